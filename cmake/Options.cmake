@@ -1,0 +1,29 @@
+# Every target links kest_options: the standard, the warnings and the Qt rules in one place.
+add_library(kest_options INTERFACE)
+target_compile_features(kest_options INTERFACE cxx_std_20)
+set_property(TARGET kest_options PROPERTY INTERFACE_CXX_EXTENSIONS OFF)
+target_compile_options(kest_options INTERFACE -Wall -Wextra -Wpedantic -Wshadow -Wnon-virtual-dtor -Woverloaded-virtual
+                                              -Werror)
+target_compile_definitions(
+    kest_options
+    INTERFACE QT_NO_CAST_FROM_ASCII QT_NO_CAST_TO_ASCII QT_NO_URL_CAST_FROM_STRING QT_NO_CAST_FROM_BYTEARRAY
+              QT_NO_FOREACH QT_NO_NARROWING_CONVERSIONS_IN_CONNECT
+              QT_DISABLE_DEPRECATED_BEFORE=0x060400 KEST_VERSION="${PROJECT_VERSION}")
+target_include_directories(kest_options INTERFACE ${PROJECT_SOURCE_DIR}/src)
+
+find_program(MOLD mold)
+if(MOLD)
+    target_link_options(kest_options INTERFACE -fuse-ld=mold)
+endif()
+
+set(KEST_SANITIZE "" CACHE STRING "Sanitizers to build with, as -fsanitize takes them")
+if(KEST_SANITIZE)
+    add_compile_options(-fsanitize=${KEST_SANITIZE} -fno-omit-frame-pointer -fno-sanitize-recover=all)
+    add_link_options(-fsanitize=${KEST_SANITIZE})
+endif()
+
+function(kest_precompile target)
+    if(KEST_PCH)
+        target_precompile_headers(${target} PRIVATE ${ARGN})
+    endif()
+endfunction()

@@ -1,0 +1,35 @@
+// What a message file is: its text made ready for the parser, its type codes and their display names.
+#pragma once
+
+#include "platform/xml/xml.h"
+
+#include <QMap>
+#include <QString>
+
+namespace kest {
+
+/// The namespace of every element path, and of the outgoing quote document.
+QString GetNamespaceURI();
+/// Prepares a document for the paths of this system, whose prefix is "rootns".
+void SetupDocument(xml::Document& document);
+/// The text with the schema-instance declaration before its first "xmlns"; unchanged where there is none, or where it
+/// is declared in the very wording of the insert.
+QString AddXsiDeclaration(const QString& text);
+
+/// The display name of a type code in upper case, or "UNKNOWN - INVALID MESSAGE".
+QString MessageTypeName(const QString& code);
+/// The display name of a network message. Changes `text` to the prepared one; never fails.
+QString GetMessageTypeName(QString& text);
+/// The display name of a marker message. Changes `text` to the prepared one; never fails.
+QString GetMarkerTypeName(QString& text);
+
+/// Every "&" as "&amp;", those of entities included.
+QString WithAmpersandsEscaped(const QString& text);
+/// The text between "<request>" and "</request>".
+QString WrappedInRequest(const QString& text);
+
+/// A prepared text parsed for the message code's paths: SetupDocument, AddXsiDeclaration, loadXML. `text` comes back
+/// prepared. The caller asks `parseError`.
+xml::Document ParsedMessage(QString& text);
+
+}  // namespace kest

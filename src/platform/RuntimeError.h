@@ -1,0 +1,66 @@
+// The one exception type for failures, and the one word for a step whose failure is passed over.
+#pragma once
+
+#include <QString>
+
+#include <exception>
+#include <utility>
+
+namespace kest {
+
+/// Failure numbers keep their usual meaning, so that a log record can be looked up.
+enum ErrorNumber : int {
+    Overflow = 6,
+    TypeMismatch = 13,
+    FileNotFound = 53,
+    FileInputOutput = 57,
+    FileExists = 58,
+    PermissionDenied = 70,
+    PathNotFound = 76,
+    NoObject = 91,  // an object, an element or a connection that is not there
+    NullValue = 94,
+    NoCurrentRow = 3021,
+    NoSuchColumn = 3265,
+    ObjectClosed = 3704,
+    RowChanged = -2147217864,       // someone else has changed or removed the row
+    StatementFailed = -2147217900,  // the engine refused the statement
+    CannotOpen = -2147467259,       // the database cannot be opened, or has gone
+};
+
+class RuntimeError : public std::exception {
+public:
+    RuntimeError(int errorNumber, QString errorDescription, QString errorSource = {});
+
+    int number() const { return number_; }
+    const QString& description() const { return description_; }
+    const QString& source() const { return source_; }
+
+    /// The engine's own code and SQLSTATE of a database failure; empty for any other.
+    const QString& nativeCode() const { return nativeCode_; }
+    const QString& sqlState() const { return sqlState_; }
+    RuntimeError& withDatabaseCodes(QString native, QString state);
+
+    const char* what() const noexcept override { return utf8_.constData(); }
+
+private:
+    int number_;
+    QString description_;
+    QString source_;
+    QString nativeCode_;
+    QString sqlState_;
+    QByteArray utf8_;
+};
+
+/// Runs a step whose failure is passed over; true when it did not fail.
+template <class Step>
+bool attempt(Step&& step)
+{
+    try {
+        std::forward<Step>(step)();
+        return true;
+    } catch (const RuntimeError&) {
+        return false;
+    }
+}
+
+}  // namespace kest

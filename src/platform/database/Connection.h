@@ -1,0 +1,47 @@
+// A connection to the quote database, whichever engine answers.
+#pragma once
+
+#include <QString>
+#include <QVariant>
+
+#include <memory>
+
+namespace kest::db {
+
+class Engine;
+
+/// One open database. Statements are written in the dialect of SQL Server; the engine that answers translates them.
+/// One statement a call: a second one behind a ";" is refused with StatementFailed.
+class Connection {
+public:
+    Connection();
+    ~Connection();
+    Connection(const Connection&) = delete;
+    Connection& operator=(const Connection&) = delete;
+
+    /// Opens what a connection text of the form "Driver={...};Server=...;Database=...;Uid=...;Pwd=...;" names: MySQL and
+    /// MariaDB, a driver registered with ODBC here, or, for a local server without such a driver, the embedded engine.
+    /// Throws CannotOpen; a server that does not answer costs seconds.
+    void open(const QString& connectionText);
+    void close();
+    /// 1 while the connection is open, 0 otherwise. A connection that the server has dropped is closed.
+    int state() const;
+
+    /// Seconds that a statement may take; 0 is no limit.
+    void setCommandTimeout(int seconds);
+
+    /// Runs a statement that gives no rows and commits it; the number of rows that it hit.
+    /// Throws StatementFailed with the engine's codes, CannotOpen when the connection has gone.
+    qint64 execute(const QString& statement);
+
+    /// For the recordset and for faults in tests.
+    Engine& engine() const;
+
+private:
+    std::unique_ptr<Engine> engine_;
+    int commandTimeout_ = 0;
+};
+
+using ConnectionPtr = std::shared_ptr<Connection>;
+
+}  // namespace kest::db

@@ -1,0 +1,49 @@
+// A script that answers boxes and input boxes and drives windows, and the record of what was shown.
+#pragma once
+
+#include "platform/desktop/Prompt.h"
+#include "platform/desktop/Window.h"
+
+#include <QJsonArray>
+#include <QJsonObject>
+#include <QString>
+
+namespace kest::desktop {
+
+/// What an unattended command showed and was answered, in the form of the command's JSON output.
+struct Record {
+    QJsonArray boxes;
+    QJsonArray inputs;
+    QJsonArray windows;
+    QJsonArray reads;
+};
+
+/// Answers without a person. Boxes are printed on standard error as `[critical] title: text`; a question takes its
+/// default where the script has no entry for it; an input box without an entry gives the empty text; a window without
+/// visits, other than those that are recorded and closed, throws NeedsAnswer.
+class Script final : public Answerer, public WindowDriver {
+public:
+    /// `script` is the script's JSON object, empty for none. Throws RuntimeError for one of another form.
+    explicit Script(const QJsonObject& script = {});
+
+    /// Windows of this objectName are recorded by their own code and closed when no visit is there for them.
+    void recordAndClose(const QString& windowName);
+
+    Answer box(const Box& box) override;
+    QString input(const Input& input) override;
+    void start(const QString& systemPath) override;
+    bool drive(QDialog& window) override;
+
+    const Record& record() const { return record_; }
+    /// For windows that record themselves: a preview, the sublet documents.
+    void addWindow(const QJsonObject& window) { record_.windows.append(window); }
+
+private:
+    Record record_;
+    QJsonObject script_;
+};
+
+/// The script that answers now, or null where a person does.
+Script* currentScript();
+
+}  // namespace kest::desktop

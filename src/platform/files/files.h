@@ -1,0 +1,64 @@
+// Files and folders under the host's names: the only place that reads and writes files.
+#pragma once
+
+#include <QByteArray>
+#include <QString>
+#include <QStringList>
+
+namespace kest::files {
+
+// A path is one in the host's form or an absolute one of this system; both slashes separate.
+//   c:\wirdoc\AUnread\x.xml   drive_c/wirdoc/AUnread/x.xml of the profile
+//   d:\...                    drive_d/...
+//   \\s\share\x               unc/s/share/x
+// Names are found without regard to case: the exact spelling first, then the first by name.
+// Failures throw RuntimeError: FileNotFound, PathNotFound, PermissionDenied, FileInputOutput.
+
+/// The path on this system. What does not exist keeps the spelling that was asked for.
+QString systemPath(const QString& path);
+
+bool exists(const QString& path);        // a file
+bool folderExists(const QString& path);  // a folder
+qint64 size(const QString& path);
+
+/// The whole file as text of the code page Windows-1252; all 256 bytes survive a round trip.
+QString read(const QString& path);
+QByteArray readBytes(const QString& path);
+
+/// Written to a temporary name that no reader of the folder takes, flushed, then renamed: nobody sees half a file.
+/// A variant of the name in another case is replaced. Characters outside the code page become "?".
+void write(const QString& path, const QString& text);
+void writeBytes(const QString& path, const QByteArray& bytes);
+/// Adds to the end of the file; a missing file is created.
+void append(const QString& path, const QString& text);
+
+/// Overwrites the target, which appears whole or not at all.
+void copy(const QString& from, const QString& to);
+void move(const QString& from, const QString& to);
+/// A missing file is FileNotFound, one marked read-only PermissionDenied.
+void remove(const QString& path);
+/// Makes the folder and those above it; nothing happens when it is there.
+void makeFolder(const QString& path);
+
+/// The names of the files of a folder whose name matches a pattern of "*" and "?" in any case, everything else literal.
+/// Ordered by the upper-cased name, in code order. Temporary names of `write` are never among them.
+QStringList list(const QString& folder, const QString& pattern = QStringLiteral("*"));
+bool matches(const QString& name, const QString& pattern);
+
+/// True for a name that stays in its folder: not empty, no separator, no "..", no drive, no control character.
+/// Names out of a message or a table pass through here: for reading a bad one is a file that does not exist.
+bool isPlainName(const QString& name);
+/// `folder` + `name`; throws PathNotFound for a name that is not plain. For names that are about to be written.
+QString pathForWriting(const QString& folder, const QString& name);
+
+/// Deletes a file that another process may still hold, again and again in the background until it has gone.
+void removeInBackground(const QString& path);
+/// Waits for the background deletions of this process; false when some file is still there after the time.
+bool waitForBackground(int milliseconds);
+
+QByteArray toCodePage(const QString& text);
+QString fromCodePage(const QByteArray& bytes);
+/// Strict base64 once white space is taken out; throws TypeMismatch for anything else.
+QByteArray fromBase64(const QString& text);
+
+}  // namespace kest::files

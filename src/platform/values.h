@@ -1,0 +1,46 @@
+// Turns column values and message texts into numbers, flags, dates and texts: the one place that converts.
+#pragma once
+
+#include <QDateTime>
+#include <QString>
+#include <QVariant>
+
+#include <optional>
+
+namespace kest {
+
+// The readers below take these forms, blanks around them allowed, and no others:
+//   number   sign, digits, commas between groups of three, one point, an exponent: "1,234.50", "-.5", "1e3"
+//   Boolean  "true" or "false" in any case, or a number
+//   date     yyyy-MM-dd, the same with "T" or a blank and HH:mm[:ss[.f]] and a zone mark, d/M/yyyy, the same with a
+//            time of a 12- or 24-hour clock
+// A Null throws NullValue, any other text TypeMismatch, a number too large for the result Overflow.
+
+double toDouble(const QVariant& value);
+/// A whole number of 32 bits; a fraction is rounded to the nearest, halves to the even one.
+qint64 toLong(const QVariant& value);
+/// A whole number of 16 bits, with Overflow outside -32768 to 32767.
+qint64 toInteger(const QVariant& value);
+bool toBool(const QVariant& value);
+QDateTime toDate(const QVariant& value);
+
+/// The number in a text, or none where the text is no number.
+std::optional<double> numberIn(const QString& text);
+std::optional<QDateTime> dateIn(const QString& text);
+bool isNumeric(const QVariant& value);
+
+/// The number at the start of a text: blanks are skipped, the rest behind it is passed over, 0 where there is none.
+double leadingNumber(const QString& text);
+
+/// Any value as text: short date, with the time when it is not midnight; "True" and "False"; general number text.
+/// Throws NullValue for a Null.
+QString toText(const QVariant& value);
+/// The value followed by an empty text: a Null is the empty text.
+QString textOrEmpty(const QVariant& value);
+
+/// General number text: up to 15 significant digits, no exponent at the sizes met here, never "-0".
+QString numberText(double value);
+/// dd/MM/yyyy, always ten characters.
+QString shortDate(const QDate& date);
+
+}  // namespace kest

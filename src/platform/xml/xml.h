@@ -1,0 +1,131 @@
+// The document object of the message code, over libxml2.
+#pragma once
+
+#include <QList>
+#include <QMap>
+#include <QString>
+
+#include <memory>
+
+struct _xmlNode;
+struct _xmlDoc;
+
+namespace kest::xml {
+
+enum class NodeType { Element = 1, Attribute = 2, Text = 3, CDataSection = 4, ProcessingInstruction = 7, Comment = 8 };
+
+/// The two errors that the message code repairs; every other failure has another code.
+constexpr quint32 BareAmpersand = 0xC00CE513;
+constexpr quint32 SecondRoot = 0xC00CE555;
+
+struct ParseError {
+    quint32 errorCode = 0;  // 0: the last parse succeeded
+    QString reason;
+    QString srcText;  // the line that holds the error
+    int line = 0;     // from 1
+    int linePosition = 0;
+};
+
+struct Attribute {
+    QString name;  // with its prefix; a namespace declaration is "xmlns" or "xmlns:prefix"
+    QString value;
+};
+
+class Document;
+
+/// A light reference to a node, valid as long as its document. A null node answers `isNull`; anything else asked of
+/// it throws NoObject.
+class Node {
+public:
+    Node() = default;
+
+    bool isNull() const { return node == nullptr; }
+    explicit operator bool() const { return node != nullptr; }
+    bool operator==(const Node&) const = default;
+
+    NodeType nodeType() const;
+    /// With the prefix that the file gives; "#text", "#cdata-section" and "#comment" for those.
+    QString nodeName() const;
+    QString localName() const;
+    QString namespaceURI() const;
+    /// The text of all descendants, joined; a text node of white space only counts for nothing.
+    QString text() const;
+    void setText(const QString& text);
+    /// Without declaration and added white space.
+    QString xml() const;
+    /// Namespace declarations included, in document order.
+    QList<Attribute> attributes() const;
+    void setAttribute(const QString& name, const QString& value);
+
+    Node parentNode() const;
+    Node firstChild() const;
+    Node lastChild() const;
+    Node nextSibling() const;
+    /// Text that is white space only is no node.
+    QList<Node> childNodes() const;
+    Node appendChild(Node child) const;
+    Node insertBefore(Node child, Node reference) const;
+    void removeChild(Node child) const;
+
+    /// Null when nothing matches. The prefixes are those of the document's selection namespaces.
+    Node selectSingleNode(const QString& path) const;
+    QList<Node> selectNodes(const QString& path) const;
+    /// The text at a path. `textOf` throws NoObject where nothing is, `textOrEmptyOf` gives the empty text.
+    QString textOf(const QString& path) const;
+    QString textOrEmptyOf(const QString& path) const;
+
+private:
+    friend class Document;
+    Node(_xmlNode* n, const Document* d) : node(n), document(d) {}
+
+    _xmlNode* node = nullptr;
+    const Document* document = nullptr;
+};
+
+/// One XML document. No DTD is accepted, nothing outside the document is ever fetched; the size of a text is bounded by
+/// `maximumBytes`, the depth by `maximumDepth`, beyond which the parse fails like any other.
+class Document {
+public:
+    static constexpr qint64 maximumBytes = 256LL * 1024 * 1024;
+    static constexpr int maximumDepth = 1000;
+
+    Document();
+    ~Document();
+    Document(Document&&) noexcept;
+    Document& operator=(Document&&) noexcept;
+
+    /// Prefixes for selections, to URIs. They hold for later parses too.
+    void setSelectionNamespaces(const QMap<QString, QString>& prefixes);
+
+    /// False leaves the document empty and `parseError` filled.
+    bool loadXML(const QString& text);
+    const ParseError& parseError() const;
+
+    /// The root element, whatever stands before it; null for an empty document.
+    Node documentElement() const;
+    /// The same: what the message code calls the document's first child.
+    Node firstChild() const { return documentElement(); }
+
+    /// A node of this document that is not yet in the tree. `name` may carry a prefix, which is declared with
+    /// `namespaceURI` where it is not in force yet; an empty URI is no namespace.
+    Node createNode(NodeType type, const QString& name, const QString& namespaceURI = {});
+    /// Puts the root of an empty document.
+    Node appendChild(Node root);
+
+    Node selectSingleNode(const QString& path) const;
+    QList<Node> selectNodes(const QString& path) const;
+    /// As Node::textOf and Node::textOrEmptyOf, from the root.
+    QString textOf(const QString& path) const;
+    QString textOrEmptyOf(const QString& path) const;
+
+    /// Characters as themselves, not as references, except those that markup needs; characters that XML forbids are
+    /// dropped.
+    QString xml() const;
+
+private:
+    friend class Node;
+    struct Data;
+    std::unique_ptr<Data> data;
+};
+
+}  // namespace kest::xml

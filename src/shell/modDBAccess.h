@@ -1,0 +1,29 @@
+// The one connection to the host's database.
+#pragma once
+
+#include "platform/database/Recordset.h"
+
+#include <QString>
+
+#include <optional>
+
+namespace kest {
+
+extern db::ConnectionPtr gcnDB;  // owned here; gConn refers to the same object
+extern QString gsSAPwd;
+extern QString gsDatabase;
+extern QString gsServer;
+extern QString gsInstance;
+
+/// The open connection, opened where needed, or null when there is none.
+db::ConnectionPtr GetConnection();
+/// True when the connection is open, opened where needed.
+bool EnsureConnection();
+/// Reads the settings and opens the connection; a failure shows only as a closed connection.
+void OpenDatabase();
+/// A query on a fresh recordset, or none after a critical message when there is no connection.
+std::optional<db::Recordset> OpenRecordset(const QString& select, bool disconnect = false, bool reconnect = false);
+/// This machine's name; empty on failure.
+QString GetComputerName();
+
+}  // namespace kest
