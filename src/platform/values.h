@@ -14,6 +14,7 @@ namespace kest {
 //   Boolean  "true" or "false" in any case, or a number
 //   date     yyyy-MM-dd, the same with "T" or a blank and HH:mm[:ss[.f]] and a zone mark, d/M/yyyy, the same with a
 //            time of a 12- or 24-hour clock
+// A zone mark is passed over: date and time stand as they are written.
 // A Null throws NullValue, any other text TypeMismatch, a number too large for the result Overflow.
 
 double toDouble(const QVariant& value);
@@ -29,16 +30,17 @@ std::optional<double> numberIn(const QString& text);
 std::optional<QDateTime> dateIn(const QString& text);
 bool isNumeric(const QVariant& value);
 
-/// The number at the start of a text: blanks are skipped, the rest behind it is passed over, 0 where there is none.
+/// The number at the start of a text: blanks are skipped wherever they stand, the rest behind it is passed over, 0
+/// where there is none.
 double leadingNumber(const QString& text);
 
-/// Any value as text: short date, with the time when it is not midnight; "True" and "False"; general number text.
-/// Throws NullValue for a Null.
+/// Any value as text: short date, with the time ("2:05:00 PM") when it is not midnight; "True" and "False"; general
+/// number text. Throws NullValue for a Null.
 QString toText(const QVariant& value);
 /// The value followed by an empty text: a Null is the empty text.
 QString textOrEmpty(const QVariant& value);
 
-/// General number text: up to 15 significant digits, no exponent at the sizes met here, never "-0".
+/// General number text: up to 15 significant digits, no exponent from 1e-10 to below 1e16, never "-0".
 QString numberText(double value);
 /// dd/MM/yyyy, always ten characters.
 QString shortDate(const QDate& date);
