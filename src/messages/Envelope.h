@@ -15,13 +15,19 @@ void SetupDocument(xml::Document& document);
 /// The text with the schema-instance declaration before its first "xmlns"; unchanged where there is none, or where it
 /// is declared in the very wording of the insert.
 QString AddXsiDeclaration(const QString& text);
+/// True where a document parsed from the bare text and one parsed from the prepared text hold the same, so that a
+/// parse can be spared. In doubt false.
+bool IsSameWhenPrepared(const QString& text);
 
 /// The display name of a type code in upper case, or "UNKNOWN - INVALID MESSAGE".
 QString MessageTypeName(const QString& code);
 /// The display name of a network message. Changes `text` to the prepared one; never fails.
 QString GetMessageTypeName(QString& text);
+/// The same, of a message that was parsed before.
+QString GetMessageTypeName(const xml::Document& message);
 /// The display name of a marker message. Changes `text` to the prepared one; never fails.
 QString GetMarkerTypeName(QString& text);
+QString GetMarkerTypeName(const xml::Document& marker);
 
 /// Every "&" as "&amp;", those of entities included.
 QString WithAmpersandsEscaped(const QString& text);

@@ -1,0 +1,128 @@
+#include "messages/Envelope.h"
+
+#include "platform/RuntimeError.h"
+
+#include <array>
+#include <utility>
+
+using namespace Qt::StringLiterals;
+
+namespace kest {
+namespace {
+
+constexpr QLatin1StringView networkDomain = "orla.example"_L1;  // of every network namespace, behind its labels
+constexpr QLatin1StringView schemaInstance = "xmlns:xsi=\"http://www.w3.org/2001/XMLSchema-instance\" "_L1;
+constexpr QLatin1StringView unknownMessage = "UNKNOWN - INVALID MESSAGE"_L1;
+
+constexpr std::pair<QLatin1StringView, QLatin1StringView> displayNames[] = {
+    {"QREQ"_L1, "Quote Request"_L1},
+    {"QMQR"_L1, "Quote Matched to Quote Request"_L1},
+    {"MANQ"_L1, "Manual Quote"_L1},
+    {"QTDL"_L1, "Quote Deletion"_L1},
+    {"RRQT"_L1, "Request for Revised Quote"_L1},
+    {"QRCN"_L1, "Quote Request Cancellation"_L1},
+    {"ADQT"_L1, "Adjusted Quote"_L1},
+    {"AUQT"_L1, "Authorised Quote"_L1},
+    {"ARES"_L1, "Assessment Result"_L1},
+    {"BACA"_L1, "Backout Assessment"_L1},
+    {"BCQR"_L1, "Backout Quote Request Cancellation"_L1},
+    {"EWAP"_L1, "Excess Waived/Already Paid"_L1},
+};
+
+}  // namespace
+
+QString GetNamespaceURI()
+{
+    return "http://quote3.webservice."_L1 + networkDomain;
+}
+
+void SetupDocument(xml::Document& document)
+{
+    static const QMap<QString, QString> prefixes{
+        {u"req"_s, GetNamespaceURI()},
+        {u"p754"_s, GetNamespaceURI()},
+        {u"soapenv"_s, u"http://schemas.xmlsoap.org/soap/envelope/"_s},
+        {u"soapenc"_s, u"http://schemas.xmlsoap.org/soap/encoding/"_s},
+        {u"rootns"_s, GetNamespaceURI()},
+    };
+    document.setSelectionNamespaces(prefixes);
+}
+
+QString AddXsiDeclaration(const QString& text)
+{
+    const qsizetype first = text.indexOf("xmlns"_L1);
+    if (first < 0 || text.contains(schemaInstance, Qt::CaseInsensitive))
+        return text;
+    return text.first(first) + schemaInstance + text.sliced(first);
+}
+
+bool IsSameWhenPrepared(const QString& text)
+{
+    const qsizetype first = text.indexOf("xmlns"_L1);
+    if (first < 0 || text.contains(schemaInstance, Qt::CaseInsensitive))
+        return true;
+    if (text.contains("xmlns:xsi"_L1))
+        return false;  // perhaps on the very element that is going to get the declaration
+    const QStringView before = QStringView(text).first(first);
+    const QStringView tag = before.sliced(qMax(before.lastIndexOf(u'<'), 0));
+    const bool isAttribute = tag.startsWith(u'<') && tag.back().isSpace() && !tag.contains(u'>') &&
+                             !tag.contains(u'"') && !tag.contains(u'\'');
+    return isAttribute && !before.contains("<!"_L1) && !before.contains("<?"_L1);
+}
+
+QString MessageTypeName(const QString& code)
+{
+    for (const auto& [known, name] : displayNames)
+        if (code == known)
+            return name;
+    return unknownMessage;
+}
+
+QString GetMessageTypeName(QString& text)
+{
+    return GetMessageTypeName(ParsedMessage(text));
+}
+
+QString GetMessageTypeName(const xml::Document& message)
+{
+    QString code;
+    attempt([&] { code = message.textOf(u"messageType"_s).toUpper(); });
+    return MessageTypeName(code);
+}
+
+QString GetMarkerTypeName(QString& text)
+{
+    return GetMarkerTypeName(ParsedMessage(text));
+}
+
+QString GetMarkerTypeName(const xml::Document& marker)
+{
+    QString mailType;
+    QString action;
+    attempt([&] { mailType = marker.textOf(u"mailtype"_s); });
+    attempt([&] { action = marker.textOf(u"action"_s); });
+    if (mailType != "MDMSG"_L1)
+        return u"CORRUPT!"_s;
+    return action == "DELDUPE"_L1 ? u"Quote Send Error"_s : QString(unknownMessage);
+}
+
+QString WithAmpersandsEscaped(const QString& text)
+{
+    return QString(text).replace(u'&', "&amp;"_L1);
+}
+
+QString WrappedInRequest(const QString& text)
+{
+    return "<request>"_L1 + text + "</request>"_L1;
+}
+
+xml::Document ParsedMessage(QString& text)
+{
+    xml::Document document;
+    SetupDocument(document);
+    text = AddXsiDeclaration(text);
+    document.loadXML(text);
+    return document;
+}
+
+}  // namespace kest

@@ -1,0 +1,187 @@
+#include "messages/Folders.h"
+
+#include "messages/Envelope.h"
+#include "platform/RuntimeError.h"
+#include "platform/database/Sql.h"
+#include "platform/files/files.h"
+#include "platform/values.h"
+#include "shell/Helpers.h"
+#include "shell/SharedVariables.h"
+
+#include <limits>
+#include <tuple>
+#include <utility>
+
+using namespace Qt::StringLiterals;
+
+namespace kest {
+namespace {
+
+// What a message tells of its quote.
+enum class KeyKind { RequestAndVersion, Request, Reference, NetworkNumber, DeletedQuote };
+
+struct KeySource {
+    QLatin1StringView type;
+    KeyKind kind;
+    QLatin1StringView path;
+};
+
+constexpr KeySource keySources[] = {
+    {"QREQ"_L1, KeyKind::RequestAndVersion, "//rootns:quoteRequestNumber"_L1},
+    {"RRQT"_L1, KeyKind::RequestAndVersion, "//rootns:quoteRequestNumber"_L1},
+    {"QRCN"_L1, KeyKind::Request, "//rootns:quoteRequestNumber"_L1},
+    {"BCQR"_L1, KeyKind::Request, "//rootns:kestQuoteRequestNumber"_L1},
+    {"BACA"_L1, KeyKind::Request, "//rootns:kestQuoteRequestNumber"_L1},
+    {"QMQR"_L1, KeyKind::Reference, "//rootns:quoteBody/rootns:quoteReference"_L1},
+    {"MANQ"_L1, KeyKind::Reference, "//rootns:quoteBody/rootns:quoteReference"_L1},
+    {"ADQT"_L1, KeyKind::Reference, "//rootns:quoteBody/rootns:quoteReference"_L1},
+    {"AUQT"_L1, KeyKind::Reference, "//rootns:quoteBody/rootns:quoteReference"_L1},
+    {"QTDL"_L1, KeyKind::DeletedQuote, "//rootns:kestQuoteNumber"_L1},
+    {"ARES"_L1, KeyKind::NetworkNumber, "//rootns:kestOriginalQuoteNumber"_L1},
+};
+
+using QuoteNumber = std::pair<QString, QString>;  // with its subquote; empty where there is none
+
+QuoteNumber numberOf(const db::Recordset& quote)
+{
+    return {toText(quote.value(u"QTNNO"_s)), toText(quote.value(u"Subquote"_s))};
+}
+
+QuoteNumber newestOfRequest(const QString& request, const QString& version)
+{
+    if (request.isEmpty())
+        return {};
+    db::Recordset quote(gConn);
+    quote.open(version.isEmpty()
+                   ? sql("SELECT * FROM QUOTE1 WHERE KESTQRNo='{}' ORDER BY rec_id DESC", request)
+                   : sql("SELECT * FROM QUOTE1 WHERE KESTQRNo='{}' AND KESTQRVer='{}' ORDER BY rec_id DESC", request,
+                         version));
+    return quote.eof() ? QuoteNumber() : numberOf(quote);
+}
+
+QuoteNumber lastOfNetworkNumber(const QString& number)
+{
+    if (number.isEmpty())
+        return {};
+    db::Recordset quote(gConn);
+    quote.open(sql("SELECT * FROM QUOTE1 WHERE KESTQuoteNo='{}'", number));
+    if (quote.eof())
+        return {};
+    quote.moveLast();
+    return numberOf(quote);
+}
+
+QuoteNumber quoteNumberIn(const xml::Document& message, const KeySource& source)
+{
+    switch (source.kind) {
+        case KeyKind::RequestAndVersion:
+            return newestOfRequest(message.textOf(source.path),
+                                   message.textOf(u"//rootns:quoteRequestVersionNumber"_s));
+        case KeyKind::Request:
+            return newestOfRequest(message.textOf(source.path), {});
+        case KeyKind::Reference:
+            return SplitQuoteRef(message.textOf(source.path));
+        case KeyKind::DeletedQuote:  // the quote has left the database by now
+            if (!gsDeletedQTNNO.isEmpty())
+                return {gsDeletedQTNNO, gsDeletedSubquote};
+            break;
+        case KeyKind::NetworkNumber:
+            break;
+    }
+    return lastOfNetworkNumber(message.textOf(source.path));
+}
+
+// The largest number that a message of this quote and subquote carries in the read folder; 0 where there is none.
+// Fails on a file of theirs whose number is none.
+qint64 runningNumber(const QString& quoteNumber, const QString& subquote)
+{
+    constexpr qsizetype extension = 4;  // ".xml"
+    qint64 largest = 0;
+    for (const QString& name : files::list(gsReadPath)) {
+        const bool isOfQuote = name.left(quoteNumber.size()).compare(quoteNumber, Qt::CaseInsensitive) == 0 &&
+                               name.mid(quoteNumber.size() + 1, subquote.size()) == subquote;
+        if (isOfQuote)
+            largest = qMax(
+                largest,
+                toInteger(name.chopped(qMin(extension, name.size())).mid(quoteNumber.size() + subquote.size() + 2)));
+    }
+    return largest;
+}
+
+QString numberedName(const QString& quoteNumber, const QString& subquote, qint64 running)
+{
+    if (running == std::numeric_limits<qint16>::max())
+        throw RuntimeError(Overflow, u"All running numbers of quote %1 are taken"_s.arg(quoteNumber));
+    return quoteNumber + u'.' + subquote + u'_' + QString::number(running + 1) + ".xml"_L1;
+}
+
+// A quote number comes out of a message: a name that leaves the folder is no name.
+QString plainOrNone(const QString& name)
+{
+    return files::isPlainName(name) ? name : QString();
+}
+
+}  // namespace
+
+void MoveMessage(const QString& file, const QString& action)
+{
+    if (action == "read"_L1 && files::isPlainName(file) && files::exists(gsUnreadPath + file)) {
+        QString name =
+            gsMatchedQTNNO.isEmpty() ? GetReadFileName(gsUnreadPath + file) : GetMatchedFileName(gsMatchedQTNNO);
+        if (name.isEmpty())
+            name = file;
+        if (files::exists(gsReadPath + name))
+            attempt([&] { files::remove(gsReadPath + name); });
+        const bool copied = attempt([&] { files::copy(gsUnreadPath + file, gsReadPath + name); });
+        if (copied && files::exists(gsReadPath + name))
+            attempt([&] { files::remove(gsUnreadPath + file); });
+    }
+    gsMatchedQTNNO.clear();
+}
+
+QString GetReadFileName(const QString& path)
+{
+    MessageQuoteKey key;
+    attempt([&] { key = GetMessageQuoteKey(files::read(path)); });
+    gsDeletedQTNNO.clear();
+    gsDeletedSubquote.clear();
+    if (key.quoteNumber.isEmpty() || key.subquote.isEmpty())
+        return {};
+
+    QString name;
+    attempt([&] {
+        const qint64 running = runningNumber(key.quoteNumber, key.subquote);
+        name = plainOrNone(key.isQuoteRequest ? key.quoteNumber + ".xml"_L1
+                                              : numberedName(key.quoteNumber, key.subquote, running));
+    });
+    return name;
+}
+
+QString GetMatchedFileName(const QString& quoteNumber)
+{
+    QString name;
+    attempt([&] { name = plainOrNone(numberedName(quoteNumber, u"0"_s, runningNumber(quoteNumber, u"0"_s))); });
+    return name;
+}
+
+MessageQuoteKey GetMessageQuoteKey(const QString& text)
+{
+    MessageQuoteKey key;
+    attempt([&] {
+        QString prepared = text;
+        const xml::Document message = ParsedMessage(prepared);
+        const QString type = message.textOf(u"messageType"_s).toUpper();
+        for (const KeySource& source : keySources)
+            if (type == source.type)
+                std::tie(key.quoteNumber, key.subquote) = quoteNumberIn(message, source);
+        key.isQuoteRequest = type == "QREQ"_L1;
+    });
+    return key;
+}
+
+void DeleteFileByBatch(const QString& path)
+{
+    files::removeInBackground(path);
+}
+
+}  // namespace kest
