@@ -1,0 +1,244 @@
+-- The quote database on the embedded engine: every table and column that this component reads or writes.
+-- Texts compare without regard to case: each text column says so itself.
+
+-- QUOTE1: quote headers; subquote 0 is the main quote
+CREATE TABLE QUOTE1 (
+    rec_id         INTEGER PRIMARY KEY AUTOINCREMENT,
+    QTNNO          VARCHAR(20) COLLATE NOCASE,
+    Subquote       INTEGER,
+    REGO           VARCHAR(20) COLLATE NOCASE,
+    INSURER_ID     INTEGER,
+    KESTQRNo       VARCHAR(50) COLLATE NOCASE,
+    KESTQRVer      VARCHAR(20) COLLATE NOCASE,
+    KESTQuoteNo    VARCHAR(50) COLLATE NOCASE,
+    KESTAuthNo     VARCHAR(50) COLLATE NOCASE,
+    AuthDate       DATETIME,
+    Claim          VARCHAR(50) COLLATE NOCASE,
+    assess         VARCHAR(100) COLLATE NOCASE,
+    QUOTER         VARCHAR(50) COLLATE NOCASE,
+    qtndate        DATETIME,
+    CAR_IN         DATETIME,
+    targetdate     DATETIME,
+    QSENT          VARCHAR(1) COLLATE NOCASE,
+    Type           VARCHAR(10) COLLATE NOCASE,
+    excess         DOUBLE,
+    contri         DOUBLE,
+    excess_gst     INTEGER,
+    RR_RATE        DOUBLE,
+    RA_RATE        DOUBLE,
+    paint_rate     DOUBLE,
+    NEWPC          DOUBLE,
+    SECONDPC       DOUBLE,
+    RECOREPC       DOUBLE,
+    AFTERPC        DOUBLE,
+    RR_TOTAL       DOUBLE,
+    RA_TOTAL       DOUBLE,
+    PAINT_TOTAL    DOUBLE,
+    TOTAL          DOUBLE,
+    PRTTOTAL       DOUBLE,
+    MISTOTAL       DOUBLE,
+    override       DOUBLE,
+    rr_override    DOUBLE,
+    ra_override    DOUBLE,
+    paint_override DOUBLE,
+    CONTACTID      INTEGER,
+    quotechanged   BOOLEAN,
+    invoiced       BOOLEAN,
+    ExtraInfo      BOOLEAN,
+    Job_stage      INTEGER,
+    ReadOnly       BOOLEAN,
+    kms            VARCHAR(50) COLLATE NOCASE,
+    msgno          VARCHAR(50) COLLATE NOCASE,
+    policy_no      VARCHAR(50) COLLATE NOCASE
+);
+
+-- QUOTE2: the lines of a quote
+CREATE TABLE QUOTE2 (
+    itemid      INTEGER PRIMARY KEY AUTOINCREMENT,
+    QTNNO       VARCHAR(20) COLLATE NOCASE,
+    Subquote    INTEGER,
+    SEQ_NO      INTEGER,
+    category    VARCHAR(10) COLLATE NOCASE,
+    script      VARCHAR(100) COLLATE NOCASE,
+    rrhour      DOUBLE DEFAULT 0,
+    rahour      DOUBLE DEFAULT 0,
+    pthour      DOUBLE DEFAULT 0,
+    rr_rate2    DOUBLE DEFAULT 0,
+    opg_rate    DOUBLE DEFAULT 0,
+    qty         DOUBLE DEFAULT 0,
+    unitcost    DOUBLE DEFAULT 0,
+    PartNo      VARCHAR(30) COLLATE NOCASE,
+    MARK        VARCHAR(1) COLLATE NOCASE,
+    SIDE        VARCHAR(1) COLLATE NOCASE,
+    VENDOR      INTEGER DEFAULT 0,
+    blend       DOUBLE DEFAULT 0,
+    Tag         INTEGER,
+    delitem     BOOLEAN DEFAULT 0,
+    DELETEDITEM INTEGER DEFAULT 0,
+    tosend      VARCHAR(1) COLLATE NOCASE,
+    directbill  VARCHAR(1) COLLATE NOCASE,
+    allow_tick  INTEGER,
+    Report      BOOLEAN DEFAULT 0,
+    Report_on   INTEGER DEFAULT 0,
+    itemno      VARCHAR(5) COLLATE NOCASE
+);
+CREATE INDEX QUOTE2_QUOTE ON QUOTE2 (QTNNO, Subquote);
+
+-- QUOTE3: the long texts of a quote, the note chain among them
+CREATE TABLE QUOTE3 (
+    QTNNO          VARCHAR(20) COLLATE NOCASE,
+    Subquote       INTEGER,
+    remarks        LONGTEXT COLLATE NOCASE,
+    P_REMARKS      LONGTEXT COLLATE NOCASE,
+    INCIDENT_NOTES LONGTEXT COLLATE NOCASE,
+    anno_rr        LONGTEXT COLLATE NOCASE,
+    anno_ra        LONGTEXT COLLATE NOCASE,
+    anno_paint     LONGTEXT COLLATE NOCASE,
+    anno_opg       LONGTEXT COLLATE NOCASE,
+    anno_part      LONGTEXT COLLATE NOCASE,
+    anno_misc      LONGTEXT COLLATE NOCASE
+);
+
+CREATE TABLE CAR (
+    REGO       VARCHAR(20) COLLATE NOCASE NOT NULL PRIMARY KEY,
+    KEST       INTEGER,
+    CUST_ID    INTEGER,
+    MODEL_ID   VARCHAR(20) COLLATE NOCASE,
+    BODY_ID    VARCHAR(10) COLLATE NOCASE,
+    BODY_ID2   VARCHAR(10) COLLATE NOCASE,
+    ENGINE     VARCHAR(50) COLLATE NOCASE,
+    ENG_SIZE   VARCHAR(20) COLLATE NOCASE,
+    CYLINDERS  DOUBLE,
+    SCHEDULE   VARCHAR(20) COLLATE NOCASE,
+    MTA_SCHED  VARCHAR(20) COLLATE NOCASE,
+    TRI_SCHED  VARCHAR(20) COLLATE NOCASE,
+    UN_SCHED   VARCHAR(20) COLLATE NOCASE,
+    paint_code VARCHAR(20) COLLATE NOCASE,
+    TRIM_CODE  VARCHAR(20) COLLATE NOCASE,
+    OPT_CODE   VARCHAR(20) COLLATE NOCASE,
+    MODEL_NO   VARCHAR(20) COLLATE NOCASE,
+    COLOUR     VARCHAR(50) COLLATE NOCASE,
+    VIN        VARCHAR(50) COLLATE NOCASE,
+    XMission   VARCHAR(50) COLLATE NOCASE,
+    Year       VARCHAR(10) COLLATE NOCASE,
+    PAINT_GP   VARCHAR(2) COLLATE NOCASE
+);
+
+CREATE TABLE CUSTOMER (
+    CUST_ID    INTEGER PRIMARY KEY AUTOINCREMENT,
+    NAME       VARCHAR(50) COLLATE NOCASE,
+    FIRSTNAME  VARCHAR(50) COLLATE NOCASE,
+    SALUTATION VARCHAR(20) COLLATE NOCASE,
+    Account    INTEGER,
+    street     VARCHAR(100) COLLATE NOCASE,
+    suburb     VARCHAR(100) COLLATE NOCASE,
+    PHONE_B    VARCHAR(50) COLLATE NOCASE,
+    PHONE_P    VARCHAR(50) COLLATE NOCASE,
+    mobile     VARCHAR(50) COLLATE NOCASE,
+    Fax        VARCHAR(50) COLLATE NOCASE,
+    email      VARCHAR(100) COLLATE NOCASE
+);
+
+CREATE TABLE INSURER (
+    INSURER_ID INTEGER PRIMARY KEY AUTOINCREMENT,
+    NAME       VARCHAR(50) COLLATE NOCASE,
+    KEST       BOOLEAN,
+    RR_RATE    DOUBLE,
+    RA_RATE    DOUBLE,
+    S1_RATE    DOUBLE,
+    S2_RATE    DOUBLE,
+    S3_RATE    DOUBLE,
+    M1_RATE    DOUBLE,
+    M2_RATE    DOUBLE,
+    M3_RATE    DOUBLE,
+    new_mu     DOUBLE,
+    excess_gst INTEGER,
+    street     VARCHAR(100) COLLATE NOCASE,
+    suburb     VARCHAR(100) COLLATE NOCASE,
+    contact    VARCHAR(50) COLLATE NOCASE,
+    phone      VARCHAR(50) COLLATE NOCASE,
+    Fax        VARCHAR(50) COLLATE NOCASE,
+    email      VARCHAR(100) COLLATE NOCASE
+);
+
+-- CINFO: one row of the shop's settings
+CREATE TABLE CINFO (
+    QUOTE_PRE VARCHAR(10) COLLATE NOCASE,
+    QUOTE_VAL INTEGER,
+    QUOTE_SUF VARCHAR(10) COLLATE NOCASE,
+    second_mu DOUBLE,
+    recore_mu DOUBLE,
+    after_mu  DOUBLE
+);
+
+-- VENDOR: suppliers and sublet repairers
+CREATE TABLE VENDOR (
+    VENDOR_ID  INTEGER PRIMARY KEY AUTOINCREMENT,
+    NAME       VARCHAR(50) COLLATE NOCASE,
+    STREET     VARCHAR(100) COLLATE NOCASE,
+    SUBURB     VARCHAR(100) COLLATE NOCASE,
+    PHONE      VARCHAR(50) COLLATE NOCASE,
+    contact    VARCHAR(50) COLLATE NOCASE,
+    Fax        VARCHAR(50) COLLATE NOCASE,
+    email      VARCHAR(100) COLLATE NOCASE,
+    accno      VARCHAR(50) COLLATE NOCASE,
+    vendor_abn VARCHAR(50) COLLATE NOCASE,
+    Account    INTEGER
+);
+
+CREATE TABLE ALLMODEL (
+    MODEL_ID VARCHAR(20) COLLATE NOCASE,
+    MAKE     VARCHAR(50) COLLATE NOCASE,
+    MODEL    VARCHAR(50) COLLATE NOCASE,
+    SCHEDULE VARCHAR(20) COLLATE NOCASE
+);
+
+CREATE TABLE MODEL (
+    MODEL_ID  VARCHAR(20) COLLATE NOCASE,
+    MODEL_ID1 VARCHAR(20) COLLATE NOCASE,
+    MAKE      VARCHAR(50) COLLATE NOCASE,
+    MODEL     VARCHAR(50) COLLATE NOCASE
+);
+
+CREATE TABLE BODY2 (
+    body_id2   VARCHAR(10) COLLATE NOCASE,
+    body_desc2 VARCHAR(50) COLLATE NOCASE
+);
+
+CREATE TABLE JOBSTAGE (
+    stage       INTEGER,
+    description VARCHAR(50) COLLATE NOCASE
+);
+
+CREATE TABLE KESTColours (
+    id     INTEGER,
+    Code   VARCHAR(10) COLLATE NOCASE,
+    Script VARCHAR(50) COLLATE NOCASE
+);
+
+CREATE TABLE SUBLET (
+    Sublet INTEGER,
+    Type   VARCHAR(10) COLLATE NOCASE,
+    Script VARCHAR(50) COLLATE NOCASE
+);
+
+-- DEBTOR: the invoices of a quote
+CREATE TABLE DEBTOR (
+    QTNNO   VARCHAR(20) COLLATE NOCASE,
+    INVDATE DATETIME
+);
+
+-- ExternalSettings: connection data of outside systems
+CREATE TABLE ExternalSettings (
+    TAG        VARCHAR(20) COLLATE NOCASE,
+    ServerName VARCHAR(100) COLLATE NOCASE,
+    Port       VARCHAR(10) COLLATE NOCASE,
+    Property1  VARCHAR(100) COLLATE NOCASE,
+    UserName   VARCHAR(100) COLLATE NOCASE,
+    passWord   VARCHAR(255) COLLATE NOCASE
+);
+
+CREATE TABLE ReportDefinition (
+    ReportID   INTEGER,
+    ReportName VARCHAR(100) COLLATE NOCASE
+);
