@@ -9,6 +9,7 @@
 #include <charconv>
 #include <cmath>
 #include <limits>
+#include <string_view>
 
 using namespace Qt::StringLiterals;
 
@@ -89,13 +90,29 @@ private:
 
 enum class Reading { Number, TooLarge, NoNumber };
 
-/// Forms a number from plain digits; what is too small for the type is 0.
+/// Of a number outside the type's range: true when it is above the range, false when it is too near to 0.
+bool isAboveRange(std::string_view plain)
+{
+    const size_t mark = std::min(plain.find('e'), plain.size());
+    const size_t point = std::min(plain.find('.'), mark);
+    const size_t firstDigit = plain.find_first_of("123456789");
+    qint64 exponent = 0;
+    if (mark < plain.size()) {
+        const bool negative = plain[mark + 1] == '-';
+        const auto [end, error] = std::from_chars(plain.data() + mark + 1, plain.data() + plain.size(), exponent);
+        if (error == std::errc::result_out_of_range)
+            return !negative;
+    }
+    return exponent + static_cast<qint64>(point) - static_cast<qint64>(firstDigit) > 0;
+}
+
+/// Forms a number from plain digits; what is too near to 0 is 0.
 Reading fromPlainDigits(const QVarLengthArray<char, 64>& plain, double& result)
 {
     const auto [end, error] = std::from_chars(plain.cbegin(), plain.cend(), result);
     if (error == std::errc::result_out_of_range) {
-        result = QByteArrayView(plain.cbegin(), plain.size()).toDouble();
-        return std::isinf(result) ? Reading::TooLarge : Reading::Number;
+        result = 0;
+        return isAboveRange({plain.cbegin(), static_cast<size_t>(plain.size())}) ? Reading::TooLarge : Reading::Number;
     }
     return error == std::errc() && end == plain.cend() ? Reading::Number : Reading::NoNumber;
 }
