@@ -11,6 +11,7 @@ namespace kest::files {
 //   c:\wirdoc\AUnread\x.xml   drive_c/wirdoc/AUnread/x.xml of the profile
 //   d:\...                    drive_d/...
 //   \\s\share\x               unc/s/share/x
+// A path without a drive lies on c:, and ".." never leads out of a drive.
 // Names are found without regard to case: the exact spelling first, then the first by name.
 // Failures throw RuntimeError: FileNotFound, PathNotFound, PermissionDenied, FileInputOutput.
 
@@ -26,7 +27,8 @@ QString read(const QString& path);
 QByteArray readBytes(const QString& path);
 
 /// Written to a temporary name that no reader of the folder takes, flushed, then renamed: nobody sees half a file.
-/// A variant of the name in another case is replaced. Characters outside the code page become "?".
+/// A variant of the name in another case is replaced and takes the new spelling. Characters outside the code page
+/// become "?".
 void write(const QString& path, const QString& text);
 void writeBytes(const QString& path, const QByteArray& bytes);
 /// Adds to the end of the file; a missing file is created.
@@ -35,13 +37,15 @@ void append(const QString& path, const QString& text);
 /// Overwrites the target, which appears whole or not at all.
 void copy(const QString& from, const QString& to);
 void move(const QString& from, const QString& to);
-/// A missing file is FileNotFound, one marked read-only PermissionDenied.
-void remove(const QString& path);
+enum class Force { No, Yes };
+/// A missing file is FileNotFound, one marked read-only PermissionDenied unless forced.
+void remove(const QString& path, Force force = Force::No);
 /// Makes the folder and those above it; nothing happens when it is there.
 void makeFolder(const QString& path);
 
 /// The names of the files of a folder whose name matches a pattern of "*" and "?" in any case, everything else literal.
-/// Ordered by the upper-cased name, in code order. Temporary names of `write` are never among them.
+/// Ordered by the upper-cased name, in code order. Temporary names of `write` are never among them. A folder that is
+/// not there has no files.
 QStringList list(const QString& folder, const QString& pattern = QStringLiteral("*"));
 bool matches(const QString& name, const QString& pattern);
 

@@ -1,0 +1,78 @@
+#include "platform/RuntimeError.h"
+#include "platform/files/files.h"
+
+#include <algorithm>
+#include <iterator>
+
+using namespace Qt::StringLiterals;
+
+namespace kest::files {
+
+namespace {
+
+// The bytes 0x80 to 0x9F; those without a character of their own stand for the control character of their number.
+constexpr char16_t upperControls[] = {
+    0x20AC, 0x0081, 0x201A, 0x0192, 0x201E, 0x2026, 0x2020, 0x2021, 0x02C6, 0x2030, 0x0160,
+    0x2039, 0x0152, 0x008D, 0x017D, 0x008F, 0x0090, 0x2018, 0x2019, 0x201C, 0x201D, 0x2022,
+    0x2013, 0x2014, 0x02DC, 0x2122, 0x0161, 0x203A, 0x0153, 0x009D, 0x017E, 0x0178,
+};
+
+char byteOf(char16_t c)
+{
+    if (c < 0x80 || (c >= 0xA0 && c <= 0xFF))
+        return static_cast<char>(c);
+    const auto* place = std::find(std::begin(upperControls), std::end(upperControls), c);
+    return place == std::end(upperControls) ? '?' : static_cast<char>(0x80 + (place - std::begin(upperControls)));
+}
+
+bool isWhiteSpace(QChar c)
+{
+    return c == u' ' || c == u'\t' || c == u'\r' || c == u'\n' || c == u'\f' || c == u'\v';
+}
+
+bool isBase64Letter(char c)
+{
+    return (c >= 'A' && c <= 'Z') || (c >= 'a' && c <= 'z') || (c >= '0' && c <= '9') || c == '+' || c == '/';
+}
+
+}  // namespace
+
+QByteArray toCodePage(const QString& text)
+{
+    QByteArray bytes(text.size(), Qt::Uninitialized);
+    char* out = bytes.data();
+    for (qsizetype i = 0; i < text.size(); ++i) {
+        const bool pair = text[i].isHighSurrogate() && i + 1 < text.size() && text[i + 1].isLowSurrogate();
+        *out++ = byteOf(text[i].unicode());
+        if (pair)
+            ++i;  // two units, one character
+    }
+    bytes.truncate(out - bytes.constData());
+    return bytes;
+}
+
+QString fromCodePage(const QByteArray& bytes)
+{
+    QString text(bytes.size(), Qt::Uninitialized);
+    std::transform(bytes.begin(), bytes.end(), text.begin(), [](char c) {
+        const auto byte = static_cast<unsigned char>(c);
+        return QChar(byte >= 0x80 && byte < 0xA0 ? upperControls[byte - 0x80] : char16_t(byte));
+    });
+    return text;
+}
+
+QByteArray fromBase64(const QString& text)
+{
+    QByteArray letters;
+    letters.reserve(text.size());
+    for (const QChar c : text) {
+        if (!isWhiteSpace(c))
+            letters.append(c.unicode() < 0x80 ? static_cast<char>(c.unicode()) : '?');
+    }
+    const qsizetype padding = letters.endsWith("==") ? 2 : letters.endsWith('=') ? 1 : 0;
+    if (letters.size() % 4 != 0 || !std::all_of(letters.begin(), letters.end() - padding, isBase64Letter))
+        throw RuntimeError(TypeMismatch, u"The text is not base64"_s);
+    return QByteArray::fromBase64(letters);
+}
+
+}  // namespace kest::files

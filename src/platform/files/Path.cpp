@@ -1,0 +1,217 @@
+#include "platform/RuntimeError.h"
+#include "platform/files/SystemFile.h"
+#include "platform/files/files.h"
+#include "platform/profile.h"
+
+#include <QFile>
+
+#include <dirent.h>
+#include <strings.h>
+#include <sys/stat.h>
+
+#include <algorithm>
+#include <memory>
+#include <vector>
+
+using namespace Qt::StringLiterals;
+
+namespace kest::files {
+
+namespace {
+
+using Folder = std::unique_ptr<DIR, int (*)(DIR*)>;
+
+Folder openFolder(const QString& systemPath)
+{
+    return {::opendir(encodedPath(systemPath).constData()), &::closedir};
+}
+
+bool isAscii(const QString& text)
+{
+    return std::all_of(text.begin(), text.end(), [](QChar c) { return c < QChar(0x80); });
+}
+
+bool isDriveLetter(QChar c)
+{
+    return (c >= u'a' && c <= u'z') || (c >= u'A' && c <= u'Z');
+}
+
+/// A path as the folder where the search for its names begins, and those names.
+struct Route {
+    QString start;
+    QStringList names;
+};
+
+/// ".." never leads out of a drive.
+QStringList namesOf(const QString& path)
+{
+    QStringList names;
+    for (const QString& name : path.split(u'/', Qt::SkipEmptyParts)) {
+        if (name == ".."_L1) {
+            if (!names.isEmpty())
+                names.removeLast();
+        } else if (name != "."_L1) {
+            names.append(name);
+        }
+    }
+    return names;
+}
+
+Route routeOf(const QString& path)
+{
+    QString rest = path;
+    rest.replace(u'\\', u'/');
+    if (rest.size() >= 2 && rest[1] == u':' && isDriveLetter(rest[0])) {
+        const QString drive = u"/drive_"_s + rest[0].toLower();
+        return {profile::root() + drive, namesOf(rest.sliced(2))};
+    }
+    if (rest.startsWith("//"_L1))
+        return {profile::root() + u"/unc"_s, namesOf(rest)};
+    if (path.startsWith(u'/'))
+        return {QString(), namesOf(rest)};
+    return {profile::root() + u"/drive_c"_s, namesOf(rest)};  // without a drive: the host's first one
+}
+
+/// The name in the folder that equals this one but for its case; empty where there is none.
+QString variantIn(const QString& folder, const QString& name)
+{
+    const Folder open = openFolder(folder.isEmpty() ? u"/"_s : folder);
+    if (!open)
+        return {};
+    const bool plain = isAscii(name);
+    const QByteArray wanted = QFile::encodeName(name);
+    QString found;
+    while (const dirent* entry = ::readdir(open.get())) {
+        if (plain ? ::strcasecmp(entry->d_name, wanted.constData()) != 0
+                  : QFile::decodeName(entry->d_name).compare(name, Qt::CaseInsensitive) != 0)
+            continue;
+        const QString candidate = QFile::decodeName(entry->d_name);
+        if (found.isEmpty() || candidate < found)
+            found = candidate;
+    }
+    return found;
+}
+
+bool isThere(const QString& systemPath)
+{
+    struct stat state {};
+    return !systemPath.contains(QChar(u'\0')) && ::lstat(encodedPath(systemPath).constData(), &state) == 0;
+}
+
+/// The path with each name in the spelling that it has on the disk, up to the first that is not there.
+QString found(const QString& start, const QStringList& names)
+{
+    const QString asAsked = names.isEmpty() ? start : start + u'/' + names.join(u'/');
+    if (isThere(asAsked))
+        return asAsked;
+    QString reached = start;
+    for (qsizetype i = 0; i < names.size(); ++i) {
+        QString next = reached + u'/' + names[i];
+        if (!isThere(next)) {
+            const QString variant = variantIn(reached, names[i]);
+            if (variant.isEmpty())
+                return reached + u'/' + names.sliced(i).join(u'/');
+            next = reached + u'/' + variant;
+        }
+        reached = next;
+    }
+    return reached;
+}
+
+}  // namespace
+
+QString systemPath(const QString& path)
+{
+    if (path.isEmpty())
+        return {};
+    const Route route = routeOf(path);
+    const QString result = found(route.start, route.names);
+    return result.isEmpty() ? u"/"_s : result;
+}
+
+QString spelledPath(const QString& path)
+{
+    Route route = routeOf(path);
+    if (route.names.isEmpty())
+        return route.start;
+    const QString name = route.names.takeLast();
+    return found(route.start, route.names) + u'/' + name;
+}
+
+bool isPlainName(const QString& name)
+{
+    if (name.isEmpty() || name == "."_L1 || name.contains(".."_L1))
+        return false;
+    return std::none_of(name.begin(), name.end(), [](QChar c) {
+        return c == u'/' || c == u'\\' || c == u':' || c.category() == QChar::Other_Control;
+    });
+}
+
+QString pathForWriting(const QString& folder, const QString& name)
+{
+    if (!isPlainName(name))
+        throwFileError(PathNotFound, folder + name);
+    const bool separated = folder.endsWith(u'\\') || folder.endsWith(u'/');
+    return separated ? folder + name : folder + u'\\' + name;
+}
+
+bool matches(const QString& name, const QString& pattern)
+{
+    const QString text = name.toUpper();
+    const QString mask = pattern.toUpper();
+    qsizetype at = 0;
+    qsizetype maskAt = 0;
+    qsizetype star = -1;  // the last "*" met, and where its text began: only that one is ever tried again
+    qsizetype starText = -1;
+    while (at < text.size()) {
+        if (maskAt < mask.size() && mask[maskAt] == u'*') {
+            star = maskAt++;
+            starText = at;
+        } else if (maskAt < mask.size() && (mask[maskAt] == u'?' || mask[maskAt] == text[at])) {
+            ++maskAt;
+            ++at;
+        } else if (star >= 0) {
+            maskAt = star + 1;
+            at = ++starText;
+        } else {
+            return false;
+        }
+    }
+    while (maskAt < mask.size() && mask[maskAt] == u'*')
+        ++maskAt;
+    return maskAt == mask.size();
+}
+
+QStringList list(const QString& folder, const QString& pattern)
+{
+    const QString place = systemPath(folder);
+    if (place.isEmpty() || !isFolder(place))
+        return {};
+    const Folder open = openFolder(place);
+    if (!open)
+        throwSystemError(place);
+
+    struct Found {
+        QString upper;
+        QString name;
+    };
+    std::vector<Found> files;
+    while (const dirent* entry = ::readdir(open.get())) {
+        if (entry->d_type == DT_DIR)
+            continue;
+        const QString name = QFile::decodeName(entry->d_name);
+        if (isTemporaryName(name) || !matches(name, pattern))
+            continue;
+        if (entry->d_type == DT_REG || isFile(place + u'/' + name))
+            files.push_back({name.toUpper(), name});
+    }
+    std::sort(files.begin(), files.end(),
+              [](const Found& a, const Found& b) { return a.upper != b.upper ? a.upper < b.upper : a.name < b.name; });
+    QStringList names;
+    names.reserve(static_cast<qsizetype>(files.size()));
+    for (Found& file : files)
+        names.append(std::move(file.name));
+    return names;
+}
+
+}  // namespace kest::files

@@ -1,0 +1,287 @@
+#include "platform/files/SystemFile.h"
+
+#include "platform/RuntimeError.h"
+#include "platform/files/FaultInjection.h"
+#include "platform/files/files.h"
+
+#include <QFile>
+#include <QRandomGenerator>
+
+#include <fcntl.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <cerrno>
+#include <cstdio>
+#include <mutex>
+#include <optional>
+#include <utility>
+
+using namespace Qt::StringLiterals;
+
+namespace kest::files {
+
+namespace {
+
+constexpr mode_t anyoneMayRead = S_IRUSR | S_IRGRP | S_IROTH;
+constexpr mode_t anyoneMayWrite = S_IWUSR | S_IWGRP | S_IWOTH;
+
+std::mutex faultMutex;
+std::function<bool()> currentFault;
+
+QString folderOf(const QString& systemPath)
+{
+    const qsizetype slash = systemPath.lastIndexOf(u'/');
+    return slash <= 0 ? u"/"_s : systemPath.first(slash);
+}
+
+std::optional<struct stat> stateOf(const QString& systemPath)
+{
+    struct stat state {};
+    if (systemPath.contains(QChar(u'\0')) || ::stat(encodedPath(systemPath).constData(), &state) != 0)
+        return {};
+    return state;
+}
+
+QString temporaryName()
+{
+    return u".kest-"_s + QString::number(QRandomGenerator::global()->generate64(), 36) + u".tmp"_s;
+}
+
+/// A rename is on the disk only when its folder is.
+void commitFolder(const QString& folder)
+{
+    SystemFile(folder, O_RDONLY | O_DIRECTORY).commit();
+}
+
+int withoutInterruption(const std::function<int()>& call)
+{
+    int result = 0;
+    do {
+        result = call();
+    } while (result < 0 && errno == EINTR);
+    return result;
+}
+
+}  // namespace
+
+void setFault(std::function<bool()> fault)
+{
+    const std::lock_guard lock(faultMutex);
+    currentFault = std::move(fault);
+}
+
+void failOnRequest(const QString& path)
+{
+    const std::lock_guard lock(faultMutex);
+    if (currentFault && currentFault())
+        throwFileError(FileInputOutput, path);
+}
+
+QByteArray encodedPath(const QString& systemPath)
+{
+    if (systemPath.contains(QChar(u'\0')))
+        throwFileError(PathNotFound, systemPath);
+    return QFile::encodeName(systemPath);
+}
+
+void throwFileError(int number, const QString& systemPath)
+{
+    const auto meaning = [&] {
+        switch (number) {
+            case FileNotFound:
+                return u"File not found"_s;
+            case PathNotFound:
+                return u"Path not found"_s;
+            case PermissionDenied:
+                return u"Permission denied"_s;
+            default:
+                return u"Device I/O error"_s;
+        }
+    };
+    throw RuntimeError(number, meaning() + u": "_s + systemPath);
+}
+
+void throwSystemError(const QString& systemPath)
+{
+    switch (errno) {
+        case ENOENT:
+            throwFileError(isFolder(folderOf(systemPath)) ? FileNotFound : PathNotFound, systemPath);
+        case ENOTDIR:
+        case ENAMETOOLONG:
+        case EINVAL:
+        case ELOOP:
+            throwFileError(PathNotFound, systemPath);
+        case EACCES:
+        case EPERM:
+        case EROFS:
+        case EBUSY:
+        case ETXTBSY:
+        case EISDIR:
+        case ENOTEMPTY:
+            throwFileError(PermissionDenied, systemPath);
+        default:
+            throwFileError(FileInputOutput, systemPath);
+    }
+}
+
+SystemFile::SystemFile(const QString& systemPath, int flags)
+    : path(systemPath), descriptor(withoutInterruption([name = encodedPath(systemPath), flags] {
+          return ::open(name.constData(), flags | O_CLOEXEC | O_NONBLOCK, 0666);
+      }))
+{
+    if (descriptor < 0)
+        throwSystemError(path);
+}
+
+SystemFile::~SystemFile()
+{
+    if (descriptor >= 0)
+        ::close(descriptor);
+}
+
+qint64 SystemFile::size() const
+{
+    struct stat state {};
+    if (::fstat(descriptor, &state) != 0)
+        throwSystemError(path);
+    return state.st_size;
+}
+
+QByteArray SystemFile::read(qsizetype most)
+{
+    QByteArray bytes(most, Qt::Uninitialized);
+    qsizetype have = 0;
+    while (have < most) {
+        const ssize_t count = ::read(descriptor, bytes.data() + have, static_cast<size_t>(most - have));
+        if (count == 0)
+            break;
+        if (count < 0 && errno != EINTR)
+            throwSystemError(path);
+        have += qMax<qsizetype>(count, 0);
+    }
+    bytes.truncate(have);
+    return bytes;
+}
+
+void SystemFile::write(const QByteArray& bytes)
+{
+    qsizetype done = 0;
+    while (done < bytes.size()) {
+        const ssize_t count = ::write(descriptor, bytes.constData() + done, static_cast<size_t>(bytes.size() - done));
+        if (count < 0 && errno != EINTR)
+            throwSystemError(path);
+        done += qMax<qsizetype>(count, 0);
+    }
+}
+
+void SystemFile::cutTo(qint64 size)
+{
+    if (::ftruncate(descriptor, size) != 0)
+        throwSystemError(path);
+}
+
+void SystemFile::setMode(unsigned mode)
+{
+    if (::fchmod(descriptor, mode) != 0)
+        throwSystemError(path);
+}
+
+void SystemFile::commit()
+{
+    if (::fsync(descriptor) != 0 && errno != EINVAL && errno != EROFS)  // some file systems can't
+        throwSystemError(path);
+    const int closing = std::exchange(descriptor, -1);
+    if (::close(closing) != 0 && errno != EINTR)
+        throwSystemError(path);
+}
+
+bool isFile(const QString& systemPath)
+{
+    const auto state = stateOf(systemPath);
+    return state && S_ISREG(state->st_mode);
+}
+
+bool isFolder(const QString& systemPath)
+{
+    const auto state = stateOf(systemPath);
+    return state && S_ISDIR(state->st_mode);
+}
+
+void checkReadable(const QString& systemPath)
+{
+    const auto state = stateOf(systemPath);
+    if (!state)
+        throwFileError(isFolder(folderOf(systemPath)) ? FileNotFound : PathNotFound, systemPath);
+    if (!S_ISREG(state->st_mode) || (state->st_mode & anyoneMayRead) == 0)
+        throwFileError(PermissionDenied, systemPath);
+}
+
+void checkWritable(const QString& systemPath)
+{
+    const auto state = stateOf(systemPath);
+    if (state && (!S_ISREG(state->st_mode) || (state->st_mode & anyoneMayWrite) == 0))
+        throwFileError(PermissionDenied, systemPath);
+}
+
+void checkFolderWritable(const QString& systemPath)
+{
+    const auto state = stateOf(folderOf(systemPath));
+    if (!state || !S_ISDIR(state->st_mode))
+        throwFileError(PathNotFound, systemPath);
+    if ((state->st_mode & anyoneMayWrite) == 0)
+        throwFileError(PermissionDenied, systemPath);
+}
+
+void replaceFile(const QString& path, const std::function<void(SystemFile&)>& fill)
+{
+    const QString target = systemPath(path);
+    checkFolderWritable(target);
+    checkWritable(target);
+    const QString temporary = folderOf(target) + u'/' + temporaryName();
+    try {
+        SystemFile file(temporary, O_WRONLY | O_CREAT | O_EXCL);
+        fill(file);
+        if (const auto old = stateOf(target))
+            file.setMode(old->st_mode & 07777);
+        file.commit();
+        renameFile(temporary, target);
+    } catch (...) {
+        ::unlink(encodedPath(temporary).constData());
+        throw;
+    }
+    // what lay there under another spelling takes the new one: at no moment are there two files or none
+    const QString asAsked = spelledPath(path);
+    if (asAsked != target)
+        renameFile(target, asAsked);
+}
+
+bool sameVolume(const QString& from, const QString& to)
+{
+    const auto source = stateOf(from);
+    const auto folder = stateOf(folderOf(to));
+    return source && folder && source->st_dev == folder->st_dev;
+}
+
+void renameFile(const QString& from, const QString& to)
+{
+    if (::rename(encodedPath(from).constData(), encodedPath(to).constData()) != 0)
+        throwSystemError(from);
+    commitFolder(folderOf(to));
+}
+
+void removeFile(const QString& systemPath)
+{
+    checkFolderWritable(systemPath);
+    if (isFolder(systemPath))
+        throwFileError(PermissionDenied, systemPath);
+    if (::unlink(encodedPath(systemPath).constData()) != 0)
+        throwSystemError(systemPath);
+}
+
+bool isTemporaryName(const QString& name)
+{
+    return name.startsWith(".kest-"_L1) && name.endsWith(".tmp"_L1);
+}
+
+}  // namespace kest::files

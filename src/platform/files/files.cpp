@@ -1,0 +1,136 @@
+#include "platform/files/files.h"
+
+#include "platform/RuntimeError.h"
+#include "platform/files/SystemFile.h"
+
+#include <QDir>
+
+#include <fcntl.h>
+
+#include <cerrno>
+
+namespace kest::files {
+
+namespace {
+constexpr qint64 largestFile = 512LL * 1024 * 1024;  // bytes that one read takes into memory
+}
+
+bool exists(const QString& path)
+{
+    return !path.isEmpty() && isFile(systemPath(path));
+}
+
+bool folderExists(const QString& path)
+{
+    return !path.isEmpty() && isFolder(systemPath(path));
+}
+
+qint64 size(const QString& path)
+{
+    const QString place = systemPath(path);
+    checkReadable(place);
+    return SystemFile(place, O_RDONLY).size();
+}
+
+QByteArray readBytes(const QString& path)
+{
+    failOnRequest(path);
+    const QString place = systemPath(path);
+    checkReadable(place);
+    SystemFile file(place, O_RDONLY);
+    const qint64 bytes = file.size();
+    if (bytes > largestFile)
+        throwFileError(FileInputOutput, place);
+    return file.read(bytes);
+}
+
+QString read(const QString& path)
+{
+    return fromCodePage(readBytes(path));
+}
+
+void writeBytes(const QString& path, const QByteArray& bytes)
+{
+    failOnRequest(path);
+    replaceFile(path, [&](SystemFile& file) { file.write(bytes); });
+}
+
+void write(const QString& path, const QString& text)
+{
+    writeBytes(path, toCodePage(text));
+}
+
+void append(const QString& path, const QString& text)
+{
+    failOnRequest(path);
+    const QString place = systemPath(path);
+    checkWritable(place);
+    if (!isFile(place))
+        checkFolderWritable(place);
+    SystemFile file(place, O_WRONLY | O_APPEND | O_CREAT);
+    const qint64 before = file.size();
+    try {
+        file.write(toCodePage(text));
+    } catch (const RuntimeError&) {
+        attempt([&] { file.cutTo(before); });  // no half record stays behind
+        throw;
+    }
+    file.commit();
+}
+
+void copy(const QString& from, const QString& to)
+{
+    constexpr qsizetype piece = 1024 * 1024;
+    failOnRequest(from);
+    const QString source = systemPath(from);
+    checkReadable(source);
+    SystemFile original(source, O_RDONLY);
+    replaceFile(to, [&](SystemFile& file) {
+        for (QByteArray bytes = original.read(piece); !bytes.isEmpty(); bytes = original.read(piece))
+            file.write(bytes);
+    });
+}
+
+void move(const QString& from, const QString& to)
+{
+    failOnRequest(from);
+    const QString source = systemPath(from);
+    const QString target = systemPath(to);
+    checkReadable(source);
+    checkFolderWritable(source);
+    checkFolderWritable(target);
+    checkWritable(target);
+    if (sameVolume(source, target)) {
+        renameFile(source, target);
+        const QString asAsked = spelledPath(to);
+        if (asAsked != target)
+            renameFile(target, asAsked);
+        return;
+    }
+    copy(from, to);
+    removeFile(source);
+}
+
+void remove(const QString& path, Force force)
+{
+    failOnRequest(path);
+    const QString place = systemPath(path);
+    if (force == Force::No)
+        checkWritable(place);
+    removeFile(place);
+}
+
+void makeFolder(const QString& path)
+{
+    const QString place = systemPath(path);
+    if (isFolder(place))
+        return;
+    if (place.isEmpty() || place.contains(QChar(u'\0')))
+        throwFileError(PathNotFound, place);
+    if (isFile(place))
+        throwFileError(FileExists, place);
+    if (!QDir().mkpath(place))
+        throwFileError(PermissionDenied, place);
+}
+
+}  // namespace kest::files
