@@ -1,0 +1,137 @@
+#include "quotedata/QuoteTotals.h"
+
+#include "platform/RuntimeError.h"
+#include "platform/database/Sql.h"
+#include "platform/values.h"
+#include "quotedata/Rounding.h"
+#include "shell/SharedVariables.h"
+
+using namespace Qt::StringLiterals;
+
+namespace kest {
+
+namespace {
+
+enum class EmptyHours { CountAsZero, Fail };
+
+struct SectionTotals {
+    double removeAndReplace = 0;
+    double repair = 0;
+    double paint = 0;
+    double otherPaint = 0;
+    double parts = 0;
+    double miscellaneous = 0;
+
+    double labour() const { return removeAndReplace + repair + paint + otherPaint; }
+};
+
+/// True when no other line points at this one as its deleted counterpart and it is not deleted itself. Leaves `lines`
+/// where it was.
+bool Counts(db::Recordset& lines)
+{
+    const qint64 id = toLong(lines.value(u"itemid"_s));
+    lines.moveFirst();
+    lines.find(sql("deleteditem = {}", id));
+    const bool replaced = !lines.eof();
+    lines.moveFirst();
+    lines.find(sql("itemid = {}", id));
+    const QVariant deleted = lines.value(u"delitem"_s);
+    return !replaced && !deleted.isNull() && !toBool(deleted);
+}
+
+bool IsZero(const QVariant& value)
+{
+    return !value.isNull() && toDouble(value) == 0;
+}
+
+bool IsReportItem(const db::Recordset& line)
+{
+    const QVariant reportOn = line.value(u"Report_on"_s);
+    return !reportOn.isNull() && toBool(reportOn);
+}
+
+/// The rounded product; 0 where one of the factors is 0, whatever the other one holds.
+double Amount(const db::Recordset& line, const QVariant& factor, const QVariant& hours)
+{
+    if (IsZero(hours) || IsZero(factor) || IsReportItem(line))
+        return 0;
+    return RoundAmount(toDouble(factor) * toDouble(hours), 2);
+}
+
+void AddLine(SectionTotals& totals, const db::Recordset& line, EmptyHours emptyHours)
+{
+    const auto hours = [&](const QString& column) {
+        const QVariant value = line.value(column);
+        return value.isNull() && emptyHours == EmptyHours::CountAsZero ? QVariant(0.0) : value;
+    };
+    const QString category = line.text(u"category"_s);
+    if (category == "PRT"_L1)
+        totals.parts += Amount(line, line.value(u"qty"_s), hours(u"rrhour"_s));  // rrhour: selling price of one unit
+    else if (category == "R&R"_L1)
+        totals.removeAndReplace += Amount(line, line.value(u"rr_rate2"_s), hours(u"rrhour"_s));
+    else if (category == "RA"_L1)
+        totals.repair += Amount(line, line.value(u"rr_rate2"_s), hours(u"rahour"_s));
+    else if (category == "PAINT"_L1)
+        totals.paint += Amount(line, line.value(u"rr_rate2"_s), hours(u"pthour"_s));
+    else if (category == "OPG"_L1)
+        totals.otherPaint += Amount(line, line.value(u"opg_rate"_s), hours(u"pthour"_s));
+    else if (category == "MIS"_L1 && !IsReportItem(line))
+        totals.miscellaneous += toDouble(line.value(u"unitcost"_s));
+}
+
+SectionTotals TotalsOf(db::Recordset& lines, EmptyHours emptyHours)
+{
+    SectionTotals totals;
+    if (lines.recordCount() > 0)
+        lines.moveFirst();
+    for (; !lines.eof(); lines.moveNext())
+        if (Counts(lines))
+            AddLine(totals, lines, emptyHours);
+    return totals;
+}
+
+}  // namespace
+
+void CalcQuoteTotals(db::Recordset& quote, db::Recordset& lines)
+{
+    attempt([&] {
+        const SectionTotals totals = TotalsOf(lines, EmptyHours::CountAsZero);
+        quote.set(u"TOTAL"_s, totals.labour());
+        quote.set(u"PRTTOTAL"_s, totals.parts);
+        quote.set(u"MISTOTAL"_s, totals.miscellaneous);
+        quote.set(u"RR_TOTAL"_s, totals.removeAndReplace);
+        quote.set(u"RA_TOTAL"_s, totals.repair);
+        quote.set(u"PAINT_TOTAL"_s, totals.paint);
+        quote.set(u"quotechanged"_s, true);
+        quote.update();
+    });
+}
+
+void CalcAuthorisedTotals(db::Recordset& quote, db::Recordset& lines)
+{
+    attempt([&] {
+        const SectionTotals totals = TotalsOf(lines, EmptyHours::Fail);
+        quote.set(u"TOTAL"_s, totals.labour());
+        quote.set(u"PRTTOTAL"_s, totals.parts);
+        quote.set(u"MISTOTAL"_s, totals.miscellaneous);
+        quote.set(u"quotechanged"_s, true);
+        quote.update();
+    });
+}
+
+void RoundQuoteLines(db::Recordset& quote)
+{
+    db::Recordset lines(gConn);
+    lines.open(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quote.value(u"QTNNO"_s),
+                   quote.value(u"Subquote"_s)));
+    for (; !lines.eof(); lines.moveNext()) {
+        for (const auto& column : {u"unitcost"_s, u"rrhour"_s, u"rahour"_s, u"pthour"_s})
+            if (!lines.text(column).isEmpty())
+                lines.set(column, RoundAmount(toDouble(lines.value(column)), 2));
+        lines.update();
+    }
+    lines.requery();
+    CalcQuoteTotals(quote, lines);
+}
+
+}  // namespace kest

@@ -1,0 +1,40 @@
+#include "quotedata/Rounding.h"
+
+#include "platform/RuntimeError.h"
+#include "platform/desktop/Prompt.h"
+#include "platform/values.h"
+
+using namespace Qt::StringLiterals;
+
+namespace kest {
+
+double RoundAmount(double& value, int places)
+{
+    for (int place = 0; place < places; ++place)
+        value *= 10;
+
+    const auto whole = static_cast<double>(toLong(RoundDown(value)));
+    if (value - whole >= 0.5)
+        value += 1;
+    if (value - whole <= -0.5)
+        value -= 1;
+    value = RoundDown(value);
+
+    for (int place = 0; place < places; ++place)
+        value /= 10;
+    return value;
+}
+
+double RoundDown(const double& value)
+{
+    try {
+        const QString text = numberText(value);
+        const qsizetype point = text.indexOf(u'.');
+        return point < 0 ? value : toDouble(text.left(point + 1));
+    } catch (const RuntimeError& error) {
+        desktop::msgBox(error.description(), desktop::Icon::Information, u"Round Down"_s);
+        return 0;
+    }
+}
+
+}  // namespace kest
