@@ -46,8 +46,7 @@ bool IsZero(const QVariant& value)
 
 bool IsReportItem(const db::Recordset& line)
 {
-    const QVariant reportOn = line.value(u"Report_on"_s);
-    return !reportOn.isNull() && toBool(reportOn);
+    return isTrue(line.value(u"Report_on"_s));
 }
 
 /// The rounded product; 0 where one of the factors is 0, whatever the other one holds.
