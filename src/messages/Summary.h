@@ -21,8 +21,11 @@ struct ListedMessage {
 
 enum MessageFolder : int { Unread = 0, Read = 1, Sent = 2 };
 
-/// Hooks of a fill: who shows the filter that was asked for, and how far the fill is.
+/// What a fill leaves to others.
 struct FillHooks {
+    /// Takes a submission response of the network into its quote; every fill over such a file needs it.
+    std::function<void(QString& text, const QString& file)> submissionResponse;
+    /// Shows the filter that the fill has asked for.
     std::function<void(const QString& filter)> filterAsked;
     std::function<void(qint64 done, qint64 total)> progress;
 };
@@ -30,7 +33,7 @@ struct FillHooks {
 /// Fills from a folder in the order of its file names. Sets gsCurFolder, gsListFolder, gsListFilter, gbFilterAsked.
 /// A file that cannot be parsed is reported by a box and left out; every other failure is thrown, its description
 /// naming the file.
-QList<ListedMessage> BuildMessageList(int folder, const FillHooks& hooks = {});
+QList<ListedMessage> BuildMessageList(int folder, const FillHooks& hooks);
 
 /// False while a picture that the request names has not arrived in the unread folder.
 bool AllImagesPresent(const xml::Document& message);
@@ -39,5 +42,8 @@ bool IsHeldBehindEarlier(const xml::Document& message, QList<ListedMessage>& lis
 /// The row of a network message or, with the type name "SENT", of a wrapped outbound document. Never fails.
 MessageRow GetMessageRow(const QString& text, const QString& typeName);
 MessageRow GetMarkerRow(const QString& text, const QString& typeName);
+/// The same, of a prepared text that was parsed before.
+MessageRow GetMessageRow(const xml::Document& message, const QString& typeName);
+MessageRow GetMarkerRow(const xml::Document& marker, const QString& typeName);
 
 }  // namespace kest
