@@ -26,6 +26,9 @@ struct Input {
     QString title;
 };
 
+/// The title of boxes and input boxes that were given none.
+QString defaultTitle();
+
 /// Whoever answers: real windows, or a script.
 class Answerer {
 public:
@@ -41,10 +44,11 @@ public:
 void setAnswerer(std::shared_ptr<Answerer> answerer);
 std::shared_ptr<Answerer> answerer();
 
-/// A box with one button. The default title of boxes is "KEST".
+/// A box with one button.
 void msgBox(const QString& text, Icon icon = Icon::None, const QString& title = {});
 /// A question with Yes and No; true for Yes. Closing the box answers No.
-bool ask(const QString& text, Icon icon = Icon::Question, const QString& title = {}, Answer defaultAnswer = Answer::Yes);
+bool ask(const QString& text, Icon icon = Icon::Question, const QString& title = {},
+         Answer defaultAnswer = Answer::Yes);
 QString inputBox(const QString& prompt, const QString& title);
 /// Starts the program as a normal window with focus, without waiting for it; a path in the host's form.
 void startProgram(const QString& path);

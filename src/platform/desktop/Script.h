@@ -2,10 +2,13 @@
 #pragma once
 
 #include "platform/desktop/Prompt.h"
+#include "platform/desktop/ScriptStep.h"
 #include "platform/desktop/Window.h"
 
+#include <QHash>
 #include <QJsonArray>
 #include <QJsonObject>
+#include <QSet>
 #include <QString>
 
 namespace kest::desktop {
@@ -20,7 +23,8 @@ struct Record {
 
 /// Answers without a person. Boxes are printed on standard error as `[critical] title: text`; a question takes its
 /// default where the script has no entry for it; an input box without an entry gives the empty text; a window without
-/// visits, other than those that are recorded and closed, throws NeedsAnswer.
+/// visits, other than those that are recorded and closed, throws NeedsAnswer, and so does a step that a person could
+/// not carry out.
 class Script final : public Answerer, public WindowDriver {
 public:
     /// `script` is the script's JSON object, empty for none. Throws RuntimeError for one of another form.
@@ -39,9 +43,28 @@ public:
     void addWindow(const QJsonObject& window) { record_.windows.append(window); }
 
 private:
+    struct Reply {
+        QString text;
+        QString answer;
+    };
+    using Visit = QList<ScriptStep>;
+
+    static QList<Reply> parseReplies(const QJsonObject& script, const QString& key);
+    void parseWindows(const QJsonObject& windows);
+    /// The steps of this showing; the last visit serves all further ones.
+    const Visit& nextVisit(const QString& window);
+    void carryOut(QDialog& window, const Visit& visit);
+
     Record record_;
-    QJsonObject script_;
+    QList<Reply> boxReplies;
+    QList<Reply> inputReplies;
+    QHash<QString, QList<Visit>> visits;
+    QHash<QString, qsizetype> showings;
+    QSet<QString> recordedAndClosed;
 };
+
+/// Puts the script in charge of boxes, input boxes and windows; null leaves nobody in charge.
+void useScript(std::shared_ptr<Script> script);
 
 /// The script that answers now, or null where a person does.
 Script* currentScript();

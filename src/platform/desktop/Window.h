@@ -25,13 +25,19 @@ public:
 };
 void setWindowDriver(std::shared_ptr<WindowDriver> driver);
 
+/// Puts a person in charge: boxes and input boxes are real windows, and windows wait for their user.
+void usePerson();
+
 /// Reports a failure that nobody trapped in a slot; `source` is "window.control_event".
 using FailureReporter = std::function<void(const RuntimeError&, const QString& source)>;
 void setFailureReporter(FailureReporter reporter);
 
 /// Runs one event of a window: a RuntimeError that nobody trapped is reported and the window stays open. What ends an
-/// unattended command is kept, and thrown again by `showModal` outside of Qt's event code.
+/// unattended command is kept, and thrown again by `showModal` outside of Qt's event code. While something is kept no
+/// further event runs.
 void guarded(const QString& source, const std::function<void()>& event);
+/// Throws what `guarded` has kept. For code that lets controls act without showing their window.
+void throwKept();
 
 /// Connects a signal to an event routine through the guard.
 template <class Sender, class Signal, class Routine>

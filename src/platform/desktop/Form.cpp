@@ -1,0 +1,64 @@
+#include "platform/desktop/Form.h"
+
+#include <QKeyEvent>
+#include <QPainter>
+#include <QPushButton>
+
+namespace kest::desktop {
+
+namespace {
+
+constexpr int pictureSize = 24;  // pixels
+
+/// A door with an arrow out of it, in the colour of the text, so that it shows on light and dark desktops.
+QIcon exitPicture(const QPalette& palette)
+{
+    constexpr qreal sharpness = 2;
+    QPixmap picture(QSize(pictureSize, pictureSize) * sharpness);
+    picture.setDevicePixelRatio(sharpness);
+    picture.fill(Qt::transparent);
+    QPainter painter(&picture);
+    painter.setRenderHint(QPainter::Antialiasing);
+    painter.setPen(QPen(palette.color(QPalette::ButtonText), 2, Qt::SolidLine, Qt::RoundCap, Qt::RoundJoin));
+    painter.drawPolyline(QPolygonF({{13, 7}, {13, 3}, {3, 3}, {3, 21}, {13, 21}, {13, 17}}));
+    painter.drawLine(QPointF(8, 12), QPointF(21, 12));
+    painter.drawPolyline(QPolygonF({{17, 8}, {21, 12}, {17, 16}}));
+    return picture;
+}
+
+}  // namespace
+
+Form::Form(const QString& name, const QString& caption) : QDialog(nullptr)
+{
+    setObjectName(name);
+    setWindowTitle(caption);
+}
+
+void Form::showEvent(QShowEvent* event)
+{
+    for (QPushButton* button : findChildren<QPushButton*>())
+        button->setAutoDefault(false);
+    QDialog::showEvent(event);
+}
+
+void Form::keyPressEvent(QKeyEvent* event)
+{
+    if (event->matches(QKeySequence::Cancel))
+        close();
+    else
+        QDialog::keyPressEvent(event);
+}
+
+QPushButton* exitButton(QWidget* parent, const QString& name, const QString& tip)
+{
+    auto* button = new QPushButton(parent);
+    button->setObjectName(name);
+    button->setIcon(exitPicture(button->palette()));
+    button->setIconSize({pictureSize, pictureSize});
+    button->setToolTip(tip);
+    button->setAccessibleName(tip);
+    button->setAutoDefault(false);
+    return button;
+}
+
+}  // namespace kest::desktop

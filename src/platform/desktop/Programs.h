@@ -1,0 +1,11 @@
+// Starts another program and leaves it to itself.
+#pragma once
+
+#include <QString>
+
+namespace kest::desktop {
+
+/// Throws FileNotFound, or PermissionDenied for a file that this system cannot run.
+void startDetached(const QString& systemPath);
+
+}  // namespace kest::desktop

@@ -1,0 +1,124 @@
+#include "platform/desktop/Window.h"
+
+#include "platform/desktop/WindowLayout.h"
+
+#include <QApplication>
+#include <QPointer>
+#include <QScreen>
+
+#include <exception>
+
+namespace kest::desktop {
+
+namespace {
+
+constexpr double twipsPerInch = 1440;
+
+std::shared_ptr<WindowDriver> windowDriver;
+FailureReporter failureReporter;
+std::exception_ptr kept;
+QList<QDialog*> shownWindows;  // the innermost last
+
+void keep(const std::exception_ptr& exception)
+{
+    if (!kept)
+        kept = exception;
+    if (!shownWindows.isEmpty())
+        shownWindows.last()->hide();  // ends its event loop, whatever its close box would say
+}
+
+class Shown {
+public:
+    explicit Shown(QDialog& window) : caller(QApplication::activeWindow()) { shownWindows.append(&window); }
+    ~Shown()
+    {
+        shownWindows.removeLast();
+        if (caller && caller->isVisible())
+            caller->activateWindow();
+    }
+    Q_DISABLE_COPY_MOVE(Shown)
+
+private:
+    QPointer<QWidget> caller;
+};
+
+double dotsPerInch()
+{
+    const QScreen* screen = QGuiApplication::primaryScreen();
+    return screen ? screen->logicalDotsPerInch() : 96;
+}
+
+}  // namespace
+
+void showModal(QDialog& window)
+{
+    throwKept();
+    if (!window.testAttribute(Qt::WA_Resized))
+        window.adjustSize();
+    WindowLayout layout(window);
+    centre(window);
+    {
+        const Shown shown(window);
+        const std::shared_ptr<WindowDriver> driver = windowDriver;
+        if (!driver || !driver->drive(window))
+            window.exec();
+    }
+    layout.remember();
+    throwKept();
+}
+
+void setWindowDriver(std::shared_ptr<WindowDriver> driver)
+{
+    windowDriver = std::move(driver);
+}
+
+void setFailureReporter(FailureReporter reporter)
+{
+    failureReporter = std::move(reporter);
+}
+
+void guarded(const QString& source, const std::function<void()>& event)
+{
+    if (kept)
+        return;
+    try {
+        try {
+            event();
+        } catch (const RuntimeError& error) {
+            if (!failureReporter)
+                throw;
+            attempt([&] { failureReporter(error, source); });
+        }
+    } catch (...) {
+        keep(std::current_exception());
+    }
+}
+
+void throwKept()
+{
+    if (kept)
+        std::rethrow_exception(std::exchange(kept, nullptr));
+}
+
+int pixels(int twips)
+{
+    return qRound(twips * dotsPerInch() / twipsPerInch);
+}
+
+QSize pixels(int widthTwips, int heightTwips)
+{
+    return {pixels(widthTwips), pixels(heightTwips)};
+}
+
+int twips(int pixels)
+{
+    return qRound(pixels * twipsPerInch / dotsPerInch());
+}
+
+void centre(QWidget& window)
+{
+    const QPoint middle = window.screen()->availableGeometry().center();
+    window.move(middle - QPoint(window.frameGeometry().width() / 2, window.frameGeometry().height() / 2));
+}
+
+}  // namespace kest::desktop

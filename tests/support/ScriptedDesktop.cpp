@@ -1,0 +1,77 @@
+#include "support/ScriptedDesktop.h"
+
+#include <QJsonDocument>
+
+#include <gtest/gtest.h>
+
+#include <stdexcept>
+
+namespace kest::test {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+QJsonObject parsed(const char* text)
+{
+    QJsonParseError error;
+    const QJsonDocument document = QJsonDocument::fromJson(text, &error);
+    if (!document.isObject())
+        throw std::invalid_argument("the test's script is no JSON object: " + error.errorString().toStdString());
+    return document.object();
+}
+
+QStringList texts(const QJsonArray& entries, const QString& key)
+{
+    QStringList result;
+    for (const QJsonValue entry : entries)
+        result.append(entry[key].toString());
+    return result;
+}
+
+}  // namespace
+
+ScriptedDesktop::ScriptedDesktop(const char* json) : script(std::make_shared<desktop::Script>(parsed(json)))
+{
+    for (const QString& window : {u"frmPrintPreview"_s, u"frmSubletAuth"_s, u"frmViewPDF"_s})
+        script->recordAndClose(window);
+    desktop::useScript(script);
+}
+
+ScriptedDesktop::~ScriptedDesktop()
+{
+    desktop::useScript(nullptr);
+    EXPECT_NO_THROW(desktop::throwKept());
+}
+
+QStringList ScriptedDesktop::boxTexts() const
+{
+    return texts(record().boxes, u"text"_s);
+}
+
+QStringList ScriptedDesktop::boxes() const
+{
+    QStringList result;
+    for (const QJsonValue box : record().boxes)
+        result.append(QStringList{box[u"icon"_s].toString(), box[u"title"_s].toString(), box[u"text"_s].toString(),
+                                  box[u"answer"_s].toString()}
+                          .join(u'|'));
+    return result;
+}
+
+QStringList ScriptedDesktop::prompts() const
+{
+    return texts(record().inputs, u"prompt"_s);
+}
+
+QJsonValue ScriptedDesktop::read(const QString& control, const QString& what) const
+{
+    for (qsizetype at = record().reads.size(); at-- > 0;) {
+        const QJsonValue seen = record().reads[at][u"values"_s][control];
+        if (seen.isObject())
+            return seen[what];
+    }
+    return QJsonValue::Null;
+}
+
+}  // namespace kest::test
