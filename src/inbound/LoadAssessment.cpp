@@ -1,0 +1,127 @@
+// What became of a quote after it was sent: adjustments, assessment results and their back-outs, submission responses.
+#include "inbound/modLoadXML.h"
+#include "messages/Envelope.h"
+#include "platform/database/Sql.h"
+#include "platform/desktop/Prompt.h"
+#include "quotedata/NoteChain.h"
+#include "quotedata/StateTable.h"
+#include "shell/Helpers.h"
+
+#include <utility>
+
+namespace kest {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+constexpr std::pair<QLatin1StringView, QLatin1StringView> reasonTexts[] = {
+    {"UNSP"_L1, "Unspecified Reason"_L1}, {"INCO"_L1, "Quote Incomplete"_L1}, {"LABR"_L1, "Labour Price"_L1},
+    {"PART"_L1, "Part Price"_L1},         {"PAIN"_L1, "Paint Price"_L1},      {"RECY"_L1, "Recycled Parts"_L1},
+    {"METH"_L1, "Method of Repair"_L1},   {"TLSS"_L1, "Total Loss"_L1},       {"NOTP"_L1, "Repair not Proceeding"_L1},
+};
+
+QString ReasonText(const QString& code)
+{
+    for (const auto& [known, text] : reasonTexts) {
+        if (known == code)
+            return text;
+    }
+    return u"Unknown Reason Code - "_s + code;
+}
+
+bool RefuseRequestNumber()
+{
+    return Refuse(u"Couldn't Locate Matching KEST Quote Request Number, Please contact MarlinDesk Support."_s);
+}
+
+/// The state that a quote goes back to. An authorisation is told from a failed tender by its number, a rejected
+/// supplementary quote by its note.
+const Transition& BackOutOf(const db::Recordset& quote, const db::Recordset& notes)
+{
+    if (!IsSupplementary(quote))
+        return quote.text(u"KESTAuthNo"_s).isEmpty() ? failedTenderBackedOut : authorisationBackedOut;
+    const bool rejected = !GetNoteStatus(u"Rejected"_s, notes.text(u"remarks"_s)).isEmpty();
+    return rejected ? rejectionBackedOut : supplementaryBackedOut;
+}
+
+}  // namespace
+
+bool LoadADQT(QString& text, const QString&)
+{
+    const xml::Document message = ParsedMessage(text);
+    const auto [number, subquote] =
+        SplitQuoteRef(message.textOf(u"//rootns:getAdjustedQuoteResponse/rootns:quoteBody/rootns:quoteReference"_s));
+    const QString request = message.textOf(u"//rootns:quoteRequestNumber"_s);
+
+    db::Recordset quote = Opened(
+        sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}' AND KESTQRNo='{}'", number, subquote, request));
+    if (quote.eof())
+        quote = Opened(sql("SELECT TOP 1 * FROM QUOTE1 WHERE KESTQRNo='{}' order by rec_id DESC", request));
+    if (quote.eof())
+        return Refuse(u"Error locating Quote in Database, Please contact Marlindesk Support."_s);
+
+    const db::Recordset lines = Opened(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'",
+                                           quote.value(u"QTNNO"_s), quote.value(u"Subquote"_s)));
+    db::Recordset notes = OpenNotes(quote);
+    if (lines.eof()) {
+        desktop::msgBox(u"Error: Cannot load an Adjustment onto a blank quote!"_s);
+        return false;
+    }
+
+    Apply(adjustmentSuggested, quote, notes);
+    quote.update();
+    notes.update();
+    return true;
+}
+
+bool LoadARES(QString& text, const QString&)
+{
+    const xml::Document message = ParsedMessage(text);
+    const QString number = message.textOf(u"//rootns:getAssmntResultResponse/rootns:kestOriginalQuoteNumber"_s);
+    db::Recordset quote = Opened(sql("SELECT * FROM QUOTE1 WHERE KESTQuoteNo='{}' ORDER BY rec_id DESC", number));
+    if (quote.eof())
+        return RefuseRequestNumber();
+    quote.moveLast();  // the oldest quote with that number
+    db::Recordset notes = OpenNotes(quote);
+
+    const QString code = message.textOf(u"//rootns:getAssmntResultResponse/rootns:reasonCode"_s).toUpper();
+    const Transition& lost = code == u"TLSS"_s ? totalLoss : tenderFailed;
+    Apply(IsSupplementary(quote) ? supplementaryRejected : lost, quote, notes, ReasonText(code));
+    quote.update();
+    notes.update();
+    return true;
+}
+
+bool LoadBACA(QString& text, const QString&)
+{
+    const xml::Document message = ParsedMessage(text);
+    const QString request = message.textOf(u"//rootns:getBackoutAssmntResponse/rootns:kestQuoteRequestNumber"_s);
+    db::Recordset quote = Opened(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request));
+    if (quote.eof())
+        return RefuseRequestNumber();
+    db::Recordset notes = OpenNotes(quote);  // of the newest quote of the request
+
+    Apply(BackOutOf(quote, notes), quote, notes);
+    quote.update();
+    notes.update();
+    return true;
+}
+
+void LoadSubmissionResponse(QString& text, const QString& fileName)
+{
+    const QString number = fileName.section(u'_', 1, 1);
+    const QString subquote = fileName.section(u'_', 2).left(1);
+    db::Recordset quote = Opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+    db::Recordset notes = Opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+
+    const xml::Document message = ParsedMessage(text);
+    const xml::Node root = message.documentElement();
+    quote.set(u"KESTQuoteNo"_s, root.textOf(u"rootns:kestQuoteNumber"_s));
+    if (root.textOf(u"rootns:quoteSubmissionStatus"_s) == u"Submitted"_s)
+        Apply(quoteSubmitted, quote, notes);
+    quote.update();
+    notes.update();
+}
+
+}  // namespace kest

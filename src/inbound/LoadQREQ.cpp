@@ -1,0 +1,368 @@
+// A quote request becomes a new, empty quote of the shop, with car, customer, note and photographs.
+#include "inbound/modLoadXML.h"
+#include "messages/Envelope.h"
+#include "platform/database/Sql.h"
+#include "platform/files/files.h"
+#include "platform/values.h"
+#include "quotedata/StateTable.h"
+#include "shell/Helpers.h"
+#include "shell/SharedVariables.h"
+
+#include <QStringList>
+
+#include <utility>
+
+namespace kest {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+constexpr QLatin1StringView universalInsurer = "KEST Universal Insurer"_L1;
+
+constexpr std::pair<QLatin1StringView, QLatin1StringView> paintGroups[] = {
+    {"SOLD"_L1, "S1"_L1}, {"CLER"_L1, "S2"_L1}, {"META"_L1, "M1"_L1}, {"PEAR"_L1, "M2"_L1}, {"HARL"_L1, "M3"_L1},
+};
+
+QString PaintGroup(const QString& paintType)
+{
+    for (const auto& [type, group] : paintGroups) {
+        if (type == paintType)
+            return group;
+    }
+    return u"S3"_s;
+}
+
+QString Transmission(const QString& code)
+{
+    if (code == u"A"_s)
+        return u"Automatic"_s;
+    return code == u"M"_s ? u"Manual"_s : code;
+}
+
+/// What the message tells and the load stores. Reading it fails for every element that is missing or malformed, those
+/// that only the report shows included: before anything is written.
+struct Request {
+    explicit Request(const xml::Document& message);
+
+    QString companyName;
+    QString title;
+    QString firstName;
+    QString surname;
+    bool extraInformation;
+    qint64 builtYear;
+    qint64 builtMonth;
+    QString transmission;
+    QString cylinders;
+    QString vin;
+    QString colourCode;
+    QString paintType;
+    QString odometer;
+};
+
+Request::Request(const xml::Document& message)
+{
+    for (const QLatin1StringView shownOnly :
+         {"claimDescription"_L1, "claimManager"_L1, "corporateCustomer"_L1, "vehicleLocation"_L1, "bayNumber"_L1,
+          "vehicleDescription"_L1, "instructions"_L1, "extraVehicleInformation/rootns:make"_L1,
+          "extraVehicleInformation/rootns:bodyShape"_L1, "extraVehicleInformation/rootns:fuelLevel"_L1,
+          "extraVehicleInformation/rootns:damageDescription"_L1,
+          "extraVehicleInformation/rootns:oldDamageDescription"_L1})
+        message.textOf(u"//rootns:"_s + shownOnly);
+
+    if (const xml::Node company = message.selectSingleNode(u"//rootns:claimCustomer/rootns:companyName"_s)) {
+        companyName = company.text().left(35);
+    } else {
+        title = message.textOf(u"//rootns:claimCustomer/rootns:title"_s).left(10);
+        firstName = message.textOf(u"//rootns:claimCustomer/rootns:firstName"_s).left(25);
+        surname = message.textOf(u"//rootns:claimCustomer/rootns:surname"_s).left(35);
+    }
+    toBool(message.textOf(u"//rootns:offsiteQuoting"_s));
+    extraInformation = toBool(message.textOf(u"//rootns:extraQuoteInformationRequested"_s));
+    FormatNetworkDate(message.textOf(u"//rootns:quoteDueTime"_s));
+
+    const auto extra = [&](QLatin1StringView name) {
+        return message.textOf(u"//rootns:extraVehicleInformation/rootns:"_s + name);
+    };
+    builtYear = toLong(SafeVal(extra("yearOfManufacture"_L1), u"0"_s));
+    builtMonth = toLong(SafeVal(extra("monthOfManufacture"_L1), u"0"_s));
+    transmission = extra("transmissionType"_L1);
+    cylinders = extra("numberOfCylinders"_L1);
+    vin = extra("vinChassis"_L1);
+    colourCode = extra("color"_L1);
+    paintType = extra("paintType"_L1);
+    odometer = extra("odometer"_L1);
+}
+
+/// Stands on the insurer that requests are made out to; false where there is none.
+bool ChooseInsurer(db::Recordset& insurer)
+{
+    if (insurer.eof())
+        return false;
+    if (insurer.recordCount() == 2 && insurer.text(u"NAME"_s) == universalInsurer)
+        insurer.moveNext();
+    else if (insurer.recordCount() > 2)
+        insurer.find(sql("name='{}'", QString(universalInsurer)));
+    return true;
+}
+
+/// The car's customer, or the one of that name; a new row where there is none.
+db::Recordset OpenCustomer(const db::Recordset& car, const Request& request)
+{
+    db::Recordset customer(gConn);
+    if (!car.eof()) {
+        customer.open(sql("SELECT * FROM CUSTOMER WHERE CUST_ID={}", car.value(u"CUST_ID"_s)));
+    } else if (!request.firstName.isEmpty()) {
+        const QString firstWord = request.firstName.split(u' ', Qt::SkipEmptyParts).value(0);
+        customer.open(sql("SELECT * FROM CUSTOMER WHERE NAME='{}' AND FIRSTNAME LIKE '{}%'", request.surname.trimmed(),
+                          firstWord));
+    } else {
+        customer.open(sql("SELECT * FROM CUSTOMER WHERE NAME='{}' AND FIRSTNAME = ''", request.companyName.trimmed()));
+    }
+    return customer;
+}
+
+struct Column {
+    QLatin1StringView name;
+    QVariant value;
+};
+
+void Fill(db::Recordset& row, std::initializer_list<Column> columns)
+{
+    for (const Column& column : columns)
+        row.set(column.name, column.value);
+}
+
+void FillCustomer(db::Recordset& customer, const Request& request)
+{
+    const QString none = u""_s;
+    Fill(customer, {
+                       {"NAME"_L1, request.companyName.isEmpty() ? request.surname : request.companyName},
+                       {"FIRSTNAME"_L1, request.firstName},
+                       {"SALUTATION"_L1, request.title},
+                       {"Account"_L1, 190},
+                       {"street"_L1, none},
+                       {"suburb"_L1, none},
+                       {"PHONE_B"_L1, none},
+                       {"Fax"_L1, none},
+                       {"PHONE_P"_L1, none},
+                       {"email"_L1, none},
+                       {"mobile"_L1, none},
+                   });
+}
+
+/// Puts a known car's colour in the spelling of the colour table, and empties one that is not in it.
+void RespellColour(db::Recordset& car, db::Recordset& colours)
+{
+    const QString colour = car.text(u"COLOUR"_s);
+    if (colour.isEmpty())
+        return;
+    colours.find(sql("Script='{}'", colour));
+    car.set(u"COLOUR"_s, colours.eof() ? u""_s : colours.text(u"Script"_s).trimmed());
+}
+
+QString BuildDate(const Request& request)
+{
+    if (request.builtYear <= 0)
+        return u""_s;
+    const qint64 month = request.builtMonth > 0 ? request.builtMonth : 1;
+    return PadZeroLeft(QString::number(month), 2) + u'/' + QString::number(request.builtYear);
+}
+
+QString ColourOf(const QString& code, db::Recordset& colours)
+{
+    if (code.isEmpty())
+        return u""_s;
+    colours.find(sql("Code='{}'", code));
+    return colours.eof() ? u""_s : colours.text(u"Script"_s).trimmed();
+}
+
+void FillNewCar(db::Recordset& car, const QString& rego, const Request& request, db::Recordset& colours)
+{
+    const db::Recordset model = Opened(u"SELECT * FROM MODEL WHERE MODEL_ID1='Z000'"_s);
+    const QString none = u""_s;
+    Fill(car, {
+                  {"PAINT_GP"_L1, PaintGroup(request.paintType)},
+                  {"REGO"_L1, rego},
+                  {"KEST"_L1, 1},
+                  {"MODEL_ID"_L1, model.value(u"MODEL_ID"_s)},
+                  {"BODY_ID"_L1, u"4"_s},
+                  {"BODY_ID2"_L1, u"4S"_s},
+                  {"ENGINE"_L1, none},
+                  {"SCHEDULE"_L1, none},
+                  {"MTA_SCHED"_L1, none},
+                  {"TRI_SCHED"_L1, none},
+                  {"UN_SCHED"_L1, none},
+                  {"paint_code"_L1, none},
+                  {"TRIM_CODE"_L1, none},
+                  {"OPT_CODE"_L1, none},
+                  {"MODEL_NO"_L1, none},
+                  {"Year"_L1, BuildDate(request)},
+                  {"COLOUR"_L1, ColourOf(request.colourCode, colours)},
+                  {"VIN"_L1, request.vin},
+                  {"XMission"_L1, Transmission(request.transmission)},
+              });
+    if (!request.cylinders.isEmpty())
+        car.set(u"CYLINDERS"_s, SafeVal(request.cylinders, u"0"_s));
+}
+
+void FillQuote(db::Recordset& quote, const Request& request, const db::Recordset& insurer, const db::Recordset& cinfo)
+{
+    Fill(quote, {
+                    {"QUOTER"_L1, u""_s},
+                    {"qtndate"_L1, shortDate(QDate::currentDate())},
+                    {"INSURER_ID"_L1, insurer.value(u"INSURER_ID"_s)},
+                    {"RR_RATE"_L1, insurer.value(u"RR_RATE"_s)},
+                    {"RA_RATE"_L1, insurer.value(u"RA_RATE"_s)},
+                    {"QSENT"_L1, u"R"_s},
+                    {"excess"_L1, 0},
+                    {"contri"_L1, 0},
+                    {"RR_TOTAL"_L1, 0},
+                    {"RA_TOTAL"_L1, 0},
+                    {"PAINT_TOTAL"_L1, 0},
+                    {"CONTACTID"_L1, 0},
+                    {"NEWPC"_L1, insurer.value(u"new_mu"_s)},
+                    {"SECONDPC"_L1, cinfo.value(u"second_mu"_s)},
+                    {"RECOREPC"_L1, cinfo.value(u"recore_mu"_s)},
+                    {"AFTERPC"_L1, cinfo.value(u"after_mu"_s)},
+                    {"assess"_L1, u""_s},
+                    {"excess_gst"_L1, insurer.isNull(u"excess_gst"_s) ? 2 : insurer.value(u"excess_gst"_s)},
+                    {"TOTAL"_L1, 0},
+                    {"PRTTOTAL"_L1, 0},
+                    {"MISTOTAL"_L1, 0},
+                    {"override"_L1, 0},
+                    {"rr_override"_L1, 0},
+                    {"ra_override"_L1, 0},
+                    {"paint_override"_L1, 0},
+                    {"quotechanged"_L1, true},
+                    {"invoiced"_L1, false},
+                    {"Type"_L1, u"MTA"_s},
+                    {"ExtraInfo"_L1, request.extraInformation},
+                });
+    if (!request.odometer.isEmpty())
+        quote.set(u"kms"_s, request.odometer);
+}
+
+/// Takes the request's pictures that have arrived into the host's images of the quote.
+void TakePhotographs(const xml::Node& root, const QString& requestNumber, const QString& quoteNumber)
+{
+    for (const xml::Node& imageId : root.selectNodes(u"rootns:quoteRequestImageIds/*"_s)) {
+        const QString arrived = requestNumber + u'_' + PadZeroLeft(imageId.text(), 3);
+        if (!files::isPlainName(arrived) || !files::exists(gsUnreadPath + arrived + u".jpg"_s))
+            continue;
+        const QString name =
+            quoteNumber + u"_0"_s + PadZeroLeft(QString::number(NextImageNumber(quoteNumber)), 3) + u".jpg"_s;
+        files::move(gsUnreadPath + arrived + u".jpg"_s, files::pathForWriting(gsImagesPath, name));
+        if (files::exists(gsUnreadPath + arrived + u".txt"_s))
+            files::remove(gsUnreadPath + arrived + u".txt"_s);
+    }
+}
+
+}  // namespace
+
+bool LoadQREQ(QString& text, const QString&)
+{
+    const xml::Document message = ParsedMessage(text);
+
+    db::Recordset cinfo = Opened(u"SELECT * FROM CINFO"_s);
+    db::Recordset insurer = Opened(u"SELECT * FROM INSURER WHERE KEST=1 or name='KEST Universal Insurer'"_s);
+    if (!ChooseInsurer(insurer))
+        return Refuse(u"Error locating a valid insurer, Please contact MarlinDesk Support."_s);
+
+    db::Recordset quote(gConn);
+    const QString quoteNumber = NextQuoteNumber({}, cinfo, quote, false);
+    db::Recordset notes = Opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}'", quoteNumber));
+    const QString rego = NormaliseRego(message.textOf(u"//rootns:vehicleRegistration"_s));
+    db::Recordset car = Opened(sql("SELECT * FROM CAR WHERE REGO='{}'", rego));
+    db::Recordset colours = Opened(u"SELECT * FROM KESTColours"_s);
+
+    const QString requestNumber = message.textOf(u"//rootns:quoteRequestNumber"_s);
+    const QString version = message.textOf(u"//rootns:quoteRequestVersionNumber"_s);
+    const QString claim = message.textOf(u"//rootns:claimNumber"_s);
+    const db::Recordset known = Opened(
+        sql("SELECT * FROM QUOTE1 WHERE SUBQUOTE=0 AND KESTQRNO='{}' AND KESTQRVER='{}'", requestNumber, version));
+    if (!known.eof())
+        return Refuse(u"Quote Request already exists as quote number "_s + known.text(u"QTNNO"_s) + u'!');
+    const Request request(message);
+
+    const bool carFound = !car.eof();
+    if (carFound) {
+        car.set(u"KEST"_s, 1);
+        car.update();
+    }
+    db::Recordset customer = OpenCustomer(car, request);
+    const bool customerFound = !customer.eof();
+    if (!customerFound)
+        customer.addNew();
+    if (!carFound)
+        car.addNew();
+    quote.addNew();
+    if (notes.eof())
+        notes.addNew();
+
+    FillQuote(quote, request, insurer, cinfo);
+    Fill(quote, {{"QTNNO"_L1, quoteNumber},
+                 {"Subquote"_L1, 0},
+                 {"KESTQRNo"_L1, requestNumber},
+                 {"KESTQRVer"_L1, version},
+                 {"Claim"_L1, claim},
+                 {"REGO"_L1, rego}});
+    Fill(notes, {{"QTNNO"_L1, quoteNumber}, {"Subquote"_L1, 0}});
+    Apply(quoteRequested, quote, notes);
+    if (!customerFound)
+        FillCustomer(customer, request);
+    if (carFound)
+        RespellColour(car, colours);
+    else
+        FillNewCar(car, rego, request, colours);
+    quote.set(u"paint_rate"_s, insurer.value(car.text(u"PAINT_GP"_s) + u"_RATE"_s));
+
+    customer.update();
+    car.set(u"CUST_ID"_s, customer.value(u"CUST_ID"_s));  // a new customer has its number only now
+    car.update();
+    quote.update();
+    notes.update();
+
+    TakePhotographs(message.documentElement(), requestNumber, quoteNumber);
+
+    db::Recordset tried(gConn);
+    cinfo.set(u"QUOTE_VAL"_s, NextQuoteNumber(quoteNumber, cinfo, tried, true));
+    cinfo.update();
+    return true;
+}
+
+QString NextQuoteNumber(const QString& given, const db::Recordset& cinfo, db::Recordset& quote, bool valueOnly)
+{
+    const QString prefix = cinfo.text(u"QUOTE_PRE"_s);
+    const QString suffix = cinfo.text(u"QUOTE_SUF"_s);
+    const auto isTaken = [&](const QString& number) {
+        if (quote.isOpen())
+            quote.close();
+        quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}'", valueOnly ? prefix + number + suffix : number));
+        return !quote.eof();
+    };
+    const auto counted = [&](const QString& value) { return valueOnly ? value : prefix + value + suffix; };
+
+    const bool usable = given != u"MANQ"_s && given.size() >= 2 && given.size() <= 8;
+    QString number = usable ? given : counted(cinfo.text(u"QUOTE_VAL"_s));
+    for (qint64 counter = 1; isTaken(number); ++counter)
+        number = counted(QString::number(toLong(cinfo.value(u"QUOTE_VAL"_s)) + counter));
+    return number;
+}
+
+int NextImageNumber(const QString& quoteNumber)
+{
+    int highest = 0;
+    for (const QString& name : files::list(gsImagesPath, quoteNumber + u"_*"_s)) {
+        // Behind the number, "_" and the subquote's digit. Without regard to case, as the folder finds names.
+        if (!name.startsWith(quoteNumber + u'_', Qt::CaseInsensitive))
+            continue;
+        bool isNumber = false;
+        const int number = name.sliced(quoteNumber.size()).mid(2, 3).toInt(&isNumber);
+        if (isNumber)
+            highest = qMax(highest, number);
+    }
+    return highest + 1;
+}
+
+}  // namespace kest

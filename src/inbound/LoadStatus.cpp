@@ -1,0 +1,189 @@
+// The six messages that move a quote through its network life without touching its lines.
+#include "inbound/modLoadXML.h"
+#include "messages/Envelope.h"
+#include "platform/database/Sql.h"
+#include "platform/desktop/Prompt.h"
+#include "platform/values.h"
+#include "quotedata/StateTable.h"
+#include "shell/Helpers.h"
+#include "shell/SharedVariables.h"
+
+#include <QStringList>
+
+namespace kest {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+constexpr QLatin1StringView quoteReference = "//rootns:getQuoteResponse/rootns:quoteBody/rootns:quoteReference"_L1;
+
+constexpr QLatin1StringView noSuchQuote = "Couldn't Locate Matching KEST Quote, Please contact MarlinDesk Support."_L1;
+constexpr QLatin1StringView noSuchQuoteNumber =
+    "Couldn't Locate Matching KEST Quote Number, Please contact MarlinDesk Support."_L1;
+constexpr QLatin1StringView noSuchRequest =
+    "Couldn't Locate Matching KEST Quote Request Number, Please contact MarlinDesk Support."_L1;
+
+db::Recordset OpenByReference(const QString& reference)
+{
+    const auto [number, subquote] = SplitQuoteRef(reference);
+    return Opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+}
+
+void tell(const QStringList& lines)
+{
+    desktop::msgBox(lines.join(u"\r\n"_s), desktop::Icon::Information);
+}
+
+/// As a rule the main quote; `eof` where the request has none.
+db::Recordset OpenOldestOfRequest(const QString& request)
+{
+    db::Recordset quote = Opened(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request));
+    if (!quote.eof())
+        quote.moveLast();
+    return quote;
+}
+
+bool AgreesToDeletion()
+{
+    const QStringList lines{
+        u"This Supplimentary Quote will be DELETED."_s,
+        u"If you require a record of this quote please print a copy before loading this message."_s,
+        u"Do you still want to continue loading this message?"_s,
+    };
+    return desktop::ask(lines.join(u"\r\n"_s), desktop::Icon::None, {}, desktop::Answer::No);
+}
+
+void DeleteQuoteRows(const QVariant& number, const QVariant& subquote)
+{
+    gConn->execute(sql("DELETE FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE={}", number, subquote));
+    gConn->execute(sql("DELETE FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE={}", number, subquote));
+    gConn->execute(sql("DELETE FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE={}", number, subquote));
+}
+
+}  // namespace
+
+bool LoadQMQR(QString& text, const QString&)
+{
+    const xml::Document message = ParsedMessage(text);
+    db::Recordset quote = OpenByReference(message.textOf(quoteReference));
+    if (quote.eof())
+        return Refuse(noSuchQuote);
+    db::Recordset notes = OpenNotes(quote);
+
+    quote.set(u"KESTQuoteNo"_s, message.textOf(u"//rootns:getQuoteResponse/rootns:kestQuoteNumber"_s));
+    quote.set(u"KESTQRNo"_s, message.textOf(u"//rootns:getQuoteResponse/rootns:quoteRequestNumber"_s));
+    quote.set(u"KESTQRVer"_s, 1);
+    quote.set(u"Claim"_s, message.textOf(u"//rootns:getQuoteResponse/rootns:claimNumber"_s));
+    quote.set(u"ExtraInfo"_s, true);
+    Apply(quoteMatched, quote, notes);
+    quote.update();
+    notes.update();
+    return true;
+}
+
+bool LoadEWAP(QString& text, const QString&)
+{
+    const xml::Document message = ParsedMessage(text);
+    const QString reference = message.textOf(quoteReference);
+    db::Recordset quote = OpenByReference(reference);
+    if (quote.eof())
+        return Refuse(noSuchQuote);
+    db::Recordset notes = OpenNotes(quote);
+
+    quote.set(u"excess"_s, 0);
+    Apply(excessWaived, quote, notes);
+    desktop::msgBox(
+        u"ORLA has removed the excess from this quote due to a special arrangement, "
+        "Please update your invoices accordingly.\r\nQuote: "_s +
+        reference);
+    quote.update();
+    notes.update();
+    return true;
+}
+
+bool LoadQTDL(QString& text, const QString&)
+{
+    const xml::Document message = ParsedMessage(text);
+    const QString networkNumber = message.textOf(u"//rootns:getQuoteDeletionResponse/rootns:kestQuoteNumber"_s);
+    db::Recordset quote = Opened(sql("SELECT * FROM QUOTE1 WHERE KESTQuoteNo='{}'", networkNumber));
+    if (quote.eof())
+        return Refuse(noSuchQuoteNumber);
+
+    const QVariant number = quote.value(u"QTNNO"_s);
+    const QVariant subquote = quote.value(u"Subquote"_s);
+    const QString label = QuoteLabel(quote);
+    const QString reason = message.textOf(u"//rootns:getQuoteDeletionResponse/rootns:reason"_s);
+    gsDeletedQTNNO = textOrEmpty(number);  // the file is named after a quote that may be gone by then
+    gsDeletedSubquote = textOrEmpty(subquote);
+
+    // The notes go to the main quote, also where a supplementary quote is deleted.
+    db::Recordset notes = Opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='0'", number));
+    bool taken = true;
+    if (!IsSupplementary(quote)) {
+        Apply(quoteDeleted, quote, notes, reason);
+        quote.update();
+        notes.update();
+    } else if ((taken = AgreesToDeletion())) {
+        DeleteQuoteRows(number, subquote);
+        Apply(supplementaryDeleted, quote, notes, label);
+        notes.update();
+    }
+
+    tell({u"ORLA has requested quote "_s + label + u" be deleted."_s, u"Reason: "_s + reason,
+          u"If you want to revise, please re-open and edit the quote then re-send to the insurer."_s});
+    return taken;
+}
+
+bool LoadRRQT(QString& text, const QString&)
+{
+    const xml::Document message = ParsedMessage(text);
+    const QString request = message.textOf(u"//rootns:getReqForRevQteResponse/rootns:quoteRequestNumber"_s);
+    db::Recordset quote = Opened(sql("SELECT TOP 1 * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request));
+    if (quote.eof())
+        return Refuse(noSuchRequest);
+    db::Recordset notes = OpenNotes(quote);
+
+    const QString comments = message.textOf(u"//rootns:getReqForRevQteResponse/rootns:comments"_s);
+    quote.set(u"KESTQRVer"_s, message.textOf(u"//rootns:getReqForRevQteResponse/rootns:quoteRequestVersionNumber"_s));
+    Apply(revisionRequested, quote, notes, comments);
+    quote.update();
+    notes.update();
+
+    tell({u"ORLA has requested quote "_s + QuoteLabel(quote) + u" be revised."_s, u"Reason: "_s + comments,
+          u"Please re-open and edit the quote then re-send to the insurer."_s});
+    return true;
+}
+
+bool LoadQRCN(QString& text, const QString&)
+{
+    const xml::Document message = ParsedMessage(text);
+    db::Recordset quote =
+        OpenOldestOfRequest(message.textOf(u"//rootns:getQRCancellationResponse/rootns:quoteRequestNumber"_s));
+    if (quote.eof())
+        return Refuse(noSuchRequest);
+    db::Recordset notes = OpenNotes(quote);
+
+    const QString reason = message.textOf(u"//rootns:getQRCancellationResponse/rootns:qrCancellationReason"_s);
+    Apply(requestCancelled, quote, notes, reason);
+    notes.update();
+    quote.update();
+    return true;
+}
+
+bool LoadBCQR(QString& text, const QString&)
+{
+    const xml::Document message = ParsedMessage(text);
+    db::Recordset quote =
+        OpenOldestOfRequest(message.textOf(u"//rootns:getBackoutCancelledQRResponse/rootns:kestQuoteRequestNumber"_s));
+    if (quote.eof())
+        return Refuse(noSuchRequest);
+    db::Recordset notes = OpenNotes(quote);
+
+    Apply(requestReinstated, quote, notes);
+    notes.update();
+    quote.update();
+    return true;
+}
+
+}  // namespace kest

@@ -1,0 +1,149 @@
+#include "inbound/modLoadXML.h"
+#include "messages/Envelope.h"
+#include "messages/Folders.h"
+#include "platform/RuntimeError.h"
+#include "platform/database/Sql.h"
+#include "platform/desktop/Prompt.h"
+#include "platform/files/files.h"
+#include "platform/values.h"
+#include "shell/Helpers.h"
+#include "shell/SharedVariables.h"
+#include "shell/modLoggerEx.h"
+
+#include <QStringList>
+
+namespace kest {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+struct Loader {
+    QLatin1StringView messageType;
+    bool (*load)(QString& text, const QString& fileName);
+};
+
+constexpr Loader loaders[] = {
+    {"QREQ"_L1, LoadQREQ}, {"QMQR"_L1, LoadQMQR}, {"QTDL"_L1, LoadQTDL}, {"RRQT"_L1, LoadRRQT}, {"QRCN"_L1, LoadQRCN},
+    {"ADQT"_L1, LoadADQT}, {"ARES"_L1, LoadARES}, {"BACA"_L1, LoadBACA}, {"BCQR"_L1, LoadBCQR}, {"EWAP"_L1, LoadEWAP},
+};
+
+void ReportParseError(const xml::ParseError& error, const QString& fileName)
+{
+    const QStringList lines{
+        u"Error loading XML file: "_s + fileName,
+        u"Error Code: "_s + QString::number(static_cast<qint32>(error.errorCode)),
+        u"Reason: "_s + error.reason,
+        u"Source Text:"_s,
+        QString(error.srcText).remove(u'\t').trimmed(),
+    };
+    desktop::msgBox(lines.join(u"\r\n"_s), desktop::Icon::Critical, u"KEST"_s);
+}
+
+bool isNotice(const xml::Node& root)
+{
+    const xml::Node first = root.firstChild();
+    return first.nodeName() == u"mailtype"_s && first.text() == u"MDMSG"_s;
+}
+
+/// A notice of the estimating product is shown and put aside; it is never a message that was taken.
+void TakeNotice(const xml::Node& root, const QString& fileName)
+{
+    desktop::msgBox(root.textOf(u"body"_s), desktop::Icon::Exclamation);
+    for (int number = 0; number <= 999; ++number) {
+        const QString target = gsReadPath + u"MDMSG"_s + PadZeroLeft(QString::number(number), 3) + u".xml"_s;
+        if (files::exists(target))
+            continue;
+        files::copy(gsUnreadPath + fileName, target);
+        DeleteFileByBatch(gsUnreadPath + fileName);
+        return;
+    }
+}
+
+/// A quote request that a manual quote answers may still wait unread; it must not make a second quote.
+void WithdrawWaitingRequests(const QString& requestNumber)
+{
+    for (const QString& name : files::list(gsUnreadPath)) {
+        QString text = files::read(gsUnreadPath + name);
+        const xml::Document waiting = ParsedMessage(text);
+        if (waiting.parseError().errorCode != 0)
+            continue;
+        const xml::Node root = waiting.documentElement();
+        const xml::Node number = root.selectSingleNode(u"//rootns:quoteRequestNumber"_s);
+        if (root.textOrEmptyOf(u"messageType"_s) == u"QREQ"_s && number && number.text() == requestNumber)
+            files::remove(gsUnreadPath + name);
+    }
+}
+
+bool Load(QString& text, const QString& fileName)
+{
+    xml::Document message = ParsedMessage(text);
+    if (message.parseError().errorCode == xml::BareAmpersand) {
+        text = WithAmpersandsEscaped(text);
+        message.loadXML(text);
+    }
+    if (message.parseError().errorCode != 0) {
+        ReportParseError(message.parseError(), fileName);
+        return false;
+    }
+
+    const xml::Node root = message.documentElement();
+    if (isNotice(root)) {
+        TakeNotice(root, fileName);
+        return false;
+    }
+
+    const QString messageType = root.textOf(u"messageType"_s);
+    if (messageType == u"MANQ"_s)
+        WithdrawWaitingRequests(root.textOf(u"//rootns:getQuoteResponse/rootns:quoteRequestNumber"_s));
+
+    for (const Loader& loader : loaders) {
+        if (loader.messageType == messageType.toUpper())
+            return loader.load(text, fileName);
+    }
+    return false;
+}
+
+}  // namespace
+
+bool LoadXML(QString& text, const QString& fileName)
+{
+    try {
+        return Load(text, fileName);
+    } catch (const RuntimeError& error) {
+        LogError(error, u"modLoadXML.LoadXML"_s, u"LoadXML"_s);
+        return false;
+    }
+}
+
+db::Recordset Opened(const QString& select)
+{
+    db::Recordset rows(gConn);
+    rows.open(select);
+    return rows;
+}
+
+db::Recordset OpenNotes(const db::Recordset& quote)
+{
+    return Opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quote.value(u"QTNNO"_s),
+                      quote.value(u"Subquote"_s)));
+}
+
+bool Refuse(const QString& text)
+{
+    desktop::msgBox(text, desktop::Icon::Critical);
+    return false;
+}
+
+bool IsSupplementary(const db::Recordset& quote)
+{
+    return toLong(quote.value(u"Subquote"_s)) > 0;
+}
+
+QString QuoteLabel(const db::Recordset& quote)
+{
+    const QString number = quote.text(u"QTNNO"_s);
+    return IsSupplementary(quote) ? number + u'/' + quote.text(u"Subquote"_s) : number;
+}
+
+}  // namespace kest
