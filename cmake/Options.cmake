@@ -1,7 +1,6 @@
 # Every target links kest_options: the standard, the warnings and the Qt rules in one place.
 add_library(kest_options INTERFACE)
 target_compile_features(kest_options INTERFACE cxx_std_20)
-set_property(TARGET kest_options PROPERTY INTERFACE_CXX_EXTENSIONS OFF)
 target_compile_options(kest_options INTERFACE -Wall -Wextra -Wpedantic -Wshadow -Wnon-virtual-dtor -Woverloaded-virtual
                                               -Werror)
 target_compile_definitions(

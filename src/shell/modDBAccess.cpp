@@ -1,0 +1,139 @@
+#include "shell/modDBAccess.h"
+
+#include "platform/RuntimeError.h"
+#include "platform/desktop/Prompt.h"
+#include "platform/values.h"
+#include "shell/ModRegistry.h"
+#include "shell/SharedVariables.h"
+
+#include <QSysInfo>
+
+namespace kest {
+
+using namespace Qt::StringLiterals;
+
+db::ConnectionPtr gcnDB;
+QString gsSAPwd;
+QString gsDatabase;
+QString gsServer;
+QString gsInstance;
+
+namespace {
+
+constexpr int commandTimeout = 120;  // seconds
+constexpr auto mysqlServer = "mysql:"_L1;
+
+struct Failure {
+    int number = 0;
+    QString description;
+};
+Failure lastFailure;  // of the last attempt to open the connection
+
+QString splashSetting(const QString& key, const QString& fallback = {})
+{
+    return GetRegSetting(u"wirra32"_s, u"frmsplash"_s, key, fallback, CopyUp::No);
+}
+
+void readConnectionSettings()
+{
+    const QString useMaster = splashSetting(u"TabletUseMaster"_s);
+    const QString prefix = useMaster == u"1"_s ? u"TabletMaster"_s : QString();
+    gsSAPwd = splashSetting(prefix + u"SAPwd"_s);
+    gsDatabase = splashSetting(prefix + u"DatabaseName"_s, u"WirSql"_s);
+    gsInstance = splashSetting(prefix + u"InstanceName"_s);
+    gsServer = splashSetting(prefix + u"ServerName"_s, u"(local)"_s);
+    gbTabletLocal = useMaster == u"0"_s;
+
+    if (gsServer == GetComputerName())
+        gsServer = u"(local)"_s;
+}
+
+int driverNumber()
+{
+    const QString type = GetRegSetting(u"wirra32"_s, u"frmSplash"_s, u"ClientConnectionType"_s, u"0"_s);
+    const QString system =
+        GetRegSetting(u"Microsoft"_s, u"Windows NT\\CurrentVersion"_s, u"CurrentVersion"_s, QString());
+    if (system >= u"6.0"_s)
+        return 1;
+    return static_cast<int>(numberIn(type).value_or(0));
+}
+
+/// Empty for a driver number that names none: the open that follows fails.
+QString connectionText(int driver)
+{
+    if (gsServer.startsWith(mysqlServer, Qt::CaseInsensitive)) {
+        const QStringList address = gsServer.mid(mysqlServer.size()).split(u':');
+        return u"Driver={MySQL};Server="_s + address.value(0) + u";Port="_s + address.value(1, u"3306"_s) +
+               u";Database="_s + gsDatabase + u";Uid=sa;Pwd="_s + gsSAPwd + u';';
+    }
+    const QString server = gsServer.endsWith(u'\\') ? gsServer : gsServer + u'\\';
+    const QString tail =
+        u"Server="_s + server + gsInstance + u";Database="_s + gsDatabase + u";Uid=sa;Pwd="_s + gsSAPwd + u';';
+    switch (driver) {
+        case 0:
+            return u"Driver={SQL Server};"_s + tail;
+        case 1:
+            return u"Driver={SQL Native Client};"_s + tail;
+        default:
+            return {};
+    }
+}
+
+bool isOpen()
+{
+    return gcnDB && gcnDB->state() == 1;
+}
+
+}  // namespace
+
+db::ConnectionPtr GetConnection()
+{
+    return EnsureConnection() ? gcnDB : nullptr;
+}
+
+bool EnsureConnection()
+{
+    if (!isOpen())
+        OpenDatabase();
+    return isOpen();
+}
+
+void OpenDatabase()
+{
+    gcnDB = std::make_shared<db::Connection>();
+    lastFailure = {};
+    attempt([] { readConnectionSettings(); });
+    attempt([] {
+        try {
+            gcnDB->open(connectionText(driverNumber()));
+        } catch (const RuntimeError& error) {
+            lastFailure = {error.number(), error.description()};
+            throw;
+        }
+    });
+    attempt([] { gcnDB->setCommandTimeout(commandTimeout); });
+}
+
+std::optional<db::Recordset> OpenRecordset(const QString& select, bool disconnect, bool reconnect)
+{
+    if (reconnect)
+        gcnDB.reset();
+    if (!EnsureConnection()) {
+        desktop::msgBox(
+            QString::number(lastFailure.number) + u": Could not Initialize Database! - "_s + lastFailure.description,
+            desktop::Icon::Critical);
+        return std::nullopt;
+    }
+    db::Recordset rows(gcnDB);
+    rows.open(select);
+    if (disconnect)
+        rows.disconnect();
+    return rows;
+}
+
+QString GetComputerName()
+{
+    return QSysInfo::machineHostName();
+}
+
+}  // namespace kest
