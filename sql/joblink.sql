@@ -1,0 +1,67 @@
+-- The three tables of JobLink's database that KEST2 writes. For whoever sets JobLink's side up.
+-- A job is finished when its newJob row has Status 1; rows with Status 0 are being written, or were given up.
+
+CREATE TABLE newJob (
+    nJobID_PK INT UNSIGNED NOT NULL AUTO_INCREMENT,
+    Status TINYINT NOT NULL DEFAULT 0,
+    PRIMARY KEY (nJobID_PK)
+) ENGINE = InnoDB DEFAULT CHARSET = utf8mb4;
+
+CREATE TABLE newJobHdr (
+    nJobHdr_PK INT UNSIGNED NOT NULL AUTO_INCREMENT,
+    nJobID_FK INT UNSIGNED NOT NULL,
+    JobNr VARCHAR(20),
+    estNr VARCHAR(20),
+    estimateDate VARCHAR(30),
+    startDate DATETIME,
+    endDate DATETIME,
+    invoiceDate VARCHAR(30),
+    paintType VARCHAR(10),
+    insName VARCHAR(100),
+    insAddr VARCHAR(200),
+    insPcode VARCHAR(10),
+    insContact VARCHAR(100),
+    insPh VARCHAR(30),
+    insMob VARCHAR(30),
+    insFax VARCHAR(30),
+    insEmail VARCHAR(100),
+    insPolicyNr VARCHAR(50),
+    insClaimNr VARCHAR(50),
+    custName VARCHAR(150),
+    custAddr VARCHAR(200),
+    custPcode VARCHAR(10),
+    custPh VARCHAR(30),
+    custMob VARCHAR(30),
+    custFax VARCHAR(30),
+    custEmail VARCHAR(100),
+    vehReg VARCHAR(20),
+    vehMake VARCHAR(50),
+    vehModel VARCHAR(100),
+    vehVIN VARCHAR(30),
+    vehColor VARCHAR(50),
+    vehColorCode VARCHAR(20),
+    vehTrans VARCHAR(20),
+    vehYear VARCHAR(10),
+    vehMonth VARCHAR(10),
+    estimator VARCHAR(50),
+    assessor VARCHAR(50),
+    jobNotes TEXT,
+    PRIMARY KEY (nJobHdr_PK),
+    KEY (nJobID_FK)
+) ENGINE = InnoDB DEFAULT CHARSET = utf8mb4;
+
+CREATE TABLE newJobDtl (
+    nJobDtlID_PK INT UNSIGNED NOT NULL AUTO_INCREMENT,
+    nJobID_FK INT UNSIGNED NOT NULL,
+    coreTitle VARCHAR(10),
+    lineDescn TEXT,
+    lineSale DECIMAL(12, 2),
+    lineCost DECIMAL(12, 2),
+    lineNr INT,
+    linePartNr VARCHAR(50),
+    linePartQty DOUBLE,
+    linePartType VARCHAR(20),
+    lineSupplierName VARCHAR(100),
+    PRIMARY KEY (nJobDtlID_PK),
+    KEY (nJobID_FK)
+) ENGINE = InnoDB DEFAULT CHARSET = utf8mb4;
