@@ -1,10 +1,10 @@
 // A profile of its own for one test, in a temporary folder that goes with it.
 #pragma once
 
-#include <gtest/gtest.h>
-
 #include <QString>
 #include <QTemporaryDir>
+
+#include <gtest/gtest.h>
 
 #include <iosfwd>
 

@@ -1,7 +1,7 @@
 // Runs a test program: no display, the code page's texts in failures, nothing of this workstation's own profile.
-#include <gtest/gtest.h>
-
 #include <QApplication>
+
+#include <gtest/gtest.h>
 
 #include <ostream>
 

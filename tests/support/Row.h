@@ -1,0 +1,102 @@
+// One row of a table, read and written at once: what a test's builders and expectations are made of.
+#pragma once
+
+#include "support/Text.h"
+
+#include <string>
+
+namespace kest::test {
+
+class Row {
+public:
+    /// The first row that meets the condition; it need not exist until it is read or written.
+    Row(const Text& table, const Text& condition) : table_(table), condition_(condition) {}
+
+    bool exists() const;
+    QVariant value(const Text& column) const;
+    /// Null is the empty text.
+    std::string text(const Text& column) const;
+    double number(const Text& column) const;
+    bool isNull(const Text& column) const { return value(column).isNull(); }
+
+protected:
+    void write(const Text& column, const Value& value);
+    const QString& condition() const { return condition_; }
+
+private:
+    QString table_;
+    QString condition_;
+};
+
+/// Rows of `table` that meet the condition.
+int rowCount(const Text& table, const Text& condition = "1=1");
+
+/// A row whose setters can be chained.
+template <class Self>
+class RowOf : public Row {
+public:
+    using Row::Row;
+    Self& set(const Text& column, const Value& value)
+    {
+        write(column, value);
+        return static_cast<Self&>(*this);
+    }
+};
+
+class LineRow : public RowOf<LineRow> {
+public:
+    using RowOf::RowOf;
+};
+
+class CarRow : public RowOf<CarRow> {
+public:
+    using RowOf::RowOf;
+    CarRow& customer(const Text& name);
+};
+
+class CustomerRow : public RowOf<CustomerRow> {
+public:
+    using RowOf::RowOf;
+    int id() const { return int(number("CUST_ID")); }
+};
+
+class VendorRow : public RowOf<VendorRow> {
+public:
+    using RowOf::RowOf;
+    int id() const { return int(number("VENDOR_ID")); }
+};
+
+/// A quote: its header, and through it the note chain and the lines.
+class QuoteRow : public RowOf<QuoteRow> {
+public:
+    QuoteRow(const Text& number, int subquote, const Text& condition);
+
+    QuoteRow& request(const Text& number, const Text& version = "1");
+    QuoteRow& quoteNumber(const Text& number) { return set("KESTQuoteNo", Value(QString(number))); }
+    QuoteRow& authorised(const Text& number) { return set("KESTAuthNo", Value(QString(number))); }
+    QuoteRow& claim(const Text& number) { return set("Claim", Value(QString(number))); }
+    QuoteRow& rego(const Text& rego) { return set("REGO", Value(QString(rego))); }
+    QuoteRow& stage(int stage) { return set("Job_stage", stage); }
+    QuoteRow& locked(bool locked = true) { return set("ReadOnly", locked); }
+    /// Puts a note such as "Active Quote Request" in front of the chain.
+    QuoteRow& note(const Text& words, const Text& day = "01/02/2008");
+    /// A column of the quote's long texts.
+    QuoteRow& remarks(const Text& text, const Text& column = "remarks");
+
+    int stage() const { return int(number("Job_stage")); }
+    bool locked() const;
+    /// The note chain, today's date written as "today".
+    std::string notes() const;
+    Row texts() const;
+
+    /// The line of that number; made with `category` where the quote has none.
+    LineRow line(int sequence, const Text& category = "R&R", const Text& script = "Front bumper bar");
+    int lines() const;
+
+private:
+    QString quoteNumber_;
+    int subquote_;
+    QString key() const;
+};
+
+}  // namespace kest::test

@@ -1,0 +1,181 @@
+#include "support/Shop.h"
+
+#include "app/QuoteDatabase.h"
+#include "platform/database/Recordset.h"
+#include "platform/database/Sql.h"
+#include "platform/files/files.h"
+#include "shell/SharedVariables.h"
+
+namespace kest::test {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+/// The database file of a new shop with one model that cars can have; built once, since making tables costs commits.
+const QByteArray& newShopFile()
+{
+    static const QByteArray file = [] {
+        const TestProfile profile;
+        db::ConnectionPtr database = app::openEmbedded(u"WirSql"_s);
+        app::createTables(*database, app::Dialect::Embedded);
+        app::fillNewShop(*database);
+        database->execute(
+            u"INSERT INTO MODEL (MODEL_ID, MODEL_ID1, MAKE, MODEL) "
+            "VALUES ('C120', 'C120', 'CORELLA', 'MERIDIAN GL')"_s);
+        database->execute(
+            u"INSERT INTO ALLMODEL (MODEL_ID, MAKE, MODEL, SCHEDULE) "
+            "VALUES ('C120', 'CORELLA', 'MERIDIAN GL', '')"_s);
+        database->close();
+        return files::readBytes(app::embeddedFile(u"WirSql"_s));
+    }();
+    return file;
+}
+
+void forgetSharedVariables()
+{
+    grsQuote.reset();
+    gConn.reset();
+    for (QString* text : {&gsUnreadPath, &gsReadPath, &gsUnsentPath, &gsSentPath, &gsImagesPath, &gsCurFolder,
+                          &gsListFolder, &gsListFilter, &gsMatchedQTNNO, &gsDeletedQTNNO, &gsDeletedSubquote})
+        text->clear();
+    gsQTNNO = gsSubQuote = u"0"_s;
+    gdicQuoteRequests.clear();
+    gbFilterAsked = gbTabletLocal = false;
+}
+
+void add(const QString& table, std::initializer_list<std::pair<QString, Value>> values)
+{
+    db::Recordset rows(gConn);
+    rows.open(u"SELECT * FROM %1 WHERE 1=0"_s.arg(table));
+    rows.addNew();
+    for (const auto& [column, value] : values)
+        rows.set(column, value);
+    rows.update();
+}
+
+QString conditionOf(const QString& number, int subquote)
+{
+    return sql("QTNNO='{}' AND Subquote={}", number, subquote);
+}
+
+void addQuote(const QString& number, int subquote)
+{
+    car("ABC123");
+    add(u"QUOTE1"_s, {{u"QTNNO"_s, number},
+                      {u"Subquote"_s, subquote},
+                      {u"REGO"_s, "ABC123"},
+                      {u"INSURER_ID"_s, 1},
+                      {u"Claim"_s, "7700001"},
+                      {u"QUOTER"_s, "Pat Ferrier"},
+                      {u"excess"_s, 0},
+                      {u"contri"_s, 0},
+                      {u"Job_stage"_s, 1}});
+}
+
+}  // namespace
+
+QuoteRow quote(const Text& number, int subquote)
+{
+    if (!quoteExists(number, subquote)) {
+        addQuote(number, subquote);
+        add(u"QUOTE3"_s, {{u"QTNNO"_s, QString(number)}, {u"Subquote"_s, subquote}});
+    }
+    return QuoteRow(number, subquote, conditionOf(number, subquote) + u" ORDER BY rec_id"_s);
+}
+
+QuoteRow anotherQuote(const Text& number, int subquote)
+{
+    addQuote(number, subquote);
+    return QuoteRow(number, subquote, conditionOf(number, subquote) + u" ORDER BY rec_id DESC"_s);
+}
+
+bool quoteExists(const Text& number, int subquote)
+{
+    return rowCount("QUOTE1", conditionOf(number, subquote)) > 0;
+}
+
+CarRow car(const Text& rego)
+{
+    const QString condition = sql("REGO='{}'", QString(rego));
+    if (rowCount("CAR", condition) == 0)
+        add(u"CAR"_s, {{u"REGO"_s, QString(rego)},
+                       {u"KEST"_s, 0},
+                       {u"CUST_ID"_s, customer("Holloway").id()},
+                       {u"MODEL_ID"_s, "C120"},
+                       {u"BODY_ID"_s, "4"},
+                       {u"BODY_ID2"_s, "4S"},
+                       {u"COLOUR"_s, "Silver"},
+                       {u"Year"_s, "03/2005"},
+                       {u"PAINT_GP"_s, "M1"}});
+    return CarRow("CAR", condition);
+}
+
+CustomerRow customer(const Text& name)
+{
+    const QString condition = sql("NAME='{}'", QString(name));
+    if (rowCount("CUSTOMER", condition) == 0)
+        add(u"CUSTOMER"_s, {{u"NAME"_s, QString(name)},
+                            {u"FIRSTNAME"_s, "Kim"},
+                            {u"SALUTATION"_s, "Ms"},
+                            {u"street"_s, "14 Banksia Street"},
+                            {u"suburb"_s, "Wattlebridge 3999"}});
+    return CustomerRow("CUSTOMER", condition);
+}
+
+VendorRow vendor(const Text& name)
+{
+    const QString condition = sql("NAME='{}'", QString(name));
+    if (rowCount("VENDOR", condition) == 0)
+        add(u"VENDOR"_s, {{u"NAME"_s, QString(name)}, {u"Account"_s, 293}});
+    return VendorRow("VENDOR", condition);
+}
+
+Shop::Shop() : desktop(std::in_place), newShop_(newShopFile()), root_(profile_.root())
+{
+    forgetSharedVariables();
+    for (const auto& [variable, folder] :
+         {std::pair(&gsUnreadPath, u"c:\\wirdoc\\AUnread\\"_s), std::pair(&gsReadPath, u"c:\\wirdoc\\ARead\\"_s),
+          std::pair(&gsUnsentPath, u"c:\\wirdoc\\AUnsent\\"_s), std::pair(&gsSentPath, u"c:\\wirdoc\\ASent\\"_s),
+          std::pair(&gsImagesPath, u"c:\\wirimg\\"_s)}) {
+        files::makeFolder(folder);
+        *variable = folder;
+    }
+    files::makeFolder(u"c:\\wirdoc\\PDF"_s);
+    files::makeFolder(root_ + u"/databases"_s);
+    files::makeFolder(root_ + u"/component"_s);
+    files::writeBytes(app::embeddedFile(u"WirSql"_s), newShop_);
+    gConn = app::openEmbedded(u"WirSql"_s);
+}
+
+Shop::~Shop()
+{
+    desktop.reset();
+    forgetSharedVariables();
+}
+
+void Shop::arrive(const Text& name, const Text& content)
+{
+    files::write(gsUnreadPath + name, content);
+}
+
+std::string Shop::shown()
+{
+    const QJsonArray& boxes = desktop->record().boxes;
+    boxesSeen_ = std::min(boxesSeen_, boxes.size());  // another script has begun a new record
+    QStringList texts;
+    for (; boxesSeen_ < boxes.size(); ++boxesSeen_) {
+        const QJsonValue box = boxes[boxesSeen_];
+        const QString title = box[u"title"_s].toString();
+        texts << u"[%1] "_s.arg(box[u"icon"_s].toString()) + (title.isEmpty() ? title : title + u": "_s) +
+                     box[u"text"_s].toString();
+    }
+    return texts.join(u'\n').toStdString();
+}
+
+QStringList Shop::filesIn(const QString& folder)
+{
+    return files::list(folder);
+}
+
+}  // namespace kest::test

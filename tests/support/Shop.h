@@ -1,0 +1,54 @@
+// A repair shop of its own for one test: profile, folders, quote database, connection and shared variables.
+#pragma once
+
+#include "support/Messages.h"
+#include "support/Row.h"
+#include "support/ScriptedDesktop.h"
+#include "support/TestProfile.h"
+
+#include <QStringList>
+
+#include <gtest/gtest.h>
+
+#include <optional>
+
+namespace kest::test {
+
+// Each finds its row, or makes it with what every quote, car, customer or vendor of a shop has.
+
+/// The car ABC123 with its customer, no network number, no line.
+QuoteRow quote(const Text& number, int subquote = 0);
+/// A second row with the same number and subquote.
+QuoteRow anotherQuote(const Text& number, int subquote = 0);
+bool quoteExists(const Text& number, int subquote = 0);
+/// Silver, of a known model, of the customer "Holloway".
+CarRow car(const Text& rego);
+CustomerRow customer(const Text& name);
+VendorRow vendor(const Text& name);
+
+class Shop : public ::testing::Test {
+protected:
+    Shop();
+    ~Shop() override;
+
+    const QString& root() const { return root_; }
+
+    /// Puts a file into the unread folder, as the transport does.
+    void arrive(const Text& name, const Text& content);
+    /// Names of the files of a folder such as `gsReadPath`.
+    static QStringList filesIn(const QString& folder);
+    /// The boxes shown since the last call, each as "[critical] text" or "[critical] title: text", joined by line
+    /// feeds.
+    std::string shown();
+
+    /// Answers boxes with their default; `desktop.emplace(script)` where a test wants other answers.
+    std::optional<ScriptedDesktop> desktop;
+
+private:
+    QByteArray newShop_;  // before the profile: it is made in one of its own
+    TestProfile profile_;
+    QString root_;
+    qsizetype boxesSeen_ = 0;
+};
+
+}  // namespace kest::test
