@@ -8,7 +8,6 @@
 #include <memory>
 
 struct _xmlNode;
-struct _xmlDoc;
 
 namespace kest::xml {
 
@@ -31,10 +30,10 @@ struct Attribute {
     QString value;
 };
 
-class Document;
+struct DocumentData;
 
-/// A light reference to a node, valid as long as its document. A null node answers `isNull`; anything else asked of
-/// it throws NoObject.
+/// A light reference to a node, valid until its document goes or loads another text; it outlives a move. A null node
+/// answers `isNull`; anything else asked of it throws NoObject.
 class Node {
 public:
     Node() = default;
@@ -76,10 +75,13 @@ public:
 
 private:
     friend class Document;
-    Node(_xmlNode* n, const Document* d) : node(n), document(d) {}
+    friend struct DocumentData;
+    Node(_xmlNode* n, DocumentData* d) : node(n), document(d) {}
+    /// The node behind this one; throws NoObject for a null node.
+    _xmlNode* required() const;
 
     _xmlNode* node = nullptr;
-    const Document* document = nullptr;
+    DocumentData* document = nullptr;
 };
 
 /// One XML document. No DTD is accepted, nothing outside the document is ever fetched; the size of a text is bounded by
@@ -112,6 +114,7 @@ public:
     /// Puts the root of an empty document.
     Node appendChild(Node root);
 
+    /// Relative paths begin at the root element.
     Node selectSingleNode(const QString& path) const;
     QList<Node> selectNodes(const QString& path) const;
     /// As Node::textOf and Node::textOrEmptyOf, from the root.
@@ -123,9 +126,7 @@ public:
     QString xml() const;
 
 private:
-    friend class Node;
-    struct Data;
-    std::unique_ptr<Data> data;
+    std::unique_ptr<DocumentData> data;
 };
 
 }  // namespace kest::xml

@@ -1,0 +1,286 @@
+#include "platform/RuntimeError.h"
+#include "platform/xml/DocumentData.h"
+
+#include <algorithm>
+
+using namespace Qt::StringLiterals;
+
+namespace kest::xml {
+
+namespace {
+
+/// The next of these siblings that counts as a node.
+xmlNodePtr counting(xmlNodePtr node)
+{
+    while (node && isBlankText(node))
+        node = node->next;
+    return node;
+}
+
+bool hasContentOfItsOwn(const xmlNode* node)
+{
+    return node->type == XML_TEXT_NODE || node->type == XML_CDATA_SECTION_NODE || node->type == XML_COMMENT_NODE ||
+           node->type == XML_PI_NODE;
+}
+
+}  // namespace
+
+QString allowedText(const QString& text)
+{
+    const auto isPair = [&](qsizetype i) {
+        return text[i].isHighSurrogate() && i + 1 < text.size() && text[i + 1].isLowSurrogate();
+    };
+    const auto isAllowed = [](char16_t c) {
+        return c >= 0x20 ? c <= 0xD7FF || (c >= 0xE000 && c <= 0xFFFD) : c == u'\t' || c == u'\n' || c == u'\r';
+    };
+    qsizetype i = 0;
+    while (i < text.size() && isAllowed(text[i].unicode()))
+        ++i;
+    if (i == text.size())
+        return text;
+    QString allowed = text.first(i);
+    for (; i < text.size(); ++i) {
+        if (isPair(i)) {
+            allowed += QStringView(text).sliced(i, 2);
+            ++i;
+        } else if (isAllowed(text[i].unicode())) {
+            allowed += text[i];
+        }
+    }
+    return allowed;
+}
+
+bool isBlankText(const xmlNode* node)
+{
+    if (node->type != XML_TEXT_NODE)
+        return false;
+    const xmlChar* c = node->content;
+    while (c && (*c == ' ' || *c == '\t' || *c == '\n' || *c == '\r'))
+        ++c;
+    return !c || *c == 0;
+}
+
+QString textOfNode(const xmlNode* node)
+{
+    if (hasContentOfItsOwn(node))
+        return fromXml(node->content);
+    QString text;
+    const xmlNode* at = node->children;
+    while (at) {
+        const bool isText = at->type == XML_CDATA_SECTION_NODE || (at->type == XML_TEXT_NODE && !isBlankText(at)) ||
+                            (at->type == XML_TEXT_NODE && node->type == XML_ATTRIBUTE_NODE);
+        if (isText)
+            text = text.isEmpty() ? fromXml(at->content) : text + fromXml(at->content);
+        if (at->type == XML_ELEMENT_NODE && at->children) {
+            at = at->children;
+            continue;
+        }
+        while (at != node && !at->next)
+            at = at->parent;
+        if (at == node)
+            break;
+        at = at->next;
+    }
+    return text;
+}
+
+QString qualifiedName(const xmlNode* node)
+{
+    const QString name = fromXml(node->name);
+    return node->ns && node->ns->prefix ? fromXml(node->ns->prefix) + u':' + name : name;
+}
+
+QList<Attribute> attributesOf(const DocumentData& data, const xmlNode* element)
+{
+    QList<Attribute> attributes;
+    if (element->type != XML_ELEMENT_NODE)
+        return attributes;
+    for (const xmlNs* declared = element->nsDef; declared; declared = declared->next) {
+        const QString name = declared->prefix ? u"xmlns:"_s + fromXml(declared->prefix) : u"xmlns"_s;
+        attributes.append({name, fromXml(declared->href)});
+    }
+    for (const xmlAttr* attribute = element->properties; attribute; attribute = attribute->next) {
+        const auto* node = reinterpret_cast<const xmlNode*>(attribute);
+        attributes.append({qualifiedName(node), textOfNode(node)});
+    }
+    const auto order = data.attributeOrders.constFind(element);
+    if (order != data.attributeOrders.cend()) {
+        const auto place = [&](const Attribute& attribute) {
+            const qsizetype index = order->indexOf(attribute.name);
+            return index < 0 ? order->size() : index;  // what came later stands behind
+        };
+        std::stable_sort(attributes.begin(), attributes.end(),
+                         [&](const Attribute& a, const Attribute& b) { return place(a) < place(b); });
+    }
+    return attributes;
+}
+
+xmlNodePtr Node::required() const
+{
+    if (!node)
+        throw RuntimeError(NoObject, u"Object variable not set"_s);
+    return node;
+}
+
+NodeType Node::nodeType() const
+{
+    return static_cast<NodeType>(required()->type);
+}
+
+QString Node::nodeName() const
+{
+    switch (required()->type) {
+        case XML_TEXT_NODE:
+            return u"#text"_s;
+        case XML_CDATA_SECTION_NODE:
+            return u"#cdata-section"_s;
+        case XML_COMMENT_NODE:
+            return u"#comment"_s;
+        case XML_PI_NODE:
+            return fromXml(node->name);
+        default:
+            return qualifiedName(node);
+    }
+}
+
+QString Node::localName() const
+{
+    return hasContentOfItsOwn(required()) ? QString() : fromXml(node->name);
+}
+
+QString Node::namespaceURI() const
+{
+    return !hasContentOfItsOwn(required()) && node->ns ? fromXml(node->ns->href) : QString();
+}
+
+QString Node::text() const
+{
+    return textOfNode(required());
+}
+
+void Node::setText(const QString& text)
+{
+    const QByteArray allowed = allowedText(text).toUtf8();
+    if (hasContentOfItsOwn(required())) {
+        xmlNodeSetContent(node, nullptr);
+        xmlNodeAddContentLen(node, toXml(allowed), static_cast<int>(allowed.size()));
+        return;
+    }
+    while (node->children)
+        document->unlink(node->children);
+    if (!allowed.isEmpty())
+        document->link(node, xmlNewDocText(node->doc, toXml(allowed)), nullptr);
+}
+
+QString Node::xml() const
+{
+    return serialized(*document, required());
+}
+
+QList<Attribute> Node::attributes() const
+{
+    required();
+    return attributesOf(*document, node);
+}
+
+void Node::setAttribute(const QString& name, const QString& value)
+{
+    const QByteArray whole = name.toUtf8();
+    if (required()->type != XML_ELEMENT_NODE || xmlValidateQName(toXml(whole), 0) != 0)
+        throw RuntimeError(TypeMismatch, u"No attribute can be made with the name "_s + name);
+    const QByteArray text = allowedText(value).toUtf8();
+    const qsizetype colon = name.indexOf(u':');
+    const QString prefix = colon < 0 ? QString() : name.first(colon);
+    const QByteArray local = name.sliced(colon + 1).toUtf8();
+    if (name == "xmlns"_L1 || prefix == "xmlns"_L1) {
+        if (!xmlNewNs(node, toXml(text), prefix.isEmpty() ? nullptr : toXml(local)))
+            throw RuntimeError(TypeMismatch, u"The namespace is declared already: "_s + name);
+        return;
+    }
+    xmlNsPtr space = prefix.isEmpty() ? nullptr : xmlSearchNs(node->doc, node, toXml(prefix.toUtf8()));
+    if (!prefix.isEmpty() && !space)
+        throw RuntimeError(TypeMismatch, u"The prefix has no namespace: "_s + name);
+    xmlSetNsProp(node, space, toXml(local), toXml(text));
+}
+
+Node Node::parentNode() const
+{
+    const xmlNodePtr parent = required()->parent;
+    return parent && parent->type == XML_ELEMENT_NODE ? document->wrap(parent) : Node();
+}
+
+Node Node::firstChild() const
+{
+    return hasContentOfItsOwn(required()) ? Node() : document->wrap(counting(node->children));
+}
+
+Node Node::lastChild() const
+{
+    if (hasContentOfItsOwn(required()))
+        return {};
+    xmlNodePtr last = node->last;
+    while (last && isBlankText(last))
+        last = last->prev;
+    return document->wrap(last);
+}
+
+Node Node::nextSibling() const
+{
+    return document->wrap(counting(required()->next));
+}
+
+QList<Node> Node::childNodes() const
+{
+    QList<Node> children;
+    for (Node child = firstChild(); child; child = child.nextSibling())
+        children.append(child);
+    return children;
+}
+
+Node Node::appendChild(Node child) const
+{
+    return insertBefore(child, {});
+}
+
+Node Node::insertBefore(Node child, Node reference) const
+{
+    if (required()->type != XML_ELEMENT_NODE || child.required()->type == XML_ATTRIBUTE_NODE ||
+        child.document != document || (reference && reference.node->parent != node))
+        throw RuntimeError(TypeMismatch, u"The node cannot be put there"_s);
+    document->link(node, child.node, reference.node);
+    return child;
+}
+
+void Node::removeChild(Node child) const
+{
+    if (child.required()->parent != required() || child.node->type == XML_ATTRIBUTE_NODE)
+        throw RuntimeError(TypeMismatch, u"The node is no child of this one"_s);
+    document->unlink(child.node);
+}
+
+Node Node::selectSingleNode(const QString& path) const
+{
+    const QList<Node> found = document->select(required(), path, true);
+    return found.isEmpty() ? Node() : found.first();
+}
+
+QList<Node> Node::selectNodes(const QString& path) const
+{
+    return document->select(required(), path, false);
+}
+
+QString Node::textOf(const QString& path) const
+{
+    const Node found = selectSingleNode(path);
+    if (!found)
+        throw RuntimeError(NoObject, u"Object variable not set: "_s + path);
+    return found.text();
+}
+
+QString Node::textOrEmptyOf(const QString& path) const
+{
+    const Node found = selectSingleNode(path);
+    return found ? found.text() : QString();
+}
+
+}  // namespace kest::xml
