@@ -19,9 +19,9 @@ public:
     Connection(const Connection&) = delete;
     Connection& operator=(const Connection&) = delete;
 
-    /// Opens what a connection text of the form "Driver={...};Server=...;Database=...;Uid=...;Pwd=...;" names: MySQL and
-    /// MariaDB, a driver registered with ODBC here, or, for a local server without such a driver, the embedded engine.
-    /// Throws CannotOpen; a server that does not answer costs seconds.
+    /// Opens what a connection text of the form "Driver={...};Server=...;Database=...;Uid=...;Pwd=...;" names: MySQL
+    /// and MariaDB, a driver registered with ODBC here, or, for a local server without such a driver, the embedded
+    /// engine. Throws CannotOpen; a server that does not answer costs seconds.
     void open(const QString& connectionText);
     void close();
     /// 1 while the connection is open, 0 otherwise. A connection that the server has dropped is closed.
@@ -34,7 +34,12 @@ public:
     /// Throws StatementFailed with the engine's codes, CannotOpen when the connection has gone.
     qint64 execute(const QString& statement);
 
-    /// For the recordset and for faults in tests.
+    /// Runs the statements of a script, parted by ";", one by one.
+    void executeScript(const QString& script);
+    /// Puts the indexes of the embedded database in order, which another tool may have left in another one.
+    void rebuildIndexes();
+
+    /// For the recordset.
     Engine& engine() const;
 
 private:
@@ -43,5 +48,10 @@ private:
 };
 
 using ConnectionPtr = std::shared_ptr<Connection>;
+
+/// The file of the profile that a connection text for a local server without a driver opens.
+QString embeddedFile(const QString& databaseName, const QString& instance = {});
+/// Makes that file from the statements of a script: whole or not at all. False where there is one already.
+bool createEmbedded(const QString& databaseName, const QString& script);
 
 }  // namespace kest::db

@@ -54,7 +54,8 @@ public:
     void moveLast();
 
     /// Forward from the current row to one that matches, that row itself included; `eof` where there is none, and in an
-    /// empty recordset. `column='text'` or `column=number`, with = <> < <= > >= and LIKE; equality costs one index probe.
+    /// empty recordset. `column='text'` or `column=number`, with = <> < <= > >= and LIKE; equality costs one index
+    /// probe.
     void find(const QString& criterion);
     /// Shows only the rows that match, joined by AND where several are given; empty shows all. Stands on the first.
     void setFilter(const QString& criterion);

@@ -1,0 +1,96 @@
+#include "platform/database/Collation.h"
+
+namespace kest::db {
+
+namespace {
+
+QStringView withoutTrailingBlanks(QStringView text)
+{
+    while (text.endsWith(u' '))
+        text.chop(1);
+    return text;
+}
+
+/// One character against the set between the brackets.
+bool isInSet(char16_t c, QStringView set)
+{
+    const bool excludes = set.startsWith(u'^');
+    if (excludes)
+        set = set.sliced(1);
+    bool found = false;
+    for (qsizetype i = 0; i < set.size(); ++i) {
+        const bool range = i + 2 < set.size() && set[i + 1] == u'-';
+        const char16_t last = set[range ? i + 2 : i].unicode();
+        found = found || (c >= set[i].unicode() && c <= last);
+        if (range)
+            i += 2;
+    }
+    return found != excludes;
+}
+
+/// The length of the pattern's first element: a set in brackets, or one character. 0 at the end of the pattern.
+qsizetype elementLength(QStringView pattern)
+{
+    if (pattern.isEmpty())
+        return 0;
+    const qsizetype close = pattern.startsWith(u'[') ? pattern.indexOf(u']', 1) : -1;
+    return close < 0 ? 1 : close + 1;
+}
+
+bool elementMatches(QStringView element, QChar c)
+{
+    if (element.size() > 1)
+        return isInSet(c.unicode(), element.sliced(1, element.size() - 2));
+    return element[0] == u'_' || element[0] == c;
+}
+
+}  // namespace
+
+QString comparisonKey(QStringView text)
+{
+    // character by character, as compareTexts does: a text keeps its length
+    QString key = withoutTrailingBlanks(text).toString();
+    for (QChar& c : key)
+        c = c.toCaseFolded();
+    return key;
+}
+
+int compareTexts(QStringView left, QStringView right)
+{
+    return withoutTrailingBlanks(left).compare(withoutTrailingBlanks(right), Qt::CaseInsensitive);
+}
+
+bool isLike(QStringView rawText, QStringView rawPattern)
+{
+    const QString foldedText = comparisonKey(rawText);
+    const QString foldedPattern = comparisonKey(rawPattern);
+    const QStringView text = foldedText;
+    const QStringView pattern = foldedPattern;
+
+    // After a mismatch only the last "%" needs to take one character more, so the cost stays the product of the
+    // lengths.
+    qsizetype t = 0;
+    qsizetype p = 0;
+    qsizetype retryText = -1;
+    qsizetype retryPattern = -1;
+    while (t < text.size()) {
+        const qsizetype length = elementLength(pattern.sliced(p));
+        if (length > 0 && pattern[p] == u'%') {
+            retryPattern = ++p;
+            retryText = t;
+        } else if (length > 0 && elementMatches(pattern.sliced(p, length), text[t])) {
+            p += length;
+            ++t;
+        } else if (retryPattern >= 0) {
+            p = retryPattern;
+            t = ++retryText;
+        } else {
+            return false;
+        }
+    }
+    while (p < pattern.size() && pattern[p] == u'%')
+        ++p;
+    return p == pattern.size();
+}
+
+}  // namespace kest::db

@@ -1,0 +1,184 @@
+#include "platform/database/Connection.h"
+
+#include "platform/RuntimeError.h"
+#include "platform/database/Engine.h"
+#include "platform/files/files.h"
+#include "platform/profile.h"
+
+#include <QDir>
+#include <QFile>
+#include <QFileInfo>
+#include <QHash>
+#include <QSysInfo>
+
+namespace kest::db {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+/// The fields of a connection text; names in lower case. A value in braces may hold a ";".
+QHash<QString, QString> fieldsOf(const QString& text)
+{
+    QHash<QString, QString> fields;
+    for (qsizetype i = 0; i < text.size();) {
+        const qsizetype equals = text.indexOf(u'=', i);
+        if (equals < 0)
+            break;
+        const QString name = text.sliced(i, equals - i).trimmed().toLower();
+        const bool braced = equals + 1 < text.size() && text[equals + 1] == u'{';
+        const qsizetype close = braced ? text.indexOf(u'}', equals) : -1;
+        const qsizetype end = text.indexOf(u';', close < 0 ? equals : close);
+        const qsizetype stop = end < 0 ? text.size() : end;
+        const QString value =
+            close < 0 ? text.sliced(equals + 1, stop - equals - 1) : text.sliced(equals + 2, close - equals - 2);
+        if (!fields.contains(name))
+            fields.insert(name, value.trimmed());
+        i = stop + 1;
+    }
+    return fields;
+}
+
+QString fieldOf(const QHash<QString, QString>& fields, const QString& name, const QString& otherName)
+{
+    return fields.contains(name) ? fields.value(name) : fields.value(otherName);
+}
+
+/// True where a section of that name stands in the list of drivers for this process, this user or this machine.
+bool isRegistered(const QString& driver)
+{
+    const QString folder = qEnvironmentVariable("ODBCSYSINI", u"/etc"_s);
+    QString systemList = qEnvironmentVariable("ODBCINSTINI", u"odbcinst.ini"_s);
+    if (QDir::isRelativePath(systemList))
+        systemList = folder + u'/' + systemList;
+    for (const QString& path : {systemList, QDir::homePath() + u"/.odbcinst.ini"_s}) {
+        QFile list(path);
+        if (!list.open(QIODevice::ReadOnly))
+            continue;
+        for (const QByteArray& line : list.readAll().split('\n')) {
+            const QString section = QString::fromUtf8(line).trimmed();
+            if (section.startsWith(u'[') && section.endsWith(u']') &&
+                section.sliced(1, section.size() - 2).trimmed().compare(driver, Qt::CaseInsensitive) == 0)
+                return true;
+        }
+    }
+    return false;
+}
+
+bool isThisMachine(const QString& server)
+{
+    const QString machine = QSysInfo::machineHostName();
+    for (const QString& name : {u"(local)"_s, u"."_s, u"localhost"_s, machine, machine.section(u'.', 0, 0)}) {
+        if (!name.isEmpty() && server.compare(name, Qt::CaseInsensitive) == 0)
+            return true;
+    }
+    return false;
+}
+
+std::unique_ptr<Engine> openLocal(const QString& databaseName, const QString& instance)
+{
+    return openEmbedded(embeddedFile(databaseName, instance));
+}
+
+std::unique_ptr<Engine> openEngine(const QString& text)
+{
+    const QHash<QString, QString> fields = fieldsOf(text);
+    const QString driver = fields.value(u"driver"_s);
+    const QString server = fields.value(u"server"_s);
+    const QString databaseName = fields.value(u"database"_s);
+    if (driver.contains(u"mysql"_s, Qt::CaseInsensitive) || driver.contains(u"mariadb"_s, Qt::CaseInsensitive)) {
+        return openMySql(server, fields.value(u"port"_s).toInt(), databaseName, fieldOf(fields, u"uid"_s, u"user"_s),
+                         fieldOf(fields, u"pwd"_s, u"password"_s));
+    }
+    if (!driver.isEmpty() && isRegistered(driver))
+        return openOdbc(text);
+    if (!driver.isEmpty() && isThisMachine(server.section(u'\\', 0, 0)))
+        return openLocal(databaseName, server.section(u'\\', 1));
+    throw RuntimeError(CannotOpen, u"No driver on this machine reaches the server \""_s + server + u'"')
+        .withDatabaseCodes(u"0"_s, u"IM002"_s);
+}
+
+}  // namespace
+
+Connection::Connection() = default;
+Connection::~Connection() = default;
+
+void Connection::open(const QString& connectionText)
+{
+    close();
+    engine_ = openEngine(connectionText);
+    engine_->setTimeout(commandTimeout_);
+}
+
+void Connection::close()
+{
+    engine_.reset();
+}
+
+int Connection::state() const
+{
+    return engine_ && engine_->isOpen() ? 1 : 0;
+}
+
+void Connection::setCommandTimeout(int seconds)
+{
+    commandTimeout_ = seconds;
+    if (state() == 1)
+        engine_->setTimeout(seconds);
+}
+
+qint64 Connection::execute(const QString& statement)
+{
+    return engine().execute(statement);
+}
+
+void Connection::executeScript(const QString& script)
+{
+    for (const QString& statement : statementsOf(script))
+        execute(statement);
+}
+
+void Connection::rebuildIndexes()
+{
+    engine().rebuildIndexes();
+}
+
+Engine& Connection::engine() const
+{
+    if (state() != 1)
+        throw RuntimeError(CannotOpen, u"The connection to the database is closed."_s);
+    return *engine_;
+}
+
+QString embeddedFile(const QString& databaseName, const QString& instance)
+{
+    const QString name = instance.isEmpty() ? databaseName : instance + u'.' + databaseName;
+    if (!files::isPlainName(name))
+        throw RuntimeError(CannotOpen, u"\""_s + name + u"\" is no name of a database."_s);
+    return files::systemPath(profile::root() + u"/databases/"_s + name + u".db"_s);
+}
+
+bool createEmbedded(const QString& databaseName, const QString& script)
+{
+    const QString file = embeddedFile(databaseName);
+    if (QFileInfo::exists(file))
+        return false;
+    const QString unfinished = file + u".new"_s;
+    if (!QDir().mkpath(QFileInfo(file).path()))
+        throw RuntimeError(PathNotFound, u"The folder of "_s + file + u" can't be made."_s);
+    QFile::remove(unfinished);
+    if (!QFile(unfinished).open(QIODevice::WriteOnly))
+        throw RuntimeError(PermissionDenied, u"The database "_s + file + u" can't be made."_s);
+    {
+        const std::unique_ptr<Engine> engine = openEmbedded(unfinished);
+        engine->execute(u"BEGIN"_s);
+        for (const QString& statement : statementsOf(script))
+            engine->execute(statement);
+        engine->execute(u"COMMIT"_s);
+    }  // closed, so that the whole database stands in the one file
+    if (!QFile::rename(unfinished, file))
+        throw RuntimeError(PermissionDenied, u"The database "_s + file + u" can't be made."_s);
+    return true;
+}
+
+}  // namespace kest::db

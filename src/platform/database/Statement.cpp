@@ -1,0 +1,497 @@
+#include "platform/database/Statement.h"
+
+#include "platform/RuntimeError.h"
+#include "platform/values.h"
+
+#include <QHash>
+#include <QRegularExpression>
+
+#include <algorithm>
+#include <vector>
+
+namespace kest::db {
+
+using namespace Qt::StringLiterals;
+
+const TableColumn* TableInfo::column(const QString& columnName) const
+{
+    const auto found = std::find_if(columns.begin(), columns.end(), [&](const TableColumn& column) {
+        return column.name.compare(columnName, Qt::CaseInsensitive) == 0;
+    });
+    return found == columns.end() ? nullptr : &*found;
+}
+
+const TableColumn* TableInfo::identity() const
+{
+    const auto found =
+        std::find_if(columns.begin(), columns.end(), [](const TableColumn& column) { return column.identity; });
+    return found == columns.end() ? nullptr : &*found;
+}
+
+namespace {
+
+enum class Part { Blank, Word, Name, Literal, Number, Symbol };  // Name: an identifier in brackets or quotes
+
+struct Token {
+    Part part;
+    QString text;
+
+    bool is(QStringView word) const { return part != Part::Literal && text.compare(word, Qt::CaseInsensitive) == 0; }
+    bool isIdentifier() const { return part == Part::Word || part == Part::Name; }
+    /// The identifier without its brackets or quotes.
+    QString name() const { return part == Part::Name ? text.sliced(1, text.size() - 2) : text; }
+    /// What a literal says.
+    QString value() const { return text.sliced(1, text.size() - 2).replace(u"''"_s, u"'"_s); }
+};
+
+using Tokens = std::vector<Token>;
+
+bool startsWord(QChar c)
+{
+    return c.isLetter() || c == u'_' || c == u'@' || c == u'#' || c == u'$';
+}
+
+/// Where the text in quotes ends, behind the closing one; a doubled closing quote stands for itself.
+qsizetype endOfQuoted(const QString& statement, qsizetype start, QChar close)
+{
+    for (qsizetype i = start + 1; i < statement.size(); ++i) {
+        if (statement[i] != close)
+            continue;
+        if (i + 1 < statement.size() && statement[i + 1] == close)
+            ++i;
+        else
+            return i + 1;
+    }
+    throw RuntimeError(StatementFailed, u"A quotation mark is not closed in the statement."_s);
+}
+
+template <class Belongs>
+qsizetype endOfRun(const QString& statement, qsizetype start, Belongs&& belongs)
+{
+    qsizetype end = start + 1;
+    while (end < statement.size() && belongs(statement[end]))
+        ++end;
+    return end;
+}
+
+Tokens tokensOf(const QString& statement)
+{
+    static const QStringList pairs{u"<>"_s, u"<="_s, u">="_s, u"!="_s, u"||"_s};
+    Tokens tokens;
+    for (qsizetype i = 0; i < statement.size();) {
+        const QChar c = statement[i];
+        Part part = Part::Symbol;
+        qsizetype end = i + 1;
+        if (c.isSpace()) {
+            part = Part::Blank;
+            end = endOfRun(statement, i, [](QChar next) { return next.isSpace(); });
+        } else if (c == u'\'') {
+            part = Part::Literal;
+            end = endOfQuoted(statement, i, c);
+        } else if (c == u'"' || c == u'`' || c == u'[') {
+            part = Part::Name;
+            end = endOfQuoted(statement, i, c == u'[' ? u']' : c);
+        } else if (startsWord(c)) {
+            part = Part::Word;
+            end = endOfRun(statement, i, [](QChar next) { return startsWord(next) || next.isDigit(); });
+        } else if (c.isDigit()) {
+            part = Part::Number;
+            end = endOfRun(statement, i, [](QChar next) { return next.isLetterOrNumber() || next == u'.'; });
+        } else if (pairs.contains(statement.sliced(i, std::min<qsizetype>(2, statement.size() - i)))) {
+            end = i + 2;
+        }
+        tokens.push_back({part, statement.sliced(i, end - i)});
+        i = end;
+    }
+    return tokens;
+}
+
+/// One statement on its way from one dialect to the other. Each step below changes tokens in place.
+class Translation {
+public:
+    Translation(const QString& statement, const Dialect& wanted, Schema& known)
+        : tokens(tokensOf(statement)), dialect(wanted), schema(known)
+    {
+    }
+
+    QString run()
+    {
+        refuseSecondStatement();
+        findTables();
+        spellNames();
+        writeFlags();
+        writeComparedLiterals();
+        if (!dialect.patternSets)
+            writePatterns();
+        if (!dialect.plusJoinsTexts)
+            joinTexts();
+        if (!dialect.top)
+            writeLimit();
+        if (dialect.backslashEscapes)
+            doubleBackslashes();
+        QString result;
+        for (const Token& token : tokens)
+            result += token.text;
+        return result;
+    }
+
+private:
+    using Index = qsizetype;
+    static constexpr Index none = -1;
+
+    Token& at(Index i) { return tokens[size_t(i)]; }
+    Index count() const { return Index(tokens.size()); }
+
+    Index next(Index i) const
+    {
+        for (++i; i < count(); ++i) {
+            if (tokens[size_t(i)].part != Part::Blank)
+                return i;
+        }
+        return none;
+    }
+
+    Index previous(Index i) const
+    {
+        for (--i; i >= 0; --i) {
+            if (tokens[size_t(i)].part != Part::Blank)
+                return i;
+        }
+        return none;
+    }
+
+    bool isAt(Index i, QStringView word) { return i != none && at(i).is(word); }
+
+    void refuseSecondStatement()
+    {
+        while (!tokens.empty() && (tokens.back().part == Part::Blank || tokens.back().is(u";")))
+            tokens.pop_back();
+        if (std::any_of(tokens.begin(), tokens.end(), [](const Token& token) { return token.is(u";"); }))
+            throw RuntimeError(StatementFailed, u"A second statement stands behind a semicolon."_s);
+    }
+
+    void findTables()
+    {
+        static const QStringList before{u"FROM"_s, u"JOIN"_s, u"INTO"_s, u"UPDATE"_s};
+        for (Index i = 0; i < count(); ++i) {
+            if (at(i).part != Part::Word || !before.contains(at(i).text, Qt::CaseInsensitive))
+                continue;
+            for (Index name = next(i); name != none && at(name).isIdentifier();) {
+                const Index behind = takeTable(name);
+                name = isAt(behind, u",") ? next(behind) : none;
+            }
+        }
+    }
+
+    /// Notes a table of the statement with its alias; the place behind it.
+    Index takeTable(Index name)
+    {
+        const QString table = at(name).name();
+        scope.append({table, table});
+        Index behind = next(name);
+        if (isAt(behind, u"AS"))
+            behind = next(behind);
+        static const QStringList keywords{u"WHERE"_s, u"ORDER"_s,  u"GROUP"_s,   u"INNER"_s,  u"LEFT"_s,  u"RIGHT"_s,
+                                          u"JOIN"_s,  u"ON"_s,     u"SET"_s,     u"VALUES"_s, u"CROSS"_s, u"UNION"_s,
+                                          u"LIMIT"_s, u"SELECT"_s, u"DEFAULT"_s, u"HAVING"_s};
+        if (behind != none && at(behind).isIdentifier() && !keywords.contains(at(behind).text, Qt::CaseInsensitive)) {
+            scope.append({at(behind).name(), table});
+            behind = next(behind);
+        }
+        return behind;
+    }
+
+    void spellNames()
+    {
+        for (Token& token : tokens) {
+            if (!token.isIdentifier())
+                continue;
+            QString name = token.name();
+            if (dialect.caseOfTables) {
+                const QString spelling = schema.tableSpelling(name);
+                if (!spelling.isEmpty())
+                    name = spelling;
+            }
+            const bool bracketed = token.text.startsWith(u'[');
+            if (bracketed)
+                token.text = dialect.openQuote + name + dialect.closeQuote;
+            else if (token.part == Part::Word)
+                token.text = name;
+        }
+    }
+
+    void writeFlags()
+    {
+        for (Token& token : tokens) {
+            if (token.part != Part::Word)
+                continue;
+            if (token.is(u"TRUE"))
+                token = {Part::Number, u"1"_s};
+            else if (token.is(u"FALSE"))
+                token = {Part::Number, u"0"_s};
+        }
+    }
+
+    const TableColumn* columnIn(const QString& tableName, const QString& column)
+    {
+        const TableInfo* table = schema.table(tableName);
+        return table ? table->column(column) : nullptr;
+    }
+
+    /// The column whose name ends at a token, or none; `first` is set to where the name begins.
+    const TableColumn* columnEndingAt(Index i, Index* first = nullptr)
+    {
+        if (i == none || !at(i).isIdentifier())
+            return nullptr;
+        const QString column = at(i).name();
+        const Index point = previous(i);
+        const bool qualified = isAt(point, u".") && previous(point) != none;
+        const Index start = qualified ? previous(point) : i;
+        if (first)
+            *first = start;
+        const QString qualifier = qualified ? at(start).name() : QString();
+        for (const auto& [alias, table] : std::as_const(scope)) {
+            if (qualified && alias.compare(qualifier, Qt::CaseInsensitive) != 0)
+                continue;
+            if (const TableColumn* found = columnIn(table, column))
+                return found;
+        }
+        return nullptr;
+    }
+
+    const TableColumn* columnStartingAt(Index i)
+    {
+        if (i == none || !at(i).isIdentifier())
+            return nullptr;
+        const Index point = next(i);
+        return columnEndingAt(isAt(point, u".") && next(point) != none ? next(point) : i);
+    }
+
+    void writeComparedLiterals()
+    {
+        static const QStringList comparisons{u"="_s, u"<>"_s, u"!="_s, u"<"_s, u">"_s, u"<="_s, u">="_s};
+        bool assigning = false;
+        for (Index i = 0; i < count(); ++i) {
+            const Token& token = at(i);
+            if (token.is(u"SET"))
+                assigning = true;
+            else if (token.is(u"WHERE"))
+                assigning = false;
+            else if (token.is(u"IN") && isAt(next(i), u"("))
+                writeList(i);
+            if (token.part != Part::Symbol || !comparisons.contains(token.text))
+                continue;
+            const Index left = previous(i);
+            const Index right = next(i);
+            if (left == none || right == none)
+                continue;
+            if (at(right).part == Part::Literal)
+                writeLiteral(at(right), columnEndingAt(left), token.text, assigning);
+            else if (at(left).part == Part::Literal)
+                writeLiteral(at(left), columnStartingAt(right), token.text, assigning);
+        }
+    }
+
+    void writeList(Index in)
+    {
+        const Index before = previous(in);
+        const TableColumn* column = columnEndingAt(isAt(before, u"NOT") ? previous(before) : before);
+        for (Index i = next(next(in)); column && i != none && !isAt(i, u")"); i = next(i)) {
+            if (at(i).part == Part::Literal)
+                writeLiteral(at(i), column, u"="_s, false);
+        }
+    }
+
+    /// A literal that meets a number, flag or date column is written as that kind of value.
+    void writeLiteral(Token& literal, const TableColumn* column, const QString& comparison, bool assigned)
+    {
+        if (!column || column->kind == Kind::Text || column->kind == Kind::LongText)
+            return;
+        const QString text = literal.value().trimmed();
+        if (column->kind == Kind::Date) {
+            if (const auto date = dateIn(text))
+                literal.text = u'\'' +
+                               date->toString(dialect.isoDates ? u"yyyy-MM-ddTHH:mm:ss"_s : u"yyyy-MM-dd HH:mm:ss"_s) +
+                               u'\'';
+            return;
+        }
+        if (text.isEmpty())
+            literal = {Part::Number, u"0"_s};
+        else if (const auto number = numberIn(text))
+            literal = {Part::Number, exactNumber(text, *number)};
+        else if (column->kind == Kind::Flag && text.compare(u"true", Qt::CaseInsensitive) == 0)
+            literal = {Part::Number, u"1"_s};
+        else if (column->kind == Kind::Flag && text.compare(u"false", Qt::CaseInsensitive) == 0)
+            literal = {Part::Number, u"0"_s};
+        else if (!assigned)  // every number differs from it, and none equals it or stands before or behind it
+            literal = {Part::Number, comparison == u"<>" || comparison == u"!=" ? u"1.7e308"_s : u"NULL"_s};
+    }
+
+    static QString exactNumber(const QString& text, double number)
+    {
+        static const QRegularExpression plain(u"\\A[+-]?[0-9]+(\\.[0-9]+)?\\z"_s);
+        return plain.match(text).hasMatch() ? text : QString::number(number, 'g', 17);
+    }
+
+    /// Where LIKE takes trailing blanks at their word and knows no sets: a pattern with a set becomes a regular
+    /// expression, and a pattern without "%" at its end is held against the text without its trailing blanks.
+    void writePatterns()
+    {
+        for (Index i = 0; i < count(); ++i) {
+            const Index pattern = at(i).is(u"LIKE") ? next(i) : none;
+            if (pattern == none || at(pattern).part != Part::Literal)
+                continue;
+            QString wanted = at(pattern).value();
+            if (wanted.contains(u'[')) {
+                at(i).text = u"REGEXP"_s;
+                at(pattern).text = u'\'' + asRegularExpression(wanted).replace(u'\'', u"''"_s) + u'\'';
+                continue;
+            }
+            Index last = previous(i);
+            if (isAt(last, u"NOT"))
+                last = previous(last);
+            Index first = none;
+            if (wanted.endsWith(u'%') || !columnEndingAt(last, &first))
+                continue;
+            while (wanted.endsWith(u' '))
+                wanted.chop(1);
+            at(pattern).text = u'\'' + wanted.replace(u'\'', u"''"_s) + u'\'';
+            at(first).text.prepend(u"RTRIM("_s);
+            at(last).text.append(u')');
+        }
+    }
+
+    static QString asRegularExpression(const QString& pattern)
+    {
+        QString result = u"(?s)\\A"_s;
+        for (qsizetype i = 0; i < pattern.size(); ++i) {
+            const QChar c = pattern[i];
+            const qsizetype close = c == u'[' ? pattern.indexOf(u']', i + 1) : -1;
+            if (c == u'%')
+                result += u".*"_s;
+            else if (c == u'_')
+                result += u'.';
+            else if (close > i + 1) {
+                QString set = pattern.sliced(i + 1, close - i - 1);
+                set.replace(u'\\', u"\\\\"_s).replace(u'[', u"\\["_s);
+                result += u'[' + set + u']';
+                i = close;
+            } else {
+                result += QRegularExpression::escape(QString(c));
+            }
+        }
+        return result + u" *\\z"_s;
+    }
+
+    bool isText(Index i, bool endsThere)
+    {
+        if (i == none)
+            return false;
+        if (at(i).part == Part::Literal)
+            return true;
+        const TableColumn* column = endsThere ? columnEndingAt(i) : columnStartingAt(i);
+        return column && (column->kind == Kind::Text || column->kind == Kind::LongText);
+    }
+
+    /// A "+" beside a text joins texts, and so does each "+" of the same chain.
+    void joinTexts()
+    {
+        bool chain = false;
+        for (int pass = 0; pass < 2; ++pass) {
+            chain = false;
+            const bool backwards = pass == 1;
+            for (Index step = 0; step < count(); ++step) {
+                const Index i = backwards ? count() - 1 - step : step;
+                const Token& token = at(i);
+                const bool plus = token.is(u"+");
+                if (plus || token.is(u"||")) {
+                    chain = chain || !plus || isText(previous(i), true) || isText(next(i), false);
+                    if (chain && plus)
+                        at(i).text = u"||"_s;
+                } else if (token.part == Part::Symbol && !token.is(u".")) {
+                    chain = false;
+                } else if (token.part == Part::Word && isClauseWord(token)) {
+                    chain = false;
+                }
+            }
+        }
+    }
+
+    static bool isClauseWord(const Token& token)
+    {
+        static const QStringList words{u"SELECT"_s, u"FROM"_s, u"WHERE"_s, u"AND"_s, u"OR"_s,
+                                       u"ORDER"_s,  u"AS"_s,   u"LIKE"_s,  u"ON"_s,  u"SET"_s};
+        return words.contains(token.text, Qt::CaseInsensitive);
+    }
+
+    void writeLimit()
+    {
+        for (Index i = 0; i < count(); ++i) {
+            const Index top = at(i).is(u"SELECT") ? next(i) : none;
+            if (!isAt(top, u"TOP") || next(top) == none || at(next(top)).part != Part::Number)
+                continue;
+            const Index number = next(top);
+            const QString limit = u" LIMIT "_s + at(number).text;
+            const Index behind = next(number);
+            const Index end = endOfSelect(i);
+            tokens.insert(tokens.begin() + end, {Part::Symbol, limit});
+            if (behind != none)
+                tokens.erase(tokens.begin() + top, tokens.begin() + behind);
+        }
+    }
+
+    /// Behind the last token of the SELECT at `i`: the parenthesis that closes around it, or the end.
+    Index endOfSelect(Index i)
+    {
+        int depth = 0;
+        for (; i < count(); ++i) {
+            if (at(i).is(u"("))
+                ++depth;
+            else if (at(i).is(u")") && --depth < 0)
+                return i;
+        }
+        return count();
+    }
+
+    void doubleBackslashes()
+    {
+        for (Token& token : tokens) {
+            if (token.part == Part::Literal)
+                token.text.replace(u'\\', u"\\\\"_s);
+        }
+    }
+
+    Tokens tokens;
+    const Dialect& dialect;
+    Schema& schema;
+    QList<std::pair<QString, QString>> scope;  // alias or name, and the table
+};
+
+}  // namespace
+
+QString translated(const QString& statement, const Dialect& dialect, Schema& schema)
+{
+    return Translation(statement, dialect, schema).run();
+}
+
+QStringList statementsOf(const QString& script)
+{
+    QStringList statements;
+    QString current;
+    const auto take = [&] {
+        if (!current.trimmed().isEmpty())
+            statements.append(current.trimmed());
+        current.clear();
+    };
+    static const QRegularExpression comment(u"^\\s*--[^\\n]*$"_s, QRegularExpression::MultilineOption);
+    for (const Token& token : tokensOf(QString(script).remove(comment))) {
+        if (token.is(u";"))
+            take();
+        else
+            current += token.text;
+    }
+    take();
+    return statements;
+}
+
+}  // namespace kest::db
