@@ -1,0 +1,228 @@
+#include "platform/settings/registry.h"
+
+#include "platform/RuntimeError.h"
+#include "platform/files/files.h"
+#include "platform/profile.h"
+#include "platform/settings/RegistryFile.h"
+
+#include <QElapsedTimer>
+#include <QFile>
+#include <QThread>
+
+#include <fcntl.h>
+#include <sys/file.h>
+#include <sys/stat.h>
+#include <unistd.h>
+
+#include <functional>
+#include <mutex>
+#include <tuple>
+
+using namespace Qt::StringLiterals;
+
+namespace kest::settings {
+
+namespace {
+
+constexpr std::pair<Hive, QLatin1StringView> hiveNames[] = {
+    {Hive::ClassesRoot, "HKEY_CLASSES_ROOT"_L1},
+    {Hive::CurrentUser, "HKEY_CURRENT_USER"_L1},
+    {Hive::LocalMachine, "HKEY_LOCAL_MACHINE"_L1},
+};
+
+QString registryPath()
+{
+    return profile::root() + u"/registry.ini"_s;
+}
+
+QLatin1StringView nameOf(Hive hive)
+{
+    for (const auto& [known, name] : hiveNames) {
+        if (known == hive)
+            return name;
+    }
+    Q_UNREACHABLE();
+}
+
+/// The key's path with its hive; backslashes too many are passed over.
+QString pathOf(Hive hive, const QString& key)
+{
+    QString path = nameOf(hive);
+    for (const QString& name : key.split(u'\\', Qt::SkipEmptyParts))
+        path += u'\\' + name;
+    return path;
+}
+
+QString userKey(const QString& application, const QString& section)
+{
+    return u"Software\\ApplicationSettings\\"_s + application + u'\\' + section;
+}
+
+/// Tells one state of the file from another: each change is a new file.
+using Identity = std::tuple<QString, quint64, qint64, qint64, qint64>;
+
+std::optional<Identity> identityOf(const QString& path)
+{
+    struct stat state {};
+    if (::stat(QFile::encodeName(path).constData(), &state) != 0)
+        return {};
+    return Identity{path, state.st_ino, state.st_size, state.st_mtim.tv_sec, state.st_mtim.tv_nsec};
+}
+
+struct Cache {
+    std::mutex mutex;
+    std::optional<Identity> identity;
+    RegistryFile content;
+};
+
+Cache& cache()
+{
+    static Cache instance;
+    return instance;
+}
+
+/// What the file holds now; a missing file holds nothing. Throws where it cannot be read.
+RegistryFile present()
+{
+    const QString path = registryPath();
+    const std::optional<Identity> identity = identityOf(path);
+    if (!identity)
+        return {};
+    Cache& kept = cache();
+    const std::lock_guard lock(kept.mutex);
+    if (kept.identity != identity) {
+        kept.content = RegistryFile::fromBytes(files::readBytes(path));
+        kept.identity = identity;
+    }
+    return kept.content;
+}
+
+/// What can't be read is empty.
+RegistryFile readable()
+{
+    RegistryFile content;
+    attempt([&] { content = present(); });
+    return content;
+}
+
+/// Keeps other processes and threads from writing. The system takes the lock away from a process that has died.
+class WriteLock {
+public:
+    explicit WriteLock(const QString& path)
+        : descriptor(::open(QFile::encodeName(path).constData(), O_RDWR | O_CREAT | O_CLOEXEC, 0666))
+    {
+        constexpr int longestWait = 10000;  // milliseconds
+        QElapsedTimer waiting;
+        waiting.start();
+        while (descriptor >= 0 && !(locked = ::flock(descriptor, LOCK_EX | LOCK_NB) == 0) &&
+               waiting.elapsed() < longestWait)
+            QThread::msleep(2);
+    }
+    ~WriteLock()
+    {
+        if (descriptor >= 0)
+            ::close(descriptor);
+    }
+    WriteLock(const WriteLock&) = delete;
+    WriteLock& operator=(const WriteLock&) = delete;
+
+    bool isLocked() const { return locked; }
+
+private:
+    int descriptor;
+    bool locked = false;
+};
+
+/// Changes the file as a whole. False when `edit` refuses or when the file cannot be written.
+bool change(const std::function<bool(RegistryFile&)>& edit)
+{
+    const QString path = registryPath();
+    const WriteLock lock(path + u".lock"_s);
+    if (!lock.isLocked())
+        return false;
+    bool done = false;
+    const bool written = attempt([&] {
+        RegistryFile content = present();
+        done = edit(content);
+        if (done)
+            files::writeBytes(path, content.toBytes());
+    });
+    return written && done;
+}
+
+}  // namespace
+
+bool keyExists(Hive hive, const QString& key)
+{
+    return readable().find(pathOf(hive, key)) != nullptr;
+}
+
+std::optional<Value> query(Hive hive, const QString& key, const QString& name)
+{
+    const RegistryFile content = readable();
+    const Value* const value = content.find(pathOf(hive, key), name);
+    return value ? std::optional(*value) : std::nullopt;
+}
+
+bool setValue(Hive hive, const QString& key, const QString& name, const Value& value)
+{
+    const QString path = pathOf(hive, key);
+    return change([&](RegistryFile& content) {
+        if (!content.find(path))
+            return false;
+        content.set(path, name, value);
+        return true;
+    });
+}
+
+bool createKey(Hive hive, const QString& key)
+{
+    return change([path = pathOf(hive, key)](RegistryFile& content) {
+        content.make(path);
+        return true;
+    });
+}
+
+bool removeKey(Hive hive, const QString& key)
+{
+    const QString path = pathOf(hive, key);
+    return change([&](RegistryFile& content) {
+        if (!content.find(path) || content.hasSubkeys(path))
+            return false;
+        content.remove(path);
+        return true;
+    });
+}
+
+QList<Entry> entries()
+{
+    QList<Entry> all;
+    const RegistryFile content = readable();
+    for (const RegistryFile::Key& key : content.keys()) {
+        const QString hiveName = key.path.section(u'\\', 0, 0);
+        for (const auto& [hive, name] : hiveNames) {
+            if (hiveName.compare(name, Qt::CaseInsensitive) != 0)
+                continue;
+            for (const RegistryFile::Value& value : key.values)
+                all.append({hive, key.path.section(u'\\', 1), value.name, value.value});
+        }
+    }
+    return all;
+}
+
+QString userSetting(const QString& application, const QString& section, const QString& name, const QString& fallback)
+{
+    const auto value = query(Hive::CurrentUser, userKey(application, section), name);
+    return value ? value->data : fallback;
+}
+
+bool setUserSetting(const QString& application, const QString& section, const QString& name, const QString& value)
+{
+    const QString path = pathOf(Hive::CurrentUser, userKey(application, section));
+    return change([&](RegistryFile& content) {
+        content.set(path, name, {Type::Text, value});
+        return true;
+    });
+}
+
+}  // namespace kest::settings
