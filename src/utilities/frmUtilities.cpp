@@ -1,0 +1,307 @@
+#include "utilities/frmUtilities.h"
+
+#include "platform/database/Sql.h"
+#include "platform/desktop/Prompt.h"
+#include "platform/desktop/Window.h"
+#include "platform/values.h"
+#include "quotedata/NoteChain.h"
+#include "shell/Helpers.h"
+#include "shell/SharedVariables.h"
+#include "utilities/ExactTextEdit.h"
+#include "utilities/StatusRepair.h"
+
+#include <QCheckBox>
+#include <QGridLayout>
+#include <QGroupBox>
+#include <QHBoxLayout>
+#include <QLabel>
+#include <QLineEdit>
+#include <QPushButton>
+#include <QTabBar>
+#include <QVBoxLayout>
+
+using namespace Qt::StringLiterals;
+
+namespace kest {
+
+namespace {
+
+struct Field {
+    QLatin1StringView name;
+    QLatin1StringView label;
+    QLatin1StringView column;  // of QUOTE1; empty for what is put together from elsewhere
+    bool editable;
+};
+
+constexpr Field fields[] = {
+    {"txtQTNNO"_L1, "Quote No"_L1, ""_L1, false},
+    {"txtRego"_L1, "Rego"_L1, "REGO"_L1, false},
+    {"txtJobStage"_L1, "Job Stage"_L1, ""_L1, false},
+    {"txtInsurer"_L1, "Insurer"_L1, ""_L1, false},
+    {"txtQRNo"_L1, "KEST QR No"_L1, "KESTQRNo"_L1, true},
+    {"txtQRVer"_L1, "QR Ver"_L1, "KESTQRVer"_L1, true},
+    {"txtQuoteNo"_L1, "KEST Quote No"_L1, "KESTQuoteNo"_L1, true},
+    {"txtClaimNo"_L1, "KEST Claim No"_L1, "Claim"_L1, true},
+    {"txtAuthNo"_L1, "KEST Auth No"_L1, "KESTAuthNo"_L1, true},
+    {"txtAuthDate"_L1, "KEST Auth Date"_L1, "AuthDate"_L1, true},
+};
+
+/// The one value that a query gives, or the empty text.
+QString looked(const QString& select)
+{
+    db::Recordset row(gConn);
+    row.open(select);
+    return row.eof() ? QString() : row.text(row.columns().first());
+}
+
+}  // namespace
+
+frmUtilities::frmUtilities()
+    : Form(u"frmUtilities"_s, u"Utilities"_s),
+      quote(gConn),
+      remarks(gConn),
+      TabStrip1(new QTabBar),
+      chkReadOnly(new QCheckBox(u"Read Only"_s)),
+      chkExtraInfo(new QCheckBox(u"Extra Information"_s)),
+      txtRemarks(new ExactTextEdit)
+{
+    TabStrip1->setObjectName("TabStrip1"_L1);
+    TabStrip1->setExpanding(false);
+
+    auto* layout = new QVBoxLayout(this);
+    layout->addWidget(TabStrip1);
+    layout->addWidget(quoteInformation(), 1);
+    layout->addWidget(setQuoteStatus());
+    layout->addWidget(closingButtons());
+    box("txtQRNo"_L1)->setFocus();
+}
+
+QWidget* frmUtilities::quoteInformation()
+{
+    auto* frame = new QGroupBox(u"Quote Information"_s);
+    auto* grid = new QGridLayout(frame);
+    int place = 0;
+    for (const Field& field : fields) {
+        auto* text = new QLineEdit;
+        text->setObjectName(field.name);
+        text->setMinimumWidth(desktop::pixels(2400));
+        if (!field.editable) {
+            text->setReadOnly(true);
+            text->setFocusPolicy(Qt::ClickFocus);
+            QPalette colours = text->palette();
+            colours.setColor(QPalette::Base, colours.color(QPalette::Window));
+            text->setPalette(colours);
+        }
+        const int column = place % 2 * 2;
+        grid->addWidget(new QLabel(field.label), place / 2, column);
+        grid->addWidget(text, place / 2, column + 1);
+        ++place;
+    }
+    const int below = place / 2;
+    chkReadOnly->setObjectName("chkReadOnly"_L1);
+    chkExtraInfo->setObjectName("chkExtraInfo"_L1);
+    grid->addWidget(chkReadOnly, below, 1);
+    grid->addWidget(chkExtraInfo, below, 3);
+    txtRemarks->setObjectName("txtRemarks"_L1);
+    txtRemarks->setTabChangesFocus(true);
+    txtRemarks->setMinimumHeight(desktop::pixels(1500));
+    grid->addWidget(new QLabel(u"Remarks"_s), below + 1, 0, Qt::AlignTop);
+    grid->addWidget(txtRemarks, below + 1, 1, 1, 3);
+    grid->setRowStretch(below + 1, 1);
+    return frame;
+}
+
+QWidget* frmUtilities::setQuoteStatus()
+{
+    auto* frame = new QGroupBox(u"Set Quote Status"_s);
+    auto* row = new QHBoxLayout(frame);
+    for (const StatusRepair& repair : statusRepairs()) {
+        if (repair.startsGroup)
+            row->addSpacing(desktop::pixels(600));
+        auto* start = new QPushButton(repair.caption);
+        start->setObjectName(repair.button);
+        row->addWidget(start);
+        desktop::onEvent(start, &QPushButton::clicked, this, u"frmUtilities.%1_Click"_s.arg(repair.button),
+                         [this, &repair] { SetStatus(repair); });
+    }
+    row->addStretch();
+    return frame;
+}
+
+QWidget* frmUtilities::closingButtons()
+{
+    auto* buttons = new QWidget;
+    auto* row = new QHBoxLayout(buttons);
+    row->setContentsMargins({});
+    row->addWidget(button(u"Command9"_s, u"Undo"_s, &frmUtilities::Command9_Click));
+    row->addStretch();
+    row->addWidget(button(u"Command1"_s, u"Save"_s, &frmUtilities::Command1_Click));
+    row->addWidget(button(u"Command2"_s, u"Close"_s, &frmUtilities::Command2_Click));
+    return buttons;
+}
+
+QPushButton* frmUtilities::button(const QString& name, const QString& caption, void (frmUtilities::*click)())
+{
+    auto* made = new QPushButton(caption);
+    made->setObjectName(name);
+    desktop::onEvent(made, &QPushButton::clicked, this, u"frmUtilities.%1_Click"_s.arg(name),
+                     [this, click] { (this->*click)(); });
+    return made;
+}
+
+QLineEdit* frmUtilities::box(QLatin1StringView name) const
+{
+    return findChild<QLineEdit*>(name);
+}
+
+void frmUtilities::ShowForm(const QString& sQTNNO, const QString& sSubQuote)
+{
+    const QString subquote = sSubQuote.isEmpty() ? u"0"_s : sSubQuote;
+    frmUtilities form;
+    form.AddTabs(sQTNNO, subquote);
+    form.OpenRows(sQTNNO, subquote);
+    form.Fill();
+    desktop::showModal(form);
+}
+
+void frmUtilities::AddTabs(const QString& number, const QString& shownSubquote)
+{
+    const auto add = [this](const QString& caption, const QString& subquote) {
+        TabStrip1->setTabData(TabStrip1->addTab(caption), u'S' + subquote);
+    };
+    add(u"Quote"_s, u"0"_s);
+    db::Recordset subquotes(gConn);
+    subquotes.open(sql("SELECT SUBQUOTE FROM QUOTE1 WHERE QTNNO='{}'", number));
+    if (subquotes.recordCount() > 1) {
+        for (subquotes.moveNext(); !subquotes.eof(); subquotes.moveNext())
+            add(u"Add.-"_s + subquotes.text(u"SUBQUOTE"_s), subquotes.text(u"SUBQUOTE"_s));
+    }
+    for (int tab = 0; tab < TabStrip1->count(); ++tab) {
+        if (TabStrip1->tabData(tab).toString() == u'S' + shownSubquote)
+            TabStrip1->setCurrentIndex(tab);
+    }
+    desktop::onEvent(TabStrip1, &QTabBar::currentChanged, this, u"frmUtilities.TabStrip1_Click"_s,
+                     [this] { TabStrip1_Click(); });
+}
+
+void frmUtilities::OpenRows(const QString& number, const QString& subquote)
+{
+    quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+    remarks.open(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+}
+
+void frmUtilities::CloseRows()
+{
+    quote.close();
+    remarks.close();
+}
+
+void frmUtilities::Fill()
+{
+    for (const Field& field : fields) {
+        if (!field.column.isEmpty())
+            box(field.name)->setText(quote.text(field.column));
+    }
+    const bool isMainQuote = SubquoteOfRow() == u"0"_s;
+    box("txtQTNNO"_L1)->setText(quote.text(u"QTNNO"_s) + (isMainQuote ? QString() : u'/' + SubquoteOfRow()));
+    box("txtJobStage"_L1)
+        ->setText(looked(sql("SELECT description FROM JOBSTAGE WHERE stage={}", quote.value(u"Job_stage"_s))));
+    box("txtInsurer"_L1)
+        ->setText(looked(sql("SELECT NAME FROM INSURER WHERE INSURER_ID={}", quote.value(u"INSURER_ID"_s))));
+    chkReadOnly->setChecked(isTrue(quote.value(u"ReadOnly"_s)));
+    chkExtraInfo->setChecked(isTrue(quote.value(u"ExtraInfo"_s)));
+    txtRemarks->setExactText(remarks.eof() ? QString() : remarks.text(u"remarks"_s));
+}
+
+/// The shown row's subquote; "0" where it has none.
+QString frmUtilities::SubquoteOfRow() const
+{
+    const QString subquote = quote.text(u"Subquote"_s);
+    return subquote.isEmpty() ? u"0"_s : subquote;
+}
+
+void frmUtilities::TabStrip1_Click()
+{
+    const QString number = quote.text(u"QTNNO"_s);
+    const QString subquote = TabStrip1->tabData(TabStrip1->currentIndex()).toString().mid(1);
+    quote.close();
+    quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+    Command9_Click();
+}
+
+void frmUtilities::Command9_Click()
+{
+    const QString number = quote.text(u"QTNNO"_s);
+    const QString subquote = SubquoteOfRow();
+    CloseRows();
+    OpenRows(number, subquote);
+    Fill();
+}
+
+void frmUtilities::Command1_Click()
+{
+    if (SafeVal(box("txtClaimNo"_L1)->text(), u"0"_s) <= 0) {
+        desktop::msgBox(u"Invalid Claim Number Entered"_s, desktop::Icon::Critical);
+        return;
+    }
+    WriteQuote();
+    WriteRemarks();
+    quote.update();
+    remarks.update();
+    CloseRows();
+
+    // the host's quote, also where another subquote was edited
+    auto hostQuote = std::make_shared<db::Recordset>(gConn);
+    hostQuote->open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", gsQTNNO, gsSubQuote));
+    grsQuote = hostQuote;
+    close();
+}
+
+void frmUtilities::WriteQuote()
+{
+    for (const Field& field : fields) {
+        if (!field.editable)
+            continue;
+        const QString text = box(field.name)->text();
+        const bool noDate = field.column == "AuthDate"_L1 && text.isEmpty();
+        quote.set(field.column, noDate ? QVariant() : QVariant(text));
+    }
+    quote.set(u"ReadOnly"_s, chkReadOnly->isChecked());
+    quote.set(u"ExtraInfo"_s, chkExtraInfo->isChecked());
+}
+
+void frmUtilities::WriteRemarks()
+{
+    const QString text = txtRemarks->exactText();
+    if (remarks.eof()) {
+        if (text.isEmpty())
+            return;
+        remarks.addNew();
+        remarks.set(u"QTNNO"_s, quote.value(u"QTNNO"_s));
+        remarks.set(u"Subquote"_s, quote.value(u"Subquote"_s));
+    }
+    remarks.set(u"remarks"_s, text);
+}
+
+void frmUtilities::Command2_Click()
+{
+    CloseRows();
+    close();
+}
+
+void frmUtilities::SetStatus(const StatusRepair& repair)
+{
+    chkReadOnly->setChecked(repair.locks);
+    QString chain = txtRemarks->exactText();
+    for (const QString& subject : repair.removed)
+        chain = RemoveNote(subject, chain);
+    if (repair.forgetsQuoteNumber)
+        box("txtQuoteNo"_L1)->clear();
+    for (const StatusRepair::Note& note : repair.added) {
+        if (!note.mainQuoteOnly || SubquoteOfRow() == u"0"_s)
+            chain = AddNote(note.subject, note.status, chain, {}, false);
+    }
+    txtRemarks->setExactText(chain);
+}
+
+}  // namespace kest

@@ -1,0 +1,215 @@
+#include "utilities/frmViewXML.h"
+
+#include "platform/desktop/Prompt.h"
+#include "platform/desktop/Window.h"
+#include "platform/files/files.h"
+#include "shell/SharedVariables.h"
+#include "utilities/ExactTextEdit.h"
+#include "utilities/FormatXML.h"
+#include "utilities/frmLogin.h"
+
+#include <QCloseEvent>
+#include <QFontDatabase>
+#include <QHBoxLayout>
+#include <QKeyEvent>
+#include <QLabel>
+#include <QLineEdit>
+#include <QPushButton>
+#include <QRegularExpression>
+#include <QScrollBar>
+#include <QShortcut>
+#include <QTextBlock>
+
+using namespace Qt::StringLiterals;
+
+namespace kest {
+
+namespace {
+
+constexpr int tabWidth = 4;  // characters
+
+}  // namespace
+
+frmViewXML::frmViewXML(const QString& file)
+    : Form(u"frmViewXML"_s, u"View XML"_s),
+      sFile(file),
+      txtXML(new ExactTextEdit(this)),
+      Command1(desktop::exitButton(this, u"Command1"_s)),
+      Command2(new QPushButton(this)),
+      findBar(new QWidget(this)),
+      txtFind(new QLineEdit(this)),
+      lblPosition(new QLabel(this))
+{
+    setMinimumSize(desktop::pixels(9000, 4500));
+    resize(desktop::pixels(13500, 9600));
+
+    txtXML->setObjectName("txtXML"_L1);
+    txtXML->setFont(QFontDatabase::systemFont(QFontDatabase::FixedFont));
+    txtXML->setLineWrapMode(QPlainTextEdit::NoWrap);
+    txtXML->setTabStopDistance(tabWidth * QFontMetricsF(txtXML->font()).horizontalAdvance(u' '));
+    txtXML->installEventFilter(this);
+    Command2->setObjectName("Command2"_L1);
+    Command2->setText(u"Save"_s);
+
+    txtFind->setPlaceholderText(u"Find (Ctrl+F)"_s);
+    txtFind->setClearButtonEnabled(true);
+    auto* previous = new QPushButton(u"Previous"_s);
+    auto* next = new QPushButton(u"Next"_s);
+    auto* row = new QHBoxLayout(findBar);
+    row->setContentsMargins({});
+    row->addWidget(txtFind, 1);
+    row->addWidget(previous);
+    row->addWidget(next);
+    row->addWidget(lblPosition);
+    QWidget* before = txtXML;
+    for (QWidget* control : std::initializer_list<QWidget*>{txtFind, previous, next, Command2, Command1}) {
+        setTabOrder(before, control);
+        before = control;
+    }
+
+    desktop::onEvent(Command1, &QPushButton::clicked, this, u"frmViewXML.Command1_Click"_s,
+                     [this] { Command1_Click(); });
+    desktop::onEvent(Command2, &QPushButton::clicked, this, u"frmViewXML.Command2_Click"_s,
+                     [this] { Command2_Click(); });
+    const auto find = [this](auto* sender, auto signal, bool backward) {
+        desktop::onEvent(sender, signal, this, u"frmViewXML.Find"_s, [this, backward] { findNext(backward); });
+    };
+    find(txtFind, &QLineEdit::returnPressed, false);
+    find(next, &QPushButton::clicked, false);
+    find(previous, &QPushButton::clicked, true);
+    find(new QShortcut(QKeySequence(Qt::Key_F3), this), &QShortcut::activated, false);
+    find(new QShortcut(QKeySequence(Qt::SHIFT | Qt::Key_F3), this), &QShortcut::activated, true);
+    desktop::onEvent(new QShortcut(QKeySequence::Find, this), &QShortcut::activated, this, u"frmViewXML.Find"_s,
+                     [this] {
+                         txtFind->setFocus();
+                         txtFind->selectAll();
+                     });
+    desktop::onEvent(txtXML, &QPlainTextEdit::cursorPositionChanged, this, u"frmViewXML.txtXML_SelChange"_s,
+                     [this] { showPosition(); });
+    const auto colour = [this](auto* sender, auto signal) {
+        desktop::onEvent(sender, signal, this, u"frmViewXML.txtXML_Paint"_s, [this] { colourVisibleTags(); });
+    };
+    colour(txtXML, &QPlainTextEdit::textChanged);
+    colour(txtXML->verticalScrollBar(), &QScrollBar::valueChanged);
+    colour(txtXML->verticalScrollBar(), &QScrollBar::rangeChanged);
+}
+
+void frmViewXML::ShowForm(const QString& file)
+{
+    frmViewXML form(file);
+    form.txtXML->setExactText(FormatXML(gsCurFolder + file));
+    form.showPosition();
+    desktop::showModal(form);
+}
+
+bool frmViewXML::eventFilter(QObject* watched, QEvent* event)
+{
+    // Escape is on its way to the window and types nothing
+    if (watched == txtXML && event->type() == QEvent::KeyPress &&
+        static_cast<QKeyEvent*>(event)->key() != Qt::Key_Escape)
+        unchanged = false;
+    return Form::eventFilter(watched, event);
+}
+
+void frmViewXML::resizeEvent(QResizeEvent* event)
+{
+    Form::resizeEvent(event);
+    const int formWidth = desktop::twips(width());
+    const int formHeight = desktop::twips(height());
+    if (formWidth <= 600 || formHeight <= 2000)
+        return;
+    const auto place = [](QWidget* control, int left, int top, int controlWidth, int controlHeight) {
+        control->setGeometry(
+            {QPoint(desktop::pixels(left), desktop::pixels(top)), desktop::pixels(controlWidth, controlHeight)});
+    };
+    constexpr int margin = 375 / 2;
+    constexpr int buttonHeight = 540;
+    place(txtXML, margin, 120, formWidth - 375, formHeight - 1350);
+    place(Command1, formWidth - 870, formHeight - 1125, 870 - margin, buttonHeight);
+    place(Command2, formWidth - 1830, formHeight - 1125, 855, buttonHeight);
+    place(findBar, margin, formHeight - 1125, formWidth - 1830 - 2 * margin, buttonHeight);
+    colourVisibleTags();
+}
+
+void frmViewXML::closeEvent(QCloseEvent* event)
+{
+    const bool typed = !unchanged || txtXML->document()->isModified();
+    bool leaves = !typed;
+    desktop::guarded(u"frmViewXML.QueryUnload"_s, [&] {
+        if (typed)
+            leaves = desktop::ask(u"Are you sure you want to exit without saving this message?"_s);
+    });
+    if (leaves)
+        Form::closeEvent(event);
+    else
+        event->ignore();
+}
+
+void frmViewXML::Command1_Click()
+{
+    close();
+}
+
+void frmViewXML::Command2_Click()
+{
+    bool ok = false;
+    frmLogin::ShowForm(ok);
+    if (!ok)
+        return;
+    if (!desktop::ask(u"Are you sure you want to OVERWRITE this message?"_s, desktop::Icon::Exclamation))
+        return;
+    const QString shown = txtXML->exactText();
+    const QString text = WithoutRequestWrapper(shown);
+    if (text != shown)
+        txtXML->setExactText(text);
+    unchanged = false;  // until the file is written
+    files::write(files::pathForWriting(gsCurFolder, sFile), WithMarkupCharacters(text));
+    unchanged = true;
+    txtXML->document()->setModified(false);
+    close();
+}
+
+void frmViewXML::findNext(bool backward)
+{
+    const QString wanted = txtFind->text();
+    if (wanted.isEmpty())
+        return;
+    const QTextDocument::FindFlags direction = backward ? QTextDocument::FindBackward : QTextDocument::FindFlags();
+    if (txtXML->find(wanted, direction))
+        return;
+    const QTextCursor here = txtXML->textCursor();
+    txtXML->moveCursor(backward ? QTextCursor::End : QTextCursor::Start);
+    if (txtXML->find(wanted, direction))
+        return;
+    txtXML->setTextCursor(here);
+    lblPosition->setText(u"Not found"_s);
+}
+
+void frmViewXML::showPosition()
+{
+    const QTextCursor cursor = txtXML->textCursor();
+    lblPosition->setText(u"Line %1, column %2"_s.arg(cursor.blockNumber() + 1).arg(cursor.positionInBlock() + 1));
+}
+
+// Only what is seen is coloured, so that a message of any size opens at once.
+void frmViewXML::colourVisibleTags()
+{
+    static const QRegularExpression tag(u"</?[^<>\\s/][^<>]*>"_s);
+    QTextCharFormat colour;
+    colour.setForeground(palette().color(QPalette::Link));
+
+    QList<QTextEdit::ExtraSelection> tags;
+    QTextCursor cursor = txtXML->cursorForPosition({});
+    const int last = txtXML->cursorForPosition(txtXML->viewport()->rect().bottomLeft()).blockNumber();
+    for (QTextBlock line = cursor.block(); line.isValid() && line.blockNumber() <= last; line = line.next()) {
+        for (auto matches = tag.globalMatch(line.text()); matches.hasNext();) {
+            const QRegularExpressionMatch match = matches.next();
+            cursor.setPosition(line.position() + static_cast<int>(match.capturedStart()));
+            cursor.setPosition(line.position() + static_cast<int>(match.capturedEnd()), QTextCursor::KeepAnchor);
+            tags.append({cursor, colour});
+        }
+    }
+    txtXML->setExtraSelections(tags);
+}
+
+}  // namespace kest

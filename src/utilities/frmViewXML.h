@@ -1,0 +1,46 @@
+// Shows a message file as indented text, and overwrites it behind the password.
+#pragma once
+
+#include "platform/desktop/Form.h"
+
+class QLabel;
+class QLineEdit;
+class QPushButton;
+
+namespace kest {
+
+class ExactTextEdit;
+
+class frmViewXML final : public desktop::Form {
+    Q_OBJECT
+
+public:
+    /// Shows a file of `gsCurFolder`, named without the folder.
+    static void ShowForm(const QString& file);
+
+protected:
+    bool eventFilter(QObject* watched, QEvent* event) override;
+    void resizeEvent(QResizeEvent* event) override;
+    void closeEvent(QCloseEvent* event) override;
+
+private:
+    explicit frmViewXML(const QString& file);
+
+    void Command1_Click();
+    void Command2_Click();
+    void findNext(bool backward);
+    void showPosition();
+    void colourVisibleTags();
+
+    QString sFile;
+    bool unchanged = true;  // since the text was loaded or saved
+
+    ExactTextEdit* txtXML;
+    QPushButton* Command1;
+    QPushButton* Command2;
+    QWidget* findBar;
+    QLineEdit* txtFind;
+    QLabel* lblPosition;
+};
+
+}  // namespace kest
