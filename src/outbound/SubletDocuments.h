@@ -1,0 +1,25 @@
+// The documents that authorise sublet work: PDF files beside the message folders, one for a line of a quote.
+#pragma once
+
+#include <QList>
+#include <QString>
+
+namespace kest {
+
+/// The folder of the documents, ending in a backslash: "PDF" in the parent of the unread folder.
+QString SubletFolder();
+
+struct SubletDocument {
+    QString file;         // its name in the folder: QTNNO.Subquote_Number.pdf
+    QString lineNumber;   // of the quote line that it belongs to
+    QString description;  // of that line
+    QString vendor;       // empty where the line has none
+};
+
+/// The numbers of a quote's documents, each once, in the order of the file names; empty where the folder can't be read.
+QStringList SubletDocumentNumbers(const QString& QTNNO, const QString& Subquote);
+
+/// The documents of these numbers whose line is in the quote. What can't be read is left out.
+QList<SubletDocument> SubletDocuments(const QString& QTNNO, const QString& Subquote, const QStringList& numbers);
+
+}  // namespace kest
