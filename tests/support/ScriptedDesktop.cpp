@@ -12,7 +12,7 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-QJsonObject parsed(const char* text)
+QJsonObject parsed(const QByteArray& text)
 {
     QJsonParseError error;
     const QJsonDocument document = QJsonDocument::fromJson(text, &error);
@@ -31,7 +31,7 @@ QStringList texts(const QJsonArray& entries, const QString& key)
 
 }  // namespace
 
-ScriptedDesktop::ScriptedDesktop(const char* json) : script(std::make_shared<desktop::Script>(parsed(json)))
+ScriptedDesktop::ScriptedDesktop(const QByteArray& json) : script(std::make_shared<desktop::Script>(parsed(json)))
 {
     for (const QString& window : {u"frmPrintPreview"_s, u"frmSubletAuth"_s, u"frmViewPDF"_s})
         script->recordAndClose(window);

@@ -14,7 +14,7 @@ class ScriptedDesktop {
 public:
     /// `script` is the JSON of a script file. frmPrintPreview, frmSubletAuth and frmViewPDF close by themselves where
     /// it has no visit for them, as in the command.
-    explicit ScriptedDesktop(const char* script = "{}");
+    explicit ScriptedDesktop(const QByteArray& script = "{}");
     /// A failure that was kept in a window's event and never thrown fails the test.
     ~ScriptedDesktop();
     Q_DISABLE_COPY_MOVE(ScriptedDesktop)

@@ -2,6 +2,7 @@
 
 #include "platform/desktop/Refusal.h"
 
+#include <QAbstractButton>
 #include <QApplication>
 #include <QElapsedTimer>
 #include <QScrollArea>
@@ -24,7 +25,10 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-constexpr int longestActivation = 1000;  // milliseconds that a window manager may take
+// Milliseconds.
+constexpr int longestActivation = 1000;  // of a slow window manager
+constexpr int longestPress = 500;        // of a button that an access key holds down
+constexpr int pollInterval = 5;
 
 int eventTime = 0;  // milliseconds; two clicks of one step may make a double click, those of two steps never do
 
@@ -57,6 +61,29 @@ QPoint reachablePoint(QWidget& control, QPoint at)
     if (hit != &control && !control.isAncestorOf(hit) && window != &control)
         throw Refusal(hit ? u"the control is covered by "_s + hit->objectName() : u"the control lies out of reach"_s);
     return point;
+}
+
+/// A window that was hidden and shown again may still have the system's focus, so that no event makes it active.
+void makeActive(QWidget& window)
+{
+    QT_WARNING_PUSH
+    QT_WARNING_DISABLE_DEPRECATED
+    QApplication::setActiveWindow(&window);
+    QT_WARNING_POP
+}
+
+/// A button acts when the access key has let it come up again, a moment after the key.
+void letButtonsComeUp(const QWidget& window)
+{
+    const auto isDown = [&] {
+        return std::ranges::any_of(window.findChildren<QAbstractButton*>(), &QAbstractButton::isDown);
+    };
+    QElapsedTimer time;
+    time.start();
+    while (isDown() && time.elapsed() < longestPress) {
+        QThread::msleep(pollInterval);
+        settle();
+    }
 }
 
 void key(QWidget& window, int code, Qt::KeyboardModifiers modifiers, const QString& text)
@@ -100,16 +127,16 @@ void settle()
 
 void activate(QWidget& window)
 {
-    if (!window.isVisible())
-        return;
     settle();
     QElapsedTimer time;
     time.start();
     while (window.isVisible() && !window.isActiveWindow() && time.elapsed() < longestActivation) {
         window.activateWindow();
         settle();
-        if (!window.isActiveWindow())
-            QThread::msleep(5);
+        if (QGuiApplication::focusWindow() == window.windowHandle())
+            makeActive(window);
+        else
+            QThread::msleep(pollInterval);
     }
 }
 
@@ -152,6 +179,7 @@ void press(QWidget& window, QKeyCombination combination)
 {
     const bool back = combination.key() == Qt::Key_Tab && combination.keyboardModifiers() == Qt::ShiftModifier;
     key(window, back ? Qt::Key_Backtab : combination.key(), combination.keyboardModifiers(), textOf(combination));
+    letButtonsComeUp(window);
 }
 
 void type(QWidget& window, const QString& text)
