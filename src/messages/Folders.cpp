@@ -123,9 +123,14 @@ QString plainOrNone(const QString& name)
 
 }  // namespace
 
+bool IsBareName(const QString& file)
+{
+    return !file.isEmpty() && !file.contains(u'/') && !file.contains(u'\\');
+}
+
 void MoveMessage(const QString& file, const QString& action)
 {
-    if (action == "read"_L1 && files::isPlainName(file) && files::exists(gsUnreadPath + file)) {
+    if (action == "read"_L1 && IsBareName(file) && files::exists(gsUnreadPath + file)) {
         QString name =
             gsMatchedQTNNO.isEmpty() ? GetReadFileName(gsUnreadPath + file) : GetMatchedFileName(gsMatchedQTNNO);
         if (name.isEmpty())

@@ -1,6 +1,7 @@
 #include "messages/Summary.h"
 
 #include "messages/Envelope.h"
+#include "messages/Folders.h"
 #include "platform/RuntimeError.h"
 #include "platform/desktop/Prompt.h"
 #include "platform/files/files.h"
@@ -159,13 +160,15 @@ QList<ListedMessage> BuildMessageList(int folder, const FillHooks& hooks)
     gsCurFolder = pathOf(folder);
     gsListFolder = gsCurFolder;
     gdicQuoteRequests.clear();
+    if (!files::folderExists(gsCurFolder))
+        throw RuntimeError(PathNotFound, gsCurFolder + ": the folder is not there"_L1);
     const QStringList names = files::list(gsCurFolder);
     settleFilter(folder, names.size(), hooks);
 
     Fill fill(folder, hooks);
     qint64 done = 0;
     for (const QString& file : names) {
-        if (file.endsWith("xml"_L1) && file.contains(gsListFilter)) {
+        if (file.endsWith("xml"_L1) && file.contains(gsListFilter) && IsBareName(file)) {
             try {
                 fill.take(file);
             } catch (const RuntimeError& error) {
