@@ -1,0 +1,121 @@
+#include "outbound/ExtraInfo.h"
+
+#include "platform/database/Sql.h"
+#include "shell/SharedVariables.h"
+
+using namespace Qt::StringLiterals;
+
+namespace kest {
+
+namespace {
+
+QString trimmed(const db::Recordset& row, const QString& column)
+{
+    return row.text(column).trimmed();
+}
+
+QString digitsOf(const QString& text)
+{
+    QString digits;
+    for (const QChar c : text)
+        if (c >= u'0' && c <= u'9')
+            digits += c;
+    return digits;
+}
+
+/// Month and year of a car's build date: "03/1998", or a year alone, which stands for its first month.
+std::pair<QString, QString> buildDate(const QString& year)
+{
+    const qsizetype slash = year.indexOf(u'/');
+    if (slash >= 0)
+        return {year.left(slash), year.mid(slash + 1)};
+    if (year.size() > 3)
+        return {u"01"_s, year};
+    return {};
+}
+
+}  // namespace
+
+ExtraInfo::ExtraInfo(const QString& quoteNumber, const QString& subquote)
+    : quoteRow(gConn), carRow(gConn), modelRow(gConn), customerRow(gConn)
+{
+    quoteRow.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quoteNumber, subquote));
+    if (quoteRow.recordCount() != 1) {
+        missing = u"Couldn't locate quote in database, Please contact MarlinDesk Support"_s;
+        return;
+    }
+    carRow.open(sql("SELECT * FROM CAR WHERE REGO='{}'", quoteRow.value(u"REGO"_s)));
+    if (carRow.recordCount() != 1) {
+        missing = u"Missing relationship : Car, Please contact MarlinDesk Support"_s;
+        return;
+    }
+    modelRow.open(sql("SELECT MAKE, MODEL FROM ALLMODEL WHERE MODEL_ID='{}'", carRow.value(u"MODEL_ID"_s)));
+    customerRow.open(sql("SELECT SALUTATION + ' ' + FIRSTNAME + ' ' + NAME AS NAME FROM CUSTOMER WHERE CUST_ID={}",
+                         carRow.value(u"CUST_ID"_s)));
+    if (modelRow.recordCount() != 1 || customerRow.recordCount() != 1)
+        missing = u"Missing relationship : Model or Customer, Please contact MarlinDesk Support"_s;
+}
+
+QString ExtraInfo::quoteNumber() const
+{
+    return trimmed(quoteRow, u"QTNNO"_s);
+}
+
+QString ExtraInfo::customer() const
+{
+    return trimmed(customerRow, u"NAME"_s);
+}
+
+QString ExtraInfo::rego() const
+{
+    return trimmed(quoteRow, u"REGO"_s);
+}
+
+QString ExtraInfo::model() const
+{
+    return trimmed(modelRow, u"MAKE"_s) + u' ' + trimmed(modelRow, u"MODEL"_s);
+}
+
+ExtraValues ExtraInfo::values() const
+{
+    const QString transmission = trimmed(carRow, u"XMission"_s).toUpper();
+    const bool automatic = transmission == "A"_L1 || transmission == "AUTOMATIC"_L1;
+    const auto [month, year] = buildDate(carRow.text(u"Year"_s));
+
+    ExtraValues values;
+    values[Transmission] = automatic ? u"Automatic"_s : u"Manual"_s;
+    values[VIN] = trimmed(carRow, u"VIN"_s);
+    values[Odometer] = trimmed(quoteRow, u"kms"_s);
+    values[Cylinders] = trimmed(carRow, u"CYLINDERS"_s);
+    values[BuildMonth] = month;
+    values[BuildYear] = year;
+    values[Colour] = carRow.text(u"COLOUR"_s);
+    return values;
+}
+
+void ExtraInfo::save(const ExtraValues& values)
+{
+    if (!values[VIN].isEmpty())
+        carRow.set(u"VIN"_s, values[VIN]);
+    if (!values[Odometer].isEmpty())
+        quoteRow.set(u"kms"_s, values[Odometer]);
+    if (const QString cylinders = digitsOf(values[Cylinders]); !cylinders.isEmpty())
+        carRow.set(u"CYLINDERS"_s, cylinders);
+    carRow.set(u"XMission"_s, values[Transmission] == "Automatic"_L1 ? u"Automatic"_s : u"Manual"_s);
+    carRow.set(u"Year"_s, QString(values[BuildMonth] + u'/' + values[BuildYear]));
+    carRow.set(u"COLOUR"_s, values[Colour]);
+    carRow.update();
+    quoteRow.update();
+}
+
+ExtraInfoResult BuildArrayFromDB(const QString& quoteNumber, const QString& subquote)
+{
+    ExtraInfo info(quoteNumber, subquote);
+    if (!info.problem().isEmpty())
+        return info.problem();
+    const ExtraValues values = info.values();
+    info.save(values);
+    return values;
+}
+
+}  // namespace kest

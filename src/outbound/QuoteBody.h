@@ -1,0 +1,60 @@
+// The body of a quote document: its labour, paint, parts, report items and sublets, their sums and the tax.
+#pragma once
+
+#include "outbound/Branch.h"
+#include "outbound/LineNumbers.h"
+#include "platform/database/Recordset.h"
+
+#include <QString>
+
+#include <functional>
+
+namespace kest {
+
+/// The amounts are worked out from the lines and not taken from the totals of the quote header: the rules differ, for a
+/// line marked as deleted counts here, and each section rounds in its own way.
+class QuoteBody {
+public:
+    /// Opens the lines of a quote.
+    QuoteBody(const QString& quoteNumber, const QString& subquote, const QString& authorisedNumber);
+
+    /// Appends `quoteBody` and gives each line its number, which is stored with the line. The quote total; the walk
+    /// ends early where it is 0, since such a quote is not sent.
+    double addTo(const Branch& request);
+
+private:
+    using Line = db::Recordset;
+    using Skip = std::function<bool(const Line&)>;
+    using Elements = std::function<Leaves(const Line&)>;
+
+    void addLabours(const Branch& labours);
+    void addPaints(const Branch& paints);
+    void addParts(const Branch& parts);
+    void addReportItems(const Branch* reportItems);
+    void addSublets(const Branch* sublets);
+    Leaves part(const Line& line);
+    void walk(db::Recordset& lines, const Branch* section, const char* element, const Elements& elements,
+              const Skip& skip = {});
+
+    QString reference;
+    bool isMainQuote;
+    bool isAuthorised;
+    LineNumbers numbers;
+
+    db::Recordset removeAndReplace;
+    db::Recordset repair;
+    db::Recordset mechanical;
+    db::Recordset miscellaneous;
+    db::Recordset partLines;
+    db::Recordset paint;
+    db::Recordset otherPaint;
+    db::Recordset sublet;
+    db::Recordset reportItem;
+
+    double labourSum = 0;
+    double paintSum = 0;
+    double partSum = 0;
+    double markUpSum = 0;
+};
+
+}  // namespace kest

@@ -1,0 +1,166 @@
+#include "outbound/QuoteHead.h"
+
+#include "platform/values.h"
+#include "shell/Helpers.h"
+
+using namespace Qt::StringLiterals;
+
+namespace kest {
+
+namespace {
+
+constexpr std::pair<QLatin1StringView, QLatin1StringView> colourCodes[] = {
+    {"aqua"_L1, "AQUA"_L1},   {"beige"_L1, "BEIG"_L1},     {"black"_L1, "BLAK"_L1},  {"blue"_L1, "BLUE"_L1},
+    {"brown"_L1, "BROW"_L1},  {"champagne"_L1, "CHAM"_L1}, {"gold"_L1, "GOLD"_L1},   {"green"_L1, "GREN"_L1},
+    {"grey"_L1, "GREY"_L1},   {"maroon"_L1, "MARN"_L1},    {"orange"_L1, "ORAG"_L1}, {"pink"_L1, "PINK"_L1},
+    {"purple"_L1, "PURP"_L1}, {"red"_L1, "RED"_L1},        {"silver"_L1, "SILV"_L1}, {"white"_L1, "WHIT"_L1},
+    {"yellow"_L1, "YELW"_L1},
+};
+
+constexpr std::pair<QLatin1StringView, QLatin1StringView> paintCodes[] = {
+    {"S1"_L1, "SOLD"_L1}, {"S2"_L1, "CLER"_L1}, {"S3"_L1, "CLER"_L1},
+    {"M1"_L1, "META"_L1}, {"M2"_L1, "PEAR"_L1}, {"M3"_L1, "HARL"_L1},
+};
+
+template <size_t N>
+QString lookedUp(const std::pair<QLatin1StringView, QLatin1StringView> (&table)[N], const QString& key,
+                 const QString& otherwise)
+{
+    for (const auto& [name, code] : table)
+        if (key == name)
+            return code;
+    return otherwise;
+}
+
+/// Year and month of a car whose build date could not be taken from the extra values.
+std::pair<QString, QString> buildDate(const QString& date)
+{
+    if (date.size() == 7)
+        return {date.right(4).trimmed(), date.left(2).trimmed()};
+    return {date.size() == 4 ? date : QString(), QString()};
+}
+
+QString phoneNumber(const db::Recordset& customer, const char* column)
+{
+    return AlphaNumericOnly(trimmed(customer, column)).left(10);
+}
+
+void AddCustomer(const Branch& request, const db::Recordset& customer)
+{
+    const auto isEmptyText = [&](const QString& column) {  // a Null is not: it may be a person's
+        return !customer.isNull(column) && customer.text(column).isEmpty();
+    };
+    const bool company = isEmptyText(u"SALUTATION"_s) && isEmptyText(u"FIRSTNAME"_s);
+    const bool person = !company;
+    const bool firstNameMissing = !text(customer, "SALUTATION").isEmpty() && text(customer, "FIRSTNAME").isEmpty();
+
+    request.add("quoteClaimCustomer")
+        .add({
+            {"companyName", company, trimmed(customer, "NAME")},
+            {"title", person, trimmed(customer, "SALUTATION")},
+            {"firstName", person, firstNameMissing ? u"."_s : trimmed(customer, "FIRSTNAME")},
+            {"surname", person, trimmed(customer, "NAME")},
+            {"privatePhoneNumber", always, phoneNumber(customer, "PHONE_P")},
+            {"businessPhoneNumber", always, phoneNumber(customer, "PHONE_B")},
+        });
+}
+
+/// The extra values that the insurer did not ask for come from the car and the quote.
+ExtraValues vehicleValues(const QuoteRows& rows, const std::optional<ExtraValues>& extra)
+{
+    const db::Recordset& car = rows.car;
+    ExtraValues values;
+    if (extra)
+        values = *extra;
+    else
+        std::tie(values[BuildYear], values[BuildMonth]) = buildDate(text(car, "YEAR"));
+    if (isTrue(rows.quote.value(u"ExtraInfo"_s)))
+        return values;
+
+    const QString transmission = trimmed(car, "XMISSION").toUpper();
+    values[Transmission] = transmission == "A"_L1 || transmission == "AUTOMATIC"_L1 ? u"Automatic"_s : u"Manual"_s;
+    values[Cylinders] = QString(text(car, "ENG_SIZE") + u' ' + text(car, "CYLINDERS")).trimmed();
+    values[VIN] = trimmed(car, "VIN");
+    values[Odometer] = trimmed(rows.quote, "kms");
+    values[Colour] = text(car, "COLOUR");
+    return values;
+}
+
+void AddVehicle(const Branch& request, const QuoteRows& rows, const std::optional<ExtraValues>& extra)
+{
+    const ExtraValues values = vehicleValues(rows, extra);
+    const bool asked = isTrue(rows.quote.value(u"ExtraInfo"_s));
+    const QString oldDamage = asked && values[OldDamageDesc].isEmpty() ? u"None"_s : values[OldDamageDesc];
+    const QString colour = values[Colour].trimmed().toLower();
+
+    const Leaves leaves = {
+        filled("make", trimmed(rows.model, "MAKE")),
+        filled("yearOfManufacture", values[BuildYear]),
+        filled("monthOfManufacture", values[BuildMonth]),
+        filled("bodyShape", trimmed(rows.body, "body_desc2")),
+        filled("transmissionType", values[Transmission]),
+        filled("numberOfCylinders", values[Cylinders]),
+        filled("vinChassis", values[VIN]),
+        filled("color", lookedUp(colourCodes, colour, colour)),
+        filled("paintType", lookedUp(paintCodes, text(rows.car, "PAINT_GP").toUpper(), {})),
+        filled("odometer", values[Odometer]),
+        filled("fuelLevel", values[Fuel]),
+        filled("damageDescription", values[DamageDesc]),
+        filled("oldDamageDescription", oldDamage),
+    };
+    if (std::ranges::any_of(leaves, &Leaf::present))
+        request.add("quoteExtraVehicleInformation").add(leaves);
+}
+
+}  // namespace
+
+InsurerReference ReferenceOf(const QuoteRows& rows)
+{
+    InsurerReference reference;
+    if (!rows.isMainQuote()) {
+        const QString authorised = text(rows.quote, "KESTAuthNo");
+        reference.authorisedQuoteNumber =
+            authorised.isEmpty() ? text(rows.mainQuote, "KESTQuoteNo") : authorised.trimmed();
+    } else if (text(rows.quote, "KESTQRNo").isEmpty()) {
+        reference.claimNumber = trimmed(rows.quote, "Claim");
+    } else {
+        reference.requestNumber = trimmed(rows.quote, "KESTQRNo");
+        reference.requestVersion = trimmed(rows.quote, "KESTQRVer");
+    }
+    return reference;
+}
+
+std::optional<qint64> RepairDays(const db::Recordset& quote)
+{
+    if (quote.isNull(u"CAR_IN"_s) || quote.isNull(u"targetdate"_s))
+        return {};
+    return toDate(quote.value(u"CAR_IN"_s)).date().daysTo(toDate(quote.value(u"targetdate"_s)).date());
+}
+
+void AddHead(const Branch& request, const QuoteRows& rows, const InsurerReference& reference,
+             const std::optional<ExtraValues>& extra, std::optional<qint64> repairDays)
+{
+    const bool hasRequest = !reference.requestNumber.isEmpty();
+    request.add({
+        filled("kestAuthorisedQuoteNumber", reference.authorisedQuoteNumber),
+        filled("claimNumber", reference.claimNumber),
+        {"quoteRequestNumber", hasRequest, reference.requestNumber},
+        {"quoteRequestVersionNumber", hasRequest, reference.requestVersion},
+        {"quotationSoftware", always, u"MarlinDesk"_s},
+        {"quotationSoftwareVersion", always, QStringLiteral(KEST_VERSION)},
+        {"quoteCreator", always, text(rows.quote, "QUOTER")},
+    });
+    AddCustomer(request, rows.customer);
+    request.add({
+        {"vehicleRegistration", always, trimmed(rows.car, "REGO")},
+        {"vehicleDescription", always, QString(text(rows.model, "MAKE") + u' ' + text(rows.model, "MODEL")).trimmed()},
+    });
+    if (rows.isMainQuote())
+        AddVehicle(request, rows, extra);
+    request.add({
+        {"quoteComments", always, text(rows.notes, "P_REMARKS")},
+        {"repairDaysRequired", repairDays.has_value(), QString::number(repairDays.value_or(0))},
+    });
+}
+
+}  // namespace kest

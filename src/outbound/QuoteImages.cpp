@@ -1,0 +1,54 @@
+#include "outbound/QuoteImages.h"
+
+#include "outbound/Branch.h"
+#include "platform/files/files.h"
+#include "platform/values.h"
+#include "shell/SharedVariables.h"
+
+#include <cmath>
+
+using namespace Qt::StringLiterals;
+
+namespace kest {
+
+QList<QuoteImage> QuoteImages(const QString& folder, const QString& quoteNumber, const QString& subquote)
+{
+    const QString stem = quoteNumber + u'_' + subquote;
+    QList<QuoteImage> images;
+    if (!files::folderExists(folder))
+        return images;
+    for (const QString& file : files::list(folder, stem + u"*.jpg"_s)) {
+        const QString id = ImageId(file);
+        if (file.startsWith(stem, Qt::CaseInsensitive) && !id.isEmpty())  // a quote number may hold a "*"
+            images.append({file, id});
+    }
+    return images;
+}
+
+QString ImageId(const QString& file)
+{
+    const QString name = file.trimmed();
+    const qsizetype behindUnderscore = name.indexOf(u'_') + 1;
+    const qsizetype length = name.size() - name.indexOf(u'.');  // of the extension, which makes four digits and a point
+    const std::optional<double> number = numberIn(name.mid(behindUnderscore, length));
+    return number ? numberText(std::trunc(*number)) : QString();
+}
+
+void WriteImageDocuments(const QString& folder, const QString& quoteNumber, const QString& subquote)
+{
+    for (const QuoteImage& image : QuoteImages(folder, quoteNumber, subquote)) {
+        xml::Document document;
+        const Branch request(document, "request");
+        request.add({
+            {"kestQuoteNumber", always, quoteNumber + u'/' + subquote},
+            {"quoteImageId", always, image.id},
+            {"imageType", always, u"JPEG"_s},
+            {"imageDescription", always, {}},
+        });
+        const QString name = u"I_"_s + image.file;
+        files::write(gsUnsentPath + name.chopped(3) + u"xml"_s, request.xml());
+        files::copy(folder + image.file, gsUnsentPath + name);
+    }
+}
+
+}  // namespace kest

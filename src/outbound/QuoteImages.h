@@ -1,0 +1,24 @@
+// The photographs of a quote: which files they are, their ids, and their documents in the outgoing folder.
+#pragma once
+
+#include <QList>
+#include <QString>
+
+namespace kest {
+
+struct QuoteImage {
+    QString file;
+    QString id;
+};
+
+/// The images of a quote in a folder, in the order of their names. A name from which no id can be read is no image of
+/// the quote, in the quote document and in the image documents alike.
+QList<QuoteImage> QuoteImages(const QString& folder, const QString& quoteNumber, const QString& subquote);
+
+/// The number behind a name's first underscore, without leading zeros: 123_0012.jpg gives 12. Empty where none stands.
+QString ImageId(const QString& file);
+
+/// Puts a document and a copy of each image into the outgoing folder.
+void WriteImageDocuments(const QString& folder, const QString& quoteNumber, const QString& subquote);
+
+}  // namespace kest

@@ -1,0 +1,110 @@
+#include "outbound/SendQuote.h"
+
+#include "outbound/modCreateXML.h"
+#include "platform/database/Sql.h"
+#include "platform/desktop/Prompt.h"
+#include "platform/values.h"
+#include "quotedata/NoteChain.h"
+#include "quotedata/QuoteTotals.h"
+#include "shell/Helpers.h"
+#include "shell/SharedVariables.h"
+
+using namespace Qt::StringLiterals;
+
+namespace kest {
+
+namespace {
+
+const QString quoteNotFound = u"Quote not found in database, Please contact MarlinDesk Support."_s;
+
+db::Recordset opened(const QString& select)
+{
+    db::Recordset record(gConn);
+    record.open(select);
+    return record;
+}
+
+/// Why a main quote may not go; empty where it may.
+QString MainQuoteRefusal(const db::Recordset& quote, const QString& remarks)
+{
+    const db::Recordset insurer =
+        opened(sql("SELECT NAME, KEST FROM INSURER WHERE INSURER_ID={}", quote.value(u"INSURER_ID"_s)));
+    if (insurer.eof())
+        return u"Could not locate Insurer! Please contact MarlinDesk Support."_s;
+    if (!insurer.isNull(u"KEST"_s) && !isTrue(insurer.value(u"KEST"_s)))
+        return u"Invalid Insurer, Please check the Insurer is valid & is marked as a KEST Insurer"_s;
+    if (!quote.text(u"msgno"_s).isEmpty())
+        return u"This quote has already been sent via TIDE, you cannot use KEST to send this quote."_s;
+    if (SafeVal(quote.text(u"Claim"_s), u"0"_s) <= 0)
+        return u"An Invalid claim number has been entered, please check the Claim Number and try again."_s;
+    const db::Recordset customer = opened(sql(
+        "SELECT * FROM CUSTOMER WHERE CUST_ID IN (SELECT CUST_ID FROM CAR WHERE REGO='{}')", quote.value(u"REGO"_s)));
+    if (customer.eof())
+        return u"Error locating customer record, Quote cannot be sent."_s;
+    if (customer.text(u"NAME"_s).isEmpty())
+        return u"Customer Name is Blank! Quote cannot be sent."_s;
+    if (!quote.text(u"KESTQRNo"_s).isEmpty() && GetNoteStatus(u"Quote Request"_s, remarks) != "Active"_L1)
+        return u"Quote request is not marked as active, Quote cannot be sent."_s;
+    return {};
+}
+
+/// Why the quote may not go; empty where it may.
+QString Refusal(const db::Recordset& quote, const QString& number, const QString& subquote)
+{
+    const db::Recordset zeroQuantities = opened(
+        sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}' AND CATEGORY='PRT' AND QTY=0", number, subquote));
+    if (!zeroQuantities.eof())
+        return u"Items with a Quantity of 0 cannot be sent to ORLA. Please check the quote details and try again."_s;
+
+    const db::Recordset notes =
+        opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+    const QString remarks = notes.eof() ? QString() : notes.text(u"remarks"_s);
+    if (quote.recordCount() == 0)
+        return quoteNotFound;
+    if (quote.recordCount() != 1)
+        return u"A Critical Error has occured, Please contact MarlinDesk Support. %1 Records"_s.arg(
+            quote.recordCount());
+    if (isTrue(quote.value(u"ReadOnly"_s)))
+        return GetNoteStatus(u"Quote Request"_s, remarks) == "Cancelled"_L1
+                   ? u"This quote request has been cancelled, Quote cannot be sent."_s
+                   : u"This quote has already been submitted to ORLA, you cannot send a quote twice."_s;
+    if (subquote != "0"_L1)
+        return GetNoteStatus(u"KEST Quote"_s, remarks) == "Submitted"_L1
+                   ? u"This additional has already been submitted to ORLA, you cannot send a quote twice."_s
+                   : QString();
+    return MainQuoteRefusal(quote, remarks);
+}
+
+double refuse(const QString& message)
+{
+    desktop::msgBox(message, desktop::Icon::Critical);
+    return 0;
+}
+
+}  // namespace
+
+double SendQuote(db::Recordset& quote)
+{
+    // a record that an earlier fault has left closed is opened again by the panel's own quote number
+    if (quote.isOpen() && quote.eof())
+        return refuse(quoteNotFound);
+    const QString number = quote.isOpen() ? quote.text(u"QTNNO"_s) : gsQTNNO;
+    quote.close();
+    quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' ORDER BY SUBQUOTE DESC", number));
+    if (quote.eof())
+        return refuse(quoteNotFound);
+    const QString subquote = quote.text(u"Subquote"_s);
+    quote.close();
+    quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+
+    if (const QString refusal = Refusal(quote, number, subquote); !refusal.isEmpty())
+        return refuse(refusal);
+
+    RoundQuoteLines(quote);
+    const double total = CreateQuoteXML(quote);
+    if (total != 0)
+        CreateImageXML(gsImagesPath, quote);
+    return total;
+}
+
+}  // namespace kest

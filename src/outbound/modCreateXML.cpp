@@ -1,0 +1,127 @@
+#include "outbound/modCreateXML.h"
+
+#include "messages/Envelope.h"
+#include "outbound/QuoteBody.h"
+#include "outbound/QuoteHead.h"
+#include "outbound/QuoteImages.h"
+#include "outbound/frmExtraInfo.h"
+#include "platform/RuntimeError.h"
+#include "platform/desktop/Prompt.h"
+#include "platform/files/files.h"
+#include "platform/values.h"
+#include "quotedata/StateTable.h"
+#include "shell/ModRegistry.h"
+#include "shell/SharedVariables.h"
+
+#include <QSet>
+
+using namespace Qt::StringLiterals;
+
+namespace kest {
+
+namespace {
+
+constexpr int highestFileNumber = 9999;
+
+double refuse(const QString& message)
+{
+    desktop::msgBox(message, desktop::Icon::Critical);
+    return 0;
+}
+
+/// The name of the quote's next document, counted by those that have gone out: one that still waits is replaced.
+QString DocumentName(const QuoteRows& rows)
+{
+    const QString stem = rows.number + u'.' + rows.subquote + u'_';
+    QSet<QString> sent;
+    if (files::folderExists(gsSentPath))
+        for (const QString& name : files::list(gsSentPath, stem + u"*.xml"_s))
+            sent.insert(name.toUpper());
+    for (int n = 1; n <= highestFileNumber; ++n) {
+        const QString name = stem + QString::number(n) + u".xml"_s;
+        if (!sent.contains(name.toUpper()))
+            return name;
+    }
+    throw RuntimeError(
+        FileExists,
+        u"All %1 documents of quote %2/%3 have been sent, there is no name for another one."_s.arg(highestFileNumber)
+            .arg(rows.number, rows.subquote));
+}
+
+/// The text between the root's tags: the transport puts a root of its own around it.
+QString WithoutRoot(const QString& text)
+{
+    const qsizetype behindRoot = text.indexOf(u'>') + 1;
+    return text.mid(behindRoot, text.size() - behindRoot - u"</request>"_s.size());
+}
+
+void AddImages(const Branch& request, const QuoteRows& rows)
+{
+    const QString folder = GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"ImagesPath"_s, u"c:\\wirimg\\"_s);
+    const QList<QuoteImage> images = QuoteImages(folder, rows.number, rows.subquote);
+    request.add("imageCount", QString::number(images.size()));
+    if (images.isEmpty())
+        return;
+    const Branch ids = request.add("quoteImageIds");
+    for (const QuoteImage& image : images)
+        ids.add("quoteImageId", image.id);
+}
+
+void MarkAsSent(QuoteRows& rows)
+{
+    if (rows.isMainQuote() && !text(rows.quote, "KESTQRNo").isEmpty())
+        Apply(requestAnswered, rows.quote, rows.notes);
+    Apply(quoteSent, rows.quote, rows.notes);
+    rows.quote.update();
+    rows.notes.update();
+}
+
+}  // namespace
+
+double CreateQuoteXML(db::Recordset& quote)
+{
+    QuoteRows rows(quote);
+    files::pathForWriting(gsUnsentPath, rows.number + u'.' + rows.subquote);  // fails before anything is changed
+    QuoteBody body(rows.number, rows.subquote, text(quote, "KESTAuthNo"));
+
+    if (rows.model.eof() || text(rows.model, "MAKE").toUpper().contains("UNIVERSAL"_L1))
+        return refuse(u"Please Select a Make and Model for this car"_s);
+    const InsurerReference reference = ReferenceOf(rows);
+    if (!rows.isMainQuote() && reference.authorisedQuoteNumber.trimmed().isEmpty())
+        return refuse(u"The main quote has no ORLA quote number yet, this additional cannot be sent."_s);
+
+    const bool asked = isTrue(quote.value(u"ExtraInfo"_s));
+    const ExtraInfoResult answer =
+        asked ? frmExtraInfo::ShowForm(rows.number, rows.subquote) : BuildArrayFromDB(rows.number, rows.subquote);
+    if (asked && std::holds_alternative<QString>(answer))
+        return refuse(std::get<QString>(answer));
+    std::optional<ExtraValues> extra;
+    if (const auto* values = std::get_if<ExtraValues>(&answer))
+        extra = *values;
+
+    const std::optional<qint64> repairDays = RepairDays(quote);
+    if (repairDays.value_or(0) < 0)
+        return refuse(u"Cannot have a target completion date before the start date. Please check the quote details."_s);
+
+    xml::Document document;
+    const Branch request(document, "request", GetNamespaceURI());
+    AddHead(request, rows, reference, extra, repairDays);
+    const double total = body.addTo(request);
+    if (total == 0)
+        return refuse(
+            u"Error: Cannot send $0 variations to ORLA. Please call your assessor to discuss the variation."_s);
+    AddImages(request, rows);
+
+    // the document stands whole in the folder before the quote is locked: a full disk must not lock it
+    files::write(files::pathForWriting(gsUnsentPath, DocumentName(rows)), WithoutRoot(request.xml()));
+    MarkAsSent(rows);
+    desktop::msgBox(u"Quote Sent."_s, desktop::Icon::Information);
+    return total;
+}
+
+void CreateImageXML(const QString& imagesPath, db::Recordset& quote)
+{
+    WriteImageDocuments(imagesPath, quote.text(u"QTNNO"_s), quote.text(u"Subquote"_s));
+}
+
+}  // namespace kest
