@@ -71,7 +71,7 @@ void WithdrawWaitingRequests(const QString& requestNumber)
         const xml::Node root = waiting.documentElement();
         const xml::Node number = root.selectSingleNode(u"//rootns:quoteRequestNumber"_s);
         if (root.textOrEmptyOf(u"messageType"_s) == u"QREQ"_s && number && number.text() == requestNumber)
-            files::remove(gsUnreadPath + name);
+            files::remove(gsUnreadPath + name, files::Force::Yes);
     }
 }
 
