@@ -77,7 +77,7 @@ public:
     QuoteRow& claim(const Text& number) { return set("Claim", Value(QString(number))); }
     QuoteRow& rego(const Text& rego) { return set("REGO", Value(QString(rego))); }
     QuoteRow& stage(int stage) { return set("Job_stage", stage); }
-    QuoteRow& locked(bool locked = true) { return set("ReadOnly", locked); }
+    QuoteRow& locked(bool locked) { return set("ReadOnly", locked); }
     /// Puts a note such as "Active Quote Request" in front of the chain.
     QuoteRow& note(const Text& words, const Text& day = "01/02/2008");
     /// A column of the quote's long texts.

@@ -1,0 +1,130 @@
+#include "inbound/modLoadXML.h"
+#include "platform/RuntimeError.h"
+#include "support/Load.h"
+#include "support/Shop.h"
+
+namespace kest::test {
+
+using namespace Qt::StringLiterals;
+using Assessments = Shop;
+
+namespace {
+
+void takeResponse(const Text& file, const Text& number, const Text& status)
+{
+    QString text = submissionResponse(number, status).text();
+    LoadSubmissionResponse(text, file);
+}
+
+}  // namespace
+
+TEST_F(Assessments, AResultClosesAMainQuoteAndHandsASupplementaryOneBack)
+{
+    const struct {
+        const char* code;
+        const char* status;
+        const char* reason;
+    } cases[] = {
+        {"UNSP", "Lose", "Unspecified Reason"},    {"INCO", "Lose", "Quote Incomplete"},
+        {"LABR", "Lose", "Labour Price"},          {"PART", "Lose", "Part Price"},
+        {"PAIN", "Lose", "Paint Price"},           {"RECY", "Lose", "Recycled Parts"},
+        {"METH", "Lose", "Method of Repair"},      {"tlss", "Total Loss", "Total Loss"},
+        {"NOTP", "Lose", "Repair not Proceeding"}, {"abc", "Lose", "Unknown Reason Code - ABC"},
+    };
+    for (const auto& c : cases) {
+        quote("500").quoteNumber("KQ1").stage(3).remarks("(01/02/2008 : Responded Quote Request)");
+        quote("500", 1).quoteNumber("KQ2").stage(3).locked(true).remarks("");
+
+        EXPECT_TRUE(load(assessmentResult("KQ1").reason(c.code)));
+        EXPECT_EQ(quote("500").stage(), 10);
+        EXPECT_TRUE(quote("500").locked());
+        EXPECT_EQ(quote("500").notes(), std::string("(today : Tender Failed \"Reason : ") + c.reason +
+                                            "\") (01/02/2008 : " + c.status + " Quote Request)");
+
+        EXPECT_TRUE(load(assessmentResult("KQ2").reason(c.code)));
+        EXPECT_EQ(quote("500", 1).stage(), 1);
+        EXPECT_FALSE(quote("500", 1).locked());
+        EXPECT_EQ(quote("500", 1).notes(), std::string("(today : Quote Rejected \"Reason : ") + c.reason + "\")");
+    }
+}
+
+TEST_F(Assessments, AResultTakesTheOldestQuoteABackOutTheNewest)
+{
+    quote("500").request("QR1").quoteNumber("KQ1");
+    quote("501").request("QR1").quoteNumber("KQ1");
+    EXPECT_TRUE(load(assessmentResult("KQ1")));
+    EXPECT_EQ(quote("500").stage(), 10);
+    EXPECT_EQ(quote("501").stage(), 1);
+    EXPECT_TRUE(load(assessmentBackout("QR1")));
+    EXPECT_EQ(quote("500").stage(), 10);
+    EXPECT_EQ(quote("501").stage(), 3);
+}
+
+TEST_F(Assessments, ABackOutUndoesWhatWasDecided)
+{
+    const struct {
+        int subquote;
+        const char* authorised;
+        const char* before;
+        const char* after;
+        bool dateStays;
+    } cases[] = {
+        {0, "KA1", "(02/02/2008 : Authorised Quote) (01/02/2008 : Won Quote Request)",
+         "(02/02/2008 : Deleted Authorised Quote) (01/02/2008 : Responded Quote Request)", false},
+        {0, "", "(01/02/2008 : Lose Quote Request)",
+         "(today : Fail Tender Backout) (01/02/2008 : Responded Quote Request)", true},
+        {1, "KA1", "(01/02/2008 : Quote Rejected \"Reason : Part Price\")",
+         "(today : Rejected Supplementary Backout) (01/02/2008 : Quote Rejected \"Reason : Part Price\")", true},
+        {1, "KA1", "(02/02/2008 : Authorised Quote)", "(02/02/2008 : Deleted Authorised Quote)", false},
+    };
+    for (const auto& c : cases) {
+        quote("500", c.subquote).request("QR1").authorised(c.authorised).set("AuthDate", "01/02/2008").stage(4);
+        quote("500", c.subquote).remarks(c.before);
+        EXPECT_TRUE(load(assessmentBackout("QR1")));
+        QuoteRow after = quote("500", c.subquote);
+        EXPECT_EQ(after.stage(), 3);
+        EXPECT_TRUE(after.locked());
+        EXPECT_EQ(after.notes(), c.after);
+        EXPECT_EQ(!after.isNull("AuthDate"), c.dateStays) << c.before;
+        // the number of a supplementary quote's authorisation stays
+        EXPECT_EQ(after.isNull("KESTAuthNo"), c.subquote == 0 && *c.authorised) << c.before;
+    }
+}
+
+TEST_F(Assessments, EachAdjustmentAddsANoteToAQuoteWithLines)
+{
+    quote("500").request("QR1").stage(3).locked(true).note("Responded Quote Request").line(1);
+    EXPECT_TRUE(load(adjustedQuote("500")));
+    EXPECT_TRUE(load(adjustedQuote("999")));  // a wrong reference: the newest quote of the request
+    EXPECT_EQ(quote("500").notes(),
+              "(today : Adjustment Suggested) (today : Adjustment Suggested) (01/02/2008 : Responded Quote Request)");
+    EXPECT_EQ(quote("500").stage(), 3);
+
+    quote("500", 1).request("QR1");
+    EXPECT_FALSE(load(adjustedQuote("500/1")));
+    EXPECT_EQ(shown(), "[none] Error: Cannot load an Adjustment onto a blank quote!");
+    EXPECT_EQ(quote("500", 1).notes(), "");
+}
+
+TEST_F(Assessments, ASubmissionResponseGivesTheQuoteItsNumber)
+{
+    quote("500", 2).note("Sending KEST Quote").note("Sending KEST Quote", "02/02/2008");
+    takeResponse("R_500_2_0001.xml", "KQ5", "Submitted");
+    takeResponse("R_500_2_0001.xml", "KQ5", "Submitted");  // each fill applies it again
+    EXPECT_EQ(quote("500", 2).text("KESTQuoteNo"), "KQ5");
+    EXPECT_TRUE(quote("500", 2).locked());
+    EXPECT_EQ(quote("500", 2).notes(), "(02/02/2008 : Submitted KEST Quote) (01/02/2008 : Submitted KEST Quote)");
+
+    quote("501").note("Sending KEST Quote");
+    takeResponse("R_501_0.xml", "KQ6", "submitted");  // another status
+    EXPECT_EQ(quote("501").text("KESTQuoteNo"), "KQ6");
+    EXPECT_FALSE(quote("501").locked());
+    EXPECT_EQ(quote("501").notes(), "(01/02/2008 : Sending KEST Quote)");
+
+    // without its quote, or without a subquote in its name: the fill says so
+    EXPECT_THROW(takeResponse("R_502_0.xml", "KQ7", "Submitted"), RuntimeError);
+    EXPECT_THROW(takeResponse("R_501.xml", "KQ7", "Submitted"), RuntimeError);
+    EXPECT_EQ(quote("501").text("KESTQuoteNo"), "KQ6");
+}
+
+}  // namespace kest::test
