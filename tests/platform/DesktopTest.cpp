@@ -1,14 +1,18 @@
 // The seam of boxes, input boxes and programs; the guard of window events; what is remembered of a window.
 #include "platform/RuntimeError.h"
 #include "platform/desktop/Form.h"
+#include "platform/desktop/Gestures.h"
 #include "platform/desktop/Prompt.h"
 #include "support/ScriptedDesktop.h"
 #include "support/TestProfile.h"
 
 #include <QFile>
-#include <QLineEdit>
+#include <QHeaderView>
+#include <QInputDialog>
 #include <QMessageBox>
 #include <QPushButton>
+#include <QScreen>
+#include <QThread>
 #include <QTimer>
 #include <QTreeWidget>
 
@@ -78,6 +82,189 @@ TEST(Seam, AProgramIsStartedUnderItsHostName)
         QThread::msleep(10);
     EXPECT_TRUE(QFile::exists(trace));
     EXPECT_THROW(desktop::startProgram(u"c:\\missing.exe"_s), RuntimeError);
+}
+
+namespace {
+
+/// Waits for a window of this kind to come up and acts on it.
+template <class Window, class Act>
+void whenShown(const Act& act)
+{
+    auto* timer = new QTimer(qApp);
+    QObject::connect(timer, &QTimer::timeout, timer, [timer, act] {
+        if (auto* window = qobject_cast<Window*>(QApplication::activeModalWidget())) {
+            timer->deleteLater();
+            timer->stop();
+            act(*window);
+        }
+    });
+    timer->start(1);
+}
+
+struct Person : testing::Test {
+    Person() { desktop::usePerson(); }
+    ~Person() override
+    {
+        desktop::useScript(nullptr);
+        desktop::setFailureReporter({});
+    }
+    TestProfile profile;
+};
+
+}  // namespace
+
+TEST_F(Person, SeesBoxesAsTheyWereMeant)
+{
+    struct Case {
+        QString text;
+        Icon icon;
+        QString title;
+        QMessageBox::Icon picture;
+        QString shownTitle;
+    };
+    const Case cases[] = {
+        {u"Message Loaded"_s, Icon::None, {}, QMessageBox::NoIcon, u"KEST"_s},
+        {u"<b>not bold</b>"_s, Icon::Information, {}, QMessageBox::Information, u"KEST"_s},
+        {u"Invalid"_s, Icon::Exclamation, u"Login"_s, QMessageBox::Warning, u"Login"_s},
+        {u"Invalid"_s, Icon::Critical, {}, QMessageBox::Critical, u"KEST"_s},
+    };
+    for (const Case& one : cases) {
+        whenShown<QMessageBox>([&](QMessageBox& box) {
+            EXPECT_EQ(box.text(), one.text);
+            EXPECT_EQ(box.textFormat(), Qt::PlainText);
+            EXPECT_EQ(box.icon(), one.picture);
+            EXPECT_EQ(box.windowTitle(), one.shownTitle);
+            box.close();
+        });
+        desktop::msgBox(one.text, one.icon, one.title);
+    }
+}
+
+TEST_F(Person, AnswersQuestionsByKey)
+{
+    struct Case {
+        Answer preset;
+        Qt::Key key;
+        bool yes;
+    };
+    const Case cases[] = {
+        {Answer::Yes, Qt::Key_Return, true},
+        {Answer::No, Qt::Key_Return, false},
+        {Answer::Yes, Qt::Key_Escape, false},
+    };
+    for (const Case& one : cases) {
+        whenShown<QMessageBox>([&](QMessageBox& box) {
+            desktop::gestures::activate(box);
+            desktop::gestures::press(box, one.key);
+        });
+        EXPECT_EQ(desktop::ask(u"Are you SURE ?"_s, Icon::Critical, {}, one.preset), one.yes) << one.key;
+    }
+    for (const auto& [key, typed] : {std::pair(Qt::Key_Return, u"abc"_s), std::pair(Qt::Key_Escape, QString())}) {
+        whenShown<QInputDialog>([&](QInputDialog& box) {
+            desktop::gestures::activate(box);
+            desktop::gestures::type(box, u"abc"_s);
+            desktop::gestures::press(box, key);
+        });
+        EXPECT_EQ(desktop::inputBox(u"Filter?"_s, {}), typed);
+    }
+}
+
+TEST_F(Person, KeepsTheWindowAfterAFailureThatNobodyTrapped)
+{
+    QStringList reported;
+    desktop::setFailureReporter([&](const RuntimeError& error, const QString& source) {
+        reported.append(source + u": "_s + error.description());
+    });
+    desktop::Form window(u"frmSample"_s, u"Sample"_s);
+    QPushButton button(&window);
+    desktop::onEvent(&button, &QPushButton::clicked, &window, u"frmSample.cmdOK_Click"_s,
+                     [] { throw RuntimeError(NoCurrentRow, u"no row"_s); });
+    whenShown<desktop::Form>([&](desktop::Form& shown) {
+        button.click();
+        EXPECT_TRUE(shown.isVisible());
+        shown.close();
+    });
+    desktop::showModal(window);
+    EXPECT_EQ(reported, QStringList{u"frmSample.cmdOK_Click: no row"_s});
+}
+
+TEST_F(Person, LeavesEveryWindowWhenTheRunMustEnd)
+{
+    desktop::Form outer(u"frmOuter"_s, {});
+    desktop::Form inner(u"frmInner"_s, {});
+    QTimer inOuter;
+    QTimer inInner;
+    int later = 0;
+    for (QTimer* timer : {&inOuter, &inInner})
+        timer->setSingleShot(true);
+    desktop::onEvent(&inOuter, &QTimer::timeout, &outer, u"outer"_s, [&] {
+        desktop::showModal(inner);
+        ++later;
+    });
+    desktop::onEvent(&inInner, &QTimer::timeout, &inner, u"inner"_s, [&] {
+        desktop::guarded(u"nested"_s, [] { throw desktop::NeedsAnswer(u"why"_s); });
+        desktop::guarded(u"behind it"_s, [&] { ++later; });
+    });
+    inOuter.start(0);
+    inInner.start(20);
+    EXPECT_THROW(desktop::showModal(outer), desktop::NeedsAnswer);
+    EXPECT_FALSE(outer.isVisible() || inner.isVisible());
+    EXPECT_EQ(later, 0);
+    EXPECT_NO_THROW(desktop::throwKept());
+}
+
+TEST_F(Person, FindsEveryWindowAsItWasLeftAndInTheMiddle)
+{
+    const auto makeWindow = [] {
+        auto window = std::make_unique<desktop::Form>(u"frmMessageList"_s, u"KEST Messages"_s);
+        auto* list = new QTreeWidget(window.get());
+        list->setObjectName(u"ListView1"_s);
+        list->setHeaderLabels({u"Filename"_s, u"Type"_s, u"Rego"_s});
+        list->setSortingEnabled(true);
+        list->header()->resizeSection(0, 100);
+        window->resize(400, 300);
+        return window;
+    };
+    const auto show = [](desktop::Form& window, const std::function<void()>& act) {
+        whenShown<desktop::Form>([&act](desktop::Form& shown) {
+            const QPoint off = shown.frameGeometry().center() - shown.screen()->availableGeometry().center();
+            EXPECT_LE(off.manhattanLength(), 4);
+            act();
+            shown.close();
+        });
+        desktop::showModal(window);
+    };
+
+    const auto left = makeWindow();
+    QHeaderView* header = left->findChild<QTreeWidget*>()->header();
+    show(*left, [&] {
+        left->resize(500, 5000);
+        left->move(0, 0);
+        header->resizeSection(0, 222);
+        header->setSortIndicator(1, Qt::DescendingOrder);
+    });
+
+    const auto found = makeWindow();
+    header = found->findChild<QTreeWidget*>()->header();
+    show(*found, [&] {
+        EXPECT_EQ(found->width(), 500);
+        EXPECT_EQ(found->height(), found->screen()->availableSize().height()) << "never larger than the screen";
+        EXPECT_EQ(header->sectionSize(0), 222);
+        EXPECT_EQ(header->sectionSize(1), header->defaultSectionSize());
+        EXPECT_EQ(header->sortIndicatorSection(), 1);
+        EXPECT_EQ(header->sortIndicatorOrder(), Qt::DescendingOrder);
+    });
+
+    const auto other = makeWindow();
+    other->setObjectName(u"frmViewXML"_s);
+    show(*other, [&] { EXPECT_EQ(other->size(), QSize(400, 300)); });
+}
+
+TEST(Twips, AreFifteenToAPixelOfAnOrdinaryScreen)
+{
+    EXPECT_EQ(desktop::pixels(2328), 155);
+    EXPECT_EQ(desktop::pixels(600, 2000), QSize(40, 133));
+    EXPECT_EQ(desktop::twips(desktop::pixels(1320)), 1320);
 }
 
 }  // namespace kest
