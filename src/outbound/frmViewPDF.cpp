@@ -62,6 +62,7 @@ frmViewPDF::frmViewPDF(QPdfDocument& document, const QString& caption)
     AcroPDF1->setPageMode(QPdfView::PageMode::MultiPage);
     AcroPDF1->setZoomMode(QPdfView::ZoomMode::FitToWidth);
     AcroPDF1->setFocus();
+    lblPage->setObjectName("lblPage"_L1);
     toolStrip->layout()->addWidget(lblPage);
     showPage();
     desktop::onEvent(AcroPDF1->pageNavigator(), &QPdfPageNavigator::currentPageChanged, this,

@@ -1,0 +1,245 @@
+// The window on a quote's network fields: what it shows, what its buttons change, what a save stores.
+#include "platform/database/Sql.h"
+#include "shell/SharedVariables.h"
+#include "support/Shop.h"
+#include "utilities/frmUtilities.h"
+
+#include <QLineEdit>
+#include <QPushButton>
+
+namespace kest {
+
+using namespace Qt::StringLiterals;
+using test::quote;
+using test::Shop;
+
+namespace {
+
+class Utilities : public Shop {
+protected:
+    /// Shows the window on quote 500 and works it.
+    void work(const std::string& steps, const QString& subquote = u"0"_s)
+    {
+        desktop.emplace(("{\"windows\": {\"frmUtilities\": [[" + steps + "]]}}").c_str());
+        frmUtilities::ShowForm(u"500"_s, subquote);
+    }
+    std::string text(const QString& control) const { return desktop->read(control).toString().toStdString(); }
+};
+
+std::string set(const std::string& control, const std::string& text)
+{
+    return "{\"set\": \"" + control + "\", \"text\": \"" + text + "\"}, ";
+}
+
+const std::string save = R"({"click": "Command1"})";
+const std::string readAll = R"({"read": true})";
+
+}  // namespace
+
+TEST_F(Utilities, ShowTheQuoteAndANullAsAnEmptyText)
+{
+    quote("500", 1)
+        .request("QR1", "2")
+        .quoteNumber("KQ1")
+        .authorised("KA1")
+        .set("AuthDate", QDate(2008, 3, 21))
+        .stage(4)
+        .locked()
+        .note("Won Quote Request");
+    work(readAll, u"1"_s);
+    const std::pair<QString, std::string> filled[] = {
+        {u"txtQTNNO"_s, "500/1"},
+        {u"txtRego"_s, "ABC123"},
+        {u"txtJobStage"_s, "Authorised"},
+        {u"txtQRNo"_s, "QR1"},
+        {u"txtQRVer"_s, "2"},
+        {u"txtQuoteNo"_s, "KQ1"},
+        {u"txtAuthNo"_s, "KA1"},
+        {u"txtClaimNo"_s, "7700001"},
+        {u"txtAuthDate"_s, "21/03/2008"},
+        {u"txtRemarks"_s, "(01/02/2008 : Won Quote Request)"},
+    };
+    for (const auto& [control, expected] : filled)
+        EXPECT_EQ(text(control), expected) << control.toStdString();
+    EXPECT_FALSE(text(u"txtInsurer"_s).empty());
+    EXPECT_TRUE(desktop->read(u"chkReadOnly"_s, u"checked"_s).toBool());
+    EXPECT_FALSE(desktop->read(u"chkExtraInfo"_s, u"checked"_s).toBool());
+
+    quote("500").set("Job_stage", nullptr).set("INSURER_ID", 999).set("Claim", nullptr);
+    work(readAll, {});
+    EXPECT_EQ(text(u"txtQTNNO"_s), "500");
+    for (const QString& control :
+         {u"txtJobStage"_s, u"txtInsurer"_s, u"txtQRNo"_s, u"txtClaimNo"_s, u"txtAuthDate"_s, u"txtRemarks"_s})
+        EXPECT_EQ(text(control), "") << control.toStdString();
+}
+
+TEST_F(Utilities, ATabForEachSubquoteLoadsItsRowAndForgetsWhatWasTyped)
+{
+    quote("500").quoteNumber("MAIN");
+    work(readAll);
+    EXPECT_EQ(desktop->read(u"TabStrip1"_s, u"rows"_s), (QJsonArray{QJsonArray{u"Quote"_s, u"S0"_s}}));
+
+    quote("500", 1).quoteNumber("FIRST");
+    quote("500", 2).quoteNumber("SECOND").remarks("second");
+    work(set("txtQuoteNo", "typed") + R"({"tab": "TabStrip1", "key": "S2"}, )" + readAll);
+    EXPECT_EQ(desktop->read(u"TabStrip1"_s, u"rows"_s),
+              (QJsonArray{QJsonArray{u"Quote"_s, u"S0"_s}, QJsonArray{u"Add.-1"_s, u"S1"_s},
+                          QJsonArray{u"Add.-2"_s, u"S2"_s}}));
+    EXPECT_EQ(text(u"txtQuoteNo"_s), "SECOND");
+    EXPECT_EQ(text(u"txtRemarks"_s), "second");
+    work(R"({"tab": "TabStrip1", "key": "S0"}, )" + readAll, u"1"_s);
+    EXPECT_EQ(text(u"txtQuoteNo"_s), "MAIN");
+    EXPECT_EQ(quote("500").text("KESTQuoteNo"), "MAIN");
+}
+
+TEST_F(Utilities, UndoReloadsAndCloseWritesNothing)
+{
+    quote("500").quoteNumber("KQ1").remarks("as it was");
+    const std::string typed = set("txtQuoteNo", "typed") + set("txtRemarks", "typed") + R"({"click": "chkReadOnly"}, )";
+    work(typed + R"({"click": "Command3"}, {"click": "Command9"}, )" + readAll);
+    EXPECT_EQ(text(u"txtQuoteNo"_s), "KQ1");
+    EXPECT_EQ(text(u"txtRemarks"_s), "as it was");
+    EXPECT_FALSE(desktop->read(u"chkReadOnly"_s, u"checked"_s).toBool());
+    work(typed + R"({"click": "Command2"})");
+    EXPECT_EQ(quote("500").text("KESTQuoteNo"), "KQ1");
+    EXPECT_EQ(quote("500").notes(), "as it was");
+}
+
+TEST_F(Utilities, SaveStoresEveryFieldAndOpensTheHostsQuoteAnew)
+{
+    quote("500").quoteNumber("HOST");
+    quote("500", 1).set("AuthDate", QDate(2008, 3, 21)).remarks("one\r\ntwo\u00a0three");
+    gsQTNNO = u"500"_s;
+    gsSubQuote = u"0"_s;
+    work(set("txtQRNo", "QR9") + set("txtQRVer", "3") + set("txtQuoteNo", "KQ'9") + set("txtAuthNo", "KA9") +
+             set("txtAuthDate", "22/4/2009") + set("txtClaimNo", "ABC 123") +
+             R"({"click": "chkReadOnly"}, {"click": "chkExtraInfo"}, )" + save,
+         u"1"_s);
+    const auto saved = quote("500", 1);
+    const std::pair<const char*, std::string> stored[] = {
+        {"KESTQRNo", "QR9"},  {"KESTQRVer", "3"},         {"KESTQuoteNo", "KQ'9"}, {"KESTAuthNo", "KA9"},
+        {"Claim", "ABC 123"}, {"AuthDate", "22/04/2009"}, {"ReadOnly", "True"},    {"ExtraInfo", "True"},
+    };
+    for (const auto& [column, expected] : stored)
+        EXPECT_EQ(saved.text(column), expected) << column;
+    EXPECT_EQ(saved.notes(), "one\r\ntwo\u00a0three");
+    ASSERT_TRUE(grsQuote && !grsQuote->eof());
+    EXPECT_EQ(grsQuote->text(u"KESTQuoteNo"_s), u"HOST"_s);
+
+    work(set("txtAuthDate", "") + save, u"1"_s);
+    EXPECT_TRUE(quote("500", 1).isNull("AuthDate"));
+}
+
+TEST_F(Utilities, ARowOfLongTextsThatIsMissingIsMadeWhereThereIsSomethingToStore)
+{
+    quote("500");
+    gConn->execute(u"DELETE FROM QUOTE3"_s);
+    work(save);
+    EXPECT_EQ(test::rowCount("QUOTE3"), 0);
+    work(R"({"click": "Command4"}, )" + save);
+    EXPECT_EQ(quote("500").notes(), "(today : Sending KEST Quote) (today : Responded Quote Request)");
+}
+
+TEST_F(Utilities, AClaimNumberWithoutAPositiveNumberIsRefused)
+{
+    const std::pair<std::string, bool> cases[] = {
+        {"7700001", true}, {"ABC 123", true}, {"-5", false},    {"ABC", false},
+        {"0", false},      {"", false},       {"1.2.3", false},
+    };
+    for (const auto& [claim, accepted] : cases) {
+        quote("500").claim("77").quoteNumber("before");
+        work(set("txtClaimNo", claim) + set("txtQuoteNo", "after") + save + (accepted ? "" : ", " + readAll));
+        EXPECT_EQ(desktop->boxes(),
+                  accepted ? QStringList() : QStringList(u"critical||Invalid Claim Number Entered|ok"_s))
+            << claim;
+        EXPECT_EQ(quote("500").text("KESTQuoteNo"), accepted ? "after" : "before") << claim;
+    }
+}
+
+TEST_F(Utilities, AStatusButtonRewritesTickNumberAndNotes)
+{
+    const std::string whole =
+        "(01/02/2008 : Authorised Quote) (01/02/2008 : Tender Failed \"Reason : price\") "
+        "(01/02/2008 : Quote Deleted \"Reason : mistake\") (01/02/2008 : Submitted KEST Quote) "
+        "(01/02/2008 : Won Quote Request)";
+    struct {
+        const char* button;
+        int subquote;
+        bool locked;
+        const char* quoteNumber;
+        std::string notes;
+    } const cases[] = {
+        {"Command3", 0, false, "",
+         "(01/02/2008 : Tender Failed \"Reason : price\") (01/02/2008 : Active Quote Request)"},
+        {"Command3", 1, false, "", "(01/02/2008 : Tender Failed \"Reason : price\") (01/02/2008 : Won Quote Request)"},
+        {"Command4", 0, true, "KQ1", "(01/02/2008 : Sending KEST Quote) (01/02/2008 : Responded Quote Request)"},
+        {"Command4", 1, true, "KQ1", "(01/02/2008 : Sending KEST Quote) (01/02/2008 : Won Quote Request)"},
+        {"cmdSubmitted", 0, true, "KQ1", "(01/02/2008 : Submitted KEST Quote) (01/02/2008 : Responded Quote Request)"},
+        {"cmdWon", 1, true, "KQ1",
+         "(01/02/2008 : Authorised Quote) (01/02/2008 : Submitted KEST Quote) (01/02/2008 : Won Quote Request)"},
+        {"cmdDeleted", 0, true, "KQ1",
+         "(01/02/2008 : Quote Deleted) (01/02/2008 : Deleted KEST Quote) (01/02/2008 : Responded Quote Request)"},
+        {"cmdLoss", 1, true, "KQ1",
+         "(01/02/2008 : Tender Failed) (01/02/2008 : Quote Deleted) (01/02/2008 : Deleted KEST Quote) "
+         "(01/02/2008 : Loss Quote Request)"},
+    };
+    for (const auto& c : cases) {
+        auto row = quote("500", c.subquote);
+        row.quoteNumber("KQ1").authorised("KA1").stage(4).locked(!c.locked).remarks(whole);
+        work("{\"click\": \"" + std::string(c.button) + "\"}, " + save, QString::number(c.subquote));
+        EXPECT_EQ(row.notes(), c.notes) << c.button << c.subquote;
+        EXPECT_EQ(std::as_const(row).locked(), c.locked) << c.button;
+        EXPECT_EQ(row.text("KESTQuoteNo"), c.quoteNumber) << c.button;
+        EXPECT_EQ(row.text("KESTAuthNo") + std::to_string(std::as_const(row).stage()), "KA14") << c.button;
+    }
+
+    quote("500").remarks("a remark");
+    work(R"({"click": "Command4"}, {"click": "Command4"}, )" + save);
+    EXPECT_EQ(quote("500").notes(), "(today : Sending KEST Quote) (today : Responded Quote Request) a remark");
+}
+
+TEST_F(Utilities, ASaveThatTheHostHasOvertakenIsReportedAndTheWindowStays)
+{
+    struct Host final : desktop::WindowDriver {
+        bool drive(QDialog& window) override
+        {
+            window.show();
+            gConn->execute(overtaken);
+            window.findChild<QLineEdit*>(u"txtQuoteNo"_s)->setText(u"repaired"_s);
+            window.findChild<QPushButton*>(u"Command4"_s)->click();
+            window.findChild<QPushButton*>(u"Command1"_s)->click();
+            stayed = window.isVisible();
+            text = window.findChild<QLineEdit*>(u"txtQuoteNo"_s)->text();
+            window.close();
+            return true;
+        }
+        QString overtaken, text;
+        bool stayed = false;
+    };
+    struct {
+        const char* overtaken;
+        std::string quoteNumber, notes;
+    } const cases[] = {
+        {"UPDATE QUOTE1 SET KESTQuoteNo='host' WHERE QTNNO='500'", "host", "before"},
+        {"UPDATE QUOTE3 SET remarks='host' WHERE QTNNO='500'", "repaired", "host"},
+    };
+    for (const auto& [overtaken, quoteNumber, notes] : cases) {
+        quote("500").quoteNumber("before").remarks("before");
+        QList<int> failures;
+        desktop::setFailureReporter(
+            [&](const RuntimeError& error, const QString&) { failures.append(error.number()); });
+        const auto host = std::make_shared<Host>();
+        host->overtaken = QString::fromLatin1(overtaken);
+        desktop::setWindowDriver(host);
+        frmUtilities::ShowForm(u"500"_s, u"0"_s);
+        desktop::setWindowDriver(nullptr);
+        desktop::setFailureReporter(nullptr);
+        EXPECT_EQ(failures, QList<int>{RowChanged}) << overtaken;
+        EXPECT_TRUE(host->stayed) << overtaken;
+        EXPECT_EQ(host->text, u"repaired"_s) << overtaken;
+        EXPECT_EQ(quote("500").text("KESTQuoteNo"), quoteNumber) << overtaken;
+        EXPECT_EQ(quote("500").notes(), notes) << overtaken;
+    }
+}
+
+}  // namespace kest
