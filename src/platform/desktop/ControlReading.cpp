@@ -46,6 +46,8 @@ std::optional<QString> textOf(const QWidget& control)
 {
     if (control.isWindow())
         return control.windowTitle();
+    if (const QVariant exact = control.property("exactText"); exact.isValid())  // with its own line ends
+        return exact.toString();
     if (const auto* button = qobject_cast<const QAbstractButton*>(&control))
         return withoutMark(button->text());
     if (const auto* label = qobject_cast<const QLabel*>(&control))

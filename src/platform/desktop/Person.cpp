@@ -33,6 +33,13 @@ QString titleOrDefault(const QString& title)
     return title.isEmpty() ? defaultTitle() : title;
 }
 
+/// The window that a box belongs to; another program's window may be the active one.
+QWidget* topWindow()
+{
+    QWidget* modal = QApplication::activeModalWidget();
+    return modal ? modal : QApplication::activeWindow();
+}
+
 /// Boxes and input boxes as windows on top of the active one.
 class PersonAnswerer final : public Answerer {
 public:
@@ -43,7 +50,7 @@ public:
 
 Answer PersonAnswerer::box(const Box& box)
 {
-    QMessageBox window(QApplication::activeWindow());
+    QMessageBox window(topWindow());
     window.setWindowTitle(titleOrDefault(box.title));
     window.setTextFormat(Qt::PlainText);
     window.setText(box.text);
@@ -61,7 +68,7 @@ Answer PersonAnswerer::box(const Box& box)
 
 QString PersonAnswerer::input(const Input& input)
 {
-    QInputDialog window(QApplication::activeWindow());
+    QInputDialog window(topWindow());
     window.setWindowTitle(titleOrDefault(input.title));
     window.setInputMode(QInputDialog::TextInput);
     window.setLabelText(input.prompt);

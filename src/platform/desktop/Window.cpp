@@ -5,6 +5,7 @@
 #include <QApplication>
 #include <QPointer>
 #include <QScreen>
+#include <QWindow>
 
 #include <exception>
 
@@ -29,7 +30,14 @@ void keep(const std::exception_ptr& exception)
 
 class Shown {
 public:
-    explicit Shown(QDialog& window) : caller(QApplication::activeWindow()) { shownWindows.append(&window); }
+    explicit Shown(QDialog& window)
+        : caller(shownWindows.isEmpty() ? QApplication::activeWindow() : shownWindows.last())
+    {
+        shownWindows.append(&window);
+        window.winId();  // makes the system's window
+        if (caller && caller->windowHandle())
+            window.windowHandle()->setTransientParent(caller->windowHandle());  // stays on top of its caller
+    }
     ~Shown()
     {
         shownWindows.removeLast();
@@ -87,7 +95,7 @@ void guarded(const QString& source, const std::function<void()>& event)
         } catch (const RuntimeError& error) {
             if (!failureReporter)
                 throw;
-            attempt([&] { failureReporter(error, source); });
+            attempt([&] { failureReporter(error, source); });  // a report that failed has shown its box all the same
         }
     } catch (...) {
         keep(std::current_exception());
