@@ -4,6 +4,8 @@
 #include "platform/desktop/Prompt.h"
 #include "platform/values.h"
 
+#include <cmath>
+
 using namespace Qt::StringLiterals;
 
 namespace kest {
@@ -29,6 +31,8 @@ double RoundDown(const double& value)
 {
     try {
         const QString text = numberText(value);
+        if (text.contains(u'E'))  // too large or too small for a plain text: all of it is whole, or nothing
+            return std::abs(value) < 1 ? 0 : value;
         const qsizetype point = text.indexOf(u'.');
         return point < 0 ? value : toDouble(text.left(point + 1));
     } catch (const RuntimeError& error) {
