@@ -25,11 +25,11 @@ extern std::shared_ptr<db::Recordset> grsQuote;  // the host's quote while the p
 extern QString gsQTNNO;                          // "0" when no quote is open
 extern QString gsSubQuote;
 
-extern QString gsCurFolder;                      // the folder that the list window shows
-extern QString gsListFolder;                     // its copy of the last fill, for the reports
+extern QString gsCurFolder;                       // the folder that the list window shows
+extern QString gsListFolder;                      // its copy of the last fill, for the reports
 extern QMap<QString, QString> gdicQuoteRequests;  // of the last fill: request number to file name
-extern QString gsListFilter;                     // a listed file's name contains it
-extern bool gbFilterAsked;                       // the filter prompt was answered for this choice of folder
+extern QString gsListFilter;                      // a listed file's name contains it
+extern bool gbFilterAsked;                        // the filter prompt was answered for this choice of folder
 
 extern QString gsMatchedQTNNO;  // from a manual quote's load to the file move behind it
 extern QString gsDeletedQTNNO;  // from a deletion's load to the file move behind it

@@ -48,7 +48,7 @@ void readConnectionSettings()
         gsServer = u"(local)"_s;
 }
 
-int driverNumber()
+int chosenDriver()
 {
     const QString type = GetRegSetting(u"wirra32"_s, u"frmSplash"_s, u"ClientConnectionType"_s, u"0"_s);
     const QString system =
@@ -56,27 +56,6 @@ int driverNumber()
     if (system >= u"6.0"_s)
         return 1;
     return static_cast<int>(numberIn(type).value_or(0));
-}
-
-/// Empty for a driver number that names none: the open that follows fails.
-QString connectionText(int driver)
-{
-    if (gsServer.startsWith(mysqlServer, Qt::CaseInsensitive)) {
-        const QStringList address = gsServer.mid(mysqlServer.size()).split(u':');
-        return u"Driver={MySQL};Server="_s + address.value(0) + u";Port="_s + address.value(1, u"3306"_s) +
-               u";Database="_s + gsDatabase + u";Uid=sa;Pwd="_s + gsSAPwd + u';';
-    }
-    const QString server = gsServer.endsWith(u'\\') ? gsServer : gsServer + u'\\';
-    const QString tail =
-        u"Server="_s + server + gsInstance + u";Database="_s + gsDatabase + u";Uid=sa;Pwd="_s + gsSAPwd + u';';
-    switch (driver) {
-        case 0:
-            return u"Driver={SQL Server};"_s + tail;
-        case 1:
-            return u"Driver={SQL Native Client};"_s + tail;
-        default:
-            return {};
-    }
 }
 
 bool isOpen()
@@ -105,13 +84,33 @@ void OpenDatabase()
     attempt([] { readConnectionSettings(); });
     attempt([] {
         try {
-            gcnDB->open(connectionText(driverNumber()));
+            gcnDB->open(ConnectionText(chosenDriver()));
         } catch (const RuntimeError& error) {
             lastFailure = {error.number(), error.description()};
             throw;
         }
     });
     attempt([] { gcnDB->setCommandTimeout(commandTimeout); });
+}
+
+QString ConnectionText(int driverNumber)
+{
+    if (gsServer.startsWith(mysqlServer, Qt::CaseInsensitive)) {
+        const QStringList address = gsServer.mid(mysqlServer.size()).split(u':');
+        return u"Driver={MySQL};Server="_s + address.value(0) + u";Port="_s + address.value(1, u"3306"_s) +
+               u";Database="_s + gsDatabase + u";Uid=sa;Pwd="_s + gsSAPwd + u';';
+    }
+    const QString server = gsServer.endsWith(u'\\') ? gsServer : gsServer + u'\\';
+    const QString tail =
+        u"Server="_s + server + gsInstance + u";Database="_s + gsDatabase + u";Uid=sa;Pwd="_s + gsSAPwd + u';';
+    switch (driverNumber) {
+        case 0:
+            return u"Driver={SQL Server};"_s + tail;
+        case 1:
+            return u"Driver={SQL Native Client};"_s + tail;
+        default:
+            return {};
+    }
 }
 
 std::optional<db::Recordset> OpenRecordset(const QString& select, bool disconnect, bool reconnect)

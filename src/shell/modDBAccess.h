@@ -21,6 +21,8 @@ db::ConnectionPtr GetConnection();
 bool EnsureConnection();
 /// Reads the settings and opens the connection; a failure shows only as a closed connection.
 void OpenDatabase();
+/// The text that the connection is opened with, from the variables above; empty for a driver number that names none.
+QString ConnectionText(int driverNumber);
 /// A query on a fresh recordset, or none after a critical message when there is no connection.
 std::optional<db::Recordset> OpenRecordset(const QString& select, bool disconnect = false, bool reconnect = false);
 /// This machine's name; empty on failure.

@@ -1,0 +1,77 @@
+#include "shell/eKEST.h"
+
+#include "platform/database/Sql.h"
+#include "platform/desktop/Prompt.h"
+#include "platform/desktop/Window.h"
+#include "shell/ModRegistry.h"
+#include "shell/SharedVariables.h"
+#include "shell/frmKEST.h"
+#include "shell/modDBAccess.h"
+#include "shell/modLoggerEx.h"
+
+namespace kest {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+QString homeFolder()
+{
+    return GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"EcomHome"_s, u"c:\\wirdoc\\"_s);
+}
+
+void reportUntrapped(const RuntimeError& error, const QString& source)
+{
+    LogError(error, source, source.mid(source.indexOf(u'.') + 1));
+}
+
+}  // namespace
+
+eKEST::eKEST()
+{
+    desktop::setFailureReporter(reportUntrapped);
+    gConn = GetConnection();
+    gsUnreadPath = homeFolder() + u"AUnread\\"_s;
+    gsReadPath = homeFolder() + u"ARead\\"_s;
+    gsUnsentPath = homeFolder() + u"AUnsent\\"_s;
+    gsSentPath = homeFolder() + u"ASent\\"_s;
+    gsImagesPath = GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"ImagesPath"_s, u"c:\\wirimg\\"_s);
+}
+
+eKEST::~eKEST()
+{
+    grsQuote.reset();
+    gConn.reset();
+    gcnDB.reset();
+}
+
+void eKEST::ShowKESTWindow(const QString& sQTNNO, const QString& sSubQuote)
+{
+    desktop::guarded(u"eKEST.ShowKESTWindow"_s, [&] {
+        frmKEST panel;
+        if (!OpenHostQuote(sQTNNO, sSubQuote))
+            return;
+        desktop::showModal(panel);
+    });
+}
+
+bool HasConnection()
+{
+    if (!gConn)
+        desktop::msgBox(u"Could not connect to the quote database, Please contact MarlinDesk Support."_s,
+                        desktop::Icon::Critical);
+    return gConn != nullptr;
+}
+
+bool OpenHostQuote(const QString& sQTNNO, const QString& sSubQuote)
+{
+    if (!HasConnection())
+        return false;
+    grsQuote = std::make_shared<db::Recordset>(gConn);
+    grsQuote->open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", sQTNNO, sSubQuote));
+    gsQTNNO = sQTNNO;
+    gsSubQuote = sSubQuote;
+    return true;
+}
+
+}  // namespace kest

@@ -1,0 +1,42 @@
+// The panel "ORLA Partner Network": the four things that a user can do with the network.
+#pragma once
+
+#include "platform/desktop/Form.h"
+
+#include <array>
+
+class QLabel;
+class QPushButton;
+class QRadioButton;
+
+namespace kest {
+
+class frmKEST final : public desktop::Form {
+    Q_OBJECT
+public:
+    frmKEST();
+
+    /// Sends the quote of the panel; false when it was refused.
+    static bool SendOpenQuote();
+
+protected:
+    bool event(QEvent* event) override;
+    void keyPressEvent(QKeyEvent* event) override;
+
+private:
+    void Form_Load();
+    void Form_Activate();
+    void Option1_Click(int index);
+    void cmdOK_Click();
+
+    void startTransport();
+    void openUtilities();
+
+    std::array<QRadioButton*, 4> Option1;
+    QLabel* lblQuote;
+    QPushButton* cmdOK;
+    QPushButton* cmdExit;
+    qint16 iOption = 1;
+};
+
+}  // namespace kest

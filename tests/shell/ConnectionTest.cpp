@@ -1,0 +1,98 @@
+#include "shell/ModRegistry.h"
+#include "shell/SharedVariables.h"
+#include "shell/modDBAccess.h"
+#include "support/ScriptedDesktop.h"
+#include "support/Shop.h"
+
+#include <gtest/gtest.h>
+
+namespace kest {
+namespace {
+
+using namespace Qt::StringLiterals;
+
+void setSetting(const QString& key, const QString& value, const QString& section = u"wirra32\\frmsplash"_s)
+{
+    RegCreateSubKey(settings::Hive::LocalMachine, u"SOFTWARE\\"_s + section);
+    ASSERT_TRUE(RegSetValue(settings::Hive::LocalMachine, u"SOFTWARE\\"_s + section, key, value));
+}
+
+TEST(ConnectionText, NamesDriverServerAndInstance)
+{
+    struct Case {
+        int driver;
+        QString server, instance, expected;
+    };
+    const Case cases[] = {
+        {0, u"(local)"_s, u""_s, u"Driver={SQL Server};Server=(local)\\;Database=WirSql;Uid=sa;Pwd=secret;"_s},
+        {1, u"SHOP\\"_s, u"A"_s, u"Driver={SQL Native Client};Server=SHOP\\A;Database=WirSql;Uid=sa;Pwd=secret;"_s},
+        {0, u"SHOP"_s, u"A"_s, u"Driver={SQL Server};Server=SHOP\\A;Database=WirSql;Uid=sa;Pwd=secret;"_s},
+        {2, u"SHOP"_s, u"A"_s, u""_s},
+        {1, u"mysql:db.shop:3307"_s, u"A"_s,
+         u"Driver={MySQL};Server=db.shop;Port=3307;Database=WirSql;Uid=sa;Pwd=secret;"_s},
+    };
+    gsDatabase = u"WirSql"_s;
+    gsSAPwd = u"secret"_s;
+    for (const Case& c : cases) {
+        gsServer = c.server;
+        gsInstance = c.instance;
+        EXPECT_EQ(ConnectionText(c.driver), c.expected);
+    }
+}
+
+class ShopConnection : public test::Shop {};
+
+TEST_F(ShopConnection, ATabletWorksOnTheMasterOrOnItsOwn)
+{
+    setSetting(u"DatabaseName"_s, u"Own"_s);
+    setSetting(u"TabletMasterDatabaseName"_s, u"Master"_s);
+    struct Case {
+        QString useMaster, database;
+        bool local;
+    };
+    const Case cases[] = {{u"1"_s, u"Master"_s, false}, {u"0"_s, u"Own"_s, true}, {u"yes"_s, u"Own"_s, false}};
+    for (const Case& c : cases) {
+        setSetting(u"TabletUseMaster"_s, c.useMaster);
+        OpenDatabase();
+        EXPECT_EQ(gsDatabase, c.database) << c.useMaster.toStdString();
+        EXPECT_EQ(gbTabletLocal, c.local) << c.useMaster.toStdString();
+    }
+    gbTabletLocal = false;
+}
+
+TEST_F(ShopConnection, ThisMachinesOwnNameIsTheLocalServer)
+{
+    setSetting(u"ServerName"_s, GetComputerName());
+    OpenDatabase();
+    EXPECT_EQ(gsServer, u"(local)"_s);
+    EXPECT_NE(GetConnection(), nullptr);
+}
+
+TEST_F(ShopConnection, AnUnknownDriverNumberOnAnOldSystemOpensNothing)
+{
+    setSetting(u"ClientConnectionType"_s, u"7"_s);
+    setSetting(u"CurrentVersion"_s, u"5.1"_s, u"Microsoft\\Windows NT\\CurrentVersion"_s);
+    OpenDatabase();
+    EXPECT_EQ(GetConnection(), nullptr);
+    setSetting(u"CurrentVersion"_s, u"6.1"_s, u"Microsoft\\Windows NT\\CurrentVersion"_s);
+    EXPECT_NE(GetConnection(), nullptr);
+}
+
+TEST_F(ShopConnection, AMissingDatabaseIsTold)
+{
+    setSetting(u"DatabaseName"_s, u"Nowhere"_s);
+    EXPECT_FALSE(OpenRecordset(u"SELECT * FROM CINFO"_s, false, true));
+    EXPECT_TRUE(desktop->boxTexts().value(0).startsWith(u"-2147467259: Could not Initialize Database! - "_s));
+}
+
+TEST_F(ShopConnection, ADisconnectedRecordsetOutlivesTheConnection)
+{
+    std::optional<db::Recordset> rows = OpenRecordset(u"SELECT * FROM CINFO"_s, true);
+    ASSERT_TRUE(rows);
+    gcnDB->close();
+    EXPECT_EQ(rows->recordCount(), 1);
+    EXPECT_TRUE(EnsureConnection());
+}
+
+}  // namespace
+}  // namespace kest

@@ -1,0 +1,64 @@
+#include "platform/files/files.h"
+#include "platform/profile.h"
+#include "shell/SharedVariables.h"
+#include "shell/eKEST.h"
+#include "support/Shop.h"
+
+#include <gtest/gtest.h>
+
+namespace kest {
+namespace {
+
+using namespace Qt::StringLiterals;
+
+class Panel : public test::Shop {
+protected:
+    /// Shows the panel on a quote, driven by steps.
+    void show(const char* quote, const char* steps)
+    {
+        desktop.emplace((std::string(R"json({"windows": {"frmKEST": [)json") + steps + "]}}").c_str());
+        eKEST().ShowKESTWindow(QString::fromLatin1(quote), u"0"_s);
+    }
+};
+
+TEST_F(Panel, StartsOnViewMessagesAndNamesTheQuote)
+{
+    test::quote("500");
+    show("500", R"json([{"read": ["Option1(1)", "Option1(2)", "lblQuote"]}])json");
+    EXPECT_TRUE(desktop->read(u"Option1(1)"_s, u"checked"_s).toBool());
+EXPECT_TRUE(desktop->read(u"Option1(2)"_s, u"enabled"_s).toBool());
+EXPECT_EQ(desktop->read(u"lblQuote"_s).toString(), u"Quote 500"_s);
+}
+
+TEST_F(Panel, UtilitiesWithoutAQuoteAsksForNoPassword)
+{
+    show("0", R"json([{"click": "Option1(3)"}, {"click": "cmdOK"}])json");
+    EXPECT_EQ(desktop->boxes(), QStringList(u"information||No quote is open.|ok"_s));
+}
+
+TEST_F(Panel, EnterWithoutShiftKeysIsOk)
+{
+    show("0", R"json([{"click": "Option1(3)"}, {"key": "Option1(3)", "keys": "Shift+Return"}])json");
+    EXPECT_EQ(desktop->boxes().size(), 0);
+    show("0", R"json([{"click": "Option1(3)"}, {"key": "Option1(3)", "keys": "Return"}])json");
+    EXPECT_EQ(desktop->boxes().size(), 1);
+    }
+
+TEST_F(Panel, AMissingTransportProgramIsSilent)
+{
+    show("0", R"json([{"click": "Option1(0)"}, {"click": "cmdOK"}, {"read": ["cmdOK"]}, {"click": "cmdExit"}])json");
+    EXPECT_EQ(desktop->boxes().size(), 0);
+EXPECT_TRUE(desktop->read(u"cmdOK"_s, u"enabled"_s).toBool());
+}
+
+TEST_F(Panel, WithoutAConnectionItIsNotShown)
+{
+    files::remove(profile::root() + u"/databases/WirSql.db"_s);
+    show("500", R"json([{"read": ["cmdOK"]}])json");
+    EXPECT_EQ(desktop->boxTexts(),
+              QStringList(u"Could not connect to the quote database, Please contact MarlinDesk Support."_s));
+    EXPECT_TRUE(desktop->record().reads.isEmpty());
+}
+
+}  // namespace
+}  // namespace kest
