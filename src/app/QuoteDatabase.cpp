@@ -8,8 +8,7 @@
 #include <QFile>
 #include <QRegularExpression>
 
-// Outside the namespaces, as the macro wants it: a static library's resources do not register themselves.
-static void registerScripts()
+static void registerSql()  // outside the namespaces, as the macro wants it
 {
     Q_INIT_RESOURCE(sql);
 }
@@ -22,7 +21,7 @@ namespace {
 
 QString script(const QString& name)
 {
-    registerScripts();
+    registerResources();
     QFile file(u":/sql/"_s + name);
     if (!file.open(QIODevice::ReadOnly))
         throw RuntimeError(FileNotFound, u"The script %1 is missing."_s.arg(name));
@@ -36,6 +35,11 @@ void run(db::Connection& database, const QString& text)
 }
 
 }  // namespace
+
+void registerResources()
+{
+    registerSql();
+}
 
 void createTables(db::Connection& database, Dialect dialect)
 {

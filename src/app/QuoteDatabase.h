@@ -22,6 +22,9 @@ void fillDemoShop(db::Connection& database, const QDate& today);
 db::ConnectionPtr openEmbedded(const QString& name);
 QString embeddedFile(const QString& name);
 
+/// Makes the files under ":/sql" readable: those of a static library do not register themselves.
+void registerResources();
+
 /// The statements of an SQL text, without its comments.
 QStringList statementsIn(const QString& script);
 /// Days around `today` filled in: "@date-3@" is three days before as yyyy-MM-dd, "@short+10@" ten days after as

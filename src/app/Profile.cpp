@@ -1,0 +1,151 @@
+#include "app/Profile.h"
+
+#include "app/DemoShop.h"
+#include "app/QuoteDatabase.h"
+#include "platform/RuntimeError.h"
+#include "platform/files/files.h"
+#include "platform/profile.h"
+#include "platform/settings/registry.h"
+#include "shell/modLoggerEx.h"
+
+#include <QDir>
+
+namespace kest::app {
+
+using namespace Qt::StringLiterals;
+using settings::Hive;
+
+namespace {
+
+const QString hostKey = u"SOFTWARE\\wirra32\\frmsplash"_s;
+const QString systemKey = u"SOFTWARE\\Microsoft\\Windows NT\\CurrentVersion"_s;
+
+const QString home = u"c:\\wirdoc\\"_s;
+const QString images = u"c:\\wirimg\\"_s;
+const QString reports = u"c:\\wirra32\\report\\"_s;
+const QString databaseName = u"WirSql"_s;
+
+struct Setting {
+    QString key;
+    QString name;
+    QString value;
+};
+
+const QList<Setting>& settingsOfNewProfile()
+{
+    static const QList<Setting> all = {
+        {hostKey, u"EcomHome"_s, home},
+        {hostKey, u"ImagesPath"_s, images},
+        {hostKey, u"ReportPath"_s, reports},
+        {hostKey, u"ServerName"_s, u"(local)"_s},
+        {hostKey, u"DatabaseName"_s, databaseName},
+        {hostKey, u"ClientConnectionType"_s, u"0"_s},
+        {systemKey, u"CurrentVersion"_s, u"10.0"_s},
+    };
+    return all;
+}
+
+void writeSettings()
+{
+    for (const auto& [key, name, value] : settingsOfNewProfile())
+        if (!settings::createKey(Hive::LocalMachine, key) ||
+            !settings::setValue(Hive::LocalMachine, key, name, {settings::Type::Text, value}))
+            throw RuntimeError(FileInputOutput, u"The setting %1 cannot be written."_s.arg(name));
+}
+
+/// The host's setting, or what a new profile has.
+QString hostSetting(const QString& name)
+{
+    const auto value = settings::query(Hive::LocalMachine, hostKey, name);
+    if (value && !value->data.isEmpty())
+        return value->data;
+    for (const Setting& setting : settingsOfNewProfile())
+        if (setting.name == name)
+            return setting.value;
+    return {};
+}
+
+void makeFolders()
+{
+    for (const QString& folder : {home + u"AUnread"_s, home + u"ARead"_s, home + u"AUnsent"_s, home + u"ASent"_s,
+                                  home + u"PDF"_s, images, reports, profile::componentFolder()})
+        files::makeFolder(folder);
+}
+
+void makeDatabase(bool demo, const QDate& today)
+{
+    // under another name until it is whole: a database of this name is one that a shop works with
+    const QString unfinished = u"unfinished"_s;
+    for (const QString& leftOver : files::list(profile::root() + u"/databases"_s, unfinished + u".db*"_s))
+        files::remove(profile::root() + u"/databases/"_s + leftOver);
+    const db::ConnectionPtr database = openEmbedded(unfinished);
+    createTables(*database, Dialect::Embedded);
+    fillNewShop(*database);
+    if (demo)
+        fillDemoShop(*database, today);
+    database->close();
+    files::move(embeddedFile(unfinished), embeddedFile(databaseName));
+}
+
+void rebuildIndexes()
+{
+    const QString folder = profile::root() + u"/databases"_s;
+    for (const QString& file : files::list(folder, u"*.db"_s))
+        openEmbedded(file.chopped(3))->execute(u"REINDEX"_s);
+}
+
+void installTemplates()
+{
+    const QDir templates(u":/templates"_s);
+    for (const QString& name : templates.entryList(QDir::Files)) {
+        QFile file(templates.filePath(name));
+        file.open(QIODevice::ReadOnly);
+        files::writeBytes(reports + name, file.readAll());
+    }
+}
+
+}  // namespace
+
+bool initProfile(bool demo, const QDate& today)
+{
+    if (settings::keyExists(Hive::LocalMachine, hostKey)) {
+        rebuildIndexes();
+        return false;
+    }
+    makeFolders();
+    files::makeFolder(profile::root() + u"/databases"_s);
+    installTemplates();
+    if (!files::exists(embeddedFile(databaseName)))
+        makeDatabase(demo, today);
+    if (demo)
+        putDemoFiles(home, images, today);
+    writeSettings();  // last: they tell that the profile is whole
+    return true;
+}
+
+QJsonObject where()
+{
+    const QString messages = hostSetting(u"EcomHome"_s);
+    const QString server = hostSetting(u"ServerName"_s);
+    const QString name = hostSetting(u"DatabaseName"_s);
+    const QString instance = hostSetting(u"InstanceName"_s);
+    const bool embedded = server == u"(local)"_s;
+    const QString database =
+        embedded ? embeddedFile(instance.isEmpty() ? name : instance + u'.' + name) : server + u'/' + name;
+    const auto folder = [](const QString& path) { return QDir::cleanPath(files::systemPath(path)); };
+    return {
+        {u"profile"_s, profile::root()},
+        {u"database"_s, database},
+        {u"unread"_s, folder(messages + u"AUnread"_s)},
+        {u"read"_s, folder(messages + u"ARead"_s)},
+        {u"unsent"_s, folder(messages + u"AUnsent"_s)},
+        {u"sent"_s, folder(messages + u"ASent"_s)},
+        {u"images"_s, folder(hostSetting(u"ImagesPath"_s))},
+        {u"pdf"_s, folder(messages + u"PDF"_s)},
+        {u"reports"_s, folder(hostSetting(u"ReportPath"_s))},
+        {u"log"_s, QDir::cleanPath(files::systemPath(ErrorLogPath()))},
+        {u"component"_s, profile::componentFolder()},
+    };
+}
+
+}  // namespace kest::app
