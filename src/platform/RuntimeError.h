@@ -22,6 +22,7 @@ enum ErrorNumber : int {
     NoCurrentRow = 3021,
     NoSuchColumn = 3265,
     ObjectClosed = 3704,
+    ValueTooLong = -2147217887,     // a text longer than its column
     RowChanged = -2147217864,       // someone else has changed or removed the row
     StatementFailed = -2147217900,  // the engine refused the statement
     CannotOpen = -2147467259,       // the database cannot be opened, or has gone

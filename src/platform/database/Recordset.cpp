@@ -612,6 +612,9 @@ void Recordset::set(const QString& name, const QVariant& value)
     if (!data->declared && described.table.isEmpty())
         throw RuntimeError(StatementFailed, u"The column "_s + name + u" is worked out and can't be changed."_s);
     const QVariant stored = converted(value, described.kind, data->declared ? described.size : 0);
+    if (!data->declared && described.kind == Kind::Text && described.size > 0 &&
+        stored.toString().size() > described.size)
+        throw RuntimeError(ValueTooLong, u"The text is too long for the column "_s + name + u"."_s);
     data->beginChange();
     data->assigned[size_t(column)] = true;
     data->store(row, column, stored);

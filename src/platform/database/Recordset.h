@@ -65,7 +65,9 @@ public:
     /// The value followed by an empty text: a Null is empty.
     QString text(const QString& column) const;
     bool isNull(const QString& column) const;
-    /// Converts to the column's kind; throws TypeMismatch where that fails. A null QVariant sets Null.
+    /// Converts to the column's kind; throws TypeMismatch where that fails, and ValueTooLong for a text that a table's
+    /// column does not take, so that no engine cuts it or refuses it only when other rows are written. A null QVariant
+    /// sets Null.
     void set(const QString& column, const QVariant& value);
 
     /// Appends a row, current at once, all columns unset.
