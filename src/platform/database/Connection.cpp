@@ -7,7 +7,6 @@
 
 #include <QDir>
 #include <QFile>
-#include <QFileInfo>
 #include <QHash>
 #include <QSysInfo>
 
@@ -77,7 +76,10 @@ bool isThisMachine(const QString& server)
 
 std::unique_ptr<Engine> openLocal(const QString& databaseName, const QString& instance)
 {
-    return openEmbedded(embeddedFile(databaseName, instance));
+    const QString name = instance.isEmpty() ? databaseName : instance + u'.' + databaseName;
+    if (!files::isPlainName(name))
+        throw RuntimeError(CannotOpen, u"\""_s + name + u"\" is no name of a database."_s);
+    return openEmbedded(files::systemPath(profile::root() + u"/databases/"_s + name + u".db"_s));
 }
 
 std::unique_ptr<Engine> openEngine(const QString& text)
@@ -132,12 +134,6 @@ qint64 Connection::execute(const QString& statement)
     return engine().execute(statement);
 }
 
-void Connection::executeScript(const QString& script)
-{
-    for (const QString& statement : statementsOf(script))
-        execute(statement);
-}
-
 void Connection::rebuildIndexes()
 {
     engine().rebuildIndexes();
@@ -148,37 +144,6 @@ Engine& Connection::engine() const
     if (state() != 1)
         throw RuntimeError(CannotOpen, u"The connection to the database is closed."_s);
     return *engine_;
-}
-
-QString embeddedFile(const QString& databaseName, const QString& instance)
-{
-    const QString name = instance.isEmpty() ? databaseName : instance + u'.' + databaseName;
-    if (!files::isPlainName(name))
-        throw RuntimeError(CannotOpen, u"\""_s + name + u"\" is no name of a database."_s);
-    return files::systemPath(profile::root() + u"/databases/"_s + name + u".db"_s);
-}
-
-bool createEmbedded(const QString& databaseName, const QString& script)
-{
-    const QString file = embeddedFile(databaseName);
-    if (QFileInfo::exists(file))
-        return false;
-    const QString unfinished = file + u".new"_s;
-    if (!QDir().mkpath(QFileInfo(file).path()))
-        throw RuntimeError(PathNotFound, u"The folder of "_s + file + u" can't be made."_s);
-    QFile::remove(unfinished);
-    if (!QFile(unfinished).open(QIODevice::WriteOnly))
-        throw RuntimeError(PermissionDenied, u"The database "_s + file + u" can't be made."_s);
-    {
-        const std::unique_ptr<Engine> engine = openEmbedded(unfinished);
-        engine->execute(u"BEGIN"_s);
-        for (const QString& statement : statementsOf(script))
-            engine->execute(statement);
-        engine->execute(u"COMMIT"_s);
-    }  // closed, so that the whole database stands in the one file
-    if (!QFile::rename(unfinished, file))
-        throw RuntimeError(PermissionDenied, u"The database "_s + file + u" can't be made."_s);
-    return true;
 }
 
 }  // namespace kest::db

@@ -34,8 +34,6 @@ public:
     /// Throws StatementFailed with the engine's codes, CannotOpen when the connection has gone.
     qint64 execute(const QString& statement);
 
-    /// Runs the statements of a script, parted by ";", one by one.
-    void executeScript(const QString& script);
     /// Puts the indexes of the embedded database in order, which another tool may have left in another one.
     void rebuildIndexes();
 
@@ -48,10 +46,5 @@ private:
 };
 
 using ConnectionPtr = std::shared_ptr<Connection>;
-
-/// The file of the profile that a connection text for a local server without a driver opens.
-QString embeddedFile(const QString& databaseName, const QString& instance = {});
-/// Makes that file from the statements of a script: whole or not at all. False where there is one already.
-bool createEmbedded(const QString& databaseName, const QString& script);
 
 }  // namespace kest::db

@@ -474,24 +474,4 @@ QString translated(const QString& statement, const Dialect& dialect, Schema& sch
     return Translation(statement, dialect, schema).run();
 }
 
-QStringList statementsOf(const QString& script)
-{
-    QStringList statements;
-    QString current;
-    const auto take = [&] {
-        if (!current.trimmed().isEmpty())
-            statements.append(current.trimmed());
-        current.clear();
-    };
-    static const QRegularExpression comment(u"^\\s*--[^\\n]*$"_s, QRegularExpression::MultilineOption);
-    for (const Token& token : tokensOf(QString(script).remove(comment))) {
-        if (token.is(u";"))
-            take();
-        else
-            current += token.text;
-    }
-    take();
-    return statements;
-}
-
 }  // namespace kest::db

@@ -51,7 +51,4 @@ struct Dialect {
 /// number equals no number.
 QString translated(const QString& statement, const Dialect& dialect, Schema& schema);
 
-/// The statements of a script, parted by ";" outside literals.
-QStringList statementsOf(const QString& script);
-
 }  // namespace kest::db

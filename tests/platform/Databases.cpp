@@ -1,0 +1,91 @@
+#include "platform/Databases.h"
+
+#include "app/QuoteDatabase.h"
+
+#include <memory>
+
+namespace kest::test {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+const auto embeddedSchema =
+    uR"(
+CREATE TABLE LINE (id INTEGER PRIMARY KEY AUTOINCREMENT, CODE VARCHAR(20) COLLATE NOCASE, SEQ INTEGER,
+    amount REAL DEFAULT 0, flag BIT DEFAULT 0, day DATETIME, notes LONGTEXT COLLATE NOCASE);
+CREATE TABLE CAR (REGO VARCHAR(20) COLLATE NOCASE NOT NULL PRIMARY KEY, owner VARCHAR(30) COLLATE NOCASE, CODE VARCHAR(20) COLLATE NOCASE);
+CREATE TABLE Tints (Code VARCHAR(20) COLLATE NOCASE, Script VARCHAR(30) COLLATE NOCASE DEFAULT 'none');)"_s;
+
+const auto mariaDbSchema =
+    uR"(
+CREATE TABLE LINE (id INTEGER NOT NULL AUTO_INCREMENT PRIMARY KEY, CODE VARCHAR(20), SEQ INTEGER,
+    amount FLOAT DEFAULT 0, flag BIT DEFAULT 0, day DATETIME, notes LONGTEXT);
+CREATE TABLE CAR (REGO VARCHAR(20) NOT NULL PRIMARY KEY, owner VARCHAR(30), CODE VARCHAR(20));
+CREATE TABLE Tints (Code VARCHAR(20), Script VARCHAR(30) DEFAULT 'none');)"_s;
+
+const auto odbcDriver = u"Shop Server"_s;
+
+/// ODBC reads the list of drivers once, so it is registered before any test runs and stays.
+class Environment final : public ::testing::Environment {
+public:
+    void SetUp() override { MariaDbServer::registerOdbcDriver(odbcList, odbcDriver); }
+    void TearDown() override { server.reset(); }
+
+    std::unique_ptr<MariaDbServer> server;
+
+private:
+    QTemporaryDir odbcList;
+};
+
+Environment* const environment = [] {
+    auto made = std::make_unique<Environment>();
+    Environment* kept = made.get();
+    ::testing::AddGlobalTestEnvironment(made.release());  // owned by the test framework from here on
+    return kept;
+}();
+
+}  // namespace
+
+MariaDbServer& mariaDb()
+{
+    if (!environment->server)
+        environment->server = std::make_unique<MariaDbServer>();
+    return *environment->server;
+}
+
+Databases::Databases()
+{
+    if (GetParam() == On::Embedded) {
+        connectionText = u"Driver={SQL Server};Server=(local)\\;Database=shop;Uid=sa;Pwd=x;"_s;
+        const db::ConnectionPtr made = app::openEmbedded(u"shop"_s);
+        for (const QString& statement : app::statementsIn(embeddedSchema))
+            made->execute(statement);
+    } else {
+        mariaDb().createDatabase(u"shop"_s, mariaDbSchema);
+        connectionText = GetParam() == On::MySql ? mariaDb().connectionText(u"shop"_s)
+                                                 : mariaDb().connectionText(u"shop"_s, odbcDriver);
+    }
+    connection = connect();
+}
+
+db::ConnectionPtr Databases::connect() const
+{
+    auto made = std::make_shared<db::Connection>();
+    made->open(connectionText);
+    return made;
+}
+
+db::Recordset Databases::query(const QString& select) const
+{
+    db::Recordset rows(connection);
+    rows.open(select);
+    return rows;
+}
+
+int Databases::count(const QString& condition) const
+{
+    return query(u"SELECT * FROM LINE WHERE "_s + condition).recordCount();
+}
+
+}  // namespace kest::test

@@ -1,0 +1,398 @@
+// The recordset: what it reads, writes, refuses and finds, on each engine alike.
+#include "platform/Databases.h"
+#include "platform/database/FaultInjection.h"
+
+#include <QElapsedTimer>
+
+namespace kest::test {
+
+using namespace Qt::StringLiterals;
+using db::Kind;
+using db::Recordset;
+
+namespace {
+
+class RecordsetOn : public Databases {
+protected:
+    RecordsetOn() : lines(query(u"SELECT * FROM LINE ORDER BY id"_s)) {}
+    ~RecordsetOn() override { db::setStatementFault({}); }
+
+    void add(const QString& code, const QVariant& seq = {})
+    {
+        lines.addNew();
+        lines.set(u"CODE"_s, code);
+        lines.set(u"SEQ"_s, seq);
+        lines.update();
+    }
+
+    /// Another user's statement.
+    void elsewhere(const QString& statement) const { connect()->execute(statement); }
+
+    template <class Step>
+    static int statements(Step&& step)
+    {
+        int count = 0;
+        db::setStatementFault([&count] { return ++count < 0; });
+        step();
+        db::setStatementFault({});
+        return count;
+    }
+
+    Recordset lines;
+};
+
+const QDateTime someDay(QDate(2026, 2, 28), QTime(13, 5, 59));
+
+}  // namespace
+
+TEST_P(RecordsetOn, AKindOfColumnHasOneTypeOnEveryEngine)
+{
+    lines.addNew();
+    for (const auto& [column, value] :
+         std::initializer_list<std::pair<QString, QVariant>>{{u"code"_s, u"Größe €5"_s},
+                                                             {u"SEQ"_s, u" 1,200 "_s},
+                                                             {u"amount"_s, u"12.5"_s},
+                                                             {u"flag"_s, u"True"_s},
+                                                             {u"day"_s, u"28/02/2026 1:05:59 PM"_s},
+                                                             {u"notes"_s, QString(100000, u'n')}})
+        lines.set(column, value);
+    lines.update();
+
+    lines.requery();
+    const std::tuple<QString, Kind, QVariant> columns[] = {
+        {u"CODE"_s, Kind::Text, u"Größe €5"_s},  {u"SEQ"_s, Kind::WholeNumber, qint64(1200)},
+        {u"amount"_s, Kind::Number, 12.5},       {u"flag"_s, Kind::Flag, true},
+        {u"day"_s, Kind::Date, someDay},         {u"notes"_s, Kind::LongText, QString(100000, u'n')},
+        {u"id"_s, Kind::WholeNumber, qint64(1)},
+    };
+    for (const auto& [name, kind, value] : columns) {
+        EXPECT_EQ(lines.kind(name), kind) << name.toStdString();
+        EXPECT_EQ(lines.value(name).typeId(), value.typeId()) << name.toStdString();
+        EXPECT_EQ(lines.value(name), value) << name.toStdString();
+    }
+    EXPECT_EQ(lines.size(u"code"_s), 20);
+    EXPECT_EQ(query(u"SELECT COUNT(*) AS n FROM LINE"_s).value(u"n"_s), QVariant(qint64(1)));
+    EXPECT_TRUE(query(u"SELECT MAX(SEQ) AS n FROM LINE WHERE SEQ=1"_s).isNull(u"N"_s));
+
+    const std::pair<QString, QString> wrong[] = {{u"SEQ"_s, u"x"_s}, {u"amount"_s, u""_s}, {u"day"_s, u"soon"_s}};
+    for (const auto& [column, text] : wrong)
+        EXPECT_EQ(failure([&] { lines.set(column, text); }).number(), TypeMismatch) << column.toStdString();
+    EXPECT_EQ(failure([&] { lines.value(u"nosuch"_s); }).number(), NoSuchColumn);
+}
+
+TEST_P(RecordsetOn, ANewRowHoldsItsIdentityAndTheDefaultsAtOnce)
+{
+    add(u"A"_s, 1);
+    lines.addNew();
+    EXPECT_EQ(lines.absolutePosition(), 2);
+    EXPECT_TRUE(lines.isNull(u"amount"_s));
+    lines.set(u"CODE"_s, u"B"_s);
+    lines.update();
+    EXPECT_EQ(lines.value(u"id"_s), QVariant(qint64(2)));
+    EXPECT_EQ(lines.value(u"amount"_s), QVariant(0.0));
+    EXPECT_EQ(lines.value(u"flag"_s), QVariant(false));
+    EXPECT_TRUE(lines.isNull(u"SEQ"_s));
+    lines.set(u"SEQ"_s, 2);  // the row can be changed on, by its new identity
+    lines.update();
+    EXPECT_EQ(count(u"CODE='B' AND SEQ=2"_s), 1);
+
+    Recordset tints = query(u"SELECT * FROM TINTS"_s);
+    tints.addNew();
+    tints.set(u"Code"_s, u"R"_s);
+    tints.update();
+    EXPECT_EQ(tints.text(u"Script"_s), u"none"_s);
+
+    lines.addNew();  // nothing set: all defaults
+    lines.update();
+    EXPECT_EQ(lines.value(u"id"_s), QVariant(qint64(3)));
+}
+
+TEST_P(RecordsetOn, AnUpdateWritesOnlyWhatDiffers)
+{
+    add(u"A"_s, 1);
+    elsewhere(u"UPDATE LINE SET SEQ=7"_s);
+    lines.set(u"CODE"_s, u"B"_s);
+    lines.set(u"SEQ"_s, 1);  // as it was read: not written
+    lines.update();
+    EXPECT_EQ(count(u"CODE='B' AND SEQ=7"_s), 1);
+
+    EXPECT_EQ(statements([&] {
+                  lines.set(u"CODE"_s, u"B"_s);
+                  lines.update();
+                  lines.update();
+              }),
+              0);
+    EXPECT_EQ(statements([&] {
+                  lines.set(u"CODE"_s, u"b"_s);  // another text, though it compares equal
+                  lines.update();
+              }),
+              1);
+}
+
+TEST_P(RecordsetOn, ARowThatSomeoneElseHasChangedIsNotOverwritten)
+{
+    struct Case {
+        QString column, before, theirs;
+        QVariant ours;
+        bool refused;
+    };
+    const Case cases[] = {
+        {u"CODE"_s, u"'a'"_s, u"'x'"_s, u"b"_s, true},
+        {u"CODE"_s, u"NULL"_s, u"'x'"_s, u"b"_s, true},
+        {u"CODE"_s, u"'a'"_s, u"NULL"_s, u"b"_s, true},
+        {u"SEQ"_s, u"1"_s, u"2"_s, 3, true},
+        {u"flag"_s, u"0"_s, u"1"_s, true, true},
+        {u"day"_s, u"'2026-02-28 00:00:00'"_s, u"NULL"_s, someDay, true},
+        {u"notes"_s, u"'a'"_s, u"'A'"_s, u"b"_s, true},
+        {u"notes"_s, u"NULL"_s, u"'x'"_s, u"b"_s, true},
+        {u"amount"_s, u"1"_s, u"2"_s, 3.0, false},  // floating point is left out of the test
+        {u"flag"_s, u"1"_s, u"1"_s, false, false},  // the same again is no change
+        {u"day"_s, u"'2026-02-28 13:05:59'"_s, u"day"_s, QDateTime(QDate(2026, 3, 1), QTime()), false},
+        {u"notes"_s, u"'a'"_s, u"notes"_s, QVariant(), false},
+    };
+    for (const Case& c : cases) {
+        const QString name = c.column + u' ' + c.before + u' ' + c.theirs;
+        elsewhere(u"DELETE FROM LINE"_s);
+        elsewhere(u"INSERT INTO LINE (%1) VALUES (%2)"_s.arg(c.column, c.before));
+        lines.requery();
+        lines.set(c.column, c.ours);
+        elsewhere(u"UPDATE LINE SET %1=%2"_s.arg(c.column, c.theirs));
+        EXPECT_EQ(failure([&] { lines.update(); }).number(), c.refused ? RowChanged : 0) << name.toStdString();
+        lines.cancelUpdate();
+    }
+    lines.set(u"CODE"_s, u"gone"_s);
+    elsewhere(u"DELETE FROM LINE"_s);
+    EXPECT_EQ(failure([&] { lines.moveFirst(); }).number(), RowChanged) << "a move updates first";
+    EXPECT_EQ(failure([&] { lines.remove(); }).number(), RowChanged);
+}
+
+TEST_P(RecordsetOn, AJoinIsUpdatedInTheTablesThatItsColumnsComeFrom)
+{
+    elsewhere(u"INSERT INTO LINE (CODE, SEQ) VALUES ('L', 1)"_s);
+    elsewhere(u"INSERT INTO LINE (CODE, SEQ) VALUES ('other', 1)"_s);
+    elsewhere(u"INSERT INTO CAR (REGO, owner, CODE) VALUES ('L', 'Ann', 'C')"_s);
+    Recordset join = query(u"SELECT * FROM line, car WHERE line.CODE=CAR.rego"_s);
+    ASSERT_EQ(join.recordCount(), 1);
+    EXPECT_EQ(join.text(u"CODE"_s), u"L"_s);  // the first of two columns of the name
+    join.set(u"code"_s, u"L2"_s);
+    join.set(u"owner"_s, u"Bob"_s);
+    join.update();
+    EXPECT_EQ(count(u"CODE='L2'"_s), 1);
+    EXPECT_EQ(count(u"CODE='other'"_s), 1);
+    EXPECT_EQ(query(u"SELECT * FROM CAR WHERE owner='Bob' AND CODE='C'"_s).recordCount(), 1);
+
+    Recordset named = query(u"SELECT REGO + ' of ' + owner AS CODE, COUNT(*) AS n FROM CAR GROUP BY REGO, owner"_s);
+    EXPECT_EQ(named.text(u"CODE"_s), u"L of Bob"_s);
+    EXPECT_NE(failure([&] { named.set(u"CODE"_s, u"x"_s); }).number(), 0) << "a worked out value";
+}
+
+TEST_P(RecordsetOn, WithoutAKeyAllSelectedColumnsTellTheRow)
+{
+    elsewhere(u"INSERT INTO TINTS (Code, Script) VALUES ('R', 'Red')"_s);
+    elsewhere(u"INSERT INTO TINTS (Code, Script) VALUES ('R', NULL)"_s);
+    elsewhere(u"INSERT INTO CAR (REGO, owner) VALUES ('R', 'Ann')"_s);
+    Recordset tints = query(u"SELECT * FROM tints"_s);
+    tints.find(u"script='red'"_s);
+    tints.set(u"Script"_s, u"Dark"_s);
+    tints.update();
+    EXPECT_EQ(query(u"SELECT * FROM Tints WHERE Script='Dark'"_s).recordCount(), 1);
+    tints.moveFirst();
+    tints.find(u"Script=NULL"_s);
+    tints.remove();
+    EXPECT_EQ(query(u"SELECT * FROM Tints"_s).recordCount(), 1);
+
+    Recordset owners = query(u"SELECT owner FROM CAR"_s);  // the key is not selected
+    owners.set(u"owner"_s, u"Bob"_s);
+    owners.update();
+    EXPECT_EQ(query(u"SELECT * FROM CAR WHERE owner='Bob'"_s).recordCount(), 1);
+}
+
+TEST_P(RecordsetOn, SearchesGoForwardAndCompareByTheKindOfTheColumn)
+{
+    for (const auto& [code, seq] :
+         {std::pair(u"red"_s, 1), {u"Blue "_s, 2}, {u"Österreich"_s, 3}, {u"RED"_s, 4}, {u"O'Brien"_s, 0}})
+        add(code, seq);
+    lines.set(u"flag"_s, true);
+    lines.set(u"day"_s, someDay);
+    lines.update();
+    struct Case {
+        int from;
+        QString criterion;
+        int hit;  // -1: none
+    };
+    const Case cases[] = {
+        {1, u"CODE='RED'"_s, 1},
+        {2, u"code = 'Red '"_s, 4},
+        {1, u"[CODE]='blue'"_s, 2},
+        {1, u"CODE='öSTERREICH'"_s, 3},
+        {1, u"CODE='green'"_s, -1},
+        {1, u"CODE='O''BRIEN'"_s, 5},
+        {1, u"SEQ='3'"_s, 3},
+        {1, u"SEQ=3"_s, 3},
+        {1, u"SEQ='3.0 '"_s, 3},
+        {1, u"SEQ=''"_s, 5},
+        {1, u"SEQ='x'"_s, -1},
+        {3, u"SEQ=2"_s, -1},
+        {1, u"SEQ>2"_s, 3},
+        {1, u"SEQ<>1"_s, 2},
+        {1, u"CODE LIKE '%rr%'"_s, 3},
+        {1, u"flag=1"_s, 5},
+        {1, u"flag=True"_s, 5},
+        {1, u"day='28/02/2026 13:05:59'"_s, 5},
+        {1, u"day=NULL"_s, 1},
+        {1, u"CODE <= 'blue'"_s, 2},
+    };
+    for (const Case& c : cases) {
+        lines.setAbsolutePosition(c.from);
+        lines.find(c.criterion);
+        EXPECT_EQ(lines.absolutePosition(), c.hit) << c.criterion.toStdString();
+        EXPECT_EQ(lines.eof(), c.hit < 0);
+    }
+    EXPECT_EQ(failure([&] { lines.find(u"CODE='a' OR 1=1"_s); }).number(), StatementFailed);
+    Recordset empty = query(u"SELECT * FROM LINE WHERE 1=0"_s);
+    empty.find(u"SEQ=1"_s);
+    EXPECT_TRUE(empty.eof());
+}
+
+TEST_P(RecordsetOn, ASearchSeesEveryChangeMadeThroughTheRecordset)
+{
+    for (int i = 1; i <= 3; ++i)
+        add(u"c"_s, i);
+    lines.moveFirst();
+    lines.find(u"SEQ=3"_s);  // the index exists from here on
+    lines.set(u"SEQ"_s, 30);
+    lines.moveFirst();
+    lines.find(u"SEQ=3"_s);
+    EXPECT_TRUE(lines.eof());
+    add(u"c"_s, 3);
+    lines.addNew();
+    lines.set(u"SEQ"_s, 40);  // pending: a search updates it first
+    lines.find(u"SEQ=40"_s);
+    EXPECT_EQ(lines.absolutePosition(), 5);
+    EXPECT_EQ(count(u"SEQ=40"_s), 1);
+    lines.moveFirst();
+    lines.find(u"SEQ=3"_s);
+    EXPECT_EQ(lines.absolutePosition(), 4);
+    lines.remove();
+    EXPECT_EQ(lines.value(u"SEQ"_s).toInt(), 40) << "behind a removed row stands the next";
+    lines.set(u"SEQ"_s, 3);
+    lines.cancelUpdate();
+    lines.moveFirst();
+    lines.find(u"SEQ=3"_s);
+    EXPECT_TRUE(lines.eof());
+}
+
+TEST_P(RecordsetOn, MovingPastAnEndIsToldOnceAndThenAnError)
+{
+    EXPECT_TRUE(lines.eof() && lines.bof());
+    EXPECT_EQ(lines.absolutePosition(), -1);
+    for (const auto move : {&Recordset::moveFirst, &Recordset::moveLast, &Recordset::moveNext, &Recordset::movePrevious,
+                            &Recordset::remove})
+        EXPECT_EQ(failure([&] { (lines.*move)(); }).number(), NoCurrentRow);
+    EXPECT_EQ(failure([&] { lines.value(u"SEQ"_s); }).number(), NoCurrentRow);
+    add(u"A"_s);
+    add(u"B"_s);
+    lines.moveNext();
+    EXPECT_TRUE(lines.eof() && !lines.bof());
+    EXPECT_EQ(failure([&] { lines.moveNext(); }).number(), NoCurrentRow);
+    EXPECT_EQ(failure([&] { lines.set(u"SEQ"_s, 1); }).number(), NoCurrentRow);
+    lines.movePrevious();
+    EXPECT_EQ(lines.text(u"CODE"_s), u"B"_s);
+    lines.movePrevious();
+    lines.movePrevious();
+    EXPECT_TRUE(lines.bof() && !lines.eof());
+    lines.moveNext();
+    EXPECT_EQ(lines.text(u"CODE"_s), u"A"_s);
+    while (!lines.eof())
+        lines.remove();
+    EXPECT_EQ(count(u"1=1"_s), 0);
+}
+
+TEST_P(RecordsetOn, APendingChangeIsWrittenByAMoveAndForgottenByClose)
+{
+    add(u"A"_s, 1);
+    add(u"B"_s, 2);
+    lines.set(u"SEQ"_s, 20);
+    lines.moveFirst();
+    EXPECT_EQ(count(u"SEQ=20"_s), 1);
+    lines.set(u"SEQ"_s, 10);
+    lines.requery();
+    EXPECT_EQ(lines.value(u"SEQ"_s).toInt(), 10);
+    lines.set(u"SEQ"_s, 11);
+    lines.close();
+    EXPECT_EQ(count(u"SEQ=11"_s), 0);
+    EXPECT_EQ(failure([&] { lines.value(u"SEQ"_s); }).number(), ObjectClosed);
+    EXPECT_EQ(failure([&] { lines.moveFirst(); }).number(), ObjectClosed);
+}
+
+TEST_P(RecordsetOn, AFilterShowsTheRowsThatMatchAndADisconnectedOneLivesOn)
+{
+    for (int i = 1; i <= 6; ++i)
+        add(i % 2 ? u"odd"_s : u"even"_s, i);
+    lines.setFilter(u"CODE='ODD' AND SEQ>1"_s);
+    EXPECT_EQ(lines.recordCount(), 2);
+    EXPECT_EQ(lines.value(u"SEQ"_s).toInt(), 3);
+    lines.find(u"SEQ=4"_s);
+    EXPECT_TRUE(lines.eof()) << "hidden";
+    lines.disconnect();
+    connection->close();
+    lines.setFilter({});
+    EXPECT_EQ(lines.recordCount(), 6);
+    lines.find(u"SEQ=4"_s);
+    EXPECT_EQ(lines.text(u"CODE"_s), u"even"_s);
+    lines.set(u"SEQ"_s, 9);
+    EXPECT_EQ(failure([&] { lines.update(); }).number(), ObjectClosed);
+}
+
+INSTANTIATE_TEST_SUITE_P(Engines, RecordsetOn, ::testing::Values(On::Embedded, On::MySql, On::Odbc));
+
+TEST(DeclaredTable, CutsTextsAndCountsItsPendingRow)
+{
+    Recordset table;
+    table.declare(u"Name"_s, Kind::Text, 5);
+    table.declare(u"Price"_s, Kind::Number);
+    table.openDeclared();
+    EXPECT_TRUE(table.eof());
+    table.addNew();
+    table.set(u"name"_s, u"Windscreen"_s);
+    EXPECT_EQ(table.recordCount(), 1);
+    table.set(u"Price"_s, u"12.50"_s);
+    table.addNew();
+    table.set(u"Name"_s, u"A"_s);
+    table.update();
+    table.moveFirst();
+    EXPECT_EQ(table.text(u"Name"_s), u"Winds"_s);
+    EXPECT_EQ(table.value(u"Price"_s), QVariant(12.5));
+    table.moveNext();
+    EXPECT_EQ(table.text(u"Name"_s), u"A"_s);
+    EXPECT_TRUE(table.isNull(u"Price"_s));
+}
+
+TEST(DeclaredTable, IsWalkedInLinearTimeBySearches)
+{
+    Recordset table;
+    table.declare(u"SEQ"_s, Kind::WholeNumber);
+    table.declare(u"Script"_s, Kind::Text);
+    table.openDeclared();
+    constexpr int count = 5000;
+    const auto walk = [&] {
+        QElapsedTimer time;
+        time.start();
+        for (int i = 1; i <= count; ++i) {
+            table.moveFirst();
+            table.find(sql("SEQ='{}'", i));
+            EXPECT_EQ(table.absolutePosition(), i);
+            table.set(u"Script"_s, u"x"_s);
+            table.update();
+        }
+        return time.elapsed();
+    };
+    for (int i = 1; i <= count; ++i) {
+        table.addNew();
+        table.set(u"SEQ"_s, i);
+        table.update();
+    }
+    EXPECT_LT(walk(), 3000);
+}
+
+}  // namespace kest::test

@@ -1,0 +1,149 @@
+#include "support/MariaDbServer.h"
+
+#include "app/QuoteDatabase.h"
+#include "platform/RuntimeError.h"
+#include "platform/database/Connection.h"
+#include "platform/database/Sql.h"
+
+#include <QDeadlineTimer>
+#include <QDir>
+#include <QFile>
+#include <QStandardPaths>
+#include <QThread>
+
+#include <arpa/inet.h>
+#include <netinet/in.h>
+#include <sys/prctl.h>
+#include <sys/socket.h>
+#include <unistd.h>
+
+#include <csignal>
+#include <stdexcept>
+
+namespace kest::test {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+constexpr int startMilliseconds = 30000;
+constexpr int stopMilliseconds = 10000;
+
+QString program(const QString& name)
+{
+    const QString found = QStandardPaths::findExecutable(name);
+    return found.isEmpty() ? QStandardPaths::findExecutable(name, {u"/usr/sbin"_s, u"/usr/local/sbin"_s}) : found;
+}
+
+QString thisUser()
+{
+    return geteuid() == 0 ? u"root"_s : qEnvironmentVariable("USER", QString::number(geteuid()));
+}
+
+int freePort()
+{
+    const int listener = socket(AF_INET, SOCK_STREAM, 0);
+    sockaddr_in address{};
+    address.sin_family = AF_INET;
+    address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
+    socklen_t length = sizeof address;
+    const bool bound = bind(listener, reinterpret_cast<sockaddr*>(&address), length) == 0 &&
+                       getsockname(listener, reinterpret_cast<sockaddr*>(&address), &length) == 0;
+    close(listener);
+    if (!bound)
+        throw std::runtime_error("no free port on the loopback interface");
+    return ntohs(address.sin_port);
+}
+
+QString textFor(const QString& driver, int port, const QString& database, const QString& user, const QString& password)
+{
+    return u"Driver={%1};Server=127.0.0.1;Port=%2;Database=%3;Uid=%4;Pwd=%5;"_s.arg(driver, QString::number(port),
+                                                                                    database, user, password);
+}
+
+}  // namespace
+
+MariaDbServer::MariaDbServer()
+{
+    prepareData();
+    start();
+}
+
+MariaDbServer::~MariaDbServer()
+{
+    server.terminate();
+    if (!server.waitForFinished(stopMilliseconds))
+        kill();
+}
+
+void MariaDbServer::prepareData()
+{
+    QProcess install;
+    install.setProcessChannelMode(QProcess::MergedChannels);
+    install.start(program(u"mariadb-install-db"_s),
+                  {u"--no-defaults"_s, u"--user="_s + thisUser(), u"--datadir="_s + folder.filePath(u"data"_s),
+                   u"--auth-root-authentication-method=normal"_s, u"--skip-test-db"_s, u"--skip-name-resolve"_s});
+    if (!install.waitForFinished(startMilliseconds) || install.exitCode() != 0)
+        throw std::runtime_error("mariadb-install-db: " + install.readAll().toStdString());
+}
+
+void MariaDbServer::start()
+{
+    tcpPort = freePort();
+    server.setProcessChannelMode(QProcess::MergedChannels);
+    server.setChildProcessModifier([] { prctl(PR_SET_PDEATHSIG, SIGKILL); });
+    server.start(program(u"mariadbd"_s),
+                 {u"--no-defaults"_s, u"--user="_s + thisUser(), u"--datadir="_s + folder.filePath(u"data"_s),
+                  u"--bind-address=127.0.0.1"_s, u"--port="_s + QString::number(tcpPort),
+                  u"--socket="_s + folder.filePath(u"s.sock"_s), u"--pid-file="_s + folder.filePath(u"pid"_s),
+                  u"--skip-name-resolve"_s, u"--innodb-buffer-pool-size=16M"_s, u"--innodb-flush-log-at-trx-commit=0"_s,
+                  u"--performance-schema=OFF"_s});
+    const QDeadlineTimer deadline(startMilliseconds);
+    db::Connection connection;
+    while (!attempt([&] { connection.open(textFor(u"MySQL"_s, tcpPort, u"mysql"_s, u"root"_s, {})); })) {
+        if (deadline.hasExpired() || server.state() == QProcess::NotRunning)
+            throw std::runtime_error("mariadbd: " + server.readAll().toStdString());
+        QThread::msleep(20);
+        server.waitForReadyRead(1);
+    }
+    connection.execute(sql("GRANT ALL ON *.* TO '{}'@'127.0.0.1' IDENTIFIED BY '{}'", user(), password()));
+}
+
+void MariaDbServer::createDatabase(const QString& name, const QString& script)
+{
+    db::Connection connection;
+    connection.open(connectionText(u"mysql"_s));
+    connection.execute(u"DROP DATABASE IF EXISTS "_s + name);
+    connection.execute(u"CREATE DATABASE "_s + name + u" CHARACTER SET utf8mb4 COLLATE utf8mb4_general_ci"_s);
+    connection.open(connectionText(name));
+    for (const QString& statement : app::statementsIn(script))
+        connection.execute(statement);
+}
+
+QString MariaDbServer::connectionText(const QString& database, const QString& driver) const
+{
+    return textFor(driver, tcpPort, database, user(), password());
+}
+
+void MariaDbServer::kill()
+{
+    server.kill();
+    server.waitForFinished(stopMilliseconds);
+}
+
+void MariaDbServer::registerOdbcDriver(const QTemporaryDir& folder, const QString& name)
+{
+    QString library;
+    for (const QString& place : {u"x86_64-linux-gnu/odbc"_s, u"aarch64-linux-gnu/odbc"_s, u"odbc"_s}) {
+        const QString candidate = u"/usr/lib/%1/libmaodbc.so"_s.arg(place);
+        if (QFile::exists(candidate))
+            library = candidate;
+    }
+    QFile list(folder.filePath(u"odbcinst.ini"_s));
+    if (!list.open(QIODevice::WriteOnly))
+        throw std::runtime_error("odbcinst.ini can't be written");
+    list.write(u"[%1]\nDriver=%2\n"_s.arg(name, library).toUtf8());
+    qputenv("ODBCSYSINI", QFile::encodeName(folder.path()));
+}
+
+}  // namespace kest::test
