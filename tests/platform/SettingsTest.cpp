@@ -1,0 +1,166 @@
+// The registry: names, types, any text, two writers at once, a profile that is not there.
+#include "platform/profile.h"
+#include "platform/settings/registry.h"
+#include "support/TestProfile.h"
+
+#include <QDir>
+#include <QElapsedTimer>
+#include <QFile>
+
+#include <gtest/gtest.h>
+#include <sys/stat.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+using namespace Qt::StringLiterals;
+using namespace kest;
+using namespace kest::settings;
+
+namespace {
+
+const QString key = u"SOFTWARE\\wirra32\\frmsplash"_s;
+
+class Registry : public ::testing::Test {
+protected:
+    static QString text(const QString& name)
+    {
+        return query(Hive::LocalMachine, key, name).value_or(Value{Type::Binary, u"(none)"_s}).data;
+    }
+    QString file() const { return profile.root() + u"/registry.ini"_s; }
+
+    test::TestProfile profile;
+};
+
+}  // namespace
+
+TEST_F(Registry, AValueNeedsItsKey)
+{
+    EXPECT_FALSE(setValue(Hive::LocalMachine, key, u"EcomHome"_s, {Type::Text, u"c:\\wirdoc\\"_s}));
+    EXPECT_FALSE(QFile::exists(file()));
+    EXPECT_TRUE(createKey(Hive::LocalMachine, key));
+    EXPECT_TRUE(keyExists(Hive::LocalMachine, u"software\\WIRRA32"_s)) << "the keys above it are made too";
+    EXPECT_FALSE(keyExists(Hive::CurrentUser, key));
+    EXPECT_TRUE(setValue(Hive::LocalMachine, key, u"EcomHome"_s, {Type::Text, u"c:\\wirdoc\\"_s}));
+    EXPECT_FALSE(query(Hive::LocalMachine, key, u"other"_s));
+}
+
+TEST_F(Registry, NamesAreFoundInAnyCaseAndKeepTheirSpelling)
+{
+    createKey(Hive::LocalMachine, key);
+    setValue(Hive::LocalMachine, key.toUpper() + u'\\', u"EcomHome"_s, {Type::Text, u"1"_s});
+    setValue(Hive::LocalMachine, key, u"ECOMHOME"_s, {Type::Number, u"2"_s});
+    const QList<Entry> all = entries();
+    ASSERT_EQ(all.size(), 1);
+    EXPECT_EQ(all[0].key, key);
+    EXPECT_EQ(all[0].name, u"EcomHome"_s);
+    EXPECT_EQ(all[0].value, (Value{Type::Number, u"2"_s}));
+    EXPECT_EQ(query(Hive::LocalMachine, u"\\Software\\\\Wirra32\\FRMSPLASH"_s, u"ecomhome"_s), all[0].value);
+}
+
+TEST_F(Registry, AnyTextSurvives)
+{
+    const QString texts[] = {
+        u""_s,
+        u" blanks "_s,
+        u"a=b:c"_s,
+        u"[x]"_s,
+        u";x"_s,
+        u"@"_s,
+        u"50%25 %"_s,
+        u"a\r\nb\tc\n"_s,
+        u"\u00e9\u20ac\U0001F697"_s,
+        u"c:\\x\\"_s,
+        u"x"_s + QChar(0) + u"y"_s,
+        u"\u0085"_s,
+        u"\""_s,
+    };
+    for (const QString& text : texts) {
+        const QString place = u"SOFTWARE\\"_s + QString(text).replace(u'\\', u'/') + u"k"_s;
+        ASSERT_TRUE(createKey(Hive::ClassesRoot, place));
+        EXPECT_TRUE(setValue(Hive::ClassesRoot, place, text, {Type::Text, text}));
+        EXPECT_EQ(query(Hive::ClassesRoot, place, text), (Value{Type::Text, text})) << text.toStdString();
+        setUserSetting(u"an app"_s, u"a section"_s, text + u"1"_s, text);
+    }
+    for (const QString& text : texts)
+        EXPECT_EQ(userSetting(u"AN APP"_s, u"A Section"_s, text + u"1"_s, u"fallback"_s), text) << text.toStdString();
+    EXPECT_EQ(userSetting(u"an app"_s, u"other"_s, u"x"_s, u"fallback"_s), u"fallback"_s);
+}
+
+TEST_F(Registry, AKeyGoesOnlyWithoutSubkeys)
+{
+    createKey(Hive::CurrentUser, u"a\\b"_s);
+    createKey(Hive::CurrentUser, u"ab"_s);
+    EXPECT_FALSE(removeKey(Hive::CurrentUser, u"a"_s));
+    EXPECT_TRUE(removeKey(Hive::CurrentUser, u"A\\B\\"_s));
+    EXPECT_FALSE(removeKey(Hive::CurrentUser, u"a\\b"_s));
+    EXPECT_TRUE(removeKey(Hive::CurrentUser, u"a"_s));
+    EXPECT_TRUE(keyExists(Hive::CurrentUser, u"ab"_s));
+}
+
+TEST_F(Registry, TwoProcessesWriteAtOnce)
+{
+    constexpr int each = 40;
+    createKey(Hive::LocalMachine, key);
+    const auto writeAll = [](const QString& who) {
+        bool all = true;
+        for (int i = 0; i < each; ++i)
+            all = setValue(Hive::LocalMachine, key, who + QString::number(i), {Type::Text, who}) && all;
+        return all;
+    };
+    const pid_t child = ::fork();
+    ASSERT_GE(child, 0);
+    if (child == 0)
+        ::_exit(writeAll(u"child"_s) ? 0 : 1);
+    EXPECT_TRUE(writeAll(u"parent"_s));
+    int status = -1;
+    ASSERT_EQ(::waitpid(child, &status, 0), child);
+    EXPECT_EQ(status, 0);
+    for (int i = 0; i < each; ++i) {
+        EXPECT_EQ(text(u"child"_s + QString::number(i)), u"child"_s);
+        EXPECT_EQ(text(u"parent"_s + QString::number(i)), u"parent"_s);
+    }
+}
+
+TEST_F(Registry, AFileWrittenByHandIsRead)
+{
+    QFile byHand(file());
+    ASSERT_TRUE(byHand.open(QFile::WriteOnly));
+    byHand.write(
+        "; a remark\r\nstray=text:x\r\n[HKEY_LOCAL_MACHINE\\SOFTWARE\\wirra32\\frmsplash]\r\n EcomHome "
+        "=text:d:\\doc\\\r\n"
+        "nonsense\r\nTabletUseMaster=number:1\r\n@=text:the default\r\n=\r\nx=unknown:1\r\n");
+    byHand.close();
+    EXPECT_EQ(text(u"EcomHome"_s), u"d:\\doc\\"_s);
+    EXPECT_EQ(query(Hive::LocalMachine, key, u"TabletUseMaster"_s), (Value{Type::Number, u"1"_s}));
+    EXPECT_EQ(text({}), u"the default"_s);
+    EXPECT_EQ(entries().size(), 3);
+}
+
+TEST_F(Registry, WhatCannotBeReadIsEmptyAndIsNotOverwritten)
+{
+    createKey(Hive::LocalMachine, key);
+    setValue(Hive::LocalMachine, key, u"a"_s, {Type::Text, u"1"_s});
+    ::chmod(QFile::encodeName(file()).constData(), 0444);
+    EXPECT_EQ(text(u"a"_s), u"1"_s);
+    EXPECT_FALSE(setValue(Hive::LocalMachine, key, u"a"_s, {Type::Text, u"2"_s}));
+    EXPECT_EQ(text(u"a"_s), u"1"_s);
+
+    profile::setRoot(profile.root() + u"/missing"_s);
+    EXPECT_EQ(text(u"a"_s), u"(none)"_s);
+    EXPECT_EQ(entries().size(), 0);
+    EXPECT_FALSE(createKey(Hive::LocalMachine, key));
+    EXPECT_FALSE(setUserSetting(u"a"_s, u"b"_s, u"c"_s, u"d"_s));
+    EXPECT_FALSE(QDir(profile::root()).exists());
+}
+
+TEST_F(Registry, AReadCostsLittle)
+{
+    createKey(Hive::LocalMachine, key);
+    for (int i = 0; i < 50; ++i)
+        setValue(Hive::LocalMachine, key, u"name"_s + QString::number(i), {Type::Text, QString(100, u'x')});
+    QElapsedTimer time;
+    time.start();
+    for (int i = 0; i < 2000; ++i)
+        text(u"name49"_s);
+    EXPECT_LT(time.elapsed(), 1000) << "for 2000 reads";
+}
