@@ -18,7 +18,8 @@ namespace {
 quint32 codeOf(const QString& text)
 {
     Document document;
-    EXPECT_EQ(document.loadXML(text), document.parseError().errorCode == 0) << text.left(80).toStdString();
+    const bool loaded = document.loadXML(text);
+    EXPECT_EQ(loaded, document.parseError().errorCode == 0) << text.left(80).toStdString();
     EXPECT_EQ(document.documentElement().isNull(), document.parseError().errorCode != 0);
     return document.parseError().errorCode;
 }

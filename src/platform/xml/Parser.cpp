@@ -92,7 +92,8 @@ void fail(Progress& progress, xmlParserCtxtPtr parser, quint32 code, const QStri
 void takeError(void* userData, xmlErrorPtr error)
 {
     const auto parser = static_cast<xmlParserCtxtPtr>(userData);
-    const bool counts = error->level >= XML_ERR_ERROR || error->code == XML_NS_ERR_UNDEFINED_NAMESPACE;
+    const bool isNameOnly = error->code == XML_WAR_NS_URI || error->code == XML_WAR_NS_URI_RELATIVE;  // any text is one
+    const bool counts = (error->level >= XML_ERR_ERROR || error->code == XML_NS_ERR_UNDEFINED_NAMESPACE) && !isNameOnly;
     if (!counts || !parser->_private)
         return;
     Progress& progress = progressOf(parser);
