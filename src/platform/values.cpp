@@ -1,6 +1,7 @@
 #include "platform/values.h"
 
 #include "platform/RuntimeError.h"
+#include "platform/TextReader.h"
 
 #include <QByteArray>
 #include <QVarLengthArray>
@@ -16,77 +17,6 @@ using namespace Qt::StringLiterals;
 namespace kest {
 
 namespace {
-
-bool isBlank(QChar c)
-{
-    return c == u' ' || c == u'\t' || c == u'\r' || c == u'\n';
-}
-
-QStringView withoutBlanks(QStringView text)
-{
-    while (!text.isEmpty() && isBlank(text.front()))
-        text = text.sliced(1);
-    while (!text.isEmpty() && isBlank(text.back()))
-        text.chop(1);
-    return text;
-}
-
-bool isDigit(QChar c)
-{
-    return c >= u'0' && c <= u'9';
-}
-
-/// Reads a text from left to right; a step that does not fit changes nothing.
-class Reader {
-public:
-    explicit Reader(QStringView source) : text(source) {}
-
-    bool atEnd() const { return position == text.size(); }
-
-    bool take(char16_t c)
-    {
-        if (atEnd() || text[position] != QChar(c))
-            return false;
-        ++position;
-        return true;
-    }
-
-    bool takeAnyOf(QStringView choice)
-    {
-        if (atEnd() || !choice.contains(text[position]))
-            return false;
-        ++position;
-        return true;
-    }
-
-    void skipBlanks()
-    {
-        while (!atEnd() && isBlank(text[position]))
-            ++position;
-    }
-
-    /// The digits from here on, at most so many.
-    QStringView digits(qsizetype most = std::numeric_limits<qsizetype>::max())
-    {
-        const qsizetype start = position;
-        while (!atEnd() && position - start < most && isDigit(text[position]))
-            ++position;
-        return text.sliced(start, position - start);
-    }
-
-    /// A whole number of `least` to `most` digits, or none.
-    std::optional<int> number(int least, int most)
-    {
-        const QStringView found = digits(most);
-        if (found.size() < least)
-            return {};
-        return found.toInt();
-    }
-
-private:
-    QStringView text;
-    qsizetype position = 0;
-};
 
 enum class Reading { Number, TooLarge, NoNumber };
 
@@ -125,7 +55,7 @@ void append(QVarLengthArray<char, 64>& plain, QStringView digits)
 
 Reading readNumber(QStringView text, double& result)
 {
-    Reader reader(withoutBlanks(text));
+    TextReader reader(withoutBlanks(text));
     QVarLengthArray<char, 64> plain;
     if (reader.take(u'-'))
         plain.append('-');
@@ -161,107 +91,6 @@ Reading readNumber(QStringView text, double& result)
         append(plain, exponent);
     }
     return reader.atEnd() ? fromPlainDigits(plain, result) : Reading::NoNumber;
-}
-
-/// The rest of a text behind its date: a 24-hour clock with a fraction and a zone mark.
-std::optional<QTime> readIsoTime(Reader& reader)
-{
-    const auto hour = reader.number(2, 2);
-    if (!hour || !reader.take(u':'))
-        return {};
-    const auto minute = reader.number(2, 2);
-    if (!minute)
-        return {};
-    int second = 0;
-    int millisecond = 0;
-    if (reader.take(u':')) {
-        const auto seconds = reader.number(2, 2);
-        if (!seconds)
-            return {};
-        second = *seconds;
-        if (reader.take(u'.')) {
-            const QStringView fraction = reader.digits();
-            if (fraction.isEmpty())
-                return {};
-            millisecond = (fraction.toString() + u"00"_s).left(3).toInt();
-        }
-    }
-    if (!reader.takeAnyOf(u"Zz") && reader.takeAnyOf(u"+-")) {
-        if (!reader.number(2, 2))
-            return {};
-        const bool colon = reader.take(u':');
-        const qsizetype digits = reader.digits(2).size();
-        if (digits == 1 || (colon && digits == 0))
-            return {};
-    }
-    const QTime time(*hour, *minute, second, millisecond);
-    return reader.atEnd() && time.isValid() ? std::optional(time) : std::nullopt;
-}
-
-/// The rest of a text behind its date: a clock of 24 hours, or of 12 with its marker.
-std::optional<QTime> readClock(Reader& reader)
-{
-    auto hour = reader.number(1, 2);
-    if (!hour || !reader.take(u':'))
-        return {};
-    const auto minute = reader.number(2, 2);
-    if (!minute)
-        return {};
-    const auto second = reader.take(u':') ? reader.number(2, 2) : std::optional(0);
-    if (!second)
-        return {};
-    reader.skipBlanks();
-    if (!reader.atEnd()) {
-        const bool afternoon = reader.takeAnyOf(u"pP");
-        if ((!afternoon && !reader.takeAnyOf(u"aA")) || !reader.takeAnyOf(u"mM") || *hour < 1 || *hour > 12)
-            return {};
-        *hour = *hour % 12 + (afternoon ? 12 : 0);
-    }
-    const QTime time(*hour, *minute, *second);
-    return reader.atEnd() && time.isValid() ? std::optional(time) : std::nullopt;
-}
-
-std::optional<QDateTime> joined(const QDate& date, const std::optional<QTime>& time)
-{
-    if (!date.isValid() || !time)
-        return {};
-    return QDateTime(date, *time);
-}
-
-std::optional<QDateTime> readDate(QStringView text)
-{
-    const QStringView trimmed = withoutBlanks(text);
-    Reader reader(trimmed);
-    if (trimmed.size() > 4 && trimmed[4] == u'-') {
-        const auto year = reader.number(4, 4);
-        reader.take(u'-');
-        const auto month = reader.number(2, 2);
-        if (!year || !month || !reader.take(u'-'))
-            return {};
-        const auto day = reader.number(2, 2);
-        if (!day)
-            return {};
-        const QDate date(*year, *month, *day);
-        if (reader.atEnd())
-            return joined(date, QTime(0, 0));
-        return reader.takeAnyOf(u"T ") ? joined(date, readIsoTime(reader)) : std::nullopt;
-    }
-    const auto day = reader.number(1, 2);
-    if (!day || !reader.take(u'/'))
-        return {};
-    const auto month = reader.number(1, 2);
-    if (!month || !reader.take(u'/'))
-        return {};
-    const auto year = reader.number(4, 4);
-    if (!year)
-        return {};
-    const QDate date(*year, *month, *day);
-    if (reader.atEnd())
-        return joined(date, QTime(0, 0));
-    if (!reader.take(u' '))
-        return {};
-    reader.skipBlanks();
-    return joined(date, readClock(reader));
 }
 
 [[noreturn]] void failAsNull()
@@ -397,11 +226,6 @@ std::optional<double> numberIn(const QString& text)
     return result;
 }
 
-std::optional<QDateTime> dateIn(const QString& text)
-{
-    return readDate(text);
-}
-
 bool isNumeric(const QVariant& value)
 {
     if (value.isNull())
@@ -517,13 +341,6 @@ QString numberText(double value)
     if (digits.size() <= exponent + 1)
         return sign + digits.leftJustified(exponent + 1, u'0');
     return sign + digits.first(exponent + 1) + u'.' + digits.sliced(exponent + 1);
-}
-
-QString shortDate(const QDate& date)
-{
-    if (!date.isValid())
-        return {};
-    return QString::asprintf("%02d/%02d/%04d", date.day(), date.month(), date.year());
 }
 
 }  // namespace kest
