@@ -1,0 +1,114 @@
+// Messages from outside with each element missing, doubled or holding what nobody expects.
+#include "messages/Envelope.h"
+#include "platform/files/files.h"
+#include "shell/SharedVariables.h"
+#include "support/FaultRun.h"
+#include "support/Snapshot.h"
+
+#include <QRegularExpression>
+
+namespace kest::test {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+const QString leaves = u"//*[not(*)]"_s;
+
+/// The message, and every one that differs from it in a single element.
+QStringList variantsOf(QString text)
+{
+    const QString wrong[] = {
+        u""_s,
+        u"x'; DELETE FROM CAR; --"_s,
+        u"O'Hara\" <b> %_[a-z]"_s,
+        u"../../AUnsent/out"_s,
+        u"-1e400"_s,
+        u"99999999999"_s,
+        u"31/02/2008"_s,
+        QString(1'000'000, u'7'),
+    };
+    QStringList variants{text};
+    const auto changed = [&](qsizetype leaf, auto change) {
+        xml::Document message = ParsedMessage(text);
+        change(message, message.selectNodes(leaves)[leaf]);
+        variants += message.xml();
+    };
+    const qsizetype count = ParsedMessage(text).selectNodes(leaves).size();
+    for (qsizetype leaf = 0; leaf < count; ++leaf) {
+        changed(leaf, [](xml::Document&, xml::Node element) { element.parentNode().removeChild(element); });
+        changed(leaf, [](xml::Document& message, xml::Node element) {
+            xml::Node twin = message.createNode(element.nodeType(), element.nodeName(), element.namespaceURI());
+            twin.setText(u"2"_s);
+            element.parentNode().insertBefore(twin, element);
+        });
+        for (const QString& value : wrong)
+            changed(leaf, [&](xml::Document&, xml::Node element) { element.setText(value); });
+    }
+    return variants;
+}
+
+/// Without the mark of a car that a message has touched: the one thing that is written before a refusal.
+std::string withoutCarMark(const std::string& held)
+{
+    static const QRegularExpression mark(u"^(CAR REGO=.*) KEST=\\S+"_s, QRegularExpression::MultilineOption);
+    return QString::fromStdString(held).replace(mark, u"\\1"_s).toStdString();
+}
+
+QStringList linesAbout(const QRegularExpression& what, const std::string& held)
+{
+    return QString::fromStdString(held).split(u'\n').filter(what);
+}
+
+QString typeOf(const QString& message)
+{
+    return message.section(u"messageType>"_s, 1, 1);
+}
+
+class Hostile : public Shop, public ::testing::WithParamInterface<Message> {};
+
+TEST_P(Hostile, AMessageChangesItsOwnQuoteOrNothing)
+{
+    const char* const bystander = "BYSTANDER";
+    car(bystander).customer(bystander);
+    quote(bystander).rego(bystander).request(bystander).quoteNumber(bystander).line(1);
+    files::write(gsUnsentPath + u"BYSTANDER.xml"_s, u"BYSTANDER"_s);
+    quote("500").request("QR1").quoteNumber("KQ1").stage(3).note("Responded Quote Request").line(1);
+    const QString ownType = typeOf(GetParam().text());
+    const Snapshot before;
+    int takenCount = 0;
+    int refusedCount = 0;
+    for (const QString& message : variantsOf(GetParam().text())) {
+        arrive("m.xml", message);
+        const std::string held = holdings();
+        const bool taken = loadAsTheWindow(u"m.xml"_s);
+        const bool wasTold = !shown().empty();
+        const std::string now = holdings();
+        const std::string told = message.left(3000).toStdString();
+        if (!taken) {
+            EXPECT_EQ(difference(withoutCarMark(held), withoutCarMark(now)), "\n") << told;
+            EXPECT_TRUE(wasTold || typeOf(message) != ownType) << told;  // an unknown type is passed over in silence
+        }
+        EXPECT_EQ(linesAbout(QRegularExpression(u"BYSTANDER"_s), held),
+                  linesAbout(QRegularExpression(u"BYSTANDER"_s), now))
+            << told;
+        const QStringList files = linesAbout(QRegularExpression(u"^/"_s), now);
+        const QStringList inPlace = linesAbout(QRegularExpression(u"^/wir(doc/A|img/)"_s), now);
+        EXPECT_EQ(files, inPlace) << told;
+        if (now != held)
+            before.restore();
+        (taken ? takenCount : refusedCount)++;
+    }
+    EXPECT_GT(takenCount, 0);
+    EXPECT_GT(refusedCount, 0);
+}
+
+INSTANTIATE_TEST_SUITE_P(Messages, Hostile,
+                         ::testing::Values(quoteRequest("QR2").images({"1"}), quoteMatch("500"), excessWaiver("500"),
+                                           quoteDeletion("KQ1"), revisionRequest("QR1"), cancellation("QR1"),
+                                           cancellationBackout("QR1"), adjustedQuote("500"), assessmentResult("KQ1"),
+                                           assessmentBackout("QR1")));
+
+}  // namespace
+
+}  // namespace kest::test
