@@ -296,7 +296,10 @@ private:
     {
         const Index before = previous(in);
         const TableColumn* column = columnEndingAt(isAt(before, u"NOT") ? previous(before) : before);
-        for (Index i = next(next(in)); column && i != none && !isAt(i, u")"); i = next(i)) {
+        const Index start = next(next(in));
+        if (isAt(start, u"SELECT"))
+            return;  // the literals of an inner query meet its own columns
+        for (Index i = start; column && i != none && !isAt(i, u")"); i = next(i)) {
             if (at(i).part == Part::Literal)
                 writeLiteral(at(i), column, u"="_s, false);
         }
