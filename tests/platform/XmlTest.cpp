@@ -146,7 +146,7 @@ TEST(XmlLimits, HostileSizesFailQuickly)
     EXPECT_NE(codeOf(manyAttributes + u"/>"_s), 0U);
     EXPECT_NE(codeOf(u"<a>"_s.repeated(Document::maximumDepth + 1) + u"</a>"_s.repeated(Document::maximumDepth + 1)),
               0U);
-    EXPECT_LT(time.elapsed(), 3000);
+    EXPECT_LT(time.elapsed(), 10000);
 
     EXPECT_EQ(codeOf(u"<a>"_s.repeated(Document::maximumDepth) + u"</a>"_s.repeated(Document::maximumDepth)), 0U);
     EXPECT_EQ(codeOf(u"<a t='"_s + u"x=1 "_s.repeated(10000) + u"'><!-- <b "_s + u"= "_s.repeated(9000) + u"--></a>"_s),
@@ -156,7 +156,7 @@ TEST(XmlLimits, HostileSizesFailQuickly)
     time.restart();
     const Document document = parsed(u"<a><pdf>"_s + large + u"</pdf></a>"_s);
     EXPECT_EQ(document.textOf(u"pdf"_s).size(), large.size());
-    EXPECT_LT(time.elapsed(), 15000);
+    EXPECT_LT(time.elapsed(), 30000);
 }
 
 TEST(XmlNodes, BlankTextIsNoNodeAndOtherTextIsNotTrimmed)
