@@ -137,8 +137,12 @@ void frmViewPDF::zoom(double factor)
         const double dots = AcroPDF1->viewport()->width() - margins.left() - margins.right();
         now = dots / (pageWidth * screen()->logicalDotsPerInch() / pointsPerInch);
     }
+    const double next = qBound(smallestZoom, now * factor, largestZoom);
+    QScrollBar* const bar = AcroPDF1->verticalScrollBar();
+    const double middle = bar->value() + bar->pageStep() / 2.0;
     AcroPDF1->setZoomMode(QPdfView::ZoomMode::Custom);
-    AcroPDF1->setZoomFactor(qBound(smallestZoom, now * factor, largestZoom));
+    AcroPDF1->setZoomFactor(next);
+    bar->setValue(qRound(middle * next / now - bar->pageStep() / 2.0));  // what stood in the middle stays there
 }
 
 void frmViewPDF::print()

@@ -80,6 +80,7 @@ QWidget* frmUtilities::quoteInformation()
 {
     auto* frame = new QGroupBox(u"Quote Information"_s);
     auto* grid = new QGridLayout(frame);
+    grid->setHorizontalSpacing(desktop::pixels(150));
     int place = 0;
     for (const Field& field : fields) {
         auto* text = new QLineEdit;

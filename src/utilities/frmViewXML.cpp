@@ -16,7 +16,6 @@
 #include <QLineEdit>
 #include <QPushButton>
 #include <QRegularExpression>
-#include <QScrollBar>
 #include <QShortcut>
 #include <QTextBlock>
 
@@ -55,6 +54,10 @@ frmViewXML::frmViewXML(const QString& file)
     txtFind->setClearButtonEnabled(true);
     auto* previous = new QPushButton(u"Previous"_s);
     auto* next = new QPushButton(u"Next"_s);
+    txtFind->setObjectName("txtFind"_L1);
+    previous->setObjectName("cmdFindPrevious"_L1);
+    next->setObjectName("cmdFindNext"_L1);
+    lblPosition->setObjectName("lblPosition"_L1);
     auto* row = new QHBoxLayout(findBar);
     row->setContentsMargins({});
     row->addWidget(txtFind, 1);
@@ -86,12 +89,8 @@ frmViewXML::frmViewXML(const QString& file)
                      });
     desktop::onEvent(txtXML, &QPlainTextEdit::cursorPositionChanged, this, u"frmViewXML.txtXML_SelChange"_s,
                      [this] { showPosition(); });
-    const auto colour = [this](auto* sender, auto signal) {
-        desktop::onEvent(sender, signal, this, u"frmViewXML.txtXML_Paint"_s, [this] { colourVisibleTags(); });
-    };
-    colour(txtXML, &QPlainTextEdit::textChanged);
-    colour(txtXML->verticalScrollBar(), &QScrollBar::valueChanged);
-    colour(txtXML->verticalScrollBar(), &QScrollBar::rangeChanged);
+    desktop::onEvent(txtXML, &QPlainTextEdit::updateRequest, this, u"frmViewXML.txtXML_Paint"_s,
+                     [this] { colourVisibleTags(); });
 }
 
 void frmViewXML::ShowForm(const QString& file)
@@ -128,7 +127,6 @@ void frmViewXML::resizeEvent(QResizeEvent* event)
     place(Command1, formWidth - 870, formHeight - 1125, 870 - margin, buttonHeight);
     place(Command2, formWidth - 1830, formHeight - 1125, 855, buttonHeight);
     place(findBar, margin, formHeight - 1125, formWidth - 1830 - 2 * margin, buttonHeight);
-    colourVisibleTags();
 }
 
 void frmViewXML::closeEvent(QCloseEvent* event)
@@ -198,9 +196,14 @@ void frmViewXML::colourVisibleTags()
     QTextCharFormat colour;
     colour.setForeground(palette().color(QPalette::Link));
 
-    QList<QTextEdit::ExtraSelection> tags;
     QTextCursor cursor = txtXML->cursorForPosition({});
     const int last = txtXML->cursorForPosition(txtXML->viewport()->rect().bottomLeft()).blockNumber();
+    const std::array seen{cursor.blockNumber(), last, txtXML->document()->revision()};
+    if (seen == coloured)
+        return;
+    coloured = seen;
+
+    QList<QTextEdit::ExtraSelection> tags;
     for (QTextBlock line = cursor.block(); line.isValid() && line.blockNumber() <= last; line = line.next()) {
         for (auto matches = tag.globalMatch(line.text()); matches.hasNext();) {
             const QRegularExpressionMatch match = matches.next();

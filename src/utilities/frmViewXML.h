@@ -3,6 +3,8 @@
 
 #include "platform/desktop/Form.h"
 
+#include <array>
+
 class QLabel;
 class QLineEdit;
 class QPushButton;
@@ -33,7 +35,8 @@ private:
     void colourVisibleTags();
 
     QString sFile;
-    bool unchanged = true;  // since the text was loaded or saved
+    bool unchanged = true;          // since the text was loaded or saved
+    std::array<int, 3> coloured{};  // first line, last line, revision of the text
 
     ExactTextEdit* txtXML;
     QPushButton* Command1;
