@@ -17,6 +17,7 @@
 #include <QHeaderView>
 #include <QLabel>
 #include <QLineEdit>
+#include <QLocale>
 #include <QProgressBar>
 #include <QPushButton>
 #include <QRadioButton>
@@ -65,7 +66,7 @@ public:
     bool operator<(const QTreeWidgetItem& other) const override
     {
         static const QCollator collator = [] {
-            QCollator natural;
+            QCollator natural(QLocale(QLocale::English, QLocale::Australia));  // numbers need a language's rules
             natural.setNumericMode(true);
             return natural;
         }();

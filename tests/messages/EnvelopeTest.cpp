@@ -1,0 +1,99 @@
+#include "messages/Envelope.h"
+#include "support/Messages.h"
+
+#include <gtest/gtest.h>
+
+using namespace Qt::StringLiterals;
+
+namespace kest::test {
+namespace {
+
+const QString xsi = u"xmlns:xsi=\"http://www.w3.org/2001/XMLSchema-instance\" "_s;
+
+TEST(Envelope, ATypeCodeHasItsDisplayNameInAnyCase)
+{
+    const std::pair<const char*, const char*> cases[] = {
+        {"QREQ", "Quote Request"},
+        {"qreq", "Quote Request"},
+        {"QMQR", "Quote Matched to Quote Request"},
+        {"MANQ", "Manual Quote"},
+        {"QTDL", "Quote Deletion"},
+        {"RRQT", "Request for Revised Quote"},
+        {"QRCN", "Quote Request Cancellation"},
+        {"ADQT", "Adjusted Quote"},
+        {"AUQT", "Authorised Quote"},
+        {"ARES", "Assessment Result"},
+        {"BACA", "Backout Assessment"},
+        {"BCQR", "Backout Quote Request Cancellation"},
+        {"EWAP", "Excess Waived/Already Paid"},
+        {"QREQ ", "UNKNOWN - INVALID MESSAGE"},
+        {"", "UNKNOWN - INVALID MESSAGE"},
+    };
+    for (const auto& [code, name] : cases) {
+        QString text = Message(code, "getAnyResponse").text();
+        EXPECT_EQ(GetMessageTypeName(text), QString::fromLatin1(name)) << code;
+        EXPECT_TRUE(text.contains(xsi)) << "the caller's text comes back prepared";
+    }
+    QString broken = u"<a><messageType>QREQ</a>"_s;
+    EXPECT_EQ(GetMessageTypeName(broken), u"UNKNOWN - INVALID MESSAGE"_s);
+}
+
+TEST(Envelope, AMarkerHasItsDisplayName)
+{
+    const std::pair<QString, const char*> cases[] = {
+        {marker("500"), "Quote Send Error"},
+        {marker("500", "0", "OTHER"), "UNKNOWN - INVALID MESSAGE"},
+        {u"<m><mailtype>MDMSG</mailtype></m>"_s, "UNKNOWN - INVALID MESSAGE"},
+        {u"<m><mailtype>mdmsg</mailtype><action>DELDUPE</action></m>"_s, "CORRUPT!"},
+        {u"<m><action>DELDUPE</action></m>"_s, "CORRUPT!"},
+        {u"<m>"_s, "CORRUPT!"},
+    };
+    for (const auto& [text, name] : cases) {
+        QString prepared = text;
+        EXPECT_EQ(GetMarkerTypeName(prepared), QString::fromLatin1(name)) << text.toStdString();
+    }
+}
+
+TEST(Envelope, TheSchemaInstanceIsDeclaredOnceBeforeTheFirstDeclaration)
+{
+    const QString upper = xsi.toUpper();
+    const std::pair<QString, QString> cases[] = {
+        {u"<a/>"_s, u"<a/>"_s},
+        {u"<a XMLNS='u'/>"_s, u"<a XMLNS='u'/>"_s},
+        {u"<a xmlns='u'/>"_s, u"<a "_s + xsi + u"xmlns='u'/>"_s},
+        {u"<a><b xmlns='u'/><c xmlns='v'/></a>"_s, u"<a><b "_s + xsi + u"xmlns='u'/><c xmlns='v'/></a>"_s},
+        {u"<a "_s + xsi + u"xmlns='u'/>"_s, u"<a "_s + xsi + u"xmlns='u'/>"_s},
+        {u"<a xmlns='u' "_s + upper + u"/>"_s, u"<a xmlns='u' "_s + upper + u"/>"_s},
+    };
+    for (const auto& [text, prepared] : cases)
+        EXPECT_EQ(AddXsiDeclaration(text), prepared);
+}
+
+TEST(Envelope, AParseIsSparedOnlyWhereThePreparedTextHoldsTheSame)
+{
+    const QString ns = u"xmlns=\"u\""_s;
+    const std::pair<QString, bool> cases[] = {
+        {u"<a><b/></a>"_s, true},
+        {u"<a "_s + ns + u"/>"_s, true},
+        {u"<request><a/><b\n"_s + ns + u"/></request>"_s, true},
+        {u"<a "_s + xsi + ns + u"/>"_s, true},
+        {u"<a "_s + ns + u' ' + xsi.trimmed() + u"/>"_s, false},         // declared twice
+        {u"<a "_s + ns + u"><b xmlns:xsi = 'http://x'/></a>"_s, false},  // not known to be another element
+        {u"<a>the word xmlns<b/></a>"_s, false},                         // becomes part of the text
+        {u"<a b=' xmlns'/>"_s, false},                                   // in an attribute's value
+        {u"<a><![CDATA[<b "_s + ns + u"/>]]></a>"_s, false},             // in a literal section
+        {u"<a><!-- <b "_s + ns + u"/> --></a>"_s, false},
+    };
+    for (const auto& [text, same] : cases) {
+        EXPECT_EQ(IsSameWhenPrepared(text), same) << text.toStdString();
+        if (!same)
+            continue;
+        xml::Document bare;
+        ASSERT_TRUE(bare.loadXML(text)) << text.toStdString();
+        QString prepared = text;
+        EXPECT_EQ(ParsedMessage(prepared).documentElement().text(), bare.documentElement().text());
+    }
+}
+
+}  // namespace
+}  // namespace kest::test

@@ -1,0 +1,243 @@
+#include "messages/frmMessageList.h"
+#include "platform/files/files.h"
+#include "shell/SharedVariables.h"
+#include "shell/modLoggerEx.h"
+#include "support/Shop.h"
+
+#include <QJsonObject>
+#include <QPushButton>
+#include <QTreeWidget>
+
+using namespace Qt::StringLiterals;
+
+namespace kest::test {
+namespace {
+
+class MessageListWindow : public Shop {
+protected:
+    /// Opens the window, carries out the steps, and closes it.
+    void visit(const std::string& steps, const std::string& answers = "", const std::string& otherWindows = "")
+    {
+        const std::string windows = R"("windows": {"frmMessageList": [[)" + steps + "]]" + otherWindows + "}";
+        desktop.emplace(("{" + windows + (answers.empty() ? "" : ", ") + answers + "}").c_str());
+        frmMessageList::ShowForm();
+    }
+
+    /// What the numbered reading step saw of a control.
+    QJsonValue seen(int reading, const char* control, const char* what)
+    {
+        const QJsonObject values = desktop->record().reads.at(reading)[u"values"_s].toObject();
+        return values[QString::fromLatin1(control)][QString::fromLatin1(what)];
+    }
+
+    std::string text(int reading, const char* control)
+    {
+        return seen(reading, control, "text").toString().toStdString();
+    }
+
+    std::string listed(int reading = 0)
+    {
+        QStringList names;
+        for (const QJsonValue row : seen(reading, "ListView1", "rows").toArray())
+            names << row[0].toString();
+        return names.join(u' ').toStdString();
+    }
+};
+
+// Steps of a visit.
+const std::string readAll = R"({"read": ["ListView1", "cmdProcess", "cmdView", "Frame2", "txtFilter", "lblStatus"]})";
+
+std::string click(const std::string& control)
+{
+    return R"({"click": ")" + control + R"("})";
+}
+
+std::string type(const std::string& control, const std::string& text)
+{
+    return R"({"set": ")" + control + R"(", "text": ")" + text + R"("})";
+}
+
+std::string key(const std::string& control, const std::string& name)
+{
+    return R"({"key": ")" + control + R"(", "keys": ")" + name + R"("})";
+}
+
+std::string joined(std::initializer_list<std::string> steps)
+{
+    std::string all;
+    for (const std::string& step : steps)
+        all += (all.empty() ? "" : ", ") + step;
+    return all;
+}
+
+TEST_F(MessageListWindow, ALoadedMessageMakesRoomForTheNextOfItsRequest)
+{
+    quote("500").request("QR1").note("Active Quote Request");
+    arrive("a.xml", cancellation("QR1"));
+    arrive("b.xml", cancellation("QR1"));
+    visit(joined({readAll, click("cmdProcess"), readAll}));
+
+    EXPECT_EQ(listed(0), "a.xml");
+    EXPECT_EQ(listed(1), "b.xml");
+    EXPECT_EQ(text(1, "lblStatus"), "1 message");
+    EXPECT_EQ(desktop->boxes(), QStringList{u"none||Message Loaded|ok"_s});
+    EXPECT_EQ(filesIn(gsReadPath), QStringList{u"500.0_1.xml"_s});
+    EXPECT_EQ(quote("500").stage(), 9);
+}
+
+TEST_F(MessageListWindow, ARefusedMessageStaysAndTheListIsFilledTwiceMore)
+{
+    arrive("a.xml", cancellation("QR1"));
+    arrive("b.xml", "");
+    visit(joined({click("cmdProcess"), R"({"wait": 600})", readAll}));
+
+    EXPECT_EQ(listed(), "a.xml");
+    const QString unreadable = u"Message b.xml unreadable, Please contact MarlinDesk Support."_s;
+    const QStringList boxes = desktop->boxTexts();
+    EXPECT_EQ(boxes.count(unreadable), 3);
+    EXPECT_EQ(boxes.size(), 4);
+    EXPECT_NE(boxes.value(1), unreadable) << "the refusal comes before the list is filled again";
+}
+
+TEST_F(MessageListWindow, EachFolderHasItsControls)
+{
+    arrive("a.xml", quoteRequest("QR1"));
+    files::write(gsReadPath + u"b.xml"_s, quoteMatch("123").text());
+    visit(joined({readAll, click("Option1(1)"), readAll, click("Option1(2)"), readAll, click("cmdView"),
+                  click("Command6"), click("Option1(0)"), readAll}));
+
+    for (const int unread : {0, 3}) {
+        EXPECT_EQ(listed(unread), "a.xml");
+        EXPECT_TRUE(seen(unread, "cmdProcess", "visible").toBool());
+        EXPECT_FALSE(seen(unread, "Frame2", "visible").toBool());
+    }
+    EXPECT_EQ(listed(1), "b.xml");
+    EXPECT_FALSE(seen(1, "cmdProcess", "visible").toBool());
+    EXPECT_TRUE(seen(1, "Frame2", "visible").toBool());
+    EXPECT_EQ(listed(2), "");
+    EXPECT_EQ(text(2, "lblStatus"), "No sent messages");
+    EXPECT_TRUE(seen(2, "Frame2", "visible").toBool());
+    EXPECT_EQ(desktop->boxes(), QStringList()) << "View and Delete do nothing without a message";
+}
+
+TEST_F(MessageListWindow, TheFilterNarrowsTheReadMessages)
+{
+    for (int i = 0; i < 26; ++i)
+        files::write(gsReadPath + u"%1.0_1.xml"_s.arg(100 + i), quoteMatch("123").text());
+    visit(joined({click("Option1(1)"), readAll, type("txtFilter", "10"), click("Command1"), readAll,
+                  type("txtFilter", "125"), key("txtFilter", "Return"), readAll, type("txtFilter", ""),
+                  click("Command1"), readAll, click("Option1(2)"), readAll}),
+          R"("inputs": [{"text": "Quote Number", "answer": "124"}])");
+
+    EXPECT_EQ(listed(0), "124.0_1.xml");
+    EXPECT_EQ(text(0, "txtFilter"), "124") << "the answer to the prompt";
+    EXPECT_EQ(seen(1, "ListView1", "rows").toArray().size(), 11) << "100 to 109, and 110";
+    EXPECT_EQ(listed(2), "125.0_1.xml");
+    EXPECT_EQ(text(2, "lblStatus"), "1 message with \"125\" in their name");
+    EXPECT_EQ(seen(3, "ListView1", "rows").toArray().size(), 26);
+    EXPECT_EQ(desktop->prompts().size(), 1) << "an empty filter that was typed asks nothing";
+    EXPECT_EQ(text(4, "txtFilter"), "") << "another folder begins without a filter";
+}
+
+TEST_F(MessageListWindow, ATabletOnItsOwnDatabaseLoadsRequestsOnly)
+{
+    gbTabletLocal = true;
+    arrive("a.xml", quoteRequest("QR1"));
+    arrive("b.xml", cancellation("QR2"));
+    visit(joined({readAll, key("ListView1", "Down"), readAll, R"({"select": "ListView1", "item": 0})", readAll}));
+    EXPECT_TRUE(seen(0, "cmdProcess", "enabled").toBool());
+    EXPECT_FALSE(seen(1, "cmdProcess", "enabled").toBool());
+    EXPECT_TRUE(seen(2, "cmdProcess", "enabled").toBool());
+
+    frmMessageList window;
+    window.open();
+    EXPECT_FALSE(window.loadFile(u"b.xml"_s)) << "its button is disabled";
+    EXPECT_EQ(desktop->boxes(), QStringList());
+}
+
+TEST_F(MessageListWindow, AMessageIsRemovedOnlyAfterYes)
+{
+    arrive("a.xml", quoteRequest("QR1"));
+    arrive("b.xml", quoteRequest("QR2"));
+    const std::string steps = joined({key("ListView1", "Delete"), readAll});
+    visit(steps);
+    EXPECT_EQ(listed(), "a.xml b.xml");
+    EXPECT_EQ(desktop->boxes(), QStringList{u"critical||You are about to remove a.xml without loading into the "
+                                            "system. Are you SURE ?|no"_s});
+    visit(steps, R"("boxes": [{"text": "remove a.xml", "answer": "yes"}])");
+    EXPECT_EQ(listed(), "b.xml");
+    EXPECT_EQ(filesIn(gsUnreadPath), QStringList{u"b.xml"_s});
+}
+
+TEST_F(MessageListWindow, ADoubleClickShowsASentMessageAndNoOther)
+{
+    arrive("a.xml", quoteRequest("QR1"));
+    files::write(gsSentPath + u"s.xml"_s, sentDocument("500"));
+    const char* doubleClick = R"({"doubleClick": "ListView1"})";
+    visit(joined({doubleClick, click("Option1(2)")}));  // a viewer that opens now ends the run
+    visit(joined({click("Option1(2)"), doubleClick}), "", R"(, "frmViewXML": [[{"read": ["txtXML"]}]])");
+    EXPECT_TRUE(text(0, "txtXML").starts_with("<request>"));
+}
+
+TEST_F(MessageListWindow, TheLineUnderTheListNamesTheFileThatEndedTheFill)
+{
+    arrive("a.xml", quoteRequest("QR1"));
+    arrive("R_500_0.xml", submissionResponse("KQ1"));
+    visit(readAll);
+    EXPECT_EQ(listed(), "");
+    EXPECT_NE(text(0, "lblStatus").find("R_500_0.xml"), std::string::npos) << text(0, "lblStatus");
+    quote("500");
+    visit(readAll);
+    EXPECT_EQ(listed(), "a.xml");
+    EXPECT_EQ(quote("500").text("KESTQuoteNo"), "KQ1");
+    EXPECT_EQ(desktop->boxes(), QStringList());
+}
+
+TEST_F(MessageListWindow, TheFirstRowShownIsChosenWhateverTheOrder)
+{
+    gbTabletLocal = true;
+    arrive("a.xml", cancellation("QR2"));
+    arrive("b10.xml", quoteRequest("QR1"));
+    arrive("b9.xml", quoteRequest("QR3"));
+    visit(joined({key("frmMessageList", "F5"), readAll}));
+    EXPECT_EQ(listed(), "a.xml b10.xml b9.xml");
+
+    frmMessageList window;
+    auto* list = window.findChild<QTreeWidget*>();
+    list->sortByColumn(0, Qt::DescendingOrder);
+    window.open();
+    EXPECT_EQ(list->topLevelItem(0)->text(0), u"b10.xml"_s);
+    EXPECT_EQ(list->currentItem(), list->topLevelItem(0));
+    EXPECT_TRUE(window.findChild<QPushButton*>(u"cmdProcess"_s)->isEnabled()) << "as if it had been clicked";
+}
+
+TEST_F(MessageListWindow, TheWindowWorksWithoutBeingShown)
+{
+    frmMessageList window;
+    arrive("MDMSG1.xml", marker("500"));
+    arrive("b.xml", quoteRequest("QR1").images({"1"}));
+    window.open();
+    ASSERT_EQ(window.rows().size(), 1);
+    EXPECT_FALSE(window.loadFile(u"MDMSG1.xml"_s));
+    EXPECT_EQ(desktop->boxTexts(), QStringList{u"Quote 500 was sent twice."_s});
+    EXPECT_EQ(window.rows().size(), 0) << "the delayed refresh finds the marker gone";
+    EXPECT_EQ(filesIn(gsReadPath), QStringList{u"MDMSG000.xml"_s});
+    window.chooseFolder(Read);
+    EXPECT_EQ(window.rows().size(), 1);
+    window.updateFilter(u"none of them"_s);
+    EXPECT_EQ(window.rows().size(), 0);
+    EXPECT_EQ(window.failure(), QString());
+}
+
+TEST_F(MessageListWindow, AFileThatHasGoneIsLogged)
+{
+    frmMessageList window;
+    arrive("a.xml", quoteRequest("QR1"));
+    window.open();
+    files::remove(gsUnreadPath + u"a.xml"_s);
+    EXPECT_FALSE(window.loadFile(u"a.xml"_s));
+    EXPECT_TRUE(files::read(ErrorLogPath()).contains(u"frmMessageList.cmdProcess_Click"_s));
+}
+
+}  // namespace
+}  // namespace kest::test

@@ -1,0 +1,321 @@
+#include "messages/Envelope.h"
+#include "messages/Summary.h"
+#include "platform/RuntimeError.h"
+#include "platform/files/files.h"
+#include "shell/SharedVariables.h"
+#include "support/Shop.h"
+
+#include <QFile>
+
+using namespace Qt::StringLiterals;
+
+namespace kest::test {
+namespace {
+
+class MessageList : public Shop {
+protected:
+    /// The fill's rows, a line each: "file: type|rego|claim|customer|quote|vehicle".
+    std::string filled(int folder = Unread)
+    {
+        FillHooks hooks;
+        hooks.submissionResponse = [this](QString&, const QString& file) { responses << file; };
+        hooks.filterAsked = [this](const QString& filter) { filterShown = filter; };
+        QStringList lines;
+        for (const ListedMessage& message : BuildMessageList(folder, hooks))
+            lines << message.file + u": "_s + QStringList(message.row.begin(), message.row.end()).join(u'|');
+        return lines.join(u'\n').toStdString();
+    }
+
+    /// The row of one unread message.
+    std::string row(const Text& message, const Text& name = "in.xml")
+    {
+        arrive(name, message);
+        const std::string line = filled();
+        files::remove(gsUnreadPath + name);
+        return line.substr(std::min(line.size(), QString(name).toStdString().size() + 2));
+    }
+
+    static void lie(const QString& folder, const QString& name, const Text& content)
+    {
+        files::write(folder + name, content);
+    }
+
+    std::string listedFiles(int folder = Unread)
+    {
+        QStringList names;
+        for (const QString& line : QString::fromStdString(filled(folder)).split(u'\n', Qt::SkipEmptyParts))
+            names << line.section(u':', 0, 0);
+        return names.join(u' ').toStdString();
+    }
+
+    QStringList responses;
+    QString filterShown;
+};
+
+TEST_F(MessageList, ARequestShowsWhatItSays)
+{
+    const auto request = [] { return quoteRequest("QR1").without("corporateCustomer"); };
+    EXPECT_EQ(row(request()), "Quote Request|XYZ789|7700001|Mr Alex Tarrant|-|Corella Meridian sedan");
+    EXPECT_EQ(row(request().set("corporateCustomer", "Fleet Pty")),
+              "Quote Request|XYZ789|7700001|Fleet Pty|-|Corella Meridian sedan");
+    EXPECT_EQ(row(request().without("claimCustomer/title").rego(" tba ").claim("")),
+              "Quote Request|UNIVERSAL|| Alex Tarrant|-|Corella Meridian sedan");
+    EXPECT_EQ(row(Message("QREQ", "getQuoteRequestResponse")), "Quote Request|-||-|-|-");
+    EXPECT_EQ(row(Message("qreq", "getQuoteRequestResponse")), "ERROR|||||");
+    EXPECT_EQ(row(excessWaiver("500")), "ERROR|||||");
+    EXPECT_EQ(row(Message("", "getAnyResponse")), "ERROR|||||");
+}
+
+TEST_F(MessageList, AMatchedOrManualQuoteFindsItsCustomerByTheCar)
+{
+    car("ABC123");
+    EXPECT_EQ(row(quoteMatch("123/2")),
+              "Quote Matched to Quote Request|ABC123|7700001|Ms Kim Holloway|123/2|Corella Meridian sedan");
+    EXPECT_EQ(row(manualQuote("123/0")), "Manual Quote|ABC123|7700001|Ms Kim Holloway|123|Corella Meridian sedan");
+    EXPECT_EQ(row(manualQuote("123").rego("O'NEIL")), "Manual Quote|O'NEIL|7700001|-|123|Corella Meridian sedan");
+    customer("Holloway").set("SALUTATION", nullptr);
+    EXPECT_EQ(row(quoteMatch("123")), "Quote Matched to Quote Request|ABC123|7700001|-|123|Corella Meridian sedan")
+        << "a name with a part that is Null is Null";
+}
+
+TEST_F(MessageList, OtherMessagesShowTheirQuote)
+{
+    const std::string found = "|ABC123|7700001|Ms Kim Holloway|500|CORELLA MERIDIAN GL";
+    const std::string newest = "|ABC123|88|Ms Kim Holloway|500/1|CORELLA MERIDIAN GL";
+    const std::string none = "|-|-|-|-|-";
+    struct Case {
+        Message message;
+        std::string type;
+        bool takesTheNewest;
+    };
+    const Case cases[] = {
+        {quoteDeletion("KQ1"), "Quote Deletion", false},
+        {revisionRequest("QR1"), "Request for Revised Quote", true},
+        {cancellation("QR1"), "Quote Request Cancellation", false},
+        {adjustedQuote("500"), "Adjusted Quote", false},
+        {authorisedQuote("500"), "Authorised Quote", false},
+        {assessmentResult("KQ1"), "Assessment Result", false},
+        {assessmentBackout("QR1"), "Backout Assessment", true},
+        {cancellationBackout("QR1"), "Backout Quote Request Cancellation", false},
+    };
+    for (const Case& one : cases)
+        EXPECT_EQ(row(one.message), one.type + none);
+    quote("500").request("QR1").quoteNumber("KQ1");
+    for (const Case& one : cases)
+        EXPECT_EQ(row(one.message), one.type + found);
+    quote("500", 1).request("QR1").quoteNumber("KQ1").claim("88");
+    for (const Case& one : cases)
+        EXPECT_EQ(row(one.message), one.type + (one.takesTheNewest ? newest : none));
+}
+
+TEST_F(MessageList, AQuoteRowShowsWhatCanBeFound)
+{
+    quote("500").request("QR1").set("Claim", nullptr);
+    car("ABC123").set("MODEL_ID", "no'ne").set("CUST_ID", nullptr);
+    EXPECT_EQ(row(cancellation("QR1")), "Quote Request Cancellation|ABC123|-|-|500|-");
+    quote("500").rego("NOCAR");
+    EXPECT_EQ(row(cancellation("QR1")), "Quote Request Cancellation|-|-|-|-|-");
+    gConn.reset();
+    EXPECT_EQ(row(cancellation("QR1")), "Quote Request Cancellation|-|-|-|-|-");
+}
+
+TEST_F(MessageList, AMarkerShowsItsQuote)
+{
+    EXPECT_EQ(row(marker("500"), "MDMSG1.xml"), "Quote Send Error|ABC123|-|-|500|-");
+    quote("500", 2);
+    EXPECT_EQ(row(marker("500", "2", "X"), "MDMSG1.xml"),
+              "UNKNOWN - INVALID MESSAGE|ABC123|7700001|Ms Kim Holloway|500/2|CORELLA MERIDIAN GL");
+    EXPECT_EQ(row(u"<m><mailtype>MDMSG</mailtype></m>"_s, "aMDMSG.xml"), "UNKNOWN - INVALID MESSAGE|-|-|-|-|-");
+    for (const char* other : {"<m><mailtype>OTHER</mailtype></m>", "<m><a/><mailtype>MDMSG</mailtype></m>", "<m/>"})
+        EXPECT_EQ(row(other, "MDMSG1.xml"), "") << other;
+    EXPECT_EQ(row(quoteRequest("QR1"), "MDMSG1.xml"), "");
+}
+
+TEST_F(MessageList, ASentQuoteShowsItsDocument)
+{
+    lie(gsSentPath, u"a.xml"_s, sentDocument("500/2"));
+    EXPECT_EQ(filled(Sent), "a.xml: Sent Quote|ABC123||Ms Kim Holloway|500/2|CORELLA MERIDIAN GL");
+    quote("500", 2);
+    EXPECT_EQ(filled(Sent), "a.xml: Sent Quote|ABC123|7700001|Ms Kim Holloway|500/2|CORELLA MERIDIAN GL");
+    quote("500", 2).set("Claim", nullptr);
+    EXPECT_EQ(filled(Sent), "a.xml: Sent Quote|ABC123|-|Ms Kim Holloway|500/2|CORELLA MERIDIAN GL");
+
+    lie(gsSentPath, u"a.xml"_s,
+        "<quoteClaimCustomer><surname>S</surname><companyName>Fish & Co</companyName>"
+        "</quoteClaimCustomer><vehicleRegistration/>");
+    EXPECT_EQ(filled(Sent), "a.xml: Sent Quote|UNIVERSAL||Fish & Co||-");
+    lie(gsSentPath, u"a.xml"_s, "<aaaa/><b/>");  // with its wrapping just long enough
+    EXPECT_EQ(filled(Sent), "a.xml: Sent Quote|-||-||-");
+    EXPECT_EQ(shown(), "");
+    for (const char* unreadable : {"<aaa/><b/>", "", "<a></b>"}) {
+        lie(gsSentPath, u"a.xml"_s, unreadable);
+        EXPECT_EQ(filled(Sent), "");
+        EXPECT_EQ(shown(), "[critical] Message a.xml unreadable, Please contact MarlinDesk Support.") << unreadable;
+    }
+}
+
+TEST_F(MessageList, ARowIsThatOfThePreparedText)
+{
+    const QString text = quoteRequest("QR1").text();
+    const QString standard = u"http://www.w3.org/2001/XMLSchema-instance"_s;
+    for (const QString& declared : {
+             QString(text).replace(u" xmlns:p754"_s, u" xmlns:xsi=\"%1\" xmlns:p754"_s.arg(standard)),
+             QString(text).replace(u" xmlns:p754"_s, u" xmlns:xsi = \"%1\" xmlns:p754"_s.arg(standard)),
+             QString(text).replace(u"\"><messageType>"_s, u"\" xmlns:xsi=\"%1\"><messageType>"_s.arg(standard)),
+             QString(text).replace(u"XYZ789"_s, u"<p754:x xmlns:xsi='%1'>XYZ789</p754:x>"_s.arg(standard)),
+             QString(text).replace(u"<p754:get"_s, u"<!-- xmlns --><p754:get"_s),
+         }) {
+        QString prepared = declared;
+        const QString typeName = GetMessageTypeName(prepared);
+        const MessageRow expected = GetMessageRow(prepared, typeName);
+        EXPECT_EQ(row(declared), QStringList(expected.begin(), expected.end()).join(u'|').toStdString())
+            << declared.toStdString();
+    }
+    EXPECT_EQ(row(QString(text).replace(u" xmlns:p754"_s, u" xmlns:xsi = \"u\" xmlns:p754"_s)), "ERROR|||||")
+        << "declared in other words, the second declaration is one too many";
+}
+
+TEST_F(MessageList, TwoFaultsOfATextAreRepairedInAnyFile)
+{
+    for (const char* name : {"a.xml", "b.xml", "c.xml", "d.xml"})
+        arrive(name, QString(quoteRequest(name).claim("1&2").text()).replace(u"Corella"_s, u"Fish & Co"_s));
+    const std::string rows = filled();
+    EXPECT_EQ(std::count(rows.begin(), rows.end(), '\n'), 3);
+    EXPECT_NE(rows.find("d.xml: Quote Request|XYZ789|1&amp;2|"), std::string::npos)
+        << "an entity is escaped a second time: " << rows;
+    arrive("e.xml", "<a/><b>R & D</b>");
+    EXPECT_EQ(listedFiles(), "a.xml b.xml c.xml d.xml e.xml");
+    EXPECT_EQ(shown(), "");
+}
+
+TEST_F(MessageList, WhatCannotBeReadIsReportedAndTheRestIsListed)
+{
+    const std::string deep = QString(u"<a>"_s.repeated(100'000)).toStdString();
+    const std::pair<Text, Text> hostile[] = {
+        {"empty.xml", ""},
+        {"garbage.xml", std::string("\x7f\x45LF\x02\x01\x01\0\0\x1b", 10)},
+        {"doctype.xml", "<!DOCTYPE a [<!ENTITY b SYSTEM 'file:///etc/passwd'>]><a>&b;</a>"},
+        {"deep.xml", deep},
+        {"half.xml", "<a><b>"},
+    };
+    for (const auto& [name, content] : hostile)
+        arrive(name, content);
+    QFile huge(files::systemPath(gsUnreadPath) + u"/huge.xml"_s);
+    ASSERT_TRUE(huge.open(QIODevice::WriteOnly) && huge.resize(xml::Document::maximumBytes + 1));
+    arrive("last.xml", quoteRequest("QR1"));
+    lie(gsUnreadPath, u"Schrägstück \u20ac.xml"_s, quoteRequest("QR2"));
+    lie(gsUnreadPath, u"\u043f\u0438\u0441\u044c\u043c\u043e.xml"_s, quoteRequest("QR3"));
+
+    EXPECT_EQ(listedFiles(), "last.xml Schrägstück \u20ac.xml \u043f\u0438\u0441\u044c\u043c\u043e.xml");
+    std::string expected;
+    for (const char* name : {"deep", "doctype", "empty", "garbage", "half", "huge"})
+        expected += (expected.empty() ? "" : "\n") + std::string("[critical] Message ") + name +
+                    ".xml unreadable, Please contact MarlinDesk Support.";
+    EXPECT_EQ(shown(), expected);
+}
+
+TEST_F(MessageList, ARequestWaitsUnreadForAllItsPictures)
+{
+    arrive("in.xml", quoteRequest("QR1").images({"1", " ", "22"}));
+    EXPECT_EQ(listedFiles(), "");
+    arrive("QR1_001.jpg", "picture");
+    EXPECT_EQ(listedFiles(), "");
+    arrive("qr1_022.JPG", "picture");
+    EXPECT_EQ(listedFiles(), "in.xml");
+    arrive("in.xml", quoteRequest("QR1").images({"", " "}));
+    EXPECT_EQ(listedFiles(), "") << "a list of blanks names no picture";
+    arrive("in.xml", quoteRequest("../AUnread/QR1").images({"1"}));
+    EXPECT_EQ(listedFiles(), "") << "a name that leaves the folder is no picture";
+    EXPECT_EQ(shown(), "");
+
+    lie(gsReadPath, u"in.xml"_s, quoteRequest("QR1").images({"7"}));
+    EXPECT_EQ(listedFiles(Read), "in.xml");
+}
+
+TEST_F(MessageList, OneMessageOfARequestIsShownAtATime)
+{
+    arrive("b.xml", cancellation("QR1"));
+    arrive("C.xml", cancellationBackout("QR1"));
+    arrive("a.xml", quoteRequest("QR1"));
+    arrive("d.xml", quoteRequest("QR2"));
+    arrive("e.xml", quoteDeletion("KQ1"));
+    EXPECT_EQ(listedFiles(), "a.xml d.xml e.xml");
+    EXPECT_EQ(gdicQuoteRequests.value(u"QR1"_s), u"a.xml"_s);
+    files::remove(gsUnreadPath + u"a.xml"_s);
+    EXPECT_EQ(listedFiles(), "b.xml d.xml e.xml");
+
+    arrive("m.xml", manualQuote("500").request("QR1"));
+    EXPECT_EQ(listedFiles(), "d.xml e.xml m.xml") << "a manual quote takes the place of what was listed";
+    arrive("n.xml", cancellation("QR1"));
+    EXPECT_EQ(listedFiles(), "d.xml e.xml m.xml");
+
+    for (const QString& name : filesIn(gsUnreadPath))
+        files::move(gsUnreadPath + name, gsReadPath + name);
+    EXPECT_EQ(listedFiles(Read), "C.xml d.xml e.xml m.xml n.xml");
+}
+
+TEST_F(MessageList, ASubmissionResponseIsAppliedAtEachFillAndNeverListed)
+{
+    arrive("R_500_0.xml", submissionResponse("KQ1"));
+    lie(gsReadPath, u"R_501_0x.xml"_s, submissionResponse("KQ2"));
+    EXPECT_EQ(filled(), "");
+    EXPECT_EQ(filled(Read), "");
+    EXPECT_EQ(responses, (QStringList{u"R_500_0.xml"_s, u"R_501_0x.xml"_s}));
+}
+
+TEST_F(MessageList, AFailureOnTheWayEndsTheFillAndNamesItsFile)
+{
+    arrive("a.xml", quoteRequest("QR1"));
+    arrive("R_500_0.xml", submissionResponse("KQ1"));
+    FillHooks hooks;
+    hooks.submissionResponse = [](QString&, const QString&) { throw RuntimeError(NoCurrentRow, u"No such quote"_s); };
+    const auto failure = [&](int folder) {
+        try {
+            BuildMessageList(folder, hooks);
+        } catch (const RuntimeError& error) {
+            return error.description().toStdString();
+        }
+        return std::string();
+    };
+    EXPECT_EQ(failure(Unread), "R_500_0.xml: No such quote");
+    gsReadPath = u"c:\\gone\\"_s;
+    EXPECT_NE(failure(Read).find("c:\\gone\\"), std::string::npos);
+    EXPECT_EQ(shown(), "");
+}
+
+TEST_F(MessageList, MoreThanTwentyFiveFilesAskForAFilterOnce)
+{
+    desktop.emplace(R"({"inputs": [{"text": "Quote Number", "answer": "12"}]})");
+    for (int i = 0; i < 24; ++i)
+        lie(gsReadPath, u"%1.jpg"_s.arg(i), "");
+    lie(gsReadPath, u"12.0_1.xml"_s, quoteMatch("12"));
+    EXPECT_EQ(listedFiles(Read), "12.0_1.xml");
+    EXPECT_EQ(desktop->prompts(), QStringList());
+
+    lie(gsReadPath, u"13.0_1.xml"_s, quoteMatch("13"));
+    EXPECT_EQ(listedFiles(Read), "12.0_1.xml");
+    EXPECT_EQ(desktop->prompts(), QStringList{u"Enter a Quote Number to search by (Leave blank for all quotes)"_s});
+    EXPECT_EQ(filterShown, u"12"_s);
+
+    gsListFilter.clear();
+    EXPECT_EQ(listedFiles(Read), "12.0_1.xml 13.0_1.xml") << "it has been asked";
+    gsListFilter = u"13"_s;
+    gbFilterAsked = false;
+    EXPECT_EQ(listedFiles(Read), "13.0_1.xml") << "there is a filter";
+    EXPECT_EQ(desktop->prompts().size(), 1);
+    filled();
+    EXPECT_EQ(gsListFilter, QString()) << "the unread folder has none";
+}
+
+TEST_F(MessageList, OnlyFilesThatEndInXmlAreMessages)
+{
+    for (const char* name : {"a.XML", "b.xmlx", "c.txt", "dxml", "e\\f.xml", "g..xml"})
+        QFile(files::systemPath(gsUnreadPath) + u'/' + QString::fromLatin1(name)).open(QIODevice::WriteOnly);
+    filled();
+    EXPECT_EQ(shown(),
+              "[critical] Message dxml unreadable, Please contact MarlinDesk Support.\n"
+              "[critical] Message g..xml unreadable, Please contact MarlinDesk Support.");
+}
+
+}  // namespace
+}  // namespace kest::test
