@@ -1,0 +1,103 @@
+// The fill of the message list against its floor: each file read and parsed once.
+#include "messages/Envelope.h"
+#include "messages/Summary.h"
+#include "platform/files/files.h"
+#include "platform/profile.h"
+#include "shell/SharedVariables.h"
+
+#include <QCoreApplication>
+#include <QElapsedTimer>
+#include <QFile>
+#include <QTemporaryDir>
+
+#include <benchmark/benchmark.h>
+#include <libxml/parser.h>
+
+using namespace Qt::StringLiterals;
+
+namespace kest {
+namespace {
+
+/// A message of the size that requests and quotes have: some ten kilobytes, mostly lines of the quote.
+QString message(int number)
+{
+    constexpr const char* types[] = {"QREQ", "QREQ", "QREQ", "QMQR", "MANQ"};
+    QString lines;
+    for (int line = 0; line < 30; ++line)
+        lines +=
+            u"<p754:labour><p754:quoteLineNumber>%1</p754:quoteLineNumber><p754:labourType>RR</p754:labourType>"
+            "<p754:labourDescription>Remove and replace the front bumper bar, number %1</p754:labourDescription>"
+            "<p754:labourAmount>100.50</p754:labourAmount></p754:labour>"_s.arg(line);
+    return u"<p754:getQuoteResponse xmlns:p754=\"%1\"><messageType>%2</messageType>"
+           "<p754:quoteRequestNumber>QR%3</p754:quoteRequestNumber><p754:claimNumber>7700001</p754:claimNumber>"
+           "<p754:claimCustomer><p754:title>Mr</p754:title><p754:firstName>Alex</p754:firstName>"
+           "<p754:surname>Tarrant</p754:surname></p754:claimCustomer>"
+           "<p754:vehicleRegistration>XYZ789</p754:vehicleRegistration>"
+           "<p754:vehicleDescription>Corella Meridian sedan</p754:vehicleDescription>"
+           "<p754:quoteBody><p754:quoteReference>%3</p754:quoteReference><p754:labours>%4</p754:labours>"
+           "</p754:quoteBody></p754:getQuoteResponse>"_s
+               .arg(GetNamespaceURI(), QLatin1StringView(types[number % std::size(types)]))
+               .arg(number)
+               .arg(lines);
+}
+
+void readAndParseEach(const QString& folder, const QStringList& names)
+{
+    for (const QString& name : names) {
+        QFile file(folder + u'/' + name);
+        if (!file.open(QIODevice::ReadOnly))
+            qFatal("%s cannot be read", qPrintable(name));
+        const QByteArray bytes = file.readAll();
+        xmlDocPtr document =
+            xmlReadMemory(bytes.constData(), static_cast<int>(bytes.size()), nullptr, "windows-1252", XML_PARSE_NONET);
+        if (!document)
+            qFatal("%s does not parse", qPrintable(name));
+        xmlFreeDoc(document);
+    }
+}
+
+void fillList(benchmark::State& state)
+{
+    const QTemporaryDir folder;
+    profile::setRoot(folder.path());
+    gsUnreadPath = u"c:\\wirdoc\\AUnread\\"_s;
+    files::makeFolder(gsUnreadPath);
+    const QString place = files::systemPath(gsUnreadPath);
+    QStringList names;
+    for (int i = 0; i < state.range(0); ++i) {
+        names << u"%1.xml"_s.arg(i, 6, 10, QChar(u'0'));
+        files::write(gsUnreadPath + names.last(), message(i));
+    }
+
+    qint64 floor = 0;  // nanoseconds, of a pass right before each fill
+    qint64 filling = 0;
+    for (auto _ : state) {
+        QElapsedTimer timer;
+        timer.start();
+        readAndParseEach(place, names);
+        floor += timer.nsecsElapsed();
+        timer.restart();
+        const QList<ListedMessage> listed = BuildMessageList(Unread, {});
+        const qint64 elapsed = timer.nsecsElapsed();
+        filling += elapsed;
+        state.SetIterationTime(static_cast<double>(elapsed) / 1e9);
+        if (listed.size() != names.size())
+            state.SkipWithError("not every message was listed");
+    }
+    state.counters["ratio_to_floor"] = static_cast<double>(filling) / static_cast<double>(floor);
+    state.counters["us_per_file"] =
+        static_cast<double>(filling) / 1e3 / static_cast<double>(state.iterations() * state.range(0));
+    profile::setRoot({});
+}
+BENCHMARK(fillList)->Arg(100)->Arg(1000)->Arg(10000)->UseManualTime()->Unit(benchmark::kMillisecond);
+
+}  // namespace
+}  // namespace kest
+
+int main(int argc, char** argv)
+{
+    const QCoreApplication application(argc, argv);
+    benchmark::Initialize(&argc, argv);
+    benchmark::RunSpecifiedBenchmarks();
+    return 0;
+}
