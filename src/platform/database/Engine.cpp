@@ -415,9 +415,16 @@ QString Engine::sameDate(const QString& column, const QString& dateLiteral) cons
     return column + u'=' + dateLiteral;
 }
 
-QString Engine::sqlState(const QSqlError&)
+/// The drivers of the servers keep the state to themselves; it follows from the server's own code.
+QString Engine::sqlState(const QSqlError& error)
 {
-    return u"HY000"_s;
+    static const QHash<int, QString> states{
+        {1044, u"42000"_s}, {1045, u"28000"_s}, {1049, u"42000"_s}, {1054, u"42S22"_s}, {1062, u"23000"_s},
+        {1064, u"42000"_s}, {1146, u"42S02"_s}, {1205, u"40001"_s}, {1969, u"70100"_s}, {2002, u"08001"_s},
+        {2003, u"08001"_s}, {2005, u"08001"_s}, {2006, u"08S01"_s}, {2013, u"08S01"_s}, {102, u"42000"_s},
+        {207, u"42S22"_s},  {208, u"42S02"_s},  {2601, u"23000"_s}, {2627, u"23000"_s}, {4060, u"42000"_s},
+        {18456, u"28000"_s}};
+    return states.value(error.nativeErrorCode().section(u';', 0, 0).toInt(), u"HY000"_s);
 }
 
 std::unique_ptr<TableInfo> Engine::fromInformationSchema(const QString& name, const InformationSchemaTerms& terms)

@@ -2,8 +2,6 @@
 #include "platform/RuntimeError.h"
 #include "platform/database/Engine.h"
 
-#include <QHash>
-
 namespace kest::db {
 
 using namespace Qt::StringLiterals;
@@ -69,16 +67,6 @@ protected:
     {
         static const QStringList lost{u"2002"_s, u"2003"_s, u"2006"_s, u"2013"_s, u"2055"_s, u"1927"_s, u"1053"_s};
         return lost.contains(error.nativeErrorCode());
-    }
-
-    QString sqlState(const QSqlError& error) override
-    {
-        static const QHash<QString, QString> states{
-            {u"1044"_s, u"42000"_s}, {u"1045"_s, u"28000"_s}, {u"1049"_s, u"42000"_s}, {u"1054"_s, u"42S22"_s},
-            {u"1062"_s, u"23000"_s}, {u"1064"_s, u"42000"_s}, {u"1146"_s, u"42S02"_s}, {u"1969"_s, u"70100"_s},
-            {u"2002"_s, u"08001"_s}, {u"2003"_s, u"08001"_s}, {u"2005"_s, u"08001"_s}, {u"2006"_s, u"08S01"_s},
-            {u"2013"_s, u"08S01"_s}};
-        return states.value(error.nativeErrorCode(), u"HY000"_s);
     }
 
 private:

@@ -19,15 +19,19 @@ public:
     {
         while (connectionText.endsWith(u';'))  // the driver manager takes a last one for an empty field, and fails
             connectionText.chop(1);
-        database.setDatabaseName(connectionText);
         database.setConnectOptions(u"SQL_ATTR_LOGIN_TIMEOUT=%1"_s.arg(connectSeconds));
-        openDatabase();
+        openNamed(connectionText);
         const QString version = ask(u"SELECT @@version"_s).values.front().toString();
-        isMySql = version.contains(u"MariaDB"_s, Qt::CaseInsensitive) ||
-                  database.driver()->dbmsType() == QSqlDriver::MySqlServer;
         isMariaDb = version.contains(u"MariaDB"_s, Qt::CaseInsensitive);
-        if (isMySql)
-            tell(u"SET SESSION sql_mode=CONCAT(@@sql_mode, ',PIPES_AS_CONCAT')"_s);
+        isMySql = isMariaDb || database.driver()->dbmsType() == QSqlDriver::MySqlServer;
+        if (!isMySql)
+            return;
+        // only with this option does an update to the value already there count as a row that was hit
+        if (!connectionText.contains(u"option="_s, Qt::CaseInsensitive)) {
+            database.close();
+            openNamed(connectionText + u";OPTION=2"_s);
+        }
+        tell(u"SET SESSION sql_mode=CONCAT(@@sql_mode, ',PIPES_AS_CONCAT')"_s);
     }
 
     void setTimeout(int seconds) override
@@ -92,6 +96,12 @@ protected:
     }
 
 private:
+    void openNamed(const QString& connectionText)
+    {
+        database.setDatabaseName(connectionText);
+        openDatabase();
+    }
+
     QString ofDatabase() const { return isMySql ? u"TABLE_SCHEMA=DATABASE()"_s : u"TABLE_CATALOG=DB_NAME()"_s; }
 
     bool isMySql = false;

@@ -1,0 +1,374 @@
+// Connections and statements: which engine answers, what a comparison means on each, what fails and how.
+#include "platform/Databases.h"
+#include "platform/database/FaultInjection.h"
+
+#include <QElapsedTimer>
+#include <QFile>
+#include <QSqlDatabase>
+#include <QSqlQuery>
+#include <QSysInfo>
+
+#include <arpa/inet.h>
+#include <sys/socket.h>
+#include <unistd.h>
+
+namespace kest::test {
+
+using namespace Qt::StringLiterals;
+using db::Recordset;
+
+namespace {
+
+class Database : public Databases {
+protected:
+    ~Database() override { db::setStatementFault({}); }
+
+    void insert(const QString& columns, const QString& values) const
+    {
+        connection->execute(u"INSERT INTO LINE (%1) VALUES (%2)"_s.arg(columns, values));
+    }
+};
+
+}  // namespace
+
+TEST_P(Database, AComparisonMeansTheSameOnEveryEngine)
+{
+    insert(u"CODE, SEQ, flag, amount"_s, u"'Red', 0, 1, 2.5"_s);
+    insert(u"CODE, SEQ, flag, amount"_s, u"'red  ', 5, 0, 0"_s);
+    insert(u"CODE, SEQ, day"_s, u"'50% [off]', NULL, '2026-02-28 00:00:00'"_s);
+    insert(u"CODE, SEQ"_s, u"'ÖL', 10"_s);
+    insert(u"CODE, SEQ"_s, u"'', 7"_s);
+    const std::pair<QString, int> cases[] = {
+        {u"CODE='RED'"_s, 2},
+        {u"'red' = line.CODE"_s, 2},
+        {u"CODE='red   '"_s, 2},
+        {u"CODE<>'red'"_s, 3},
+        {u"CODE='öl'"_s, 1},
+        {u"CODE=''"_s, 1},
+        {u"CODE IN ('RED', 'öl ')"_s, 3},
+        {u"CODE LIKE 'RE_'"_s, 2},
+        {u"CODE LIKE 'red  '"_s, 2},
+        {u"CODE LIKE 're%'"_s, 2},
+        {u"CODE LIKE '%D'"_s, 2},
+        {u"CODE LIKE 'öl'"_s, 1},
+        {u"CODE LIKE '[p-s]ed'"_s, 2},
+        {u"CODE LIKE '[^p-s]%'"_s, 2},
+        {u"CODE LIKE '50[%] [[]off]'"_s, 1},
+        {u"CODE NOT LIKE '%d'"_s, 3},
+        {u"SEQ='0'"_s, 1},
+        {u"SEQ=''"_s, 1},
+        {u"SEQ='5.0 '"_s, 1},
+        {u"SEQ>'5'"_s, 2},
+        {u"SEQ='abc'"_s, 0},
+        {u"SEQ='0abc'"_s, 0},
+        {u"SEQ<>'abc'"_s, 4},
+        {u"SEQ<'abc' OR SEQ>'abc'"_s, 0},
+        {u"SEQ IN ('x', '7')"_s, 1},
+        {u"SEQ=NULL"_s, 0},
+        {u"amount='2.50'"_s, 1},
+        {u"flag=1"_s, 1},
+        {u"flag='1'"_s, 1},
+        {u"flag=TRUE"_s, 1},
+        {u"flag='False'"_s, 4},
+        {u"day='28/02/2026'"_s, 1},
+        {u"[SEQ]=5 AND [line].[CODE]='RED'"_s, 1},
+    };
+    for (const auto& [condition, rows] : cases)
+        EXPECT_EQ(count(condition), rows) << condition.toStdString();
+}
+
+TEST_P(Database, StatementsInTheDialectOfTheHostAreUnderstood)
+{
+    insert(u"CODE, SEQ"_s, u"'A+B', 1"_s);
+    insert(u"CODE, SEQ"_s, u"NULL, 2"_s);
+    insert(u"CODE, SEQ"_s, u"'c', 3"_s);
+    Recordset newest = query(u"select top 2 * from line order by ID desc"_s);
+    EXPECT_EQ(newest.recordCount(), 2);
+    EXPECT_EQ(newest.text(u"CODE"_s), u"c"_s);
+
+    Recordset joined = query(u"SELECT CODE + ' top 1 ' + CODE + ';' AS NAME, SEQ + 1 AS n FROM LINE ORDER BY SEQ"_s);
+    EXPECT_EQ(joined.text(u"NAME"_s), u"A+B top 1 A+B;"_s);
+    EXPECT_EQ(joined.value(u"n"_s), QVariant(qint64(2)));
+    joined.moveNext();
+    EXPECT_TRUE(joined.isNull(u"NAME"_s)) << "a Null joined to a text is Null";
+
+    EXPECT_EQ(connection->execute(u"UPDATE line SET SEQ=3, flag=true WHERE SEQ='3';"_s), 1);
+    EXPECT_EQ(connection->execute(u"UPDATE line SET SEQ=3, flag=true WHERE SEQ='3'"_s), 1) << "the same again";
+    EXPECT_EQ(connection->execute(u"DELETE FROM TINTS"_s), 0);
+}
+
+TEST_P(Database, NoValueEndsItsLiteral)
+{
+    const QString hostile[] = {
+        u"O'Brien"_s, u"\\"_s,         u"\\' OR 1=1 -- "_s, u"'; DROP TABLE LINE; --"_s, u"{}"_s, u"a;b"_s,
+        u"\"`[x]"_s,  u"? :name %1"_s, u"€\u2019"_s,        u"line\r\nbreak\ttab"_s};
+    for (const QString& text : hostile) {
+        connection->execute(u"DELETE FROM LINE"_s);
+        connection->execute(sql("INSERT INTO LINE (CODE, notes) VALUES ('{}', '{}')", text.left(20), text));
+        Recordset rows = query(sql("SELECT * FROM LINE WHERE CODE='{}'", text.left(20)));
+        ASSERT_EQ(rows.recordCount(), 1) << text.toStdString();
+        EXPECT_EQ(rows.text(u"notes"_s), text);
+        rows.find(sql("CODE='{}'", text.left(20)));
+        EXPECT_FALSE(rows.eof()) << text.toStdString();
+        rows.set(u"CODE"_s, u"x"_s);
+        rows.set(u"notes"_s, text + text);
+        rows.update();
+        rows.set(u"CODE"_s, text.left(20));
+        rows.update();
+        rows.requery();
+        ASSERT_EQ(rows.recordCount(), 1) << text.toStdString();
+        EXPECT_EQ(rows.text(u"notes"_s), text + text);
+    }
+    insert(u"SEQ"_s, u"1"_s);
+    for (const QString& two : {u"DELETE FROM LINE; DELETE FROM CAR"_s, u"SELECT 1;DELETE FROM LINE"_s})
+        EXPECT_EQ(failure([&] { connection->execute(two); }).number(), StatementFailed);
+    EXPECT_EQ(failure([&] { query(u"SELECT * FROM LINE; DELETE FROM LINE"_s); }).number(), StatementFailed);
+    EXPECT_EQ(count(u"SEQ=1"_s), 1);
+}
+
+TEST_P(Database, AFailureKeepsTheCodesOfTheDatabase)
+{
+    const RuntimeError noTable = failure([&] { query(u"SELECT * FROM NOSUCH"_s); });
+    EXPECT_EQ(noTable.number(), StatementFailed);
+    EXPECT_FALSE(noTable.nativeCode().isEmpty());
+    EXPECT_TRUE(noTable.sqlState().startsWith(u"42"_s)) << noTable.sqlState().toStdString();
+    EXPECT_TRUE(noTable.description().contains(u"NOSUCH"_s, Qt::CaseInsensitive)) << noTable.what();
+
+    Recordset cars = query(u"SELECT * FROM CAR"_s);
+    for (const int expected : {0, int(StatementFailed)}) {
+        cars.addNew();
+        cars.set(u"REGO"_s, expected == 0 ? u"ABC1"_s : u"abc1 "_s);
+        const RuntimeError twice = failure([&] { cars.update(); });
+        EXPECT_EQ(twice.number(), expected);
+        EXPECT_EQ(twice.sqlState(), expected == 0 ? QString() : u"23000"_s);
+    }
+    EXPECT_EQ(connection->state(), 1);
+}
+
+TEST_P(Database, AStatementThatTakesTooLongIsGivenUp)
+{
+    const QString slow =
+        GetParam() == On::Embedded
+            ? u"WITH RECURSIVE n(i) AS (SELECT 1 UNION ALL SELECT i + 1 FROM n) SELECT COUNT(*) FROM n"_s
+            : u"SELECT SUM(a.seq * b.seq) FROM seq_1_to_1000000 a, seq_1_to_1000000 b"_s;
+    connection->setCommandTimeout(1);
+    QElapsedTimer time;
+    time.start();
+    EXPECT_EQ(failure([&] { query(slow); }).number(), StatementFailed);
+    EXPECT_LT(time.elapsed(), 10000);
+    EXPECT_EQ(query(u"SELECT 1 AS one"_s).value(u"one"_s).toInt(), 1) << "the connection lives on";
+}
+
+TEST_P(Database, AConnectionThatHasGoneIsNoticedAndCanBeOpenedAgain)
+{
+    if (GetParam() == On::Embedded) {
+        db::setStatementFault([] { return true; }, CannotOpen);
+    } else {
+        const QString id = query(u"SELECT CONNECTION_ID() AS id"_s).text(u"id"_s);
+        connect()->execute(u"KILL "_s + id);
+    }
+    EXPECT_EQ(failure([&] { query(u"SELECT * FROM LINE"_s); }).number(), CannotOpen);
+    EXPECT_EQ(connection->state(), 0);
+    db::setStatementFault({});
+    EXPECT_EQ(failure([&] { connection->execute(u"DELETE FROM LINE"_s); }).number(), CannotOpen);
+    connection->open(connectionText);
+    EXPECT_EQ(connection->state(), 1);
+    EXPECT_EQ(count(u"1=1"_s), 0);
+    Recordset none{db::ConnectionPtr()};
+    EXPECT_EQ(failure([&] { none.open(u"SELECT 1"_s); }).number(), NoObject);
+}
+
+INSTANTIATE_TEST_SUITE_P(Engines, Database, ::testing::Values(On::Embedded, On::MySql, On::Odbc));
+
+class EmbeddedDatabase : public Database {
+protected:
+    /// The file as any other tool opens it.
+    void byAnotherTool(const QStringList& statements) const
+    {
+        {
+            QSqlDatabase plain = QSqlDatabase::addDatabase(u"QSQLITE"_s, u"another tool"_s);
+            plain.setDatabaseName(profile.root() + u"/databases/shop.db"_s);
+            ASSERT_TRUE(plain.open());
+            for (const QString& statement : statements)
+                EXPECT_TRUE(QSqlQuery(plain).exec(statement)) << statement.toStdString();
+        }
+        QSqlDatabase::removeDatabase(u"another tool"_s);
+    }
+
+    QVariant single(const QString& select) const
+    {
+        Recordset rows = query(select);
+        return rows.value(rows.columns().first());
+    }
+};
+
+TEST_P(EmbeddedDatabase, ReadsWhatAnotherToolHasWritten)
+{
+    byAnotherTool({u"INSERT INTO LINE (CODE, SEQ, amount, flag, day) VALUES (5, 'x', '1,5', -1, '2026-02-28')"_s,
+                   u"INSERT INTO LINE (SEQ, amount, flag, day) VALUES (1.5, 3, 'True', '2026-02-28T10:00:00')"_s});
+    Recordset lines = query(u"SELECT * FROM LINE"_s);
+    EXPECT_EQ(lines.value(u"CODE"_s), QVariant(u"5"_s));
+    EXPECT_EQ(lines.text(u"SEQ"_s), u"x"_s);
+    EXPECT_EQ(lines.value(u"flag"_s), QVariant(true));
+    EXPECT_EQ(lines.value(u"day"_s), QVariant(QDateTime(QDate(2026, 2, 28), QTime(0, 0))));
+    for (const QString& column : {u"flag"_s, u"day"_s, u"SEQ"_s}) {
+        lines.set(column, QVariant());
+        lines.update();  // finds the row by the value as it stands in the file
+        EXPECT_TRUE(lines.isNull(column));
+    }
+    lines.moveNext();
+    EXPECT_EQ(lines.value(u"SEQ"_s), QVariant(1.5));
+    EXPECT_EQ(lines.value(u"flag"_s), QVariant(true));
+    lines.set(u"day"_s, u"1/3/2026"_s);
+    lines.update();
+    EXPECT_EQ(single(u"SELECT day + '' AS stored FROM LINE WHERE day IS NOT NULL"_s),
+              QVariant(u"2026-03-01 00:00:00"_s));
+}
+
+TEST_P(EmbeddedDatabase, IndexesLeftInAnotherOrderAreRebuilt)
+{
+    connection->execute(u"CREATE INDEX byCode ON LINE (CODE)"_s);
+    byAnotherTool({u"INSERT INTO LINE (CODE) VALUES ('öl'), ('ÖL'), ('z'), ('Ä'), ('b  '), ('B')"_s});
+    connection->rebuildIndexes();
+    EXPECT_EQ(count(u"CODE='Öl'"_s), 2);
+    EXPECT_EQ(count(u"CODE='b'"_s), 2);
+    EXPECT_EQ(single(u"SELECT integrity_check AS answer FROM pragma_integrity_check"_s), QVariant(u"ok"_s));
+}
+
+TEST_P(EmbeddedDatabase, IsDurableAndLeavesForeignKeysAlone)
+{
+    const std::pair<QString, QVariant> settings[] = {{u"journal_mode"_s, u"wal"_s},
+                                                     {u"synchronous"_s, qint64(2)},
+                                                     {u"foreign_keys"_s, qint64(0)},
+                                                     {u"busy_timeout"_s, qint64(5000)}};
+    for (const auto& [name, value] : settings)
+        EXPECT_EQ(single(u"PRAGMA "_s + name), value) << name.toStdString();
+}
+
+INSTANTIATE_TEST_SUITE_P(Alone, EmbeddedDatabase, ::testing::Values(On::Embedded));
+
+TEST(ConnectionText, ChoosesTheEngineThatAnswers)
+{
+    const TestProfile profile;
+    QDir().mkpath(profile.root() + u"/databases"_s);
+    for (const QString& name : {u"Shop.db"_s, u"BRANCH.Shop.db"_s})
+        QFile(profile.root() + u"/databases/"_s + name).open(QIODevice::WriteOnly);
+    QFile junk(profile.root() + u"/databases/junk.db"_s);
+    ASSERT_TRUE(junk.open(QIODevice::WriteOnly));
+    junk.write(QByteArray(5000, 'x'));
+    junk.close();
+    const std::pair<QString, bool> cases[] = {
+        {u"Driver={SQL Server};Server=(local)\\;Database=Shop;Uid=sa;Pwd=;"_s, true},
+        {u"Driver={SQL Native Client};Server=(LOCAL)\\BRANCH;Database=shop;Uid=sa;Pwd=a=b;"_s, true},
+        {u"Driver={SQL Server};Server="_s + QSysInfo::machineHostName() + u"\\;Database=Shop;"_s, true},
+        {u"Driver={SQL Server};Server=(local)\\OTHER;Database=Shop;"_s, false},
+        {u"Driver={SQL Server};Server=(local)\\;Database=NoShop;"_s, false},
+        {u"Driver={SQL Server};Server=(local)\\;Database=junk;"_s, false},
+        {u"Driver={SQL Server};Server=(local)\\;Database=../databases/Shop;"_s, false},
+        {u"Driver={SQL Server};Server=elsewhere\\;Database=Shop;"_s, false},
+        {u"Database=Shop;"_s, false},
+        {QString(), false},
+    };
+    for (const auto& [text, opens] : cases) {
+        db::Connection connection;
+        int number = 0;
+        try {
+            connection.open(text);
+        } catch (const RuntimeError& error) {
+            number = error.number();
+        }
+        EXPECT_EQ(number, opens ? 0 : CannotOpen) << text.toStdString();
+        EXPECT_EQ(connection.state(), opens ? 1 : 0) << text.toStdString();
+    }
+    EXPECT_FALSE(QFile::exists(profile.root() + u"/databases/NoShop.db"_s)) << "a missing database is not made";
+}
+
+TEST(ConnectionText, AServerThatRefusesOrDoesNotAnswerCostsSeconds)
+{
+    const int silent = socket(AF_INET, SOCK_STREAM, 0);
+    sockaddr_in address{};
+    address.sin_family = AF_INET;
+    address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
+    socklen_t length = sizeof address;
+    ASSERT_EQ(bind(silent, reinterpret_cast<sockaddr*>(&address), length), 0);
+    ASSERT_EQ(listen(silent, 1), 0);
+    getsockname(silent, reinterpret_cast<sockaddr*>(&address), &length);
+    mariaDb().createDatabase(u"shop"_s);
+
+    const auto text = [](const QString& driver, int port, const QString& password, const QString& database) {
+        return u"Driver={%1};Server=127.0.0.1;Port=%2;Database=%3;User=%4;Password=%5;Option=3;"_s.arg(
+            driver, QString::number(port), database, mariaDb().user(), password);
+    };
+    const QString right = mariaDb().password();
+    const QString driver = u"MySQL ODBC 3.51 Driver"_s;
+    const int port = mariaDb().port();
+    const std::tuple<QString, int, QString> cases[] = {
+        {text(driver, port, right, u"shop"_s), 0, {}},
+        {text(driver, port, u"wrong"_s, u"shop"_s), CannotOpen, u"1045"_s},
+        {text(driver, port, right, u"noshop"_s), CannotOpen, u"1049"_s},
+        {text(driver, 1, right, u"shop"_s), CannotOpen, u"2002"_s},
+        {text(driver, ntohs(address.sin_port), right, u"shop"_s), CannotOpen, u"2013"_s},
+    };
+    for (const auto& [connectionText, number, native] : cases) {
+        QElapsedTimer time;
+        time.start();
+        db::Connection connection;
+        RuntimeError thrown(0, QString());
+        try {
+            connection.open(connectionText);
+        } catch (const RuntimeError& error) {
+            thrown = error;
+        }
+        EXPECT_EQ(thrown.number(), number) << connectionText.toStdString();
+        EXPECT_EQ(thrown.nativeCode(), native);
+        EXPECT_LT(time.elapsed(), 10000);
+    }
+    close(silent);
+}
+
+TEST(PastedStatement, FillsPlacesByWhereTheyStand)
+{
+    const std::tuple<const char*, QVariant, const char*> cases[] = {
+        {"A='{}'", u"O'Brien"_s, "A='O''Brien'"},
+        {"A='{}'", u"{}"_s, "A='{}'"},
+        {"A='{}'", QVariant(), "A=''"},
+        {"A='{}'", 5, "A='5'"},
+        {"A LIKE '%{}%'", u"x"_s, "A LIKE '%x%'"},
+        {"A='it''s {}'", u"'"_s, "A='it''s '''"},
+        {"A={}", 5, "A=5"},
+        {"A={}", u" 0042 "_s, "A=0042"},
+        {"A={}", u"1,234.5"_s, "A=1234.5"},
+        {"A={}", 2.5, "A=2.5"},
+        {"A={}", true, "A=1"},
+        {"A={}", QVariant(), "A=NULL"},
+        {"A={}", u"1 OR 1=1"_s, nullptr},
+        {"A={}", u""_s, nullptr},
+        {"A={}", u"'"_s, nullptr},
+    };
+    for (const auto& [statement, value, expected] : cases) {
+        if (expected) {
+            EXPECT_EQ(sql(statement, value), QString::fromLatin1(expected)) << statement;
+            continue;
+        }
+        try {
+            sql(statement, value);
+            ADD_FAILURE() << value.toString().toStdString() << " is no number";
+        } catch (const RuntimeError& error) {
+            EXPECT_EQ(error.number(), TypeMismatch);
+        }
+    }
+    EXPECT_EQ(sql("A='{}' AND B={} AND C='{}'", u"{}'"_s, 1, u"c"_s), u"A='{}''' AND B=1 AND C='c'"_s);
+}
+
+TEST_P(Database, AFaultSetByATestHitsTheStatementItNames)
+{
+    for (const int number : {int(StatementFailed), int(CannotOpen)}) {
+        int statements = 0;
+        db::setStatementFault([&] { return ++statements == 2; }, number);
+        EXPECT_EQ(failure([&] { query(u"SELECT * FROM LINE"_s); }).number(), 0);
+        EXPECT_EQ(failure([&] { connection->execute(u"DELETE FROM LINE"_s); }).number(), number);
+        EXPECT_EQ(connection->state(), number == CannotOpen ? 0 : 1);
+    }
+}
+
+}  // namespace kest::test
