@@ -1,0 +1,384 @@
+#include "app/Commands.h"
+
+#include "app/Profile.h"
+#include "jobexport/JobLinkSettings.h"
+#include "messages/frmMessageList.h"
+#include "outbound/SendQuote.h"
+#include "platform/RuntimeError.h"
+#include "platform/desktop/Script.h"
+#include "platform/desktop/Window.h"
+#include "platform/files/files.h"
+#include "platform/profile.h"
+#include "platform/settings/registry.h"
+#include "shell/CredentialCipher.h"
+#include "shell/ModRegistry.h"
+#include "shell/SharedVariables.h"
+#include "shell/component.h"
+#include "shell/eKEST.h"
+#include "shell/frmKEST.h"
+#include "utilities/FormatXML.h"
+
+#include <QFile>
+#include <QFileInfo>
+#include <QJsonDocument>
+
+#include <cstdio>
+#include <map>
+#include <optional>
+
+namespace kest::app {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+constexpr int backgroundWait = 30'000;  // milliseconds
+
+/// What a command adds to the answer that all commands give.
+struct Outcome {
+    int exitCode = Done;
+    QJsonObject fields{};  // of the JSON object
+    QString text{};        // on standard output without --json
+    bool isWhole = false;  // `fields` is the whole JSON object
+};
+
+enum class Needs { Nothing, Profile, Connection };
+
+struct Command {
+    Needs needs;
+    int fewest;  // arguments
+    int most;
+    Outcome (*run)(const QStringList& arguments);
+};
+
+void say(const QString& text, std::FILE* stream = stdout)
+{
+    const QByteArray bytes = text.toUtf8();
+    std::fwrite(bytes.constData(), 1, static_cast<size_t>(bytes.size()), stream);
+    std::fflush(stream);
+}
+
+Outcome refused(const QString& why, int exitCode)
+{
+    say(u"kest2: "_s + why + u'\n', stderr);
+    return {.exitCode = exitCode};
+}
+
+Outcome init(const QStringList& arguments)
+{
+    const bool demo = arguments.contains(u"--demo"_s);
+    if (arguments.size() > (demo ? 1 : 0))
+        return refused(u"init takes --demo and nothing else"_s, Usage);
+    initProfile(demo);
+    if (DllRegisterServer() != com::Ok)
+        return refused(u"the class could not be entered into the settings of "_s + profile::root(), Refused);
+    return {.text = u"The profile is ready: "_s + profile::root() + u'\n'};
+}
+
+Outcome showWhere(const QStringList&)
+{
+    const QJsonObject places = where();
+    return {.fields = places, .text = QString::fromUtf8(QJsonDocument(places).toJson()), .isWhole = true};
+}
+
+/// Goes through the class object, as the host does.
+Outcome open(const QStringList& arguments)
+{
+    void* object = nullptr;
+    if (DllGetClassObject(CLSID_eKEST, com::IID_IClassFactory, &object) != com::Ok)
+        return refused(u"the class object is not to be had"_s, Refused);
+    auto* factory = static_cast<com::IClassFactory*>(object);
+    const com::HResult created = factory->CreateInstance(nullptr, IID_IeKEST, &object);
+    factory->Release();
+    if (created != com::Ok)
+        return refused(u"the component could not be created"_s, Refused);
+
+    auto* component = static_cast<IeKEST*>(object);
+    std::u16string quote = arguments.value(0, u"0"_s).toStdU16String();
+    std::u16string subquote = arguments.value(1, u"0"_s).toStdU16String();
+    Text quoteText = quote.data();
+    Text subquoteText = subquote.data();
+    component->ShowKESTWindow(&quoteText, &subquoteText);
+    const bool connected = gConn != nullptr;
+    component->Release();
+    desktop::throwKept();
+    return {.exitCode = connected ? Done : NoConnection};
+}
+
+QString rowsAsText(const QList<ListedMessage>& rows)
+{
+    QString text;
+    for (const ListedMessage& message : rows) {
+        text += message.file;
+        for (const QString& cell : message.row)
+            text += u'\t' + cell;
+        text += u'\n';
+    }
+    return text;
+}
+
+QJsonArray rowsAsJson(const QList<ListedMessage>& rows)
+{
+    static const QString names[] = {u"type"_s, u"rego"_s, u"claim"_s, u"customer"_s, u"quote"_s, u"vehicle"_s};
+    QJsonArray array;
+    for (const ListedMessage& message : rows) {
+        QJsonObject object{{u"file"_s, message.file}};
+        for (size_t i = 0; i < message.row.size(); ++i)
+            object.insert(names[i], message.row[i]);
+        array.append(object);
+    }
+    return array;
+}
+
+std::optional<int> folderNamed(const QString& name)
+{
+    static const std::map<QString, int> folders{{u"unread"_s, Unread}, {u"read"_s, Read}, {u"sent"_s, Sent}};
+    const auto found = folders.find(name);
+    return found == folders.end() ? std::nullopt : std::optional(found->second);
+}
+
+Outcome list(const QStringList& arguments)
+{
+    const std::optional<int> folder = folderNamed(arguments[0]);
+    const bool filtered = arguments.size() == 3 && arguments[1] == u"--filter"_s;
+    if (!folder || (arguments.size() > 1 && !filtered))
+        return refused(u"list takes unread, read or sent, and --filter TEXT"_s, Usage);
+
+    frmMessageList window;
+    window.open();
+    if (*folder != Unread) {
+        if (filtered)
+            desktop::currentScript()->answerInputs(arguments[2]);
+        window.chooseFolder(*folder);
+        if (filtered && gsListFilter != arguments[2])
+            window.updateFilter(arguments[2]);
+    }
+    return {.fields = {{u"rows"_s, rowsAsJson(window.rows())}}, .text = rowsAsText(window.rows())};
+}
+
+Outcome load(const QStringList& arguments)
+{
+    frmMessageList window;
+    window.open();
+    const bool loaded = window.loadFile(arguments[0]);
+    return {.exitCode = loaded ? Done : Refused, .fields = {{u"rows"_s, rowsAsJson(window.rows())}}};
+}
+
+QString folderPath(int folder)
+{
+    return folder == Unread ? gsUnreadPath : folder == Read ? gsReadPath : gsSentPath;
+}
+
+Outcome view(const QStringList& arguments)
+{
+    const std::optional<int> folder = folderNamed(arguments[0]);
+    if (!folder)
+        return refused(u"view takes unread, read or sent, and a file"_s, Usage);
+    if (!files::isPlainName(arguments[1]))
+        return refused(arguments[1] + u" is no name of a file"_s, Refused);
+    const QString text = FormatXML(folderPath(*folder) + arguments[1]);
+    return {.exitCode = text.isEmpty() ? Refused : Done, .fields = {{u"text"_s, text}}, .text = text};
+}
+
+Outcome send(const QStringList& arguments)
+{
+    OpenHostQuote(arguments[0], arguments.value(1, u"0"_s));
+    bool sent = false;
+    desktop::guarded(u"frmKEST.cmdOK_Click"_s, [&] { sent = frmKEST::SendOpenQuote(); });
+    desktop::throwKept();
+    return {.exitCode = sent ? Done : Refused};
+}
+
+QJsonArray settingsAsJson()
+{
+    QJsonArray all;
+    for (const settings::Entry& entry : settings::entries()) {
+        static const std::map<settings::Hive, QString> hives{{settings::Hive::ClassesRoot, u"HKEY_CLASSES_ROOT"_s},
+                                                             {settings::Hive::CurrentUser, u"HKEY_CURRENT_USER"_s},
+                                                             {settings::Hive::LocalMachine, u"HKEY_LOCAL_MACHINE"_s}};
+        all.append(QJsonObject{{u"hive"_s, hives.at(entry.hive)},
+                               {u"key"_s, entry.key},
+                               {u"name"_s, entry.name},
+                               {u"value"_s, entry.value.data}});
+    }
+    return all;
+}
+
+Outcome setting(const QStringList& arguments)
+{
+    const QString& what = arguments[0];
+    if (what == u"list"_s && arguments.size() == 1) {
+        const QJsonArray all = settingsAsJson();
+        QString text;
+        for (const QJsonValue& entry : all)
+            text += entry[u"hive"].toString() + u'\\' + entry[u"key"].toString() + u'\t' + entry[u"name"].toString() +
+                    u'\t' + entry[u"value"].toString() + u'\n';
+        return {.fields = {{u"settings"_s, all}}, .text = text};
+    }
+    if (arguments.size() < 4)
+        return refused(u"setting takes list, get APP SECTION KEY or set APP SECTION KEY VALUE"_s, Usage);
+
+    const QString key = u"SOFTWARE\\"_s + arguments[1] + u'\\' + arguments[2];
+    if (what == u"get"_s && arguments.size() == 4) {
+        const QString value = RegGetValue(settings::Hive::LocalMachine, key, arguments[3]);
+        return {.fields = {{u"value"_s, value}}, .text = value + u'\n'};
+    }
+    if (what == u"set"_s && arguments.size() == 5) {
+        RegCreateSubKey(settings::Hive::LocalMachine, key);
+        if (!RegSetValue(settings::Hive::LocalMachine, key, arguments[3], arguments[4]))
+            return refused(u"the setting could not be written"_s, Refused);
+        return {.fields = {{u"value"_s, arguments[4]}}};
+    }
+    return refused(u"setting takes list, get APP SECTION KEY or set APP SECTION KEY VALUE"_s, Usage);
+}
+
+/// `joblink set --server S --port N --database D --user U`, the password on standard input: it must not stand in a list
+/// of processes or in a shell's history.
+Outcome jobLink(const QStringList& arguments)
+{
+    const auto wrong = [] { return refused(u"joblink set takes --server S --port N --database D --user U"_s, Usage); };
+    if (arguments[0] != u"set"_s || arguments.size() != 9)
+        return wrong();
+    std::map<QString, QString> options;
+    for (qsizetype i = 1; i < arguments.size(); i += 2)
+        options[arguments[i]] = arguments[i + 1];
+    bool isPort = false;
+    JobLinkSettings settings{.server = options[u"--server"_s],
+                             .port = options[u"--port"_s].toUShort(&isPort),
+                             .database = options[u"--database"_s],
+                             .user = options[u"--user"_s],
+                             .password = {}};
+    if (!isPort || settings.server.isEmpty() || settings.database.isEmpty() || settings.user.isEmpty())
+        return wrong();
+
+    QFile input;
+    if (!input.open(stdin, QIODevice::ReadOnly))
+        return refused(u"the password cannot be read from standard input"_s, Refused);
+    settings.password = QString::fromLocal8Bit(input.readLine());
+    while (settings.password.endsWith(u'\n') || settings.password.endsWith(u'\r'))
+        settings.password.chop(1);
+    InitCipherKey();
+    StoreJobLinkSettings(settings);
+    return {.text = u"JobLink's settings are stored.\n"_s};
+}
+
+const std::map<QString, Command> commands{
+    {u"init"_s, {Needs::Nothing, 0, 1, init}},          {u"where"_s, {Needs::Nothing, 0, 0, showWhere}},
+    {u"open"_s, {Needs::Profile, 0, 2, open}},          {u"list"_s, {Needs::Connection, 1, 3, list}},
+    {u"load"_s, {Needs::Connection, 1, 1, load}},       {u"send"_s, {Needs::Connection, 1, 2, send}},
+    {u"view"_s, {Needs::Connection, 2, 2, view}},       {u"setting"_s, {Needs::Profile, 1, 5, setting}},
+    {u"joblink"_s, {Needs::Connection, 1, 9, jobLink}},
+};
+
+bool profileExists()
+{
+    return QFileInfo::exists(profile::root() + u"/registry.ini"_s);
+}
+
+Outcome runConnected(const Command& command, const QStringList& arguments)
+{
+    const eKEST component;
+    if (!HasConnection())
+        return {.exitCode = NoConnection};
+    return command.run(arguments);
+}
+
+Outcome runChecked(const CommandLine& line)
+{
+    const auto found = commands.find(line.command);
+    if (found == commands.end())
+        return refused(u"unknown command "_s + line.command, Usage);
+    const Command& command = found->second;
+    if (line.arguments.size() < command.fewest || line.arguments.size() > command.most)
+        return refused(u"wrong number of arguments for "_s + line.command, Usage);
+    if (command.needs != Needs::Nothing && !profileExists())
+        return refused(u"no profile at "_s + profile::root() + u"; make one with: kest2 init"_s, NoConnection);
+    if (command.needs == Needs::Connection)
+        return runConnected(command, line.arguments);
+    return command.run(line.arguments);
+}
+
+Outcome runCaught(const CommandLine& line)
+{
+    try {
+        return runChecked(line);
+    } catch (const desktop::NeedsAnswer& needed) {
+        return refused(needed.reason(), NeedsAPerson);
+    } catch (const RuntimeError& error) {
+        return refused(error.description(), Refused);
+    }
+}
+
+QJsonObject scriptIn(const QString& file)
+{
+    if (file.isEmpty())
+        return {};
+    QFile script(file);
+    if (!script.open(QIODevice::ReadOnly))
+        throw RuntimeError(FileNotFound, u"the script "_s + file + u" cannot be read: "_s + script.errorString());
+    QJsonParseError problem;
+    const QJsonDocument document = QJsonDocument::fromJson(script.readAll(), &problem);
+    if (!document.isObject())
+        throw RuntimeError(TypeMismatch, u"the script "_s + file + u" is no JSON object: "_s + problem.errorString());
+    return document.object();
+}
+
+std::shared_ptr<desktop::Script> answeringScript(const CommandLine& line)
+{
+    auto script = std::make_shared<desktop::Script>(scriptIn(line.script));
+    for (const QString& window : {u"frmPrintPreview"_s, u"frmSubletAuth"_s, u"frmViewPDF"_s})
+        script->recordAndClose(window);
+    desktop::setAnswerer(script);
+    desktop::setWindowDriver(script);
+    return script;
+}
+
+void print(const CommandLine& line, const Outcome& outcome, const desktop::Record& record)
+{
+    if (!line.json) {
+        say(outcome.text);
+        return;
+    }
+    QJsonObject answer = outcome.fields;
+    if (!outcome.isWhole) {
+        answer[u"command"_s] = line.command;
+        answer[u"result"_s] = outcome.exitCode == Done;
+        answer[u"boxes"_s] = record.boxes;
+        answer[u"inputs"_s] = record.inputs;
+        answer[u"windows"_s] = record.windows;
+        answer[u"reads"_s] = record.reads;
+        if (!answer.contains(u"rows"_s))
+            answer[u"rows"_s] = QJsonArray();
+    }
+    say(QString::fromUtf8(QJsonDocument(answer).toJson()));
+}
+
+}  // namespace
+
+bool isInteractive(const CommandLine& line)
+{
+    return line.command == u"open"_s && line.script.isEmpty();
+}
+
+int run(const CommandLine& line)
+{
+    if (!line.profile.isEmpty())
+        profile::setRoot(line.profile);
+
+    std::shared_ptr<desktop::Script> script;
+    try {
+        if (isInteractive(line))
+            desktop::usePerson();
+        else
+            script = answeringScript(line);
+    } catch (const RuntimeError& error) {
+        return refused(error.description(), Usage).exitCode;
+    }
+
+    const Outcome outcome = runCaught(line);
+    files::waitForBackground(backgroundWait);
+    print(line, outcome, script ? script->record() : desktop::Record());
+    return outcome.exitCode;
+}
+
+}  // namespace kest::app

@@ -1,0 +1,15 @@
+// Runs one command of `kest2` and says what it did.
+#pragma once
+
+#include "app/CommandLine.h"
+
+namespace kest::app {
+
+/// Runs the command of a line that was parsed without an error, prints its answer on standard output and its boxes on
+/// standard error, and gives the exit code. An application object must exist.
+int run(const CommandLine& line);
+
+/// True for the one command that a person may answer.
+bool isInteractive(const CommandLine& line);
+
+}  // namespace kest::app

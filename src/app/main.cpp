@@ -1,0 +1,47 @@
+// The command kest2: what the windows do, from a terminal.
+#include "app/CommandLine.h"
+#include "app/Commands.h"
+
+#include <QApplication>
+
+#include <cstdio>
+
+namespace {
+
+bool hasDisplay()
+{
+    return qEnvironmentVariableIsSet("DISPLAY") || qEnvironmentVariableIsSet("WAYLAND_DISPLAY") ||
+           qEnvironmentVariableIsSet("QT_QPA_PLATFORM");
+}
+
+QStringList words(int argc, char** argv)
+{
+    QStringList list;
+    for (int i = 1; i < argc; ++i)
+        list.append(QString::fromLocal8Bit(argv[i]));
+    return list;
+}
+
+}  // namespace
+
+int main(int argc, char** argv)
+{
+    using namespace kest::app;
+    const CommandLine line = parsed(words(argc, argv));
+    if (!line.error.isEmpty()) {
+        std::fprintf(stderr, "kest2: %s\n\n%s", qUtf8Printable(line.error), qUtf8Printable(usage()));
+        return Usage;
+    }
+    if (isInteractive(line) && !hasDisplay()) {
+        std::fputs("kest2: there is no display to open the panel on; give a --script, or run it in a desktop session\n",
+                   stderr);
+        return NeedsAPerson;
+    }
+    if (!isInteractive(line) && !qEnvironmentVariableIsSet("QT_QPA_PLATFORM"))
+        qputenv("QT_QPA_PLATFORM", "offscreen");
+
+    QApplication application(argc, argv);
+    application.setApplicationName(QStringLiteral("kest2"));
+    application.setApplicationVersion(QStringLiteral(KEST_VERSION));
+    return run(line);
+}
