@@ -254,6 +254,14 @@ TEST_P(RecordsetOn, SearchesGoForwardAndCompareByTheKindOfTheColumn)
     EXPECT_TRUE(empty.eof());
 }
 
+TEST_P(RecordsetOn, AnInnerQueryComparesItsOwnLiterals)
+{
+    add(u"WRG 114"_s, 7);
+    add(u"other"_s, 8);
+    EXPECT_EQ(query(u"SELECT * FROM LINE WHERE SEQ IN (SELECT SEQ FROM LINE WHERE CODE='WRG 114')"_s).recordCount(), 1);
+    EXPECT_EQ(query(u"SELECT * FROM LINE WHERE SEQ IN ('7', 'x')"_s).recordCount(), 1);
+}
+
 TEST_P(RecordsetOn, ASearchSeesEveryChangeMadeThroughTheRecordset)
 {
     for (int i = 1; i <= 3; ++i)
