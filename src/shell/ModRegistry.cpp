@@ -1,7 +1,10 @@
 #include "shell/ModRegistry.h"
 
+#include "platform/RuntimeError.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
+
+#include <cmath>
 
 namespace kest {
 
@@ -11,7 +14,8 @@ using settings::Type;
 
 namespace {
 
-constexpr qsizetype bufferSize = 1024;  // bytes, the closing zero byte among them
+constexpr qsizetype bufferSize = 1024;        // bytes, the closing zero byte among them
+constexpr double largestNumber = 0xFFFFFFFF;  // of four bytes
 
 QString machineKey(const QString& app, const QString& section)
 {
@@ -57,8 +61,11 @@ bool RegSetValue(Hive hive, const QString& subKey, const QString& valueName, con
     const std::optional<settings::Value> present = settings::query(hive, subKey, valueName);
     const Type type = present ? present->type : Type::Text;
     if (type == Type::Number) {
-        const auto number = static_cast<quint32>(static_cast<qint64>(leadingNumber(value)));
-        return settings::setValue(hive, subKey, valueName, {Type::Number, QString::number(number)});
+        double number = 0;
+        if (!attempt([&] { number = leadingNumber(value); }) || std::abs(number) > largestNumber)
+            return false;
+        const auto stored = static_cast<quint32>(static_cast<qint64>(number));
+        return settings::setValue(hive, subKey, valueName, {Type::Number, QString::number(stored)});
     }
     return settings::setValue(hive, subKey, valueName, {type, value});
 }

@@ -68,6 +68,7 @@ TEST_F(Settings, AWriteKeepsTheTypeAndNeedsTheKey)
     EXPECT_FALSE(RegSetValue(Hive::LocalMachine, splash, u"a"_s, u"1"_s));
     machineWide(u"number"_s, {Type::Number, u"26"_s});
     EXPECT_TRUE(RegSetValue(Hive::LocalMachine, splash, u"number"_s, u"12 pieces"_s));
+    EXPECT_FALSE(RegSetValue(Hive::LocalMachine, splash, u"number"_s, u"1e999"_s));
     EXPECT_EQ(settings::query(Hive::LocalMachine, splash, u"number"_s), (settings::Value{Type::Number, u"12"_s}));
     EXPECT_TRUE(RegSetValue(Hive::LocalMachine, splash, u"text"_s, u"12"_s));
     EXPECT_EQ(settings::query(Hive::LocalMachine, splash, u"text"_s), (settings::Value{Type::Text, u"12"_s}));
