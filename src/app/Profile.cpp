@@ -6,6 +6,7 @@
 #include "platform/files/files.h"
 #include "platform/profile.h"
 #include "platform/settings/registry.h"
+#include "shell/component.h"
 #include "shell/modLoggerEx.h"
 
 #include <QDir>
@@ -79,10 +80,12 @@ void makeDatabase(bool demo, const QDate& today)
     for (const QString& leftOver : files::list(profile::root() + u"/databases"_s, unfinished + u".db*"_s))
         files::remove(profile::root() + u"/databases/"_s + leftOver);
     const db::ConnectionPtr database = openEmbedded(unfinished);
+    database->execute(u"BEGIN"_s);  // nothing is there to keep: one write to the disk instead of hundreds
     createTables(*database, Dialect::Embedded);
     fillNewShop(*database);
     if (demo)
         fillDemoShop(*database, today);
+    database->execute(u"COMMIT"_s);
     database->close();
     files::move(embeddedFile(unfinished), embeddedFile(databaseName));
 }
@@ -91,7 +94,7 @@ void rebuildIndexes()
 {
     const QString folder = profile::root() + u"/databases"_s;
     for (const QString& file : files::list(folder, u"*.db"_s))
-        openEmbedded(file.chopped(3))->execute(u"REINDEX"_s);
+        openEmbedded(file.chopped(3))->rebuildIndexes();
 }
 
 void installTemplates()
@@ -119,6 +122,8 @@ bool initProfile(bool demo, const QDate& today)
         makeDatabase(demo, today);
     if (demo)
         putDemoFiles(home, images, today);
+    if (DllRegisterServer() != com::Ok)
+        throw RuntimeError(FileInputOutput, u"The class cannot be registered."_s);
     writeSettings();  // last: they tell that the profile is whole
     return true;
 }

@@ -6,9 +6,9 @@
 
 namespace kest::app {
 
-/// Makes the profile: folders, quote database and settings, with `demo` a shop with quotes, messages and photographs
-/// too. On a profile that exists nothing changes but that the indexes of its databases are rebuilt, which another tool
-/// may have left in another order. True when the profile was made.
+/// Makes the profile: folders, quote database, class registration and settings, with `demo` a shop with quotes,
+/// messages and photographs too. On a profile that exists nothing changes but that the indexes of its databases are
+/// rebuilt, which another tool may have left in another order. True when the profile was made.
 bool initProfile(bool demo, const QDate& today = QDate::currentDate());
 
 /// The absolute paths of this system: `profile`, `database`, `unread`, `read`, `unsent`, `sent`, `images`, `pdf`,

@@ -34,10 +34,8 @@ const QByteArray& newShopFile()
 
 void forgetSharedVariables()
 {
-    grsQuote.reset();
-    gConn.reset();
-    for (QString* text : {&gsUnreadPath, &gsReadPath, &gsUnsentPath, &gsSentPath, &gsImagesPath, &gsCurFolder,
-                          &gsListFolder, &gsListFilter, &gsMatchedQTNNO, &gsDeletedQTNNO, &gsDeletedSubquote})
+    for (QString* text :
+         {&gsCurFolder, &gsListFolder, &gsListFilter, &gsMatchedQTNNO, &gsDeletedQTNNO, &gsDeletedSubquote})
         text->clear();
     gsQTNNO = gsSubQuote = u"0"_s;
     gdicQuoteRequests.clear();
@@ -134,23 +132,19 @@ VendorRow vendor(const Text& name)
 Shop::Shop() : desktop(std::in_place), newShop_(newShopFile()), root_(profile_.root())
 {
     forgetSharedVariables();
-    for (const auto& [variable, folder] :
-         {std::pair(&gsUnreadPath, u"c:\\wirdoc\\AUnread\\"_s), std::pair(&gsReadPath, u"c:\\wirdoc\\ARead\\"_s),
-          std::pair(&gsUnsentPath, u"c:\\wirdoc\\AUnsent\\"_s), std::pair(&gsSentPath, u"c:\\wirdoc\\ASent\\"_s),
-          std::pair(&gsImagesPath, u"c:\\wirimg\\"_s)}) {
-        files::makeFolder(folder);
-        *variable = folder;
-    }
-    files::makeFolder(u"c:\\wirdoc\\PDF"_s);
+    for (const char* folder : {"AUnread", "ARead", "AUnsent", "ASent", "PDF"})
+        files::makeFolder(u"c:\\wirdoc\\"_s + QString::fromLatin1(folder));
+    files::makeFolder(u"c:\\wirimg"_s);
     files::makeFolder(root_ + u"/databases"_s);
     files::makeFolder(root_ + u"/component"_s);
     files::writeBytes(app::embeddedFile(u"WirSql"_s), newShop_);
-    gConn = app::openEmbedded(u"WirSql"_s);
+    host_.emplace();
 }
 
 Shop::~Shop()
 {
     desktop.reset();
+    host_.reset();
     forgetSharedVariables();
 }
 

@@ -1,6 +1,7 @@
 // A repair shop of its own for one test: profile, folders, quote database, connection and shared variables.
 #pragma once
 
+#include "shell/eKEST.h"
 #include "support/Messages.h"
 #include "support/Row.h"
 #include "support/ScriptedDesktop.h"
@@ -48,6 +49,7 @@ private:
     QByteArray newShop_;  // before the profile: it is made in one of its own
     TestProfile profile_;
     QString root_;
+    std::optional<eKEST> host_;
     qsizetype boxesSeen_ = 0;
 };
 
