@@ -149,16 +149,20 @@ void frmViewPDF::print()
 {
     QPrinter printer(QPrinter::HighResolution);
     printer.setResolution(printResolution);
-    printer.setFromTo(1, pdf.pageCount());
     QPrintDialog dialog(&printer, this);
     dialog.setObjectName("PrintDialog"_L1);
     dialog.setMinMax(1, pdf.pageCount());
     desktop::showModal(dialog);
     if (dialog.result() != QDialog::Accepted)
         return;
-    const int first = printer.fromPage() > 0 ? printer.fromPage() - 1 : 0;  // all pages are told as 0 to 0
-    const int last = printer.toPage() > 0 ? printer.toPage() - 1 : pdf.pageCount() - 1;
+    const bool isRange = printer.printRange() == QPrinter::PageRange;
+    const int first = isRange ? printer.fromPage() - 1 : 0;
+    const int last = isRange ? printer.toPage() - 1 : pdf.pageCount() - 1;
     QPainter painter(&printer);
+    if (!painter.isActive()) {
+        desktop::msgBox(u"The document can't be printed."_s, desktop::Icon::Critical);
+        return;
+    }
     for (int page = first; page <= last; ++page) {
         if (page > first)
             printer.newPage();

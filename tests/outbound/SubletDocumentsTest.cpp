@@ -4,10 +4,15 @@
 #include "outbound/frmViewPDF.h"
 #include "platform/files/files.h"
 #include "shell/SharedVariables.h"
+#include "support/Hands.h"
 #include "support/Shop.h"
 
 #include <QPainter>
+#include <QPdfDocument>
 #include <QPdfWriter>
+#include <QPrintDialog>
+#include <QPrinter>
+#include <QShortcut>
 
 namespace kest {
 
@@ -87,6 +92,32 @@ TEST_F(Sublet, OpenShowsTheChosenDocument)
 
     frmViewPDF::ShowForm(u"c:\\wirdoc\\PDF\\gone.pdf"_s);
     EXPECT_EQ(shown(), "[critical] The document c:\\wirdoc\\PDF\\gone.pdf can't be shown: the file is not there.");
+}
+
+TEST_F(Sublet, APrintTakesThePagesThatWereChosen)
+{
+    realDocument(u"500.0_1.pdf"_s);
+    const QString output = root() + u"/printed.pdf"_s;
+    for (const bool onlySecond : {false, true}) {
+        const test::Hands hands({{u"frmViewPDF"_s,
+                                  [](QDialog& window) {
+                                      for (auto* shortcut : window.findChildren<QShortcut*>())
+                                          if (shortcut->key() == QKeySequence(QKeySequence::Print))
+                                              emit shortcut->activated();
+                                  }},
+                                 {u"PrintDialog"_s, [&](QDialog& window) {
+                                      QPrinter& printer = *static_cast<QPrintDialog&>(window).printer();
+                                      printer.setOutputFileName(output);
+                                      printer.setPrintRange(onlySecond ? QPrinter::PageRange : QPrinter::AllPages);
+                                      printer.setFromTo(onlySecond ? 2 : 0, onlySecond ? 2 : 0);
+                                      window.hide();
+                                      window.setResult(QDialog::Accepted);
+                                  }}});
+        frmViewPDF::ShowForm(u"c:\\wirdoc\\PDF\\500.0_1.pdf"_s);
+        QPdfDocument printed;
+        ASSERT_EQ(printed.load(output), QPdfDocument::Error::None);
+        EXPECT_EQ(printed.pageCount(), onlySecond ? 1 : 2);
+    }
 }
 
 }  // namespace kest

@@ -1,4 +1,5 @@
 // The password question: what is let in, what is said, and how the field tells that it has the focus.
+#include "support/Hands.h"
 #include "support/ScriptedDesktop.h"
 #include "support/TestProfile.h"
 #include "utilities/frmLogin.h"
@@ -61,19 +62,16 @@ TEST(Login, OnlyTheDaysNumberPassesAndOnlyAWrongNumberIsRemarkedOn)
 TEST(Login, AnotherTryAndEnterAreTakenAndCancelIsNot)
 {
     const TestProfile profile;
-    const std::string password = std::to_string(DayPassword(QDate::currentDate()));
+    const QString password = QString::number(DayPassword(QDate::currentDate()));
+    QString keys;  // the wrong text is marked, so that typing replaces it
+    for (const QChar digit : password)
+        keys += u"\"%1\", "_s.arg(digit);
     QStringList boxes;
     EXPECT_TRUE(login(R"({"set": "txtPassword", "text": "1"}, {"click": "cmdOK"}, {"key": "txtPassword", "keys": [)" +
-                          [&] {
-                              std::string keys;  // the wrong text is marked, so that typing replaces it
-                              for (const char digit : password)
-                                  keys += std::string("\"") + digit + "\", ";
-                              return keys;
-                          }() +
-                          R"("Return"]})",
+                          keys.toStdString() + R"("Return"]})",
                       boxes));
     EXPECT_EQ(boxes.size(), 1);
-    const std::string typed = R"({"set": "txtPassword", "text": ")" + password + R"("}, )";
+    const std::string typed = R"({"set": "txtPassword", "text": ")" + password.toStdString() + R"("}, )";
     EXPECT_FALSE(login(typed + R"({"click": "cmdCancel"})", boxes));
     EXPECT_FALSE(login(typed + R"({"key": "frmLogin", "keys": "Escape"})", boxes));
 }
@@ -95,29 +93,18 @@ TEST(Login, OkIsEnabledByTheFirstTextAndNeverDisabledAgain)
 
 TEST(Login, TheFieldIsYellowWithTheFocusAndCyanWithout)
 {
-    struct Looker final : desktop::WindowDriver {
-        bool drive(QDialog& window) override
-        {
-            const auto* password = window.findChild<QLineEdit*>(u"txtPassword"_s);
-            window.show();
-            window.activateWindow();
-            QCoreApplication::processEvents();
-            withFocus = password->palette().color(QPalette::Base);
-            window.findChild<QPushButton*>(u"cmdCancel"_s)->setFocus();
-            without = password->palette().color(QPalette::Base);
-            window.close();
-            return true;
-        }
-        QColor withFocus, without;
-    };
     const TestProfile profile;
-    const auto looker = std::make_shared<Looker>();
-    desktop::setWindowDriver(looker);
+    QColor withFocus, without;
+    const test::Hands hands({{u"frmLogin"_s, [&](QDialog& window) {
+                                  const auto& password = test::control<QLineEdit>(window, "txtPassword");
+                                  withFocus = password.palette().color(QPalette::Base);
+                                  test::control<QPushButton>(window, "cmdCancel").setFocus();
+                                  without = password.palette().color(QPalette::Base);
+                              }}});
     bool ok = true;
     frmLogin::ShowForm(ok);
-    desktop::setWindowDriver(nullptr);
-    EXPECT_EQ(looker->withFocus, QColor(Qt::yellow));
-    EXPECT_EQ(looker->without, QColor(Qt::cyan));
+    EXPECT_EQ(withFocus, QColor(Qt::yellow));
+    EXPECT_EQ(without, QColor(Qt::cyan));
 }
 
 }  // namespace kest

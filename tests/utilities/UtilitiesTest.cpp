@@ -1,6 +1,6 @@
 // The window on a quote's network fields: what it shows, what its buttons change, what a save stores.
-#include "platform/database/Sql.h"
 #include "shell/SharedVariables.h"
+#include "support/Hands.h"
 #include "support/Shop.h"
 #include "utilities/frmUtilities.h"
 
@@ -200,22 +200,6 @@ TEST_F(Utilities, AStatusButtonRewritesTickNumberAndNotes)
 
 TEST_F(Utilities, ASaveThatTheHostHasOvertakenIsReportedAndTheWindowStays)
 {
-    struct Host final : desktop::WindowDriver {
-        bool drive(QDialog& window) override
-        {
-            window.show();
-            gConn->execute(overtaken);
-            window.findChild<QLineEdit*>(u"txtQuoteNo"_s)->setText(u"repaired"_s);
-            window.findChild<QPushButton*>(u"Command4"_s)->click();
-            window.findChild<QPushButton*>(u"Command1"_s)->click();
-            stayed = window.isVisible();
-            text = window.findChild<QLineEdit*>(u"txtQuoteNo"_s)->text();
-            window.close();
-            return true;
-        }
-        QString overtaken, text;
-        bool stayed = false;
-    };
     struct {
         const char* overtaken;
         std::string quoteNumber, notes;
@@ -228,15 +212,19 @@ TEST_F(Utilities, ASaveThatTheHostHasOvertakenIsReportedAndTheWindowStays)
         QList<int> failures;
         desktop::setFailureReporter(
             [&](const RuntimeError& error, const QString&) { failures.append(error.number()); });
-        const auto host = std::make_shared<Host>();
-        host->overtaken = QString::fromLatin1(overtaken);
-        desktop::setWindowDriver(host);
+        QString left;
+        const test::Hands hands({{u"frmUtilities"_s, [&](QDialog& window) {
+                                      gConn->execute(QString::fromLatin1(overtaken));
+                                      auto& number = test::control<QLineEdit>(window, "txtQuoteNo");
+                                      number.setText(u"repaired"_s);
+                                      test::control<QPushButton>(window, "Command4").click();
+                                      test::control<QPushButton>(window, "Command1").click();
+                                      left = window.isVisible() ? number.text() : QString();
+                                  }}});
         frmUtilities::ShowForm(u"500"_s, u"0"_s);
-        desktop::setWindowDriver(nullptr);
         desktop::setFailureReporter(nullptr);
         EXPECT_EQ(failures, QList<int>{RowChanged}) << overtaken;
-        EXPECT_TRUE(host->stayed) << overtaken;
-        EXPECT_EQ(host->text, u"repaired"_s) << overtaken;
+        EXPECT_EQ(left, u"repaired"_s) << overtaken;
         EXPECT_EQ(quote("500").text("KESTQuoteNo"), quoteNumber) << overtaken;
         EXPECT_EQ(quote("500").notes(), notes) << overtaken;
     }

@@ -1,11 +1,15 @@
 // The text viewer: what a save writes, what stops it, and leaving with unsaved typing.
 #include "platform/files/files.h"
 #include "shell/SharedVariables.h"
+#include "support/Hands.h"
 #include "support/ScriptedDesktop.h"
 #include "support/TestProfile.h"
 #include "utilities/ExactTextEdit.h"
 #include "utilities/frmLogin.h"
 #include "utilities/frmViewXML.h"
+
+#include <QLineEdit>
+#include <QPushButton>
 
 namespace kest {
 
@@ -87,37 +91,26 @@ TEST_F(Viewer, NothingIsWrittenWithoutThePasswordOrTheYes)
 
 TEST_F(Viewer, ASaveBringsBackAFileThatHasGoneAndReplacesOneThatHasChanged)
 {
-    struct Changer final : desktop::WindowDriver {
-        explicit Changer(std::function<void()> c, std::shared_ptr<desktop::Script> s) : change(c), script(s) {}
-        bool drive(QDialog& window) override
-        {
-            if (window.objectName() == u"frmViewXML"_s)
-                change();
-            return script->drive(window);
-        }
-        std::function<void()> change;
-        std::shared_ptr<desktop::Script> script;
+    const std::function<void()> meanwhile[] = {
+        [] { files::remove(gsCurFolder + file); },
+        [] { files::writeBytes(gsCurFolder + file, "<b/>"); },
     };
-    for (const bool gone : {true, false}) {
+    for (const auto& change : meanwhile) {
+        const ScriptedDesktop desk;
+        const test::Hands hands(
+            {{u"frmViewXML"_s,
+              [&](QDialog& window) {
+                  change();
+                  test::control<QPushButton>(window, "Command2").click();
+              }},
+             {u"frmLogin"_s, [](QDialog& window) {
+                  const qint64 password = DayPassword(QDate::currentDate());
+                  test::control<QLineEdit>(window, "txtPassword").setText(QString::number(password));
+                  test::control<QPushButton>(window, "cmdOK").click();
+              }}});
         files::writeBytes(gsCurFolder + file, "<a>1</a>");
-        const QString password = QString::number(DayPassword(QDate::currentDate()));
-        const QJsonArray loginSteps{QJsonObject{{u"set"_s, u"txtPassword"_s}, {u"text"_s, password}},
-                                    QJsonObject{{u"click"_s, u"cmdOK"_s}}};
-        const QJsonObject windows{{u"frmViewXML"_s, QJsonArray{QJsonArray{QJsonObject{{u"click"_s, u"Command2"_s}}}}},
-                                  {u"frmLogin"_s, QJsonArray{loginSteps}}};
-        const auto script = std::make_shared<desktop::Script>(QJsonObject{{u"windows"_s, windows}});
-        desktop::useScript(script);
-        desktop::setWindowDriver(std::make_shared<Changer>(
-            [gone] {
-                if (gone)
-                    files::remove(gsCurFolder + file);
-                else
-                    files::writeBytes(gsCurFolder + file, "<b/>");
-            },
-            script));
         frmViewXML::ShowForm(file);
-        desktop::useScript(nullptr);
-        EXPECT_EQ(written(), "<a>1</a>\r\n") << gone;
+        EXPECT_EQ(written(), "<a>1</a>\r\n");
     }
 }
 
