@@ -1,10 +1,11 @@
 #include "Sending.h"
 #include "outbound/SendQuote.h"
 #include "platform/RuntimeError.h"
+#include "platform/files/FaultInjection.h"
 #include "platform/files/files.h"
 #include "shell/SharedVariables.h"
 
-#include <QFile>
+#include <QDir>
 
 #include <functional>
 
@@ -151,13 +152,7 @@ TEST_F(Sending, AQuoteIsLockedOnlyWhenItsDocumentStands)
         {"a part without quantity", [](QuoteRow& q) { q.line(2, "PRT").set("qty", nullptr); }, NullValue},
         {"no notes row", [](QuoteRow&) { gConn->execute(u"DELETE FROM QUOTE3"_s); }, NoCurrentRow},
         {"a line number past the highest", [](QuoteRow& q) { q.line(32768).set("rrhour", 1); }, Overflow},
-        {"a disk that is full",
-         [](QuoteRow&) {
-             const QString folder = files::systemPath(gsUnsentPath);
-             QDir().rmdir(folder);
-             QFile(folder.chopped(1)).open(QIODevice::WriteOnly);
-         },
-         PathNotFound},
+        {"a full disk", [](QuoteRow&) { files::setFault([] { return true; }); }, FileInputOutput},
     };
     for (const auto& [what, change, number] : cases) {
         QuoteRow row = sendable();
@@ -168,7 +163,9 @@ TEST_F(Sending, AQuoteIsLockedOnlyWhenItsDocumentStands)
         } catch (const RuntimeError& error) {
             EXPECT_EQ(error.number(), number) << what << ": " << error.what();
         }
+        files::setFault({});
         EXPECT_FALSE(row.locked()) << what;
+        EXPECT_EQ(filesIn(gsUnsentPath), QStringList()) << what;
         EXPECT_EQ(shown(), "");
         for (const char* table : {"QUOTE1", "QUOTE2", "QUOTE3"})
             gConn->execute(u"DELETE FROM "_s + QLatin1StringView(table));

@@ -36,6 +36,21 @@ std::string Sending::sent(const QString& path, const QString& file)
     return node ? node.text().toStdString() : "(none)";
 }
 
+void Sending::addLine(QuoteRow quote, const Text& category, const Text& script, Fields fields)
+{
+    db::Recordset lines(gConn);
+    lines.open(u"SELECT * FROM QUOTE2 WHERE 1=0"_s);
+    lines.addNew();
+    lines.set(u"QTNNO"_s, quote.value("QTNNO"));
+    lines.set(u"Subquote"_s, quote.value("Subquote"));
+    lines.set(u"category"_s, QString(category));
+    lines.set(u"script"_s, QString(script));
+    lines.set(u"PartNo"_s, u""_s);
+    for (const auto& [column, value] : fields)
+        lines.set(column, value);
+    lines.update();
+}
+
 QuoteRow Sending::sendable(const Text& number, int subquote)
 {
     QuoteRow row = quote(number, subquote);
@@ -43,16 +58,21 @@ QuoteRow Sending::sendable(const Text& number, int subquote)
     return row;
 }
 
+QString withRoot(const QString& document)
+{
+    return u"<request xmlns=\""_s + quoteNamespace + u"\">"_s + document + u"</request>"_s;
+}
+
 QStringList readAsXml(const QString& document)
 {
-    QXmlStreamReader reader(u"<request xmlns=\""_s + quoteNamespace + u"\">"_s + document + u"</request>"_s);
+    QXmlStreamReader reader(document);
     QStringList lines;
     qsizetype depth = 0;
     while (!reader.atEnd()) {
         reader.readNext();
         if (reader.isStartElement()) {
             lines.append(QString(2 * depth++, u' ') + reader.name().toString() + u": "_s);
-            if (reader.namespaceUri() != quoteNamespace || reader.attributes().size() > 0)
+            if (reader.namespaceUri() != quoteNamespace || !reader.attributes().isEmpty())
                 lines.last() +=
                     u"(namespace \"%1\", %2 attributes) "_s.arg(reader.namespaceUri()).arg(reader.attributes().size());
         } else if (reader.isEndElement()) {
