@@ -49,6 +49,23 @@ Kind kindOfValue(const QVariant& value)
     }
 }
 
+/// Most values come in the type of their kind already, and stay as they are.
+bool isNormal(const QVariant& value, Kind kind)
+{
+    const int type = value.typeId();
+    switch (kind) {
+        case Kind::Text:
+        case Kind::LongText:
+            return type == QMetaType::QString && !value.isNull();
+        case Kind::WholeNumber:
+            return type == QMetaType::LongLong && !value.isNull();
+        case Kind::Number:
+            return type == QMetaType::Double && !value.isNull();
+        default:
+            return false;
+    }
+}
+
 QString textOf(const QVariant& value)
 {
     if (value.typeId() == QMetaType::QByteArray)
@@ -203,24 +220,23 @@ Rows Engine::selectNative(const QString& statement)
     checkFault();
     QSqlQuery query(database);
     run(query, statement);
-    Rows rows;
-    rows.columns = describe(query);
-    const Rows raw = fetch(query);
-    rows.values.reserve(raw.values.size());
-    const size_t width = size_t(rows.columns.size());
+    const QList<ResultColumn> columns = describe(query);
+    Rows rows = fetch(query);
+    rows.columns = columns;
+    const size_t width = size_t(columns.size());
     for (size_t column = 0; column < width; ++column) {
         ResultColumn& described = rows.columns[qsizetype(column)];
-        if (!described.table.isEmpty())
-            continue;
-        for (size_t i = column; i < raw.values.size(); i += width) {
-            if (raw.values[i].isNull())
+        for (size_t i = column; described.table.isEmpty() && i < rows.values.size(); i += width) {
+            if (rows.values[i].isNull())
                 continue;
-            described.kind = kindOfValue(raw.values[i]);
+            described.kind = kindOfValue(rows.values[i]);
             break;
         }
+        for (size_t i = column; i < rows.values.size(); i += width) {
+            if (!isNormal(rows.values[i], described.kind))
+                rows.values[i] = normalised(rows.values[i], described.kind);
+        }
     }
-    for (size_t i = 0; i < raw.values.size(); ++i)
-        rows.values.push_back(normalised(raw.values[i], rows.columns[qsizetype(i % width)].kind));
     return rows;
 }
 
