@@ -306,20 +306,21 @@ void frmExtraInfo::txtColour_ButtonClick()
 
 void frmExtraInfo::txtColour_Change()
 {
-    const QString typed = txtColour->text();
-    if (typed.isEmpty())
+    if (txtColour->text().isEmpty())
         return;
     QTreeWidgetItem* item = colourBeginningWithText();
     if (!item) {
-        txtColour->setText(typed.size() < 2 ? QString() : acceptedColour);
-        return;
+        txtColour->setText(txtColour->text().size() < 2 ? QString() : acceptedColour);
+        item = txtColour->text().isEmpty() ? nullptr : colourBeginningWithText();
+        if (!item)
+            return;
     }
-    const int count = static_cast<int>(typed.size());
+    const auto typed = static_cast<int>(txtColour->text().size());
     const QString colour = item->text(0);
     txtColour->setText(colour);
     // from the end, so that the cursor stands where typing goes on
-    txtColour->setSelection(static_cast<int>(colour.size()), count - static_cast<int>(colour.size()));
-    acceptedColour = colour.left(count);
+    txtColour->setSelection(static_cast<int>(colour.size()), typed - static_cast<int>(colour.size()));
+    acceptedColour = colour.left(typed);
     selectColour(item);
 }
 
