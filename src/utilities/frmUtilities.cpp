@@ -47,7 +47,7 @@ constexpr Field fields[] = {
 };
 
 /// The one value that a query gives, or the empty text.
-QString looked(const QString& select)
+QString firstValueOf(const QString& select)
 {
     db::Recordset row(gConn);
     row.open(select);
@@ -206,9 +206,9 @@ void frmUtilities::Fill()
     const bool isMainQuote = SubquoteOfRow() == u"0"_s;
     box("txtQTNNO"_L1)->setText(quote.text(u"QTNNO"_s) + (isMainQuote ? QString() : u'/' + SubquoteOfRow()));
     box("txtJobStage"_L1)
-        ->setText(looked(sql("SELECT description FROM JOBSTAGE WHERE stage={}", quote.value(u"Job_stage"_s))));
+        ->setText(firstValueOf(sql("SELECT description FROM JOBSTAGE WHERE stage={}", quote.value(u"Job_stage"_s))));
     box("txtInsurer"_L1)
-        ->setText(looked(sql("SELECT NAME FROM INSURER WHERE INSURER_ID={}", quote.value(u"INSURER_ID"_s))));
+        ->setText(firstValueOf(sql("SELECT NAME FROM INSURER WHERE INSURER_ID={}", quote.value(u"INSURER_ID"_s))));
     chkReadOnly->setChecked(isTrue(quote.value(u"ReadOnly"_s)));
     chkExtraInfo->setChecked(isTrue(quote.value(u"ExtraInfo"_s)));
     txtRemarks->setExactText(remarks.eof() ? QString() : remarks.text(u"remarks"_s));

@@ -1,4 +1,4 @@
-// The password question: what is let in, what is said, and how the field tells that it has the focus.
+// The password question: what is let in, what is said, and how its controls tell where one stands.
 #include "support/Hands.h"
 #include "support/ScriptedDesktop.h"
 #include "support/TestProfile.h"
@@ -10,21 +10,7 @@
 namespace kest {
 
 using namespace Qt::StringLiterals;
-using test::ScriptedDesktop;
-using test::TestProfile;
-
-namespace {
-
-bool login(const std::string& steps, QStringList& boxes)
-{
-    ScriptedDesktop desk(("{\"windows\": {\"frmLogin\": [[" + steps + "]]}}").c_str());
-    bool ok = true;
-    frmLogin::ShowForm(ok);
-    boxes = desk.boxes();
-    return ok;
-}
-
-}  // namespace
+using test::control;
 
 TEST(Login, ThePasswordIsANumberThatChangesEachDay)
 {
@@ -34,77 +20,60 @@ TEST(Login, ThePasswordIsANumberThatChangesEachDay)
 
 TEST(Login, OnlyTheDaysNumberPassesAndOnlyAWrongNumberIsRemarkedOn)
 {
-    const TestProfile profile;
+    const test::TestProfile profile;
     const std::string password = std::to_string(DayPassword(QDate::currentDate()));
+    const std::string ok = R"({"click": "cmdOK"})";
     struct {
-        std::string typed;
-        bool passes;
-        bool remarked;
+        std::string typed, answer;
+        bool passes, remarked;
     } const cases[] = {
-        {password, true, false},
-        {"000" + password, true, false},
-        {password + ".0", true, false},
-        {password + "1", false, true},
-        {"0", false, true},
-        {"secret", false, false},
-        {password + "x", false, false},
+        {password, ok, true, false},
+        {"000" + password, ok, true, false},
+        {password, R"({"key": "txtPassword", "keys": "Return"})", true, false},
+        {"0", ok + R"(, {"set": "txtPassword", "text": ")" + password + "\"}, " + ok, true, true},
+        {password + "1", ok, false, true},
+        {password + "x", ok, false, false},
+        {password, R"({"click": "cmdCancel"})", false, false},
+        {password, R"({"key": "frmLogin", "keys": "Escape"})", false, false},
     };
-    for (const auto& [typed, passes, remarked] : cases) {
-        QStringList boxes;
-        EXPECT_EQ(login("{\"set\": \"txtPassword\", \"text\": \"" + typed + "\"}, {\"click\": \"cmdOK\"}", boxes),
-                  passes)
-            << typed;
-        EXPECT_EQ(boxes, remarked ? QStringList(u"exclamation|Login|Invalid Password, try again!|ok"_s) : QStringList())
-            << typed;
+    for (const auto& [typed, answer, passes, remarked] : cases) {
+        const test::ScriptedDesktop desk(
+            (R"({"windows": {"frmLogin": [[{"set": "txtPassword", "text": ")" + typed + "\"}, " + answer + "]]}}")
+                .c_str());
+        bool passed = !passes;
+        frmLogin::ShowForm(passed);
+        EXPECT_EQ(passed, passes) << typed << answer;
+        EXPECT_EQ(desk.boxes().join(u'\n'),
+                  remarked ? u"exclamation|Login|Invalid Password, try again!|ok"_s : QString())
+            << typed << answer;
     }
 }
 
-TEST(Login, AnotherTryAndEnterAreTakenAndCancelIsNot)
+TEST(Login, TheControlsTellWhereOneStands)
 {
-    const TestProfile profile;
-    const QString password = QString::number(DayPassword(QDate::currentDate()));
-    QString keys;  // the wrong text is marked, so that typing replaces it
-    for (const QChar digit : password)
-        keys += u"\"%1\", "_s.arg(digit);
-    QStringList boxes;
-    EXPECT_TRUE(login(R"({"set": "txtPassword", "text": "1"}, {"click": "cmdOK"}, {"key": "txtPassword", "keys": [)" +
-                          keys.toStdString() + R"("Return"]})",
-                      boxes));
-    EXPECT_EQ(boxes.size(), 1);
-    const std::string typed = R"({"set": "txtPassword", "text": ")" + password.toStdString() + R"("}, )";
-    EXPECT_FALSE(login(typed + R"({"click": "cmdCancel"})", boxes));
-    EXPECT_FALSE(login(typed + R"({"key": "frmLogin", "keys": "Escape"})", boxes));
-}
-
-TEST(Login, OkIsEnabledByTheFirstTextAndNeverDisabledAgain)
-{
-    const TestProfile profile;
-    ScriptedDesktop desk(R"({"windows": {"frmLogin": [[ {"read": "cmdOK"},
-        {"set": "txtPassword", "text": "1"}, {"set": "txtPassword", "text": ""}, {"click": "cmdOK"}, {"read": "cmdOK"} ]]}})");
-    bool ok = true;
-    frmLogin::ShowForm(ok);
-    EXPECT_FALSE(ok);
-    EXPECT_EQ(desk.boxTexts(), QStringList());
-    const QJsonArray& reads = desk.record().reads;
-    ASSERT_EQ(reads.size(), 2);
-    EXPECT_FALSE(reads[0][u"values"_s][u"cmdOK"_s][u"enabled"_s].toBool(true));
-    EXPECT_TRUE(reads[1][u"values"_s][u"cmdOK"_s][u"enabled"_s].toBool(false));
-}
-
-TEST(Login, TheFieldIsYellowWithTheFocusAndCyanWithout)
-{
-    const TestProfile profile;
-    QColor withFocus, without;
-    const test::Hands hands({{u"frmLogin"_s, [&](QDialog& window) {
-                                  const auto& password = test::control<QLineEdit>(window, "txtPassword");
-                                  withFocus = password.palette().color(QPalette::Base);
-                                  test::control<QPushButton>(window, "cmdCancel").setFocus();
-                                  without = password.palette().color(QPalette::Base);
+    const test::TestProfile profile;
+    const test::ScriptedDesktop desk;
+    const test::Hands hands({{u"frmLogin"_s, [](QDialog& window) {
+                                  auto& password = control<QLineEdit>(window, "txtPassword");
+                                  auto& ok = control<QPushButton>(window, "cmdOK");
+                                  EXPECT_EQ(password.palette().color(QPalette::Base), QColor(Qt::yellow));
+                                  EXPECT_FALSE(ok.isEnabled());
+                                  password.setText(u"1"_s);
+                                  password.clear();
+                                  EXPECT_TRUE(ok.isEnabled()) << "it is never disabled again";
+                                  ok.setFocus();
+                                  EXPECT_EQ(password.palette().color(QPalette::Base), QColor(Qt::cyan));
+                                  ok.click();
+                                  EXPECT_TRUE(window.isVisible());
+                                  password.setText(u"1"_s);
+                                  ok.click();
+                                  EXPECT_TRUE(password.hasFocus());
+                                  EXPECT_EQ(password.selectedText().size(), 1);
                               }}});
-    bool ok = true;
-    frmLogin::ShowForm(ok);
-    EXPECT_EQ(withFocus, QColor(Qt::yellow));
-    EXPECT_EQ(without, QColor(Qt::cyan));
+    bool passed = true;
+    frmLogin::ShowForm(passed);
+    EXPECT_FALSE(passed);
+    EXPECT_EQ(desk.boxes().size(), 1);
 }
 
 }  // namespace kest
