@@ -563,12 +563,17 @@ void Recordset::find(const QString& text)
     auto hit = visible.end();
     if (criterion.comparison == Criterion::Comparison::Equal && criterion.operand) {
         const std::optional<QString> key = equalityKey(*criterion.operand, columnKind);
-        const Bucket bucket = key && from != visible.end() ? data->indexOf(column).value(*key) : Bucket();
-        for (auto row = from == visible.end() ? bucket.end() : std::lower_bound(bucket.begin(), bucket.end(), *from);
-             row != bucket.end() && hit == visible.end(); ++row) {
-            const auto place = std::lower_bound(from, visible.end(), *row);
-            if (place != visible.end() && *place == *row)
-                hit = place;
+        if (key && from != visible.end()) {
+            static const Bucket noRows;
+            const Index& index = data->indexOf(column);
+            const auto found = index.constFind(*key);
+            const Bucket& bucket = found == index.constEnd() ? noRows : *found;
+            for (auto row = std::lower_bound(bucket.begin(), bucket.end(), *from);
+                 row != bucket.end() && hit == visible.end(); ++row) {
+                const auto place = std::lower_bound(from, visible.end(), *row);
+                if (place != visible.end() && *place == *row)
+                    hit = place;
+            }
         }
     } else {
         hit = std::find_if(from, visible.end(),
