@@ -43,15 +43,21 @@ QString Transmission(const QString& code)
 /// What the message tells and the load stores. Reading it fails for every element that is missing or malformed, those
 /// that only the report shows included: before anything is written.
 struct Request {
-    explicit Request(const xml::Document& message);
+    /// Enough to tell whether the request is known.
+    void readKey(const xml::Document& message);
+    void readRest(const xml::Document& message);
 
+    QString number;
+    QString version;
+    QString claim;
+    QString rego;
     QString companyName;
     QString title;
     QString firstName;
     QString surname;
-    bool extraInformation;
-    qint64 builtYear;
-    qint64 builtMonth;
+    bool extraInformation = false;
+    qint64 builtYear = 0;
+    qint64 builtMonth = 0;
     QString transmission;
     QString cylinders;
     QString vin;
@@ -60,7 +66,15 @@ struct Request {
     QString odometer;
 };
 
-Request::Request(const xml::Document& message)
+void Request::readKey(const xml::Document& message)
+{
+    rego = NormaliseRego(message.textOf(u"//rootns:vehicleRegistration"_s));
+    number = message.textOf(u"//rootns:quoteRequestNumber"_s);
+    version = message.textOf(u"//rootns:quoteRequestVersionNumber"_s);
+    claim = message.textOf(u"//rootns:claimNumber"_s);
+}
+
+void Request::readRest(const xml::Document& message)
 {
     for (const QLatin1StringView shownOnly :
          {"claimDescription"_L1, "claimManager"_L1, "corporateCustomer"_L1, "vehicleLocation"_L1, "bayNumber"_L1,
@@ -177,13 +191,13 @@ QString ColourOf(const QString& code, db::Recordset& colours)
     return colours.eof() ? u""_s : colours.text(u"Script"_s).trimmed();
 }
 
-void FillNewCar(db::Recordset& car, const QString& rego, const Request& request, db::Recordset& colours)
+void FillNewCar(db::Recordset& car, const Request& request, db::Recordset& colours)
 {
     const db::Recordset model = Opened(u"SELECT * FROM MODEL WHERE MODEL_ID1='Z000'"_s);
     const QString none = u""_s;
     Fill(car, {
                   {"PAINT_GP"_L1, PaintGroup(request.paintType)},
-                  {"REGO"_L1, rego},
+                  {"REGO"_L1, request.rego},
                   {"KEST"_L1, 1},
                   {"MODEL_ID"_L1, model.value(u"MODEL_ID"_s)},
                   {"BODY_ID"_L1, u"4"_s},
@@ -206,12 +220,19 @@ void FillNewCar(db::Recordset& car, const QString& rego, const Request& request,
         car.set(u"CYLINDERS"_s, SafeVal(request.cylinders, u"0"_s));
 }
 
-void FillQuote(db::Recordset& quote, const Request& request, const db::Recordset& insurer, const db::Recordset& cinfo)
+void FillQuote(db::Recordset& quote, const QString& quoteNumber, const Request& request, const db::Recordset& insurer,
+               const db::Recordset& cinfo)
 {
     Fill(quote, {
                     {"QUOTER"_L1, u""_s},
+                    {"QTNNO"_L1, quoteNumber},
+                    {"Subquote"_L1, 0},
                     {"qtndate"_L1, shortDate(QDate::currentDate())},
                     {"INSURER_ID"_L1, insurer.value(u"INSURER_ID"_s)},
+                    {"KESTQRNo"_L1, request.number},
+                    {"KESTQRVer"_L1, request.version},
+                    {"Claim"_L1, request.claim},
+                    {"REGO"_L1, request.rego},
                     {"RR_RATE"_L1, insurer.value(u"RR_RATE"_s)},
                     {"RA_RATE"_L1, insurer.value(u"RA_RATE"_s)},
                     {"QSENT"_L1, u"R"_s},
@@ -272,18 +293,16 @@ bool LoadQREQ(QString& text, const QString&)
     db::Recordset quote(gConn);
     const QString quoteNumber = NextQuoteNumber({}, cinfo, quote, false);
     db::Recordset notes = Opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}'", quoteNumber));
-    const QString rego = NormaliseRego(message.textOf(u"//rootns:vehicleRegistration"_s));
-    db::Recordset car = Opened(sql("SELECT * FROM CAR WHERE REGO='{}'", rego));
+    Request request;
+    request.readKey(message);
+    db::Recordset car = Opened(sql("SELECT * FROM CAR WHERE REGO='{}'", request.rego));
     db::Recordset colours = Opened(u"SELECT * FROM KESTColours"_s);
 
-    const QString requestNumber = message.textOf(u"//rootns:quoteRequestNumber"_s);
-    const QString version = message.textOf(u"//rootns:quoteRequestVersionNumber"_s);
-    const QString claim = message.textOf(u"//rootns:claimNumber"_s);
-    const db::Recordset known = Opened(
-        sql("SELECT * FROM QUOTE1 WHERE SUBQUOTE=0 AND KESTQRNO='{}' AND KESTQRVER='{}'", requestNumber, version));
+    const db::Recordset known = Opened(sql("SELECT * FROM QUOTE1 WHERE SUBQUOTE=0 AND KESTQRNO='{}' AND KESTQRVER='{}'",
+                                           request.number, request.version));
     if (!known.eof())
         return Refuse(u"Quote Request already exists as quote number "_s + known.text(u"QTNNO"_s) + u'!');
-    const Request request(message);
+    request.readRest(message);
 
     const bool carFound = !car.eof();
     if (carFound) {
@@ -300,13 +319,7 @@ bool LoadQREQ(QString& text, const QString&)
     if (notes.eof())
         notes.addNew();
 
-    FillQuote(quote, request, insurer, cinfo);
-    Fill(quote, {{"QTNNO"_L1, quoteNumber},
-                 {"Subquote"_L1, 0},
-                 {"KESTQRNo"_L1, requestNumber},
-                 {"KESTQRVer"_L1, version},
-                 {"Claim"_L1, claim},
-                 {"REGO"_L1, rego}});
+    FillQuote(quote, quoteNumber, request, insurer, cinfo);
     Fill(notes, {{"QTNNO"_L1, quoteNumber}, {"Subquote"_L1, 0}});
     Apply(quoteRequested, quote, notes);
     if (!customerFound)
@@ -314,7 +327,7 @@ bool LoadQREQ(QString& text, const QString&)
     if (carFound)
         RespellColour(car, colours);
     else
-        FillNewCar(car, rego, request, colours);
+        FillNewCar(car, request, colours);
     quote.set(u"paint_rate"_s, insurer.value(car.text(u"PAINT_GP"_s) + u"_RATE"_s));
 
     customer.update();
@@ -323,7 +336,7 @@ bool LoadQREQ(QString& text, const QString&)
     quote.update();
     notes.update();
 
-    TakePhotographs(message.documentElement(), requestNumber, quoteNumber);
+    TakePhotographs(message.documentElement(), request.number, quoteNumber);
 
     db::Recordset tried(gConn);
     cinfo.set(u"QUOTE_VAL"_s, NextQuoteNumber(quoteNumber, cinfo, tried, true));
