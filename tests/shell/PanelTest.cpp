@@ -53,6 +53,7 @@ EXPECT_TRUE(desktop->read(u"cmdOK"_s, u"enabled"_s).toBool());
 
 TEST_F(Panel, WithoutAConnectionItIsNotShown)
 {
+    gConn->close();
     files::remove(profile::root() + u"/databases/WirSql.db"_s);
     show("500", R"json([{"read": ["cmdOK"]}])json");
     EXPECT_EQ(desktop->boxTexts(),
