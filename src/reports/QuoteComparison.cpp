@@ -1,0 +1,438 @@
+#include "reports/QuoteComparison.h"
+
+#include "platform/RuntimeError.h"
+#include "platform/database/Sql.h"
+#include "platform/values.h"
+#include "reports/ReportTable.h"
+#include "shell/SharedVariables.h"
+
+#include <span>
+#include <vector>
+
+namespace kest {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+constexpr int descriptionLength = 39;
+constexpr int repairerLength = 49;
+
+constexpr ReportField fields[] = {
+    {"KESTQuoteNo", 12}, {"comment", 3000},    {"authority_no", 20}, {"complete_date", 15}, {"ass_name", 40},
+    {"ass_ph", 20},      {"ass_fax", 20},      {"excess", 20},       {"contri", 20},        {"auth_amt", 20},
+    {"quote_ref", 20},   {"quote_type", 4},    {"action", 1},        {"line_no", 5},        {"itemno", 5},
+    {"lab_grp", 20},     {"paint_grp", 20},    {"category", 4},      {"script", 39},        {"amount", 20},
+    {"vendor", 20},      {"old_amount", 20},   {"qty", 20},          {"old_qty", 20},       {"gst", 20},
+    {"quote_total", 20}, {"sub_repairer", 30}, {"total_md", 20},
+};
+
+// A path is read from the message, anything else stands as it is; null is worked out elsewhere.
+struct HeaderField {
+    const char* name;
+    const char* authorised;
+    const char* adjusted;
+};
+
+// clang-format off
+constexpr HeaderField headerFields[] = {
+    {"KESTQuoteNo",   "//rootns:kestAuthorisedQuoteNumber",         "//rootns:kestAdjustedQuoteNumber"},
+    {"comment",       "//rootns:assessmentComment",                 "//rootns:assessmentComment"},
+    {"authority_no",  "//rootns:authorityNumber",                   "0"},
+    {"complete_date", "//rootns:repairCompletionDate",              ""},
+    {"ass_name",      "//rootns:orlaContact/rootns:name",           ""},
+    {"ass_ph",        "//rootns:orlaContact/rootns:phone",          ""},
+    {"ass_fax",       "//rootns:orlaContact/rootns:fax",            ""},
+    {"excess",        nullptr,                                      "0"},
+    {"contri",        nullptr,                                      "0"},
+    {"auth_amt",      "//rootns:authorisedAmount",                  "0"},
+    {"quote_ref",     "//rootns:quoteBody/rootns:quoteReference",   "//rootns:quoteBody/rootns:quoteReference"},
+    {"quote_type",    "AUTR",                                       "ADJR"},
+    {"quote_total",   nullptr,                                      "//rootns:quoteBody/rootns:quoteTotal"},
+    {"sub_repairer",  "",                                           ""},
+};
+
+enum class Section { Labour, Part, Paint, Sublet };
+
+// With which value a field of a line starts.
+struct Start {
+    enum From { Unset, Literal, Element, Number, NumberOrUnset, Tenth } from = Unset;
+    const char* text = "";
+};
+
+constexpr Start unset{};
+constexpr Start is(const char* text)            { return {Start::Literal, text}; }
+constexpr Start of(const char* element)         { return {Start::Element, element}; }
+constexpr Start number(const char* element)     { return {Start::Number, element}; }         // 0 where it is empty
+constexpr Start numberIfAny(const char* element) { return {Start::NumberOrUnset, element}; }
+constexpr Start tenthOf(const char* element)    { return {Start::Tenth, element}; }          // 0 where it is empty
+
+struct StartField {
+    const char* name;
+    Start sections[4];  // labour, part, paint, sublet
+};
+
+constexpr StartField authorisedStart[] = {
+    {"itemno",     {is(""),                  is(""),                is(""),                 is("")}},
+    {"lab_grp",    {of("labourGroup"),       is(""),                is(""),                 is("")}},
+    {"paint_grp",  {is(""),                  is(""),                of("paintGroup"),       is("")}},
+    {"category",   {of("labourType"),        is(""),                of("paintWorkType"),    of("subletType")}},
+    {"script",     {of("labourDescription"), of("partDescription"), of("paintDescription"), of("subletDescription")}},
+    {"amount",     {of("labourAmount"),      of("partUnitPrice"),   of("paintAmount"),      is("0")}},
+    {"qty",        {is("1"),                 of("partQuantity"),    is("1"),                is("1")}},
+    {"old_qty",    {unset,                   unset,                 unset,                  is("0")}},
+    {"old_amount", {unset,                   unset,                 unset,                  is("0")}},
+    {"gst",        {is("0"),                 is("0"),               is("0"),                is("0")}},
+    {"total_md",   {is("0"),                 is("0"),               is("0"),                is("0")}},
+};
+
+constexpr StartField adjustedStart[] = {
+    {"itemno",     {is("000"),               is("000"),             is("000"),              of("quoteLineNumber")}},
+    {"lab_grp",    {of("labourGroup"),       is(""),                is(""),                 is("")}},
+    {"paint_grp",  {is(""),                  is(""),                of("paintGroup"),       is("")}},
+    {"category",   {of("labourType"),        is(""),                of("paintWorkType"),    of("subletType")}},
+    {"script",     {of("labourDescription"), of("partDescription"), of("paintDescription"), of("subletDescription")}},
+    {"amount",     {number("labourAmount"),  numberIfAny("partUnitPrice"), number("paintAmount"), is("0")}},
+    {"qty",        {is("0"),                 of("partQuantity"),    is("0"),                is("1")}},
+    {"old_qty",    {is("0"),                 unset,                 unset,                  is("0")}},
+    {"old_amount", {unset,                   unset,                 unset,                  is("0")}},
+    {"gst",        {is("0"),                 tenthOf("partAmount"), is("0"),                is("0")}},
+    {"total_md",   {is("0"),                 is("0"),               is("0"),                is("0")}},
+};
+// clang-format on
+
+constexpr std::pair<Section, const char*> sections[] = {
+    {Section::Labour, "rootns:labours/*"},
+    {Section::Part, "rootns:parts/*"},
+    {Section::Paint, "rootns:paints/*"},
+    {Section::Sublet, "rootns:sublets/*"},
+};
+
+bool IsBlank(const QString& text)
+{
+    return text.trimmed().isEmpty();
+}
+
+/// One line of the message. A deleted one has its number and nothing else.
+struct Line {
+    xml::Node node;
+    QString indicator;
+
+    bool isChanged() const { return indicator == u"C"_s; }
+    bool isDeleted() const { return indicator == u"D"_s; }
+    bool isUnchanged() const { return indicator == u"N"_s; }
+
+    QString number() const { return node.textOrEmptyOf(u"rootns:quoteLineNumber"_s); }
+    QString text(const char* element) const
+    {
+        const bool isTold = !isDeleted() || qstrcmp(element, "quoteLineNumber") == 0;
+        return isTold ? node.textOrEmptyOf(u"rootns:"_s + QString::fromLatin1(element)) : QString();
+    }
+};
+
+QVariant StartValue(const Start& start, const Line& line)
+{
+    if (start.from == Start::Unset)
+        return {};
+    if (start.from == Start::Literal)
+        return QString::fromLatin1(start.text);
+    const QString text = line.text(start.text);
+    if (start.from == Start::Element)
+        return text;
+    if (IsBlank(text))
+        return start.from == Start::NumberOrUnset ? QVariant() : QVariant(0);
+    return start.from == Start::Tenth ? toDouble(text) * 0.1 : toDouble(text);
+}
+
+/// Null where one of the two is.
+QVariant Product(const db::Recordset& row, const QString& hours, const QString& rate)
+{
+    if (row.isNull(hours) || row.isNull(rate))
+        return {};
+    return toDouble(row.value(hours)) * toDouble(row.value(rate));
+}
+
+// What a deleted line takes over from the shop's quote, where its own value says nothing.
+enum class SaysNothing { EmptyText, Zero };
+
+void TakeOver(db::Recordset& row, const QString& field, const QString& oldField, SaysNothing test)
+{
+    const QString own = row.text(field);
+    const bool isEmpty = IsBlank(own) || (test == SaysNothing::Zero && toDouble(own) == 0);
+    if (isEmpty && !IsBlank(row.text(oldField)))
+        row.set(field, row.value(oldField));
+}
+
+/// Puts the shop's values beside those of the message: the row added last in the table, and the shop's line.
+class Comparison {
+public:
+    Comparison(db::Recordset& reportRow, const db::Recordset& shopLine, const Line& messageLine,
+               ComparisonOf comparison)
+        : row(reportRow), shop(shopLine), line(messageLine), isAuthorised(comparison == ComparisonOf::AuthorisedQuote)
+    {
+    }
+
+    void labour();
+    void part();
+    void paint();
+    void sublet(db::Recordset& subletTypes);
+
+private:
+    bool has(const QString& column) const { return !IsBlank(shop.text(column)); }
+    void takeOverWhereDeleted();
+    void takeScriptWhereEmpty();
+    void takeItemNo();
+    QVariant oldLabourAmount(const QString& type) const;
+
+    db::Recordset& row;
+    const db::Recordset& shop;
+    const Line& line;
+    bool isAuthorised;
+};
+
+void Comparison::takeOverWhereDeleted()
+{
+    if (!line.isDeleted())
+        return;
+    const SaysNothing test = isAuthorised ? SaysNothing::Zero : SaysNothing::EmptyText;
+    TakeOver(row, u"qty"_s, u"old_qty"_s, test);
+    TakeOver(row, u"amount"_s, u"old_amount"_s, test);
+}
+
+void Comparison::takeScriptWhereEmpty()
+{
+    if (has(u"script"_s) && IsBlank(row.text(u"script"_s)))
+        row.set(u"script"_s, shop.text(u"script"_s).trimmed());
+}
+
+void Comparison::takeItemNo()
+{
+    if (has(u"itemno"_s))
+        row.set(u"itemno"_s, shop.value(u"itemno"_s));
+}
+
+QVariant Comparison::oldLabourAmount(const QString& type) const
+{
+    const QString rate = u"rr_rate2"_s;
+    if (type == u"RR"_s)
+        return Product(shop, u"rrhour"_s, rate);
+    if (type == u"REPR"_s)
+        return Product(shop, u"rahour"_s, rate);
+    if (!shop.isNull(u"unitcost"_s))
+        return shop.value(u"unitcost"_s);
+    for (const QString& hours : {u"rrhour"_s, u"rahour"_s, u"pthour"_s})
+        if (!shop.isNull(hours))
+            return Product(shop, hours, rate);
+    return {};
+}
+
+void Comparison::labour()
+{
+    QString type = line.text("labourType");
+    if (IsBlank(type)) {
+        const QString category = shop.text(u"category"_s);
+        type = category == u"R&R"_s ? u"RR"_s : category == u"RA"_s ? u"REPR"_s : u"OTH"_s;
+        row.set(u"category"_s, type);
+    }
+    if (line.isDeleted()) {
+        row.set(u"script"_s, shop.text(u"script"_s));
+        row.set(u"amount"_s, isAuthorised ? u"0"_s : u""_s);
+        row.set(u"gst"_s, 0);
+    }
+    if (!isAuthorised && line.isDeleted())
+        row.set(u"old_qty"_s, 0);
+    else if (!shop.isNull(u"qty"_s))
+        row.set(u"old_qty"_s, shop.value(u"qty"_s));
+    const QVariant oldAmount = oldLabourAmount(type);
+    if (!oldAmount.isNull())
+        row.set(u"old_amount"_s, oldAmount);
+    takeOverWhereDeleted();
+    takeScriptWhereEmpty();
+    takeItemNo();
+}
+
+void Comparison::part()
+{
+    const bool isQuantityKept = row.text(u"qty"_s).trimmed() == shop.text(u"qty"_s).trimmed();
+    if (isAuthorised || isQuantityKept) {
+        if (line.isChanged() || line.isDeleted())
+            row.set(u"old_qty"_s, 0);
+        if (line.isChanged())
+            row.set(u"qty"_s, 0);
+        if (line.isDeleted()) {
+            row.set(u"qty"_s, shop.value(u"qty"_s));
+            row.set(u"script"_s, shop.text(u"script"_s));
+            row.set(u"amount"_s, shop.value(u"rrhour"_s));
+            row.set(u"gst"_s, 0);
+        }
+    }
+    if ((isAuthorised || !isQuantityKept) && has(u"qty"_s))
+        row.set(u"old_qty"_s, shop.value(u"qty"_s));
+    takeScriptWhereEmpty();
+    if (has(u"unitcost"_s))
+        row.set(u"old_amount"_s, shop.value(u"unitcost"_s));
+    takeOverWhereDeleted();
+    takeItemNo();
+}
+
+void Comparison::paint()
+{
+    if (IsBlank(line.text("paintWorkType")))
+        row.set(u"category"_s, u"PAIN"_s);
+    if (line.isDeleted()) {
+        row.set(u"script"_s, shop.text(u"script"_s));
+        row.set(u"amount"_s, 0);
+        row.set(u"gst"_s, 0);
+    }
+    row.set(u"old_qty"_s, has(u"qty"_s) ? shop.text(u"qty"_s).trimmed() : u"0"_s);
+    if (has(u"pthour"_s))
+        row.set(u"old_amount"_s,
+                has(u"rr_rate2"_s) ? Product(shop, u"pthour"_s, u"rr_rate2"_s) : shop.value(u"pthour"_s));
+    else
+        row.set(u"old_amount"_s, 0);
+    if (line.isDeleted()) {
+        TakeOver(row, u"qty"_s, u"old_qty"_s, SaysNothing::Zero);
+        TakeOver(row, u"amount"_s, u"old_amount"_s, SaysNothing::Zero);
+    }
+    row.set(u"itemno"_s, has(u"itemno"_s) ? shop.text(u"itemno"_s) : u""_s);
+    takeScriptWhereEmpty();
+}
+
+void Comparison::sublet(db::Recordset& subletTypes)
+{
+    if (IsBlank(line.text("subletType")))
+        row.set(u"category"_s, u"MIS"_s);
+    if (line.isDeleted()) {
+        if (subletTypes.recordCount() > 0)
+            subletTypes.moveFirst();
+        subletTypes.find(sql("Type='{}'", shop.value(u"PartNo"_s)));
+        if (!subletTypes.eof())
+            row.set(u"category"_s, subletTypes.value(u"Type"_s));
+        row.set(u"script"_s, u""_s);
+        row.set(u"amount"_s, shop.value(u"unitcost"_s));
+        if (!isAuthorised) {
+            row.set(u"old_qty"_s, 0);
+            row.set(u"gst"_s, 0);
+        }
+    }
+    row.set(u"itemno"_s, has(u"itemno"_s) ? shop.text(u"itemno"_s) : u""_s);
+    takeScriptWhereEmpty();
+}
+
+/// The vendor that the repairer of a sublet line is; a new one where the shop knows none of that name.
+QVariant VendorOf(const Line& line)
+{
+    const QString name = line.text("subletRepairer").left(repairerLength);
+    db::Recordset vendor(gConn);
+    vendor.open(sql("SELECT * FROM VENDOR WHERE NAME LIKE '%{}%'", name));
+    if (vendor.eof()) {
+        vendor.addNew();
+        vendor.set(u"Name"_s, name);
+        vendor.set(u"street"_s, line.text("subletRepairerAddress").left(repairerLength));
+        vendor.set(u"phone"_s, line.text("subletRepairerPhone"));
+        vendor.set(u"Account"_s, 293);
+        for (const QLatin1StringView empty :
+             {"contact"_L1, "suburb"_L1, "Fax"_L1, "accno"_L1, "email"_L1, "vendor_abn"_L1})
+            vendor.set(empty, u""_s);
+        vendor.update();
+    }
+    return vendor.value(u"VENDOR_ID"_s);
+}
+
+void StartRow(db::Recordset& table, const Line& line, Section section, ComparisonOf comparison)
+{
+    table.addNew();
+    table.set(u"action"_s, line.indicator);
+    table.set(u"line_no"_s, line.number());
+    const std::span<const StartField> fieldsOfLine =
+        comparison == ComparisonOf::AuthorisedQuote ? authorisedStart : adjustedStart;
+    for (const StartField& field : fieldsOfLine) {
+        const Start& start = field.sections[static_cast<size_t>(section)];
+        if (const QVariant value = StartValue(start, line); !value.isNull())
+            table.set(QString::fromLatin1(field.name), value);
+    }
+}
+
+}  // namespace
+
+db::Recordset OpenComparison(ComparisonOf comparison)
+{
+    std::vector<ReportField> declared(std::begin(fields), std::end(fields));
+    if (comparison == ComparisonOf::AdjustedQuote)
+        std::erase_if(declared, [](const ReportField& field) { return qstrcmp(field.name, "vendor") == 0; });
+    return OpenReportTable(declared);
+}
+
+ComparisonHeader ReadHeader(const xml::Document& document, ComparisonOf comparison)
+{
+    ComparisonHeader header;
+    for (const HeaderField& field : headerFields) {
+        const char* source = comparison == ComparisonOf::AuthorisedQuote ? field.authorised : field.adjusted;
+        if (!source)
+            continue;
+        const QString text = QString::fromLatin1(source);
+        header.append({QString::fromLatin1(field.name), text.startsWith(u"//"_s) ? document.textOf(text) : text});
+    }
+    return header;
+}
+
+void SetHeader(db::Recordset& table, const ComparisonHeader& header)
+{
+    for (const auto& [field, value] : header)
+        table.set(field, value);
+}
+
+bool FindLine(db::Recordset& lines, const QString& number)
+{
+    if (IsBlank(number) || lines.recordCount() == 0)
+        return false;
+    lines.moveFirst();
+    lines.find(sql("SEQ_NO='{}'", number));
+    return !lines.eof();
+}
+
+void AddChangedLines(db::Recordset& table, const ComparisonHeader& header, const xml::Document& document,
+                     const db::Recordset& quote, db::Recordset& lines, ComparisonOf comparison, bool Reprint)
+{
+    const bool isAuthorised = comparison == ComparisonOf::AuthorisedQuote;
+    const xml::Node body = document.selectSingleNode(u"//rootns:quoteBody"_s);
+    db::Recordset subletTypes(gConn);
+    subletTypes.open(u"SELECT Type, Script FROM SUBLET WHERE Sublet=1"_s);
+    const QVariant total = quote.value(u"TOTAL"_s);
+
+    for (const auto& [section, path] : sections) {
+        QString indicator;  // a line without one has that of the line before it, as when it is loaded
+        for (const xml::Node& node : body.selectNodes(QString::fromLatin1(path))) {
+            if (const xml::Node own = node.selectSingleNode(u"rootns:quoteLineChangeIndicator"_s))
+                indicator = own.text();
+            const Line line{node, indicator};
+            if (line.isUnchanged() || (line.isDeleted() && Reprint))
+                continue;
+            StartRow(table, line, section, comparison);
+            SetHeader(table, header);
+            if (isAuthorised && section == Section::Sublet)
+                table.set(u"vendor"_s, VendorOf(line));
+            if (FindLine(lines, line.number())) {
+                Comparison shown(table, lines, line, comparison);
+                switch (section) {
+                    case Section::Labour:
+                        shown.labour();
+                        break;
+                    case Section::Part:
+                        shown.part();
+                        break;
+                    case Section::Paint:
+                        shown.paint();
+                        break;
+                    case Section::Sublet:
+                        shown.sublet(subletTypes);
+                        break;
+                }
+            }
+            if (!isAuthorised || !total.isNull())
+                table.set(u"total_md"_s, total);
+        }
+    }
+}
+
+}  // namespace kest
