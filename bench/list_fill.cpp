@@ -49,7 +49,7 @@ void readAndParseEach(const QString& folder, const QStringList& names)
             qFatal("%s cannot be read", qPrintable(name));
         const QByteArray bytes = file.readAll();
         xmlDocPtr document =
-            xmlReadMemory(bytes.constData(), static_cast<int>(bytes.size()), nullptr, "windows-1252", XML_PARSE_NONET);
+            xmlReadMemory(bytes.constData(), static_cast<int>(bytes.size()), nullptr, "UTF-8", XML_PARSE_NONET);
         if (!document)
             qFatal("%s does not parse", qPrintable(name));
         xmlFreeDoc(document);
