@@ -1,0 +1,181 @@
+// A send against its floor, the bare statements that it needs and the serialisation of the same tree; and the totals.
+#include "app/QuoteDatabase.h"
+#include "outbound/SendQuote.h"
+#include "platform/database/Sql.h"
+#include "platform/desktop/Prompt.h"
+#include "platform/files/files.h"
+#include "platform/profile.h"
+#include "platform/xml/xml.h"
+#include "quotedata/QuoteTotals.h"
+#include "shell/SharedVariables.h"
+
+#include <QCoreApplication>
+#include <QElapsedTimer>
+#include <QSqlDatabase>
+#include <QSqlError>
+#include <QSqlQuery>
+#include <QSqlRecord>
+#include <QTemporaryDir>
+
+#include <benchmark/benchmark.h>
+
+using namespace Qt::StringLiterals;
+
+namespace kest {
+namespace {
+
+class SaysYes final : public desktop::Answerer {
+    desktop::Answer box(const desktop::Box& box) override { return box.defaultAnswer; }
+    QString input(const desktop::Input&) override { return {}; }
+    void start(const QString&) override {}
+};
+
+void run(const QString& statement)
+{
+    QSqlQuery query(QSqlDatabase::database(QSqlDatabase::connectionNames().constFirst(), false));
+    query.setForwardOnly(true);
+    if (!query.exec(statement))
+        qFatal("%s: %s", qPrintable(statement), qPrintable(query.lastError().text()));
+    const int columns = query.record().count();
+    while (query.next())
+        for (int column = 0; column < columns; ++column)
+            benchmark::DoNotOptimize(query.value(column));
+}
+
+/// A new shop with the quote 1, of so many lines of every kind.
+class BenchShop {
+public:
+    explicit BenchShop(int64_t lines)
+    {
+        profile::setRoot(folder.path());
+        desktop::setAnswerer(std::make_shared<SaysYes>());
+        for (const auto& [variable, path] :
+             {std::pair(&gsUnsentPath, u"c:\\wirdoc\\AUnsent\\"_s), std::pair(&gsSentPath, u"c:\\wirdoc\\ASent\\"_s),
+              std::pair(&gsImagesPath, u"c:\\wirimg\\"_s)}) {
+            files::makeFolder(path);
+            *variable = path;
+        }
+        gConn = app::openEmbedded(u"WirSql"_s);
+        app::createTables(*gConn, app::Dialect::Embedded);
+        app::fillNewShop(*gConn);
+        run(u"INSERT INTO ALLMODEL (MODEL_ID, MAKE, MODEL) VALUES ('C120', 'CORELLA', 'MERIDIAN GL')"_s);
+        run(u"INSERT INTO CUSTOMER (CUST_ID, NAME, FIRSTNAME, SALUTATION) VALUES (1, 'Holloway', 'Kim', 'Ms')"_s);
+        run(u"INSERT INTO CAR (REGO, CUST_ID, MODEL_ID, BODY_ID2, Year, XMission, COLOUR) "
+            "VALUES ('ABC123', 1, 'C120', '4S', '03/2005', 'Manual', 'Silver')"_s);
+        run(u"INSERT INTO QUOTE1 (QTNNO, Subquote, REGO, INSURER_ID, Claim, ReadOnly) "
+            "VALUES ('1', 0, 'ABC123', 1, '7700001', 0)"_s);
+        run(u"INSERT INTO QUOTE3 (QTNNO, Subquote, remarks) VALUES ('1', 0, '')"_s);
+        const char* categories[] = {"R&R", "RA", "PAINT", "PRT", "MIS"};
+        run(u"BEGIN"_s);
+        for (int64_t i = 0; i < lines; ++i)
+            run(
+                sql("INSERT INTO QUOTE2 (QTNNO, Subquote, category, script, rrhour, rahour, pthour, rr_rate2, qty, "
+                    "unitcost, PartNo, MARK) VALUES ('1', 0, '{}', 'Left front guard {}', 1.25, 1.5, 2, 38.5, 1, 20.5, "
+                    "'P{}', '')",
+                    QString::fromLatin1(categories[i % 5]), static_cast<qint64>(i), static_cast<qint64>(i)));
+        run(u"COMMIT"_s);
+    }
+
+    ~BenchShop()
+    {
+        gConn.reset();
+        profile::setRoot({});
+    }
+
+private:
+    QTemporaryDir folder;
+};
+
+/// As before the first send: no line has a number.
+void takeBack()
+{
+    run(u"UPDATE QUOTE1 SET ReadOnly=0, Job_stage=1, quotechanged=0 WHERE QTNNO='1'"_s);
+    run(u"UPDATE QUOTE2 SET SEQ_NO=NULL WHERE QTNNO='1'"_s);
+    run(u"UPDATE QUOTE3 SET remarks='' WHERE QTNNO='1'"_s);
+}
+
+void bareStatements(int64_t lines)
+{
+    const QString ofQuote = u" WHERE QTNNO='1' AND SUBQUOTE=0"_s;
+    for (int i = 0; i < 3; ++i)
+        run(u"SELECT * FROM QUOTE1"_s + ofQuote);
+    for (int i = 0; i < 2; ++i) {
+        run(u"SELECT * FROM CUSTOMER WHERE CUST_ID=1"_s);
+        run(u"SELECT * FROM CAR WHERE REGO='ABC123'"_s);
+        run(u"SELECT * FROM ALLMODEL WHERE MODEL_ID='C120'"_s);
+        run(u"SELECT * FROM QUOTE3"_s + ofQuote);
+        run(u"SELECT * FROM QUOTE2"_s + ofQuote);  // once to round, once to total
+    }
+    run(u"SELECT NAME, KEST FROM INSURER WHERE INSURER_ID=1"_s);
+    run(u"SELECT * FROM QUOTE2 WHERE QTNNO='1' AND SUBQUOTE=0 AND CATEGORY='PRT' AND QTY=0"_s);
+    for (const char* set :
+         {"CATEGORY='R&R' AND PARTNO <> 'M'", "CATEGORY='RA'", "CATEGORY='R&R' AND PARTNO='M'", "CATEGORY='MIS'",
+          "CATEGORY='PRT'", "CATEGORY='PAINT'", "CATEGORY='OPG'", "CATEGORY='MIS' AND VENDOR>0", "REPORT_ON=1"})
+        run(u"SELECT ITEMID, PARTNO, SCRIPT, RRHOUR, RR_RATE2, SEQ_NO FROM QUOTE2"_s + ofQuote + u" AND "_s +
+            QString::fromLatin1(set));
+    for (int64_t i = 1; i <= lines; ++i)
+        run(u"UPDATE QUOTE2 SET SEQ_NO=%1 WHERE itemid=%1"_s.arg(i));
+    run(u"UPDATE QUOTE1 SET TOTAL=1, PRTTOTAL=1, quotechanged=1 WHERE QTNNO='1'"_s);
+    run(u"UPDATE QUOTE1 SET Job_stage=3, ReadOnly=1 WHERE QTNNO='1'"_s);
+    run(u"UPDATE QUOTE3 SET remarks='(22/11/2026 : Sending KEST Quote)' WHERE QTNNO='1'"_s);
+}
+
+void sendQuote(benchmark::State& state)
+{
+    const int64_t lines = state.range(0);
+    const BenchShop shop(lines);
+    db::Recordset panel(gConn);
+    panel.open(u"SELECT * FROM QUOTE1 WHERE QTNNO='1'"_s);
+    qint64 floor = 0;  // nanoseconds
+    qint64 sending = 0;
+    QElapsedTimer timer;
+    for (auto _ : state) {
+        takeBack();
+        timer.start();
+        const double total = SendQuote(panel);
+        const qint64 elapsed = timer.nsecsElapsed();
+        sending += elapsed;
+        state.SetIterationTime(static_cast<double>(elapsed) / 1e9);
+        if (total == 0)
+            state.SkipWithError("the quote was not sent");
+
+        takeBack();
+        const QString document = files::read(gsUnsentPath + u"1.0_1.xml"_s);
+        xml::Document tree;
+        tree.loadXML(u"<request>"_s + document + u"</request>"_s);
+        timer.restart();
+        bareStatements(lines);
+        files::write(gsUnsentPath + u"floor.txt"_s, tree.xml());
+        floor += timer.nsecsElapsed();
+    }
+    state.counters["microseconds_per_line"] =
+        static_cast<double>(sending) / 1e3 / static_cast<double>(lines * static_cast<int64_t>(state.iterations()));
+    state.counters["ratio_to_floor"] = static_cast<double>(sending) / static_cast<double>(floor);
+}
+BENCHMARK(sendQuote)->Arg(10)->Arg(100)->Arg(1000)->Arg(5000)->UseManualTime()->Unit(benchmark::kMillisecond);
+
+void calcTotals(benchmark::State& state)
+{
+    const BenchShop shop(state.range(0));
+    db::Recordset quote(gConn);
+    quote.open(u"SELECT * FROM QUOTE1 WHERE QTNNO='1'"_s);
+    db::Recordset lines(gConn);
+    lines.open(u"SELECT * FROM QUOTE2 WHERE QTNNO='1'"_s);
+    for (auto _ : state)
+        CalcQuoteTotals(quote, lines);
+    state.SetComplexityN(state.range(0));
+    state.counters["lines_per_second"] =
+        benchmark::Counter(static_cast<double>(state.range(0)), benchmark::Counter::kIsIterationInvariantRate);
+}
+BENCHMARK(calcTotals)->RangeMultiplier(10)->Range(10, 10000)->Unit(benchmark::kMillisecond)->Complexity();
+
+}  // namespace
+}  // namespace kest
+
+int main(int argc, char** argv)
+{
+    const QCoreApplication application(argc, argv);
+    benchmark::Initialize(&argc, argv);
+    benchmark::RunSpecifiedBenchmarks();
+    return 0;
+}
