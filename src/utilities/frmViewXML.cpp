@@ -50,6 +50,20 @@ frmViewXML::frmViewXML(const QString& file)
     Command2->setObjectName("Command2"_L1);
     Command2->setText(u"Save"_s);
 
+    fillFindBar();
+
+    desktop::onEvent(Command1, &QPushButton::clicked, this, u"frmViewXML.Command1_Click"_s,
+                     [this] { Command1_Click(); });
+    desktop::onEvent(Command2, &QPushButton::clicked, this, u"frmViewXML.Command2_Click"_s,
+                     [this] { Command2_Click(); });
+    desktop::onEvent(txtXML, &QPlainTextEdit::cursorPositionChanged, this, u"frmViewXML.txtXML_SelChange"_s,
+                     [this] { showPosition(); });
+    desktop::onEvent(txtXML, &QPlainTextEdit::updateRequest, this, u"frmViewXML.txtXML_Paint"_s,
+                     [this] { colourVisibleTags(); });
+}
+
+void frmViewXML::fillFindBar()
+{
     txtFind->setPlaceholderText(u"Find (Ctrl+F)"_s);
     txtFind->setClearButtonEnabled(true);
     auto* previous = new QPushButton(u"Previous"_s);
@@ -70,10 +84,6 @@ frmViewXML::frmViewXML(const QString& file)
         before = control;
     }
 
-    desktop::onEvent(Command1, &QPushButton::clicked, this, u"frmViewXML.Command1_Click"_s,
-                     [this] { Command1_Click(); });
-    desktop::onEvent(Command2, &QPushButton::clicked, this, u"frmViewXML.Command2_Click"_s,
-                     [this] { Command2_Click(); });
     const auto find = [this](auto* sender, auto signal, bool backward) {
         desktop::onEvent(sender, signal, this, u"frmViewXML.Find"_s, [this, backward] { findNext(backward); });
     };
@@ -87,10 +97,6 @@ frmViewXML::frmViewXML(const QString& file)
                          txtFind->setFocus();
                          txtFind->selectAll();
                      });
-    desktop::onEvent(txtXML, &QPlainTextEdit::cursorPositionChanged, this, u"frmViewXML.txtXML_SelChange"_s,
-                     [this] { showPosition(); });
-    desktop::onEvent(txtXML, &QPlainTextEdit::updateRequest, this, u"frmViewXML.txtXML_Paint"_s,
-                     [this] { colourVisibleTags(); });
 }
 
 void frmViewXML::ShowForm(const QString& file)

@@ -28,6 +28,7 @@ protected:
 private:
     explicit frmViewXML(const QString& file);
 
+    void fillFindBar();
     void Command1_Click();
     void Command2_Click();
     void findNext(bool backward);

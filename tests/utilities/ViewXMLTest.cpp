@@ -40,7 +40,8 @@ protected:
                               R"("}, {"click": "cmdOK"}]]}})")
                                  .c_str());
         frmViewXML::ShowForm(file);
-        shown = desk.read(u"txtXML"_s).toString();
+        const QString position = desk.read(u"lblPosition"_s).toString();
+        shown = position.isEmpty() ? desk.read(u"txtXML"_s).toString() : position;
         return desk.boxTexts();
     }
     static QByteArray written() { return files::readBytes(gsCurFolder + file); }
@@ -125,6 +126,28 @@ TEST_F(Viewer, LeavingWithUnsavedTypingIsAskedAbout)
                  desktop::NeedsAnswer)
         << "No keeps the window, which the end of the script then can't close";
     EXPECT_EQ(written(), "<a/>");
+}
+
+TEST_F(Viewer, AFindGoesRoundTheTextAndIsNoTyping)
+{
+    const QByteArray content = "<a><b>1</b><b>2</b></a>";
+    const std::pair<std::string, QString> cases[] = {
+        {R"("Return")", u"Line 2, column 5"_s},
+        {R"("Return", "Return", "Return")", u"Line 2, column 5"_s},
+        {R"("Return", "F3")", u"Line 3, column 5"_s},
+        {R"("Shift+F3")", u"Line 3, column 5"_s},
+    };
+    for (const auto& [keys, place] : cases) {
+        const std::string steps = R"({"key": "txtXML", "keys": "Ctrl+F"}, {"set": "txtFind", "text": "<b>"},
+            {"key": "txtFind", "keys": [)" +
+                                  keys + R"(]}, {"read": "lblPosition"}, {"click": "Command1"})";
+        EXPECT_EQ(view(content, steps), QStringList()) << keys;
+        EXPECT_EQ(shown, place) << keys;
+    }
+    EXPECT_EQ(view(content, R"({"set": "txtFind", "text": "x"}, {"key": "txtFind", "keys": "Return"},
+                               {"read": "lblPosition"})"),
+              QStringList());
+    EXPECT_EQ(shown, u"Not found"_s);
 }
 
 TEST(ExactText, ComesBackAsItWasGivenAndAsItWasEdited)
