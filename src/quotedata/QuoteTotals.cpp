@@ -78,15 +78,24 @@ void AddLine(SectionTotals& totals, const db::Recordset& line, EmptyHours emptyH
         totals.miscellaneous += toDouble(line.value(u"unitcost"_s));
 }
 
+/// From the current line on.
 SectionTotals TotalsOf(db::Recordset& lines, EmptyHours emptyHours)
 {
     SectionTotals totals;
-    if (lines.recordCount() > 0)
-        lines.moveFirst();
     for (; !lines.eof(); lines.moveNext())
         if (Counts(lines))
             AddLine(totals, lines, emptyHours);
     return totals;
+}
+
+double RoundedColumn(const db::Recordset& line, const QString& column)
+{
+    try {
+        return RoundAmount(toDouble(line.value(column)), 2);
+    } catch (const RuntimeError& error) {
+        throw RuntimeError(error.number(), u"%1: %2 of the quote line \"%3\""_s.arg(error.description(), column,
+                                                                                    line.text(u"script"_s)));
+    }
 }
 
 }  // namespace
@@ -94,6 +103,8 @@ SectionTotals TotalsOf(db::Recordset& lines, EmptyHours emptyHours)
 void CalcQuoteTotals(db::Recordset& quote, db::Recordset& lines)
 {
     attempt([&] {
+        if (lines.recordCount() > 0)
+            lines.moveFirst();
         const SectionTotals totals = TotalsOf(lines, EmptyHours::CountAsZero);
         quote.set(u"TOTAL"_s, totals.labour());
         quote.set(u"PRTTOTAL"_s, totals.parts);
@@ -109,6 +120,8 @@ void CalcQuoteTotals(db::Recordset& quote, db::Recordset& lines)
 void CalcAuthorisedTotals(db::Recordset& quote, db::Recordset& lines)
 {
     attempt([&] {
+        if (!lines.eof())
+            lines.moveFirst();
         const SectionTotals totals = TotalsOf(lines, EmptyHours::Fail);
         quote.set(u"TOTAL"_s, totals.labour());
         quote.set(u"PRTTOTAL"_s, totals.parts);
@@ -126,7 +139,7 @@ void RoundQuoteLines(db::Recordset& quote)
     for (; !lines.eof(); lines.moveNext()) {
         for (const auto& column : {u"unitcost"_s, u"rrhour"_s, u"rahour"_s, u"pthour"_s})
             if (!lines.text(column).isEmpty())
-                lines.set(column, RoundAmount(toDouble(lines.value(column)), 2));
+                lines.set(column, RoundedColumn(lines, column));
         lines.update();
     }
     lines.requery();

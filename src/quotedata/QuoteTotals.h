@@ -11,7 +11,8 @@ namespace kest {
 void CalcQuoteTotals(db::Recordset& quote, db::Recordset& lines);
 
 /// The same for a quote whose lines carry authorised amounts: all labour goes into `TOTAL`, the totals of the single
-/// labour sections stay as they are, and a Null in the hours is a failure too.
+/// labour sections stay as they are, and a Null in the hours is a failure too. `lines` that stand at their end count
+/// nothing: the caller hands them over on a line.
 void CalcAuthorisedTotals(db::Recordset& quote, db::Recordset& lines);
 
 /// Rounds the stored money and hours of all lines of a quote, then runs `CalcQuoteTotals`. Failures are thrown.

@@ -192,6 +192,17 @@ TEST_F(Totals, AuthorisedLabourIsOneSumAndTheSectionsStay)
     EXPECT_EQ(quote("500").text("RR_TOTAL") + quote("500").text("RA_TOTAL") + quote("500").text("PAINT_TOTAL"), "123");
 }
 
+TEST_F(Totals, LinesThatAreWalkedAlreadyCountOnlyForASend)
+{
+    part(quote("500"), 1, 1, 40);
+    Opened opened(u"500"_s);
+    opened.lines.moveNext();
+    CalcQuoteTotals(opened.header, opened.lines);
+    EXPECT_EQ(quote("500").number("PRTTOTAL"), 40);
+    CalcAuthorisedTotals(opened.header, opened.lines);
+    EXPECT_EQ(quote("500").number("PRTTOTAL"), 0);
+}
+
 TEST_F(Totals, RoundingStoresMoneyAndHoursAndTotalsThem)
 {
     LineRow line = quote("500").line(1, "MIS").set("unitcost", 10.456).set("rahour", 1.005).set("pthour", nullptr);
