@@ -1,7 +1,6 @@
-#include "app/DemoShop.h"
 #include "app/Profile.h"
 #include "app/QuoteDatabase.h"
-#include "messages/Envelope.h"
+#include "platform/RuntimeError.h"
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
@@ -11,7 +10,6 @@
 
 #include <QDirIterator>
 #include <QFile>
-#include <QImage>
 #include <QJsonObject>
 #include <QMap>
 #include <QSqlDatabase>
@@ -137,88 +135,39 @@ TEST_F(Profile, FindsWhatAnotherToolWroteOnceInitHasRebuiltTheIndexes)
     EXPECT_EQ(found(), regos.size());
 }
 
-TEST_F(Profile, TheDemoShopHoldsTogether)
+// A line that a load adds counts in totals and documents; what was never filled in stays told apart from 0.
+TEST_F(Profile, ItsTablesTakeWhatAHostWrites)
 {
-    ASSERT_TRUE(app::initProfile(true, today));
+    ASSERT_TRUE(app::initProfile(false));
+    db::ConnectionPtr database = app::openEmbedded(u"WirSql"_s);
+    database->execute(u"INSERT INTO QUOTE2 (QTNNO) VALUES ('9')"_s);
+    db::Recordset line = opened(u"SELECT * FROM QUOTE2"_s);
+    for (const char* column : {"rrhour", "rahour", "pthour", "rr_rate2", "opg_rate", "qty", "unitcost", "VENDOR",
+                               "blend", "delitem", "DELETEDITEM", "Report", "Report_on"})
+        EXPECT_TRUE(!line.isNull(QString::fromLatin1(column)) && toDouble(line.value(QString::fromLatin1(column))) == 0)
+            << column;
+    for (const char* column : {"SEQ_NO", "allow_tick", "itemno", "PartNo", "MARK"})
+        EXPECT_TRUE(line.isNull(QString::fromLatin1(column))) << column;
 
-    const std::pair<const char*, QString> nothing[] = {
-        {"a quote without long texts",
-         u"SELECT QTNNO FROM QUOTE1 WHERE NOT EXISTS (SELECT 1 FROM QUOTE3 WHERE "
-         "QUOTE3.QTNNO=QUOTE1.QTNNO AND QUOTE3.Subquote=QUOTE1.Subquote)"_s},
-        {"a quote without lines",
-         u"SELECT QTNNO FROM QUOTE1 WHERE NOT EXISTS (SELECT 1 FROM QUOTE2 WHERE "
-         "QUOTE2.QTNNO=QUOTE1.QTNNO AND QUOTE2.Subquote=QUOTE1.Subquote)"_s},
-        {"a quote without insurer",
-         u"SELECT QTNNO FROM QUOTE1 WHERE INSURER_ID NOT IN (SELECT INSURER_ID FROM INSURER)"_s},
-        {"a quote without car", u"SELECT QTNNO FROM QUOTE1 WHERE REGO NOT IN (SELECT REGO FROM CAR)"_s},
-        {"a car without customer", u"SELECT REGO FROM CAR WHERE CUST_ID NOT IN (SELECT CUST_ID FROM CUSTOMER)"_s},
-        {"a car without model", u"SELECT REGO FROM CAR WHERE MODEL_ID NOT IN (SELECT MODEL_ID FROM ALLMODEL)"_s},
-        {"a car of unknown colour", u"SELECT REGO FROM CAR WHERE COLOUR NOT IN (SELECT Script FROM KESTColours)"_s},
-        {"a line without vendor",
-         u"SELECT script FROM QUOTE2 WHERE VENDOR>0 AND VENDOR NOT IN (SELECT VENDOR_ID FROM VENDOR)"_s},
-        {"an unknown stage", u"SELECT QTNNO FROM QUOTE1 WHERE Job_stage NOT IN (SELECT stage FROM JOBSTAGE)"_s},
-        {"a supplementary quote without main quote",
-         u"SELECT QTNNO FROM QUOTE1 WHERE Subquote>0 AND QTNNO NOT IN "
-         "(SELECT QTNNO FROM QUOTE1 WHERE Subquote=0)"_s},
+    for (int twice = 0; twice < 2; ++twice)
+        database->execute(u"INSERT INTO QUOTE1 (QTNNO, Subquote) VALUES ('9', 0)"_s);
+    EXPECT_EQ(listed(u"SELECT rec_id FROM QUOTE1 WHERE QTNNO='9'"_s), QStringList({u"1"_s, u"2"_s}));
+    database->execute(u"INSERT INTO CAR (REGO) VALUES ('ABC123')"_s);
+    EXPECT_THROW(database->execute(u"INSERT INTO CAR (REGO) VALUES ('abc123 ')"_s), RuntimeError);
+}
+
+TEST(Schema, HasTheSameColumnsOnAllEngines)
+{
+    const auto columns = [](const QString& name) {
+        QStringList words;
+        const QStringList lines = files::read(QStringLiteral(KEST_SOURCE_DIR "/sql/") + name).split(u'\n');
+        for (const QString& line : lines)
+            if (!line.startsWith(u"--"_s) && !line.startsWith(u')'))
+                words << line.simplified().section(u' ', 0, line.startsWith(u' ') ? 0 : 2) +
+                             (line.contains(u"DEFAULT 0"_s) ? u" 0"_s : QString());
+        return words;
     };
-    for (const auto& [what, select] : nothing)
-        EXPECT_EQ(listed(select), QStringList()) << what;
-    EXPECT_EQ(listed(u"SELECT QTNNO FROM QUOTE1"_s).size(), 30);
-    EXPECT_EQ(listed(u"SELECT DISTINCT category FROM QUOTE2"_s).size(), 6);
-    EXPECT_EQ(listed(u"SELECT remarks FROM QUOTE3 WHERE QTNNO='1003'"_s),
-              QStringList(u"(15/03/2008 : Active Quote Request)"_s));
-    EXPECT_EQ(listed(u"SELECT qtndate FROM QUOTE1 WHERE QTNNO='1003'"_s), QStringList(u"15/03/2008"_s));
-
-    // the next number that the shop gives is free
-    EXPECT_EQ(listed(u"SELECT QTNNO FROM QUOTE1 WHERE QTNNO=(SELECT QUOTE_VAL FROM CINFO)"_s), QStringList());
-}
-
-TEST_F(Profile, TheDemoMessagesParseAfterRepair)
-{
-    ASSERT_TRUE(app::initProfile(true, today));
-    const QString home = profile.driveC() + u"/wirdoc/"_s;
-
-    QStringList types;
-    QStringList unreadable;
-    for (const QString& folder : {home + u"AUnread/"_s, home + u"ARead/"_s})
-        for (const QString& name : files::list(folder, u"*.xml"_s)) {
-            QString text = files::read(folder + name);
-            xml::Document message = ParsedMessage(text);
-            if (message.parseError().errorCode == xml::BareAmpersand)
-                message.loadXML(WithAmpersandsEscaped(text));
-            if (message.documentElement().isNull()) {
-                unreadable << name;
-                continue;
-            }
-            if (name.startsWith(u"R_"_s) || name.contains(u"MDMSG"_s))
-                continue;
-            types << message.textOf(u"messageType"_s);
-            EXPECT_TRUE(folder.endsWith(u"ARead/"_s) || name.startsWith(types.last())) << name.toStdString();
-        }
-    types.removeDuplicates();
-    types.sort();
-    EXPECT_EQ(types.join(u' '), u"ADQT ARES AUQT BACA BCQR EWAP MANQ QMQR QRCN QREQ QTDL RRQT"_s);
-    EXPECT_EQ(unreadable, QStringList(u"QREQ_20554_1.xml"_s));
-
-    for (const QString& name : files::list(home + u"ASent"_s)) {
-        xml::Document document;
-        EXPECT_TRUE(document.loadXML(WrappedInRequest(files::read(home + u"ASent/"_s + name)))) << name.toStdString();
-        EXPECT_TRUE(name.startsWith(document.textOf(u"//quoteReference"_s).replace(u'/', u'.'))) << name.toStdString();
-    }
-}
-
-TEST_F(Profile, TheDemoPhotographsArePictures)
-{
-    ASSERT_TRUE(app::initProfile(true, today));
-    QStringList pictures;
-    for (const QString& folder : {profile.driveC() + u"/wirdoc/AUnread/"_s, profile.driveC() + u"/wirimg/"_s})
-        for (const QString& name : files::list(folder, u"*.jpg"_s)) {
-            pictures << name;
-            EXPECT_FALSE(QImage(folder + name).isNull()) << name.toStdString();
-        }
-    EXPECT_EQ(pictures.filter(u"20551_"_s).size(), 3);
-    EXPECT_EQ(pictures.filter(u"20553_"_s).size(), 0) << "the request that waits for its picture";
-    EXPECT_EQ(app::drawn({u"same"_s, Qt::blue, 0.5}), app::drawn({u"same"_s, Qt::blue, 0.5}));
+    EXPECT_EQ(columns(u"quote-embedded.sql"_s), columns(u"quote-mariadb.sql"_s));
 }
 
 TEST(Statements, AreSplitOutsideLiteralsAndWithoutComments)

@@ -106,7 +106,8 @@ void MariaDbServer::start()
         QThread::msleep(20);
         server.waitForReadyRead(1);
     }
-    connection.execute(sql("GRANT ALL ON *.* TO '{}'@'127.0.0.1' IDENTIFIED BY '{}'", user(), password()));
+    for (const QString& name : {user(), u"sa"_s})  // "sa" is who the component always is
+        connection.execute(sql("GRANT ALL ON *.* TO '{}'@'127.0.0.1' IDENTIFIED BY '{}'", name, password()));
 }
 
 void MariaDbServer::createDatabase(const QString& name, const QString& script)
