@@ -123,6 +123,8 @@ db::Recordset BuildAuthorised(const xml::Document& document, const QString& numb
     const ComparisonHeader header = AuthorisedHeader(document, number);
     db::Recordset table = OpenComparison(ComparisonOf::AuthorisedQuote);
     AddChangedLines(table, header, document, quote, lines, ComparisonOf::AuthorisedQuote, Reprint);
+    if (lines.recordCount() > 0)
+        lines.moveFirst();  // a search that found nothing has left them at their end, where they count nothing
     CalcAuthorisedTotals(quote, lines);
     if (table.recordCount() == 0)
         AddUnchanged(table, header);
