@@ -69,10 +69,9 @@ Outcome init(const QStringList& arguments)
     const bool demo = arguments.contains(u"--demo"_s);
     if (arguments.size() > (demo ? 1 : 0))
         return refused(u"init takes --demo and nothing else"_s, Usage);
-    initProfile(demo);
-    if (DllRegisterServer() != com::Ok)
-        return refused(u"the class could not be entered into the settings of "_s + profile::root(), Refused);
-    return {.text = u"The profile is ready: "_s + profile::root() + u'\n'};
+    const bool made = initProfile(demo);
+    return {.text =
+                (made ? u"The profile is ready: "_s : u"The profile is there already: "_s) + profile::root() + u'\n'};
 }
 
 Outcome showWhere(const QStringList&)

@@ -123,7 +123,7 @@ bool initProfile(bool demo, const QDate& today)
     if (demo)
         putDemoFiles(home, images, today);
     if (DllRegisterServer() != com::Ok)
-        throw RuntimeError(FileInputOutput, u"The class cannot be registered."_s);
+        throw RuntimeError(FileInputOutput, u"The class cannot be entered into the settings."_s);
     writeSettings();  // last: they tell that the profile is whole
     return true;
 }
