@@ -13,7 +13,7 @@
 #include "utilities/frmUtilities.h"
 
 #include <QEvent>
-#include <QGroupBox>
+#include <QFrame>
 #include <QHBoxLayout>
 #include <QKeyEvent>
 #include <QLabel>
@@ -35,7 +35,8 @@ const std::array optionCaptions{u"&Start KESTWeb"_s, u"&View Messages"_s, u"Send
 
 frmKEST::frmKEST() : Form(u"frmKEST"_s, u"ORLA Partner Network"_s)
 {
-    auto* frame = new QGroupBox(this);
+    auto* frame = new QFrame(this);
+    frame->setFrameShape(QFrame::StyledPanel);  // a titleless group box costs its style a third of the start
     frame->setObjectName(u"Frame1"_s);
     frame->setAccessibleName(u"What to do"_s);
     auto* options = new QVBoxLayout(frame);
