@@ -114,7 +114,7 @@ INSERT INTO QUOTE1 (QTNNO, Subquote, REGO, INSURER_ID, KESTQRNo, KESTQRVer, KEST
     ('1025', 0, 'DRF551', 1, '20525', '1', '300125', '400125', '@date-14@ 00:00:00', '7701025', 'Whitby, Morgan Lee', 'Pat Ferrier', '@date-29@ 00:00:00', '@date-1@ 00:00:00', '@date+4@ 00:00:00', 'R', 'MTA', 0, 0, 1, 1, 1, 1, 25, 15, 15, 20, 53.2, 210, 211.2, 503.2, 491.95, 6.4, 0, 0, 0, 0, 0, 1, 0, 0, 5, 1, '28100', NULL, NULL),
     ('1026', 0, 'ALC299', 1, '20526', '1', '300126', '400126', '@date-40@ 00:00:00', '7701026', 'Sayle, Robin', 'Pat Ferrier', '@date-52@ 00:00:00', '@date-34@ 00:00:00', '@date-26@ 00:00:00', 'R', 'MTA', 0, 0, 1, 1, 1, 1, 25, 15, 15, 20, 129.2, 71.4, 46.8, 247.4, 1081.25, 0, 0, 0, 0, 0, 0, 1, 0, 0, 8, 1, '21050', NULL, NULL),
     ('1027', 0, 'SMO321', 1, '20527', '1', '300127', NULL, NULL, '7701027', '', 'Pat Ferrier', '@date-23@ 00:00:00', NULL, NULL, 'R', 'MTA', 0, 0, 1, 1, 1, 1, 25, 15, 15, 20, 152, 260.4, 239.2, 651.6, 860.6, 18, 0, 0, 0, 0, 0, 1, 0, 0, 3, 1, '32500', NULL, NULL),
-    ('1028', 0, 'HDC418', 3, NULL, NULL, NULL, NULL, NULL, '7701028', '', 'Pat Ferrier', '@date-20@ 00:00:00', NULL, NULL, '', '', 0, 0, 2, 38, 42, 46, 25, 15, 15, 20, 41.8, 37.8, 36.8, 116.4, 95, 0, 0, 0, 0, 0, 0, 1, 0, 0, 3, NULL, '96900', 'TD-5521', NULL);
+    ('1028', 0, 'HDC418', 1, NULL, NULL, NULL, NULL, NULL, '7701028', '', 'Pat Ferrier', '@date-20@ 00:00:00', NULL, NULL, '', '', 0, 0, 2, 38, 42, 46, 25, 15, 15, 20, 41.8, 37.8, 36.8, 116.4, 95, 0, 0, 0, 0, 0, 0, 1, 0, 0, 3, NULL, '96900', 'TD-5521', NULL);
 
 INSERT INTO QUOTE3 (QTNNO, Subquote, remarks, P_REMARKS, INCIDENT_NOTES) VALUES
     ('1001', 0, NULL, 'Customer will leave the car with us.', NULL),

@@ -58,9 +58,8 @@ QPainterPath carSide()
 QPainterPath windows()
 {
     QPainterPath glass;
-    glass.addPolygon(QPolygonF({{215, 230}, {262, 180}, {325, 172}, {325, 230}}));
-    glass.addPolygon(QPolygonF({{338, 230}, {338, 172}, {405, 178}, {455, 230}}));
-    glass.closeSubpath();
+    glass.addPolygon(QPolygonF({{215, 230}, {262, 180}, {325, 172}, {325, 230}, {215, 230}}));
+    glass.addPolygon(QPolygonF({{338, 230}, {338, 172}, {405, 178}, {455, 230}, {338, 230}}));
     return glass;
 }
 

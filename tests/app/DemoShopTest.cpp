@@ -171,12 +171,24 @@ TEST_P(DemoShop, ListsItsMessages)
     EXPECT_EQ(listed(Read).size(), files::list(gsReadPath).size());
 }
 
-TEST_P(DemoShop, HasAQuoteToSend)
+TEST_P(DemoShop, SendsWhatMayGo)
 {
-    ASSERT_TRUE(OpenHostQuote(u"1004"_s, u"0"_s));
-    SendQuote(*grsQuote);
-    EXPECT_EQ(desktop.boxTexts(), QStringList(u"Quote Sent."_s));
-    EXPECT_EQ(files::list(gsUnsentPath), QStringList(u"1004.0_1.xml"_s));
+    const std::pair<QString, QString> quotes[] = {
+        {u"1001"_s, u"Quote Sent."_s},
+        {u"1002"_s, u"Invalid Insurer, Please check the Insurer is valid & is marked as a KEST Insurer"_s},
+        {u"1004"_s, u"Quote Sent."_s},
+        {u"1005"_s,
+         u"Items with a Quantity of 0 cannot be sent to ORLA. Please check the quote details and try again."_s},
+        {u"1006"_s, u"This quote has already been submitted to ORLA, you cannot send a quote twice."_s},
+        {u"1011"_s, u"This quote request has been cancelled, Quote cannot be sent."_s},
+        {u"1028"_s, u"This quote has already been sent via TIDE, you cannot use KEST to send this quote."_s},
+    };
+    for (const auto& [number, box] : quotes) {
+        ASSERT_TRUE(OpenHostQuote(number, u"0"_s));
+        SendQuote(*grsQuote);
+        EXPECT_EQ(desktop.boxTexts().last(), box) << number.toStdString();
+    }
+    EXPECT_EQ(files::list(gsUnsentPath), QStringList({u"1001.0_1.xml"_s, u"1004.0_1.xml"_s}));
 }
 
 TEST_P(DemoShop, ItsPhotographsArePictures)
