@@ -116,13 +116,6 @@ bool LoadXML(QString& text, const QString& fileName)
     }
 }
 
-db::Recordset Opened(const QString& select)
-{
-    db::Recordset rows(gConn);
-    rows.open(select);
-    return rows;
-}
-
 db::Recordset OpenNotes(const db::Recordset& quote)
 {
     return Opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quote.value(u"QTNNO"_s),

@@ -2,6 +2,7 @@
 #pragma once
 
 #include "platform/database/Recordset.h"
+#include "shell/modDBAccess.h"
 
 #include <QString>
 
@@ -41,8 +42,6 @@ QString NextQuoteNumber(const QString& given, const db::Recordset& cinfo, db::Re
 /// One more than the highest number among the quote's files in the images folder.
 int NextImageNumber(const QString& quoteNumber);
 
-/// Opens a query on the shared connection.
-db::Recordset Opened(const QString& select);
 /// The row of the long texts that belongs to the quote.
 db::Recordset OpenNotes(const db::Recordset& quote);
 /// Says with a critical box why a message is not taken; false.

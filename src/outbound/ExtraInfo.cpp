@@ -1,7 +1,7 @@
 #include "outbound/ExtraInfo.h"
 
 #include "platform/database/Sql.h"
-#include "shell/SharedVariables.h"
+#include "shell/modDBAccess.h"
 
 using namespace Qt::StringLiterals;
 
@@ -37,21 +37,20 @@ std::pair<QString, QString> buildDate(const QString& year)
 }  // namespace
 
 ExtraInfo::ExtraInfo(const QString& quoteNumber, const QString& subquote)
-    : quoteRow(gConn), carRow(gConn), modelRow(gConn), customerRow(gConn)
+    : quoteRow(Opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quoteNumber, subquote)))
 {
-    quoteRow.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quoteNumber, subquote));
     if (quoteRow.recordCount() != 1) {
         missing = u"Couldn't locate quote in database, Please contact MarlinDesk Support"_s;
         return;
     }
-    carRow.open(sql("SELECT * FROM CAR WHERE REGO='{}'", quoteRow.value(u"REGO"_s)));
+    carRow = Opened(sql("SELECT * FROM CAR WHERE REGO='{}'", quoteRow.value(u"REGO"_s)));
     if (carRow.recordCount() != 1) {
         missing = u"Missing relationship : Car, Please contact MarlinDesk Support"_s;
         return;
     }
-    modelRow.open(sql("SELECT MAKE, MODEL FROM ALLMODEL WHERE MODEL_ID='{}'", carRow.value(u"MODEL_ID"_s)));
-    customerRow.open(sql("SELECT SALUTATION + ' ' + FIRSTNAME + ' ' + NAME AS NAME FROM CUSTOMER WHERE CUST_ID={}",
-                         carRow.value(u"CUST_ID"_s)));
+    modelRow = Opened(sql("SELECT MAKE, MODEL FROM ALLMODEL WHERE MODEL_ID='{}'", carRow.value(u"MODEL_ID"_s)));
+    customerRow = Opened(sql("SELECT SALUTATION + ' ' + FIRSTNAME + ' ' + NAME AS NAME FROM CUSTOMER WHERE CUST_ID={}",
+                             carRow.value(u"CUST_ID"_s)));
     if (modelRow.recordCount() != 1 || customerRow.recordCount() != 1)
         missing = u"Missing relationship : Model or Customer, Please contact MarlinDesk Support"_s;
 }

@@ -8,6 +8,7 @@
 #include "quotedata/QuoteTotals.h"
 #include "shell/Helpers.h"
 #include "shell/SharedVariables.h"
+#include "shell/modDBAccess.h"
 
 using namespace Qt::StringLiterals;
 
@@ -17,18 +18,11 @@ namespace {
 
 const QString quoteNotFound = u"Quote not found in database, Please contact MarlinDesk Support."_s;
 
-db::Recordset opened(const QString& select)
-{
-    db::Recordset record(gConn);
-    record.open(select);
-    return record;
-}
-
 /// Why a main quote may not go; empty where it may.
 QString MainQuoteRefusal(const db::Recordset& quote, const QString& remarks)
 {
     const db::Recordset insurer =
-        opened(sql("SELECT NAME, KEST FROM INSURER WHERE INSURER_ID={}", quote.value(u"INSURER_ID"_s)));
+        Opened(sql("SELECT NAME, KEST FROM INSURER WHERE INSURER_ID={}", quote.value(u"INSURER_ID"_s)));
     if (insurer.eof())
         return u"Could not locate Insurer! Please contact MarlinDesk Support."_s;
     if (!insurer.isNull(u"KEST"_s) && !isTrue(insurer.value(u"KEST"_s)))
@@ -37,7 +31,7 @@ QString MainQuoteRefusal(const db::Recordset& quote, const QString& remarks)
         return u"This quote has already been sent via TIDE, you cannot use KEST to send this quote."_s;
     if (SafeVal(quote.text(u"Claim"_s), u"0"_s) <= 0)
         return u"An Invalid claim number has been entered, please check the Claim Number and try again."_s;
-    const db::Recordset customer = opened(sql(
+    const db::Recordset customer = Opened(sql(
         "SELECT * FROM CUSTOMER WHERE CUST_ID IN (SELECT CUST_ID FROM CAR WHERE REGO='{}')", quote.value(u"REGO"_s)));
     if (customer.eof())
         return u"Error locating customer record, Quote cannot be sent."_s;
@@ -51,13 +45,13 @@ QString MainQuoteRefusal(const db::Recordset& quote, const QString& remarks)
 /// Why the quote may not go; empty where it may.
 QString Refusal(const db::Recordset& quote, const QString& number, const QString& subquote)
 {
-    const db::Recordset zeroQuantities = opened(
+    const db::Recordset zeroQuantities = Opened(
         sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}' AND CATEGORY='PRT' AND QTY=0", number, subquote));
     if (!zeroQuantities.eof())
         return u"Items with a Quantity of 0 cannot be sent to ORLA. Please check the quote details and try again."_s;
 
     const db::Recordset notes =
-        opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+        Opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
     const QString remarks = notes.eof() ? QString() : notes.text(u"remarks"_s);
     if (quote.recordCount() == 0)
         return quoteNotFound;

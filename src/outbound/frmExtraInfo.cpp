@@ -4,7 +4,7 @@
 #include "platform/desktop/Prompt.h"
 #include "platform/desktop/Window.h"
 #include "platform/values.h"
-#include "shell/SharedVariables.h"
+#include "shell/modDBAccess.h"
 
 #include <QAction>
 #include <QApplication>
@@ -138,8 +138,7 @@ QLineEdit* frmExtraInfo::addField(const char* name, const QString& label)
 
 void frmExtraInfo::fillColours()
 {
-    db::Recordset colours(gConn);
-    colours.open(u"SELECT * FROM KESTCOLOURS"_s);
+    db::Recordset colours = Opened(u"SELECT * FROM KESTCOLOURS"_s);
     const QSignalBlocker fillIsNoChoice(lvColour);
     for (; !colours.eof(); colours.moveNext()) {
         const double place = leadingNumber(colours.text(u"id"_s)) - 1;
@@ -200,9 +199,7 @@ std::pair<QWidget*, QString> frmExtraInfo::complaint() const
         return {txtCylinders, u"Number of Cylinders must be entered."_s};
     if (txtColour->text().isEmpty())
         return {txtColour, u"Colour must be entered."_s};
-    db::Recordset colour(gConn);
-    colour.open(sql("SELECT Script from KESTColours WHERE Script='{}'", txtColour->text()));
-    if (colour.eof())
+    if (Opened(sql("SELECT Script from KESTColours WHERE Script='{}'", txtColour->text())).eof())
         return {txtColour, u"You must select a valid KEST Colour"_s};
     return {};
 }

@@ -4,7 +4,7 @@
 #include "platform/database/Sql.h"
 #include "platform/values.h"
 #include "quotedata/Rounding.h"
-#include "shell/SharedVariables.h"
+#include "shell/modDBAccess.h"
 
 using namespace Qt::StringLiterals;
 
@@ -133,9 +133,8 @@ void CalcAuthorisedTotals(db::Recordset& quote, db::Recordset& lines)
 
 void RoundQuoteLines(db::Recordset& quote)
 {
-    db::Recordset lines(gConn);
-    lines.open(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quote.value(u"QTNNO"_s),
-                   quote.value(u"Subquote"_s)));
+    db::Recordset lines = Opened(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quote.value(u"QTNNO"_s),
+                                     quote.value(u"Subquote"_s)));
     for (; !lines.eof(); lines.moveNext()) {
         for (const auto& column : {u"unitcost"_s, u"rrhour"_s, u"rahour"_s, u"pthour"_s})
             if (!lines.text(column).isEmpty())

@@ -130,6 +130,13 @@ std::optional<db::Recordset> OpenRecordset(const QString& select, bool disconnec
     return rows;
 }
 
+db::Recordset Opened(const QString& select)
+{
+    db::Recordset rows(gConn);
+    rows.open(select);
+    return rows;
+}
+
 QString GetComputerName()
 {
     return QSysInfo::machineHostName();

@@ -25,6 +25,8 @@ void OpenDatabase();
 QString ConnectionText(int driverNumber);
 /// A query on a fresh recordset, or none after a critical message when there is no connection.
 std::optional<db::Recordset> OpenRecordset(const QString& select, bool disconnect = false, bool reconnect = false);
+/// A query on the shared connection `gConn`, open. Failures are thrown.
+db::Recordset Opened(const QString& select);
 /// This machine's name; empty on failure.
 QString GetComputerName();
 
