@@ -1,0 +1,105 @@
+// What a recordset holds, for the two halves of its work: reading and moving, and writing changes back.
+#pragma once
+
+#include "platform/RuntimeError.h"
+#include "platform/database/Criterion.h"
+#include "platform/database/Engine.h"
+#include "platform/database/Recordset.h"
+
+#include <QHash>
+
+#include <vector>
+
+namespace kest::db {
+
+/// The rows with one value, in their order.
+using Bucket = std::vector<int>;
+using Index = QHash<QString, Bucket>;
+
+[[noreturn]] void failNoCurrentRow();
+
+struct Recordset::Data {
+    enum class Pending { None, Change, Insert };
+
+    ConnectionPtr connection;
+    QString select;
+    bool isOpen = false;
+    bool declared = false;
+    bool disconnected = false;
+
+    QList<ResultColumn> columns;
+    QHash<QString, int> columnNumbers;  // by the name in lower case; of two with one name the first
+    std::vector<QVariant> values;       // row behind row, removed ones included
+    std::vector<int> rows;              // those not removed
+    std::vector<int> visible;           // those that the filter shows
+    int position = 0;                   // among the visible ones; -1 before the first
+
+    Pending pending = Pending::None;
+    std::vector<QVariant> original;  // of the row with the pending change
+    std::vector<bool> assigned;
+
+    QList<Criterion> filter;
+    QHash<int, Index> indexes;  // by column, made when a search first needs one
+
+    void requireOpen() const
+    {
+        if (!isOpen)
+            throw RuntimeError(ObjectClosed, QStringLiteral("Operation is not allowed when the object is closed."));
+    }
+
+    bool hasRow() const { return position >= 0 && position < int(visible.size()); }
+
+    int row() const
+    {
+        requireOpen();
+        if (!hasRow())
+            failNoCurrentRow();
+        return visible[size_t(position)];
+    }
+
+    QVariant& at(int row, int column) { return values[size_t(row) * size_t(columns.size()) + size_t(column)]; }
+
+    int columnNumber(const QString& name) const
+    {
+        const auto found = columnNumbers.constFind(name.toLower());
+        if (found == columnNumbers.constEnd())
+            throw RuntimeError(NoSuchColumn,
+                               QStringLiteral("Item cannot be found in the collection corresponding to the "
+                                              "requested name or ordinal: ") +
+                                   name);
+        return *found;
+    }
+
+    Engine& engine() const
+    {
+        if (disconnected)
+            throw RuntimeError(ObjectClosed,
+                               QStringLiteral("The rows live without a connection and can't be updated."));
+        if (!connection)
+            throw RuntimeError(NoObject, QStringLiteral("Object variable or With block variable not set"));
+        return connection->engine();
+    }
+
+    void numberColumns();
+    void fetch();
+    void showFiltered();
+    bool isShown(int row);
+
+    const Index& indexOf(int column);
+    void store(int row, int column, const QVariant& value);
+    void beginChange();
+    void forgetChange();
+    void dropCurrentRow();
+
+    QStringList changedTables();
+    bool isChanged(int column);
+    QString keyCondition(const TableInfo& table);
+    int resultColumn(const QString& table, const QString& column) const;
+    void checkLongTexts(const TableInfo& table, const QString& key);
+    void writeChange(const QString& table);
+    void writeInsert(const QString& table);
+    void readBack(const TableInfo& table, const QVariant& identity);
+    QString insertedRow(const TableInfo& table);
+};
+
+}  // namespace kest::db

@@ -1,0 +1,276 @@
+// Writes a recordset's pending change to the base tables that its columns come from.
+#include "platform/database/RecordsetData.h"
+
+#include <algorithm>
+
+namespace kest::db {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+[[noreturn]] void failRowChanged()
+{
+    throw RuntimeError(RowChanged,
+                       u"Row cannot be located for updating. Some values may have been changed since it was "
+                       "last read."_s);
+}
+
+bool isExact(Kind kind)
+{
+    return kind != Kind::Number && kind != Kind::LongText;
+}
+
+}  // namespace
+
+void Recordset::Data::beginChange()
+{
+    const int current = row();
+    if (pending != Pending::None)
+        return;
+    pending = Pending::Change;
+    original.assign(&at(current, 0), &at(current, 0) + columns.size());
+    assigned.assign(size_t(columns.size()), false);
+}
+
+void Recordset::Data::forgetChange()
+{
+    pending = Pending::None;
+    original.clear();
+    assigned.clear();
+}
+
+void Recordset::Data::dropCurrentRow()
+{
+    const int dropped = row();
+    for (int column = 0; column < columns.size(); ++column)
+        store(dropped, column, {});
+    rows.erase(std::lower_bound(rows.begin(), rows.end(), dropped));
+    visible.erase(visible.begin() + position);
+}
+
+bool Recordset::Data::isChanged(int column)
+{
+    if (!assigned[size_t(column)])
+        return false;
+    if (pending == Pending::Insert)
+        return true;
+    const QVariant& before = original[size_t(column)];
+    const QVariant& now = at(row(), column);
+    return before.isNull() != now.isNull() || before.typeId() != now.typeId() || before != now;
+}
+
+QStringList Recordset::Data::changedTables()
+{
+    QStringList tables;
+    for (int column = 0; column < columns.size(); ++column) {
+        if (isChanged(column) && !tables.contains(columns[column].table))
+            tables.append(columns[column].table);
+    }
+    return tables;
+}
+
+int Recordset::Data::resultColumn(const QString& table, const QString& name) const
+{
+    for (int i = 0; i < columns.size(); ++i) {
+        if (columns[i].table == table && columns[i].name.compare(name, Qt::CaseInsensitive) == 0)
+            return i;
+    }
+    return -1;
+}
+
+/// The condition for the current row in a table: its primary key, or all selected columns where the key is not there.
+QString Recordset::Data::keyCondition(const TableInfo& table)
+{
+    const auto before = [&](int column) {
+        return pending == Pending::Change ? original[size_t(column)] : at(row(), column);
+    };
+    QStringList conditions;
+    for (const QString& name : table.key) {
+        const int column = resultColumn(table.name, name);
+        if (column < 0) {
+            conditions.clear();
+            break;
+        }
+        conditions.append(engine().holds(columns[column].name, columns[column].kind, before(column)));
+    }
+    if (conditions.isEmpty()) {
+        for (int column = 0; column < columns.size(); ++column) {
+            if (columns[column].table == table.name && isExact(columns[column].kind))
+                conditions.append(engine().holds(columns[column].name, columns[column].kind, before(column)));
+        }
+    }
+    if (conditions.isEmpty())
+        throw RuntimeError(StatementFailed, u"The columns of the query don't tell a row of "_s + table.name);
+    return conditions.join(u" AND "_s);
+}
+
+/// Long texts can't be compared by every engine in a condition, so the ones about to be written are read again.
+void Recordset::Data::checkLongTexts(const TableInfo& table, const QString& key)
+{
+    QList<int> longTexts;
+    QStringList names;
+    for (int column = 0; column < columns.size(); ++column) {
+        if (columns[column].table == table.name && columns[column].kind == Kind::LongText && isChanged(column)) {
+            longTexts.append(column);
+            names.append(engine().quoted(columns[column].name));
+        }
+    }
+    if (longTexts.isEmpty())
+        return;
+    const Rows now = engine().selectNative(u"SELECT "_s + names.join(u", "_s) + u" FROM "_s +
+                                           engine().quoted(table.name) + u" WHERE "_s + key);
+    if (now.count() == 0)
+        failRowChanged();
+    for (qsizetype i = 0; i < longTexts.size(); ++i) {
+        const QVariant& before = original[size_t(longTexts[i])];
+        const QVariant& stored = now.values[size_t(i)];
+        if (before.isNull() != stored.isNull() || before.toString() != stored.toString())
+            failRowChanged();
+    }
+}
+
+void Recordset::Data::writeChange(const QString& tableName)
+{
+    const TableInfo* table = engine().table(tableName);
+    if (!table)
+        throw RuntimeError(StatementFailed, u"There is no table "_s + tableName);
+    const QString key = keyCondition(*table);
+    QStringList assignments;
+    QString condition = key;
+    QList<int> written;
+    for (int column = 0; column < columns.size(); ++column) {
+        if (columns[column].table != tableName || !isChanged(column))
+            continue;
+        const QString& name = columns[column].name;
+        const QVariant& before = original[size_t(column)];
+        assignments.append(engine().quoted(name) + u'=' + engine().literal(at(row(), column)));
+        if (isExact(columns[column].kind))
+            condition += u" AND "_s + engine().holds(name, columns[column].kind, before);
+        written.append(column);
+    }
+    checkLongTexts(*table, key);
+    const qint64 hit = engine().executeNative(u"UPDATE "_s + engine().quoted(tableName) + u" SET "_s +
+                                              assignments.join(u", "_s) + u" WHERE "_s + condition);
+    if (hit == 0)
+        failRowChanged();
+    for (const int column : written)
+        original[size_t(column)] = at(row(), column);
+}
+
+void Recordset::Data::writeInsert(const QString& tableName)
+{
+    const TableInfo* table = engine().table(tableName);
+    if (!table)
+        throw RuntimeError(StatementFailed, u"There is no table "_s + tableName);
+    QStringList names;
+    QStringList literals;
+    for (int column = 0; column < columns.size(); ++column) {
+        if (columns[column].table != tableName || !isChanged(column))
+            continue;
+        names.append(engine().quoted(columns[column].name));
+        literals.append(engine().literal(at(row(), column)));
+    }
+    readBack(*table, engine().insert(*table, names, literals));
+}
+
+/// What the database itself put into the new row: its identity and the defaults of the columns that were not set.
+void Recordset::Data::readBack(const TableInfo& table, const QVariant& identity)
+{
+    QList<int> wanted;
+    QStringList names;
+    for (int column = 0; column < columns.size(); ++column) {
+        const TableColumn* base = columns[column].table == table.name ? table.column(columns[column].name) : nullptr;
+        if (!base || assigned[size_t(column)])
+            continue;
+        if (base->identity) {
+            store(row(), column, identity);
+        } else if (base->hasDefault) {
+            wanted.append(column);
+            names.append(engine().quoted(base->name));
+        }
+    }
+    if (wanted.isEmpty())
+        return;
+    const QString condition =
+        identity.isNull() ? insertedRow(table) : engine().holds(table.identity()->name, Kind::WholeNumber, identity);
+    const Rows stored = engine().selectNative(u"SELECT "_s + names.join(u", "_s) + u" FROM "_s +
+                                              engine().quoted(table.name) + u" WHERE "_s + condition);
+    for (qsizetype i = 0; stored.count() > 0 && i < wanted.size(); ++i)
+        store(row(), wanted[i], stored.values[size_t(i)]);
+}
+
+/// A table without identity: the row with all the values that were set.
+QString Recordset::Data::insertedRow(const TableInfo& table)
+{
+    QStringList conditions{u"1=1"_s};
+    for (int column = 0; column < columns.size(); ++column) {
+        if (columns[column].table == table.name && assigned[size_t(column)] && isExact(columns[column].kind))
+            conditions.append(engine().holds(columns[column].name, columns[column].kind, at(row(), column)));
+    }
+    return conditions.join(u" AND "_s);
+}
+
+void Recordset::addNew()
+{
+    update();
+    data->requireOpen();
+    const int row = data->columns.isEmpty() ? 0 : int(data->values.size()) / int(data->columns.size());
+    data->values.resize(data->values.size() + size_t(data->columns.size()));
+    data->rows.push_back(row);
+    data->visible.push_back(row);
+    data->position = int(data->visible.size()) - 1;
+    data->beginChange();
+    data->pending = Data::Pending::Insert;
+}
+
+void Recordset::update()
+{
+    if (data->pending == Data::Pending::None)
+        return;
+    if (!data->declared) {
+        QStringList tables = data->changedTables();
+        if (data->pending == Data::Pending::Insert) {
+            if (tables.isEmpty() && !data->columns.isEmpty())
+                tables.append(data->columns.first().table);
+            for (const QString& table : tables)
+                data->writeInsert(table);
+        } else {
+            for (const QString& table : tables)
+                data->writeChange(table);
+        }
+    }
+    data->forgetChange();
+}
+
+void Recordset::cancelUpdate()
+{
+    if (data->pending == Data::Pending::Insert) {
+        data->dropCurrentRow();
+    } else if (data->pending == Data::Pending::Change) {
+        for (int column = 0; column < data->columns.size(); ++column)
+            data->store(data->row(), column, data->original[size_t(column)]);
+    }
+    data->forgetChange();
+}
+
+void Recordset::remove()
+{
+    const int row = data->row();
+    if (data->pending == Data::Pending::Insert)
+        return cancelUpdate();
+    if (!data->declared) {
+        const TableInfo* table = data->columns.isEmpty() ? nullptr : data->engine().table(data->columns.first().table);
+        if (!table)
+            throw RuntimeError(StatementFailed, u"The query has no base table to delete from."_s);
+        const QString condition = data->keyCondition(*table);
+        if (data->engine().executeNative(u"DELETE FROM "_s + data->engine().quoted(table->name) + u" WHERE "_s +
+                                         condition) == 0)
+            failRowChanged();
+    }
+    Q_UNUSED(row);
+    data->forgetChange();
+    data->dropCurrentRow();
+}
+
+}  // namespace kest::db
