@@ -7,6 +7,8 @@
 
 namespace kest {
 
+enum ReportNumber : qint32 { QuoteRequestReport = 710, AssessmentReport = 720, ComparisonReport = 730 };
+
 struct ReportField {
     const char* name;
     int size;  // characters; what is longer is cut

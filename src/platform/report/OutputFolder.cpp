@@ -1,0 +1,37 @@
+#include "platform/report/OutputFolder.h"
+
+#include "platform/files/files.h"
+#include "platform/report/Pages.h"
+
+#include <QDir>
+#include <QJsonDocument>
+
+namespace kest::report {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+QString outputFolder;
+int written = 0;
+
+}  // namespace
+
+void setOutputFolder(const QString& folder)
+{
+    outputFolder = folder.isEmpty() ? folder : QDir::cleanPath(QDir().absoluteFilePath(folder));
+    written = 0;
+    if (!outputFolder.isEmpty())
+        files::makeFolder(outputFolder);
+}
+
+void writeOutput(int number, const Report& report, const QJsonObject& shown)
+{
+    if (outputFolder.isEmpty())
+        return;
+    const QString path = u"%1/%2-%3"_s.arg(outputFolder).arg(++written).arg(number);
+    writePdf(report, path + u".pdf"_s);
+    files::writeBytes(path + u".json"_s, QJsonDocument(shown).toJson());
+}
+
+}  // namespace kest::report

@@ -1,0 +1,160 @@
+#include "reports/frmPrintPreview.h"
+
+#include "platform/RuntimeError.h"
+#include "platform/database/Recordset.h"
+#include "platform/database/Sql.h"
+#include "platform/desktop/Prompt.h"
+#include "platform/desktop/Script.h"
+#include "platform/desktop/Window.h"
+#include "platform/files/files.h"
+#include "platform/report/OutputFolder.h"
+#include "platform/report/Pages.h"
+#include "platform/report/Preview.h"
+#include "platform/values.h"
+#include "reports/ReportTable.h"
+#include "shell/ModRegistry.h"
+#include "shell/SharedVariables.h"
+
+#include <QGuiApplication>
+#include <QPrintDialog>
+#include <QPrinter>
+#include <QPushButton>
+
+#include <optional>
+
+namespace kest {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+constexpr int gap = 80;  // twips, around the button
+
+/// The template's path; none after a box where the number has no report.
+std::optional<QString> TemplateOf(qint32 number)
+{
+    db::Recordset definition(gConn);
+    definition.open(sql("select * from ReportDefinition where ReportID = {}", number));
+    if (definition.eof()) {
+        desktop::msgBox(u"Report ID %1 does not exist"_s.arg(number));
+        return {};
+    }
+    const QString name = definition.text(u"ReportName"_s);
+    if (!files::isPlainName(name))
+        throw RuntimeError(FileNotFound, u"There is no report "_s + name);
+    return GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"ReportPath"_s, u"c:\\wirra32\\report\\"_s) + name;
+}
+
+void SetParameters(report::Report& report, qint32 number, const QVariant& value)
+{
+    for (qsizetype i = 0; i < report.parameters().size(); ++i) {
+        const QString name = report.parameters()[i].name.toUpper();
+        if (number == QuoteRequestReport || number == ComparisonReport)
+            report.setParameter(i, textOrEmpty(value));
+        else if (number == AssessmentReport && name == u"COMP"_s)
+            report.setParameter(i, value.toStringList().value(0));
+        else if (number == AssessmentReport && name == u"TITLE"_s)
+            report.setParameter(i, value.toStringList().value(1));
+    }
+}
+
+QJsonValue AsJson(const std::optional<report::Table>& table)
+{
+    if (!table)
+        return QJsonValue::Null;
+    QJsonArray rows;
+    for (const QVariantList& row : table->rows) {
+        QJsonArray cells;
+        for (const QVariant& cell : row)
+            cells.append(cell.isNull() ? QJsonValue(QJsonValue::Null) : QJsonValue(cell.toString()));
+        rows.append(cells);
+    }
+    return QJsonObject{{u"fields"_s, QJsonArray::fromStringList(table->fields)}, {u"rows"_s, rows}};
+}
+
+/// For a run without a person: what was shown, in the form of its answer.
+void Record(qint32 number, const report::Report& report, const std::optional<report::Table>& table)
+{
+    QJsonObject parameters;
+    for (const report::Parameter& parameter : report.parameters())
+        parameters.insert(parameter.name, parameter.value);
+    const QJsonObject shown{{u"name"_s, u"frmPrintPreview"_s},
+                            {u"report"_s, number},
+                            {u"parameters"_s, parameters},
+                            {u"table"_s, AsJson(table)}};
+    if (desktop::Script* script = desktop::currentScript())
+        script->addWindow(shown);
+    report::writeOutput(number, report, shown);
+}
+
+void SetDefaultPointer()
+{
+    while (QGuiApplication::overrideCursor())
+        QGuiApplication::restoreOverrideCursor();
+}
+
+}  // namespace
+
+frmPrintPreview::frmPrintPreview(const report::Report& report)
+    : Form(u"frmPrintPreview"_s, u"Print Preview"_s),
+      crvPreview(new report::Preview(this, [this] { crvPreview_PrintButtonClicked(); })),
+      cmdExit(new QPushButton(u"E&xit"_s, this))
+{
+    setWindowFlag(Qt::WindowMaximizeButtonHint);
+    crvPreview->setObjectName(u"crvPreview"_s);
+    cmdExit->setObjectName(u"cmdExit"_s);
+    cmdExit->resize(cmdExit->sizeHint());
+    desktop::onEvent(cmdExit, &QPushButton::clicked, this, u"frmPrintPreview.cmdExit_Click"_s, [this] { close(); });
+    setMinimumSize(desktop::pixels(6000, 4500));
+    resize(desktop::pixels(13500, 11250));
+    crvPreview->hide();
+    crvPreview->setReport(report);
+    crvPreview->show();
+    crvPreview->setFocus();
+    SetDefaultPointer();
+}
+
+void frmPrintPreview::ShowForm(qint32 peReportType, const QVariant& pvValue, db::Recordset* table)
+{
+    attempt([&] {
+        const std::optional<QString> path = TemplateOf(peReportType);
+        if (!path)
+            return;
+        report::Report report(*path);
+        std::optional<report::Table> rows;
+        if (table) {
+            rows = report::tableOf(*table);
+            report.setTable(*rows);
+        }
+        SetParameters(report, peReportType, pvValue);
+        Record(peReportType, report, rows);
+        frmPrintPreview form(report);
+        desktop::showModal(form);
+    });
+    SetDefaultPointer();
+}
+
+void frmPrintPreview::crvPreview_PrintButtonClicked()
+{
+    QPrinter printer(QPrinter::HighResolution);
+    report::setPaper(printer);
+    QPrintDialog setup(&printer, this);
+    setup.setObjectName(u"PrintDialog"_s);
+    desktop::showModal(setup);
+    if (setup.result() != QDialog::Accepted)
+        return;
+    const bool isRange = printer.printRange() == QPrinter::PageRange;
+    report::paint(crvPreview->report(), printer, isRange ? printer.fromPage() : 1, isRange ? printer.toPage() : 0);
+}
+
+void frmPrintPreview::resizeEvent(QResizeEvent* event)
+{
+    Form::resizeEvent(event);
+    if (isMinimized())
+        return;
+    const int space = desktop::pixels(gap);
+    crvPreview->setGeometry(0, 0, width(), height() - cmdExit->height() - 2 * space);
+    cmdExit->move(width() - cmdExit->width() - space, crvPreview->height() + space);
+}
+
+}  // namespace kest
