@@ -1,5 +1,6 @@
 #include "outbound/ExtraInfo.h"
 
+#include "outbound/QuoteRows.h"
 #include "platform/database/Sql.h"
 #include "shell/modDBAccess.h"
 
@@ -8,11 +9,6 @@ using namespace Qt::StringLiterals;
 namespace kest {
 
 namespace {
-
-QString trimmed(const db::Recordset& row, const QString& column)
-{
-    return row.text(column).trimmed();
-}
 
 QString digitsOf(const QString& text)
 {
@@ -57,35 +53,35 @@ ExtraInfo::ExtraInfo(const QString& quoteNumber, const QString& subquote)
 
 QString ExtraInfo::quoteNumber() const
 {
-    return trimmed(quoteRow, u"QTNNO"_s);
+    return trimmed(quoteRow, "QTNNO");
 }
 
 QString ExtraInfo::customer() const
 {
-    return trimmed(customerRow, u"NAME"_s);
+    return trimmed(customerRow, "NAME");
 }
 
 QString ExtraInfo::rego() const
 {
-    return trimmed(quoteRow, u"REGO"_s);
+    return trimmed(quoteRow, "REGO");
 }
 
 QString ExtraInfo::model() const
 {
-    return trimmed(modelRow, u"MAKE"_s) + u' ' + trimmed(modelRow, u"MODEL"_s);
+    return trimmed(modelRow, "MAKE") + u' ' + trimmed(modelRow, "MODEL");
 }
 
 ExtraValues ExtraInfo::values() const
 {
-    const QString transmission = trimmed(carRow, u"XMission"_s).toUpper();
+    const QString transmission = trimmed(carRow, "XMission").toUpper();
     const bool automatic = transmission == "A"_L1 || transmission == "AUTOMATIC"_L1;
     const auto [month, year] = buildDate(carRow.text(u"Year"_s));
 
     ExtraValues values;
     values[Transmission] = automatic ? u"Automatic"_s : u"Manual"_s;
-    values[VIN] = trimmed(carRow, u"VIN"_s);
-    values[Odometer] = trimmed(quoteRow, u"kms"_s);
-    values[Cylinders] = trimmed(carRow, u"CYLINDERS"_s);
+    values[VIN] = trimmed(carRow, "VIN");
+    values[Odometer] = trimmed(quoteRow, "kms");
+    values[Cylinders] = trimmed(carRow, "CYLINDERS");
     values[BuildMonth] = month;
     values[BuildYear] = year;
     values[Colour] = carRow.text(u"COLOUR"_s);

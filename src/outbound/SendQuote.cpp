@@ -79,17 +79,14 @@ double refuse(const QString& message)
 
 double SendQuote(db::Recordset& quote)
 {
-    // a record that an earlier fault has left closed is opened again by the panel's own quote number
-    if (quote.isOpen() && quote.eof())
+    if (quote.eof())
         return refuse(quoteNotFound);
-    const QString number = quote.isOpen() ? quote.text(u"QTNNO"_s) : gsQTNNO;
-    quote.close();
-    quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' ORDER BY SUBQUOTE DESC", number));
+    const QString number = quote.text(u"QTNNO"_s);
+    quote = Opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' ORDER BY SUBQUOTE DESC", number));
     if (quote.eof())
         return refuse(quoteNotFound);
     const QString subquote = quote.text(u"Subquote"_s);
-    quote.close();
-    quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+    quote = Opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
 
     if (const QString refusal = Refusal(quote, number, subquote); !refusal.isEmpty())
         return refuse(refusal);

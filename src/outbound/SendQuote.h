@@ -6,7 +6,7 @@
 namespace kest {
 
 /// Sends the newest subquote of the quote in hand, or refuses it with one message. `quote` is the panel's record; it is
-/// closed and opened again, and stands afterwards on the row that was considered.
+/// opened again, and stands afterwards on the row that was considered.
 /// The quote total that was sent, 0 when the quote was not sent. Failures are thrown; a quote is locked only when its
 /// document stands complete in the outgoing folder.
 double SendQuote(db::Recordset& quote);

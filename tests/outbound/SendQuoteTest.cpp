@@ -1,6 +1,7 @@
 #include "Sending.h"
 #include "outbound/SendQuote.h"
 #include "platform/RuntimeError.h"
+#include "platform/database/FaultInjection.h"
 #include "platform/files/FaultInjection.h"
 #include "platform/files/files.h"
 #include "shell/SharedVariables.h"
@@ -170,6 +171,28 @@ TEST_F(Sending, AQuoteIsLockedOnlyWhenItsDocumentStands)
         for (const char* table : {"QUOTE1", "QUOTE2", "QUOTE3"})
             gConn->execute(u"DELETE FROM "_s + QLatin1StringView(table));
     }
+}
+
+TEST_F(Sending, AfterAFaultAtAnyStepTheQuoteCanBeSentAgain)
+{
+    sendable().request("QR1").note("Active Quote Request");
+    db::Recordset panel(gConn);
+    panel.open(u"SELECT * FROM QUOTE1 WHERE QTNNO='500'"_s);
+    int failing = 0;
+    for (bool reached = true; reached; ++failing) {
+        int statement = 0;
+        db::setStatementFault([&] { return statement++ == failing; });
+        attempt([&] { SendQuote(panel); });
+        db::setStatementFault({});
+        reached = statement > failing;
+        EXPECT_EQ(panel.text(u"QTNNO"_s), u"500"_s) << failing;
+        if (quote("500").locked()) {
+            EXPECT_EQ(filesIn(gsUnsentPath), QStringList(u"500.0_1.xml"_s)) << failing;
+            quote("500").locked(false).remarks("(01/02/2008 : Active Quote Request)");
+        }
+    }
+    EXPECT_GT(failing, 30) << "as many statements as a send has";
+    EXPECT_EQ(filesIn(gsUnsentPath), QStringList(u"500.0_1.xml"_s));
 }
 
 TEST_F(Sending, AQuoteNumberCannotLeaveTheOutgoingFolder)
