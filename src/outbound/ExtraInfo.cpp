@@ -32,6 +32,12 @@ std::pair<QString, QString> buildDate(const QString& year)
 
 }  // namespace
 
+QString TransmissionOf(const db::Recordset& car)
+{
+    const QString transmission = trimmed(car, "XMISSION").toUpper();
+    return transmission == "A"_L1 || transmission == "AUTOMATIC"_L1 ? u"Automatic"_s : u"Manual"_s;
+}
+
 ExtraInfo::ExtraInfo(const QString& quoteNumber, const QString& subquote)
     : quoteRow(Opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quoteNumber, subquote)))
 {
@@ -73,12 +79,10 @@ QString ExtraInfo::model() const
 
 ExtraValues ExtraInfo::values() const
 {
-    const QString transmission = trimmed(carRow, "XMission").toUpper();
-    const bool automatic = transmission == "A"_L1 || transmission == "AUTOMATIC"_L1;
     const auto [month, year] = buildDate(carRow.text(u"Year"_s));
 
     ExtraValues values;
-    values[Transmission] = automatic ? u"Automatic"_s : u"Manual"_s;
+    values[Transmission] = TransmissionOf(carRow);
     values[VIN] = trimmed(carRow, "VIN");
     values[Odometer] = trimmed(quoteRow, "kms");
     values[Cylinders] = trimmed(carRow, "CYLINDERS");

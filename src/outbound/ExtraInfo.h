@@ -24,6 +24,9 @@ enum ExtraValue : size_t {
 };
 using ExtraValues = std::array<QString, 10>;
 
+/// "Automatic" or "Manual", from the letter or the word that the car has.
+QString TransmissionOf(const db::Recordset& car);
+
 /// The values, or the message that says which record is missing.
 using ExtraInfoResult = std::variant<ExtraValues, QString>;
 

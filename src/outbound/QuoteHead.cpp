@@ -77,8 +77,7 @@ ExtraValues vehicleValues(const QuoteRows& rows, const std::optional<ExtraValues
     if (isTrue(rows.quote.value(u"ExtraInfo"_s)))
         return values;
 
-    const QString transmission = trimmed(car, "XMISSION").toUpper();
-    values[Transmission] = transmission == "A"_L1 || transmission == "AUTOMATIC"_L1 ? u"Automatic"_s : u"Manual"_s;
+    values[Transmission] = TransmissionOf(car);
     values[Cylinders] = QString(text(car, "ENG_SIZE") + u' ' + text(car, "CYLINDERS")).trimmed();
     values[VIN] = trimmed(car, "VIN");
     values[Odometer] = trimmed(rows.quote, "kms");
