@@ -1,7 +1,9 @@
 // Whole quote documents, compared with the readable ones in golden/.
 #include "Sending.h"
+#include "app/QuoteDatabase.h"
 #include "platform/files/files.h"
 #include "shell/SharedVariables.h"
+#include "support/MariaDbServer.h"
 
 #include <QFile>
 
@@ -29,6 +31,9 @@ protected:
         for (qsizetype i = 0; i < std::max(actual.size(), expected.size()); ++i)
             EXPECT_EQ(actual.value(i), expected.value(i)) << name.toStdString() << ", element " << i;
     }
+
+    static void sendSupplementary();
+    static void sendFortyLines();
 
     static void addPhotographs(std::initializer_list<const char*> names)
     {
@@ -93,7 +98,7 @@ TEST_F(GoldenDocument, AMainQuoteWithAClaimAndTheExtraInformation)
     EXPECT_EQ(quote("777").text("kms"), "120500");
 }
 
-TEST_F(GoldenDocument, ASupplementaryQuoteThatWasAuthorised)
+void GoldenDocument::sendSupplementary()
 {
     customer("Holloway").set("SALUTATION", nullptr).set("FIRSTNAME", nullptr);
     quote("1201").quoteNumber("KQ55");
@@ -115,7 +120,7 @@ TEST_F(GoldenDocument, ASupplementaryQuoteThatWasAuthorised)
         EXPECT_EQ(Row("QUOTE2", u"script='%1'"_s.arg(QLatin1StringView(script))).text("SEQ_NO"), number) << script;
 }
 
-TEST_F(GoldenDocument, AMainQuoteOfFortyLinesInEverySet)
+void GoldenDocument::sendFortyLines()
 {
     QuoteRow row = quote("A-40").request("QR40", "1").note("Active Quote Request");
     const int tower = vendor("Night and Day Towing").id();
@@ -145,6 +150,32 @@ TEST_F(GoldenDocument, AMainQuoteOfFortyLinesInEverySet)
 
     EXPECT_DOUBLE_EQ(send("A-40"), 3843.5);
     expectDocument(u"A-40.0_1.xml"_s, u"forty-lines.xml"_s);
+}
+
+TEST_F(GoldenDocument, ASupplementaryQuoteThatWasAuthorised)
+{
+    sendSupplementary();
+}
+
+TEST_F(GoldenDocument, AMainQuoteOfFortyLinesInEverySet)
+{
+    sendFortyLines();
+}
+
+TEST_F(GoldenDocument, ADatabaseServerGivesTheSameDocuments)
+{
+    MariaDbServer server;
+    server.createDatabase(u"shop"_s);
+    gConn = std::make_shared<db::Connection>();
+    gConn->open(server.connectionText(u"shop"_s));
+    app::createTables(*gConn, app::Dialect::MariaDb);
+    app::fillNewShop(*gConn);
+    gConn->execute(
+        u"INSERT INTO ALLMODEL (MODEL_ID, MAKE, MODEL, SCHEDULE) VALUES ('C120', 'CORELLA', 'MERIDIAN GL', '')"_s);
+    sendSupplementary();
+    customer("Holloway").set("SALUTATION", "Ms").set("FIRSTNAME", "Kim");
+    car("ABC123").set("Year", "03/2005");
+    sendFortyLines();
 }
 
 }  // namespace kest::test
