@@ -5,6 +5,7 @@
 #include "platform/desktop/Prompt.h"
 #include "quotedata/NoteChain.h"
 #include "quotedata/StateTable.h"
+#include "reports/PrintXML.h"
 #include "shell/Helpers.h"
 
 #include <utility>
@@ -47,7 +48,7 @@ const Transition& BackOutOf(const db::Recordset& quote, const db::Recordset& not
 
 }  // namespace
 
-bool LoadADQT(QString& text, const QString&)
+bool LoadADQT(QString& text, const QString& fileName)
 {
     const xml::Document message = ParsedMessage(text);
     const auto [number, subquote] =
@@ -72,6 +73,7 @@ bool LoadADQT(QString& text, const QString&)
     Apply(adjustmentSuggested, quote, notes);
     quote.update();
     notes.update();
+    PrintXML(fileName, false);
     return true;
 }
 
@@ -93,7 +95,7 @@ bool LoadARES(QString& text, const QString&)
     return true;
 }
 
-bool LoadBACA(QString& text, const QString&)
+bool LoadBACA(QString& text, const QString& fileName)
 {
     const xml::Document message = ParsedMessage(text);
     const QString request = message.textOf(u"//rootns:getBackoutAssmntResponse/rootns:kestQuoteRequestNumber"_s);
@@ -105,6 +107,7 @@ bool LoadBACA(QString& text, const QString&)
     Apply(BackOutOf(quote, notes), quote, notes);
     quote.update();
     notes.update();
+    PrintXML(fileName, false);
     return true;
 }
 

@@ -5,6 +5,7 @@
 #include "platform/files/files.h"
 #include "platform/values.h"
 #include "quotedata/StateTable.h"
+#include "reports/PrintXML.h"
 #include "shell/Helpers.h"
 #include "shell/SharedVariables.h"
 
@@ -281,7 +282,7 @@ void TakePhotographs(const xml::Node& root, const QString& requestNumber, const 
 
 }  // namespace
 
-bool LoadQREQ(QString& text, const QString&)
+bool LoadQREQ(QString& text, const QString& fileName)
 {
     const xml::Document message = ParsedMessage(text);
 
@@ -336,6 +337,7 @@ bool LoadQREQ(QString& text, const QString&)
     quote.update();
     notes.update();
 
+    PrintXML(fileName, false);
     TakePhotographs(message.documentElement(), request.number, quoteNumber);
 
     db::Recordset tried(gConn);

@@ -5,6 +5,7 @@
 #include "platform/desktop/Prompt.h"
 #include "platform/values.h"
 #include "quotedata/StateTable.h"
+#include "reports/PrintXML.h"
 #include "shell/Helpers.h"
 #include "shell/SharedVariables.h"
 
@@ -63,7 +64,7 @@ void DeleteQuoteRows(const QVariant& number, const QVariant& subquote)
 
 }  // namespace
 
-bool LoadQMQR(QString& text, const QString&)
+bool LoadQMQR(QString& text, const QString& fileName)
 {
     const xml::Document message = ParsedMessage(text);
     db::Recordset quote = OpenByReference(message.textOf(quoteReference));
@@ -79,10 +80,11 @@ bool LoadQMQR(QString& text, const QString&)
     Apply(quoteMatched, quote, notes);
     quote.update();
     notes.update();
+    PrintXML(fileName, false);
     return true;
 }
 
-bool LoadEWAP(QString& text, const QString&)
+bool LoadEWAP(QString& text, const QString& fileName)
 {
     const xml::Document message = ParsedMessage(text);
     const QString reference = message.textOf(quoteReference);
@@ -99,6 +101,7 @@ bool LoadEWAP(QString& text, const QString&)
         reference);
     quote.update();
     notes.update();
+    PrintXML(fileName, false);
     return true;
 }
 

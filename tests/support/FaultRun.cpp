@@ -26,6 +26,7 @@ void setFault(FaultOf of, std::function<bool()> fault)
 
 bool loadAsTheWindow(const QString& message)
 {
+    gsListFolder = gsUnreadPath;  // as after a fill: a load prints from there
     bool taken = false;
     attempt([&] {
         QString text = files::read(gsUnreadPath + message);
