@@ -9,6 +9,7 @@
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
+#include "platform/report/OutputFolder.h"
 #include "platform/settings/registry.h"
 #include "shell/CredentialCipher.h"
 #include "shell/ModRegistry.h"
@@ -163,6 +164,15 @@ Outcome load(const QStringList& arguments)
     return {.exitCode = loaded ? Done : Refused, .fields = {{u"rows"_s, rowsAsJson(window.rows())}}};
 }
 
+Outcome reprint(const QStringList& arguments)
+{
+    frmMessageList window;
+    window.open();
+    window.chooseFolder(Read);
+    const bool printed = window.reprintFile(arguments[0]);
+    return {.exitCode = printed ? Done : Refused};
+}
+
 QString folderPath(int folder)
 {
     return folder == Unread ? gsUnreadPath : folder == Read ? gsReadPath : gsSentPath;
@@ -265,8 +275,8 @@ const std::map<QString, Command> commands{
     {u"init"_s, {Needs::Nothing, 0, 1, init}},          {u"where"_s, {Needs::Nothing, 0, 0, showWhere}},
     {u"open"_s, {Needs::Profile, 0, 2, open}},          {u"list"_s, {Needs::Connection, 1, 3, list}},
     {u"load"_s, {Needs::Connection, 1, 1, load}},       {u"send"_s, {Needs::Connection, 1, 2, send}},
-    {u"view"_s, {Needs::Connection, 2, 2, view}},       {u"setting"_s, {Needs::Profile, 1, 5, setting}},
-    {u"joblink"_s, {Needs::Connection, 1, 9, jobLink}},
+    {u"reprint"_s, {Needs::Connection, 1, 1, reprint}}, {u"view"_s, {Needs::Connection, 2, 2, view}},
+    {u"setting"_s, {Needs::Profile, 1, 5, setting}},    {u"joblink"_s, {Needs::Connection, 1, 9, jobLink}},
 };
 
 bool profileExists()
@@ -370,6 +380,7 @@ int run(const CommandLine& line)
             desktop::usePerson();
         else
             script = answeringScript(line);
+        report::setOutputFolder(line.reports);
     } catch (const RuntimeError& error) {
         return refused(error.description(), Usage).exitCode;
     }

@@ -6,6 +6,7 @@
 #include "platform/desktop/Prompt.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
+#include "reports/PrintXML.h"
 #include "shell/SharedVariables.h"
 #include "shell/modLoggerEx.h"
 #include "utilities/frmViewXML.h"
@@ -140,6 +141,8 @@ void frmMessageList::buildControls()
     prgFill->setVisible(false);
 
     cmdProcess = named(new QPushButton(u"&Load"_s), u"cmdProcess"_s, u"Take the message into the quotes"_s);
+    cmdPrint = named(new QPushButton(u"Re&print"_s), u"cmdPrint"_s, u"Show the message's report"_s);
+    cmdPrint->setVisible(false);
     cmdView = named(new QPushButton(u"&View"_s), u"cmdView"_s, u"Show the message's text"_s);
     Command6 = named(new QPushButton(u"&Delete"_s), u"Command6"_s, u"Remove the message's file (Del)"_s);
     cmdExit = desktop::exitButton(this, u"cmdExit"_s, u"Close (Esc)"_s);
@@ -172,6 +175,7 @@ void frmMessageList::arrange()
 
     auto* bottom = new QHBoxLayout;
     bottom->addWidget(cmdProcess);
+    bottom->addWidget(cmdPrint);
     bottom->addWidget(cmdView);  // moves to the left where neither of the two is shown
     bottom->addStretch();
     bottom->addWidget(cmdExit);
@@ -184,8 +188,8 @@ void frmMessageList::arrange()
     all->addLayout(line);
     all->addLayout(bottom);
 
-    const QList<QWidget*> order{Option1[Unread], Option1[Read], Option1[Sent], txtFilter, Command1,
-                                ListView1,       cmdProcess,    cmdView,       Command6,  cmdExit};
+    const QList<QWidget*> order{Option1[Unread], Option1[Read], Option1[Sent], txtFilter, Command1, ListView1,
+                                cmdProcess,      cmdPrint,      cmdView,       Command6,  cmdExit};
     for (qsizetype i = 1; i < order.size(); ++i)
         setTabOrder(order[i - 1], order[i]);
     ListView1->setFocus();
@@ -211,6 +215,7 @@ void frmMessageList::connectControls()
     on(ListView1, &QTreeWidget::itemDoubleClicked, u"ListView1_DblClick"_s, [this] { ListView1_DblClick(); });
     on(cmdProcess, &QPushButton::clicked, u"cmdProcess_Click"_s, [this] { cmdProcess_Click(); });
     on(cmdView, &QPushButton::clicked, u"cmdView_Click"_s, [this] { cmdView_Click(); });
+    on(cmdPrint, &QPushButton::clicked, u"cmdPrint_Click"_s, [this] { cmdPrint_Click(); });
     on(Command1, &QPushButton::clicked, u"Command1_Click"_s, [this] { Command1_Click(); });
     on(txtFilter, &QLineEdit::returnPressed, u"txtFilter_KeyDown"_s, [this] { Command1_Click(); });
     on(Command6, &QPushButton::clicked, u"Command6_Click"_s, [this] { Command6_Click(); });
@@ -255,6 +260,14 @@ bool frmMessageList::loadFile(const QString& file)
         tmrRefresh_Timer();
     }
     return loaded;
+}
+
+bool frmMessageList::reprintFile(const QString& file)
+{
+    if (select(file) && !cmdPrint->isEnabled())
+        return false;
+    sCurFile = file;
+    return cmdPrint_Click();
 }
 
 void frmMessageList::RefreshList()
@@ -337,6 +350,7 @@ void frmMessageList::Option1_Click(int index)
     iFolder = index;
     RefreshList();
     cmdProcess->setVisible(index == Unread);
+    cmdPrint->setVisible(index == Read);
     Frame2->setVisible(index != Unread);
 }
 
@@ -346,6 +360,8 @@ void frmMessageList::ListView1_ItemClick(const QTreeWidgetItem& item)
     const QString type = item.text(TypeColumn);
     if (gbTabletLocal)  // on its own database a tablet takes new work only
         cmdProcess->setEnabled(type == "Quote Request"_L1);
+    cmdPrint->setEnabled(type != "Request for Revised Quote"_L1 && type != "Quote Deletion"_L1 &&
+                         type != "Quote Request Cancellation"_L1);
 }
 
 void frmMessageList::ListView1_DblClick()
@@ -392,6 +408,11 @@ void frmMessageList::cmdView_Click()
 {
     if (ListView1->currentItem())
         frmViewXML::ShowForm(selectedFile());
+}
+
+bool frmMessageList::cmdPrint_Click()
+{
+    return PrintXML(sCurFile, true);
 }
 
 void frmMessageList::Command1_Click()

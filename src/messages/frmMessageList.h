@@ -37,6 +37,9 @@ public:
     /// "Load" on a file of the folder, listed or not, with the refreshes that follow, the delayed one included. False
     /// when the message was not taken. For a listed one whose button is disabled nothing happens.
     bool loadFile(const QString& file);
+    /// "Reprint" on a file of the folder, listed or not. False when its report was refused or failed. For a listed one
+    /// whose button is disabled nothing happens.
+    bool reprintFile(const QString& file);
 
     void RefreshList();
 
@@ -50,6 +53,7 @@ private:
     void ListView1_DblClick();
     void cmdProcess_Click();
     void cmdView_Click();
+    bool cmdPrint_Click();
     void Command1_Click();
     void Command6_Click();
     void tmrRefresh_Timer();
@@ -76,6 +80,7 @@ private:
     QProgressBar* prgFill;
     QPushButton* cmdProcess;
     QPushButton* cmdView;
+    QPushButton* cmdPrint;
     QPushButton* Command6;
     QPushButton* cmdExit;
     QTimer* tmrRefresh;

@@ -156,7 +156,7 @@ void FillRequest(db::Recordset& row, const xml::Document& message, const QString
     Set(row, "Instruction", text("instructions"));
 }
 
-void PrintRequest(const xml::Document& message)
+bool PrintRequest(const xml::Document& message)
 {
     const QString requestNumber = message.textOf(u"//rootns:quoteRequestNumber"_s);
     db::Recordset quote(gConn);
@@ -165,7 +165,7 @@ void PrintRequest(const xml::Document& message)
     if (quote.eof()) {
         desktop::msgBox(u"Quote does not exist in database, please contact MarlinDesk Support."_s,
                         desktop::Icon::Critical);
-        return;
+        return false;
     }
     quote.moveLast();  // the oldest
     const QList<xml::Node> images = message.documentElement().selectNodes(u"rootns:quoteRequestImageIds/*"_s);
@@ -177,16 +177,17 @@ void PrintRequest(const xml::Document& message)
             Step([&] { FillImage(table, requestNumber, images[i].text()); });
     }
     frmPrintPreview::ShowForm(QuoteRequestReport, u""_s, &table);
+    return true;
 }
 
-void PrintResult(const xml::Document& message)
+bool PrintResult(const xml::Document& message)
 {
     const QString requestNumber = message.textOf(u"//rootns:kestQuoteRequestNumber"_s);
     db::Recordset quote(gConn);
     quote.open(sql("SELECT * FROM QUOTE1 WHERE KESTQRNo='{}' ORDER BY rec_id DESC", requestNumber));
     if (quote.recordCount() != 1) {
         desktop::msgBox(u"Failed Matching Quote. Please contact MarlinDesk Support"_s, desktop::Icon::Critical);
-        return;
+        return false;
     }
     db::Recordset table = OpenReportTable(resultFields);
     table.addNew();
@@ -198,14 +199,16 @@ void PrintResult(const xml::Document& message)
         Set(table, "reason", TextOf(message.textOf(u"//rootns:reasonCode"_s), reasons));
     });
     frmPrintPreview::ShowForm(AssessmentReport, QStringList{u""_s, u"Assessment Result"_s}, &table);
+    return true;
 }
 
-void PrintAdjusted(const xml::Document& message, bool Reprint)
+bool PrintAdjusted(const xml::Document& message, bool Reprint)
 {
     std::optional<db::Recordset> table;
     Step([&] { table = BuildAdjustedReport(message, Reprint); });
     if (table)
         frmPrintPreview::ShowForm(ComparisonReport, u""_s, &*table);
+    return table.has_value();
 }
 
 /// A document's name begins with the quote number, one more character, and the subquote.
@@ -217,7 +220,7 @@ bool HasSubletDocument(const QString& number, const QString& subquote)
     });
 }
 
-void PrintAuthorised(const xml::Document& message, bool Reprint)
+bool PrintAuthorised(const xml::Document& message, bool Reprint)
 {
     QString number;
     QString subquote;
@@ -226,34 +229,37 @@ void PrintAuthorised(const xml::Document& message, bool Reprint)
     std::tie(number, subquote) = SplitQuoteRef(message.textOf(u"//rootns:quoteBody/rootns:quoteReference"_s));
     if (HasSubletDocument(number, subquote))
         frmSubletAuth::ShowForm(number, subquote);
+    return table.has_value();
 }
 
-void Print(const QString& fileName, bool Reprint)
+bool Print(const QString& fileName, bool Reprint)
 {
     QString text = files::read(gsListFolder + fileName);
     const xml::Document message = ParsedMessage(text);
     const QString type = message.textOf(u"//*[name()='messageType']"_s);
     if (type == u"QREQ"_s)
-        PrintRequest(message);
-    else if (type == u"ADQT"_s)
-        PrintAdjusted(message, Reprint);
-    else if (type == u"AUQT"_s)
-        PrintAuthorised(message, Reprint);
-    else if (type == u"ARES"_s)
-        PrintResult(message);
+        return PrintRequest(message);
+    if (type == u"ADQT"_s)
+        return PrintAdjusted(message, Reprint);
+    if (type == u"AUQT"_s)
+        return PrintAuthorised(message, Reprint);
+    if (type == u"ARES"_s)
+        return PrintResult(message);
+    return true;  // the other types have no report
 }
 
 }  // namespace
 
-void PrintXML(const QString& fileName, bool Reprint)
+bool PrintXML(const QString& fileName, bool Reprint)
 {
     if (fileName.isEmpty())
-        return;
+        return true;
     try {
-        Print(fileName, Reprint);
+        return Print(fileName, Reprint);
     } catch (const RuntimeError& error) {
         desktop::msgBox(u"An error %1 has occured, Please contact MarlinDesk Support\r\n%2-%3"_s.arg(error.number())
                             .arg(error.description(), error.source()));
+        return false;
     }
 }
 

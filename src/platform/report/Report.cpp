@@ -43,7 +43,7 @@ QStringList tagsIn(const QString& part)
     return names;
 }
 
-/// "field=A|B" or "field!=A|B": which rows are meant.
+/// "field=A|B" or "field!=A|B".
 struct Condition {
     QString field;
     QStringList values;
@@ -58,6 +58,13 @@ struct Condition {
         return {text.first(negated ? at - 1 : at), text.sliced(at + 1).split(u'|'), negated};
     }
     bool isGiven() const { return !field.isEmpty(); }
+    static QList<Condition> listIn(const QString& text)
+    {
+        QList<Condition> conditions;
+        for (const QString& condition : text.split(u',', Qt::SkipEmptyParts))
+            conditions.append(in(condition));
+        return conditions;
+    }
 };
 
 /// One row under the names of its fields, which are found without regard to case.
@@ -139,6 +146,7 @@ Report::Report(const QString& path)
     title_ = between(text, u"<title>"_s, u"</title>"_s).trimmed();
     styles = between(text, u"<style[^>]*>"_s, u"</style>"_s);
     readSaved(between(text, u"<script[^>]*type=\"application/json\"[^>]*>"_s, u"</script>"_s));
+    putInFragments();
     for (const auto& [part, tag] : {std::pair(&header_, u"header"_s), std::pair(&footer_, u"footer"_s)}) {
         *part = between(body_, u"<"_s + tag + u">"_s, u"</"_s + tag + u">"_s);
         body_.remove(QRegularExpression(u"<%1>.*?</%1>"_s.arg(tag), QRegularExpression::DotMatchesEverythingOption |
@@ -147,6 +155,17 @@ Report::Report(const QString& path)
     for (const QString& part : {header_, footer_, body_})
         if (const mustache::mustache parsed(part.toStdString()); !parsed.is_valid())
             noTemplate(QString::fromStdString(parsed.error_message()));
+}
+
+void Report::putInFragments()
+{
+    static const QRegularExpression fragment(
+        u"<template\\s+id=\"([^\"]+)\">(.*?)</template>"_s,
+        QRegularExpression::DotMatchesEverythingOption | QRegularExpression::CaseInsensitiveOption);
+    for (auto found = fragment.match(body_); found.hasMatch(); found = fragment.match(body_)) {
+        body_.remove(found.capturedStart(), found.capturedLength());
+        body_.replace(u"{{>"_s + found.captured(1) + u"}}"_s, found.captured(2).trimmed());
+    }
 }
 
 void Report::readSaved(const QString& json)
@@ -192,10 +211,11 @@ QString Report::filled(const QString& part, int page, int pages) const
     for (const QString& tag : tags) {
         if (!isOfRows(tag))
             continue;
-        const Condition condition = Condition::in(tag.section(u':', 1));
+        const QList<Condition> conditions = Condition::listIn(tag.section(u':', 1));
         mustache::data list(mustache::data::type::list);
         for (const QVariantList& values : table_.rows)
-            if (const Row row(table_, &values); !condition.isGiven() || row.meets(condition))
+            if (const Row row(table_, &values);
+                std::ranges::all_of(conditions, [&](const Condition& condition) { return row.meets(condition); }))
                 list.push_back(rowData(row));
         data.set(tag.toStdString(), tag.startsWith(u"any:"_s) ? mustache::data(list.is_non_empty_list()) : list);
     }

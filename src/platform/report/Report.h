@@ -32,9 +32,12 @@ struct Parameter {
 ///   {{field}}              of the row, or outside of rows of the first one; {{parameter}}; {{page}} and {{pages}}
 ///   {{field:money}}        with two decimals and groups of three digits, where it is a number
 ///   {{field:date}}         as dd/MM/yyyy, where it is a date
-///   {{#rows}}...{{/rows}}  once for each row; {{#rows:field=A|B}} for those with one of these values, != for the rest
+///   {{#rows}}...{{/rows}}  once for each row; {{#rows:field=A|B}} for those with one of these values,
+///   {{#rows:field!=A}}
+///                          for those without; several conditions joined by commas
 ///   {{#any:field=A|B}}     once where there is such a row
-///   {{#field=A|B}}         where the row has one of these values; {{^...}} where it has not
+///   {{#field=A|B}}         where the row has one of these values; {{^field=A|B}} where it has not
+///   {{>name}}              what stands in <template id="name">
 class Report {
 public:
     /// Throws FileNotFound and the like for a file that cannot be read, TypeMismatch for one that is no template.
@@ -54,6 +57,7 @@ public:
 
 private:
     QString filled(const QString& part, int page, int pages) const;
+    void putInFragments();
     void readSaved(const QString& json);
 
     QString title_;
