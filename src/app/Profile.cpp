@@ -99,6 +99,7 @@ void rebuildIndexes()
 
 void installTemplates()
 {
+    registerResources();
     const QDir templates(u":/templates"_s);
     for (const QString& name : templates.entryList(QDir::Files)) {
         QFile file(templates.filePath(name));

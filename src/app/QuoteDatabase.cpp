@@ -8,9 +8,10 @@
 #include <QFile>
 #include <QRegularExpression>
 
-static void registerSql()  // outside the namespaces, as the macro wants it
+static void registerFiles()  // outside the namespaces, as the macro wants it
 {
     Q_INIT_RESOURCE(sql);
+    Q_INIT_RESOURCE(templates);
 }
 
 namespace kest::app {
@@ -38,7 +39,7 @@ void run(db::Connection& database, const QString& text)
 
 void registerResources()
 {
-    registerSql();
+    registerFiles();
 }
 
 void createTables(db::Connection& database, Dialect dialect)
