@@ -11,6 +11,7 @@
 #include "quotedata/Rounding.h"
 #include "quotedata/StateTable.h"
 #include "reports/BuildAuthReport.h"
+#include "reports/ReportTable.h"
 #include "reports/frmPrintPreview.h"
 #include "shell/Helpers.h"
 #include "shell/modLoggerEx.h"
@@ -24,7 +25,6 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-constexpr int comparisonReport = 730;
 constexpr QLatin1StringView unknownRego = "UNIVERSAL"_L1;
 
 /// What the message tells and the load stores. Reading it fails for every element that is missing, those that only the
@@ -160,7 +160,7 @@ void ShowResults(const db::Recordset& quote, std::optional<db::Recordset>& compa
 {
     WriteQuote(quote.text(u"QTNNO"_s), quote.text(u"Subquote"_s));
     if (comparison)
-        frmPrintPreview::ShowForm(comparisonReport, u""_s, &*comparison);
+        frmPrintPreview::ShowForm(ComparisonReport, u""_s, &*comparison);
     if (gbSubletDocumentArrived) {
         frmSubletAuth::ShowForm(number, subquote);
         gbSubletDocumentArrived = false;
