@@ -29,6 +29,7 @@ constexpr double smallestZoom = 0.1;
 constexpr double largestZoom = 8;
 constexpr int printResolution = 300;  // dots per inch
 constexpr double pointsPerInch = 72;
+constexpr int rightMargin = 150;  // twips
 
 QString whyNotOpened(QPdfDocument::Error error)
 {
@@ -55,7 +56,6 @@ frmViewPDF::frmViewPDF(QPdfDocument& document, const QString& caption)
       lblPage(new QLabel)
 {
     setWindowFlag(Qt::WindowMaximizeButtonHint);
-    setMinimumSize(desktop::pixels(6000, 4500));
     resize(desktop::pixels(12000, 10500));
 
     AcroPDF1->setObjectName("AcroPDF1"_L1);
@@ -66,9 +66,11 @@ frmViewPDF::frmViewPDF(QPdfDocument& document, const QString& caption)
     AcroPDF1->setFocus();
     lblPage->setObjectName("lblPage"_L1);
     toolStrip->layout()->addWidget(lblPage);
-    showPage();
+    showPage(pdf.pageCount());  // the widest
+    setMinimumSize(toolStrip->sizeHint().width() + desktop::pixels(rightMargin), desktop::pixels(4500));
+    showPage(1);
     desktop::onEvent(AcroPDF1->pageNavigator(), &QPdfPageNavigator::currentPageChanged, this,
-                     u"frmViewPDF.AcroPDF1_Page"_s, [this] { showPage(); });
+                     u"frmViewPDF.AcroPDF1_Page"_s, [this](int page) { showPage(page + 1); });
 }
 
 void frmViewPDF::ShowForm(const QString& fileName)
@@ -131,7 +133,7 @@ QWidget* frmViewPDF::tools()
 void frmViewPDF::resizeEvent(QResizeEvent* event)
 {
     Form::resizeEvent(event);
-    const int right = desktop::pixels(150);
+    const int right = desktop::pixels(rightMargin);
     const int bottom = desktop::pixels(400);
     AcroPDF1->setGeometry(0, 0, width() - right, height() - bottom);
     toolStrip->setGeometry(0, height() - bottom, width() - right, bottom);
@@ -187,9 +189,9 @@ void frmViewPDF::print()
     }
 }
 
-void frmViewPDF::showPage()
+void frmViewPDF::showPage(int page)
 {
-    lblPage->setText(u"Page %1 of %2"_s.arg(AcroPDF1->pageNavigator()->currentPage() + 1).arg(pdf.pageCount()));
+    lblPage->setText(u"Page %1 of %2"_s.arg(page).arg(pdf.pageCount()));
 }
 
 }  // namespace kest

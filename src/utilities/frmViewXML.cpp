@@ -205,7 +205,8 @@ void frmViewXML::showPosition()
 // Only what is seen is coloured, so that a message of any size opens at once.
 void frmViewXML::colourVisibleTags()
 {
-    static const QRegularExpression tag(u"</?[^<>\\s/][^<>]*>"_s);
+    // neighbours are coloured as one: of two that touch only the first would be
+    static const QRegularExpression tag(u"(</?[^<>\\s/][^<>]*>)+"_s);
     QTextCharFormat colour;
     colour.setForeground(palette().color(QPalette::Link));
 
