@@ -21,15 +21,16 @@ QString SubletFolder()
 
 QStringList SubletDocumentNumbers(const QString& QTNNO, const QString& Subquote)
 {
-    const QString start = QTNNO + u'.' + Subquote;
+    // with the "_": subquote 1 has no part in the documents of subquote 10
+    const QString start = QTNNO + u'.' + Subquote + u'_';
     QStringList files;
-    attempt([&] { files = files::list(SubletFolder()); });
+    attempt([&] { files = files::list(SubletFolder(), u"*.pdf"_s); });
 
     QStringList numbers;
     for (const QString& file : files) {
-        if (!file.startsWith(start))
+        if (!file.startsWith(start, Qt::CaseInsensitive))
             continue;
-        const QString number = file.section(u'_', 1).section(u'.', 0, 0);
+        const QString number = file.mid(start.size()).section(u'.', 0, 0);
         if (numberIn(number).value_or(0) > 0 && !numbers.contains(number))
             numbers.append(number);
     }

@@ -27,8 +27,7 @@ void setRoot(const QString& folder)
 QString componentFolder()
 {
     const QString fromEnvironment = qEnvironmentVariable("KEST2_COMPONENT_DIR");
-    return fromEnvironment.isEmpty() ? root() + QStringLiteral("/component")
-                                     : QDir::cleanPath(QDir(fromEnvironment).absolutePath());
+    return fromEnvironment.isEmpty() ? root() + QStringLiteral("/component") : fromEnvironment;
 }
 
 }  // namespace kest::profile

@@ -104,6 +104,20 @@ QVariant Sum(const db::Recordset& row, std::initializer_list<QLatin1StringView> 
     return sum;
 }
 
+void Finish(db::Recordset& table, const db::Recordset& quote, db::Recordset& lines)
+{
+    const QVariant total = Sum(quote, {"TOTAL"_L1, "PRTTOTAL"_L1, "MISTOTAL"_L1});
+    for (table.moveFirst(); !table.eof(); table.moveNext()) {
+        table.set(u"total_md"_s, total);
+        if (!FindLine(lines, table.text(u"line_no"_s)))
+            continue;
+        const QString itemNo = lines.text(u"itemno"_s).trimmed();
+        if (!itemNo.isEmpty())
+            table.set(u"itemno"_s, itemNo);
+    }
+    table.moveFirst();
+}
+
 db::Recordset BuildAuthorised(const xml::Document& document, const QString& number, db::Recordset& quote, bool Reprint)
 {
     db::Recordset lines = OpenLines(quote);
@@ -115,7 +129,7 @@ db::Recordset BuildAuthorised(const xml::Document& document, const QString& numb
     CalcAuthorisedTotals(quote, lines);
     if (table.recordCount() == 0)
         AddUnchanged(table, header);
-    FinishAuthReport(table, quote, lines);
+    Finish(table, quote, lines);
     return table;
 }
 
@@ -136,19 +150,6 @@ std::optional<db::Recordset> BuildAuthReport(const xml::Document& document, QStr
     } catch (const RuntimeError&) {
         desktop::msgBox(u"error"_s);
         return {};
-    }
-}
-
-void FinishAuthReport(db::Recordset& table, const db::Recordset& quote, db::Recordset& lines)
-{
-    const QVariant total = Sum(quote, {"TOTAL"_L1, "PRTTOTAL"_L1, "MISTOTAL"_L1});
-    for (table.moveFirst(); !table.eof(); table.moveNext()) {
-        table.set(u"total_md"_s, total);
-        if (!FindLine(lines, table.text(u"line_no"_s)))
-            continue;
-        const QString itemNo = lines.text(u"itemno"_s).trimmed();
-        if (!itemNo.isEmpty())
-            table.set(u"itemno"_s, itemNo);
     }
 }
 

@@ -74,7 +74,9 @@ void Pages::collect(const QTextFrame& frame)
             for (qsizetype i = first; i < lines.size(); ++i)
                 pieces.append({.top = lines[i].first,
                                .bottom = lines[i].second,
-                               .staysWithNext = at.currentBlock().blockFormat().headingLevel() > 0});
+                               .staysWithNext = at.currentBlock().blockFormat().headingLevel() > 0,
+                               .block = at.currentBlock(),
+                               .line = static_cast<int>(i - first)});
         }
     }
 }
@@ -136,7 +138,7 @@ void Pages::slice()
     double top = 0;
     qsizetype first = 0;  // the piece that the page begins with
     do {
-        Slice page{.top = top, .bottom = end};
+        Slice page{.top = top, .bottom = end, .firstPiece = first};
         if (first < pieces.size() && pieces[first].headBottom <= top) {
             page.headTop = pieces[first].headTop;
             page.headBottom = pieces[first].headBottom;
@@ -170,27 +172,50 @@ double Pages::lastLineAbove(double top, double limit) const
     return cut > top ? cut : limit;
 }
 
+void Pages::draw(QPainter& painter, const QTextDocument& document, double at, double from, double to) const
+{
+    if (to <= from)
+        return;
+    painter.save();
+    painter.translate(0, at - from);
+    const QRectF shown(0, from, width, to - from);
+    QAbstractTextDocumentLayout::PaintContext context;
+    const double point = device.logicalDpiY() / pointsPerInch;
+    context.clip = shown.adjusted(0, point, 0, -point);  // what only touches the cut would come on both pages
+    context.palette.setColor(QPalette::Text, Qt::black);
+    painter.setClipRect(shown);
+    document.documentLayout()->draw(&painter, context);
+    painter.restore();
+}
+
+/// The lines of a paragraph that began on the page before, down to the place that is returned. The layout's own drawing
+/// would put the line above the cut here too, hidden but there for whoever searches the file.
+double Pages::drawRestOfParagraph(QPainter& painter, const Slice& slice, double at) const
+{
+    if (slice.firstPiece >= pieces.size() || pieces[slice.firstPiece].line == 0)
+        return slice.top;
+    const QTextBlock& block = pieces[slice.firstPiece].block;
+    const QRectF rect = rectOf(block);
+    painter.save();
+    painter.translate(0, at - slice.top);
+    for (int i = pieces[slice.firstPiece].line; i < block.layout()->lineCount(); ++i)
+        if (const QTextLine line = block.layout()->lineAt(i); rect.top() + line.rect().bottom() <= slice.bottom)
+            line.draw(&painter, rect.topLeft());
+    painter.restore();
+    return std::min(rect.bottom(), slice.bottom);
+}
+
 void Pages::paint(QPainter& painter, int page) const
 {
     const Slice& slice = slices[page];
-    const auto draw = [&](const QTextDocument& document, double at, double from, double to) {
-        if (to <= from)
-            return;
-        painter.save();
-        painter.translate(0, at - from);
-        QAbstractTextDocumentLayout::PaintContext context;
-        context.clip = QRectF(0, from, width, to - from);
-        context.palette.setColor(QPalette::Text, Qt::black);
-        painter.setClipRect(context.clip);
-        document.documentLayout()->draw(&painter, context);
-        painter.restore();
-    };
     const auto header = laidOut(report.header(page + 1, count()));
-    draw(*header, 0, 0, heightOf(*header));
-    draw(*body, headerHeight, slice.headTop, slice.headBottom);
-    draw(*body, headerHeight + slice.headBottom - slice.headTop, slice.top, slice.bottom);
+    draw(painter, *header, 0, 0, heightOf(*header));
+    draw(painter, *body, headerHeight, slice.headTop, slice.headBottom);
+    const double at = headerHeight + slice.headBottom - slice.headTop;
+    const double from = drawRestOfParagraph(painter, slice, at);
+    draw(painter, *body, at + from - slice.top, from, slice.bottom);
     const auto footer = laidOut(report.footer(page + 1, count()));
-    draw(*footer, height - heightOf(*footer), 0, heightOf(*footer));
+    draw(painter, *footer, height - heightOf(*footer), 0, heightOf(*footer));
 }
 
 void setPaper(QPagedPaintDevice& device)

@@ -2,13 +2,13 @@
 #pragma once
 
 #include <QList>
+#include <QTextBlock>
 #include <QTextDocument>
 
 #include <memory>
 
 class QPagedPaintDevice;
 class QPainter;
-class QTextBlock;
 class QTextFrame;
 class QTextTable;
 
@@ -33,6 +33,7 @@ private:
         double bottom;
         double headTop = 0;
         double headBottom = 0;
+        qsizetype firstPiece = 0;
     };
     // What should stay in one piece: a row of a table with its head, or a paragraph's line.
     struct Piece {
@@ -41,6 +42,8 @@ private:
         double headTop = 0;  // of the table that the piece is a row of
         double headBottom = 0;
         bool staysWithNext = false;  // a heading
+        QTextBlock block = {};       // of a paragraph
+        int line = 0;
     };
 
     std::unique_ptr<QTextDocument> laidOut(const QString& html) const;
@@ -49,6 +52,8 @@ private:
     void collectLines(const QTextBlock& block);
     void slice();
     double lastLineAbove(double top, double limit) const;
+    void draw(QPainter& painter, const QTextDocument& document, double at, double from, double to) const;
+    double drawRestOfParagraph(QPainter& painter, const Slice& slice, double at) const;
 
     const Report& report;
     QPagedPaintDevice& device;

@@ -45,6 +45,7 @@ Preview::Preview(QWidget* parent, const std::function<void()>& print)
 
     view->setViewMode(QPrintPreviewWidget::SinglePageView);
     view->setZoomMode(QPrintPreviewWidget::FitToWidth);
+    sheet->setObjectName(u"crvPages"_s);
     sheet->installEventFilter(this);
     setFocusProxy(sheet);
     const QString source = u"frmPrintPreview.crvPreview_View"_s;
@@ -53,6 +54,7 @@ Preview::Preview(QWidget* parent, const std::function<void()>& print)
             paint(*shown, *printer);
     });
     desktop::onEvent(view, &QPrintPreviewWidget::previewChanged, this, source, [this] { showPage(); });
+    desktop::onEvent(sheet->verticalScrollBar(), &QScrollBar::valueChanged, this, source, [this] { showPage(); });
 }
 
 Preview::~Preview() = default;
@@ -99,24 +101,7 @@ void Preview::addTool(QHBoxLayout& row, const QString& name, const QString& capt
 void Preview::goTo(int page)
 {
     view->setCurrentPage(qBound(1, page, view->pageCount()));
-    sheet->verticalScrollBar()->setValue(0);
     showPage();
-}
-
-/// Page down scrolls to the end of the page first, and turns to the top of the next one from there.
-bool Preview::scrollOrTurn(int direction)
-{
-    QScrollBar* bar = sheet->verticalScrollBar();
-    const int end = direction > 0 ? bar->maximum() : bar->minimum();
-    if (bar->value() != end)
-        return false;  // the view scrolls
-    const int page = view->currentPage() + direction;
-    if (page < 1 || page > view->pageCount())
-        return true;
-    goTo(page);
-    if (direction < 0)
-        bar->setValue(bar->maximum());
-    return true;
 }
 
 bool Preview::eventFilter(QObject* watched, QEvent* event)
@@ -124,11 +109,7 @@ bool Preview::eventFilter(QObject* watched, QEvent* event)
     if (watched != sheet || event->type() != QEvent::KeyPress)
         return QWidget::eventFilter(watched, event);
     switch (static_cast<QKeyEvent*>(event)->key()) {
-        case Qt::Key_PageDown:
-            return scrollOrTurn(1);
-        case Qt::Key_PageUp:
-            return scrollOrTurn(-1);
-        case Qt::Key_Home:
+        case Qt::Key_Home:  // the other page keys scroll through all pages by themselves
             goTo(1);
             return true;
         case Qt::Key_End:

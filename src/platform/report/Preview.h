@@ -37,7 +37,6 @@ private:
     void addTool(QHBoxLayout& row, const QString& name, const QString& caption, const QString& hint,
                  const QKeySequence& keys, const std::function<void()>& action);
     void goTo(int page);
-    bool scrollOrTurn(int direction);
     void saveAsPdf();
     void showPage();
 

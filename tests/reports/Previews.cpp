@@ -1,0 +1,67 @@
+#include "reports/Previews.h"
+
+#include "platform/files/files.h"
+
+#include <QFile>
+#include <QJsonArray>
+#include <QProcess>
+
+namespace kest::test {
+
+using namespace Qt::StringLiterals;
+
+Previews::Previews()
+{
+    files::makeFolder(u"c:\\wirra32\\report"_s);
+    for (const char* name : {"710.html", "720.html", "730.html"})
+        putTemplate(name, files::readBytes(QStringLiteral(KEST_SOURCE_DIR "/templates/") + QLatin1String(name)));
+}
+
+void Previews::putTemplate(const char* name, const QByteArray& content)
+{
+    files::writeBytes(u"c:\\wirra32\\report\\"_s + QString::fromLatin1(name), content);
+}
+
+QList<QJsonObject> Previews::windows()
+{
+    QList<QJsonObject> shown;
+    const QJsonArray& all = desktop->record().windows;
+    for (; seen < all.size(); ++seen)
+        shown.append(all[seen].toObject());
+    return shown;
+}
+
+std::string Previews::shownReports()
+{
+    QStringList names;
+    for (const QJsonObject& window : windows())
+        names.append(window[u"name"].toString() + window[u"report"].toVariant().toString());
+    return names.join(u' ').toStdString();
+}
+
+std::string Previews::cells(const QJsonObject& window, int row, const char* fields)
+{
+    const QJsonArray names = window[u"table"][u"fields"].toArray();
+    const QJsonArray values = window[u"table"][u"rows"][row].toArray();
+    QStringList texts;
+    for (const QString& field : QString::fromLatin1(fields).split(u' ')) {
+        qsizetype at = 0;
+        while (at < names.size() && names[at].toString() != field)
+            ++at;
+        texts.append(at == names.size()    ? "no field "_L1 + field
+                     : values[at].isNull() ? u"-"_s
+                                           : values[at].toString());
+    }
+    return texts.join(u'|').toStdString();
+}
+
+QString pdfText(const QString& file)
+{
+    QProcess reader;
+    reader.start(u"pdftotext"_s, {u"-layout"_s, u"-enc"_s, u"UTF-8"_s, file, u"-"_s});
+    EXPECT_TRUE(reader.waitForFinished());
+    EXPECT_EQ(reader.exitCode(), 0);
+    return QString::fromUtf8(reader.readAllStandardOutput());
+}
+
+}  // namespace kest::test

@@ -1,0 +1,154 @@
+// Which report a message gives, with which values, and what is said where it gives none.
+#include "platform/files/files.h"
+#include "reports/Previews.h"
+#include "reports/PrintXML.h"
+#include "shell/SharedVariables.h"
+
+namespace kest::test {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+class Printing : public Previews {
+protected:
+    static void print(const Text& message, bool reprint = true)
+    {
+        gsListFolder = gsReadPath;
+        files::write(gsReadPath + u"message.xml"_s, message);
+        PrintXML(u"message.xml"_s, reprint);
+    }
+};
+
+}  // namespace
+
+TEST_F(Printing, ARequestShowsOneRowForEachImage)
+{
+    quote("500").request("QR1", "1");
+    quote("501").request("QR1", "1");  // the oldest counts
+    files::write(gsUnreadPath + u"QR1_001.txt"_s, u"  Bumper & grille, L/H  \r\n"_s);
+    files::write(gsUnreadPath + u"QR1_002.txt"_s, u""_s);
+    Message request = quoteRequest("QR1").images({"1", "002", "3"});
+    request.rego(" tba ").set("offsiteQuoting", "TRUE").set("vehicleLocation", std::string(80, 'x'));
+    print(request);
+    const QList<QJsonObject> shownWindows = windows();
+    ASSERT_EQ(shownWindows.size(), 1);
+    const QJsonObject& window = shownWindows[0];
+    EXPECT_EQ(window[u"report"].toInt(), 710);
+    ASSERT_EQ(window[u"table"][u"rows"].toArray().size(), 3);
+    const char* images[] = {"1|Bumper & grille, L/H", "2|", "3|"};
+    for (int row = 0; row < 3; ++row) {
+        EXPECT_EQ(cells(window, row, "image_id image_desc"), images[row]);
+        EXPECT_EQ(cells(window, row,
+                        "Corp Quote Qrno Rego Claim Claim_desc Fullname Bay Offsite Quote_due Veh_desc Make "
+                        "Body Built_date Colour_desc Odometer Damage Old_Damage Instruction"),
+                  "|500|QR1|UNIVERSAL|7700001|Reversed into a bollard|Mr Alex Tarrant|3|1|26/3/2008 6:30 AM|"
+                  "Corella Meridian sedan|CORELLA|Sedan|07/2004|Blue|84200|Rear bumper|None|Quote from photographs");
+        EXPECT_EQ(cells(window, row, "Location"), std::string(55, 'x'));
+    }
+}
+
+TEST_F(Printing, ValuesOfARequestAreMadeFromWhatTheMessageHolds)
+{
+    const struct {
+        Fields set;
+        const char* fields;
+        const char* expected;
+    } cases[] = {
+        {{}, "image_id image_desc", "-|-"},
+        {{{"extraVehicleInformation/monthOfManufacture", "0"}}, "Built_date", "01/2004"},
+        {{{"extraVehicleInformation/monthOfManufacture", "x11"}}, "Built_date", "11/2004"},
+        {{{"extraVehicleInformation/yearOfManufacture", "0"}}, "Built_date", ""},
+        {{{"extraVehicleInformation/color", "wHIT"}}, "Colour_desc", "White"},
+        {{{"extraVehicleInformation/color", "XXXX"}}, "Colour_desc", "-"},
+        {{{"claimCustomer/companyName", "Ferry & Co"}}, "Fullname", "Ferry & Co"},
+        {{{"claimCustomer/title", ""}, {"claimCustomer/firstName", " Kim "}}, "Fullname", "Kim Tarrant"},
+        {{{"quoteDueTime", ""}, {"offsiteQuoting", "0"}}, "Quote_due Offsite", "|0"},
+    };
+    quote("500").request("QR1");
+    for (const auto& c : cases) {
+        Message message = quoteRequest("QR1");
+        for (const auto& [path, value] : c.set)
+            message.set(path, value);
+        print(message);
+        const QList<QJsonObject> shownWindows = windows();
+        ASSERT_EQ(shownWindows.size(), 1) << c.expected;
+        EXPECT_EQ(cells(shownWindows[0], 0, c.fields), c.expected);
+    }
+}
+
+TEST_F(Printing, AResultShowsItsReasonForTheOneQuoteOfTheRequest)
+{
+    const std::pair<const char*, const char*> cases[] = {
+        {"UNSP", "Unspecified Reason"}, {"inco", "Quote Incomplete"},
+        {"LABR", "Labour Price"},       {"PART", "Part Price"},
+        {"PAIN", "Paint Price"},        {"RECY", "Recycled Parts"},
+        {"METH", "Method of Repair"},   {"TLSS", "-"},
+    };
+    quote("500", 2).request("QR1");
+    for (const auto& [code, reason] : cases) {
+        print(assessmentResult("KQ1").reason(code));
+        const QList<QJsonObject> shownWindows = windows();
+        ASSERT_EQ(shownWindows.size(), 1);
+        EXPECT_EQ(shownWindows[0][u"report"].toInt(), 720);
+        EXPECT_EQ(shownWindows[0][u"parameters"].toObject(),
+                  (QJsonObject{{u"Comp"_s, u""_s}, {u"Title"_s, u"Assessment Result"_s}}));
+        EXPECT_EQ(cells(shownWindows[0], 0, "KESTQuoteNo QTNNO subquote KESTQRNO reason"),
+                  std::string("KQ1|500|2|QR1|") + reason);
+    }
+    quote("501").request("QR1");
+    print(assessmentResult("KQ1"));
+    EXPECT_EQ(shownReports(), "");
+    EXPECT_EQ(shown(), "[critical] Failed Matching Quote. Please contact MarlinDesk Support");
+}
+
+TEST_F(Printing, EachTypeHasItsReportOrNone)
+{
+    quote("500").request("QR1").line(1);
+    EXPECT_FALSE(PrintXML(u"gone.xml"_s, true));
+    EXPECT_EQ(shown().substr(0, 67), "[none] An error 53 has occured, Please contact MarlinDesk Support\r\n");
+    EXPECT_TRUE(PrintXML({}, true));
+    const struct {
+        Text message;
+        const char* reports;
+        const char* box;
+    } cases[] = {
+        {adjustedQuote("500"), "frmPrintPreview730", ""},
+        {authorisedQuote("500"), "frmPrintPreview730", ""},
+        {quoteMatch("500"), "", ""},
+        {quoteDeletion("KQ1"), "", ""},
+        {revisionRequest("QR1"), "", ""},
+        {cancellation("QR1"), "", ""},
+        {manualQuote("500"), "", ""},
+        {quoteRequest("QR2"), "", "[critical] Quote does not exist in database, please contact MarlinDesk Support."},
+        {adjustedQuote("501"), "", "[critical] Quote not found in database. Please contact MarlinDesk Support."},
+        // an authorisation without its quote still opens the report, on the rows that are saved in its template
+        {authorisedQuote("501"), "frmPrintPreview730",
+         "[critical] Matching quote was not found in database, Please contact MarlinDesk Support."},
+        {Text(Message("adqt", "getAdjustedQuoteResponse").text()), "", ""},
+    };
+    for (const auto& c : cases) {
+        print(c.message);
+        EXPECT_EQ(shownReports(), c.reports) << QString(c.message).toStdString();
+        EXPECT_EQ(shown(), c.box) << QString(c.message).toStdString();
+    }
+    Message broken = adjustedQuote("500");
+    print(broken.without("assessmentComment"));
+    EXPECT_EQ(shown().substr(0, 67), "[none] An error 91 has occured, Please contact MarlinDesk Support\r\n");
+}
+
+TEST_F(Printing, AnAuthorisationAlsoShowsItsSubletDocuments)
+{
+    quote("500", 1).request("QR1").line(7, "MIS", "Alignment").set("qty", 1.0);
+    quote("500").request("QR2");
+    print(authorisedQuote("500/1"));
+    EXPECT_EQ(shownReports(), "frmPrintPreview730");
+    files::writeBytes(u"c:\\wirdoc\\PDF\\500.0_7.pdf"_s, "%PDF-1.4");
+    print(authorisedQuote("500/1"));
+    EXPECT_EQ(shownReports(), "frmPrintPreview730");
+    files::writeBytes(u"c:\\wirdoc\\PDF\\500.1_7.pdf"_s, "%PDF-1.4");
+    print(authorisedQuote("500/1"));
+    EXPECT_EQ(shownReports(), "frmPrintPreview730 frmSubletAuth");
+}
+
+}  // namespace kest::test
