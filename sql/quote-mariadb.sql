@@ -1,5 +1,5 @@
 -- The quote database on MariaDB and MySQL: every table and column that this component reads or writes.
--- The collation compares texts without regard to case and to trailing blanks.
+-- The collation compares texts without regard to case and to trailing blanks, but tells accents apart.
 
 -- QUOTE1: quote headers; subquote 0 is the main quote
 CREATE TABLE QUOTE1 (
@@ -50,7 +50,7 @@ CREATE TABLE QUOTE1 (
     kms            VARCHAR(50),
     msgno          VARCHAR(50),
     policy_no      VARCHAR(50)
-) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_general_ci;
+) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_uca1400_as_ci;
 
 -- QUOTE2: the lines of a quote
 CREATE TABLE QUOTE2 (
@@ -81,7 +81,7 @@ CREATE TABLE QUOTE2 (
     Report      BOOLEAN DEFAULT 0,
     Report_on   INTEGER DEFAULT 0,
     itemno      VARCHAR(5)
-) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_general_ci;
+) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_uca1400_as_ci;
 CREATE INDEX QUOTE2_QUOTE ON QUOTE2 (QTNNO, Subquote);
 
 -- QUOTE3: the long texts of a quote, the note chain among them
@@ -97,7 +97,7 @@ CREATE TABLE QUOTE3 (
     anno_opg       LONGTEXT,
     anno_part      LONGTEXT,
     anno_misc      LONGTEXT
-) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_general_ci;
+) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_uca1400_as_ci;
 
 CREATE TABLE CAR (
     REGO       VARCHAR(20) NOT NULL PRIMARY KEY,
@@ -122,7 +122,7 @@ CREATE TABLE CAR (
     XMission   VARCHAR(50),
     Year       VARCHAR(10),
     PAINT_GP   VARCHAR(2)
-) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_general_ci;
+) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_uca1400_as_ci;
 
 CREATE TABLE CUSTOMER (
     CUST_ID    INTEGER NOT NULL AUTO_INCREMENT PRIMARY KEY,
@@ -137,7 +137,7 @@ CREATE TABLE CUSTOMER (
     mobile     VARCHAR(50),
     Fax        VARCHAR(50),
     email      VARCHAR(100)
-) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_general_ci;
+) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_uca1400_as_ci;
 
 CREATE TABLE INSURER (
     INSURER_ID INTEGER NOT NULL AUTO_INCREMENT PRIMARY KEY,
@@ -159,7 +159,7 @@ CREATE TABLE INSURER (
     phone      VARCHAR(50),
     Fax        VARCHAR(50),
     email      VARCHAR(100)
-) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_general_ci;
+) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_uca1400_as_ci;
 
 -- CINFO: one row of the shop's settings
 CREATE TABLE CINFO (
@@ -169,7 +169,7 @@ CREATE TABLE CINFO (
     second_mu DOUBLE,
     recore_mu DOUBLE,
     after_mu  DOUBLE
-) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_general_ci;
+) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_uca1400_as_ci;
 
 -- VENDOR: suppliers and sublet repairers
 CREATE TABLE VENDOR (
@@ -184,49 +184,49 @@ CREATE TABLE VENDOR (
     accno      VARCHAR(50),
     vendor_abn VARCHAR(50),
     Account    INTEGER
-) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_general_ci;
+) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_uca1400_as_ci;
 
 CREATE TABLE ALLMODEL (
     MODEL_ID VARCHAR(20),
     MAKE     VARCHAR(50),
     MODEL    VARCHAR(50),
     SCHEDULE VARCHAR(20)
-) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_general_ci;
+) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_uca1400_as_ci;
 
 CREATE TABLE MODEL (
     MODEL_ID  VARCHAR(20),
     MODEL_ID1 VARCHAR(20),
     MAKE      VARCHAR(50),
     MODEL     VARCHAR(50)
-) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_general_ci;
+) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_uca1400_as_ci;
 
 CREATE TABLE BODY2 (
     body_id2   VARCHAR(10),
     body_desc2 VARCHAR(50)
-) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_general_ci;
+) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_uca1400_as_ci;
 
 CREATE TABLE JOBSTAGE (
     stage       INTEGER,
     description VARCHAR(50)
-) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_general_ci;
+) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_uca1400_as_ci;
 
 CREATE TABLE KESTColours (
     id     INTEGER,
     Code   VARCHAR(10),
     Script VARCHAR(50)
-) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_general_ci;
+) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_uca1400_as_ci;
 
 CREATE TABLE SUBLET (
     Sublet INTEGER,
     Type   VARCHAR(10),
     Script VARCHAR(50)
-) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_general_ci;
+) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_uca1400_as_ci;
 
 -- DEBTOR: the invoices of a quote
 CREATE TABLE DEBTOR (
     QTNNO   VARCHAR(20),
     INVDATE DATETIME
-) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_general_ci;
+) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_uca1400_as_ci;
 
 -- ExternalSettings: connection data of outside systems
 CREATE TABLE ExternalSettings (
@@ -236,9 +236,9 @@ CREATE TABLE ExternalSettings (
     Property1  VARCHAR(100),
     UserName   VARCHAR(100),
     passWord   VARCHAR(255)
-) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_general_ci;
+) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_uca1400_as_ci;
 
 CREATE TABLE ReportDefinition (
     ReportID   INTEGER,
     ReportName VARCHAR(100)
-) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_general_ci;
+) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_uca1400_as_ci;

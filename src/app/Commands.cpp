@@ -111,7 +111,7 @@ QString rowsAsText(const QList<ListedMessage>& rows)
     for (const ListedMessage& message : rows) {
         text += message.file;
         for (const QString& cell : message.row)
-            text += u'\t' + cell;
+            text += u'\t' + cell.simplified();
         text += u'\n';
     }
     return text;
@@ -153,6 +153,8 @@ Outcome list(const QStringList& arguments)
         if (filtered && gsListFilter != arguments[2])
             window.updateFilter(arguments[2]);
     }
+    if (!window.failure().isEmpty())
+        say(u"kest2: "_s + window.failure() + u'\n', stderr);
     return {.fields = {{u"rows"_s, rowsAsJson(window.rows())}}, .text = rowsAsText(window.rows())};
 }
 
@@ -236,7 +238,8 @@ Outcome setting(const QStringList& arguments)
         RegCreateSubKey(settings::Hive::LocalMachine, key);
         if (!RegSetValue(settings::Hive::LocalMachine, key, arguments[3], arguments[4]))
             return refused(u"the setting could not be written"_s, Refused);
-        return {.fields = {{u"value"_s, arguments[4]}}};
+        const QString stored = RegGetValue(settings::Hive::LocalMachine, key, arguments[3]);
+        return {.fields = {{u"value"_s, stored}}};
     }
     return refused(u"setting takes list, get APP SECTION KEY or set APP SECTION KEY VALUE"_s, Usage);
 }
@@ -266,7 +269,11 @@ Outcome jobLink(const QStringList& arguments)
     settings.password = QString::fromLocal8Bit(input.readLine());
     while (settings.password.endsWith(u'\n') || settings.password.endsWith(u'\r'))
         settings.password.chop(1);
-    InitCipherKey();
+    if (settings.password.contains(u';') || settings.password.trimmed() != settings.password ||
+        files::fromCodePage(files::toCodePage(settings.password)) != settings.password)
+        return refused(
+            u"the password may hold no \";\", no blank at its ends and only characters of the code page 1252"_s,
+            Refused);
     StoreJobLinkSettings(settings);
     return {.text = u"JobLink's settings are stored.\n"_s};
 }
@@ -289,6 +296,7 @@ Outcome runConnected(const Command& command, const QStringList& arguments)
     const eKEST component;
     if (!HasConnection())
         return {.exitCode = NoConnection};
+    InitCipherKey();  // as the panel does: a load may export to JobLink
     return command.run(arguments);
 }
 
@@ -328,7 +336,8 @@ QJsonObject scriptIn(const QString& file)
     QJsonParseError problem;
     const QJsonDocument document = QJsonDocument::fromJson(script.readAll(), &problem);
     if (!document.isObject())
-        throw RuntimeError(TypeMismatch, u"the script "_s + file + u" is no JSON object: "_s + problem.errorString());
+        throw RuntimeError(TypeMismatch, u"the script "_s + file + u" is no JSON object"_s +
+                                             (problem.error ? u": "_s + problem.errorString() : QString()));
     return document.object();
 }
 
@@ -369,6 +378,12 @@ bool isInteractive(const CommandLine& line)
     return line.command == u"open"_s && line.script.isEmpty();
 }
 
+int refuse(const CommandLine& line, const QString& why, int exitCode)
+{
+    print(line, refused(why, exitCode), {});
+    return exitCode;
+}
+
 int run(const CommandLine& line)
 {
     if (!line.profile.isEmpty())
@@ -382,7 +397,7 @@ int run(const CommandLine& line)
             script = answeringScript(line);
         report::setOutputFolder(line.reports);
     } catch (const RuntimeError& error) {
-        return refused(error.description(), Usage).exitCode;
+        return refuse(line, error.description(), Usage);
     }
 
     const Outcome outcome = runCaught(line);

@@ -9,6 +9,9 @@ namespace kest::app {
 /// standard error, and gives the exit code. An application object must exist.
 int run(const CommandLine& line);
 
+/// Says on standard error why a command is not run, and gives the exit code; the JSON answer comes all the same.
+int refuse(const CommandLine& line, const QString& why, int exitCode);
+
 /// True for the one command that a person may answer.
 bool isInteractive(const CommandLine& line);
 

@@ -7,6 +7,7 @@
 #include "platform/profile.h"
 #include "platform/settings/registry.h"
 #include "shell/component.h"
+#include "shell/modDBAccess.h"
 #include "shell/modLoggerEx.h"
 
 #include <QDir>
@@ -94,7 +95,7 @@ void rebuildIndexes()
 {
     const QString folder = profile::root() + u"/databases"_s;
     for (const QString& file : files::list(folder, u"*.db"_s))
-        openEmbedded(file.chopped(3))->rebuildIndexes();
+        attempt([&] { openEmbedded(file.chopped(3))->rebuildIndexes(); });  // a file may be no database
 }
 
 void installTemplates()
@@ -132,12 +133,10 @@ bool initProfile(bool demo, const QDate& today)
 QJsonObject where()
 {
     const QString messages = hostSetting(u"EcomHome"_s);
-    const QString server = hostSetting(u"ServerName"_s);
-    const QString name = hostSetting(u"DatabaseName"_s);
-    const QString instance = hostSetting(u"InstanceName"_s);
-    const bool embedded = server == u"(local)"_s;
-    const QString database =
-        embedded ? embeddedFile(instance.isEmpty() ? name : instance + u'.' + name) : server + u'/' + name;
+    ReadConnectionSettings();
+    const QString file = gsInstance.isEmpty() ? gsDatabase : gsInstance + u'.' + gsDatabase;
+    const bool embedded = db::isThisMachine(gsServer.section(u'\\', 0, 0));
+    const QString database = embedded ? embeddedFile(file) : gsServer + u'/' + gsDatabase;
     const auto folder = [](const QString& path) { return QDir::cleanPath(files::systemPath(path)); };
     return {
         {u"profile"_s, profile::root()},

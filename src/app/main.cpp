@@ -28,15 +28,18 @@ int main(int argc, char** argv)
 {
     using namespace kest::app;
     const CommandLine line = parsed(words(argc, argv));
-    if (!line.error.isEmpty()) {
-        std::fprintf(stderr, "kest2: %s\n\n%s", qUtf8Printable(line.error), qUtf8Printable(usage()));
-        return Usage;
+    if (line.command == QLatin1String("--help")) {
+        std::fputs(qUtf8Printable(usage()), stdout);
+        return Done;
     }
-    if (isInteractive(line) && !hasDisplay()) {
-        std::fputs("kest2: there is no display to open the panel on; give a --script, or run it in a desktop session\n",
-                   stderr);
-        return NeedsAPerson;
-    }
+    if (!line.error.isEmpty())
+        return refuse(line, line.error + QLatin1String("\n\n") + usage(), Usage);
+    if (isInteractive(line) && !hasDisplay())
+        return refuse(
+            line,
+            QStringLiteral("there is no display to open the panel on; give a --script, or run it in a desktop "
+                           "session"),
+            NeedsAPerson);
     if (!isInteractive(line) && !qEnvironmentVariableIsSet("QT_QPA_PLATFORM"))
         qputenv("QT_QPA_PLATFORM", "offscreen");
 

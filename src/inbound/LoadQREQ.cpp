@@ -137,17 +137,6 @@ db::Recordset OpenCustomer(const db::Recordset& car, const Request& request)
     return customer;
 }
 
-struct Column {
-    QLatin1StringView name;
-    QVariant value;
-};
-
-void Fill(db::Recordset& row, std::initializer_list<Column> columns)
-{
-    for (const Column& column : columns)
-        row.set(column.name, column.value);
-}
-
 void FillCustomer(db::Recordset& customer, const Request& request)
 {
     const QString none = u""_s;
@@ -164,16 +153,6 @@ void FillCustomer(db::Recordset& customer, const Request& request)
                        {"email"_L1, none},
                        {"mobile"_L1, none},
                    });
-}
-
-/// Puts a known car's colour in the spelling of the colour table, and empties one that is not in it.
-void RespellColour(db::Recordset& car, db::Recordset& colours)
-{
-    const QString colour = car.text(u"COLOUR"_s);
-    if (colour.isEmpty())
-        return;
-    colours.find(sql("Script='{}'", colour));
-    car.set(u"COLOUR"_s, colours.eof() ? u""_s : colours.text(u"Script"_s).trimmed());
 }
 
 QString BuildDate(const Request& request)

@@ -24,8 +24,9 @@ struct Loader {
 };
 
 constexpr Loader loaders[] = {
-    {"QREQ"_L1, LoadQREQ}, {"QMQR"_L1, LoadQMQR}, {"QTDL"_L1, LoadQTDL}, {"RRQT"_L1, LoadRRQT}, {"QRCN"_L1, LoadQRCN},
-    {"ADQT"_L1, LoadADQT}, {"ARES"_L1, LoadARES}, {"BACA"_L1, LoadBACA}, {"BCQR"_L1, LoadBCQR}, {"EWAP"_L1, LoadEWAP},
+    {"QREQ"_L1, LoadQREQ}, {"QMQR"_L1, LoadQMQR}, {"MANQ"_L1, LoadMANQ}, {"AUQT"_L1, LoadAUQT},
+    {"QTDL"_L1, LoadQTDL}, {"RRQT"_L1, LoadRRQT}, {"QRCN"_L1, LoadQRCN}, {"ADQT"_L1, LoadADQT},
+    {"ARES"_L1, LoadARES}, {"BACA"_L1, LoadBACA}, {"BCQR"_L1, LoadBCQR}, {"EWAP"_L1, LoadEWAP},
 };
 
 void ReportParseError(const xml::ParseError& error, const QString& fileName)
@@ -114,6 +115,21 @@ bool LoadXML(QString& text, const QString& fileName)
         LogError(error, u"modLoadXML.LoadXML"_s, u"LoadXML"_s);
         return false;
     }
+}
+
+void Fill(db::Recordset& row, std::initializer_list<Column> columns)
+{
+    for (const Column& column : columns)
+        row.set(column.name, column.value);
+}
+
+void RespellColour(db::Recordset& car, db::Recordset& colours)
+{
+    const QString colour = car.text(u"COLOUR"_s);
+    if (colour.isEmpty())
+        return;
+    colours.find(sql("Script='{}'", colour));
+    car.set(u"COLOUR"_s, colours.eof() ? u""_s : colours.text(u"Script"_s).trimmed());
 }
 
 db::Recordset OpenNotes(const db::Recordset& quote)

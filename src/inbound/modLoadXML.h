@@ -2,9 +2,13 @@
 #pragma once
 
 #include "platform/database/Recordset.h"
+#include "platform/xml/xml.h"
 #include "shell/modDBAccess.h"
 
 #include <QString>
+#include <QVariant>
+
+#include <initializer_list>
 
 namespace kest {
 
@@ -25,6 +29,7 @@ void LoadSubmissionResponse(QString& text, const QString& fileName);
 bool LoadQREQ(QString& text, const QString& fileName);
 bool LoadQMQR(QString& text, const QString& fileName);
 bool LoadEWAP(QString& text, const QString& fileName);
+bool LoadMANQ(QString& text, const QString& fileName);
 bool LoadQTDL(QString& text, const QString& fileName);
 bool LoadRRQT(QString& text, const QString& fileName);
 bool LoadQRCN(QString& text, const QString& fileName);
@@ -32,6 +37,31 @@ bool LoadBCQR(QString& text, const QString& fileName);
 bool LoadADQT(QString& text, const QString& fileName);
 bool LoadARES(QString& text, const QString& fileName);
 bool LoadBACA(QString& text, const QString& fileName);
+bool LoadAUQT(QString& text, const QString& fileName);  // traps its own failures
+
+// The lines of a quote that comes back, for the loaders of authorised and of manual quotes.
+
+/// Applies the lines of the message to those of the quote: `rsQuote` stands on the quote's row, `rsLines` holds all its
+/// lines. False after a failure, which is in the error log; what was applied before it stays. A line that says to do
+/// something unknown fails the body before any line is touched.
+bool LoadQuoteBody(const db::Recordset& rsQuote, db::Recordset& rsLines, const xml::Document& message);
+/// False, with the error log written, where `LoadQuoteBody` would touch no line.
+bool CheckQuoteBody(const xml::Document& message);
+/// A line brought a document that authorises sublet work. Whoever shows the documents takes the mark away.
+extern bool gbSubletDocumentArrived;
+
+/// The SEQ_NO of a line: `number` where it is above 0, else the next one of the quote. It goes on from the number that
+/// it gave the same quote last, since a line that was numbered may not be stored yet.
+qint64 NextLineNumber(qint64 number, const QString& qtnno, const QString& subquote);
+/// An item code of the current line's category that no line has; "999" where none is left. Never fails, and leaves
+/// `rsLines` where it was.
+QString NextItemNo(db::Recordset& rsLines);
+/// The number of the documents' folder that a document of a line without number gives it: one above `highest` and above
+/// the last digit of every document's name.
+qint64 NextDocumentLine(qint64 highest);
+/// Where a line's document is to lie: under the line's number, or above the quote's highest where that is taken. Empty
+/// without number or subquote of the quote.
+QString NextDocumentName(const QString& qtnno, const QString& subquote, qint64 number);
 
 // What the loaders share.
 
@@ -42,6 +72,14 @@ QString NextQuoteNumber(const QString& given, const db::Recordset& cinfo, db::Re
 /// One more than the highest number among the quote's files in the images folder.
 int NextImageNumber(const QString& quoteNumber);
 
+struct Column {
+    QLatin1StringView name;
+    QVariant value;
+};
+/// Sets columns of the current row, in their order.
+void Fill(db::Recordset& row, std::initializer_list<Column> columns);
+/// Puts a car's colour in the spelling of the colour table, and empties one that is not in it.
+void RespellColour(db::Recordset& car, db::Recordset& colours);
 /// The row of the long texts that belongs to the quote.
 db::Recordset OpenNotes(const db::Recordset& quote);
 /// Says with a critical box why a message is not taken; false.

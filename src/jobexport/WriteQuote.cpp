@@ -99,7 +99,7 @@ void openTarget(Export& job)
     attempt([&] {
         db::Recordset identity(job.jobLink);
         identity.open(u"SELECT last_insert_id()"_s);
-        job.jobId = toLong(identity.value(identity.columns().first()));
+        job.jobId = identity.value(identity.columns().first()).toLongLong();
     });
     attempt([&] {
         job.header.open(

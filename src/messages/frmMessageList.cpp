@@ -8,6 +8,7 @@
 #include "platform/files/files.h"
 #include "reports/PrintXML.h"
 #include "shell/SharedVariables.h"
+#include "shell/modDBAccess.h"
 #include "shell/modLoggerEx.h"
 #include "utilities/frmViewXML.h"
 
@@ -292,6 +293,7 @@ void frmMessageList::fill()
     listed.clear();
     fillFailure.clear();
     try {
+        EnsureConnection();
         listed = BuildMessageList(iFolder, hooks);
     } catch (const RuntimeError& error) {
         fillFailure = error.description();
@@ -444,7 +446,7 @@ QString frmMessageList::selectedFile() const
 // As a click on the file's row; false where the list does not show it.
 bool frmMessageList::select(const QString& file)
 {
-    const QList<QTreeWidgetItem*> found = ListView1->findItems(file, Qt::MatchExactly | Qt::MatchCaseSensitive);
+    const QList<QTreeWidgetItem*> found = ListView1->findItems(file, Qt::MatchFixedString);
     if (found.isEmpty())
         return false;
     ListView1->setCurrentItem(found.first());

@@ -21,16 +21,15 @@ QString SubletFolder()
 
 QStringList SubletDocumentNumbers(const QString& QTNNO, const QString& Subquote)
 {
-    // with the "_": subquote 1 has no part in the documents of subquote 10
-    const QString start = QTNNO + u'.' + Subquote + u'_';
+    const QString start = QTNNO + u'.' + Subquote;
     QStringList files;
-    attempt([&] { files = files::list(SubletFolder(), u"*.pdf"_s); });
+    attempt([&] { files = files::list(SubletFolder()); });
 
     QStringList numbers;
     for (const QString& file : files) {
-        if (!file.startsWith(start, Qt::CaseInsensitive))
+        if (!file.startsWith(start))
             continue;
-        const QString number = file.mid(start.size()).section(u'.', 0, 0);
+        const QString number = file.section(u'_', 1).section(u'.', 0, 0);
         if (numberIn(number).value_or(0) > 0 && !numbers.contains(number))
             numbers.append(number);
     }

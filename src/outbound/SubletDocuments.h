@@ -16,7 +16,8 @@ struct SubletDocument {
     QString vendor;       // empty where the line has none
 };
 
-/// The numbers of a quote's documents, each once, in the order of the file names; empty where the folder can't be read.
+/// The numbers in the file names that begin with the quote, each once, in the order of the names; empty where the
+/// folder can't be read. Subquote 1 finds those of subquote 10 too: which of them it has shows in its lines.
 QStringList SubletDocumentNumbers(const QString& QTNNO, const QString& Subquote);
 
 /// The documents of these numbers whose line is in the quote. What can't be read is left out.

@@ -31,6 +31,7 @@ frmSubletAuth::frmSubletAuth(const QList<SubletDocument>& documents)
     resize(desktop::pixels(9000, 4800));
 
     ListView1->setObjectName("ListView1"_L1);
+    ListView1->setAccessibleName(u"Documents"_s);
     ListView1->setHeaderLabels({u"Description"_s, u"Vendor"_s});
     ListView1->setRootIsDecorated(false);
     ListView1->setAllColumnsShowFocus(true);
@@ -46,10 +47,10 @@ frmSubletAuth::frmSubletAuth(const QList<SubletDocument>& documents)
     ListView1->setCurrentItem(ListView1->topLevelItem(0));
 
     Command1->setObjectName("Command1"_L1);
-    Command1->setText(u"Open"_s);
+    Command1->setText(u"&Open"_s);
     Command1->setDefault(true);
     Command2->setObjectName("Command2"_L1);
-    Command2->setText(u"Close"_s);
+    Command2->setText(u"&Close"_s);
 
     auto* buttons = new QHBoxLayout;
     buttons->addStretch();
@@ -85,7 +86,7 @@ void frmSubletAuth::ShowForm(const QString& QTNNO, const QString& Subquote)
 
 void frmSubletAuth::Command1_Click()
 {
-    if (const QTreeWidgetItem* chosen = ListView1->currentItem())
+    for (const QTreeWidgetItem* chosen : ListView1->selectedItems())
         frmViewPDF::ShowForm(folder + chosen->data(0, fileRole).toString());
 }
 

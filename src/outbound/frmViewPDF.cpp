@@ -29,6 +29,7 @@ constexpr double smallestZoom = 0.1;
 constexpr double largestZoom = 8;
 constexpr int printResolution = 300;  // dots per inch
 constexpr double pointsPerInch = 72;
+constexpr int rightMargin = 150;  // twips
 
 QString whyNotOpened(QPdfDocument::Error error)
 {
@@ -54,19 +55,22 @@ frmViewPDF::frmViewPDF(QPdfDocument& document, const QString& caption)
       toolStrip(tools()),
       lblPage(new QLabel)
 {
-    setMinimumSize(desktop::pixels(6000, 4500));
+    setWindowFlag(Qt::WindowMaximizeButtonHint);
     resize(desktop::pixels(12000, 10500));
 
     AcroPDF1->setObjectName("AcroPDF1"_L1);
+    AcroPDF1->setAccessibleName(u"Document"_s);
     AcroPDF1->setDocument(&pdf);
     AcroPDF1->setPageMode(QPdfView::PageMode::MultiPage);
     AcroPDF1->setZoomMode(QPdfView::ZoomMode::FitToWidth);
     AcroPDF1->setFocus();
     lblPage->setObjectName("lblPage"_L1);
     toolStrip->layout()->addWidget(lblPage);
-    showPage();
+    showPage(pdf.pageCount());  // the widest
+    setMinimumSize(toolStrip->sizeHint().width() + desktop::pixels(rightMargin), desktop::pixels(4500));
+    showPage(1);
     desktop::onEvent(AcroPDF1->pageNavigator(), &QPdfPageNavigator::currentPageChanged, this,
-                     u"frmViewPDF.AcroPDF1_Page"_s, [this] { showPage(); });
+                     u"frmViewPDF.AcroPDF1_Page"_s, [this](int page) { showPage(page + 1); });
 }
 
 void frmViewPDF::ShowForm(const QString& fileName)
@@ -89,26 +93,39 @@ QWidget* frmViewPDF::tools()
     auto* strip = new QWidget(this);
     auto* row = new QHBoxLayout(strip);
     row->setContentsMargins({});
-    const auto add = [&](const QString& caption, const QString& hint, const QKeySequence& keys, auto action) {
+    const auto turn = [this](int pages) {
+        return [this, pages] { goTo(AcroPDF1->pageNavigator()->currentPage() + pages); };
+    };
+    const auto enlarge = [this](double factor) { return [this, factor] { zoom(factor); }; };
+    const auto fitWidth = [this] { AcroPDF1->setZoomMode(QPdfView::ZoomMode::FitToWidth); };
+    const QList<QKeySequence> zoomIn{QKeySequence::ZoomIn, Qt::CTRL | Qt::Key_Equal};  // "+" without Shift
+    const struct {
+        QLatin1StringView name, caption, hint;
+        QList<QKeySequence> keys;
+        std::function<void()> action;
+    } list[] = {
+        {"cmdFirst"_L1, "First"_L1, "First page"_L1, {Qt::Key_Home}, [this] { goTo(0); }},
+        {"cmdPrevious"_L1, "Previous"_L1, "Previous page"_L1, {Qt::CTRL | Qt::Key_PageUp}, turn(-1)},
+        {"cmdNext"_L1, "Next"_L1, "Next page"_L1, {Qt::CTRL | Qt::Key_PageDown}, turn(1)},
+        {"cmdLast"_L1, "Last"_L1, "Last page"_L1, {Qt::Key_End}, [this] { goTo(pdf.pageCount() - 1); }},
+        {"cmdZoomIn"_L1, "Zoom in"_L1, "Larger"_L1, zoomIn, enlarge(zoomStep)},
+        {"cmdZoomOut"_L1, "Zoom out"_L1, "Smaller"_L1, {QKeySequence::ZoomOut}, enlarge(1 / zoomStep)},
+        {"cmdFitWidth"_L1, "Fit width"_L1, "As wide as the window"_L1, {Qt::CTRL | Qt::Key_0}, fitWidth},
+        {"cmdPrint"_L1, "Print..."_L1, "Print"_L1, {QKeySequence::Print}, [this] { print(); }},
+    };
+    for (const auto& [name, caption, hint, keys, action] : list) {
         auto* tool = new QToolButton;
+        tool->setObjectName(name);
         tool->setText(caption);
         tool->setAutoRaise(true);
-        tool->setToolTip(u"%1 (%2)"_s.arg(hint, keys.toString(QKeySequence::NativeText)));
+        tool->setToolTip(u"%1 (%2)"_s.arg(hint, keys.first().toString(QKeySequence::NativeText)));
         row->addWidget(tool);
-        const QString source = u"frmViewPDF.Tool_Click"_s;
+        auto* shortcut = new QShortcut(this);
+        shortcut->setKeys(keys);
+        const QString source = u"frmViewPDF.%1_Click"_s.arg(name);
         desktop::onEvent(tool, &QToolButton::clicked, this, source, action);
-        desktop::onEvent(new QShortcut(keys, this), &QShortcut::activated, this, source, action);
-    };
-    const auto page = [this] { return AcroPDF1->pageNavigator()->currentPage(); };
-    add(u"First"_s, u"First page"_s, Qt::Key_Home, [this] { goTo(0); });
-    add(u"Previous"_s, u"Previous page"_s, Qt::CTRL | Qt::Key_PageUp, [this, page] { goTo(page() - 1); });
-    add(u"Next"_s, u"Next page"_s, Qt::CTRL | Qt::Key_PageDown, [this, page] { goTo(page() + 1); });
-    add(u"Last"_s, u"Last page"_s, Qt::Key_End, [this] { goTo(pdf.pageCount() - 1); });
-    add(u"Zoom in"_s, u"Larger"_s, QKeySequence::ZoomIn, [this] { zoom(zoomStep); });
-    add(u"Zoom out"_s, u"Smaller"_s, QKeySequence::ZoomOut, [this] { zoom(1 / zoomStep); });
-    add(u"Fit width"_s, u"As wide as the window"_s, Qt::CTRL | Qt::Key_0,
-        [this] { AcroPDF1->setZoomMode(QPdfView::ZoomMode::FitToWidth); });
-    add(u"Print..."_s, u"Print"_s, QKeySequence::Print, [this] { print(); });
+        desktop::onEvent(shortcut, &QShortcut::activated, this, source, action);
+    }
     row->addStretch();
     return strip;
 }
@@ -116,7 +133,7 @@ QWidget* frmViewPDF::tools()
 void frmViewPDF::resizeEvent(QResizeEvent* event)
 {
     Form::resizeEvent(event);
-    const int right = desktop::pixels(150);
+    const int right = desktop::pixels(rightMargin);
     const int bottom = desktop::pixels(400);
     AcroPDF1->setGeometry(0, 0, width() - right, height() - bottom);
     toolStrip->setGeometry(0, height() - bottom, width() - right, bottom);
@@ -172,9 +189,9 @@ void frmViewPDF::print()
     }
 }
 
-void frmViewPDF::showPage()
+void frmViewPDF::showPage(int page)
 {
-    lblPage->setText(u"Page %1 of %2"_s.arg(AcroPDF1->pageNavigator()->currentPage() + 1).arg(pdf.pageCount()));
+    lblPage->setText(u"Page %1 of %2"_s.arg(page).arg(pdf.pageCount()));
 }
 
 }  // namespace kest

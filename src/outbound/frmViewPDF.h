@@ -26,7 +26,7 @@ private:
     void goTo(int page);
     void zoom(double factor);
     void print();
-    void showPage();
+    void showPage(int page);
 
     QPdfDocument& pdf;
     QPdfView* AcroPDF1;

@@ -27,7 +27,8 @@ void setRoot(const QString& folder)
 QString componentFolder()
 {
     const QString fromEnvironment = qEnvironmentVariable("KEST2_COMPONENT_DIR");
-    return fromEnvironment.isEmpty() ? root() + QStringLiteral("/component") : fromEnvironment;
+    return fromEnvironment.isEmpty() ? root() + QStringLiteral("/component")
+                                     : QDir::cleanPath(QDir(fromEnvironment).absolutePath());
 }
 
 }  // namespace kest::profile

@@ -104,20 +104,6 @@ QVariant Sum(const db::Recordset& row, std::initializer_list<QLatin1StringView> 
     return sum;
 }
 
-void Finish(db::Recordset& table, const db::Recordset& quote, db::Recordset& lines)
-{
-    const QVariant total = Sum(quote, {"TOTAL"_L1, "PRTTOTAL"_L1, "MISTOTAL"_L1});
-    for (table.moveFirst(); !table.eof(); table.moveNext()) {
-        table.set(u"total_md"_s, total);
-        if (!FindLine(lines, table.text(u"line_no"_s)))
-            continue;
-        const QString itemNo = lines.text(u"itemno"_s).trimmed();
-        if (!itemNo.isEmpty())
-            table.set(u"itemno"_s, itemNo);
-    }
-    table.moveFirst();
-}
-
 db::Recordset BuildAuthorised(const xml::Document& document, const QString& number, db::Recordset& quote, bool Reprint)
 {
     db::Recordset lines = OpenLines(quote);
@@ -129,7 +115,7 @@ db::Recordset BuildAuthorised(const xml::Document& document, const QString& numb
     CalcAuthorisedTotals(quote, lines);
     if (table.recordCount() == 0)
         AddUnchanged(table, header);
-    Finish(table, quote, lines);
+    FinishAuthReport(table, quote, lines);
     return table;
 }
 
@@ -151,6 +137,20 @@ std::optional<db::Recordset> BuildAuthReport(const xml::Document& document, QStr
         desktop::msgBox(u"error"_s);
         return {};
     }
+}
+
+void FinishAuthReport(db::Recordset& table, const db::Recordset& quote, db::Recordset& lines)
+{
+    const QVariant total = Sum(quote, {"TOTAL"_L1, "PRTTOTAL"_L1, "MISTOTAL"_L1});
+    for (table.moveFirst(); !table.eof(); table.moveNext()) {
+        table.set(u"total_md"_s, total);
+        if (!FindLine(lines, table.text(u"line_no"_s)))
+            continue;
+        const QString itemNo = lines.text(u"itemno"_s).trimmed();
+        if (!itemNo.isEmpty())
+            table.set(u"itemno"_s, itemNo);
+    }
+    table.moveFirst();
 }
 
 std::optional<db::Recordset> BuildAdjustedReport(const xml::Document& document, bool Reprint)

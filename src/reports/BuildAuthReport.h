@@ -19,8 +19,12 @@ namespace kest {
 std::optional<db::Recordset> BuildAuthReport(const xml::Document& document, QString& quoteNumber, QString& subquote,
                                              bool Reprint);
 
-/// The same for an adjusted quote, which may have no row and changes nothing in the database. Nothing after a box where
-/// no quote matches; failures are thrown.
+/// Puts the quote's total on all rows of the comparison, and on each the item code of its line: what is final only when
+/// the message's lines are in the quote.
+void FinishAuthReport(db::Recordset& table, const db::Recordset& quote, db::Recordset& lines);
+
+/// The comparison for an adjusted quote, which may have no row and changes nothing in the database. Nothing after a box
+/// where no quote matches; failures are thrown.
 std::optional<db::Recordset> BuildAdjustedReport(const xml::Document& document, bool Reprint);
 
 }  // namespace kest

@@ -3,6 +3,7 @@
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
+#include "quotedata/Vendors.h"
 #include "reports/ReportTable.h"
 #include "shell/SharedVariables.h"
 
@@ -322,21 +323,8 @@ void Comparison::sublet(db::Recordset& subletTypes)
 /// The vendor that the repairer of a sublet line is; a new one where the shop knows none of that name.
 QVariant VendorOf(const Line& line)
 {
-    const QString name = line.text("subletRepairer").left(repairerLength);
-    db::Recordset vendor(gConn);
-    vendor.open(sql("SELECT * FROM VENDOR WHERE NAME LIKE '%{}%'", name));
-    if (vendor.eof()) {
-        vendor.addNew();
-        vendor.set(u"Name"_s, name);
-        vendor.set(u"street"_s, line.text("subletRepairerAddress").left(repairerLength));
-        vendor.set(u"phone"_s, line.text("subletRepairerPhone"));
-        vendor.set(u"Account"_s, 293);
-        for (const QLatin1StringView empty :
-             {"contact"_L1, "suburb"_L1, "Fax"_L1, "accno"_L1, "email"_L1, "vendor_abn"_L1})
-            vendor.set(empty, u""_s);
-        vendor.update();
-    }
-    return vendor.value(u"VENDOR_ID"_s);
+    return FindOrAddVendor(line.text("subletRepairer").left(repairerLength),
+                           line.text("subletRepairerAddress").left(repairerLength), line.text("subletRepairerPhone"));
 }
 
 void StartRow(db::Recordset& table, const Line& line, Section section, ComparisonOf comparison)

@@ -20,6 +20,8 @@ QString homeFolder()
     return GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"EcomHome"_s, u"c:\\wirdoc\\"_s);
 }
 
+int objects = 0;  // they share connection and folders
+
 void reportUntrapped(const RuntimeError& error, const QString& source)
 {
     LogError(error, source, source.mid(source.indexOf(u'.') + 1));
@@ -29,6 +31,7 @@ void reportUntrapped(const RuntimeError& error, const QString& source)
 
 eKEST::eKEST()
 {
+    ++objects;
     desktop::setFailureReporter(reportUntrapped);
     gConn = GetConnection();
     gsUnreadPath = homeFolder() + u"AUnread\\"_s;
@@ -40,6 +43,8 @@ eKEST::eKEST()
 
 eKEST::~eKEST()
 {
+    if (--objects > 0)
+        return;
     grsQuote.reset();
     gConn.reset();
     gcnDB.reset();
@@ -57,6 +62,7 @@ void eKEST::ShowKESTWindow(const QString& sQTNNO, const QString& sSubQuote)
 
 bool HasConnection()
 {
+    gConn = GetConnection();
     if (!gConn)
         desktop::msgBox(u"Could not connect to the quote database, Please contact MarlinDesk Support."_s,
                         desktop::Icon::Critical);

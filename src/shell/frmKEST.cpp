@@ -54,6 +54,7 @@ frmKEST::frmKEST() : Form(u"frmKEST"_s, u"ORLA Partner Network"_s)
     cmdOK = new QPushButton(u"&OK"_s, this);
     cmdOK->setObjectName(u"cmdOK"_s);
     cmdOK->setDefault(true);
+    cmdOK->installEventFilter(this);
     desktop::onEvent(cmdOK, &QPushButton::clicked, this, u"frmKEST.cmdOK_Click"_s, [this] { cmdOK_Click(); });
 
     cmdExit = desktop::exitButton(this, u"cmdExit"_s, u"Close the panel"_s);
@@ -97,12 +98,24 @@ bool frmKEST::event(QEvent* event)
     return Form::event(event);
 }
 
+/// Enter with any shift key does nothing, on the button too, which would take it for a click.
+bool frmKEST::eventFilter(QObject* watched, QEvent* event)
+{
+    if (event->type() == QEvent::KeyPress) {
+        const auto& key = static_cast<const QKeyEvent&>(*event);
+        const bool isEnter = key.key() == Qt::Key_Return || key.key() == Qt::Key_Enter;
+        if (isEnter && (key.modifiers() & ~Qt::KeypadModifier))
+            return true;
+    }
+    return Form::eventFilter(watched, event);
+}
+
 void frmKEST::keyPressEvent(QKeyEvent* event)
 {
     if (event->key() == Qt::Key_Return || event->key() == Qt::Key_Enter) {
         if (!(event->modifiers() & ~Qt::KeypadModifier))
             cmdOK->click();
-        return;  // Enter with any shift key does nothing
+        return;
     }
     Form::keyPressEvent(event);
 }

@@ -34,7 +34,9 @@ QString splashSetting(const QString& key, const QString& fallback = {})
     return GetRegSetting(u"wirra32"_s, u"frmsplash"_s, key, fallback, CopyUp::No);
 }
 
-void readConnectionSettings()
+}  // namespace
+
+void ReadConnectionSettings()
 {
     const QString useMaster = splashSetting(u"TabletUseMaster"_s);
     const QString prefix = useMaster == u"1"_s ? u"TabletMaster"_s : QString();
@@ -48,6 +50,8 @@ void readConnectionSettings()
         gsServer = u"(local)"_s;
 }
 
+namespace {
+
 int chosenDriver()
 {
     const QString type = GetRegSetting(u"wirra32"_s, u"frmSplash"_s, u"ClientConnectionType"_s, u"0"_s);
@@ -55,7 +59,9 @@ int chosenDriver()
         GetRegSetting(u"Microsoft"_s, u"Windows NT\\CurrentVersion"_s, u"CurrentVersion"_s, QString());
     if (system >= u"6.0"_s)
         return 1;
-    return static_cast<int>(numberIn(type).value_or(0));
+    int number = 0;  // also for a text that is no number
+    attempt([&] { number = static_cast<int>(toInteger(type)); });
+    return number;
 }
 
 bool isOpen()
@@ -72,8 +78,10 @@ db::ConnectionPtr GetConnection()
 
 bool EnsureConnection()
 {
-    if (!isOpen())
+    if (!isOpen()) {
         OpenDatabase();
+        gConn = isOpen() ? gcnDB : nullptr;
+    }
     return isOpen();
 }
 
@@ -81,7 +89,7 @@ void OpenDatabase()
 {
     gcnDB = std::make_shared<db::Connection>();
     lastFailure = {};
-    attempt([] { readConnectionSettings(); });
+    attempt([] { ReadConnectionSettings(); });
     attempt([] {
         try {
             gcnDB->open(ConnectionText(chosenDriver()));

@@ -21,6 +21,8 @@ db::ConnectionPtr GetConnection();
 bool EnsureConnection();
 /// Reads the settings and opens the connection; a failure shows only as a closed connection.
 void OpenDatabase();
+/// Takes server, instance, database and password from the settings, which stay where they are.
+void ReadConnectionSettings();
 /// The text that the connection is opened with, from the variables above; empty for a driver number that names none.
 QString ConnectionText(int driverNumber);
 /// A query on a fresh recordset, or none after a critical message when there is no connection.

@@ -1,7 +1,8 @@
 #include "utilities/ExactTextEdit.h"
 
+#include <QKeyEvent>
+#include <QMimeData>
 #include <QTextBlock>
-#include <QTextBlockFormat>
 
 using namespace Qt::StringLiterals;
 
@@ -11,7 +12,7 @@ namespace {
 
 constexpr qsizetype longestLine = 4000;  // characters; a document in base64 may stand in one line of millions
 constexpr auto usualJoint = "\r\n"_L1;
-constexpr int jointIndex = QTextFormat::UserProperty;  // into `joints`; each is given to one line only
+constexpr int jointIndex = QTextFormat::UserProperty;  // into `joints`; kept by the line end's own character
 
 /// The characters at which Qt starts a new line of a plain text.
 bool endsLine(QChar c)
@@ -65,11 +66,11 @@ void ExactTextEdit::setExactText(const QString& text)
         block = block.next();
         if (line.jointBefore == usualJoint)
             continue;
-        QTextBlockFormat format;
+        QTextCharFormat format;
         format.setProperty(jointIndex, static_cast<int>(joints.size()));
         joints.append(line.jointBefore.toString());
         cursor.setPosition(block.position());
-        cursor.setBlockFormat(format);
+        cursor.setBlockCharFormat(format);
     }
     cursor.endEditBlock();
     document()->setModified(false);
@@ -78,18 +79,50 @@ void ExactTextEdit::setExactText(const QString& text)
 
 QString ExactTextEdit::exactText() const
 {
-    QString text = document()->begin().text();
-    text.reserve(document()->characterCount());
+    return exactText(0, document()->characterCount() - 1);
+}
+
+QString ExactTextEdit::exactText(int start, int end) const
+{
+    QString text;
+    text.reserve(end - start);
     int indexBefore = -1;
-    for (QTextBlock block = document()->begin().next(); block.isValid(); block = block.next()) {
-        const QVariant kept = block.blockFormat().property(jointIndex);
-        const int index = kept.isValid() ? kept.toInt() : -1;
-        // a line that a person starts inherits the format of the line that it was cut from
-        text += index < 0 || index == indexBefore ? QString(usualJoint) : joints[index];
-        text += block.text();
-        indexBefore = index;
+    const QTextBlock first = document()->findBlock(start);
+    for (QTextBlock block = first; block.isValid() && block.position() <= end; block = block.next()) {
+        if (block != first) {
+            // the indexes rise: what a person starts in an empty line inherits that line's
+            const QVariant index = block.charFormat().property(jointIndex);
+            const bool isKept = index.isValid() && index.toInt() > indexBefore;
+            text += isKept ? joints[index.toInt()] : QString(usualJoint);
+            if (isKept)
+                indexBefore = index.toInt();
+        }
+        const int from = qMax(start - block.position(), 0);
+        text += QStringView(block.text()).mid(from, end - block.position() - from);
     }
     return text;
+}
+
+void ExactTextEdit::keyPressEvent(QKeyEvent* event)
+{
+    if (!event->matches(QKeySequence::InsertLineSeparator))
+        return QPlainTextEdit::keyPressEvent(event);
+    QKeyEvent plainReturn(QEvent::KeyPress, Qt::Key_Return, Qt::NoModifier, u"\r"_s);
+    QPlainTextEdit::keyPressEvent(&plainReturn);
+}
+
+QMimeData* ExactTextEdit::createMimeDataFromSelection() const
+{
+    auto* copied = new QMimeData;
+    copied->setText(exactText(textCursor().selectionStart(), textCursor().selectionEnd()));
+    return copied;
+}
+
+void ExactTextEdit::insertFromMimeData(const QMimeData* source)
+{
+    QMimeData pasted;
+    pasted.setText(source->text().replace(QChar::LineSeparator, u'\n'));
+    QPlainTextEdit::insertFromMimeData(&pasted);
 }
 
 }  // namespace kest

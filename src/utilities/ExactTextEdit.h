@@ -1,4 +1,4 @@
-// A text box that gives back the very text that it was given, where nobody typed.
+// A text box that gives back the very text that it was given, but for what a person changed.
 #pragma once
 
 #include <QPlainTextEdit>
@@ -6,9 +6,8 @@
 namespace kest {
 
 /// Qt's own text box turns every line end into a line feed and every hard blank into a blank, and is slow on lines of
-/// millions of characters. This one keeps, line by line, how the line is joined to the one before it: by a carriage
-/// return and a line feed (as are lines that a person starts), by a single one of them, or, where it shows an overlong
-/// line in pieces, by nothing.
+/// millions of characters. This one keeps with each line end what it stands for: a carriage return and a line feed (as
+/// do those that a person puts in), a single one of them, or, where an overlong line is shown in pieces, nothing.
 class ExactTextEdit final : public QPlainTextEdit {
     Q_OBJECT
     Q_PROPERTY(QString exactText READ exactText)
@@ -20,8 +19,15 @@ public:
     void setExactText(const QString& text);
     QString exactText() const;
 
+protected:
+    void keyPressEvent(QKeyEvent* event) override;
+    QMimeData* createMimeDataFromSelection() const override;
+    void insertFromMimeData(const QMimeData* source) override;
+
 private:
-    QStringList joints;  // of the lines that are joined in another way than usual
+    QString exactText(int start, int end) const;
+
+    QStringList joints;  // what the line ends stand for that are other than usual
 };
 
 }  // namespace kest

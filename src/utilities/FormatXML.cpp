@@ -6,6 +6,8 @@
 #include "platform/files/files.h"
 #include "platform/xml/xml.h"
 
+#include <QStringDecoder>
+
 #include <optional>
 
 using namespace Qt::StringLiterals;
@@ -59,6 +61,14 @@ void FormatNode(QString& text, const xml::Node& node, qint16 level)
     }
 }
 
+/// The text of a file: in the encoding of its byte order mark where it has one, else in the code page.
+QString textOfFile(const QString& fileName)
+{
+    const QByteArray bytes = files::readBytes(fileName);
+    const std::optional<QStringConverter::Encoding> marked = QStringConverter::encodingForData(bytes);
+    return marked ? QStringDecoder(*marked).decode(bytes) : files::fromCodePage(bytes);
+}
+
 /// Parses the text, each of the two known faults repaired once.
 bool loadRepaired(xml::Document& document, QString text)
 {
@@ -78,7 +88,7 @@ QString FormatXML(const QString& fileName)
 {
     xml::Document document;
     bool loaded = false;
-    attempt([&] { loaded = loadRepaired(document, files::read(fileName)); });
+    attempt([&] { loaded = loadRepaired(document, textOfFile(fileName)); });
     if (!loaded) {
         desktop::msgBox(u"Error loading XML - Corrupt file?"_s, desktop::Icon::Critical);
         return {};

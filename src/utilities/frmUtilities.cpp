@@ -38,13 +38,21 @@ constexpr Field fields[] = {
     {"txtRego"_L1, "Rego"_L1, "REGO"_L1, false},
     {"txtJobStage"_L1, "Job Stage"_L1, ""_L1, false},
     {"txtInsurer"_L1, "Insurer"_L1, ""_L1, false},
-    {"txtQRNo"_L1, "KEST QR No"_L1, "KESTQRNo"_L1, true},
-    {"txtQRVer"_L1, "QR Ver"_L1, "KESTQRVer"_L1, true},
-    {"txtQuoteNo"_L1, "KEST Quote No"_L1, "KESTQuoteNo"_L1, true},
-    {"txtClaimNo"_L1, "KEST Claim No"_L1, "Claim"_L1, true},
-    {"txtAuthNo"_L1, "KEST Auth No"_L1, "KESTAuthNo"_L1, true},
-    {"txtAuthDate"_L1, "KEST Auth Date"_L1, "AuthDate"_L1, true},
+    {"txtQRNo"_L1, "KEST Q&R No"_L1, "KESTQRNo"_L1, true},
+    {"txtQRVer"_L1, "QR &Ver"_L1, "KESTQRVer"_L1, true},
+    {"txtQuoteNo"_L1, "KEST &Quote No"_L1, "KESTQuoteNo"_L1, true},
+    {"txtClaimNo"_L1, "KEST Cla&im No"_L1, "Claim"_L1, true},
+    {"txtAuthNo"_L1, "KEST &Auth No"_L1, "KESTAuthNo"_L1, true},
+    {"txtAuthDate"_L1, "KEST Auth &Date"_L1, "AuthDate"_L1, true},
 };
+
+QLabel* labelOf(QWidget* control, const QString& caption)
+{
+    auto* label = new QLabel(caption);
+    label->setBuddy(control);
+    label->setIndent(desktop::pixels(30));  // a J reaches out of its place to the left
+    return label;
+}
 
 /// The one value that a query gives, or the empty text.
 QString firstValueOf(const QString& select)
@@ -56,16 +64,20 @@ QString firstValueOf(const QString& select)
 
 }  // namespace
 
-frmUtilities::frmUtilities()
+frmUtilities::frmUtilities(const QString& quoteNumber, const QString& shownSubquote)
     : Form(u"frmUtilities"_s, u"Utilities"_s),
+      number(quoteNumber),
+      subquote(shownSubquote),
       quote(gConn),
+      lines(gConn),
       remarks(gConn),
       TabStrip1(new QTabBar),
-      chkReadOnly(new QCheckBox(u"Read Only"_s)),
-      chkExtraInfo(new QCheckBox(u"Extra Information"_s)),
+      chkReadOnly(new QCheckBox(u"Read Onl&y"_s)),
+      chkExtraInfo(new QCheckBox(u"E&xtra Information"_s)),
       txtRemarks(new ExactTextEdit)
 {
     TabStrip1->setObjectName("TabStrip1"_L1);
+    TabStrip1->setAccessibleName(u"Quote and additionals"_s);
     TabStrip1->setExpanding(false);
 
     auto* layout = new QVBoxLayout(this);
@@ -94,7 +106,7 @@ QWidget* frmUtilities::quoteInformation()
             text->setPalette(colours);
         }
         const int column = place % 2 * 2;
-        grid->addWidget(new QLabel(field.label), place / 2, column);
+        grid->addWidget(labelOf(text, field.label), place / 2, column);
         grid->addWidget(text, place / 2, column + 1);
         ++place;
     }
@@ -106,7 +118,7 @@ QWidget* frmUtilities::quoteInformation()
     txtRemarks->setObjectName("txtRemarks"_L1);
     txtRemarks->setTabChangesFocus(true);
     txtRemarks->setMinimumHeight(desktop::pixels(1500));
-    grid->addWidget(new QLabel(u"Remarks"_s), below + 1, 0, Qt::AlignTop);
+    grid->addWidget(labelOf(txtRemarks, "Re&marks"_L1), below + 1, 0, Qt::AlignTop);
     grid->addWidget(txtRemarks, below + 1, 1, 1, 3);
     grid->setRowStretch(below + 1, 1);
     return frame;
@@ -134,10 +146,10 @@ QWidget* frmUtilities::closingButtons()
     auto* buttons = new QWidget;
     auto* row = new QHBoxLayout(buttons);
     row->setContentsMargins({});
-    row->addWidget(button(u"Command9"_s, u"Undo"_s, &frmUtilities::Command9_Click));
+    row->addWidget(button(u"Command9"_s, u"&Undo"_s, &frmUtilities::Command9_Click));
     row->addStretch();
-    row->addWidget(button(u"Command1"_s, u"Save"_s, &frmUtilities::Command1_Click));
-    row->addWidget(button(u"Command2"_s, u"Close"_s, &frmUtilities::Command2_Click));
+    row->addWidget(button(u"Command1"_s, u"&Save"_s, &frmUtilities::Command1_Click));
+    row->addWidget(button(u"Command2"_s, u"&Close"_s, &frmUtilities::Command2_Click));
     return buttons;
 }
 
@@ -157,18 +169,17 @@ QLineEdit* frmUtilities::box(QLatin1StringView name) const
 
 void frmUtilities::ShowForm(const QString& sQTNNO, const QString& sSubQuote)
 {
-    const QString subquote = sSubQuote.isEmpty() ? u"0"_s : sSubQuote;
-    frmUtilities form;
-    form.AddTabs(sQTNNO, subquote);
-    form.OpenRows(sQTNNO, subquote);
+    frmUtilities form(sQTNNO, sSubQuote.isEmpty() ? u"0"_s : sSubQuote);
+    form.AddTabs();
+    form.OpenRows();
     form.Fill();
     desktop::showModal(form);
 }
 
-void frmUtilities::AddTabs(const QString& number, const QString& shownSubquote)
+void frmUtilities::AddTabs()
 {
-    const auto add = [this](const QString& caption, const QString& subquote) {
-        TabStrip1->setTabData(TabStrip1->addTab(caption), u'S' + subquote);
+    const auto add = [this](const QString& caption, const QString& ofSubquote) {
+        TabStrip1->setTabData(TabStrip1->addTab(caption), u'S' + ofSubquote);
     };
     add(u"Quote"_s, u"0"_s);
     db::Recordset subquotes(gConn);
@@ -177,23 +188,26 @@ void frmUtilities::AddTabs(const QString& number, const QString& shownSubquote)
         for (subquotes.moveNext(); !subquotes.eof(); subquotes.moveNext())
             add(u"Add.-"_s + subquotes.text(u"SUBQUOTE"_s), subquotes.text(u"SUBQUOTE"_s));
     }
-    for (int tab = 0; tab < TabStrip1->count(); ++tab) {
-        if (TabStrip1->tabData(tab).toString() == u'S' + shownSubquote)
+    for (int tab = TabStrip1->count() - 1; tab >= 0; --tab) {  // of two with one subquote the first
+        if (TabStrip1->tabData(tab).toString() == u'S' + subquote)
             TabStrip1->setCurrentIndex(tab);
     }
+    shownTab = TabStrip1->currentIndex();
     desktop::onEvent(TabStrip1, &QTabBar::currentChanged, this, u"frmUtilities.TabStrip1_Click"_s,
                      [this] { TabStrip1_Click(); });
 }
 
-void frmUtilities::OpenRows(const QString& number, const QString& subquote)
+void frmUtilities::OpenRows()
 {
     quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+    lines.open(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
     remarks.open(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
 }
 
 void frmUtilities::CloseRows()
 {
     quote.close();
+    lines.close();
     remarks.close();
 }
 
@@ -203,8 +217,8 @@ void frmUtilities::Fill()
         if (!field.column.isEmpty())
             box(field.name)->setText(quote.text(field.column));
     }
-    const bool isMainQuote = SubquoteOfRow() == u"0"_s;
-    box("txtQTNNO"_L1)->setText(quote.text(u"QTNNO"_s) + (isMainQuote ? QString() : u'/' + SubquoteOfRow()));
+    const bool isMainQuote = subquote == u"0"_s;
+    box("txtQTNNO"_L1)->setText(quote.text(u"QTNNO"_s) + (isMainQuote ? QString() : u'/' + subquote));
     box("txtJobStage"_L1)
         ->setText(firstValueOf(sql("SELECT description FROM JOBSTAGE WHERE stage={}", quote.value(u"Job_stage"_s))));
     box("txtInsurer"_L1)
@@ -214,28 +228,25 @@ void frmUtilities::Fill()
     txtRemarks->setExactText(remarks.eof() ? QString() : remarks.text(u"remarks"_s));
 }
 
-/// The shown row's subquote; "0" where it has none.
-QString frmUtilities::SubquoteOfRow() const
-{
-    const QString subquote = quote.text(u"Subquote"_s);
-    return subquote.isEmpty() ? u"0"_s : subquote;
-}
-
 void frmUtilities::TabStrip1_Click()
 {
-    const QString number = quote.text(u"QTNNO"_s);
-    const QString subquote = TabStrip1->tabData(TabStrip1->currentIndex()).toString().mid(1);
-    quote.close();
-    quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+    const QString wanted = TabStrip1->tabData(TabStrip1->currentIndex()).toString().mid(1);
+    db::Recordset chosen(gConn);
+    chosen.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, wanted));
+    if (chosen.eof()) {
+        const QSignalBlocker silent(TabStrip1);
+        TabStrip1->setCurrentIndex(shownTab);
+        throw RuntimeError(NoCurrentRow, u"Quote %1/%2 is no longer there."_s.arg(number, wanted));
+    }
+    shownTab = TabStrip1->currentIndex();
+    subquote = wanted.isEmpty() ? u"0"_s : wanted;
     Command9_Click();
 }
 
 void frmUtilities::Command9_Click()
 {
-    const QString number = quote.text(u"QTNNO"_s);
-    const QString subquote = SubquoteOfRow();
     CloseRows();
-    OpenRows(number, subquote);
+    OpenRows();
     Fill();
 }
 
@@ -243,6 +254,7 @@ void frmUtilities::Command1_Click()
 {
     if (SafeVal(box("txtClaimNo"_L1)->text(), u"0"_s) <= 0) {
         desktop::msgBox(u"Invalid Claim Number Entered"_s, desktop::Icon::Critical);
+        box("txtClaimNo"_L1)->setFocus();
         return;
     }
     WriteQuote();
@@ -250,22 +262,31 @@ void frmUtilities::Command1_Click()
     quote.update();
     remarks.update();
     CloseRows();
+    close();  // what is saved stays saved, whatever becomes of the host's quote
 
-    // the host's quote, also where another subquote was edited
+    // also where another subquote was edited
     auto hostQuote = std::make_shared<db::Recordset>(gConn);
     hostQuote->open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", gsQTNNO, gsSubQuote));
     grsQuote = hostQuote;
-    close();
+}
+
+void frmUtilities::WriteField(QLatin1StringView name, const QString& column)
+{
+    const QString text = box(name)->text();
+    const bool noDate = column == "AuthDate"_L1 && text.isEmpty();
+    try {
+        quote.set(column, noDate ? QVariant() : QVariant(text));
+    } catch (const RuntimeError&) {
+        box(name)->setFocus();
+        throw;
+    }
 }
 
 void frmUtilities::WriteQuote()
 {
     for (const Field& field : fields) {
-        if (!field.editable)
-            continue;
-        const QString text = box(field.name)->text();
-        const bool noDate = field.column == "AuthDate"_L1 && text.isEmpty();
-        quote.set(field.column, noDate ? QVariant() : QVariant(text));
+        if (field.editable)
+            WriteField(field.name, field.column);
     }
     quote.set(u"ReadOnly"_s, chkReadOnly->isChecked());
     quote.set(u"ExtraInfo"_s, chkExtraInfo->isChecked());
@@ -299,7 +320,7 @@ void frmUtilities::SetStatus(const StatusRepair& repair)
     if (repair.forgetsQuoteNumber)
         box("txtQuoteNo"_L1)->clear();
     for (const StatusRepair::Note& note : repair.added) {
-        if (!note.mainQuoteOnly || SubquoteOfRow() == u"0"_s)
+        if (!note.mainQuoteOnly || subquote == u"0"_s)
             chain = AddNote(note.subject, note.status, chain, {}, false);
     }
     txtRemarks->setExactText(chain);

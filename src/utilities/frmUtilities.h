@@ -22,18 +22,18 @@ public:
     static void ShowForm(const QString& sQTNNO, const QString& sSubQuote);
 
 private:
-    frmUtilities();
+    frmUtilities(const QString& quoteNumber, const QString& shownSubquote);
     QWidget* quoteInformation();
     QWidget* setQuoteStatus();
     QWidget* closingButtons();
     QPushButton* button(const QString& name, const QString& caption, void (frmUtilities::*click)());
     QLineEdit* box(QLatin1StringView name) const;
 
-    void AddTabs(const QString& number, const QString& shownSubquote);
-    void OpenRows(const QString& number, const QString& subquote);
+    void AddTabs();
+    void OpenRows();
     void CloseRows();
     void Fill();
-    QString SubquoteOfRow() const;
+    void WriteField(QLatin1StringView name, const QString& column);
     void WriteQuote();
     void WriteRemarks();
 
@@ -43,7 +43,13 @@ private:
     void Command9_Click();  // Undo
     void SetStatus(const StatusRepair& repair);
 
+    // of what is shown; the row itself may go
+    QString number;
+    QString subquote;
+    int shownTab = 0;
+
     db::Recordset quote;    // of QUOTE1
+    db::Recordset lines;    // of QUOTE2: opened and closed with the others
     db::Recordset remarks;  // of QUOTE3, where the quote may have no row
 
     QTabBar* TabStrip1;

@@ -27,6 +27,12 @@ namespace {
 
 constexpr int tabWidth = 4;  // characters
 
+/// Not a key that moves about or copies, nor Escape, which is on its way to the window.
+bool isTyping(const QKeyEvent& key)
+{
+    return !key.text().isEmpty() && !(key.modifiers() & Qt::ControlModifier) && key.key() != Qt::Key_Escape;
+}
+
 }  // namespace
 
 frmViewXML::frmViewXML(const QString& file)
@@ -39,16 +45,18 @@ frmViewXML::frmViewXML(const QString& file)
       txtFind(new QLineEdit(this)),
       lblPosition(new QLabel(this))
 {
+    setWindowFlag(Qt::WindowMaximizeButtonHint);
     setMinimumSize(desktop::pixels(9000, 4500));
     resize(desktop::pixels(13500, 9600));
 
     txtXML->setObjectName("txtXML"_L1);
+    txtXML->setAccessibleName(u"Text of the message"_s);
     txtXML->setFont(QFontDatabase::systemFont(QFontDatabase::FixedFont));
     txtXML->setLineWrapMode(QPlainTextEdit::NoWrap);
     txtXML->setTabStopDistance(tabWidth * QFontMetricsF(txtXML->font()).horizontalAdvance(u' '));
     txtXML->installEventFilter(this);
     Command2->setObjectName("Command2"_L1);
-    Command2->setText(u"Save"_s);
+    Command2->setText(u"&Save"_s);
 
     fillFindBar();
 
@@ -64,10 +72,11 @@ frmViewXML::frmViewXML(const QString& file)
 
 void frmViewXML::fillFindBar()
 {
+    txtFind->setAccessibleName(u"Find"_s);
     txtFind->setPlaceholderText(u"Find (Ctrl+F)"_s);
     txtFind->setClearButtonEnabled(true);
-    auto* previous = new QPushButton(u"Previous"_s);
-    auto* next = new QPushButton(u"Next"_s);
+    auto* previous = new QPushButton(u"&Previous"_s);
+    auto* next = new QPushButton(u"&Next"_s);
     txtFind->setObjectName("txtFind"_L1);
     previous->setObjectName("cmdFindPrevious"_L1);
     next->setObjectName("cmdFindNext"_L1);
@@ -109,9 +118,7 @@ void frmViewXML::ShowForm(const QString& file)
 
 bool frmViewXML::eventFilter(QObject* watched, QEvent* event)
 {
-    // Escape is on its way to the window and types nothing
-    if (watched == txtXML && event->type() == QEvent::KeyPress &&
-        static_cast<QKeyEvent*>(event)->key() != Qt::Key_Escape)
+    if (watched == txtXML && event->type() == QEvent::KeyPress && isTyping(*static_cast<QKeyEvent*>(event)))
         unchanged = false;
     return Form::eventFilter(watched, event);
 }
@@ -198,7 +205,8 @@ void frmViewXML::showPosition()
 // Only what is seen is coloured, so that a message of any size opens at once.
 void frmViewXML::colourVisibleTags()
 {
-    static const QRegularExpression tag(u"</?[^<>\\s/][^<>]*>"_s);
+    // neighbours are coloured as one: of two that touch only the first would be
+    static const QRegularExpression tag(u"(</?[^<>\\s/][^<>]*>)+"_s);
     QTextCharFormat colour;
     colour.setForeground(palette().color(QPalette::Link));
 

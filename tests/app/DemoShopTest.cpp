@@ -2,6 +2,7 @@
 #include "app/Profile.h"
 #include "app/QuoteDatabase.h"
 #include "inbound/modLoadXML.h"
+#include "messages/Folders.h"
 #include "messages/Summary.h"
 #include "outbound/SendQuote.h"
 #include "platform/database/Sql.h"
@@ -73,7 +74,7 @@ protected:
     }
 
     TestProfile profile;
-    ScriptedDesktop desktop;
+    ScriptedDesktop desktop{R"({"boxes":[{"text":"DELETED","answer":"yes"}]})"};
     std::optional<eKEST> host;
 
 private:
@@ -169,6 +170,21 @@ TEST_P(DemoShop, ListsItsMessages)
         EXPECT_TRUE(message.key().startsWith(QString(message.value()[4]).replace(u'/', u'.')))
             << message.key().toStdString();
     EXPECT_EQ(listed(Read).size(), files::list(gsReadPath).size());
+}
+
+TEST_P(DemoShop, ItsMessagesLoad)
+{
+    QStringList left;
+    for (const QString& file : listed(Unread).keys()) {
+        QString text = files::read(gsUnreadPath + file);
+        if (LoadXML(text, file))
+            MoveMessage(file, u"read"_s);
+        else
+            left << file;
+    }
+    EXPECT_EQ(left, QStringList(u"MDMSG_1009.xml"_s)) << desktop.boxTexts().join(u'\n').toStdString();
+    EXPECT_EQ(listed(Unread).keys(), QStringList(u"QREQ_20551_2.xml"_s)) << "it waited behind the first of its request";
+    EXPECT_EQ(files::list(gsImagesPath, u"1029_*.jpg"_s).size(), 3);
 }
 
 TEST_P(DemoShop, SendsWhatMayGo)

@@ -26,8 +26,8 @@ TEST_F(Panel, StartsOnViewMessagesAndNamesTheQuote)
     test::quote("500");
     show("500", R"json([{"read": ["Option1(1)", "Option1(2)", "lblQuote"]}])json");
     EXPECT_TRUE(desktop->read(u"Option1(1)"_s, u"checked"_s).toBool());
-EXPECT_TRUE(desktop->read(u"Option1(2)"_s, u"enabled"_s).toBool());
-EXPECT_EQ(desktop->read(u"lblQuote"_s).toString(), u"Quote 500"_s);
+    EXPECT_TRUE(desktop->read(u"Option1(2)"_s, u"enabled"_s).toBool());
+    EXPECT_EQ(desktop->read(u"lblQuote"_s).toString(), u"Quote 500"_s);
 }
 
 TEST_F(Panel, UtilitiesWithoutAQuoteAsksForNoPassword)
@@ -40,15 +40,18 @@ TEST_F(Panel, EnterWithoutShiftKeysIsOk)
 {
     show("0", R"json([{"click": "Option1(3)"}, {"key": "Option1(3)", "keys": "Shift+Return"}])json");
     EXPECT_EQ(desktop->boxes().size(), 0);
+    show("0", R"json([{"click": "Option1(3)"}, {"key": "Option1(3)", "keys": "Tab"},
+                      {"key": "cmdOK", "keys": "Shift+Return"}])json");
+    EXPECT_EQ(desktop->boxes().size(), 0);
     show("0", R"json([{"click": "Option1(3)"}, {"key": "Option1(3)", "keys": "Return"}])json");
     EXPECT_EQ(desktop->boxes().size(), 1);
-    }
+}
 
 TEST_F(Panel, AMissingTransportProgramIsSilent)
 {
     show("0", R"json([{"click": "Option1(0)"}, {"click": "cmdOK"}, {"read": ["cmdOK"]}, {"click": "cmdExit"}])json");
     EXPECT_EQ(desktop->boxes().size(), 0);
-EXPECT_TRUE(desktop->read(u"cmdOK"_s, u"enabled"_s).toBool());
+    EXPECT_TRUE(desktop->read(u"cmdOK"_s, u"enabled"_s).toBool());
 }
 
 TEST_F(Panel, WithoutAConnectionItIsNotShown)

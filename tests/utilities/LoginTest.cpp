@@ -12,14 +12,9 @@ namespace kest {
 using namespace Qt::StringLiterals;
 using test::control;
 
-TEST(Login, ThePasswordIsANumberThatChangesEachDay)
-{
-    EXPECT_EQ(DayPassword(QDate(1899, 12, 30)), 4711);
-    EXPECT_EQ(DayPassword(QDate(2026, 11, 22)), 46348 + 4711);
-}
-
 TEST(Login, OnlyTheDaysNumberPassesAndOnlyAWrongNumberIsRemarkedOn)
 {
+    EXPECT_EQ(DayPassword(QDate(2026, 11, 22)), 46348 + 4711);
     const test::TestProfile profile;
     const std::string password = std::to_string(DayPassword(QDate::currentDate()));
     const std::string ok = R"({"click": "cmdOK"})";
@@ -27,7 +22,6 @@ TEST(Login, OnlyTheDaysNumberPassesAndOnlyAWrongNumberIsRemarkedOn)
         std::string typed, answer;
         bool passes, remarked;
     } const cases[] = {
-        {password, ok, true, false},
         {"000" + password, ok, true, false},
         {password, R"({"key": "txtPassword", "keys": "Return"})", true, false},
         {"0", ok + R"(, {"set": "txtPassword", "text": ")" + password + "\"}, " + ok, true, true},
@@ -37,9 +31,8 @@ TEST(Login, OnlyTheDaysNumberPassesAndOnlyAWrongNumberIsRemarkedOn)
         {password, R"({"key": "frmLogin", "keys": "Escape"})", false, false},
     };
     for (const auto& [typed, answer, passes, remarked] : cases) {
-        const test::ScriptedDesktop desk(
-            (R"({"windows": {"frmLogin": [[{"set": "txtPassword", "text": ")" + typed + "\"}, " + answer + "]]}}")
-                .c_str());
+        const std::string type = R"({"set": "txtPassword", "text": ")" + typed + "\"}, ";
+        const test::ScriptedDesktop desk((R"({"windows": {"frmLogin": [[)" + type + answer + "]]}}").c_str());
         bool passed = !passes;
         frmLogin::ShowForm(passed);
         EXPECT_EQ(passed, passes) << typed << answer;
@@ -63,17 +56,14 @@ TEST(Login, TheControlsTellWhereOneStands)
                                   EXPECT_TRUE(ok.isEnabled()) << "it is never disabled again";
                                   ok.setFocus();
                                   EXPECT_EQ(password.palette().color(QPalette::Base), QColor(Qt::cyan));
-                                  ok.click();
-                                  EXPECT_TRUE(window.isVisible());
                                   password.setText(u"1"_s);
                                   ok.click();
                                   EXPECT_TRUE(password.hasFocus());
-                                  EXPECT_EQ(password.selectedText().size(), 1);
+                                  EXPECT_EQ(password.selectedText(), u"1"_s);
                               }}});
     bool passed = true;
     frmLogin::ShowForm(passed);
     EXPECT_FALSE(passed);
-    EXPECT_EQ(desk.boxes().size(), 1);
 }
 
 }  // namespace kest

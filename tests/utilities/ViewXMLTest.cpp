@@ -1,15 +1,14 @@
 // The text viewer: what a save writes, what stops it, and leaving with unsaved typing.
 #include "platform/files/files.h"
 #include "shell/SharedVariables.h"
-#include "support/Hands.h"
 #include "support/ScriptedDesktop.h"
 #include "support/TestProfile.h"
 #include "utilities/ExactTextEdit.h"
 #include "utilities/frmLogin.h"
 #include "utilities/frmViewXML.h"
 
-#include <QLineEdit>
-#include <QPushButton>
+#include <QClipboard>
+#include <QGuiApplication>
 
 namespace kest {
 
@@ -59,25 +58,21 @@ const QString leave = u"Are you sure you want to exit without saving this messag
 TEST_F(Viewer, ASaveWritesTheTextWithoutTheWrapperAndWithTheCharactersThemselves)
 {
     const QByteArray longValue(3'000'000, 'Q');  // a document in base64
-    const std::pair<QByteArray, QByteArray> cases[] = {
-        {"<a><b>1</b></a>", "<a>\r\n\t<b>1</b>\r\n</a>\r\n"},
+    struct {
+        QByteArray content, written;
+        std::string typed = {};
+    } const cases[] = {
         {"<a>1</a><b>2</b>", "\r\n\t<a>1</a>\r\n\t<b>2</b>\r\n"},
         {"<request><a>1</a></request>", "\r\n\t<a>1</a>\r\n"},
-        {"<a>Smith & Co</a>", "<a>Smith & Co</a>\r\n"},
         {"<a>&lt;b&gt; &amp;amp; &amp;lt; &amp;amp;lt;</a>", "<a><b> & < &lt;</a>\r\n"},
         {"<a>caf\xe9\xa0\x80 one\ntwo</a>", "<a>caf\xe9\xa0\x80 one\ntwo</a>\r\n"},
         {"<a><pdf>" + longValue + "</pdf></a>", "<a>\r\n\t<pdf>" + longValue + "</pdf>\r\n</a>\r\n"},
+        {"<a>1</a>", "<a>\r\n2</a>", R"({"set": "txtXML", "text": "<a>\n2</a>"}, )"},
     };
-    for (const auto& [content, expected] : cases) {
-        EXPECT_EQ(view(content, save), QStringList(overwrite));
-        EXPECT_TRUE(written() == expected) << written().left(100).toStdString();
+    for (const auto& c : cases) {
+        EXPECT_EQ(view(c.content, c.typed + save), QStringList(overwrite));
+        EXPECT_TRUE(written() == c.written) << written().left(100).toStdString();
     }
-}
-
-TEST_F(Viewer, WhatWasTypedIsWritten)
-{
-    view("<a>1</a>", R"({"set": "txtXML", "text": "<a>\n2</a>"}, )" + save);
-    EXPECT_EQ(written(), "<a>\r\n2</a>");
 }
 
 TEST_F(Viewer, NothingIsWrittenWithoutThePasswordOrTheYes)
@@ -90,38 +85,16 @@ TEST_F(Viewer, NothingIsWrittenWithoutThePasswordOrTheYes)
     EXPECT_EQ(written(), "<a>1</a>");
 }
 
-TEST_F(Viewer, ASaveBringsBackAFileThatHasGoneAndReplacesOneThatHasChanged)
-{
-    const std::function<void()> meanwhile[] = {
-        [] { files::remove(gsCurFolder + file); },
-        [] { files::writeBytes(gsCurFolder + file, "<b/>"); },
-    };
-    for (const auto& change : meanwhile) {
-        const ScriptedDesktop desk;
-        const test::Hands hands(
-            {{u"frmViewXML"_s,
-              [&](QDialog& window) {
-                  change();
-                  test::control<QPushButton>(window, "Command2").click();
-              }},
-             {u"frmLogin"_s, [](QDialog& window) {
-                  const qint64 password = DayPassword(QDate::currentDate());
-                  test::control<QLineEdit>(window, "txtPassword").setText(QString::number(password));
-                  test::control<QPushButton>(window, "cmdOK").click();
-              }}});
-        files::writeBytes(gsCurFolder + file, "<a>1</a>");
-        frmViewXML::ShowForm(file);
-        EXPECT_EQ(written(), "<a>1</a>\r\n");
-    }
-}
-
 TEST_F(Viewer, LeavingWithUnsavedTypingIsAskedAbout)
 {
-    const std::string type = R"({"key": "txtXML", "keys": "x"}, )";
-    EXPECT_EQ(view("<a/>", R"({"click": "Command1"})"), QStringList());
-    EXPECT_EQ(view("<a/>", R"({"key": "txtXML", "keys": "Escape"})"), QStringList());
-    EXPECT_EQ(view("<a/>", type + R"({"click": "Command1"})"), QStringList(leave));
-    EXPECT_THROW(view("<a/>", type + R"({"click": "Command1"}, {"read": "txtXML"})",
+    const std::pair<const char*, bool> cases[] = {
+        {"x", true}, {"Return", true}, {"Ctrl+V", true}, {"Ctrl+C", false}, {"PgDown", false}, {"Escape", false},
+    };
+    QGuiApplication::clipboard()->setText(u"pasted"_s);
+    const auto press = [](const char* key) { return R"({"key": "txtXML", "keys": ")" + std::string(key) + "\"}"; };
+    for (const auto& [key, typing] : cases)
+        EXPECT_EQ(view("<a/>", press(key)), typing ? QStringList(leave) : QStringList()) << key;
+    EXPECT_THROW(view("<a/>", press("x") + R"(, {"click": "Command1"}, {"read": "txtXML"})",
                       R"({"text": "exit without saving", "answer": "no"})"),
                  desktop::NeedsAnswer)
         << "No keeps the window, which the end of the script then can't close";
@@ -130,24 +103,21 @@ TEST_F(Viewer, LeavingWithUnsavedTypingIsAskedAbout)
 
 TEST_F(Viewer, AFindGoesRoundTheTextAndIsNoTyping)
 {
-    const QByteArray content = "<a><b>1</b><b>2</b></a>";
-    const std::pair<std::string, QString> cases[] = {
-        {R"("Return")", u"Line 2, column 5"_s},
-        {R"("Return", "Return", "Return")", u"Line 2, column 5"_s},
-        {R"("Return", "F3")", u"Line 3, column 5"_s},
-        {R"("Shift+F3")", u"Line 3, column 5"_s},
+    struct {
+        std::string wanted, keys;
+        QString place;
+    } const cases[] = {
+        {"<b>", R"("Return", "Return", "Return")", u"Line 2, column 5"_s},
+        {"<b>", R"("Return", "F3")", u"Line 3, column 5"_s},
+        {"<b>", R"("Shift+F3")", u"Line 3, column 5"_s},
+        {"x", R"("Return")", u"Not found"_s},
     };
-    for (const auto& [keys, place] : cases) {
-        const std::string steps = R"({"key": "txtXML", "keys": "Ctrl+F"}, {"set": "txtFind", "text": "<b>"},
-            {"key": "txtFind", "keys": [)" +
-                                  keys + R"(]}, {"read": "lblPosition"}, {"click": "Command1"})";
-        EXPECT_EQ(view(content, steps), QStringList()) << keys;
+    for (const auto& [wanted, keys, place] : cases) {
+        const std::string find = R"({"key": "txtXML", "keys": "Ctrl+F"}, {"set": "txtFind", "text": ")" + wanted +
+                                 R"("}, {"key": "txtFind", "keys": [)" + keys + R"(]}, {"read": "lblPosition"})";
+        EXPECT_EQ(view("<a><b>1</b><b>2</b></a>", find), QStringList()) << keys;
         EXPECT_EQ(shown, place) << keys;
     }
-    EXPECT_EQ(view(content, R"({"set": "txtFind", "text": "x"}, {"key": "txtFind", "keys": "Return"},
-                               {"read": "lblPosition"})"),
-              QStringList());
-    EXPECT_EQ(shown, u"Not found"_s);
 }
 
 TEST(ExactText, ComesBackAsItWasGivenAndAsItWasEdited)
@@ -155,11 +125,9 @@ TEST(ExactText, ComesBackAsItWasGivenAndAsItWasEdited)
     const QString longLine(10'000, u'Q');
     const QString texts[] = {
         {},
-        u"one"_s,
         u"\r\n"_s,
         u"a\r\nb\nc\rd\r\n\r\n\n"_s,
         u"a\u00a0b\u2029c\ufdd0d\u2028e"_s,
-        longLine,
         longLine + u"\r\n\t"_s + longLine + u'\n',
     };
     ExactTextEdit edit;
@@ -168,22 +136,37 @@ TEST(ExactText, ComesBackAsItWasGivenAndAsItWasEdited)
         EXPECT_TRUE(edit.exactText() == text) << text.left(40).toStdString();
     }
 
-    edit.setExactText(longLine);  // shown in pieces
-    QTextCursor cursor(edit.document());
-    cursor.setPosition(4000);
-    cursor.insertBlock();
-    EXPECT_TRUE(edit.exactText() == longLine.left(4000) + u"\r\n"_s + longLine.mid(4000));
-    edit.undo();
-    cursor.setPosition(6000);
-    cursor.insertText(u"1\n2\n3"_s);
-    EXPECT_TRUE(edit.exactText() == longLine.left(5999) + u"1\r\n2\r\n3"_s + longLine.mid(5999));
-    edit.undo();
-    cursor.setPosition(3990);
-    cursor.setPosition(4010, QTextCursor::KeepAnchor);
-    cursor.removeSelectedText();
-    EXPECT_TRUE(edit.exactText() == longLine.mid(19));
-    edit.undo();
-    EXPECT_TRUE(edit.exactText() == longLine);
+    // what stands between two places gives way to a text, in the editor as in the text itself
+    const QString text = u"a\nb\r\n"_s + longLine;  // shown in pieces from 5, 4005 and 8005
+    struct {
+        int start, length;  // in the text as it is shown
+        QString typed, expected;
+    } const edits[] = {
+        {1, 0, u"\n"_s, u"a\r\n\nb\r\n"_s + longLine},
+        {0, 2, u"1\n2"_s, u"1\r\n2b\r\n"_s + longLine},
+        {4, 4001, {}, u"a\nb\r\n"_s + longLine.mid(4000)},
+        {3, 1, {}, u"a\nb"_s + longLine},
+        {3990, 20, {}, u"a\nb\r\n"_s + longLine.mid(19)},
+        {4004, 0, u"\n"_s, u"a\nb\r\n"_s + longLine.left(4000) + u"\r\n"_s + longLine.mid(4000)},
+    };
+    edit.setExactText(text);
+    for (const auto& [start, length, typed, expected] : edits) {
+        QTextCursor cursor(edit.document());
+        cursor.setPosition(start);
+        cursor.setPosition(start + length, QTextCursor::KeepAnchor);
+        cursor.insertText(typed);
+        EXPECT_TRUE(edit.exactText() == expected) << start;
+        edit.undo();
+        EXPECT_TRUE(edit.exactText() == text) << start;
+    }
+    edit.selectAll();
+    edit.copy();
+    EXPECT_TRUE(QGuiApplication::clipboard()->text() == text);
+    QGuiApplication::clipboard()->setText(u"1\u20282"_s);
+    edit.paste();
+    QKeyEvent key(QEvent::KeyPress, Qt::Key_Return, Qt::ShiftModifier, u"\r"_s);
+    QCoreApplication::sendEvent(&edit, &key);
+    EXPECT_EQ(edit.exactText(), u"1\r\n2\r\n"_s) << "no line ends but the usual ones are put in";
 }
 
 }  // namespace kest

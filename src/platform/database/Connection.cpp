@@ -64,16 +64,6 @@ bool isRegistered(const QString& driver)
     return false;
 }
 
-bool isThisMachine(const QString& server)
-{
-    const QString machine = QSysInfo::machineHostName();
-    for (const QString& name : {u"(local)"_s, u"."_s, u"localhost"_s, machine, machine.section(u'.', 0, 0)}) {
-        if (!name.isEmpty() && server.compare(name, Qt::CaseInsensitive) == 0)
-            return true;
-    }
-    return false;
-}
-
 std::unique_ptr<Engine> openLocal(const QString& databaseName, const QString& instance)
 {
     const QString name = instance.isEmpty() ? databaseName : instance + u'.' + databaseName;
@@ -101,6 +91,16 @@ std::unique_ptr<Engine> openEngine(const QString& text)
 }
 
 }  // namespace
+
+bool isThisMachine(const QString& server)
+{
+    const QString machine = QSysInfo::machineHostName();
+    for (const QString& name : {u"(local)"_s, u"."_s, u"localhost"_s, machine, machine.section(u'.', 0, 0)}) {
+        if (!name.isEmpty() && server.compare(name, Qt::CaseInsensitive) == 0)
+            return true;
+    }
+    return false;
+}
 
 Connection::Connection() = default;
 Connection::~Connection() = default;

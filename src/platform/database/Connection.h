@@ -45,6 +45,9 @@ private:
     int commandTimeout_ = 0;
 };
 
+/// True for a server's name that means this machine.
+bool isThisMachine(const QString& server);
+
 using ConnectionPtr = std::shared_ptr<Connection>;
 
 }  // namespace kest::db

@@ -1,0 +1,231 @@
+// The insurer accepts a quote, as it stands or with changed lines, under an authority number.
+#include "inbound/modLoadXML.h"
+#include "jobexport/WriteQuote.h"
+#include "messages/Envelope.h"
+#include "outbound/frmSubletAuth.h"
+#include "platform/database/Sql.h"
+#include "platform/desktop/Prompt.h"
+#include "platform/values.h"
+#include "quotedata/NoteChain.h"
+#include "quotedata/QuoteTotals.h"
+#include "quotedata/Rounding.h"
+#include "quotedata/StateTable.h"
+#include "reports/BuildAuthReport.h"
+#include "reports/ReportTable.h"
+#include "reports/frmPrintPreview.h"
+#include "shell/Helpers.h"
+#include "shell/modLoggerEx.h"
+
+#include <optional>
+#include <utility>
+
+namespace kest {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+constexpr QLatin1StringView unknownRego = "UNIVERSAL"_L1;
+
+/// What the message tells and the load stores. Reading it fails for every element that is missing, those that only the
+/// report shows included: before anything is written.
+struct Authorisation {
+    explicit Authorisation(const xml::Document& message);
+
+    QString authorisedNumber;
+    QString request;
+    QString originalNumber;
+    QString claim;
+    QString completionDate;
+    QString rego;
+    QString assessor;
+    QString excess;
+    QString contribution;
+    QString reference;
+};
+
+Authorisation::Authorisation(const xml::Document& message)
+{
+    const auto element = [&](QLatin1StringView path) { return message.textOf(u"//rootns:"_s + path); };
+    for (const QLatin1StringView shownOnly :
+         {"authorityNumber"_L1, "claimManager"_L1, "corporateCustomer"_L1, "orlaContact/rootns:phone"_L1,
+          "orlaContact/rootns:fax"_L1, "assessmentComment"_L1, "authorisedAmount"_L1, "quoteBody/rootns:quoteType"_L1,
+          "quoteBody/rootns:labourTotal"_L1, "quoteBody/rootns:partTotal"_L1, "quoteBody/rootns:partMarkUpTotal"_L1,
+          "quoteBody/rootns:gst"_L1, "quoteBody/rootns:paintTotal"_L1, "quoteBody/rootns:quoteTotal"_L1})
+        element(shownOnly);
+    const QString customer = u"//rootns:authorisedQuoteClaimCustomer/rootns:"_s;
+    if (!message.selectSingleNode(customer + u"companyName"_s)) {
+        for (const QLatin1StringView name : {"title"_L1, "firstName"_L1, "surname"_L1})
+            message.textOf(customer + name);
+    }
+
+    authorisedNumber = element("kestAuthorisedQuoteNumber"_L1);
+    request = element("quoteRequestNumber"_L1);
+    originalNumber = element("kestOriginalQuoteNumber"_L1);
+    claim = element("claimNumber"_L1);
+    completionDate = element("repairCompletionDate"_L1);
+    rego = NormaliseRego(element("vehicleRegistration"_L1));
+    assessor = element("orlaContact/rootns:name"_L1);
+    excess = message.textOrEmptyOf(u"//rootns:excess"_s);
+    contribution = message.textOrEmptyOf(u"//rootns:customerContribution"_s);
+    reference = element("quoteBody/rootns:quoteReference"_L1);
+}
+
+/// The quote of that number, else the one of that request, network number and car, whose number and subquote then take
+/// the place of the given ones. Where several are so, the first, and the given ones stand.
+db::Recordset OpenQuote(const Authorisation& told, QString& number, QString& subquote)
+{
+    db::Recordset quote = Opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+    if (!quote.eof())
+        return quote;
+    quote = Opened(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' AND KESTQuoteNo='{}' AND REGO = '{}'", told.request,
+                       told.originalNumber, told.rego));
+    if (quote.recordCount() == 1) {
+        number = quote.text(u"QTNNO"_s);
+        subquote = quote.text(u"Subquote"_s);
+    }
+    return quote;
+}
+
+/// Excess and customer's contribution, which the main quote alone carries. An amount that the quote lacks stays out.
+void TakeOverMoney(const Authorisation& told, const QString& number, const QString& subquote)
+{
+    db::Recordset quote = Opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+    const auto has = [&](const QString& column) { return !quote.text(column).trimmed().isEmpty(); };
+
+    const double excess = SafeVal(told.excess, u"0"_s);
+    if (has(u"excess"_s) && toDouble(quote.value(u"excess"_s)) != excess) {
+        quote.set(u"excess"_s, RoundAmount(double(excess), 2));
+        quote.update();
+    }
+    // The message's contribution includes the tax of 10 percent, the quote's does not.
+    const double contribution = RoundAmount(SafeVal(told.contribution, u"0"_s) / 11 * 10, 2);
+    if (has(u"contri"_s) && RoundAmount(toDouble(quote.value(u"contri"_s)), 2) != contribution) {
+        quote.set(u"contri"_s, contribution);
+        quote.update();
+    }
+}
+
+/// "Whitby, Morgan Lee" of "Morgan Lee Whitby".
+QString SurnameFirst(const QString& name)
+{
+    constexpr qsizetype surnameLength = 15;  // characters
+    const qsizetype blank = name.lastIndexOf(u' ');
+    const QString surname = name.mid(blank + 1).left(surnameLength);
+    const QString given = name.left(qMax<qsizetype>(blank, 0));
+    return given.isEmpty() ? surname : surname + u", "_s + given;
+}
+
+void FillHeader(db::Recordset& quote, const Authorisation& told, const QString& rego, const db::Recordset& insurer)
+{
+    Fill(quote, {
+                    {"KESTQRNo"_L1, told.request},
+                    {"KESTQuoteNo"_L1, told.originalNumber},
+                    {"KESTAuthNo"_L1, told.authorisedNumber},
+                    {"Claim"_L1, told.claim},
+                    {"REGO"_L1, rego},
+                    {"assess"_L1, SurnameFirst(told.assessor)},
+                    {"AuthDate"_L1, shortDate(QDate::currentDate())},
+                    {"targetdate"_L1, toDate(told.completionDate)},
+                    {"INSURER_ID"_L1, insurer.value(u"INSURER_ID"_s)},
+                    {"RR_RATE"_L1, 1},
+                    {"RA_RATE"_L1, 1},
+                    {"paint_rate"_L1, 1},
+                    {"QSENT"_L1, u"R"_s},
+                    {"excess_gst"_L1, 1},
+                    {"RR_TOTAL"_L1, 0},
+                    {"RA_TOTAL"_L1, 0},
+                    {"PAINT_TOTAL"_L1, 0},
+                    {"CONTACTID"_L1, 0},
+                    {"TOTAL"_L1, 0},
+                    {"PRTTOTAL"_L1, 0},
+                    {"MISTOTAL"_L1, 0},
+                    {"override"_L1, 0},
+                    {"rr_override"_L1, 0},
+                    {"ra_override"_L1, 0},
+                    {"paint_override"_L1, 0},
+                    {"quotechanged"_L1, true},
+                    {"invoiced"_L1, false},
+                });
+}
+
+bool RefusePlainly(const QString& text)
+{
+    desktop::msgBox(text);
+    return false;
+}
+
+void ShowResults(const db::Recordset& quote, std::optional<db::Recordset>& comparison, const QString& number,
+                 const QString& subquote)
+{
+    WriteQuote(quote.text(u"QTNNO"_s), quote.text(u"Subquote"_s));
+    if (comparison)
+        frmPrintPreview::ShowForm(ComparisonReport, u""_s, &*comparison);
+    if (gbSubletDocumentArrived) {
+        frmSubletAuth::ShowForm(number, subquote);
+        gbSubletDocumentArrived = false;
+    }
+}
+
+bool Authorise(QString& text)
+{
+    const xml::Document message = ParsedMessage(text);
+    const Authorisation told(message);
+    auto [number, subquote] = SplitQuoteRef(told.reference);
+
+    db::Recordset quote = OpenQuote(told, number, subquote);
+    if (quote.eof())
+        return Refuse(u"Couldn't Locate Matching KEST Quote, Please contact MarlinDesk Support."_s);
+    const QString rego = told.rego == unknownRego ? quote.text(u"REGO"_s) : told.rego;
+    const QVariant rowSubquote = quote.value(u"Subquote"_s);
+    db::Recordset lines = Opened(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, rowSubquote));
+    if (lines.eof())
+        return RefusePlainly(u"Error: Cannot load an Authorisation onto a blank quote!"_s);
+    db::Recordset notes = Opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, rowSubquote));
+    db::Recordset car = Opened(sql("SELECT * FROM CAR WHERE REGO='{}'", rego));
+    const db::Recordset insurer =
+        Opened(sql("SELECT * FROM INSURER WHERE INSURER_ID={}", quote.value(u"INSURER_ID"_s)));
+    if (car.eof())
+        return RefusePlainly(u"Could not locate Car listed on Authorisation. Please Contact MarlinDesk Support."_s);
+    car.set(u"KEST"_s, 1);
+    car.update();
+    if (insurer.eof())
+        return Refuse(u"Error locating a valid insurer, Please contact MarlinDesk Support."_s);
+    if (notes.eof())
+        notes.addNew();
+
+    // before the lines change: it shows them as they are now
+    std::optional<db::Recordset> comparison = BuildAuthReport(message, number, subquote, false);
+    if (subquote == u"0"_s)
+        TakeOverMoney(told, number, subquote);
+    quote.requery();
+    FillHeader(quote, told, rego, insurer);
+    if (!GetNoteStatus(u"Quote Request"_s, notes.text(u"remarks"_s)).isEmpty())
+        Apply(requestWon, quote, notes);
+    Apply(quoteAuthorised, quote, notes);
+    quote.update();
+
+    if (!LoadQuoteBody(quote, lines, message))
+        return RefusePlainly(u"Error processing Quote Items, Please contact MarlinDesk Support."_s);
+    Fill(notes, {{"QTNNO"_L1, quote.value(u"QTNNO"_s)}, {"Subquote"_L1, quote.value(u"Subquote"_s)}});
+    notes.update();
+    CalcAuthorisedTotals(quote, lines);
+    if (comparison)
+        FinishAuthReport(*comparison, quote, lines);
+    ShowResults(quote, comparison, number, subquote);
+    return true;
+}
+
+}  // namespace
+
+bool LoadAUQT(QString& text, const QString&)
+{
+    try {
+        return Authorise(text);
+    } catch (const RuntimeError& error) {
+        LogError(error, u"modLoadXML.LoadAUQT"_s, u"LoadAUQT"_s);
+        return false;
+    }
+}
+
+}  // namespace kest

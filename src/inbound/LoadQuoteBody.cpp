@@ -1,0 +1,364 @@
+// The lines of a message become lines of a quote: section by section, each with a word on what is to happen to it.
+#include "inbound/modLoadXML.h"
+#include "platform/RuntimeError.h"
+#include "platform/database/Sql.h"
+#include "platform/files/files.h"
+#include "platform/values.h"
+#include "quotedata/Vendors.h"
+#include "shell/modLoggerEx.h"
+
+#include <QList>
+
+#include <utility>
+
+namespace kest {
+
+using namespace Qt::StringLiterals;
+
+bool gbSubletDocumentArrived = false;
+
+namespace {
+
+constexpr int descriptionLength = 39;  // characters
+constexpr int partNumberLength = 21;
+constexpr int repairerLength = 49;
+constexpr int tickOfNewLine = 7;
+
+// Insert comes with a word of its own; a line of which no line of its section said anything is added too.
+enum class Change { Add, Insert, Alter, Keep, Delete };
+
+constexpr std::pair<QLatin1StringView, Change> changes[] = {
+    {""_L1, Change::Add},   {"I"_L1, Change::Insert}, {"C"_L1, Change::Alter},
+    {"N"_L1, Change::Keep}, {"D"_L1, Change::Delete},
+};
+
+Change ChangeOf(const QString& indicator)
+{
+    for (const auto& [known, change] : changes) {
+        if (known == indicator)
+            return change;
+    }
+    throw RuntimeError(TypeMismatch, u"The change indicator \"%1\" is not known."_s.arg(indicator));
+}
+
+/// One line of the message. A deleted one has its number and nothing else.
+struct Line {
+    xml::Node node;
+    Change change;
+
+    qint64 number() const { return toLong(node.textOf(u"rootns:quoteLineNumber"_s)); }
+    QString text(QLatin1StringView element) const
+    {
+        return change == Change::Delete ? QString() : node.textOf(u"rootns:"_s + element);
+    }
+};
+
+/// The lines of a section. One that does not say what is to happen does as the one before it.
+QList<Line> LinesOf(const xml::Node& body, QLatin1StringView section)
+{
+    QList<Line> lines;
+    QString indicator;
+    for (const xml::Node& node : body.selectNodes(u"rootns:"_s + section + u"/*"_s)) {
+        if (const xml::Node own = node.selectSingleNode(u"rootns:quoteLineChangeIndicator"_s))
+            indicator = own.text();
+        lines.append({node, ChangeOf(indicator)});
+    }
+    return lines;
+}
+
+/// Stands on the row that a line is to fill, a new one where it is added. False where there is nothing to fill.
+bool StandOnRow(db::Recordset& rows, Change change, qint64 number)
+{
+    if (rows.recordCount() > 0)
+        rows.moveFirst();
+    switch (change) {
+        case Change::Add:
+        case Change::Insert:
+            rows.addNew();
+            return true;
+        case Change::Keep:
+            return false;
+        case Change::Alter:
+        case Change::Delete:
+            break;
+    }
+    rows.find(sql("SEQ_NO='{}'", number));
+    if (rows.eof())
+        return false;
+    if (change == Change::Delete)
+        rows.remove();
+    return change == Change::Alter;
+}
+
+void FillKey(db::Recordset& row, const db::Recordset& quote, qint64 number)
+{
+    const QString qtnno = quote.text(u"QTNNO"_s);
+    const QString subquote = quote.text(u"Subquote"_s);
+    Fill(row, {{"QTNNO"_L1, quote.value(u"QTNNO"_s)},
+               {"Subquote"_L1, quote.value(u"Subquote"_s)},
+               {"SEQ_NO"_L1, NextLineNumber(number, qtnno, subquote)}});
+}
+
+void FillWhereEmpty(db::Recordset& row, const QString& column, const QVariant& value)
+{
+    if (row.text(column).isEmpty())
+        row.set(column, value);
+}
+
+void TakeItemNo(db::Recordset& row)
+{
+    if (row.text(u"itemno"_s).isEmpty())
+        row.set(u"itemno"_s, NextItemNo(row));
+}
+
+// The rate of a loaded line is 1, so that its amount of money stands in the hours.
+
+void FillLabourAmount(db::Recordset& row, const QString& type, const QString& script, const QString& amount)
+{
+    if (type == u"RR"_s)
+        Fill(row,
+             {{"category"_L1, u"R&R"_s}, {"script"_L1, script}, {"rrhour"_L1, toDouble(amount)}, {"rr_rate2"_L1, 1}});
+    else if (type == u"REPR"_s)
+        Fill(row,
+             {{"category"_L1, u"RA"_s}, {"script"_L1, script}, {"rahour"_L1, toDouble(amount)}, {"rr_rate2"_L1, 1}});
+    else if (type == u"OTH"_s)
+        Fill(row, {{"category"_L1, u"MIS"_s},
+                   {"script"_L1, script},
+                   {"unitcost"_L1, toDouble(amount)},
+                   {"rr_rate2"_L1, 0},
+                   {"directbill"_L1, u"R"_s}});
+}
+
+void TakeLabour(const db::Recordset& quote, db::Recordset& row, const Line& line)
+{
+    const qint64 number = line.number();
+    const QString type = line.text("labourType"_L1);
+    const QString script = line.text("labourDescription"_L1).left(descriptionLength);
+    const QString amount = line.text("labourAmount"_L1);
+    if (!StandOnRow(row, line.change, number))
+        return;
+
+    FillKey(row, quote, number);
+    FillLabourAmount(row, type, script, amount);
+    FillWhereEmpty(row, u"allow_tick"_s, tickOfNewLine);
+    Fill(row, {{"opg_rate"_L1, 0},
+               {"Tag"_L1, 1},
+               {"delitem"_L1, false},
+               {"VENDOR"_L1, 0},
+               {"tosend"_L1, u"A"_s},
+               {"PartNo"_L1, u""_s},
+               {"blend"_L1, 0}});
+    row.update();
+    TakeItemNo(row);
+    row.update();
+}
+
+void FillMark(db::Recordset& row, const QString& partType)
+{
+    if (partType == u"NEW"_s)
+        row.set(u"MARK"_s, u" "_s);
+    else if (partType == u"RECY"_s)
+        row.set(u"MARK"_s, u"U"_s);
+    else if (partType == u"EXCH"_s)
+        row.set(u"MARK"_s, u"X"_s);
+}
+
+/// The side of the car where the description begins with it; a side that a person set stays.
+void FillSide(db::Recordset& row, const QString& description)
+{
+    FillWhereEmpty(row, u"SIDE"_s, u"O"_s);
+    if (row.text(u"SIDE"_s) != u"O"_s)
+        return;
+    const QString start = description.toUpper().left(3);
+    if (start == u"L/H"_s)
+        row.set(u"SIDE"_s, u"L"_s);
+    else if (start == u"R/H"_s)
+        row.set(u"SIDE"_s, u"R"_s);
+}
+
+void TakePart(const db::Recordset& quote, db::Recordset& row, const Line& line)
+{
+    const qint64 number = line.number();
+    const QString partNumber = line.text("partNumber"_L1).left(partNumberLength);
+    const QString type = line.text("partType"_L1);
+    const QString description = line.text("partDescription"_L1);
+    const QString quantityText = line.text("partQuantity"_L1);
+    const QString priceText = line.text("partUnitPrice"_L1);
+    const QString percentageText = line.text("partMarkUpPercentage"_L1);
+    line.text("partAmount"_L1);
+    line.text("partMarkUpAmount"_L1);
+    if (!StandOnRow(row, line.change, number))
+        return;
+
+    FillKey(row, quote, number);
+    Fill(row,
+         {{"category"_L1, u"PRT"_s}, {"script"_L1, description.left(descriptionLength)}, {"PartNo"_L1, partNumber}});
+    FillMark(row, type);
+    const double quantity = toDouble(quantityText);
+    if (quantity == 0)
+        row.set(u"Report"_s, true);
+    else
+        row.set(u"qty"_s, quantity);
+    const double price = toDouble(priceText);
+    Fill(row, {{"unitcost"_L1, price}, {"rrhour"_L1, price + price * toDouble(percentageText) / 100}});
+    FillSide(row, description);
+    Fill(row, {{"VENDOR"_L1, 0}, {"blend"_L1, 0}, {"Tag"_L1, 1}, {"delitem"_L1, false}, {"tosend"_L1, u"A"_s}});
+    TakeItemNo(row);
+    row.update();
+}
+
+/// Without the marker of blended paint at its end.
+QString WithoutBlend(const QString& description)
+{
+    constexpr qsizetype marker = 6;  // characters: the word and the blank before it
+    if (!description.toUpper().trimmed().endsWith(u"BLEND"_s))
+        return description;
+    return description.chopped(qMin(marker, description.size()));
+}
+
+void TakePaint(const db::Recordset& quote, db::Recordset& row, const Line& line)
+{
+    const qint64 number = line.number();
+    line.text("paintWorkType"_L1);
+    const QString script = WithoutBlend(line.text("paintDescription"_L1)).left(descriptionLength);
+    const QString amount = line.text("paintAmount"_L1);
+    if (!StandOnRow(row, line.change, number))
+        return;
+
+    FillKey(row, quote, number);
+    FillWhereEmpty(row, u"category"_s, u"PAINT"_s);  // other paint work that was changed stays what it is
+    Fill(row, {{"script"_L1, script}, {"pthour"_L1, toDouble(amount)}});
+    FillWhereEmpty(row, u"blend"_s, 0);
+    Fill(row, {{"Tag"_L1, 1}, {"delitem"_L1, false}, {"tosend"_L1, u"A"_s}, {"rr_rate2"_L1, 1}});
+    FillWhereEmpty(row, u"allow_tick"_s, tickOfNewLine);
+    row.set(u"opg_rate"_s, 1);
+    TakeItemNo(row);
+    row.update();
+}
+
+/// What the lines of the section have told so far: an element that a line lacks keeps what the line before it told.
+struct Sublet {
+    qint64 number = 0;
+    QString description;
+    QString repairer;
+    QString address;
+    QString phone;
+
+    void read(const Line& line);
+};
+
+void Sublet::read(const Line& line)
+{
+    const auto take = [&](const QString& element, QString& text) {
+        if (const xml::Node told = line.node.selectSingleNode(element))
+            text = told.text();
+    };
+    take(u"rootns:subletDescription"_s, description);
+    take(u"rootns:subletRepairer"_s, repairer);
+    take(u"rootns:subletRepairerAddress"_s, address);
+    take(u"rootns:subletRepairerPhone"_s, phone);
+}
+
+/// The number of a line that has none but brings a document: above all lines of the quote, or above the line before it
+/// where the quote has none.
+qint64 NumberForDocument(const QString& qtnno, const QString& subquote, qint64 before)
+{
+    const db::Recordset rows =
+        Opened(sql("SELECT MAX(SEQ_NO) FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", qtnno, subquote));
+    const QVariant highest = rows.value(rows.columns().constFirst());
+    return NextDocumentLine(highest.isNull() ? before : toLong(highest));
+}
+
+/// Stores the document that a line brings; the line's number, which may have to be worked out for it.
+qint64 TakeDocument(const db::Recordset& quote, const Line& line, qint64 before)
+{
+    qint64 number = line.number();
+    const xml::Node document = line.node.selectSingleNode(u"rootns:subletAuthorityDocument"_s);
+    if (!document)
+        return number;
+    const QString qtnno = quote.text(u"QTNNO"_s);
+    const QString subquote = quote.text(u"Subquote"_s);
+    if (number == 0)
+        number = NumberForDocument(qtnno, subquote, before);
+    const QString path = NextDocumentName(qtnno, subquote, number);
+    files::writeBytes(path, files::fromBase64(document.text()));
+    gbSubletDocumentArrived = true;
+    return number;
+}
+
+void TakeSublet(const db::Recordset& quote, db::Recordset& row, const Line& line, Sublet& told)
+{
+    told.read(line);
+    told.number = TakeDocument(quote, line, told.number);
+    if (!StandOnRow(row, line.change, told.number))
+        return;
+
+    FillKey(row, quote, told.number);
+    Fill(row, {{"category"_L1, u"MIS"_s}, {"script"_L1, told.description.left(descriptionLength)}, {"blend"_L1, 0}});
+    if (line.change == Change::Insert) {
+        Fill(row, {{"Report_on"_L1, 0},
+                   {"delitem"_L1, false},
+                   {"tosend"_L1, u"A"_s},
+                   {"unitcost"_L1, 0},
+                   {"Tag"_L1, 1},
+                   {"itemno"_L1, u""_s},
+                   {"directbill"_L1, u"R"_s},
+                   {"VENDOR"_L1, FindOrAddVendor(told.repairer.left(repairerLength), told.address, told.phone)}});
+    }
+    TakeItemNo(row);
+    row.update();
+}
+
+constexpr QLatin1StringView sections[] = {"labours"_L1, "parts"_L1, "paints"_L1, "sublets"_L1};
+
+xml::Node BodyOf(const xml::Document& message)
+{
+    const xml::Node body = message.selectSingleNode(u"rootns:quoteBody"_s);
+    for (const QLatin1StringView section : sections)
+        LinesOf(body, section);
+    return body;
+}
+
+void TakeLines(const db::Recordset& quote, db::Recordset& rows, const xml::Document& message)
+{
+    const xml::Node body = BodyOf(message);
+    for (const QLatin1StringView total :
+         {"labourTotal"_L1, "partTotal"_L1, "partMarkUpTotal"_L1, "gst"_L1, "paintTotal"_L1, "quoteTotal"_L1})
+        body.textOf(u"rootns:"_s + total);
+
+    for (const Line& line : LinesOf(body, "labours"_L1))
+        TakeLabour(quote, rows, line);
+    for (const Line& line : LinesOf(body, "parts"_L1))
+        TakePart(quote, rows, line);
+    for (const Line& line : LinesOf(body, "paints"_L1))
+        TakePaint(quote, rows, line);
+    Sublet told;
+    for (const Line& line : LinesOf(body, "sublets"_L1))
+        TakeSublet(quote, rows, line, told);
+}
+
+template <class Step>
+bool Trapped(Step step)
+{
+    try {
+        step();
+        return true;
+    } catch (const RuntimeError& error) {
+        LogError(error, u"modLoadXML.LoadQuoteBody"_s, u"LoadQuoteBody"_s);
+        return false;
+    }
+}
+
+}  // namespace
+
+bool LoadQuoteBody(const db::Recordset& rsQuote, db::Recordset& rsLines, const xml::Document& message)
+{
+    return Trapped([&] { TakeLines(rsQuote, rsLines, message); });
+}
+
+bool CheckQuoteBody(const xml::Document& message)
+{
+    return Trapped([&] { BodyOf(message); });
+}
+
+}  // namespace kest

@@ -1,0 +1,134 @@
+// The numbers that a loaded line takes where the message leaves them open: its own, its item code, its document's.
+#include "inbound/modLoadXML.h"
+#include "outbound/SubletDocuments.h"
+#include "platform/RuntimeError.h"
+#include "platform/database/Sql.h"
+#include "platform/files/files.h"
+#include "platform/values.h"
+#include "shell/Helpers.h"
+
+#include <QSet>
+
+#include <array>
+#include <span>
+#include <utility>
+
+namespace kest {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+using CodeRange = std::pair<int, int>;  // first and last
+
+constexpr CodeRange labourCodes[] = {{137, 151}, {287, 303}, {447, 459}};
+constexpr CodeRange otherPaintCodes[] = {{153, 155}, {304, 306}, {462, 464}};
+constexpr CodeRange partCodes[] = {{780, 800}};
+constexpr CodeRange miscellaneousCodes[] = {{990, 994}, {997, 998}};
+
+struct CodePool {
+    QLatin1StringView category;
+    std::span<const CodeRange> codes;
+};
+
+const CodePool codePools[] = {
+    {"R&R"_L1, labourCodes},     {"RA"_L1, labourCodes}, {"PAINT"_L1, labourCodes},
+    {"OPG"_L1, otherPaintCodes}, {"PRT"_L1, partCodes},  {"MIS"_L1, miscellaneousCodes},
+};
+
+std::span<const CodeRange> CodesOf(const QString& category)
+{
+    for (const CodePool& pool : codePools) {
+        if (pool.category == category)
+            return pool.codes;
+    }
+    return {};
+}
+
+bool IsTaken(db::Recordset& rows, const QString& code)
+{
+    rows.moveFirst();
+    rows.find(sql("itemno = '{}'", code));
+    return !rows.eof();
+}
+
+/// The first code of the ranges that no row has; empty where all are taken.
+QString FreeCode(db::Recordset& rows, std::span<const CodeRange> ranges)
+{
+    for (const auto& [first, last] : ranges) {
+        for (int code = first; code <= last; ++code) {
+            if (!IsTaken(rows, QString::number(code)))
+                return QString::number(code);
+        }
+    }
+    return {};
+}
+
+/// The quote of the last number that was worked out, and that number.
+struct LastNumber {
+    QString qtnno;
+    QString subquote;
+    qint64 number = 0;
+};
+LastNumber lastNumber;
+
+}  // namespace
+
+qint64 NextLineNumber(qint64 number, const QString& qtnno, const QString& subquote)
+{
+    if (number > 0)
+        return number;
+    const db::Recordset rows =
+        Opened(sql("SELECT MAX(SEQ_NO) FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", qtnno, subquote));
+    const bool isSameQuote = lastNumber.qtnno == qtnno && lastNumber.subquote == subquote;
+    const qint64 highest = isSameQuote ? lastNumber.number : toLong(rows.value(rows.columns().constFirst()));
+    lastNumber = {qtnno, subquote, highest + 1};
+    return lastNumber.number;
+}
+
+QString NextItemNo(db::Recordset& rsLines)
+{
+    QString chosen = u"999"_s;
+    attempt([&] {
+        const int position = rsLines.absolutePosition();
+        const QString code = FreeCode(rsLines, CodesOf(rsLines.text(u"category"_s).trimmed()));
+        if (!code.isEmpty())
+            chosen = code;
+        rsLines.moveFirst();
+        rsLines.setAbsolutePosition(position);
+    });
+    return chosen;
+}
+
+qint64 NextDocumentLine(qint64 highest)
+{
+    for (const QString& name : files::list(SubletFolder())) {
+        if (name.startsWith(u'.') || GetExtensionUpper(name) != u"PDF"_s)  // a name with a dot in front is hidden
+            continue;
+        const QString lastCharacter = name.left(name.lastIndexOf(u'.')).right(1);
+        highest = qMax(highest, qint64(leadingNumber(lastCharacter)));
+    }
+    return highest + 1;
+}
+
+QString NextDocumentName(const QString& qtnno, const QString& subquote, qint64 number)
+{
+    if (qtnno.isEmpty() || subquote.isEmpty())
+        return {};
+    QSet<qint64> taken;
+    qint64 highest = 0;
+    for (const QString& name : files::list(SubletFolder(), u"*pdf"_s)) {
+        const bool isOfQuote =
+            name.startsWith(qtnno, Qt::CaseInsensitive) && name.mid(qtnno.size() + 1, subquote.size()) == subquote;
+        bool isNumber = false;
+        const int found = name.section(u'_', -1).section(u'.', 0, 0).toInt(&isNumber);
+        if (!isOfQuote || !isNumber)
+            continue;
+        taken.insert(found);
+        highest = qMax<qint64>(highest, found);
+    }
+    const qint64 free = taken.contains(number) ? highest + 1 : number;
+    return files::pathForWriting(SubletFolder(), qtnno + u'.' + subquote + u'_' + QString::number(free) + u".pdf"_s);
+}
+
+}  // namespace kest

@@ -1,0 +1,33 @@
+#include "quotedata/Vendors.h"
+
+#include "platform/database/Sql.h"
+#include "shell/modDBAccess.h"
+
+namespace kest {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+constexpr int vendorAccount = 293;  // of the ledger
+
+}  // namespace
+
+QVariant FindOrAddVendor(const QString& name, const QString& street, const QString& phone)
+{
+    db::Recordset vendor = Opened(sql("SELECT * FROM VENDOR WHERE NAME LIKE '%{}%'", name));
+    if (vendor.eof()) {
+        vendor.addNew();
+        vendor.set(u"Name"_s, name);
+        vendor.set(u"street"_s, street);
+        vendor.set(u"phone"_s, phone);
+        for (const QLatin1StringView empty :
+             {"contact"_L1, "suburb"_L1, "Fax"_L1, "accno"_L1, "email"_L1, "vendor_abn"_L1})
+            vendor.set(empty, u""_s);
+        vendor.set(u"Account"_s, vendorAccount);
+        vendor.update();
+    }
+    return vendor.value(u"VENDOR_ID"_s);
+}
+
+}  // namespace kest
