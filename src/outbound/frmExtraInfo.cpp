@@ -111,7 +111,7 @@ void frmExtraInfo::build()
     Command1->installEventFilter(this);
     lvColour->installEventFilter(this);
 
-    QAction* drop = txtColour->addAction(style()->standardIcon(QStyle::SP_ArrowDown), QLineEdit::TrailingPosition);
+    QAction* drop = txtColour->addAction(desktop::dropArrow(palette()), QLineEdit::TrailingPosition);
     drop->setToolTip(u"Show the colours (F4)"_s);
     drop->setShortcut(Qt::Key_F4);
     drop->setShortcutContext(Qt::WidgetShortcut);

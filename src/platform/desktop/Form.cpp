@@ -10,8 +10,8 @@ namespace {
 
 constexpr int pictureSize = 24;  // pixels
 
-/// A door with an arrow out of it, in the colour of the text, so that it shows on light and dark desktops.
-QIcon exitPicture(const QPalette& palette)
+/// Lines in the colour of the text, so that they show on light and dark desktops.
+QIcon drawn(const QPalette& palette, const QList<QPolygonF>& lines)
 {
     constexpr qreal sharpness = 2;
     QPixmap picture(QSize(pictureSize, pictureSize) * sharpness);
@@ -20,10 +20,16 @@ QIcon exitPicture(const QPalette& palette)
     QPainter painter(&picture);
     painter.setRenderHint(QPainter::Antialiasing);
     painter.setPen(QPen(palette.color(QPalette::ButtonText), 2, Qt::SolidLine, Qt::RoundCap, Qt::RoundJoin));
-    painter.drawPolyline(QPolygonF({{13, 7}, {13, 3}, {3, 3}, {3, 21}, {13, 21}, {13, 17}}));
-    painter.drawLine(QPointF(8, 12), QPointF(21, 12));
-    painter.drawPolyline(QPolygonF({{17, 8}, {21, 12}, {17, 16}}));
+    for (const QPolygonF& line : lines)
+        painter.drawPolyline(line);
     return picture;
+}
+
+/// A door with an arrow out of it.
+QIcon exitPicture(const QPalette& palette)
+{
+    return drawn(palette, {QPolygonF({{13, 7}, {13, 3}, {3, 3}, {3, 21}, {13, 21}, {13, 17}}),
+                           QPolygonF({{8, 12}, {21, 12}}), QPolygonF({{17, 8}, {21, 12}, {17, 16}})});
 }
 
 }  // namespace
@@ -47,6 +53,11 @@ void Form::keyPressEvent(QKeyEvent* event)
         close();
     else
         QDialog::keyPressEvent(event);
+}
+
+QIcon dropArrow(const QPalette& palette)
+{
+    return drawn(palette, {QPolygonF({{6, 9}, {12, 15}, {18, 9}})});
 }
 
 QPushButton* exitButton(QWidget* parent, const QString& name, const QString& tip)

@@ -23,4 +23,7 @@ protected:
 /// A button with a picture of the way out in place of a caption; `tip` is shown, and read out, in its place.
 QPushButton* exitButton(QWidget* parent, const QString& name, const QString& tip = QStringLiteral("Close"));
 
+/// The picture of a list that drops down, in the colour of the text.
+QIcon dropArrow(const QPalette& palette);
+
 }  // namespace kest::desktop
