@@ -16,7 +16,6 @@
 #include "shell/SharedVariables.h"
 #include "shell/component.h"
 #include "shell/eKEST.h"
-#include "shell/frmKEST.h"
 #include "utilities/FormatXML.h"
 
 #include <QFile>
@@ -195,7 +194,7 @@ Outcome send(const QStringList& arguments)
 {
     OpenHostQuote(arguments[0], arguments.value(1, u"0"_s));
     bool sent = false;
-    desktop::guarded(u"frmKEST.cmdOK_Click"_s, [&] { sent = frmKEST::SendOpenQuote(); });
+    desktop::guarded(u"frmKEST.cmdOK_Click"_s, [&] { SendQuote(*grsQuote, &sent); });
     desktop::throwKept();
     return {.exitCode = sent ? Done : Refused};
 }

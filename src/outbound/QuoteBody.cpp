@@ -238,7 +238,7 @@ Leaves QuoteBody::part(const Line& line)
     partSum = RoundAmount(toDouble(amount) + partSum, 2);
     markUpSum = RoundAmount(toDouble(markUpAmount) + markUpSum, 2);
 
-    const QString mark = line.text(u"MARK"_s).trimmed();  // a blank is a new part, as no mark is
+    const QString mark = line.text(u"MARK"_s);  // a blank, which a load writes, is a mark of its own
     return {
         filled("partNumber", mark.isEmpty() ? line.text(u"PARTNO"_s) : QString()),
         {"partType", always, partType(mark)},

@@ -74,7 +74,8 @@ ExtraValues vehicleValues(const QuoteRows& rows, const std::optional<ExtraValues
         values = *extra;
     else
         std::tie(values[BuildYear], values[BuildMonth]) = buildDate(text(car, "YEAR"));
-    if (isTrue(rows.quote.value(u"ExtraInfo"_s)))
+    const QVariant asked = rows.quote.value(u"ExtraInfo"_s);
+    if (asked.isNull() || isTrue(asked))  // a quote of which nobody has said counts as answered
         return values;
 
     values[Transmission] = TransmissionOf(car);
@@ -117,9 +118,8 @@ InsurerReference ReferenceOf(const QuoteRows& rows)
 {
     InsurerReference reference;
     if (!rows.isMainQuote()) {
-        const QString authorised = text(rows.quote, "KESTAuthNo");
-        reference.authorisedQuoteNumber =
-            authorised.isEmpty() ? text(rows.mainQuote, "KESTQuoteNo") : authorised.trimmed();
+        const QString authorised = trimmed(rows.quote, "KESTAuthNo");
+        reference.authorisedQuoteNumber = authorised.isEmpty() ? text(rows.mainQuote, "KESTQuoteNo") : authorised;
     } else if (text(rows.quote, "KESTQRNo").isEmpty()) {
         reference.claimNumber = trimmed(rows.quote, "Claim");
     } else {

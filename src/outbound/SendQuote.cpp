@@ -77,7 +77,7 @@ double refuse(const QString& message)
 
 }  // namespace
 
-double SendQuote(db::Recordset& quote)
+double SendQuote(db::Recordset& quote, bool* sent)
 {
     if (quote.eof())
         return refuse(quoteNotFound);
@@ -93,6 +93,8 @@ double SendQuote(db::Recordset& quote)
 
     RoundQuoteLines(quote);
     const double total = CreateQuoteXML(quote);
+    if (sent)
+        *sent = total != 0;
     if (total != 0)
         CreateImageXML(gsImagesPath, quote);
     return total;

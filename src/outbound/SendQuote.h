@@ -9,6 +9,7 @@ namespace kest {
 /// opened again, and stands afterwards on the row that was considered.
 /// The quote total that was sent, 0 when the quote was not sent. Failures are thrown; a quote is locked only when its
 /// document stands complete in the outgoing folder.
-double SendQuote(db::Recordset& quote);
+/// `sent` becomes true once the quote counts as sent, whatever fails behind it.
+double SendQuote(db::Recordset& quote, bool* sent = nullptr);
 
 }  // namespace kest

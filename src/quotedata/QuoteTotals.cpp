@@ -21,6 +21,7 @@ struct SectionTotals {
     double otherPaint = 0;
     double parts = 0;
     double miscellaneous = 0;
+    double inOrder = 0;  // all labour and paint, added line by line
 
     double labour() const { return removeAndReplace + repair + paint + otherPaint; }
 };
@@ -63,17 +64,21 @@ void AddLine(SectionTotals& totals, const db::Recordset& line, EmptyHours emptyH
         const QVariant value = line.value(column);
         return value.isNull() && emptyHours == EmptyHours::CountAsZero ? QVariant(0.0) : value;
     };
+    const auto addLabour = [&](double& section, double amount) {
+        section += amount;
+        totals.inOrder += amount;
+    };
     const QString category = line.text(u"category"_s);
     if (category == "PRT"_L1)
         totals.parts += Amount(line, line.value(u"qty"_s), hours(u"rrhour"_s));  // rrhour: selling price of one unit
     else if (category == "R&R"_L1)
-        totals.removeAndReplace += Amount(line, line.value(u"rr_rate2"_s), hours(u"rrhour"_s));
+        addLabour(totals.removeAndReplace, Amount(line, line.value(u"rr_rate2"_s), hours(u"rrhour"_s)));
     else if (category == "RA"_L1)
-        totals.repair += Amount(line, line.value(u"rr_rate2"_s), hours(u"rahour"_s));
+        addLabour(totals.repair, Amount(line, line.value(u"rr_rate2"_s), hours(u"rahour"_s)));
     else if (category == "PAINT"_L1)
-        totals.paint += Amount(line, line.value(u"rr_rate2"_s), hours(u"pthour"_s));
+        addLabour(totals.paint, Amount(line, line.value(u"rr_rate2"_s), hours(u"pthour"_s)));
     else if (category == "OPG"_L1)
-        totals.otherPaint += Amount(line, line.value(u"opg_rate"_s), hours(u"pthour"_s));
+        addLabour(totals.otherPaint, Amount(line, line.value(u"opg_rate"_s), hours(u"pthour"_s)));
     else if (category == "MIS"_L1 && !IsReportItem(line))
         totals.miscellaneous += toDouble(line.value(u"unitcost"_s));
 }
@@ -113,7 +118,8 @@ void CalcQuoteTotals(db::Recordset& quote, db::Recordset& lines)
         quote.set(u"RA_TOTAL"_s, totals.repair);
         quote.set(u"PAINT_TOTAL"_s, totals.paint);
         quote.set(u"quotechanged"_s, true);
-        quote.update();
+        if (!attempt([&] { quote.update(); }))
+            quote.cancelUpdate();  // totals that could not be stored must not go with a later change
     });
 }
 
@@ -123,11 +129,12 @@ void CalcAuthorisedTotals(db::Recordset& quote, db::Recordset& lines)
         if (!lines.eof())
             lines.moveFirst();
         const SectionTotals totals = TotalsOf(lines, EmptyHours::Fail);
-        quote.set(u"TOTAL"_s, totals.labour());
+        quote.set(u"TOTAL"_s, totals.inOrder);
         quote.set(u"PRTTOTAL"_s, totals.parts);
         quote.set(u"MISTOTAL"_s, totals.miscellaneous);
         quote.set(u"quotechanged"_s, true);
-        quote.update();
+        if (!attempt([&] { quote.update(); }))
+            quote.cancelUpdate();  // totals that could not be stored must not go with a later change
     });
 }
 

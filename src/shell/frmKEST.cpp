@@ -135,7 +135,7 @@ void frmKEST::cmdOK_Click()
             frmMessageList::ShowForm();
             break;
         case SendQuoteOption:
-            SendOpenQuote();
+            SendQuote(*grsQuote);
             break;
         case Utilities:
             openUtilities();
@@ -143,11 +143,6 @@ void frmKEST::cmdOK_Click()
         default:
             break;
     }
-}
-
-bool frmKEST::SendOpenQuote()
-{
-    return SendQuote(*grsQuote) != 0;
 }
 
 void frmKEST::startTransport()

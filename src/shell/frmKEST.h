@@ -16,9 +16,6 @@ class frmKEST final : public desktop::Form {
 public:
     frmKEST();
 
-    /// Sends the quote of the panel; false when it was refused.
-    static bool SendOpenQuote();
-
 protected:
     bool event(QEvent* event) override;
     bool eventFilter(QObject* watched, QEvent* event) override;

@@ -46,7 +46,8 @@ TEST_F(GoldenDocument, AMainQuoteFromARequest)
 {
     customer("Holloway").set("PHONE_P", "(02) 5550 1234").set("PHONE_B", " +61 2 5550 98765");
     car("ABC123").set("XMission", "a").set("CYLINDERS", 4).set("ENG_SIZE", "1.8L").set("VIN", " 6T1BD0001 ");
-    QuoteRow row = quote("1201").request("QR88123", "2").note("Active Quote Request").set("kms", "84210");
+    QuoteRow row = quote("1201").request("QR88123", "2").note("Active Quote Request");
+    row.set("kms", "84210").set("ExtraInfo", false);
     row.set("CAR_IN", QDate(2024, 2, 26)).set("targetdate", QDate(2024, 3, 4));
     row.remarks("Repairs < 1 week & \"guaranteed\",\r\ncaf\u00e9 next door", "P_REMARKS");
     addPhotographs({"1201_0001.jpg", "1201_0012.jpg", "1201_1001.jpg", "120_0001.jpg"});
