@@ -119,20 +119,29 @@ TEST_F(Utilities, OnlySaveStoresWhatWasTypedAndItOpensTheHostsQuoteAnew)
     const std::string typed = set("txtQRNo", "QR9") + set("txtQRVer", "3") + set("txtQuoteNo", "KQ'9") +
                               set("txtAuthNo", "KA9") + set("txtAuthDate", "22/4/2009") + set("txtClaimNo", "ABC 123") +
                               R"({"click": "chkReadOnly"}, {"click": "chkExtraInfo"}, )";
-    const std::pair<std::string, std::string> ways[] = {
-        {R"({"click": "Command3"}, {"click": "Command9"}, )" + save, "||||7700001|21/03/2008|False|False|"},
-        {R"({"click": "Command2"})", "||||7700001|21/03/2008|False|False|"},
-        {save, "QR9|3|KQ'9|KA9|ABC 123|22/04/2009|True|True|"},
+    const std::string before = "||||7700001|21/03/2008|False|False|";
+    const std::string after = "QR9|3|KQ'9|KA9|ABC 123|22/04/2009|True|True|";
+    const char* const refusal = "Invalid Claim Number Entered";
+    struct {
+        std::string way, stored;
+        const char* box = "";
+    } const cases[] = {
+        {R"({"click": "Command3"}, {"click": "Command9"}, )" + save, before},
+        {R"({"click": "Command2"})", before},
+        {set("txtClaimNo", "ABC") + save + ", " + readAll, before, refusal},
+        {set("txtClaimNo", "-5") + save + ", " + readAll, before, refusal},
+        {save, after},
     };
-    for (const auto& [way, expected] : ways) {
-        work(typed + way, u"1"_s);
+    for (const auto& c : cases) {
+        work(typed + c.way, u"1"_s);
         const auto row = quote("500", 1);
         std::string stored;
         for (const char* column :
              {"KESTQRNo", "KESTQRVer", "KESTQuoteNo", "KESTAuthNo", "Claim", "AuthDate", "ReadOnly", "ExtraInfo"})
             stored += row.text(column) + '|';
-        EXPECT_EQ(stored, expected) << way;
-        EXPECT_EQ(row.notes(), "one\r\ntwo\u00a0three") << way;
+        EXPECT_EQ(stored, c.stored) << c.way;
+        EXPECT_EQ(row.notes(), "one\r\ntwo\u00a0three") << c.way;
+        EXPECT_EQ(desktop->boxTexts().join(u'|').toStdString(), c.box) << c.way;
     }
     ASSERT_TRUE(grsQuote && !grsQuote->eof());
     EXPECT_EQ(grsQuote->text(u"KESTQuoteNo"_s), u"HOST"_s);
@@ -153,51 +162,36 @@ TEST_F(Utilities, ARowOfLongTextsThatIsMissingIsMadeWhereThereIsSomethingToStore
     }
 }
 
-TEST_F(Utilities, AClaimNumberWithoutAPositiveNumberIsRefused)
-{
-    const QStringList refusal(u"critical||Invalid Claim Number Entered|ok"_s);
-    const std::pair<std::string, bool> cases[] = {{"ABC 123", true}, {"ABC", false}, {"-5", false}};
-    for (const auto& [claim, accepted] : cases) {
-        quote("500").claim("77").quoteNumber("before");
-        work(set("txtClaimNo", claim) + set("txtQuoteNo", "after") + save + (accepted ? "" : ", " + readAll));
-        EXPECT_EQ(desktop->boxes(), accepted ? QStringList() : refusal) << claim;
-        EXPECT_EQ(quote("500").text("KESTQuoteNo"), accepted ? "after" : "before") << claim;
-    }
-}
-
 TEST_F(Utilities, AStatusButtonRewritesTickNumberAndNotes)
 {
-    const std::string whole =
-        "(01/02/2008 : Authorised Quote) (01/02/2008 : Tender Failed \"Reason : price\") "
-        "(01/02/2008 : Quote Deleted \"Reason : mistake\") (01/02/2008 : Submitted KEST Quote) "
-        "(01/02/2008 : Won Quote Request)";
+    const QString old = u"01/02/2008 : "_s;
+    const QString whole =
+        u"(Authorised Quote) (Tender Failed \"Reason : price\") (Quote Deleted \"Reason : mistake\") "
+        "(Submitted KEST Quote) (Won Quote Request)"_s;
     struct {
         const char* button;
         int subquote;
-        bool locked;
-        const char* quoteNumber;
-        std::string notes;
+        std::string state;  // locked, number, authorised, stage
+        QString notes;
     } const cases[] = {
-        {"Command3", 0, false, "",
-         "(01/02/2008 : Tender Failed \"Reason : price\") (01/02/2008 : Active Quote Request)"},
-        {"Command3", 1, false, "", "(01/02/2008 : Tender Failed \"Reason : price\") (01/02/2008 : Won Quote Request)"},
-        {"Command4", 0, true, "KQ1", "(01/02/2008 : Sending KEST Quote) (01/02/2008 : Responded Quote Request)"},
-        {"cmdWon", 1, true, "KQ1",
-         "(01/02/2008 : Authorised Quote) (01/02/2008 : Submitted KEST Quote) (01/02/2008 : Won Quote Request)"},
-        {"cmdDeleted", 0, true, "KQ1",
-         "(01/02/2008 : Quote Deleted) (01/02/2008 : Deleted KEST Quote) (01/02/2008 : Responded Quote Request)"},
-        {"cmdLoss", 1, true, "KQ1",
-         "(01/02/2008 : Tender Failed) (01/02/2008 : Quote Deleted) (01/02/2008 : Deleted KEST Quote) "
-         "(01/02/2008 : Loss Quote Request)"},
+        {"Command3", 0, "False||KA1|4", u"(Tender Failed \"Reason : price\") (Active Quote Request)"_s},
+        {"Command3", 1, "False||KA1|4", u"(Tender Failed \"Reason : price\") (Won Quote Request)"_s},
+        {"Command4", 0, "True|KQ1|KA1|4", u"(Sending KEST Quote) (Responded Quote Request)"_s},
+        {"cmdWon", 1, "True|KQ1|KA1|4", u"(Authorised Quote) (Submitted KEST Quote) (Won Quote Request)"_s},
+        {"cmdDeleted", 0, "True|KQ1|KA1|4", u"(Quote Deleted) (Deleted KEST Quote) (Responded Quote Request)"_s},
+        {"cmdLoss", 1, "True|KQ1|KA1|4",
+         u"(Tender Failed) (Quote Deleted) (Deleted KEST Quote) (Loss Quote Request)"_s},
     };
     for (const auto& c : cases) {
         auto row = quote("500", c.subquote);
-        row.quoteNumber("KQ1").authorised("KA1").stage(4).locked(!c.locked).remarks(whole);
+        row.quoteNumber("KQ1").authorised("KA1").stage(4).locked(c.state.front() == 'F');
+        row.remarks(QString(whole).replace(u'(', u'(' + old));
         work("{\"click\": \"" + std::string(c.button) + "\"}, " + save, QString::number(c.subquote));
-        EXPECT_EQ(row.notes(), c.notes) << c.button << c.subquote;
-        EXPECT_EQ(row.locked(), c.locked) << c.button;
-        EXPECT_EQ(row.text("KESTQuoteNo"), c.quoteNumber) << c.button;
-        EXPECT_EQ(row.text("KESTAuthNo") + std::to_string(row.stage()), "KA14") << c.button;
+        EXPECT_EQ(QString::fromStdString(row.notes()).remove(old), c.notes) << c.button << c.subquote;
+        EXPECT_EQ(row.text("ReadOnly") + '|' + row.text("KESTQuoteNo") + '|' + row.text("KESTAuthNo") + '|' +
+                      row.text("Job_stage"),
+                  c.state)
+            << c.button;
     }
 }
 

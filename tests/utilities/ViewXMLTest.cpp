@@ -50,6 +50,7 @@ protected:
 };
 
 const std::string save = R"({"click": "Command2"})";
+const std::string read = R"(, {"read": "txtXML"})";
 const QString overwrite = u"Are you sure you want to OVERWRITE this message?"_s;
 const QString leave = u"Are you sure you want to exit without saving this message?"_s;
 
@@ -77,11 +78,10 @@ TEST_F(Viewer, ASaveWritesTheTextWithoutTheWrapperAndWithTheCharactersThemselves
 
 TEST_F(Viewer, NothingIsWrittenWithoutThePasswordOrTheYes)
 {
-    const std::string readToo = save + R"(, {"read": "txtXML"})";
-    EXPECT_EQ(view("<a>1</a>", readToo, R"({"text": "OVERWRITE", "answer": "no"})"), QStringList(overwrite));
+    EXPECT_EQ(view("<a>1</a>", save + read, R"({"text": "OVERWRITE", "answer": "no"})"), QStringList(overwrite));
     EXPECT_EQ(written(), "<a>1</a>");
     EXPECT_EQ(shown, u"<a>1</a>\r\n"_s);
-    EXPECT_EQ(view("<a>1</a>", readToo, {}, "1"), QStringList(u"Invalid Password, try again!"_s));
+    EXPECT_EQ(view("<a>1</a>", save + read, {}, "1"), QStringList(u"Invalid Password, try again!"_s));
     EXPECT_EQ(written(), "<a>1</a>");
 }
 
