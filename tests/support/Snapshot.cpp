@@ -48,7 +48,8 @@ std::string holdings()
         for (db::Recordset rows = Opened(u"SELECT * FROM "_s + name); !rows.eof(); rows.moveNext()) {
             QStringList values{name};
             for (const QString& column : rows.columns())
-                values += column + u'=' + (rows.isNull(column) ? u"Null"_s : rows.text(column));
+                if (column != u"itemid"_s)  // a line that is stored anew has another one
+                    values += column + u'=' + (rows.isNull(column) ? u"Null"_s : rows.text(column));
             ofTable += values.join(u' ');
         }
         ofTable.sort();
