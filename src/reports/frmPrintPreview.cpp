@@ -153,7 +153,7 @@ void frmPrintPreview::resizeEvent(QResizeEvent* event)
     if (isMinimized())
         return;
     const int space = desktop::pixels(gap);
-    crvPreview->setGeometry(0, 0, width(), height() - cmdExit->height() - 2 * space);
+    crvPreview->setGeometry(0, 0, width(), height() - cmdExit->height() - desktop::pixels(2 * gap));
     cmdExit->move(width() - cmdExit->width() - space, crvPreview->height() + space);
 }
 

@@ -1,8 +1,11 @@
 // Which report a message gives, with which values, and what is said where it gives none.
+#include "messages/frmMessageList.h"
 #include "platform/files/files.h"
 #include "reports/Previews.h"
 #include "reports/PrintXML.h"
 #include "shell/SharedVariables.h"
+
+#include <QPushButton>
 
 namespace kest::test {
 
@@ -135,6 +138,27 @@ TEST_F(Printing, EachTypeHasItsReportOrNone)
     Message broken = adjustedQuote("500");
     print(broken.without("assessmentComment"));
     EXPECT_EQ(shown().substr(0, 67), "[none] An error 91 has occured, Please contact MarlinDesk Support\r\n");
+}
+
+TEST_F(Printing, TheListWindowReprintsItsReadMessages)
+{
+    quote("500").request("QR1").line(1, "PRT").set("qty", 1.0);
+    files::write(gsReadPath + u"a.xml"_s, authorisedQuote("500").part(1, "D").text());
+    files::write(gsReadPath + u"b.xml"_s, cancellation("QR1").text());
+    frmMessageList window;
+    window.open();
+    auto* button = window.findChild<QPushButton*>(u"cmdPrint"_s);
+    EXPECT_TRUE(button->isHidden());
+    window.chooseFolder(Read);
+    EXPECT_FALSE(button->isHidden());
+    EXPECT_TRUE(window.reprintFile(u"a.xml"_s));
+    const QList<QJsonObject> shownWindows = windows();
+    ASSERT_EQ(shownWindows.size(), 1);
+    EXPECT_EQ(cells(shownWindows[0], 0, "action"), "N");  // the deleted line is left out
+    EXPECT_FALSE(window.reprintFile(u"b.xml"_s));         // its button is disabled
+    EXPECT_EQ(shownReports(), "");
+    window.chooseFolder(Sent);
+    EXPECT_TRUE(button->isHidden());
 }
 
 TEST_F(Printing, AnAuthorisationAlsoShowsItsSubletDocuments)

@@ -109,7 +109,7 @@ mustache::data valueOf(const QString& tag, const Row& row)
         return mustache::data(row.meets(condition));
     const QString field = tag.section(u':', 0, 0);
     const QString format = tag.section(u':', 1);
-    const QString text = row.text(field);
+    const QString text = row.text(field).remove(u'\r');  // lines end in a line feed here
     return (format == u"money"_s ? asMoney(text) : format == u"date"_s ? asDate(text) : text).toStdString();
 }
 
