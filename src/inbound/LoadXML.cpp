@@ -79,10 +79,8 @@ void WithdrawWaitingRequests(const QString& requestNumber)
 bool Load(QString& text, const QString& fileName)
 {
     xml::Document message = ParsedMessage(text);
-    if (message.parseError().errorCode == xml::BareAmpersand) {
-        text = WithAmpersandsEscaped(text);
+    if (message.parseError().errorCode == xml::BareAmpersand && EscapeAmpersands(text))
         message.loadXML(text);
-    }
     if (message.parseError().errorCode != 0) {
         ReportParseError(message.parseError(), fileName);
         return false;

@@ -106,9 +106,12 @@ QString GetMarkerTypeName(const xml::Document& marker)
     return action == "DELDUPE"_L1 ? u"Quote Send Error"_s : QString(unknownMessage);
 }
 
-QString WithAmpersandsEscaped(const QString& text)
+bool EscapeAmpersands(QString& text)
 {
-    return QString(text).replace(u'&', "&amp;"_L1);
+    if (text.size() + 4 * text.count(u'&') > xml::Document::maximumBytes)
+        return false;
+    text.replace(u'&', "&amp;"_L1);
+    return true;
 }
 
 QString WrappedInRequest(const QString& text)

@@ -29,8 +29,9 @@ QString GetMessageTypeName(const xml::Document& message);
 QString GetMarkerTypeName(QString& text);
 QString GetMarkerTypeName(const xml::Document& marker);
 
-/// Every "&" as "&amp;", those of entities included.
-QString WithAmpersandsEscaped(const QString& text);
+/// Every "&" becomes "&amp;", those of entities included. False, and nothing changes, where the outcome would be longer
+/// than a parse takes: it can be five times as long.
+bool EscapeAmpersands(QString& text);
 /// The text between "<request>" and "</request>".
 QString WrappedInRequest(const QString& text);
 

@@ -67,7 +67,6 @@ public:
 private:
     bool parse(const QString& path);
     bool parseWithRepairs();
-    bool escapeAmpersands();
     bool isMarker() const;
     const xml::Document& prepared();
 
@@ -108,7 +107,7 @@ bool Fill::parse(const QString& path)
     text = files::read(path);
     if (folder != Sent)
         return parseWithRepairs();
-    if (!escapeAmpersands())
+    if (!EscapeAmpersands(text))
         return false;
     text = WrappedInRequest(text);
     return document.loadXML(text) && text.size() >= shortestSentText;
@@ -122,18 +121,9 @@ bool Fill::parseWithRepairs()
             return false;
         if (error == xml::SecondRoot)
             text = WrappedInRequest(text);
-        else if (error != xml::BareAmpersand || !escapeAmpersands())
+        else if (error != xml::BareAmpersand || !EscapeAmpersands(text))
             return false;
     }
-    return true;
-}
-
-// Escaping can make a text five times as long: one that no parse would take is not built.
-bool Fill::escapeAmpersands()
-{
-    if (text.size() + 4 * text.count(u'&') > xml::Document::maximumBytes)
-        return false;
-    text = WithAmpersandsEscaped(text);
     return true;
 }
 

@@ -79,7 +79,7 @@ bool loadRepaired(xml::Document& document, QString text)
         if (document.loadXML(text))
             return true;
     }
-    return document.parseError().errorCode == xml::BareAmpersand && document.loadXML(WithAmpersandsEscaped(text));
+    return document.parseError().errorCode == xml::BareAmpersand && EscapeAmpersands(text) && document.loadXML(text);
 }
 
 }  // namespace

@@ -13,18 +13,7 @@ const QString xsi = u"xmlns:xsi=\"http://www.w3.org/2001/XMLSchema-instance\" "_
 TEST(Envelope, ATypeCodeHasItsDisplayNameInAnyCase)
 {
     const std::pair<const char*, const char*> cases[] = {
-        {"QREQ", "Quote Request"},
-        {"qreq", "Quote Request"},
-        {"QMQR", "Quote Matched to Quote Request"},
-        {"MANQ", "Manual Quote"},
-        {"QTDL", "Quote Deletion"},
-        {"RRQT", "Request for Revised Quote"},
-        {"QRCN", "Quote Request Cancellation"},
-        {"ADQT", "Adjusted Quote"},
-        {"AUQT", "Authorised Quote"},
-        {"ARES", "Assessment Result"},
-        {"BACA", "Backout Assessment"},
-        {"BCQR", "Backout Quote Request Cancellation"},
+        {"qreq", "Quote Request"},  // the others have their names in the list's tests
         {"EWAP", "Excess Waived/Already Paid"},
         {"QREQ ", "UNKNOWN - INVALID MESSAGE"},
         {"", "UNKNOWN - INVALID MESSAGE"},
@@ -43,10 +32,7 @@ TEST(Envelope, AMarkerHasItsDisplayName)
     const std::pair<QString, const char*> cases[] = {
         {marker("500"), "Quote Send Error"},
         {marker("500", "0", "OTHER"), "UNKNOWN - INVALID MESSAGE"},
-        {u"<m><mailtype>MDMSG</mailtype></m>"_s, "UNKNOWN - INVALID MESSAGE"},
         {u"<m><mailtype>mdmsg</mailtype><action>DELDUPE</action></m>"_s, "CORRUPT!"},
-        {u"<m><action>DELDUPE</action></m>"_s, "CORRUPT!"},
-        {u"<m>"_s, "CORRUPT!"},
     };
     for (const auto& [text, name] : cases) {
         QString prepared = text;
@@ -56,17 +42,21 @@ TEST(Envelope, AMarkerHasItsDisplayName)
 
 TEST(Envelope, TheSchemaInstanceIsDeclaredOnceBeforeTheFirstDeclaration)
 {
-    const QString upper = xsi.toUpper();
-    const std::pair<QString, QString> cases[] = {
-        {u"<a/>"_s, u"<a/>"_s},
-        {u"<a XMLNS='u'/>"_s, u"<a XMLNS='u'/>"_s},
-        {u"<a xmlns='u'/>"_s, u"<a "_s + xsi + u"xmlns='u'/>"_s},
-        {u"<a><b xmlns='u'/><c xmlns='v'/></a>"_s, u"<a><b "_s + xsi + u"xmlns='u'/><c xmlns='v'/></a>"_s},
-        {u"<a "_s + xsi + u"xmlns='u'/>"_s, u"<a "_s + xsi + u"xmlns='u'/>"_s},
-        {u"<a xmlns='u' "_s + upper + u"/>"_s, u"<a xmlns='u' "_s + upper + u"/>"_s},
-    };
-    for (const auto& [text, prepared] : cases)
-        EXPECT_EQ(AddXsiDeclaration(text), prepared);
+    EXPECT_EQ(AddXsiDeclaration(u"<a><b xmlns='u'/><c xmlns='v'/></a>"_s),
+              u"<a><b "_s + xsi + u"xmlns='u'/><c xmlns='v'/></a>"_s);
+    for (const QString& unchanged :
+         {u"<a XMLNS='u'/>"_s, u"<a "_s + xsi + u"xmlns='u'/>"_s, u"<a xmlns='u' "_s + xsi.toUpper() + u"/>"_s})
+        EXPECT_EQ(AddXsiDeclaration(unchanged), unchanged);
+}
+
+TEST(Envelope, AmpersandsAreEscapedAsFarAsAParseGoes)
+{
+    QString text = u"a & b &amp;"_s;
+    EXPECT_TRUE(EscapeAmpersands(text));
+    EXPECT_EQ(text, u"a &amp; b &amp;amp;"_s);
+    QString hostile(xml::Document::maximumBytes / 5 + 1, u'&');
+    EXPECT_FALSE(EscapeAmpersands(hostile));
+    EXPECT_EQ(hostile.size(), xml::Document::maximumBytes / 5 + 1);
 }
 
 TEST(Envelope, AParseIsSparedOnlyWhereThePreparedTextHoldsTheSame)
@@ -74,7 +64,6 @@ TEST(Envelope, AParseIsSparedOnlyWhereThePreparedTextHoldsTheSame)
     const QString ns = u"xmlns=\"u\""_s;
     const std::pair<QString, bool> cases[] = {
         {u"<a><b/></a>"_s, true},
-        {u"<a "_s + ns + u"/>"_s, true},
         {u"<request><a/><b\n"_s + ns + u"/></request>"_s, true},
         {u"<a "_s + xsi + ns + u"/>"_s, true},
         {u"<a "_s + ns + u' ' + xsi.trimmed() + u"/>"_s, false},         // declared twice
