@@ -61,18 +61,30 @@ void TakeNotice(const xml::Node& root, const QString& fileName)
     }
 }
 
+void WithdrawIfRequest(const QString& path, const QString& requestNumber)
+{
+    QString text = files::read(path);
+    const xml::Document waiting = ParsedMessage(text);
+    if (waiting.parseError().errorCode != 0)
+        return;
+    const xml::Node root = waiting.documentElement();
+    const xml::Node number = root.selectSingleNode(u"//rootns:quoteRequestNumber"_s);
+    if (root.textOrEmptyOf(u"messageType"_s) == u"QREQ"_s && number && number.text() == requestNumber)
+        files::remove(path, files::Force::Yes);
+}
+
 /// A quote request that a manual quote answers may still wait unread; it must not make a second quote.
 void WithdrawWaitingRequests(const QString& requestNumber)
 {
     for (const QString& name : files::list(gsUnreadPath)) {
-        QString text = files::read(gsUnreadPath + name);
-        const xml::Document waiting = ParsedMessage(text);
-        if (waiting.parseError().errorCode != 0)
+        if (!IsBareName(name))
             continue;
-        const xml::Node root = waiting.documentElement();
-        const xml::Node number = root.selectSingleNode(u"//rootns:quoteRequestNumber"_s);
-        if (root.textOrEmptyOf(u"messageType"_s) == u"QREQ"_s && number && number.text() == requestNumber)
-            files::remove(gsUnreadPath + name, files::Force::Yes);
+        try {
+            WithdrawIfRequest(gsUnreadPath + name, requestNumber);
+        } catch (const RuntimeError& error) {
+            if (error.number() != FileNotFound)  // taken by the transport since the folder was listed
+                throw;
+        }
     }
 }
 
