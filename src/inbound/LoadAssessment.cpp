@@ -42,7 +42,10 @@ const Transition& BackOutOf(const db::Recordset& quote, const db::Recordset& not
 {
     if (!IsSupplementary(quote))
         return quote.text(u"KESTAuthNo"_s).isEmpty() ? failedTenderBackedOut : authorisationBackedOut;
-    const bool rejected = !GetNoteStatus(u"Rejected"_s, notes.text(u"remarks"_s)).isEmpty();
+    const QString remarks = notes.text(u"remarks"_s);
+    bool rejected = !GetNoteStatus(u"Rejected"_s, remarks).isEmpty();
+    if (!rejected && remarks.contains(u"Rejected"_s))  // hidden behind the note of an earlier back-out
+        rejected = quote.isNull(u"AuthDate"_s);
     return rejected ? rejectionBackedOut : supplementaryBackedOut;
 }
 
