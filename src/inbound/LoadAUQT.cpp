@@ -76,7 +76,7 @@ Authorisation::Authorisation(const xml::Document& message)
 db::Recordset OpenQuote(const Authorisation& told, QString& number, QString& subquote)
 {
     db::Recordset quote = Opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
-    if (!quote.eof())
+    if (!quote.eof() || told.originalNumber.trimmed().isEmpty())
         return quote;
     quote = Opened(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' AND KESTQuoteNo='{}' AND REGO = '{}'", told.request,
                        told.originalNumber, told.rego));

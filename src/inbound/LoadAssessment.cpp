@@ -60,7 +60,7 @@ bool LoadADQT(QString& text, const QString& fileName)
 
     db::Recordset quote = Opened(
         sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}' AND KESTQRNo='{}'", number, subquote, request));
-    if (quote.eof())
+    if (quote.eof() && !request.trimmed().isEmpty())
         quote = Opened(sql("SELECT TOP 1 * FROM QUOTE1 WHERE KESTQRNo='{}' order by rec_id DESC", request));
     if (quote.eof())
         return Refuse(u"Error locating Quote in Database, Please contact Marlindesk Support."_s);
@@ -85,7 +85,7 @@ bool LoadARES(QString& text, const QString&)
     const xml::Document message = ParsedMessage(text);
     const QString number = message.textOf(u"//rootns:getAssmntResultResponse/rootns:kestOriginalQuoteNumber"_s);
     db::Recordset quote = Opened(sql("SELECT * FROM QUOTE1 WHERE KESTQuoteNo='{}' ORDER BY rec_id DESC", number));
-    if (quote.eof())
+    if (IsUnknown(number, quote))
         return RefuseRequestNumber();
     quote.moveLast();  // the oldest quote with that number
     db::Recordset notes = OpenNotes(quote);
@@ -103,7 +103,7 @@ bool LoadBACA(QString& text, const QString& fileName)
     const xml::Document message = ParsedMessage(text);
     const QString request = message.textOf(u"//rootns:getBackoutAssmntResponse/rootns:kestQuoteRequestNumber"_s);
     db::Recordset quote = Opened(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request));
-    if (quote.eof())
+    if (IsUnknown(request, quote))
         return RefuseRequestNumber();
     db::Recordset notes = OpenNotes(quote);  // of the newest quote of the request
 

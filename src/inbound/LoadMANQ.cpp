@@ -80,7 +80,7 @@ std::optional<QuoteKey> MatchSupplementary(const ManualQuote& manual, const db::
     }
     quotes =
         Opened(sql("SELECT QTNNO, SUBQUOTE FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY SUBQUOTE DESC", manual.request));
-    if (!quotes.eof())
+    if (!IsUnknown(manual.request, quotes))
         return QuoteKey{quotes.text(u"QTNNO"_s), Behind(quotes)};
     Refuse(u"Failed matching to existing parent KEST Quote"_s);
     return {};
@@ -127,7 +127,7 @@ QuoteKey MatchMain(const ManualQuote& manual, const db::Recordset& cinfo)
     }
     const db::Recordset requested =
         Opened(sql("SELECT QTNNO, Subquote, Rego FROM QUOTE1 WHERE KESTQRNO='{}'", manual.request));
-    if (!requested.eof() && isOfCar(requested.text(u"Rego"_s)))
+    if (!IsUnknown(manual.request, requested) && isOfCar(requested.text(u"Rego"_s)))
         return KeyOf(requested);
     return {NewNumber(manual.told.number, cinfo), u"0"_s};
 }

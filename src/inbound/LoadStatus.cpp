@@ -110,7 +110,7 @@ bool LoadQTDL(QString& text, const QString&)
     const xml::Document message = ParsedMessage(text);
     const QString networkNumber = message.textOf(u"//rootns:getQuoteDeletionResponse/rootns:kestQuoteNumber"_s);
     db::Recordset quote = Opened(sql("SELECT * FROM QUOTE1 WHERE KESTQuoteNo='{}'", networkNumber));
-    if (quote.eof())
+    if (IsUnknown(networkNumber, quote))
         return Refuse(noSuchQuoteNumber);
 
     const QVariant number = quote.value(u"QTNNO"_s);
@@ -143,7 +143,7 @@ bool LoadRRQT(QString& text, const QString&)
     const xml::Document message = ParsedMessage(text);
     const QString request = message.textOf(u"//rootns:getReqForRevQteResponse/rootns:quoteRequestNumber"_s);
     db::Recordset quote = Opened(sql("SELECT TOP 1 * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request));
-    if (quote.eof())
+    if (IsUnknown(request, quote))
         return Refuse(noSuchRequest);
     db::Recordset notes = OpenNotes(quote);
 
@@ -161,9 +161,9 @@ bool LoadRRQT(QString& text, const QString&)
 bool LoadQRCN(QString& text, const QString&)
 {
     const xml::Document message = ParsedMessage(text);
-    db::Recordset quote =
-        OpenOldestOfRequest(message.textOf(u"//rootns:getQRCancellationResponse/rootns:quoteRequestNumber"_s));
-    if (quote.eof())
+    const QString request = message.textOf(u"//rootns:getQRCancellationResponse/rootns:quoteRequestNumber"_s);
+    db::Recordset quote = OpenOldestOfRequest(request);
+    if (IsUnknown(request, quote))
         return Refuse(noSuchRequest);
     db::Recordset notes = OpenNotes(quote);
 
@@ -177,9 +177,9 @@ bool LoadQRCN(QString& text, const QString&)
 bool LoadBCQR(QString& text, const QString&)
 {
     const xml::Document message = ParsedMessage(text);
-    db::Recordset quote =
-        OpenOldestOfRequest(message.textOf(u"//rootns:getBackoutCancelledQRResponse/rootns:kestQuoteRequestNumber"_s));
-    if (quote.eof())
+    const QString request = message.textOf(u"//rootns:getBackoutCancelledQRResponse/rootns:kestQuoteRequestNumber"_s);
+    db::Recordset quote = OpenOldestOfRequest(request);
+    if (IsUnknown(request, quote))
         return Refuse(noSuchRequest);
     db::Recordset notes = OpenNotes(quote);
 

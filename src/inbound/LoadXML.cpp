@@ -148,6 +148,11 @@ db::Recordset OpenNotes(const db::Recordset& quote)
                       quote.value(u"Subquote"_s)));
 }
 
+bool IsUnknown(const QString& number, const db::Recordset& quote)
+{
+    return number.trimmed().isEmpty() || quote.eof();
+}
+
 bool Refuse(const QString& text)
 {
     desktop::msgBox(text, desktop::Icon::Critical);

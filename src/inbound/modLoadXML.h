@@ -82,6 +82,8 @@ void Fill(db::Recordset& row, std::initializer_list<Column> columns);
 void RespellColour(db::Recordset& car, db::Recordset& colours);
 /// The row of the long texts that belongs to the quote.
 db::Recordset OpenNotes(const db::Recordset& quote);
+/// True where a message's number leads to no quote. An empty one never does: quotes of the host's own may hold it.
+bool IsUnknown(const QString& number, const db::Recordset& quote);
 /// Says with a critical box why a message is not taken; false.
 bool Refuse(const QString& text);
 /// True for a subquote above 0.

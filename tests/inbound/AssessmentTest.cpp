@@ -25,39 +25,19 @@ TEST_F(Assessments, AResultClosesAMainQuoteAndHandsASupplementaryOneBack)
         const char* status;
         const char* reason;
     } cases[] = {
-        {"UNSP", "Lose", "Unspecified Reason"},    {"INCO", "Lose", "Quote Incomplete"},
-        {"LABR", "Lose", "Labour Price"},          {"PART", "Lose", "Part Price"},
-        {"PAIN", "Lose", "Paint Price"},           {"RECY", "Lose", "Recycled Parts"},
-        {"METH", "Lose", "Method of Repair"},      {"tlss", "Total Loss", "Total Loss"},
-        {"NOTP", "Lose", "Repair not Proceeding"}, {"abc", "Lose", "Unknown Reason Code - ABC"},
+        {"PART", "Lose", "Part Price"},
+        {"tlss", "Total Loss", "Total Loss"},
+        {"abc", "Lose", "Unknown Reason Code - ABC"},
     };
     for (const auto& c : cases) {
         quote("500").quoteNumber("KQ1").stage(3).remarks("(01/02/2008 : Responded Quote Request)");
-        quote("500", 1).quoteNumber("KQ2").stage(3).locked(true).remarks("");
-
         EXPECT_TRUE(load(assessmentResult("KQ1").reason(c.code)));
-        EXPECT_EQ(quote("500").stage(), 10);
-        EXPECT_TRUE(quote("500").locked());
-        EXPECT_EQ(quote("500").notes(), std::string("(today : Tender Failed \"Reason : ") + c.reason +
+        EXPECT_EQ(quote("500").state(), std::string("10 locked KQ1 (today : Tender Failed \"Reason : ") + c.reason +
                                             "\") (01/02/2008 : " + c.status + " Quote Request)");
-
-        EXPECT_TRUE(load(assessmentResult("KQ2").reason(c.code)));
-        EXPECT_EQ(quote("500", 1).stage(), 1);
-        EXPECT_FALSE(quote("500", 1).locked());
-        EXPECT_EQ(quote("500", 1).notes(), std::string("(today : Quote Rejected \"Reason : ") + c.reason + "\")");
     }
-}
-
-TEST_F(Assessments, AResultTakesTheOldestQuoteABackOutTheNewest)
-{
-    quote("500").request("QR1").quoteNumber("KQ1");
-    quote("501").request("QR1").quoteNumber("KQ1");
-    EXPECT_TRUE(load(assessmentResult("KQ1")));
-    EXPECT_EQ(quote("500").stage(), 10);
-    EXPECT_EQ(quote("501").stage(), 1);
-    EXPECT_TRUE(load(assessmentBackout("QR1")));
-    EXPECT_EQ(quote("500").stage(), 10);
-    EXPECT_EQ(quote("501").stage(), 3);
+    quote("500", 1).quoteNumber("KQ2").stage(3).locked(true);
+    EXPECT_TRUE(load(assessmentResult("KQ2").reason("tlss")));
+    EXPECT_EQ(quote("500", 1).state(), "1 open KQ2 (today : Quote Rejected \"Reason : Total Loss\")");
 }
 
 TEST_F(Assessments, ABackOutUndoesWhatWasDecided)
@@ -76,15 +56,15 @@ TEST_F(Assessments, ABackOutUndoesWhatWasDecided)
         {1, "KA1", "(01/02/2008 : Quote Rejected \"Reason : Part Price\")",
          "(today : Rejected Supplementary Backout) (01/02/2008 : Quote Rejected \"Reason : Part Price\")", true},
         {1, "KA1", "(02/02/2008 : Authorised Quote)", "(02/02/2008 : Deleted Authorised Quote)", false},
+        {1, "KA1", "(02/02/2008 : Authorised Quote) (01/02/2008 : Rejected Supplementary Backout)",
+         "(02/02/2008 : Deleted Authorised Quote) (01/02/2008 : Rejected Supplementary Backout)", false},
     };
     for (const auto& c : cases) {
         quote("500", c.subquote).request("QR1").authorised(c.authorised).set("AuthDate", "01/02/2008").stage(4);
         quote("500", c.subquote).remarks(c.before);
         EXPECT_TRUE(load(assessmentBackout("QR1")));
-        QuoteRow after = quote("500", c.subquote);
-        EXPECT_EQ(after.stage(), 3);
-        EXPECT_TRUE(after.locked());
-        EXPECT_EQ(after.notes(), c.after);
+        const QuoteRow after = quote("500", c.subquote);
+        EXPECT_EQ(after.state(), std::string("3 locked - ") + c.after);
         EXPECT_EQ(!after.isNull("AuthDate"), c.dateStays) << c.before;
         // the number of a supplementary quote's authorisation stays
         EXPECT_EQ(after.isNull("KESTAuthNo"), c.subquote == 0 && *c.authorised) << c.before;
@@ -112,15 +92,12 @@ TEST_F(Assessments, ASubmissionResponseGivesTheQuoteItsNumber)
     quote("500", 2).note("Sending KEST Quote").note("Sending KEST Quote", "02/02/2008");
     takeResponse("R_500_2_0001.xml", "KQ5", "Submitted");
     takeResponse("R_500_2_0001.xml", "KQ5", "Submitted");  // each fill applies it again
-    EXPECT_EQ(quote("500", 2).text("KESTQuoteNo"), "KQ5");
-    EXPECT_TRUE(quote("500", 2).locked());
-    EXPECT_EQ(quote("500", 2).notes(), "(02/02/2008 : Submitted KEST Quote) (01/02/2008 : Submitted KEST Quote)");
+    EXPECT_EQ(quote("500", 2).state(),
+              "1 locked KQ5 (02/02/2008 : Submitted KEST Quote) (01/02/2008 : Submitted KEST Quote)");
 
     quote("501").note("Sending KEST Quote");
     takeResponse("R_501_0.xml", "KQ6", "submitted");  // another status
-    EXPECT_EQ(quote("501").text("KESTQuoteNo"), "KQ6");
-    EXPECT_FALSE(quote("501").locked());
-    EXPECT_EQ(quote("501").notes(), "(01/02/2008 : Sending KEST Quote)");
+    EXPECT_EQ(quote("501").state(), "1 open KQ6 (01/02/2008 : Sending KEST Quote)");
 
     // without its quote, or without a subquote in its name: the fill says so
     EXPECT_THROW(takeResponse("R_502_0.xml", "KQ7", "Submitted"), RuntimeError);

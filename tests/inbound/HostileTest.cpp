@@ -72,6 +72,7 @@ TEST_P(Hostile, AMessageChangesItsOwnQuoteOrNothing)
     const char* const bystander = "BYSTANDER";
     car(bystander).customer(bystander);
     quote(bystander).rego(bystander).request(bystander).quoteNumber(bystander).line(1);
+    quote("BYSTANDER2").rego(bystander).request("", "").quoteNumber("").line(1);
     files::write(gsUnsentPath + u"BYSTANDER.xml"_s, u"BYSTANDER"_s);
     quote("500").request("QR1").quoteNumber("KQ1").stage(3).note("Responded Quote Request").line(1);
     const QString ownType = typeOf(GetParam().text());

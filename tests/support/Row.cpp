@@ -105,6 +105,13 @@ std::string QuoteRow::notes() const
     return chain.replace(shortDate(QDate::currentDate()), u"today"_s).toStdString();
 }
 
+std::string QuoteRow::state() const
+{
+    const std::string network = text("KESTQuoteNo");
+    return std::to_string(stage()) + (locked() ? " locked " : " open ") + (network.empty() ? "-" : network) + ' ' +
+           notes();
+}
+
 Row QuoteRow::texts() const
 {
     return Row("QUOTE3", key());

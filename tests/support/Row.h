@@ -87,6 +87,8 @@ public:
     bool locked() const;
     /// The note chain, today's date written as "today".
     std::string notes() const;
+    /// Stage, lock, network number and notes: "3 locked KQ1 (01/02/2008 : Responded Quote Request)".
+    std::string state() const;
     Row texts() const;
 
     /// The line of that number; made with `category` where the quote has none.
