@@ -12,6 +12,8 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
+constexpr qsizetype longestShown = 200;  // characters of a criterion that a message shows
+
 bool isTextKind(Kind kind)
 {
     return kind == Kind::Text || kind == Kind::LongText;
@@ -106,13 +108,13 @@ QList<Criterion> criteriaIn(const QString& text)
 {
     static const QRegularExpression condition(
         uR"(\G\s*(?:\[([^\]]+)\]|(\w+))\s*(=|<>|<=|>=|<|>|LIKE\b)\s*)"
-        uR"((?:'((?:[^']|'')*)'|#([^#]*)#|([+-]?[0-9.][0-9.eE+-]*)|(NULL|TRUE|FALSE)\b)\s*(AND\b|$))"_s,
+        uR"((?:'((?:[^']++|'')*+)'|#([^#]*)#|([+-]?[0-9.][0-9.eE+-]*)|(NULL|TRUE|FALSE)\b)\s*(AND\b|$))"_s,
         QRegularExpression::CaseInsensitiveOption);
     QList<Criterion> criteria;
     for (qsizetype start = 0; start < text.size();) {
         const QRegularExpressionMatch match = condition.match(text, start);
         if (!match.hasMatch())
-            throw RuntimeError(StatementFailed, u"The criterion can't be understood: "_s + text);
+            throw RuntimeError(StatementFailed, u"The criterion can't be understood: "_s + text.left(longestShown));
         Criterion criterion;
         criterion.column = match.captured(match.hasCaptured(1) ? 1 : 2);
         criterion.comparison = comparisonOf(match.captured(3));
