@@ -85,9 +85,9 @@ void Request::readRest(const xml::Document& message)
           "extraVehicleInformation/rootns:oldDamageDescription"_L1})
         message.textOf(u"//rootns:"_s + shownOnly);
 
-    if (const xml::Node company = message.selectSingleNode(u"//rootns:claimCustomer/rootns:companyName"_s)) {
+    if (const xml::Node company = message.selectSingleNode(u"//rootns:claimCustomer/rootns:companyName"_s))
         companyName = company.text().left(35);
-    } else {
+    if (companyName.isEmpty()) {
         title = message.textOf(u"//rootns:claimCustomer/rootns:title"_s).left(10);
         firstName = message.textOf(u"//rootns:claimCustomer/rootns:firstName"_s).left(25);
         surname = message.textOf(u"//rootns:claimCustomer/rootns:surname"_s).left(35);
@@ -127,7 +127,7 @@ db::Recordset OpenCustomer(const db::Recordset& car, const Request& request)
     db::Recordset customer(gConn);
     if (!car.eof()) {
         customer.open(sql("SELECT * FROM CUSTOMER WHERE CUST_ID={}", car.value(u"CUST_ID"_s)));
-    } else if (!request.firstName.isEmpty()) {
+    } else if (!request.firstName.trimmed().isEmpty()) {
         const QString firstWord = request.firstName.split(u' ', Qt::SkipEmptyParts).value(0);
         customer.open(sql("SELECT * FROM CUSTOMER WHERE NAME='{}' AND FIRSTNAME LIKE '{}%'", request.surname.trimmed(),
                           firstWord));
@@ -171,9 +171,8 @@ QString ColourOf(const QString& code, db::Recordset& colours)
     return colours.eof() ? u""_s : colours.text(u"Script"_s).trimmed();
 }
 
-void FillNewCar(db::Recordset& car, const Request& request, db::Recordset& colours)
+void FillNewCar(db::Recordset& car, const Request& request, const db::Recordset& model, db::Recordset& colours)
 {
-    const db::Recordset model = Opened(u"SELECT * FROM MODEL WHERE MODEL_ID1='Z000'"_s);
     const QString none = u""_s;
     Fill(car, {
                   {"PAINT_GP"_L1, PaintGroup(request.paintType)},
@@ -244,6 +243,18 @@ void FillQuote(db::Recordset& quote, const QString& quoteNumber, const Request& 
         quote.set(u"kms"_s, request.odometer);
 }
 
+/// A name that no image has. Three digits are all that the search for the next number reads, so behind 999 it finds
+/// names that are taken.
+QString NewImagePath(const QString& quoteNumber)
+{
+    for (int number = NextImageNumber(quoteNumber);; ++number) {
+        const QString name = quoteNumber + u"_0"_s + PadZeroLeft(QString::number(number), 3) + u".jpg"_s;
+        const QString path = files::pathForWriting(gsImagesPath, name);
+        if (!files::exists(path))
+            return path;
+    }
+}
+
 /// Takes the request's pictures that have arrived into the host's images of the quote.
 void TakePhotographs(const xml::Node& root, const QString& requestNumber, const QString& quoteNumber)
 {
@@ -251,9 +262,7 @@ void TakePhotographs(const xml::Node& root, const QString& requestNumber, const 
         const QString arrived = requestNumber + u'_' + PadZeroLeft(imageId.text(), 3);
         if (!files::isPlainName(arrived) || !files::exists(gsUnreadPath + arrived + u".jpg"_s))
             continue;
-        const QString name =
-            quoteNumber + u"_0"_s + PadZeroLeft(QString::number(NextImageNumber(quoteNumber)), 3) + u".jpg"_s;
-        files::move(gsUnreadPath + arrived + u".jpg"_s, files::pathForWriting(gsImagesPath, name));
+        files::move(gsUnreadPath + arrived + u".jpg"_s, NewImagePath(quoteNumber));
         if (files::exists(gsUnreadPath + arrived + u".txt"_s))
             files::remove(gsUnreadPath + arrived + u".txt"_s);
     }
@@ -276,6 +285,7 @@ bool LoadQREQ(QString& text, const QString& fileName)
     Request request;
     request.readKey(message);
     db::Recordset car = Opened(sql("SELECT * FROM CAR WHERE REGO='{}'", request.rego));
+    const db::Recordset model = Opened(u"SELECT * FROM MODEL WHERE MODEL_ID1='Z000'"_s);
     db::Recordset colours = Opened(u"SELECT * FROM KESTColours"_s);
 
     const db::Recordset known = Opened(sql("SELECT * FROM QUOTE1 WHERE SUBQUOTE=0 AND KESTQRNO='{}' AND KESTQRVER='{}'",
@@ -307,7 +317,7 @@ bool LoadQREQ(QString& text, const QString& fileName)
     if (carFound)
         RespellColour(car, colours);
     else
-        FillNewCar(car, request, colours);
+        FillNewCar(car, request, model, colours);
     quote.set(u"paint_rate"_s, insurer.value(car.text(u"PAINT_GP"_s) + u"_RATE"_s));
 
     customer.update();
@@ -320,8 +330,11 @@ bool LoadQREQ(QString& text, const QString& fileName)
     TakePhotographs(message.documentElement(), request.number, quoteNumber);
 
     db::Recordset tried(gConn);
-    cinfo.set(u"QUOTE_VAL"_s, NextQuoteNumber(quoteNumber, cinfo, tried, true));
-    cinfo.update();
+    const QString next = NextQuoteNumber(quoteNumber, cinfo, tried, true);
+    if (isNumeric(next)) {  // with a prefix of letters the counter stays, and the search skips what is taken
+        cinfo.set(u"QUOTE_VAL"_s, next);
+        cinfo.update();
+    }
     return true;
 }
 
@@ -338,7 +351,7 @@ QString NextQuoteNumber(const QString& given, const db::Recordset& cinfo, db::Re
     const auto counted = [&](const QString& value) { return valueOnly ? value : prefix + value + suffix; };
 
     const bool usable = given != u"MANQ"_s && given.size() >= 2 && given.size() <= 8;
-    QString number = usable ? given : counted(cinfo.text(u"QUOTE_VAL"_s));
+    QString number = usable ? given : counted(toText(cinfo.value(u"QUOTE_VAL"_s)));
     for (qint64 counter = 1; isTaken(number); ++counter)
         number = counted(QString::number(toLong(cinfo.value(u"QUOTE_VAL"_s)) + counter));
     return number;
