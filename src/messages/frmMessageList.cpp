@@ -252,7 +252,7 @@ void frmMessageList::updateFilter(const QString& filter)
 
 bool frmMessageList::loadFile(const QString& file)
 {
-    if (select(file) && !cmdProcess->isEnabled())
+    if (!IsBareName(file) || (select(file) && !cmdProcess->isEnabled()))
         return false;
     const bool loaded = load(file);
     if (tmrRefresh->isActive()) {

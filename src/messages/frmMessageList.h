@@ -35,7 +35,8 @@ public:
     /// A text typed as the filter, and "Update".
     void updateFilter(const QString& filter);
     /// "Load" on a file of the folder, listed or not, with the refreshes that follow, the delayed one included. False
-    /// when the message was not taken. For a listed one whose button is disabled nothing happens.
+    /// when the message was not taken. For a name that leaves the folder, and for a listed one whose button is
+    /// disabled, nothing happens.
     bool loadFile(const QString& file);
     /// "Reprint" on a file of the folder, listed or not. False when its report was refused or failed. For a listed one
     /// whose button is disabled nothing happens.

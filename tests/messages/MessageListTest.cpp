@@ -16,9 +16,13 @@ namespace {
 class MessageListWindow : public Shop {
 protected:
     /// Opens the window, carries out the steps, and closes it.
-    void visit(const std::string& steps, const std::string& answers = "", const std::string& otherWindows = "")
+    void visit(std::initializer_list<std::string> steps, const std::string& answers = "",
+               const std::string& otherWindows = "")
     {
-        const std::string windows = R"("windows": {"frmMessageList": [[)" + steps + "]]" + otherWindows + "}";
+        std::string all;
+        for (const std::string& step : steps)
+            all += (all.empty() ? "" : ", ") + step;
+        const std::string windows = R"("windows": {"frmMessageList": [[)" + all + "]]" + otherWindows + "}";
         desktop.emplace(("{" + windows + (answers.empty() ? "" : ", ") + answers + "}").c_str());
         frmMessageList::ShowForm();
     }
@@ -62,20 +66,12 @@ std::string key(const std::string& control, const std::string& name)
     return R"({"key": ")" + control + R"(", "keys": ")" + name + R"("})";
 }
 
-std::string joined(std::initializer_list<std::string> steps)
-{
-    std::string all;
-    for (const std::string& step : steps)
-        all += (all.empty() ? "" : ", ") + step;
-    return all;
-}
-
 TEST_F(MessageListWindow, ALoadedMessageMakesRoomForTheNextOfItsRequest)
 {
     quote("500").request("QR1").note("Active Quote Request");
     arrive("a.xml", cancellation("QR1"));
     arrive("b.xml", cancellation("QR1"));
-    visit(joined({readAll, click("cmdProcess"), readAll}));
+    visit({readAll, click("cmdProcess"), readAll});
 
     EXPECT_EQ(listed(0), "a.xml");
     EXPECT_EQ(listed(1), "b.xml");
@@ -89,7 +85,7 @@ TEST_F(MessageListWindow, ARefusedMessageStaysAndTheListIsFilledTwiceMore)
 {
     arrive("a.xml", cancellation("QR1"));
     arrive("b.xml", "");
-    visit(joined({click("cmdProcess"), R"({"wait": 600})", readAll}));
+    visit({click("cmdProcess"), R"({"wait": 600})", readAll});
 
     EXPECT_EQ(listed(), "a.xml");
     const QString unreadable = u"Message b.xml unreadable, Please contact MarlinDesk Support."_s;
@@ -103,8 +99,8 @@ TEST_F(MessageListWindow, EachFolderHasItsControls)
 {
     arrive("a.xml", quoteRequest("QR1"));
     files::write(gsReadPath + u"b.xml"_s, quoteMatch("123").text());
-    visit(joined({readAll, click("Option1(1)"), readAll, click("Option1(2)"), readAll, click("cmdView"),
-                  click("Command6"), click("Option1(0)"), readAll}));
+    visit({readAll, click("Option1(1)"), readAll, click("Option1(2)"), readAll, click("cmdView"), click("Command6"),
+           click("Option1(0)"), readAll});
 
     for (const int unread : {0, 3}) {
         EXPECT_EQ(listed(unread), "a.xml");
@@ -124,9 +120,9 @@ TEST_F(MessageListWindow, TheFilterNarrowsTheReadMessages)
 {
     for (int i = 0; i < 26; ++i)
         files::write(gsReadPath + u"%1.0_1.xml"_s.arg(100 + i), quoteMatch("123").text());
-    visit(joined({click("Option1(1)"), readAll, type("txtFilter", "10"), click("Command1"), readAll,
-                  type("txtFilter", "125"), key("txtFilter", "Return"), readAll, type("txtFilter", ""),
-                  click("Command1"), readAll, click("Option1(2)"), readAll}),
+    visit({click("Option1(1)"), readAll, type("txtFilter", "10"), click("Command1"), readAll, type("txtFilter", "125"),
+           key("txtFilter", "Return"), readAll, type("txtFilter", ""), click("Command1"), readAll, click("Option1(2)"),
+           readAll},
           R"("inputs": [{"text": "Quote Number", "answer": "124"}])");
 
     EXPECT_EQ(listed(0), "124.0_1.xml");
@@ -144,7 +140,7 @@ TEST_F(MessageListWindow, ATabletOnItsOwnDatabaseLoadsRequestsOnly)
     gbTabletLocal = true;
     arrive("a.xml", quoteRequest("QR1"));
     arrive("b.xml", cancellation("QR2"));
-    visit(joined({readAll, key("ListView1", "Down"), readAll, R"({"select": "ListView1", "item": 0})", readAll}));
+    visit({readAll, key("ListView1", "Down"), readAll, R"({"select": "ListView1", "item": 0})", readAll});
     EXPECT_TRUE(seen(0, "cmdProcess", "enabled").toBool());
     EXPECT_FALSE(seen(1, "cmdProcess", "enabled").toBool());
     EXPECT_TRUE(seen(2, "cmdProcess", "enabled").toBool());
@@ -159,12 +155,11 @@ TEST_F(MessageListWindow, AMessageIsRemovedOnlyAfterYes)
 {
     arrive("a.xml", quoteRequest("QR1"));
     arrive("b.xml", quoteRequest("QR2"));
-    const std::string steps = joined({key("ListView1", "Delete"), readAll});
-    visit(steps);
+    visit({key("ListView1", "Delete"), readAll});
     EXPECT_EQ(listed(), "a.xml b.xml");
     EXPECT_EQ(desktop->boxes(), QStringList{u"critical||You are about to remove a.xml without loading into the "
                                             "system. Are you SURE ?|no"_s});
-    visit(steps, R"("boxes": [{"text": "remove a.xml", "answer": "yes"}])");
+    visit({key("ListView1", "Delete"), readAll}, R"("boxes": [{"text": "remove a.xml", "answer": "yes"}])");
     EXPECT_EQ(listed(), "b.xml");
     EXPECT_EQ(filesIn(gsUnreadPath), QStringList{u"b.xml"_s});
 }
@@ -174,8 +169,8 @@ TEST_F(MessageListWindow, ADoubleClickShowsASentMessageAndNoOther)
     arrive("a.xml", quoteRequest("QR1"));
     files::write(gsSentPath + u"s.xml"_s, sentDocument("500"));
     const char* doubleClick = R"({"doubleClick": "ListView1"})";
-    visit(joined({doubleClick, click("Option1(2)")}));  // a viewer that opens now ends the run
-    visit(joined({click("Option1(2)"), doubleClick}), "", R"(, "frmViewXML": [[{"read": ["txtXML"]}]])");
+    visit({doubleClick, click("Option1(2)")});  // a viewer that opens now ends the run
+    visit({click("Option1(2)"), doubleClick}, "", R"(, "frmViewXML": [[{"read": ["txtXML"]}]])");
     EXPECT_TRUE(text(0, "txtXML").starts_with("<request>"));
 }
 
@@ -183,13 +178,16 @@ TEST_F(MessageListWindow, TheLineUnderTheListNamesTheFileThatEndedTheFill)
 {
     arrive("a.xml", quoteRequest("QR1"));
     arrive("R_500_0.xml", submissionResponse("KQ1"));
-    visit(readAll);
+    visit({readAll});
     EXPECT_EQ(listed(), "");
     EXPECT_NE(text(0, "lblStatus").find("R_500_0.xml"), std::string::npos) << text(0, "lblStatus");
     quote("500");
-    visit(readAll);
+    visit({readAll});
     EXPECT_EQ(listed(), "a.xml");
     EXPECT_EQ(quote("500").text("KESTQuoteNo"), "KQ1");
+    gsUnreadPath = u"c:\\gone\\"_s;
+    visit({readAll});
+    EXPECT_NE(text(0, "lblStatus").find("c:\\gone\\"), std::string::npos);
     EXPECT_EQ(desktop->boxes(), QStringList());
 }
 
@@ -199,7 +197,7 @@ TEST_F(MessageListWindow, TheFirstRowShownIsChosenWhateverTheOrder)
     arrive("a.xml", cancellation("QR2"));
     arrive("b10.xml", quoteRequest("QR1"));
     arrive("b9.xml", quoteRequest("QR3"));
-    visit(joined({key("frmMessageList", "F5"), readAll}));
+    visit({key("frmMessageList", "F5"), readAll});
     EXPECT_EQ(listed(), "a.xml b10.xml b9.xml");
 
     frmMessageList window;
@@ -211,32 +209,16 @@ TEST_F(MessageListWindow, TheFirstRowShownIsChosenWhateverTheOrder)
     EXPECT_TRUE(window.findChild<QPushButton*>(u"cmdProcess"_s)->isEnabled()) << "as if it had been clicked";
 }
 
-TEST_F(MessageListWindow, TheWindowWorksWithoutBeingShown)
+TEST_F(MessageListWindow, AFileThatHasGoneOrLiesElsewhereIsNotLoaded)
 {
     frmMessageList window;
-    arrive("MDMSG1.xml", marker("500"));
-    arrive("b.xml", quoteRequest("QR1").images({"1"}));
     window.open();
-    ASSERT_EQ(window.rows().size(), 1);
-    EXPECT_FALSE(window.loadFile(u"MDMSG1.xml"_s));
-    EXPECT_EQ(desktop->boxTexts(), QStringList{u"Quote 500 was sent twice."_s});
-    EXPECT_EQ(window.rows().size(), 0) << "the delayed refresh finds the marker gone";
-    EXPECT_EQ(filesIn(gsReadPath), QStringList{u"MDMSG000.xml"_s});
-    window.chooseFolder(Read);
-    EXPECT_EQ(window.rows().size(), 1);
-    window.updateFilter(u"none of them"_s);
-    EXPECT_EQ(window.rows().size(), 0);
-    EXPECT_EQ(window.failure(), QString());
-}
-
-TEST_F(MessageListWindow, AFileThatHasGoneIsLogged)
-{
-    frmMessageList window;
-    arrive("a.xml", quoteRequest("QR1"));
-    window.open();
-    files::remove(gsUnreadPath + u"a.xml"_s);
-    EXPECT_FALSE(window.loadFile(u"a.xml"_s));
+    EXPECT_FALSE(window.loadFile(u"gone.xml"_s));
     EXPECT_TRUE(files::read(ErrorLogPath()).contains(u"frmMessageList.cmdProcess_Click"_s));
+    files::write(gsReadPath + u"notice.xml"_s, marker("500"));
+    EXPECT_FALSE(window.loadFile(u"../ARead/notice.xml"_s));
+    EXPECT_TRUE(files::waitForBackground(5000));
+    EXPECT_EQ(filesIn(gsReadPath), QStringList{u"notice.xml"_s});
 }
 
 }  // namespace
