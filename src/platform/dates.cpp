@@ -13,7 +13,7 @@ std::optional<QTime> readIsoTime(TextReader& reader)
     const auto hour = reader.number(2, 2);
     if (!hour || !reader.take(u':'))
         return {};
-    const auto minute = reader.number(2, 2);
+    const auto minute = reader.number(1, 2);
     if (!minute)
         return {};
     int second = 0;

@@ -12,7 +12,7 @@ namespace kest {
 // The readers below take these forms, blanks around them allowed, and no others:
 //   number   sign, digits, commas between groups of three, one point, an exponent: "1,234.50", "-.5", "1e3"
 //   Boolean  "true" or "false" in any case, or a number
-//   date     yyyy-MM-dd, the same with "T" or a blank and HH:mm[:ss[.f]] and a zone mark, d/M/yyyy, the same with a
+//   date     yyyy-MM-dd, the same with "T" or a blank and HH:m[:ss[.f]] and a zone mark, d/M/yyyy, the same with a
 //            time of a 12- or 24-hour clock
 // A zone mark is passed over: date and time stand as they are written.
 // A Null throws NullValue, any other text TypeMismatch, a number too large for the result Overflow.
