@@ -47,8 +47,7 @@ TEST_F(Dispatcher, TheTypeDecidesInAnyCase)
 TEST_F(Dispatcher, AFailureStandsInTheLog)
 {
     EXPECT_FALSE(load(Message("", "getQRCancellationResponse")));
-    EXPECT_TRUE(QString::fromStdString(shown()).startsWith(
-        u"[critical] LoadXML: Line No: 0\r\nSource: modLoadXML.LoadXML\r\nError Number: 91\r\n"_s));
+    EXPECT_NE(shown().find("Error Number: 91\r\n"), std::string::npos);
     EXPECT_TRUE(files::read(ErrorLogPath()).contains(u"Source: modLoadXML.LoadXML"_s));
 }
 
