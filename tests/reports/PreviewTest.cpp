@@ -8,9 +8,16 @@
 #include "reports/Previews.h"
 #include "reports/frmPrintPreview.h"
 #include "shell/SharedVariables.h"
+#include "support/Hands.h"
 
 #include <QJsonDocument>
+#include <QKeyEvent>
+#include <QLabel>
+#include <QPrintDialog>
+#include <QPrinter>
+#include <QPushButton>
 #include <QRegularExpression>
+#include <QToolButton>
 
 namespace kest::test {
 
@@ -196,14 +203,51 @@ TEST_F(Preview, ARowOfSeveralLinesIsNeverDividedAndALongTextIsWhole)
 
 TEST_F(Preview, TheViewerFillsTheWindowAboveItsButton)
 {
-    desktop.emplace(R"({"windows": {"frmPrintPreview": [[
-        {"resize": [12000, 9000]}, {"read": ["lblPage", "cmdExit"]},
-        {"key": "crvPages", "keys": "End"}, {"read": ["lblPage"]},
-        {"click": "cmdZoomIn"}, {"click": "cmdFitPage"}, {"click": "cmdExit"}]]}})");
     db::Recordset rows = table({{u"comment"_s, QString(u"word\n"_s).repeated(300)}});
+    const Hands hands({{u"frmPrintPreview"_s, [](QDialog& window) {
+                            const auto& viewer = control<QWidget>(window, "crvPreview");
+                            const auto& exit = control<QPushButton>(window, "cmdExit");
+                            for (const QSize size : {QSize(700, 500), QSize(900, 800)}) {
+                                window.resize(size);
+                                QCoreApplication::processEvents();
+                                EXPECT_EQ(
+                                    viewer.geometry(),
+                                    QRect(0, 0, size.width(), size.height() - exit.height() - desktop::pixels(160)));
+                                EXPECT_EQ(exit.y() - viewer.height(), desktop::pixels(80));
+                                EXPECT_EQ(size.width() - exit.geometry().right() - 1, desktop::pixels(80));
+                            }
+                            const auto& page = control<QLabel>(window, "lblPage");
+                            EXPECT_EQ(page.text(), u"Page 1 of 5"_s);
+                            QKeyEvent end(QEvent::KeyPress, Qt::Key_End, Qt::NoModifier);
+                            QCoreApplication::sendEvent(&control<QWidget>(window, "crvPages"), &end);
+                            EXPECT_EQ(page.text(), u"Page 5 of 5"_s);
+                            control<QToolButton>(window, "cmdPrevious").click();
+                            EXPECT_EQ(page.text(), u"Page 4 of 5"_s);
+                        }}});
     frmPrintPreview::ShowForm(730, u""_s, &rows);
-    EXPECT_TRUE(desktop->read(u"lblPage"_s).toString().contains(QRegularExpression(u"Page (\\d+) of \\1$"_s)))
-        << desktop->read(u"lblPage"_s).toString().toStdString();
+}
+
+TEST_F(Preview, ThePrintButtonAsksForAPrinterAndPrintsWhatWasChosen)
+{
+    const QString output = root() + u"/printed.pdf"_s;
+    db::Recordset rows = table({{u"comment"_s, QString(u"word\n"_s).repeated(300)}});
+    for (const bool onlySecond : {false, true}) {
+        const auto choose = [&](QDialog& window) {
+            QPrinter& printer = *static_cast<QPrintDialog&>(window).printer();
+            printer.setOutputFileName(output);
+            printer.setPrintRange(onlySecond ? QPrinter::PageRange : QPrinter::AllPages);
+            printer.setFromTo(onlySecond ? 2 : 0, onlySecond ? 2 : 0);
+            window.hide();
+            window.setResult(QDialog::Accepted);
+        };
+        const auto print = [](QDialog& window) { control<QToolButton>(window, "cmdPrint").click(); };
+        const Hands hands({{u"frmPrintPreview"_s, print}, {u"PrintDialog"_s, choose}});
+        frmPrintPreview::ShowForm(730, u""_s, &rows);
+        const QString text = pdfText(output);
+        EXPECT_EQ(text.contains(u"Page 1 of 5"_s), !onlySecond);
+        EXPECT_TRUE(text.contains(u"Page 2 of 5"_s));
+        EXPECT_EQ(text.count(u'\f'), onlySecond ? 1 : 5);
+    }
 }
 
 }  // namespace kest::test
