@@ -1,6 +1,7 @@
 // Which report a message gives, with which values, and what is said where it gives none.
 #include "messages/frmMessageList.h"
 #include "platform/files/files.h"
+#include "platform/report/OutputFolder.h"
 #include "reports/Previews.h"
 #include "reports/PrintXML.h"
 #include "shell/SharedVariables.h"
@@ -33,7 +34,13 @@ TEST_F(Printing, ARequestShowsOneRowForEachImage)
     files::write(gsUnreadPath + u"QR1_002.txt"_s, u""_s);
     Message request = quoteRequest("QR1").images({"1", "002", "3"});
     request.rego(" tba ").set("offsiteQuoting", "TRUE").set("vehicleLocation", std::string(80, 'x'));
+    report::setOutputFolder(root() + u"/out"_s);
     print(request);
+    report::setOutputFolder({});
+    const QString page = pdfText(root() + u"/out/1-710.pdf"_s);
+    for (const QString& text : {u"Quote request QR1"_s, u"Mr Alex Tarrant"_s, u"Reversed into a bollard"_s,
+                                u"Rear bumper"_s, u"Quote from photographs"_s, u"Bumper & grille, L/H"_s})
+        EXPECT_TRUE(page.contains(text)) << text.toStdString();
     const QList<QJsonObject> shownWindows = windows();
     ASSERT_EQ(shownWindows.size(), 1);
     const QJsonObject& window = shownWindows[0];

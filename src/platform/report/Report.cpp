@@ -113,6 +113,13 @@ mustache::data valueOf(const QString& tag, const Row& row)
     return (format == u"money"_s ? asMoney(text) : format == u"date"_s ? asDate(text) : text).toStdString();
 }
 
+/// What stands before a format or a condition.
+QString fieldOf(const QString& tag)
+{
+    const auto end = std::find_if(tag.begin(), tag.end(), [](QChar c) { return c == u':' || c == u'=' || c == u'!'; });
+    return QString(tag.begin(), end - tag.begin());
+}
+
 bool isOfRows(const QString& tag)
 {
     return tag == u"rows"_s || tag.startsWith(u"rows:"_s) || tag.startsWith(u"any:"_s);
@@ -203,7 +210,7 @@ QString Report::filled(const QString& part, int page, int pages) const
     const auto rowData = [&](const Row& row) {
         mustache::data data(mustache::data::type::object);
         for (const QString& tag : tags)
-            if (row.has(tag.section(QRegularExpression(u"[:=!]"_s), 0, 0)))
+            if (row.has(fieldOf(tag)))
                 data.set(tag.toStdString(), valueOf(tag, row));
         return data;
     };

@@ -1,7 +1,6 @@
 // A report: a template that a shop can change, its parameters, and the table that it shows.
 #pragma once
 
-#include <QHash>
 #include <QList>
 #include <QString>
 #include <QStringList>
