@@ -22,10 +22,12 @@ using namespace Qt::StringLiterals;
 namespace kest {
 namespace {
 
+QString connectionName;  // of the shop that stands
+
 /// All values of the first column.
 QList<qint64> run(const QString& statement)
 {
-    QSqlQuery query(QSqlDatabase::database(QSqlDatabase::connectionNames().constFirst(), false));
+    QSqlQuery query(QSqlDatabase::database(connectionName, false));
     query.setForwardOnly(true);
     if (!query.exec(statement))
         qFatal("%s: %s", qPrintable(statement), qPrintable(query.lastError().text()));
@@ -54,7 +56,11 @@ public:
             *variable = path;
         }
         gsListFolder = gsUnreadPath;
+        const QStringList before = QSqlDatabase::connectionNames();
         gConn = app::openEmbedded(u"WirSql"_s);
+        for (const QString& name : QSqlDatabase::connectionNames())
+            if (!before.contains(name))
+                connectionName = name;
         app::createTables(*gConn, app::Dialect::Embedded);
         app::fillNewShop(*gConn);
         run(u"INSERT INTO CAR (REGO, CUST_ID, KEST) VALUES ('ABC123', 1, 1)"_s);

@@ -77,6 +77,7 @@ TEST_P(Hostile, AMessageChangesItsOwnQuoteOrNothing)
     quote("500").request("QR1").quoteNumber("KQ1").stage(3).note("Responded Quote Request").line(1);
     const QString ownType = typeOf(GetParam().text());
     const Snapshot before;
+    const bool isMerged = ownType.startsWith(u"AUQT"_s) || ownType.startsWith(u"MANQ"_s);
     int takenCount = 0;
     int refusedCount = 0;
     for (const QString& message : variantsOf(GetParam().text())) {
@@ -87,7 +88,9 @@ TEST_P(Hostile, AMessageChangesItsOwnQuoteOrNothing)
         const std::string now = holdings();
         const std::string told = message.left(3000).toStdString();
         if (!taken) {
-            EXPECT_EQ(difference(withoutCarMark(held), withoutCarMark(now)), "\n") << told;
+            if (!isMerged) {  // what was merged before a failure stays
+                EXPECT_EQ(difference(withoutCarMark(held), withoutCarMark(now)), "\n") << told;
+            }
             EXPECT_TRUE(wasTold || typeOf(message) != ownType) << told;  // an unknown type is passed over in silence
         }
         EXPECT_EQ(linesAbout(QRegularExpression(u"BYSTANDER"_s), held),
@@ -108,7 +111,9 @@ INSTANTIATE_TEST_SUITE_P(Messages, Hostile,
                          ::testing::Values(quoteRequest("QR2").images({"1"}), quoteMatch("500"), excessWaiver("500"),
                                            quoteDeletion("KQ1"), revisionRequest("QR1"), cancellation("QR1"),
                                            cancellationBackout("QR1"), adjustedQuote("500"), assessmentResult("KQ1"),
-                                           assessmentBackout("QR1")));
+                                           assessmentBackout("QR1"),
+                                           authorisedQuote("500").labour(1, "C").sublet(2, "I"),
+                                           manualQuote("500").part(1, "I").paint(2, "I")));
 
 }  // namespace
 
