@@ -209,6 +209,8 @@ bool Authorise(QString& text)
         return RefusePlainly(u"Error processing Quote Items, Please contact MarlinDesk Support."_s);
     Fill(notes, {{"QTNNO"_L1, quote.value(u"QTNNO"_s)}, {"Subquote"_L1, quote.value(u"Subquote"_s)}});
     notes.update();
+    if (lines.recordCount() > 0)
+        lines.moveFirst();  // a last line that was not found leaves the lines at their end, where nothing counts
     CalcAuthorisedTotals(quote, lines);
     if (comparison)
         FinishAuthReport(*comparison, quote, lines);

@@ -105,10 +105,13 @@ void FillWhereEmpty(db::Recordset& row, const QString& column, const QVariant& v
         row.set(column, value);
 }
 
-void TakeItemNo(db::Recordset& row)
+/// Stores the line before a code is looked for: the look goes through the rows and passes over what fails on its way.
+void StoreWithItemNo(db::Recordset& row)
 {
+    row.update();
     if (row.text(u"itemno"_s).isEmpty())
         row.set(u"itemno"_s, NextItemNo(row));
+    row.update();
 }
 
 // The rate of a loaded line is 1, so that its amount of money stands in the hours.
@@ -148,9 +151,7 @@ void TakeLabour(const db::Recordset& quote, db::Recordset& row, const Line& line
                {"tosend"_L1, u"A"_s},
                {"PartNo"_L1, u""_s},
                {"blend"_L1, 0}});
-    row.update();
-    TakeItemNo(row);
-    row.update();
+    StoreWithItemNo(row);
 }
 
 void FillMark(db::Recordset& row, const QString& partType)
@@ -203,8 +204,7 @@ void TakePart(const db::Recordset& quote, db::Recordset& row, const Line& line)
     Fill(row, {{"unitcost"_L1, price}, {"rrhour"_L1, price + price * toDouble(percentageText) / 100}});
     FillSide(row, description);
     Fill(row, {{"VENDOR"_L1, 0}, {"blend"_L1, 0}, {"Tag"_L1, 1}, {"delitem"_L1, false}, {"tosend"_L1, u"A"_s}});
-    TakeItemNo(row);
-    row.update();
+    StoreWithItemNo(row);
 }
 
 /// Without the marker of blended paint at its end.
@@ -232,8 +232,7 @@ void TakePaint(const db::Recordset& quote, db::Recordset& row, const Line& line)
     Fill(row, {{"Tag"_L1, 1}, {"delitem"_L1, false}, {"tosend"_L1, u"A"_s}, {"rr_rate2"_L1, 1}});
     FillWhereEmpty(row, u"allow_tick"_s, tickOfNewLine);
     row.set(u"opg_rate"_s, 1);
-    TakeItemNo(row);
-    row.update();
+    StoreWithItemNo(row);
 }
 
 /// What the lines of the section have told so far: an element that a line lacks keeps what the line before it told.
@@ -305,8 +304,7 @@ void TakeSublet(const db::Recordset& quote, db::Recordset& row, const Line& line
                    {"directbill"_L1, u"R"_s},
                    {"VENDOR"_L1, FindOrAddVendor(told.repairer.left(repairerLength), told.address, told.phone)}});
     }
-    TakeItemNo(row);
-    row.update();
+    StoreWithItemNo(row);
 }
 
 constexpr QLatin1StringView sections[] = {"labours"_L1, "parts"_L1, "paints"_L1, "sublets"_L1};

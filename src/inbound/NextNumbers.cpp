@@ -89,11 +89,13 @@ qint64 NextLineNumber(qint64 number, const QString& qtnno, const QString& subquo
 QString NextItemNo(db::Recordset& rsLines)
 {
     QString chosen = u"999"_s;
+    const int position = rsLines.absolutePosition();
     attempt([&] {
-        const int position = rsLines.absolutePosition();
         const QString code = FreeCode(rsLines, CodesOf(rsLines.text(u"category"_s).trimmed()));
         if (!code.isEmpty())
             chosen = code;
+    });
+    attempt([&] {  // also after a failure: the code belongs to the line that asked
         rsLines.moveFirst();
         rsLines.setAbsolutePosition(position);
     });
@@ -121,11 +123,11 @@ QString NextDocumentName(const QString& qtnno, const QString& subquote, qint64 n
         const bool isOfQuote =
             name.startsWith(qtnno, Qt::CaseInsensitive) && name.mid(qtnno.size() + 1, subquote.size()) == subquote;
         bool isNumber = false;
-        const int found = name.section(u'_', -1).section(u'.', 0, 0).toInt(&isNumber);
-        if (!isOfQuote || !isNumber)
+        const qint64 found = name.section(u'_', -1).section(u'.', 0, 0).toLongLong(&isNumber);
+        if (!isOfQuote || !isNumber || !name.contains(u'_'))
             continue;
         taken.insert(found);
-        highest = qMax<qint64>(highest, found);
+        highest = qMax(highest, found);
     }
     const qint64 free = taken.contains(number) ? highest + 1 : number;
     return files::pathForWriting(SubletFolder(), qtnno + u'.' + subquote + u'_' + QString::number(free) + u".pdf"_s);
