@@ -11,35 +11,20 @@ namespace kest::test {
 
 using namespace Qt::StringLiterals;
 
-namespace {
-
-QString golden(const QString& name)
-{
-    QFile file(QStringLiteral(KEST_SOURCE_DIR "/tests/outbound/golden/") + name);
-    EXPECT_TRUE(file.open(QIODevice::ReadOnly)) << name.toStdString();
-    return QString::fromUtf8(file.readAll());
-}
-
-}  // namespace
-
 class GoldenDocument : public Sending {
 protected:
     static void expectDocument(const QString& file, const QString& name)
     {
         const QStringList actual = readAsXml(withRoot(outgoing(file)));
-        const QStringList expected = readAsXml(golden(name));
+        QFile golden(QStringLiteral(KEST_SOURCE_DIR "/tests/outbound/golden/") + name);
+        EXPECT_TRUE(golden.open(QIODevice::ReadOnly)) << name.toStdString();
+        const QStringList expected = readAsXml(QString::fromUtf8(golden.readAll()));
         for (qsizetype i = 0; i < std::max(actual.size(), expected.size()); ++i)
             EXPECT_EQ(actual.value(i), expected.value(i)) << name.toStdString() << ", element " << i;
     }
 
     static void sendSupplementary();
     static void sendFortyLines();
-
-    static void addPhotographs(std::initializer_list<const char*> names)
-    {
-        for (const char* name : names)
-            files::write(gsImagesPath + QString::fromLatin1(name), u"a photograph"_s);
-    }
 };
 
 TEST_F(GoldenDocument, AMainQuoteFromARequest)
@@ -50,7 +35,8 @@ TEST_F(GoldenDocument, AMainQuoteFromARequest)
     row.set("kms", "84210").set("ExtraInfo", false);
     row.set("CAR_IN", QDate(2024, 2, 26)).set("targetdate", QDate(2024, 3, 4));
     row.remarks("Repairs < 1 week & \"guaranteed\",\r\ncaf\u00e9 next door", "P_REMARKS");
-    addPhotographs({"1201_0001.jpg", "1201_0012.jpg", "1201_1001.jpg", "120_0001.jpg"});
+    for (const QString& name : {u"1201_0001.jpg"_s, u"1201_0012.jpg"_s, u"1201_1001.jpg"_s, u"120_0001.jpg"_s})
+        files::write(gsImagesPath + name, u"a photograph"_s);
 
     addLine(row, "R&R", "Front bumper bar", {{"SEQ_NO", 1}, {"rrhour", 1.5}, {"rr_rate2", 33.33}});
     addLine(row, "R&R", "Headlamp \"left\"", {{"SEQ_NO", 2}, {"rrhour", 0.4}, {"rr_rate2", 38}});

@@ -48,8 +48,7 @@ TEST_F(Sending, EachRefusalHasItsMessageAndChangesNothing)
         {[](QuoteRow& q) { q.set("CAR_IN", QDate(2024, 3, 2)).set("targetdate", QDate(2024, 3, 1)); },
          "Cannot have a target completion date before the start date. Please check the quote details."},
         {[](QuoteRow& q) { q.line(1).set("rrhour", 0); },
-         "Error: Cannot send $0 variations to ORLA. Please call your assessor to discuss the variation."},
-    };
+         "Error: Cannot send $0 variations to ORLA. Please call your assessor to discuss the variation."}};
     for (const auto& [change, message] : cases) {
         QuoteRow row = sendable();
         change(row);
@@ -148,13 +147,11 @@ TEST_F(Sending, AQuoteIsLockedOnlyWhenItsDocumentStands)
         const char* what;
         std::function<void(QuoteRow&)> change;
         int number;
-    } cases[] = {
-        {"a line without hours", [](QuoteRow& q) { q.line(1).set("rrhour", nullptr); }, NullValue},
-        {"a part without quantity", [](QuoteRow& q) { q.line(2, "PRT").set("qty", nullptr); }, NullValue},
-        {"no notes row", [](QuoteRow&) { gConn->execute(u"DELETE FROM QUOTE3"_s); }, NoCurrentRow},
-        {"a line number past the highest", [](QuoteRow& q) { q.line(32768).set("rrhour", 1); }, Overflow},
-        {"a full disk", [](QuoteRow&) { files::setFault([] { return true; }); }, FileInputOutput},
-    };
+    } cases[] = {{"a line without hours", [](QuoteRow& q) { q.line(1).set("rrhour", nullptr); }, NullValue},
+                 {"a part without quantity", [](QuoteRow& q) { q.line(2, "PRT").set("qty", nullptr); }, NullValue},
+                 {"no notes row", [](QuoteRow&) { gConn->execute(u"DELETE FROM QUOTE3"_s); }, NoCurrentRow},
+                 {"a line number past the highest", [](QuoteRow& q) { q.line(32768).set("rrhour", 1); }, Overflow},
+                 {"a full disk", [](QuoteRow&) { files::setFault([] { return true; }); }, FileInputOutput}};
     for (const auto& [what, change, number] : cases) {
         QuoteRow row = sendable();
         change(row);
@@ -220,15 +217,12 @@ TEST_F(Sending, ImagesAreListedAndGoOutWithTheirDocuments)
     EXPECT_EQ(outgoing(u"I_500_0012.xml"_s),
               u"<request><kestQuoteNumber>500/0</kestQuoteNumber><quoteImageId>12</quoteImageId>"
               "<imageType>JPEG</imageType><imageDescription/></request>"_s);
-}
 
-TEST_F(Sending, AQuoteWithoutImagesSaysSo)
-{
-    sendable();
     QDir(files::systemPath(gsImagesPath)).removeRecursively();
-    send("500");
-    EXPECT_EQ(sent(u"imageCount"_s), "0");
-    EXPECT_EQ(sent(u"quoteImageIds"_s), "(none)");
+    sendable("600");
+    send("600");
+    EXPECT_EQ(sent(u"imageCount"_s, u"600.0_1.xml"_s), "0");
+    EXPECT_EQ(sent(u"quoteImageIds"_s, u"600.0_1.xml"_s), "(none)");
 }
 
 }  // namespace kest::test
