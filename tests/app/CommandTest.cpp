@@ -71,8 +71,7 @@ TEST_F(Command, ExitCodesTellUsageProfileAndConnection)
         {{u"setting"_s, u"get"_s, u"wirra32"_s}, app::Usage},
         {{u"list"_s, u"unread"_s, u"--profile"_s, profile.root() + u"/none"_s}, app::NoConnection},
         {{u"view"_s, u"unread"_s, u"../../../registry.ini"_s}, app::Refused},
-        {{u"load"_s, u"absent.xml"_s}, app::Refused},
-    };
+        {{u"load"_s, u"absent.xml"_s}, app::Refused}};
     for (const auto& [words, code] : cases)
         EXPECT_EQ(kest2(words).exitCode, code) << words.join(u' ').toStdString();
 

@@ -15,7 +15,6 @@
 #include "support/ScriptedDesktop.h"
 #include "support/TestProfile.h"
 
-#include <QImage>
 #include <QMap>
 
 #include <gtest/gtest.h>
@@ -93,36 +92,24 @@ QMap<QString, MessageRow> listed(int folder)
 
 TEST_P(DemoShop, HoldsTogether)
 {
-    const std::pair<const char*, QString> nothing[] = {
-        {"a quote without long texts",
-         u"SELECT QTNNO FROM QUOTE1 WHERE NOT EXISTS (SELECT 1 FROM QUOTE3 WHERE "
-         "QUOTE3.QTNNO=QUOTE1.QTNNO AND QUOTE3.Subquote=QUOTE1.Subquote)"_s},
-        {"a quote without lines",
-         u"SELECT QTNNO FROM QUOTE1 WHERE NOT EXISTS (SELECT 1 FROM QUOTE2 WHERE "
-         "QUOTE2.QTNNO=QUOTE1.QTNNO AND QUOTE2.Subquote=QUOTE1.Subquote)"_s},
-        {"a quote without insurer",
-         u"SELECT QTNNO FROM QUOTE1 WHERE INSURER_ID NOT IN (SELECT INSURER_ID FROM INSURER)"_s},
-        {"a quote without car", u"SELECT QTNNO FROM QUOTE1 WHERE REGO NOT IN (SELECT REGO FROM CAR)"_s},
-        {"a car without customer", u"SELECT REGO FROM CAR WHERE CUST_ID NOT IN (SELECT CUST_ID FROM CUSTOMER)"_s},
-        {"a car without model", u"SELECT REGO FROM CAR WHERE MODEL_ID NOT IN (SELECT MODEL_ID FROM ALLMODEL)"_s},
-        {"a car of unknown colour", u"SELECT REGO FROM CAR WHERE COLOUR NOT IN (SELECT Script FROM KESTColours)"_s},
-        {"a line without vendor",
-         u"SELECT script FROM QUOTE2 WHERE VENDOR>0 AND VENDOR NOT IN (SELECT VENDOR_ID FROM VENDOR)"_s},
-        {"an unknown stage", u"SELECT QTNNO FROM QUOTE1 WHERE Job_stage NOT IN (SELECT stage FROM JOBSTAGE)"_s},
-        {"a supplementary quote without main quote",
-         u"SELECT QTNNO FROM QUOTE1 WHERE Subquote>0 AND QTNNO NOT IN "
-         "(SELECT QTNNO FROM QUOTE1 WHERE Subquote=0)"_s},
-    };
-    for (const auto& [what, select] : nothing)
-        EXPECT_EQ(texts(select), QStringList()) << what;
+    const char* faults[] = {
+        "QUOTE1 WHERE NOT EXISTS (SELECT 1 FROM QUOTE3 t WHERE t.QTNNO=QUOTE1.QTNNO AND t.Subquote=QUOTE1.Subquote)",
+        "QUOTE1 WHERE NOT EXISTS (SELECT 1 FROM QUOTE2 t WHERE t.QTNNO=QUOTE1.QTNNO AND t.Subquote=QUOTE1.Subquote)",
+        "QUOTE1 WHERE INSURER_ID NOT IN (SELECT INSURER_ID FROM INSURER)",
+        "QUOTE1 WHERE REGO NOT IN (SELECT REGO FROM CAR)",
+        "QUOTE1 WHERE Job_stage NOT IN (SELECT stage FROM JOBSTAGE)",
+        "QUOTE1 WHERE Subquote>0 AND QTNNO NOT IN (SELECT QTNNO FROM QUOTE1 WHERE Subquote=0)",
+        "QUOTE1 WHERE QTNNO=(SELECT QUOTE_VAL FROM CINFO)",  // the next number that the shop gives is free
+        "QUOTE2 WHERE VENDOR>0 AND VENDOR NOT IN (SELECT VENDOR_ID FROM VENDOR)",
+        "CAR WHERE CUST_ID NOT IN (SELECT CUST_ID FROM CUSTOMER)",
+        "CAR WHERE MODEL_ID NOT IN (SELECT MODEL_ID FROM ALLMODEL)",
+        "CAR WHERE COLOUR NOT IN (SELECT Script FROM KESTColours)"};
+    for (const char* fault : faults)
+        EXPECT_EQ(texts(u"SELECT * FROM "_s + QLatin1StringView(fault)), QStringList()) << fault;
     EXPECT_EQ(texts(u"SELECT QTNNO FROM QUOTE1"_s).size(), 30);
-    EXPECT_EQ(texts(u"SELECT DISTINCT category FROM QUOTE2"_s).size(), 6);
     EXPECT_EQ(texts(u"SELECT remarks FROM QUOTE3 WHERE QTNNO='1003'"_s),
               QStringList(u"(15/03/2008 : Active Quote Request)"_s));
     EXPECT_EQ(texts(u"SELECT qtndate FROM QUOTE1 WHERE QTNNO='1003'"_s), QStringList(u"15/03/2008"_s));
-
-    // the next number that the shop gives is free
-    EXPECT_EQ(texts(u"SELECT QTNNO FROM QUOTE1 WHERE QTNNO=(SELECT QUOTE_VAL FROM CINFO)"_s), QStringList());
 }
 
 TEST_P(DemoShop, ItsTotalsAreThoseOfItsLines)
@@ -197,27 +184,13 @@ TEST_P(DemoShop, SendsWhatMayGo)
          u"Items with a Quantity of 0 cannot be sent to ORLA. Please check the quote details and try again."_s},
         {u"1006"_s, u"This quote has already been submitted to ORLA, you cannot send a quote twice."_s},
         {u"1011"_s, u"This quote request has been cancelled, Quote cannot be sent."_s},
-        {u"1028"_s, u"This quote has already been sent via TIDE, you cannot use KEST to send this quote."_s},
-    };
+        {u"1028"_s, u"This quote has already been sent via TIDE, you cannot use KEST to send this quote."_s}};
     for (const auto& [number, box] : quotes) {
         ASSERT_TRUE(OpenHostQuote(number, u"0"_s));
         SendQuote(*grsQuote);
         EXPECT_EQ(desktop.boxTexts().last(), box) << number.toStdString();
     }
     EXPECT_EQ(files::list(gsUnsentPath), QStringList({u"1001.0_1.xml"_s, u"1004.0_1.xml"_s}));
-}
-
-TEST_P(DemoShop, ItsPhotographsArePictures)
-{
-    QStringList pictures;
-    for (const QString& folder : {profile.driveC() + u"/wirdoc/AUnread/"_s, profile.driveC() + u"/wirimg/"_s})
-        for (const QString& name : files::list(folder, u"*.jpg"_s)) {
-            pictures << name;
-            EXPECT_FALSE(QImage(folder + name).isNull()) << name.toStdString();
-        }
-    EXPECT_EQ(pictures.filter(u"20551_"_s).size(), 3);
-    EXPECT_EQ(pictures.filter(u"20553_"_s).size(), 0) << "the request that waits for its picture";
-    EXPECT_EQ(app::drawn({u"same"_s, Qt::blue, 0.5}), app::drawn({u"same"_s, Qt::blue, 0.5}));
 }
 
 INSTANTIATE_TEST_SUITE_P(Engines, DemoShop, ::testing::Values(EngineOf::Profile, EngineOf::Server),

@@ -11,41 +11,12 @@
 using namespace Qt::StringLiterals;
 using namespace kest;
 
-namespace {
-
-/// Another time zone for one test.
-class Zone {
-public:
-    explicit Zone(const char* name) : before(qgetenv("TZ")), wasSet(qEnvironmentVariableIsSet("TZ"))
-    {
-        qputenv("TZ", name);
-        ::tzset();
-    }
-    ~Zone()
-    {
-        if (wasSet)
-            qputenv("TZ", before);
-        else
-            qunsetenv("TZ");
-        ::tzset();
-    }
-    Zone(const Zone&) = delete;
-    Zone& operator=(const Zone&) = delete;
-
-private:
-    QByteArray before;
-    bool wasSet;
-};
-
-}  // namespace
-
 TEST(Helpers, ReplacementsAreNotSearchedAgain)
 {
     const std::tuple<QString, QString, QString, QString> cases[] = {
         {u"aXbx"_s, u"-"_s, u"x"_s, u"a-b-"_s}, {u"&&"_s, u"&amp;"_s, u"&"_s, u"&amp;&amp;"_s},
         {u"aaa"_s, u"b"_s, u"AA"_s, u"ba"_s},   {u""_s, u"b"_s, u"a"_s, u""_s},
-        {u"abc"_s, u"-"_s, u""_s, u"abc"_s},    {u"abc"_s, u""_s, u"B"_s, u"ac"_s},
-    };
+        {u"abc"_s, u"-"_s, u""_s, u"abc"_s},    {u"abc"_s, u""_s, u"B"_s, u"ac"_s}};
     for (const auto& [text, replacement, search, expected] : cases)
         EXPECT_EQ(ReplaceText(text, replacement, search), expected);
 }
@@ -66,8 +37,7 @@ TEST(Helpers, ANumberIsReadFromTextThatMayHoldAnythingElse)
         {u"abc"_s, u"7"_s, 7},         {u""_s, u"7"_s, 7},
         {u"1.2.3"_s, u"7"_s, 7},       {u"."_s, u"7"_s, 7},
         {u"abc"_s, u"abc"_s, 0},       {u"-x5"_s, u"0"_s, 5},
-        {u"1e999"_s, u"7"_s, 1999},    {QString(500, u'9'), u"7"_s, 7},
-    };
+        {u"1e999"_s, u"7"_s, 1999},    {QString(500, u'9'), u"7"_s, 7}};
     for (const auto& [text, fallback, expected] : cases)
         EXPECT_EQ(SafeVal(text, fallback), expected) << text.toStdString();
 }
@@ -87,8 +57,7 @@ TEST(Helpers, AQuoteReferenceHoldsAnOptionalSubquote)
         {u"123/2"_s, u"123/2"_s, u"123"_s, u"2"_s}, {u"123/"_s, u"123"_s, u"123"_s, u""_s},
         {u"1/x"_s, u"1"_s, u"1"_s, u"x"_s},         {u"1/2/3"_s, u"1/2/3"_s, u"1"_s, u"2/3"_s},
         {u"/1"_s, u"/1"_s, u""_s, u"1"_s},          {u""_s, u""_s, u""_s, u"0"_s},
-        {u"1/-1"_s, u"1"_s, u"1"_s, u"-1"_s},
-    };
+        {u"1/-1"_s, u"1"_s, u"1"_s, u"-1"_s}};
     for (const auto& [reference, normal, number, subquote] : cases) {
         EXPECT_EQ(NormaliseQuoteRef(reference), normal) << reference.toStdString();
         EXPECT_EQ(SplitQuoteRef(reference), std::pair(number, subquote)) << reference.toStdString();
@@ -105,7 +74,9 @@ TEST(Helpers, LettersDigitsAndExtensions)
 
 TEST(Helpers, AMessagesDateIsShownInLocalTime)
 {
-    const Zone sydney("Australia/Sydney");
+    const QByteArray before = qgetenv("TZ");
+    qputenv("TZ", "Australia/Sydney");
+    ::tzset();
     const std::pair<QString, QString> cases[] = {
         {u""_s, u""_s},
         {u"2024-07-01T02:05:09.000Z"_s, u"1/7/2024 12:05 PM"_s},
@@ -120,4 +91,6 @@ TEST(Helpers, AMessagesDateIsShownInLocalTime)
     EXPECT_THROW(FormatNetworkDate(u"not a date"_s), RuntimeError);
     EXPECT_THROW(FormatNetworkDate(u"Z"_s), RuntimeError);
     EXPECT_EQ(UtcToLocal(QDateTime(QDate(2024, 7, 1), QTime(0, 0, 5, 900))).time(), QTime(10, 0, 5));
+    before.isNull() ? qunsetenv("TZ") : qputenv("TZ", before);
+    ::tzset();
 }

@@ -26,16 +26,11 @@ protected:
 
 TEST_F(ErrorLog, TheModeChoosesBoxAndFile)
 {
-    struct Case {
-        int mode;
-        qsizetype boxes;
-        bool file;
-    };
-    const Case cases[] = {{2, 0, false}, {BoxOnly, 1, false}, {BoxAndFile, 2, true}};
-    for (const Case& c : cases) {
-        report(c.mode);
-        EXPECT_EQ(desktop.boxes().size(), c.boxes) << c.mode;
-        EXPECT_EQ(files::exists(ErrorLogPath()), c.file) << c.mode;
+    const std::tuple<int, qsizetype, bool> cases[] = {{2, 0, false}, {BoxOnly, 1, false}, {BoxAndFile, 2, true}};
+    for (const auto& [mode, boxes, file] : cases) {
+        report(mode);
+        EXPECT_EQ(desktop.boxes().size(), boxes) << mode;
+        EXPECT_EQ(files::exists(ErrorLogPath()), file) << mode;
     }
     EXPECT_EQ(desktop.boxes().last(),
               u"critical|LoadY|Line No: 7\r\nSource: modX.LoadY\r\nError Number: 94\r\nDescription: Null here|ok"_s);

@@ -40,16 +40,12 @@ TEST_F(Settings, AMachineWideValueComesBeforeTheUsersAndTheDefault)
 
 TEST_F(Settings, TheFirstReadFixesADefaultForAllLaterOnes)
 {
-    EXPECT_EQ(setting(u"ImagesPath"_s, u"c:\\wirimg\\"_s), u"c:\\wirimg\\"_s);
-    EXPECT_EQ(stored(u"ImagesPath"_s), u"c:\\wirimg\\"_s);
-    EXPECT_EQ(setting(u"ImagesPath"_s, u"elsewhere"_s), u"c:\\wirimg\\"_s);
-}
-
-TEST_F(Settings, NothingIsCopiedUpWhenToldNotToOrWhenThereIsNothing)
-{
     EXPECT_EQ(setting(u"ServerName"_s, u"(local)"_s, CopyUp::No), u"(local)"_s);
     EXPECT_EQ(setting(u"Empty"_s, u""_s), u""_s);
     EXPECT_FALSE(settings::keyExists(Hive::LocalMachine, splash));
+    EXPECT_EQ(setting(u"ImagesPath"_s, u"c:\\wirimg\\"_s), u"c:\\wirimg\\"_s);
+    EXPECT_EQ(stored(u"ImagesPath"_s), u"c:\\wirimg\\"_s);
+    EXPECT_EQ(setting(u"ImagesPath"_s, u"elsewhere"_s), u"c:\\wirimg\\"_s);
 }
 
 TEST_F(Settings, AValueIsReadByItsType)
