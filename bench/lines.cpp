@@ -6,6 +6,7 @@
 #include "platform/files/files.h"
 #include "platform/profile.h"
 #include "shell/SharedVariables.h"
+#include "shell/modDBAccess.h"
 
 #include <QCoreApplication>
 #include <QElapsedTimer>
@@ -22,12 +23,10 @@ using namespace Qt::StringLiterals;
 namespace kest {
 namespace {
 
-QString connectionName;  // of the shop that stands
-
 /// All values of the first column.
 QList<qint64> run(const QString& statement)
 {
-    QSqlQuery query(QSqlDatabase::database(connectionName, false));
+    QSqlQuery query(QSqlDatabase::database(QSqlDatabase::connectionNames().constFirst(), false));
     query.setForwardOnly(true);
     if (!query.exec(statement))
         qFatal("%s: %s", qPrintable(statement), qPrintable(query.lastError().text()));
@@ -56,11 +55,7 @@ public:
             *variable = path;
         }
         gsListFolder = gsUnreadPath;
-        const QStringList before = QSqlDatabase::connectionNames();
-        gConn = app::openEmbedded(u"WirSql"_s);
-        for (const QString& name : QSqlDatabase::connectionNames())
-            if (!before.contains(name))
-                connectionName = name;
+        gcnDB = gConn = app::openEmbedded(u"WirSql"_s);
         app::createTables(*gConn, app::Dialect::Embedded);
         app::fillNewShop(*gConn);
         run(u"INSERT INTO CAR (REGO, CUST_ID, KEST) VALUES ('ABC123', 1, 1)"_s);
@@ -83,6 +78,7 @@ public:
     ~BenchShop()
     {
         gConn.reset();
+        gcnDB.reset();
         profile::setRoot({});
     }
 
