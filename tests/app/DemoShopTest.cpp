@@ -178,11 +178,9 @@ TEST_P(DemoShop, SendsWhatMayGo)
 {
     const std::pair<QString, QString> quotes[] = {
         {u"1001"_s, u"Quote Sent."_s},
-        {u"1002"_s, u"Invalid Insurer, Please check the Insurer is valid & is marked as a KEST Insurer"_s},
         {u"1004"_s, u"Quote Sent."_s},
         {u"1005"_s,
          u"Items with a Quantity of 0 cannot be sent to ORLA. Please check the quote details and try again."_s},
-        {u"1006"_s, u"This quote has already been submitted to ORLA, you cannot send a quote twice."_s},
         {u"1011"_s, u"This quote request has been cancelled, Quote cannot be sent."_s},
         {u"1028"_s, u"This quote has already been sent via TIDE, you cannot use KEST to send this quote."_s}};
     for (const auto& [number, box] : quotes) {

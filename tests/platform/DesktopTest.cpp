@@ -158,31 +158,6 @@ TEST_F(Person, KeepsTheWindowAfterAFailureThatNobodyTrapped)
     EXPECT_EQ(reported, QStringList{u"frmSample.cmdOK_Click: no row"_s});
 }
 
-TEST_F(Person, LeavesEveryWindowWhenTheRunMustEnd)
-{
-    desktop::Form outer(u"frmOuter"_s, {});
-    desktop::Form inner(u"frmInner"_s, {});
-    QTimer inOuter;
-    QTimer inInner;
-    int later = 0;
-    for (QTimer* timer : {&inOuter, &inInner})
-        timer->setSingleShot(true);
-    desktop::onEvent(&inOuter, &QTimer::timeout, &outer, u"outer"_s, [&] {
-        desktop::showModal(inner);
-        ++later;
-    });
-    desktop::onEvent(&inInner, &QTimer::timeout, &inner, u"inner"_s, [&] {
-        desktop::guarded(u"nested"_s, [] { throw desktop::NeedsAnswer(u"why"_s); });
-        desktop::guarded(u"behind it"_s, [&] { ++later; });
-    });
-    inOuter.start(0);
-    inInner.start(20);
-    EXPECT_THROW(desktop::showModal(outer), desktop::NeedsAnswer);
-    EXPECT_FALSE(outer.isVisible() || inner.isVisible());
-    EXPECT_EQ(later, 0);
-    EXPECT_NO_THROW(desktop::throwKept());
-}
-
 TEST_F(Person, FindsEveryWindowAsItWasLeftAndInTheMiddle)
 {
     const auto makeWindow = [] {
@@ -195,34 +170,32 @@ TEST_F(Person, FindsEveryWindowAsItWasLeftAndInTheMiddle)
         window->resize(400, 300);
         return window;
     };
-    const auto show = [](desktop::Form& window, const std::function<void()>& act) {
+    const auto show = [](desktop::Form& window, const std::function<void(QHeaderView&)>& act) {
         whenShown<desktop::Form>([&act](desktop::Form& shown) {
             const QPoint off = shown.frameGeometry().center() - shown.screen()->availableGeometry().center();
             EXPECT_LE(off.manhattanLength(), 4);
-            act();
+            act(*shown.findChild<QTreeWidget*>()->header());
             shown.close();
         });
         desktop::showModal(window);
     };
 
     const auto left = makeWindow();
-    QHeaderView* header = left->findChild<QTreeWidget*>()->header();
-    show(*left, [&] {
+    show(*left, [&](QHeaderView& header) {
         left->resize(500, 5000);
         left->move(0, 0);
-        header->resizeSection(0, 222);
-        header->setSortIndicator(1, Qt::DescendingOrder);
+        header.resizeSection(0, 222);
+        header.setSortIndicator(1, Qt::DescendingOrder);
     });
 
     const auto found = makeWindow();
-    header = found->findChild<QTreeWidget*>()->header();
-    show(*found, [&] {
+    show(*found, [&](QHeaderView& header) {
         EXPECT_EQ(found->width(), 500);
         EXPECT_EQ(found->height(), found->screen()->availableSize().height()) << "never larger than the screen";
-        EXPECT_EQ(header->sectionSize(0), 222);
-        EXPECT_EQ(header->sectionSize(1), header->defaultSectionSize());
-        EXPECT_EQ(header->sortIndicatorSection(), 1);
-        EXPECT_EQ(header->sortIndicatorOrder(), Qt::DescendingOrder);
+        EXPECT_EQ(header.sectionSize(0), 222);
+        EXPECT_EQ(header.sectionSize(1), header.defaultSectionSize());
+        EXPECT_EQ(header.sortIndicatorSection(), 1);
+        EXPECT_EQ(header.sortIndicatorOrder(), Qt::DescendingOrder);
     });
 }
 

@@ -140,11 +140,7 @@ struct Steps : testing::Test {
 
 TEST_F(Steps, ReachTheControlsAsAPersonWould)
 {
-    struct Case {
-        QString steps;
-        QStringList notes;
-    };
-    const Case cases[] = {
+    const std::pair<QString, QStringList> cases[] = {
         {uR"j({"click": "Option1(1)"})j"_s, {u"option 1"_s}},
         {uR"j({"click": "chkReadOnly"}, {"click": "chkReadOnly"})j"_s, {u"on"_s, u"off"_s}},
         {uR"j({"set": "txtLine", "text": "aB"})j"_s, {u"~"_s, u"~a"_s, u"~aB"_s}},
@@ -218,20 +214,16 @@ TEST_F(Steps, ThatAPersonCouldNotTakeEndTheRunAndSayWhich)
     QLabel cover(u"cover"_s, &window);
     cover.setObjectName(u"lblCover"_s);
     cover.setGeometry(0, 0, 4000, 40);
-    struct Case {
-        QString step;
-        QString why;
-    };
-    const Case cases[] = {{uR"j({"click": "cmdOff"})j"_s, u"disabled"_s},
-                          {uR"j({"click": "cmdGone"})j"_s, u"hidden"_s},
-                          {uR"j({"click": "cmdMissing"})j"_s, u"no such control"_s},
-                          {uR"j({"click": "Option1(0)"})j"_s, u"covered by lblCover"_s},
-                          {uR"j({"set": "cmbGear", "text": "Reverse"})j"_s, u"no such row"_s},
-                          {uR"j({"select": "ListView1", "item": "z.xml"})j"_s, u"no such row"_s},
-                          {uR"j({"doubleClick": "ListView1"})j"_s, u"no row is chosen"_s},
-                          {uR"j({"tab": "TabStrip1", "key": "S7"})j"_s, u"no such tab"_s},
-                          {uR"j({"read": ["cmdMissing"]})j"_s, u"cmdMissing"_s},
-                          {uR"j({"shot": "/no/such/folder/x.png"})j"_s, u"can't be written"_s}};
+    const std::pair<QString, QString> cases[] = {{uR"j({"click": "cmdOff"})j"_s, u"disabled"_s},
+                                                 {uR"j({"click": "cmdGone"})j"_s, u"hidden"_s},
+                                                 {uR"j({"click": "cmdMissing"})j"_s, u"no such control"_s},
+                                                 {uR"j({"click": "Option1(0)"})j"_s, u"covered by lblCover"_s},
+                                                 {uR"j({"set": "cmbGear", "text": "Reverse"})j"_s, u"no such row"_s},
+                                                 {uR"j({"select": "ListView1", "item": "z.xml"})j"_s, u"no such row"_s},
+                                                 {uR"j({"doubleClick": "ListView1"})j"_s, u"no row is chosen"_s},
+                                                 {uR"j({"tab": "TabStrip1", "key": "S7"})j"_s, u"no such tab"_s},
+                                                 {uR"j({"read": ["cmdMissing"]})j"_s, u"cmdMissing"_s},
+                                                 {uR"j({"shot": "/no/such/folder/x.png"})j"_s, u"can't be written"_s}};
     for (const auto& [step, why] : cases) {
         const QString reason = refusal(u"{\"wait\": 0}, "_s + step);
         EXPECT_TRUE(reason.contains(why) && reason.startsWith(u"frmSample, step 2 "_s)) << reason.toStdString();
@@ -251,21 +243,6 @@ TEST_F(Steps, OfEachShowingAreAVisitOfTheirOwnAndTheLastServesAllFurtherOnes)
     for (int showing = 0; showing < 3; ++showing)
         desktop::showModal(window);
     EXPECT_EQ(window.notes.join(u' '), u"on close box ok close box ok close box"_s);
-}
-
-TEST_F(Steps, EndWithTheWindowThatTheyOpen)
-{
-    SampleWindow inner;
-    inner.setObjectName(u"frmInner"_s);
-    window.whenOk = [&] {
-        desktop::showModal(inner);
-        window.notes.append(inner.notes);
-    };
-    const ScriptedDesktop desk(R"j({"windows": {
-        "frmSample": [ [ {"click": "cmdOK"}, {"click": "Option1(1)"}, {"key": "frmSample", "keys": "Escape"} ] ],
-        "frmInner":  [ [ {"click": "chkReadOnly"}, {"click": "cmdExit"} ] ]}})j");
-    desktop::showModal(window);
-    EXPECT_EQ(window.notes.join(u' '), u"ok on close box option 1 close box"_s);
 }
 
 TEST_F(Steps, OfAnInnerWindowThatFailEndTheOuterRunToo)
@@ -289,15 +266,6 @@ TEST_F(Steps, OfAnInnerWindowThatFailEndTheOuterRunToo)
     EXPECT_FALSE(wentOn) << "errors are passed over, but not this";
     EXPECT_FALSE(window.isVisible() || inner.isVisible());
     EXPECT_EQ(window.notes, QStringList{u"ok"_s});
-}
-
-TEST_F(Steps, AreNeededForEveryWindowButThoseThatRecordThemselves)
-{
-    const ScriptedDesktop desk;
-    EXPECT_THROW(desktop::showModal(window), NeedsAnswer);
-    window.setObjectName(u"frmPrintPreview"_s);
-    desktop::showModal(window);
-    EXPECT_EQ(window.notes, QStringList{u"close box"_s});
 }
 
 TEST(ScriptForm, IsCheckedBeforeAnythingRuns)
