@@ -1,7 +1,6 @@
 // Connections and statements: which engine answers, what a comparison means on each, what fails and how.
 #include "platform/Databases.h"
 #include "platform/database/FaultInjection.h"
-#include "support/Failure.h"
 
 #include <QElapsedTimer>
 #include <QFile>
@@ -158,32 +157,19 @@ TEST_P(Database, AConnectionThatHasGoneIsNoticedAndCanBeOpenedAgain)
 
 INSTANTIATE_TEST_SUITE_P(Engines, Database, ::testing::Values(On::Embedded, On::MySql, On::Odbc));
 
-class EmbeddedDatabase : public Database {
-protected:
-    /// The file as any other tool opens it.
-    void byAnotherTool(const QStringList& statements) const
-    {
-        {
-            QSqlDatabase plain = QSqlDatabase::addDatabase(u"QSQLITE"_s, u"another tool"_s);
-            plain.setDatabaseName(profile.root() + u"/databases/shop.db"_s);
-            ASSERT_TRUE(plain.open());
-            for (const QString& statement : statements)
-                EXPECT_TRUE(QSqlQuery(plain).exec(statement)) << statement.toStdString();
-        }
-        QSqlDatabase::removeDatabase(u"another tool"_s);
-    }
-
-    QVariant single(const QString& select) const
-    {
-        Recordset rows = query(select);
-        return rows.value(rows.columns().first());
-    }
-};
+class EmbeddedDatabase : public Database {};
 
 TEST_P(EmbeddedDatabase, ReadsWhatAnotherToolHasWritten)
 {
-    byAnotherTool({u"INSERT INTO LINE (CODE, SEQ, amount, flag, day) VALUES (5, 'x', '1,5', -1, '2026-02-28')"_s,
-                   u"INSERT INTO LINE (SEQ, amount, flag, day) VALUES (1.5, 3, 'True', '2026-02-28T10:00:00')"_s});
+    {
+        QSqlDatabase tool = QSqlDatabase::addDatabase(u"QSQLITE"_s, u"tool"_s);
+        tool.setDatabaseName(profile.root() + u"/databases/shop.db"_s);
+        ASSERT_TRUE(tool.open());
+        EXPECT_TRUE(QSqlQuery(tool).exec(
+            u"INSERT INTO LINE (CODE, SEQ, amount, flag, day) VALUES (5, 'x', '1,5', -1, '2026-02-28'), "
+            "(NULL, 1.5, 3, 'True', '2026-02-28T10:00:00')"_s));
+    }
+    QSqlDatabase::removeDatabase(u"tool"_s);
     Recordset lines = query(u"SELECT * FROM LINE"_s);
     EXPECT_EQ(lines.value(u"CODE"_s), QVariant(u"5"_s));
     EXPECT_EQ(lines.text(u"SEQ"_s), u"x"_s);
@@ -199,8 +185,8 @@ TEST_P(EmbeddedDatabase, ReadsWhatAnotherToolHasWritten)
     EXPECT_EQ(lines.value(u"flag"_s), QVariant(true));
     lines.set(u"day"_s, u"1/3/2026"_s);
     lines.update();
-    EXPECT_EQ(single(u"SELECT day + '' AS stored FROM LINE WHERE day IS NOT NULL"_s),
-              QVariant(u"2026-03-01 00:00:00"_s));
+    EXPECT_EQ(query(u"SELECT day + '' AS stored FROM LINE WHERE day IS NOT NULL"_s).text(u"stored"_s),
+              u"2026-03-01 00:00:00"_s);
 }
 
 INSTANTIATE_TEST_SUITE_P(Alone, EmbeddedDatabase, ::testing::Values(On::Embedded));
@@ -228,7 +214,7 @@ TEST(ConnectionText, ChoosesTheEngineThatAnswers)
         {QString(), false}};
     for (const auto& [text, opens] : cases) {
         db::Connection connection;
-        EXPECT_EQ(failureOf([&] { connection.open(text); }), opens ? 0 : CannotOpen) << text.toStdString();
+        EXPECT_EQ(failure([&] { connection.open(text); }).number(), opens ? 0 : CannotOpen) << text.toStdString();
         EXPECT_EQ(connection.state(), opens ? 1 : 0) << text.toStdString();
     }
     EXPECT_FALSE(QFile::exists(profile.root() + u"/databases/NoShop.db"_s)) << "a missing database is not made";
@@ -263,12 +249,7 @@ TEST(ConnectionText, AServerThatRefusesOrDoesNotAnswerCostsSeconds)
         QElapsedTimer time;
         time.start();
         db::Connection connection;
-        RuntimeError thrown(0, QString());
-        try {
-            connection.open(connectionText);
-        } catch (const RuntimeError& error) {
-            thrown = error;
-        }
+        const RuntimeError thrown = failure([&] { connection.open(connectionText); });
         EXPECT_EQ(thrown.number(), number) << connectionText.toStdString();
         EXPECT_EQ(thrown.nativeCode(), native);
         EXPECT_LT(time.elapsed(), 10000);
@@ -300,7 +281,7 @@ TEST(PastedStatement, FillsPlacesByWhereTheyStand)
             EXPECT_EQ(sql(statement, value), QString::fromLatin1(expected)) << statement;
             continue;
         }
-        EXPECT_EQ(failureOf([&] { sql(statement, value); }), TypeMismatch) << value.toString().toStdString();
+        EXPECT_EQ(failure([&] { sql(statement, value); }).number(), TypeMismatch) << value.toString().toStdString();
     }
     EXPECT_EQ(sql("A='{}' AND B={} AND C='{}'", u"{}'"_s, 1, u"c"_s), u"A='{}''' AND B=1 AND C='c'"_s);
 }

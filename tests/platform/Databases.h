@@ -18,6 +18,18 @@ enum class On { Embedded, MySql, Odbc };
 /// One server for the whole program; it is started by the first test that needs it.
 MariaDbServer& mariaDb();
 
+/// The error that a step throws; number 0 where it throws none.
+template <class Step>
+RuntimeError failure(Step&& step)
+{
+    try {
+        step();
+    } catch (const RuntimeError& error) {
+        return error;
+    }
+    return RuntimeError(0, QString());
+}
+
 /// LINE (id, the identity; CODE, SEQ, amount, flag, day, notes), CAR (REGO, the key; owner) and Tints (Code, Script; no
 /// key). Comparison and defaults as in the quote database.
 class Databases : public ::testing::TestWithParam<On> {
@@ -27,18 +39,6 @@ protected:
     db::ConnectionPtr connect() const;
     db::Recordset query(const QString& select) const;
     int count(const QString& condition) const;
-    /// The error that a step throws; number 0 where it throws none.
-    template <class Step>
-    static RuntimeError failure(Step&& step)
-    {
-        try {
-            step();
-        } catch (const RuntimeError& error) {
-            return error;
-        }
-        return RuntimeError(0, QString());
-    }
-
     TestProfile profile;
     QString connectionText;
     db::ConnectionPtr connection;
