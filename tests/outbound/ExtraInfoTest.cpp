@@ -5,8 +5,6 @@
 #include "platform/values.h"
 #include "shell/SharedVariables.h"
 
-#include <QJsonDocument>
-
 namespace kest::test {
 
 using namespace Qt::StringLiterals;

@@ -7,7 +7,6 @@
 #include <QCheckBox>
 #include <QCloseEvent>
 #include <QComboBox>
-#include <QGroupBox>
 #include <QIntValidator>
 #include <QJsonDocument>
 #include <QLabel>

@@ -22,6 +22,13 @@ void setFault(FaultOf of, std::function<bool()> fault)
         files::setFault(std::move(fault));
 }
 
+std::string describe(const DisturbedLoad& load)
+{
+    return (load.of == FaultOf::Statement ? "statement " : "file operation ") + std::to_string(load.number) +
+           (load.lasting ? " and all behind it" : "") + "\nfirst load: " + (load.taken ? "taken " : "not taken ") +
+           load.boxes + "\nsecond load: " + (load.takenAgain ? "taken " : "not taken ") + load.boxesAgain;
+}
+
 }  // namespace
 
 bool loadAsTheWindow(const QString& message)
@@ -35,13 +42,6 @@ bool loadAsTheWindow(const QString& message)
     if (taken)
         MoveMessage(message, u"read"_s);
     return taken;
-}
-
-std::string describe(const DisturbedLoad& load)
-{
-    return (load.of == FaultOf::Statement ? "statement " : "file operation ") + std::to_string(load.number) +
-           (load.lasting ? " and all behind it" : "") + "\nfirst load: " + (load.taken ? "taken " : "not taken ") +
-           load.boxes + "\nsecond load: " + (load.takenAgain ? "taken " : "not taken ") + load.boxesAgain;
 }
 
 FaultRun::FaultRun(const QString& message, const char* script, const std::function<bool(const QString& message)>& load)

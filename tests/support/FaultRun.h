@@ -23,8 +23,6 @@ struct DisturbedLoad {
     std::string shop;  // what the shop holds in the end
 };
 
-std::string describe(const DisturbedLoad& load);
-
 /// The window's way with a message, the move to the read folder included; false where a failure reaches the window.
 bool loadAsTheWindow(const QString& message);
 
@@ -33,10 +31,6 @@ public:
     /// The shop as it stands now is where each load begins. The message lies in the unread folder.
     explicit FaultRun(const QString& message, const char* script = "{}",
                       const std::function<bool(const QString& message)>& load = loadAsTheWindow);
-
-    /// What the shop holds after a load without a fault: all rows of all tables, all files of the folders.
-    const std::string& undisturbed() const { return undisturbed_; }
-    const std::vector<DisturbedLoad>& loads() const { return loads_; }
 
     /// A case in which the second load does not end as if the first had never been disturbed, and why.
     struct KnownDifference {
@@ -48,7 +42,7 @@ public:
     void expectAsIfNeverDisturbed(const std::vector<KnownDifference>& known = {}) const;
 
 private:
-    std::string undisturbed_;
+    std::string undisturbed_;  // what the shop holds after a load without a fault
     std::vector<DisturbedLoad> loads_;
 };
 

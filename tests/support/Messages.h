@@ -29,7 +29,6 @@ public:
     {
         return setFirst({"kestOriginalQuoteNumber", "kestQuoteNumber"}, number);
     }
-    Message& reference(const Text& reference) { return set("quoteBody/quoteReference", reference); }
     Message& claim(const Text& number) { return set("claimNumber", number); }
     Message& rego(const Text& rego) { return set("vehicleRegistration", rego); }
     Message& reason(const Text& text)
