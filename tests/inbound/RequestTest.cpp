@@ -6,6 +6,8 @@
 #include "support/Load.h"
 #include "support/Shop.h"
 
+#include <vector>
+
 namespace kest::test {
 
 using namespace Qt::StringLiterals;
@@ -22,7 +24,7 @@ protected:
             EXPECT_EQ(row.text(column.section(u'=', 0, 0)), column.section(u'=', 1).toStdString())
                 << column.toStdString();
     }
-    static void insurers(std::initializer_list<const char*> names)
+    static void insurers(std::vector<const char*> names)
     {
         run("DELETE FROM INSURER");
         for (const char* name : names)
@@ -60,7 +62,7 @@ TEST_F(Requests, ARequestBecomesANewQuoteWithCarAndCustomer)
 
 TEST_F(Requests, TheUniversalInsurerIsPreferredAmongMany)
 {
-    const std::pair<std::initializer_list<const char*>, const char*> cases[] = {
+    const std::pair<std::vector<const char*>, const char*> cases[] = {
         {{"A", "B"}, "A"},
         {{"A", "KEST Universal Insurer"}, "A"},
         {{"KEST Universal Insurer", "B"}, "B"},
