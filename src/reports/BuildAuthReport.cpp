@@ -153,18 +153,17 @@ void FinishAuthReport(db::Recordset& table, const db::Recordset& quote, db::Reco
     table.moveFirst();
 }
 
-std::optional<db::Recordset> BuildAdjustedReport(const xml::Document& document, bool Reprint)
+bool FillAdjustedReport(db::Recordset& table, const xml::Document& document, bool Reprint)
 {
     const auto [number, subquote] = QuoteOf(document);
     const db::Recordset quote =
         OpenQuote(document, number, subquote, u"Quote not found in database. Please contact MarlinDesk Support."_s);
     if (!quote.isOpen())
-        return {};
+        return false;
     db::Recordset lines = OpenLines(quote);
-    db::Recordset table = OpenComparison(ComparisonOf::AdjustedQuote);
     AddChangedLines(table, ReadHeader(document, ComparisonOf::AdjustedQuote), document, quote, lines,
                     ComparisonOf::AdjustedQuote, Reprint);
-    return table;
+    return true;
 }
 
 }  // namespace kest

@@ -23,8 +23,8 @@ std::optional<db::Recordset> BuildAuthReport(const xml::Document& document, QStr
 /// the message's lines are in the quote.
 void FinishAuthReport(db::Recordset& table, const db::Recordset& quote, db::Recordset& lines);
 
-/// The comparison for an adjusted quote, which may have no row and changes nothing in the database. Nothing after a box
-/// where no quote matches; failures are thrown.
-std::optional<db::Recordset> BuildAdjustedReport(const xml::Document& document, bool Reprint);
+/// Fills the comparison for an adjusted quote, which may keep no row and changes nothing in the database. False after a
+/// box where no quote matches; failures are thrown, and the rows until then stay.
+bool FillAdjustedReport(db::Recordset& table, const xml::Document& document, bool Reprint);
 
 }  // namespace kest

@@ -9,6 +9,7 @@
 #include "platform/files/files.h"
 #include "platform/values.h"
 #include "reports/BuildAuthReport.h"
+#include "reports/QuoteComparison.h"
 #include "reports/ReportTable.h"
 #include "reports/frmPrintPreview.h"
 #include "shell/Helpers.h"
@@ -204,11 +205,12 @@ bool PrintResult(const xml::Document& message)
 
 bool PrintAdjusted(const xml::Document& message, bool Reprint)
 {
-    std::optional<db::Recordset> table;
-    Step([&] { table = BuildAdjustedReport(message, Reprint); });
-    if (table)
-        frmPrintPreview::ShowForm(ComparisonReport, u""_s, &*table);
-    return table.has_value();
+    db::Recordset table = OpenComparison(ComparisonOf::AdjustedQuote);
+    bool isMatched = true;
+    Step([&] { isMatched = FillAdjustedReport(table, message, Reprint); });
+    if (isMatched)
+        frmPrintPreview::ShowForm(ComparisonReport, u""_s, &table);
+    return isMatched;
 }
 
 /// A document's name begins with the quote number, one more character, and the subquote.

@@ -1,6 +1,7 @@
 // What the insurer changed beside what the shop had quoted, cell by cell.
 #include "messages/Envelope.h"
 #include "reports/BuildAuthReport.h"
+#include "reports/QuoteComparison.h"
 #include "support/Shop.h"
 
 namespace kest::test {
@@ -23,9 +24,9 @@ protected:
     static db::Recordset adjusted(const Message& message, bool reprint = false)
     {
         QString text = message.text();
-        auto table = BuildAdjustedReport(ParsedMessage(text), reprint);
-        EXPECT_TRUE(table.has_value());
-        return table ? std::move(*table) : db::Recordset();
+        db::Recordset table = OpenComparison(ComparisonOf::AdjustedQuote);
+        EXPECT_TRUE(FillAdjustedReport(table, ParsedMessage(text), reprint));
+        return table;
     }
     static bool matches(const Message& message, const char* number = "", const char* subquote = "")
     {
@@ -279,7 +280,8 @@ TEST_F(Comparison, WithoutItsQuoteThereIsABoxAndNoTable)
     EXPECT_TRUE(matches(authorisedQuote("500"), "500", "2"));  // a number that the caller knows goes first
     quote("500", 2).request("QR2");
     QString text = adjustedQuote("500/2").text();
-    EXPECT_FALSE(BuildAdjustedReport(ParsedMessage(text), false).has_value());
+    db::Recordset table = OpenComparison(ComparisonOf::AdjustedQuote);
+    EXPECT_FALSE(FillAdjustedReport(table, ParsedMessage(text), false));
     EXPECT_EQ(shown(), "[critical] Quote not found in database. Please contact MarlinDesk Support.");
     quote("500", 2).request("QR1");
     Message broken = authorisedQuote("500/2");

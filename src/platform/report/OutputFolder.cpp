@@ -1,10 +1,13 @@
 #include "platform/report/OutputFolder.h"
 
+#include "platform/RuntimeError.h"
 #include "platform/files/files.h"
 #include "platform/report/Pages.h"
 
 #include <QDir>
 #include <QJsonDocument>
+
+#include <cstdio>
 
 namespace kest::report {
 
@@ -30,8 +33,13 @@ void writeOutput(int number, const Report& report, const QJsonObject& shown)
     if (outputFolder.isEmpty())
         return;
     const QString path = u"%1/%2-%3"_s.arg(outputFolder).arg(++written).arg(number);
-    writePdf(report, path + u".pdf"_s);
-    files::writeBytes(path + u".json"_s, QJsonDocument(shown).toJson());
+    try {
+        writePdf(report, path + u".pdf"_s);
+        files::writeBytes(path + u".json"_s, QJsonDocument(shown).toJson());
+    } catch (const RuntimeError& error) {
+        const QString line = u"The report %1 can't be written: %2\n"_s.arg(path, error.description());
+        std::fputs(line.toLocal8Bit().constData(), stderr);
+    }
 }
 
 }  // namespace kest::report

@@ -12,7 +12,8 @@ class Report;
 /// folder, a path of this system; empty turns it off. Throws where it cannot be made.
 void setOutputFolder(const QString& folder);
 
-/// Writes one preview there; nothing without a folder.
+/// Writes one preview there; nothing without a folder. What cannot be written is told on standard error: the preview
+/// goes on.
 void writeOutput(int number, const Report& report, const QJsonObject& shown);
 
 }  // namespace kest::report

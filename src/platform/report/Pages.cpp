@@ -226,11 +226,13 @@ void setPaper(QPagedPaintDevice& device)
 
 void paint(const Report& report, QPagedPaintDevice& device, int firstPage, int lastPage)
 {
+    const Pages pages(report, device);
+    const int last = lastPage > 0 ? std::min(lastPage, pages.count()) : pages.count();
+    if (firstPage > last)
+        return;  // to begin would bring out an empty page
     QPainter painter;
     if (!painter.begin(&device))
         throw RuntimeError(FileInputOutput, u"The report can't be painted."_s);
-    const Pages pages(report, device);
-    const int last = lastPage > 0 ? std::min(lastPage, pages.count()) : pages.count();
     for (int page = firstPage; page <= last; ++page) {
         if (page > firstPage)
             device.newPage();

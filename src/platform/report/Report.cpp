@@ -58,14 +58,22 @@ struct Condition {
         return {text.first(negated ? at - 1 : at), text.sliced(at + 1).split(u'|'), negated};
     }
     bool isGiven() const { return !field.isEmpty(); }
-    static QList<Condition> listIn(const QString& text)
-    {
-        QList<Condition> conditions;
-        for (const QString& condition : text.split(u',', Qt::SkipEmptyParts))
-            conditions.append(in(condition));
-        return conditions;
-    }
 };
+
+/// "A=1,B=2;C=3": the conditions of one alternative joined by commas, the alternatives by semicolons.
+using Alternatives = QList<QList<Condition>>;
+
+Alternatives alternativesIn(const QString& text)
+{
+    Alternatives alternatives;
+    for (const QString& alternative : text.split(u';')) {
+        QList<Condition> conditions;
+        for (const QString& condition : alternative.split(u',', Qt::SkipEmptyParts))
+            conditions.append(Condition::in(condition.trimmed()));
+        alternatives.append(conditions);
+    }
+    return alternatives;
+}
 
 /// One row under the names of its fields, which are found without regard to case.
 class Row {
@@ -84,6 +92,12 @@ public:
     {
         const bool isOne = condition.values.contains(text(condition.field).trimmed(), Qt::CaseInsensitive);
         return isOne != condition.negated;
+    }
+    bool meetsOne(const Alternatives& alternatives) const
+    {
+        return std::ranges::any_of(alternatives, [&](const QList<Condition>& conditions) {
+            return std::ranges::all_of(conditions, [&](const Condition& condition) { return meets(condition); });
+        });
     }
 
 private:
@@ -185,6 +199,9 @@ void Report::readSaved(const QString& json)
         noTemplate(error.errorString());
     for (const QJsonValue parameter : saved[u"parameters"_s].toArray())
         parameters_.append({parameter[u"name"_s].toString(), parameter[u"value"_s].toString()});
+    const QJsonObject named = saved[u"groups"_s].toObject();
+    for (auto group = named.begin(); group != named.end(); ++group)
+        groups.insert(group.key(), group.value().toString());
     for (const QJsonValue row : saved[u"rows"_s].toArray()) {
         const QJsonObject cells = row.toObject();
         QVariantList values(table_.fields.size());
@@ -218,11 +235,11 @@ QString Report::filled(const QString& part, int page, int pages) const
     for (const QString& tag : tags) {
         if (!isOfRows(tag))
             continue;
-        const QList<Condition> conditions = Condition::listIn(tag.section(u':', 1));
+        const QString group = tag.section(u':', 1);
+        const Alternatives alternatives = alternativesIn(groups.value(group, group));
         mustache::data list(mustache::data::type::list);
         for (const QVariantList& values : table_.rows)
-            if (const Row row(table_, &values);
-                std::ranges::all_of(conditions, [&](const Condition& condition) { return row.meets(condition); }))
+            if (const Row row(table_, &values); row.meetsOne(alternatives))
                 list.push_back(rowData(row));
         data.set(tag.toStdString(), tag.startsWith(u"any:"_s) ? mustache::data(list.is_non_empty_list()) : list);
     }

@@ -33,7 +33,8 @@ struct Parameter {
 ///   {{field:date}}         as dd/MM/yyyy, where it is a date
 ///   {{#rows}}...{{/rows}}  once for each row; {{#rows:field=A|B}} for those with one of these values,
 ///   {{#rows:field!=A}}
-///                          for those without; several conditions joined by commas
+///                          for those without; several conditions joined by commas, alternatives by semicolons;
+///   {{#rows:name}}         for those of a group, whose conditions stand under this name in the template
 ///   {{#any:field=A|B}}     once where there is such a row
 ///   {{#field=A|B}}         where the row has one of these values; {{^field=A|B}} where it has not
 ///   {{>name}}              what stands in <template id="name">
@@ -65,6 +66,7 @@ private:
     QString header_;
     QString footer_;
     QList<Parameter> parameters_;
+    QHash<QString, QString> groups;
     Table table_;
 };
 
