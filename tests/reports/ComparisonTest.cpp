@@ -244,14 +244,6 @@ TEST_F(Comparison, AnAuthorisedQuoteWithoutChangesStillHasARow)
     EXPECT_EQ(adjusted(adjustedQuote("500").labour(1, "N")).recordCount(), 0);
 }
 
-TEST_F(Comparison, ALineTakesTheItemNumberOfTheShopsLineAtTheEnd)
-{
-    quote("500").request("QR1").line(7, "MIS", "Tow").set("itemno", " 991 ").set("qty", 1.0);
-    EXPECT_EQ(cells(authorised(authorisedQuote("500").sublet(7, "C")), "itemno"), "991");
-    quote("500").line(7).set("itemno", "");
-    EXPECT_EQ(cells(authorised(authorisedQuote("500").labour(7, "C")), "itemno"), "");
-}
-
 TEST_F(Comparison, ASubletRepairerIsAVendorAndBecomesOneByAMerePrint)
 {
     quote("500").request("QR1");

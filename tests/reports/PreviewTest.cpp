@@ -10,9 +10,11 @@
 #include "shell/SharedVariables.h"
 #include "support/Hands.h"
 
+#include <QFileInfo>
 #include <QJsonDocument>
 #include <QKeyEvent>
 #include <QLabel>
+#include <QPdfWriter>
 #include <QPrintDialog>
 #include <QPrinter>
 #include <QPushButton>
@@ -80,13 +82,15 @@ TEST_F(Preview, ATemplateIsFilledByFieldConditionAndRow)
         {"{{#rows}}[{{name}}]{{/rows}}", "[A &amp; B]"},
         {"{{#rows:kind=b}}[{{name}}]{{/rows:kind=b}}{{#any:kind=b}}some{{/any:kind=b}}", ""},
         {"{{#rows:kind=a,none!=}}[{{name}}]{{/rows:kind=a,none!=}}", ""},
+        {"{{#rows:kind=b;none=,kind=a}}[{{name}}]{{/rows:kind=b;none=,kind=a}}{{#any:bs}}some{{/any:bs}}",
+         "[A &amp; B]"},
         {"<template id=\"x\">({{name}})</template>{{>x}}{{>x}}", "(A &amp; B)(A &amp; B)"},
         {"{{unknown}}{{Comp}}", "the shop"},
     };
     for (const auto& [tags, expected] : cases) {
         const QByteArray page =
             "<html><head><script type=\"application/json\">{\"parameters\": [{\"name\": \"Comp\", \"value\": "
-            "\"the shop\"}]}</script></head><body>" +
+            "\"the shop\"}], \"groups\": {\"bs\": \"kind=b\"}}</script></head><body>" +
             QByteArray(tags) + "</body></html>";
         const QString text = filled(page, {{u"name"_s, u"A & B"_s},
                                            {u"amount"_s, u"1,234.5"_s},
@@ -160,6 +164,13 @@ TEST_F(Preview, EachPreviewIsKeptInTheFolderOfReports)
     };
     EXPECT_EQ(json(1), desktop->record().windows[0].toObject());
     EXPECT_TRUE(json(2)[u"table"].isNull());
+
+    windows();
+    files::makeFolder(folder + u"/3-720.pdf"_s);  // in the way
+    ::testing::internal::CaptureStderr();
+    frmPrintPreview::ShowForm(720, QStringList(), nullptr);
+    EXPECT_NE(::testing::internal::GetCapturedStderr().find("3-720 can't be written"), std::string::npos);
+    EXPECT_EQ(shownReports(), "frmPrintPreview720");
 }
 
 TEST_F(Preview, EveryLineStandsOnceOnAPageAndPagesAreCounted)
@@ -178,6 +189,10 @@ TEST_F(Preview, EveryLineStandsOnceOnAPageAndPagesAreCounted)
         }
         EXPECT_EQ(pages.size() == 1, lines == 1);
     }
+    const QString none = root() + u"/none.pdf"_s;
+    QPdfWriter writer(none);
+    report::paint(comparisonOf(1, u"%1"_s), writer, 2, 3);  // pages that the report has not
+    EXPECT_EQ(QFileInfo(none).size(), 0);
 }
 
 TEST_F(Preview, ARowOfSeveralLinesIsNeverDividedAndALongTextIsWhole)

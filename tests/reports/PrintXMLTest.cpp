@@ -7,6 +7,7 @@
 #include "shell/SharedVariables.h"
 
 #include <QPushButton>
+#include <QRegularExpression>
 
 namespace kest::test {
 
@@ -90,10 +91,9 @@ TEST_F(Printing, ValuesOfARequestAreMadeFromWhatTheMessageHolds)
 TEST_F(Printing, AResultShowsItsReasonForTheOneQuoteOfTheRequest)
 {
     const std::pair<const char*, const char*> cases[] = {
-        {"UNSP", "Unspecified Reason"}, {"inco", "Quote Incomplete"},
-        {"LABR", "Labour Price"},       {"PART", "Part Price"},
-        {"PAIN", "Paint Price"},        {"RECY", "Recycled Parts"},
-        {"METH", "Method of Repair"},   {"TLSS", "-"},
+        {"UNSP", "Unspecified Reason"},
+        {"inco", "Quote Incomplete"},
+        {"TLSS", "-"},
     };
     quote("500", 2).request("QR1");
     for (const auto& [code, reason] : cases) {
@@ -172,14 +172,49 @@ TEST_F(Printing, AnAuthorisationAlsoShowsItsSubletDocuments)
 {
     quote("500", 1).request("QR1").line(7, "MIS", "Alignment").set("qty", 1.0);
     quote("500").request("QR2");
-    print(authorisedQuote("500/1"));
-    EXPECT_EQ(shownReports(), "frmPrintPreview730");
-    files::writeBytes(u"c:\\wirdoc\\PDF\\500.0_7.pdf"_s, "%PDF-1.4");
-    print(authorisedQuote("500/1"));
-    EXPECT_EQ(shownReports(), "frmPrintPreview730");
-    files::writeBytes(u"c:\\wirdoc\\PDF\\500.1_7.pdf"_s, "%PDF-1.4");
-    print(authorisedQuote("500/1"));
-    EXPECT_EQ(shownReports(), "frmPrintPreview730 frmSubletAuth");
+    for (const auto& [document, reports] : {std::pair{"500.0_7.pdf", "frmPrintPreview730"},
+                                            std::pair{"500.1_7.pdf", "frmPrintPreview730 frmSubletAuth"}}) {
+        files::writeBytes(u"c:\\wirdoc\\PDF\\"_s + QLatin1String(document), "%PDF-1.4");
+        print(authorisedQuote("500/1"));
+        EXPECT_EQ(shownReports(), reports);
+    }
+}
+
+TEST_F(Printing, EachChangedLineStandsInItsSection)
+{
+    quote("500").request("QR1").line(1, "R&R", "Labour deleted").set("qty", 1.0);
+    quote("500").line(2, "MIS", "Labour other").set("qty", 1.0);
+    const auto lines = [](Message message) {
+        return message.labour(1, "D")
+            .labour(2, "D")
+            .labour(91, "I", {{"labourType", ""}, {"labourGroup", "1"}, {"labourDescription", "Labour unknown"}})
+            .part(92, "I", {{"partDescription", "Parts unknown"}})
+            .paint(93, "I", {{"paintWorkType", ""}, {"paintGroup", "1"}, {"paintDescription", "Paint unknown"}})
+            .sublet(94, "C", {{"subletType", "OTH"}, {"subletDescription", "Sublet other"}});
+    };
+    report::setOutputFolder(root() + u"/out"_s);
+    print(lines(adjustedQuote("500")), false);
+    print(lines(authorisedQuote("500")).sublet(95, "I", {{"subletType", ""}, {"subletDescription", "Sublet bare"}}),
+          false);
+    print(adjustedQuote("500"));
+    report::setOutputFolder({});
+    for (const char* name : {"/out/1-730.pdf", "/out/2-730.pdf"}) {
+        QString section;
+        int count = 0;
+        for (const QString& line : pdfText(root() + QLatin1String(name)).split(u'\n')) {
+            if (const QString heading = line.trimmed().section(u' ', 0, 0);
+                !line.startsWith(u' ') && heading != "Line"_L1)
+                section = heading;
+            static const QRegularExpression script(u"(Labour|Parts|Paint|Sublet) (deleted|other|unknown|bare)"_s);
+            const auto found = script.match(line);
+            count += found.hasMatch() ? 1 : 0;
+            EXPECT_TRUE(!found.hasMatch() || found.captured(1) == section) << line.toStdString();
+        }
+        EXPECT_EQ(count, name[5] == '1' ? 6 : 7);
+    }
+    const QString unchanged = pdfText(root() + u"/out/3-730.pdf"_s);
+    EXPECT_TRUE(unchanged.contains(u"No line of this quote was changed"_s));
+    EXPECT_FALSE(unchanged.contains(u"Authorised"_s));
 }
 
 }  // namespace kest::test
