@@ -98,9 +98,9 @@ QStringList statementsIn(const QString& script)
 
 QString withDates(QString text, const QDate& today)
 {
-    static const QRegularExpression placeholder(u"@(date|short)([+-]\\d+)@"_s);
+    static const QRegularExpression dayToken(u"@(date|short)([+-]\\d+)@"_s);
     qsizetype from = 0;
-    for (auto match = placeholder.match(text); match.hasMatch(); match = placeholder.match(text, from)) {
+    for (auto match = dayToken.match(text); match.hasMatch(); match = dayToken.match(text, from)) {
         const QDate day = today.addDays(match.captured(2).toInt());
         const QString date = match.captured(1) == u"date"_s ? day.toString(Qt::ISODate) : shortDate(day);
         text.replace(match.capturedStart(), match.capturedLength(), date);

@@ -24,7 +24,10 @@ qint64 toLong(const QVariant& value);
 qint64 toInteger(const QVariant& value);
 bool toBool(const QVariant& value);
 /// The flag of a column: a Null counts as false.
-inline bool isTrue(const QVariant& flag) { return !flag.isNull() && toBool(flag); }
+inline bool isTrue(const QVariant& flag)
+{
+    return !flag.isNull() && toBool(flag);
+}
 QDateTime toDate(const QVariant& value);
 
 /// The number in a text, or none where the text is no number.

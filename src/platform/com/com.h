@@ -26,7 +26,10 @@ struct Guid {
     std::uint16_t data3;
     std::uint8_t data4[8];
 };
-inline bool operator==(const Guid& a, const Guid& b) { return std::memcmp(&a, &b, sizeof(Guid)) == 0; }
+inline bool operator==(const Guid& a, const Guid& b)
+{
+    return std::memcmp(&a, &b, sizeof(Guid)) == 0;
+}
 /// "{00000000-0000-0000-C000-000000000046}"
 QString text(const Guid& id);
 
