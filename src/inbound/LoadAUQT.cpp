@@ -133,20 +133,8 @@ void FillHeader(db::Recordset& quote, const Authorisation& told, const QString& 
                     {"paint_rate"_L1, 1},
                     {"QSENT"_L1, u"R"_s},
                     {"excess_gst"_L1, 1},
-                    {"RR_TOTAL"_L1, 0},
-                    {"RA_TOTAL"_L1, 0},
-                    {"PAINT_TOTAL"_L1, 0},
-                    {"CONTACTID"_L1, 0},
-                    {"TOTAL"_L1, 0},
-                    {"PRTTOTAL"_L1, 0},
-                    {"MISTOTAL"_L1, 0},
-                    {"override"_L1, 0},
-                    {"rr_override"_L1, 0},
-                    {"ra_override"_L1, 0},
-                    {"paint_override"_L1, 0},
-                    {"quotechanged"_L1, true},
-                    {"invoiced"_L1, false},
                 });
+    FillWithoutTotals(quote);
 }
 
 bool RefusePlainly(const QString& text)

@@ -148,30 +148,18 @@ void FillHeader(db::Recordset& quote, const ManualQuote& manual, const QuoteKey&
                     {"QSENT"_L1, u"R"_s},
                     {"excess"_L1, 0},
                     {"contri"_L1, 0},
-                    {"RR_TOTAL"_L1, 0},
-                    {"RA_TOTAL"_L1, 0},
-                    {"PAINT_TOTAL"_L1, 0},
-                    {"CONTACTID"_L1, 0},
                     {"NEWPC"_L1, insurer.value(u"new_mu"_s)},
                     {"SECONDPC"_L1, cinfo.value(u"second_mu"_s)},
                     {"RECOREPC"_L1, cinfo.value(u"recore_mu"_s)},
                     {"AFTERPC"_L1, cinfo.value(u"after_mu"_s)},
                     {"assess"_L1, u""_s},
                     {"excess_gst"_L1, 1},
-                    {"TOTAL"_L1, 0},
-                    {"PRTTOTAL"_L1, 0},
-                    {"MISTOTAL"_L1, 0},
-                    {"override"_L1, 0},
-                    {"rr_override"_L1, 0},
-                    {"ra_override"_L1, 0},
-                    {"paint_override"_L1, 0},
-                    {"quotechanged"_L1, true},
-                    {"invoiced"_L1, false},
                     {"Type"_L1, u"MTA"_s},
                     {"ExtraInfo"_L1, true},
                     {"QTNNO"_L1, key.number},
                     {"Subquote"_L1, key.subquote},
                 });
+    FillWithoutTotals(quote);
 }
 
 bool RefuseLines()

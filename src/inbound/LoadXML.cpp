@@ -133,6 +133,14 @@ void Fill(db::Recordset& row, std::initializer_list<Column> columns)
         row.set(column.name, column.value);
 }
 
+void FillWithoutTotals(db::Recordset& quote)
+{
+    for (const char16_t* column : {u"RR_TOTAL", u"RA_TOTAL", u"PAINT_TOTAL", u"TOTAL", u"PRTTOTAL", u"MISTOTAL",
+                                   u"override", u"rr_override", u"ra_override", u"paint_override", u"CONTACTID"})
+        quote.set(QString::fromUtf16(column), 0);
+    Fill(quote, {{"quotechanged"_L1, true}, {"invoiced"_L1, false}});
+}
+
 void RespellColour(db::Recordset& car, db::Recordset& colours)
 {
     const QString colour = car.text(u"COLOUR"_s);

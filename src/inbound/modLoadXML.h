@@ -78,6 +78,8 @@ struct Column {
 };
 /// Sets columns of the current row, in their order.
 void Fill(db::Recordset& row, std::initializer_list<Column> columns);
+/// Takes the totals and the host's overrides off a header that a load builds; the host has to look at the quote again.
+void FillWithoutTotals(db::Recordset& quote);
 /// Puts a car's colour in the spelling of the colour table, and empties one that is not in it.
 void RespellColour(db::Recordset& car, db::Recordset& colours);
 /// The row of the long texts that belongs to the quote.
