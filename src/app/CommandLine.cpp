@@ -58,6 +58,7 @@ QString usage()
   list unread|read|sent [--filter TEXT]
   load FILE                     load a message of the unread folder
   send QTNNO [SUBQUOTE]         send a quote
+  reprint FILE                  print a message of the read folder again
   joblink set --server S --port N --database D --user U     the password is read from standard input
   view unread|read|sent FILE    the indented text of a message
   setting list | get APP SECTION KEY | set APP SECTION KEY VALUE
