@@ -34,7 +34,7 @@ CommandLine parsed(const QStringList& words)
             }
             *value = words[i];
         } else if (line.command.isEmpty()) {
-            if (word.startsWith(u'-') && word != u"--help"_s) {
+            if (word.startsWith(u'-') && word != u"--help"_s && word != u"--version"_s) {
                 line.error = u"unknown option "_s + word;
                 return line;
             }

@@ -32,6 +32,10 @@ int main(int argc, char** argv)
         std::fputs(qUtf8Printable(usage()), stdout);
         return Done;
     }
+    if (line.command == QLatin1String("--version")) {
+        std::puts("kest2 " KEST_VERSION);
+        return Done;
+    }
     if (!line.error.isEmpty())
         return refuse(line, line.error + QLatin1String("\n\n") + usage(), Usage);
     if (isInteractive(line) && !hasDisplay())

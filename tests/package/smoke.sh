@@ -64,6 +64,8 @@ done
 man --warnings --local-file "$root/usr/share/man/man1/kest2.1.gz" >"$tmp/page" 2>"$tmp/warnings"
 [ ! -s "$tmp/warnings" ] || fail "the manual page has faults: $(cat "$tmp/warnings")"
 
+version=$(dpkg-deb --field "$deb" Version)
+[ "$("$kest2" --version)" = "kest2 $version" ] || fail "the command is not of version $version"
 export KEST2_PROFILE=$tmp/profile
 "$kest2" init --demo
 [ "$("$kest2" list unread | wc -l)" -gt 10 ] || fail "the demo shop shows no messages"

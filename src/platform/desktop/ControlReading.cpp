@@ -56,8 +56,6 @@ std::optional<QString> textOf(const QWidget& control)
         return withoutMark(frame->title());
     if (const auto* field = qobject_cast<const QLineEdit*>(&control))
         return field->text();
-    if (const QVariant exact = control.property("exactText"); exact.isValid())
-        return exact.toString();  // with its own line ends
     if (const auto* text = qobject_cast<const QPlainTextEdit*>(&control))
         return text->toPlainText();
     if (const auto* text = qobject_cast<const QTextEdit*>(&control))
