@@ -19,15 +19,6 @@ struct NamedPhotograph {
     Photograph photograph;
 };
 
-QByteArray jpegOf(const Photograph& photograph)
-{
-    QByteArray bytes;
-    QBuffer buffer(&bytes);
-    buffer.open(QIODevice::WriteOnly);
-    drawn(photograph).save(&buffer, "JPEG", 85);
-    return bytes;
-}
-
 void putPhotographs(const QString& folder, std::initializer_list<NamedPhotograph> photographs)
 {
     for (const auto& [name, photograph] : photographs)
@@ -100,6 +91,15 @@ QImage drawn(const Photograph& photograph)
     painter.setPen(Qt::black);
     painter.drawText(QRect(20, 372, 600, 36), Qt::AlignLeft | Qt::AlignVCenter, photograph.caption);
     return image;
+}
+
+QByteArray jpegOf(const Photograph& photograph)
+{
+    QByteArray bytes;
+    QBuffer buffer(&bytes);
+    buffer.open(QIODevice::WriteOnly);
+    drawn(photograph).save(&buffer, "JPEG", 85);
+    return bytes;
 }
 
 void putDemoFiles(const QString& home, const QString& images, const QDate& today)

@@ -18,5 +18,6 @@ struct Photograph {
     double dent;  // how far along the car, from 0 at the front to 1 at the rear
 };
 QImage drawn(const Photograph& photograph);
+QByteArray jpegOf(const Photograph& photograph);
 
 }  // namespace kest::app

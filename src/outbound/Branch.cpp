@@ -19,6 +19,11 @@ void Branch::add(const char* name, const QString& text) const
     add(name).node.setText(text);
 }
 
+void Branch::addOutside(const char* name, const QString& text) const
+{
+    node.appendChild(document->createNode(xml::NodeType::Element, QString::fromLatin1(name))).setText(text);
+}
+
 void Branch::add(const Leaves& leaves) const
 {
     for (const Leaf& leaf : leaves)

@@ -36,6 +36,8 @@ public:
     void add(const char* name, const QString& text) const;
     /// Those of the list that are present, in its order.
     void add(const Leaves& leaves) const;
+    /// An element that lies in no namespace.
+    void addOutside(const char* name, const QString& text) const;
 
     /// The serialised text of the element.
     QString xml() const { return node.xml(); }
