@@ -1,6 +1,7 @@
 #include "app/Commands.h"
 
 #include "app/Profile.h"
+#include "app/transport/TransportCommand.h"
 #include "jobexport/JobLinkSettings.h"
 #include "messages/frmMessageList.h"
 #include "outbound/SendQuote.h"
@@ -18,11 +19,13 @@
 #include "shell/eKEST.h"
 #include "utilities/FormatXML.h"
 
+#include <QCoreApplication>
 #include <QFile>
 #include <QFileInfo>
 #include <QJsonDocument>
 
 #include <cstdio>
+#include <functional>
 #include <map>
 #include <optional>
 
@@ -48,8 +51,14 @@ struct Command {
     Needs needs;
     int fewest;  // arguments
     int most;
-    Outcome (*run)(const QStringList& arguments);
+    std::function<Outcome(const CommandLine& line)> run;
 };
+
+/// For the commands that look at their arguments alone.
+std::function<Outcome(const CommandLine&)> with(Outcome (*run)(const QStringList& arguments))
+{
+    return [run](const CommandLine& line) { return run(line.arguments); };
+}
 
 void say(const QString& text, std::FILE* stream = stdout)
 {
@@ -70,6 +79,8 @@ Outcome init(const QStringList& arguments)
     if (arguments.size() > (demo ? 1 : 0))
         return refused(u"init takes --demo and nothing else"_s, Usage);
     const bool made = initProfile(demo);
+    if (made && demo)
+        installTransport(QCoreApplication::applicationFilePath());
     return {.text =
                 (made ? u"The profile is ready: "_s : u"The profile is there already: "_s) + profile::root() + u'\n'};
 }
@@ -277,26 +288,61 @@ Outcome jobLink(const QStringList& arguments)
     return {.text = u"JobLink's settings are stored.\n"_s};
 }
 
+Outcome transport(const CommandLine& line)
+{
+    static const std::map<QString, TransportMode> modes{
+        {{}, TransportMode::Watching}, {u"--once"_s, TransportMode::Once}, {u"--window"_s, TransportMode::Window}};
+    const auto mode = modes.find(line.arguments.value(0));
+    if (mode == modes.end())
+        return refused(u"transport takes --once or --window and nothing else"_s, Usage);
+
+    QJsonArray carried;
+    bool faulty = false;
+    const bool ran = runTransport(mode->second, [&](const Carry& carry) {
+        for (const Carried& file : carry.carried) {
+            const QString direction = file.direction == Carried::Out ? u"out"_s : u"in"_s;
+            if (line.json)
+                carried.append(
+                    QJsonObject{{u"direction"_s, direction}, {u"file"_s, file.file}, {u"what"_s, file.what}});
+            else
+                say(direction + u'\t' + file.file + u'\t' + file.what + u'\n');
+        }
+        for (const QString& fault : carry.faults)
+            say(u"kest2: "_s + fault + u'\n', stderr);
+        faulty = !carry.faults.isEmpty();
+    });
+    if (!ran)
+        return refused(u"another transport works for this profile already"_s, Refused);
+    return {.exitCode = faulty && mode->second == TransportMode::Once ? Refused : Done,
+            .fields = {{u"carried"_s, carried}}};
+}
+
 const std::map<QString, Command> commands{
-    {u"init"_s, {Needs::Nothing, 0, 1, init}},          {u"where"_s, {Needs::Nothing, 0, 0, showWhere}},
-    {u"open"_s, {Needs::Profile, 0, 2, open}},          {u"list"_s, {Needs::Connection, 1, 3, list}},
-    {u"load"_s, {Needs::Connection, 1, 1, load}},       {u"send"_s, {Needs::Connection, 1, 2, send}},
-    {u"reprint"_s, {Needs::Connection, 1, 1, reprint}}, {u"view"_s, {Needs::Connection, 2, 2, view}},
-    {u"setting"_s, {Needs::Profile, 1, 5, setting}},    {u"joblink"_s, {Needs::Connection, 1, 9, jobLink}},
+    {u"init"_s, {Needs::Nothing, 0, 1, with(init)}},          {u"where"_s, {Needs::Nothing, 0, 0, with(showWhere)}},
+    {u"open"_s, {Needs::Profile, 0, 2, with(open)}},          {u"list"_s, {Needs::Connection, 1, 3, with(list)}},
+    {u"load"_s, {Needs::Connection, 1, 1, with(load)}},       {u"send"_s, {Needs::Connection, 1, 2, with(send)}},
+    {u"reprint"_s, {Needs::Connection, 1, 1, with(reprint)}}, {u"view"_s, {Needs::Connection, 2, 2, with(view)}},
+    {u"setting"_s, {Needs::Profile, 1, 5, with(setting)}},    {u"joblink"_s, {Needs::Connection, 1, 9, with(jobLink)}},
+    {u"transport"_s, {Needs::Profile, 0, 1, transport}},
 };
+
+bool showsTransport(const CommandLine& line)
+{
+    return line.command == u"transport"_s && line.arguments.contains(u"--window"_s);
+}
 
 bool profileExists()
 {
     return QFileInfo::exists(profile::root() + u"/registry.ini"_s);
 }
 
-Outcome runConnected(const Command& command, const QStringList& arguments)
+Outcome runConnected(const Command& command, const CommandLine& line)
 {
     const eKEST component;
     if (!HasConnection())
         return {.exitCode = NoConnection};
     InitCipherKey();  // as the panel does: a load may export to JobLink
-    return command.run(arguments);
+    return command.run(line);
 }
 
 Outcome runChecked(const CommandLine& line)
@@ -310,8 +356,8 @@ Outcome runChecked(const CommandLine& line)
     if (command.needs != Needs::Nothing && !profileExists())
         return refused(u"no profile at "_s + profile::root() + u"; make one with: kest2 init"_s, NoConnection);
     if (command.needs == Needs::Connection)
-        return runConnected(command, line.arguments);
-    return command.run(line.arguments);
+        return runConnected(command, line);
+    return command.run(line);
 }
 
 Outcome runCaught(const CommandLine& line)
@@ -374,7 +420,12 @@ void print(const CommandLine& line, const Outcome& outcome, const desktop::Recor
 
 bool isInteractive(const CommandLine& line)
 {
-    return line.command == u"open"_s && line.script.isEmpty();
+    return (line.command == u"open"_s || showsTransport(line)) && line.script.isEmpty();
+}
+
+bool withoutWindow(CommandLine& line)
+{
+    return showsTransport(line) && line.arguments.removeAll(u"--window"_s) > 0;
 }
 
 int refuse(const CommandLine& line, const QString& why, int exitCode)

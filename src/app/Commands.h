@@ -12,7 +12,9 @@ int run(const CommandLine& line);
 /// Says on standard error why a command is not run, and gives the exit code; the JSON answer comes all the same.
 int refuse(const CommandLine& line, const QString& why, int exitCode);
 
-/// True for the one command that a person may answer.
+/// True for the commands that open a window for a person.
 bool isInteractive(const CommandLine& line);
+/// Takes the window off a command that does its work without one too; false for any other.
+bool withoutWindow(CommandLine& line);
 
 }  // namespace kest::app

@@ -2,6 +2,7 @@
 
 #include "app/QuoteDatabase.h"
 #include "platform/files/files.h"
+#include "platform/profile.h"
 
 #include <QBuffer>
 #include <QDir>
@@ -108,6 +109,10 @@ void putDemoFiles(const QString& home, const QString& images, const QDate& today
     for (const auto& [resource, folder] :
          {std::pair(u"unread"_s, u"AUnread\\"_s), {u"read"_s, u"ARead\\"_s}, {u"sent"_s, u"ASent\\"_s}})
         putMessages(resource, home + folder, today);
+
+    QFile rules(u":/sql/demo/insurer.rules"_s);
+    rules.open(QIODevice::ReadOnly);
+    files::writeBytes(profile::componentFolder() + u"/insurer.rules"_s, rules.readAll());
 
     const QString unread = home + u"AUnread\\"_s;
     const QColor blue(52, 86, 160), silver(190, 194, 200), champagne(214, 196, 150);

@@ -1,4 +1,4 @@
-// The demo shop's files: messages in all folders, and the photographs that belong to them.
+// The demo shop's files: messages in all folders, the photographs that belong to them, the rules of its insurer.
 #pragma once
 
 #include <QColor>
@@ -8,7 +8,8 @@
 
 namespace kest::app {
 
-/// Writes them into the message folders under `home` and into the images folder; dates count back from `today`.
+/// Writes them into the message folders under `home`, the images folder and the component's folder; dates count back
+/// from `today`.
 void putDemoFiles(const QString& home, const QString& images, const QDate& today);
 
 /// What a photograph of the demo shop shows: the side of a car with its damage marked, and a caption.

@@ -27,7 +27,7 @@ QStringList words(int argc, char** argv)
 int main(int argc, char** argv)
 {
     using namespace kest::app;
-    const CommandLine line = parsed(words(argc, argv));
+    CommandLine line = parsed(words(argc, argv));
     if (line.command == QLatin1String("--help")) {
         std::fputs(qUtf8Printable(usage()), stdout);
         return Done;
@@ -38,7 +38,7 @@ int main(int argc, char** argv)
     }
     if (!line.error.isEmpty())
         return refuse(line, line.error + QLatin1String("\n\n") + usage(), Usage);
-    if (isInteractive(line) && !hasDisplay())
+    if (isInteractive(line) && !hasDisplay() && !withoutWindow(line))
         return refuse(
             line,
             QStringLiteral("there is no display to open the panel on; give a --script, or run it in a desktop "

@@ -40,6 +40,7 @@ protected:
         host.emplace();
         for (const QString& file : files::list(gsUnreadPath))
             files::remove(gsUnreadPath + file);
+        rules({});
         restart();
     }
 

@@ -172,6 +172,7 @@ void Transport::complete(const Step& step, Matter& matter)
             fail(u"no document of quote %1 lies in the folder of sent quotes"_s.arg(matter.reference()));
     };
     const auto needRequest = [&] { need(matter.request, u"the request"_s, u"request"_s); };
+    const auto needClaim = [&] { need(matter.claim, u"the claim"_s, u"claim"_s); };
     const auto needNetwork = [&] { need(matter.network, u"the network's number of the quote"_s, u"network"_s); };
 
     switch (step.act) {
@@ -190,15 +191,16 @@ void Transport::complete(const Step& step, Matter& matter)
             return give(matter.network);
         case Act::Match:
             needDocument();
+            needClaim();
             give(matter.network);
-            give(matter.request);
-            return give(matter.claim);
+            return give(matter.request);
         case Act::Authorise:
         case Act::Adjust:
             needDocument();
             needNetwork();
             needRequest();
-            give(matter.claim);
+            if (step.act == Act::Authorise)
+                needClaim();  // the shop takes it over
             return give(matter.authorised);
         case Act::Revise:
             needRequest();

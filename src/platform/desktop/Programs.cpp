@@ -1,6 +1,7 @@
 #include "platform/desktop/Programs.h"
 
 #include "platform/RuntimeError.h"
+#include "platform/profile.h"
 
 #include <QFileInfo>
 #include <QProcess>
@@ -13,7 +14,12 @@ void startDetached(const QString& systemPath)
 {
     if (!QFileInfo(systemPath).isFile())
         throw RuntimeError(FileNotFound, u"File not found: "_s + systemPath);
-    if (!QProcess::startDetached(systemPath, {}))
+    QProcess program;
+    program.setProgram(systemPath);
+    QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
+    environment.insert(u"KEST2_PROFILE"_s, profile::root());  // it may have been chosen by an option
+    program.setProcessEnvironment(environment);
+    if (!program.startDetached())
         throw RuntimeError(PermissionDenied, u"This program can't be started: "_s + systemPath);
 }
 

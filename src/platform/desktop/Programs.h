@@ -5,7 +5,8 @@
 
 namespace kest::desktop {
 
-/// Throws FileNotFound, or PermissionDenied for a file that this system cannot run.
+/// The program finds the profile by KEST2_PROFILE. Throws FileNotFound, or PermissionDenied for a file that this system
+/// cannot run.
 void startDetached(const QString& systemPath);
 
 }  // namespace kest::desktop
