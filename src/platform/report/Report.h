@@ -29,7 +29,7 @@ struct Parameter {
 /// One template, opened. Its tags are those of mustache:
 ///
 ///   {{field}}              of the row, or outside of rows of the first one; {{parameter}}; {{page}} and {{pages}}
-///   {{field:money}}        with two decimals and groups of three digits, where it is a number
+///   {{field:money}}        with two decimals, where it is a number
 ///   {{field:date}}         as dd/MM/yyyy, where it is a date
 ///   {{#rows}}...{{/rows}}  once for each row; {{#rows:field=A|B}} for those with one of these values,
 ///   {{#rows:field!=A}}
