@@ -12,6 +12,7 @@ namespace {
 
 constexpr QLatin1StringView networkDomain = "orla.example"_L1;  // of every network namespace, behind its labels
 constexpr QLatin1StringView schemaInstance = "xmlns:xsi=\"http://www.w3.org/2001/XMLSchema-instance\" "_L1;
+constexpr int repairsAllowed = 3;
 constexpr QLatin1StringView unknownMessage = "UNKNOWN - INVALID MESSAGE"_L1;
 
 constexpr std::pair<QLatin1StringView, QLatin1StringView> displayNames[] = {
@@ -106,6 +107,12 @@ QString GetMarkerTypeName(const xml::Document& marker)
     return action == "DELDUPE"_L1 ? u"Quote Send Error"_s : QString(unknownMessage);
 }
 
+bool IsMarker(const xml::Document& message)
+{
+    const xml::Node first = message.firstChild().firstChild();
+    return first && first.text() == "MDMSG"_L1;
+}
+
 bool EscapeAmpersands(QString& text)
 {
     if (text.size() + 4 * text.count(u'&') > xml::Document::maximumBytes)
@@ -117,6 +124,20 @@ bool EscapeAmpersands(QString& text)
 QString WrappedInRequest(const QString& text)
 {
     return "<request>"_L1 + text + "</request>"_L1;
+}
+
+bool ParseWithRepairs(xml::Document& document, QString& text)
+{
+    for (int repairs = 0; !document.loadXML(text); ++repairs) {
+        const quint32 error = document.parseError().errorCode;
+        if (repairs == repairsAllowed)
+            return false;
+        if (error == xml::SecondRoot)
+            text = WrappedInRequest(text);
+        else if (error != xml::BareAmpersand || !EscapeAmpersands(text))
+            return false;
+    }
+    return true;
 }
 
 xml::Document ParsedMessage(QString& text)

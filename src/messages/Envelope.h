@@ -28,6 +28,8 @@ QString GetMessageTypeName(const xml::Document& message);
 /// The display name of a marker message. Changes `text` to the prepared one; never fails.
 QString GetMarkerTypeName(QString& text);
 QString GetMarkerTypeName(const xml::Document& marker);
+/// True for a marker message, whatever its file's name.
+bool IsMarker(const xml::Document& message);
 
 /// Every "&" becomes "&amp;", those of entities included. False, and nothing changes, where the outcome would be longer
 /// than a parse takes: it can be five times as long.
@@ -35,6 +37,9 @@ bool EscapeAmpersands(QString& text);
 /// The text between "<request>" and "</request>".
 QString WrappedInRequest(const QString& text);
 
+/// Parses a text into the document, at need after the two repairs, which change `text`. False where it stays
+/// unreadable.
+bool ParseWithRepairs(xml::Document& document, QString& text);
 /// A prepared text parsed for the message code's paths: SetupDocument, AddXsiDeclaration, loadXML. `text` comes back
 /// prepared. The caller asks `parseError`.
 xml::Document ParsedMessage(QString& text);

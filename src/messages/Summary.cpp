@@ -15,8 +15,7 @@ using namespace Qt::StringLiterals;
 namespace kest {
 namespace {
 
-constexpr qsizetype unaskedFiles = 25;  // a folder with more of them asks for a filter
-constexpr int repairsAllowed = 3;
+constexpr qsizetype unaskedFiles = 25;      // a folder with more of them asks for a filter
 constexpr qsizetype shortestSentText = 30;  // with its wrapping
 
 QString pathOf(int folder)
@@ -66,8 +65,6 @@ public:
 
 private:
     bool parse(const QString& path);
-    bool parseWithRepairs();
-    bool isMarker() const;
     const xml::Document& prepared();
 
     QString text;  // of the file in hand, and its document
@@ -86,7 +83,7 @@ void Fill::take(const QString& file)
     } else if (file.startsWith("R_"_L1)) {
         hooks.submissionResponse(text, file);
     } else if (file.contains("MDMSG"_L1)) {
-        if (isMarker()) {
+        if (IsMarker(document)) {
             const xml::Document& marker = prepared();
             listed.append({file, GetMarkerRow(marker, GetMarkerTypeName(marker))});
         }
@@ -106,31 +103,11 @@ bool Fill::parse(const QString& path)
         return false;
     text = files::read(path);
     if (folder != Sent)
-        return parseWithRepairs();
+        return ParseWithRepairs(document, text);
     if (!EscapeAmpersands(text))
         return false;
     text = WrappedInRequest(text);
     return document.loadXML(text) && text.size() >= shortestSentText;
-}
-
-bool Fill::parseWithRepairs()
-{
-    for (int repairs = 0; !document.loadXML(text); ++repairs) {
-        const quint32 error = document.parseError().errorCode;
-        if (repairs == repairsAllowed)
-            return false;
-        if (error == xml::SecondRoot)
-            text = WrappedInRequest(text);
-        else if (error != xml::BareAmpersand || !EscapeAmpersands(text))
-            return false;
-    }
-    return true;
-}
-
-bool Fill::isMarker() const
-{
-    const xml::Node first = document.firstChild().firstChild();
-    return first && first.text() == "MDMSG"_L1;
 }
 
 // What rows are drawn from: the document with the schema-instance declaration, which some texts do not survive. The

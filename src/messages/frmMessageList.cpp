@@ -2,7 +2,12 @@
 
 #include "inbound/modLoadXML.h"
 #include "messages/Folders.h"
+#include "messages/ListSearch.h"
+#include "messages/MessageListModel.h"
+#include "messages/TakeIn.h"
 #include "platform/RuntimeError.h"
+#include "platform/desktop/Lists.h"
+#include "platform/desktop/Progress.h"
 #include "platform/desktop/Prompt.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
@@ -12,14 +17,16 @@
 #include "shell/modLoggerEx.h"
 #include "utilities/frmViewXML.h"
 
-#include <QCollator>
-#include <QElapsedTimer>
+#include <QClipboard>
+#include <QDropEvent>
 #include <QGroupBox>
+#include <QGuiApplication>
 #include <QHBoxLayout>
 #include <QHeaderView>
 #include <QLabel>
 #include <QLineEdit>
 #include <QLocale>
+#include <QMimeData>
 #include <QProgressBar>
 #include <QPushButton>
 #include <QRadioButton>
@@ -28,7 +35,7 @@
 #include <QShortcut>
 #include <QThread>
 #include <QTimer>
-#include <QTreeWidget>
+#include <QTreeView>
 #include <QVBoxLayout>
 
 using namespace Qt::StringLiterals;
@@ -37,21 +44,13 @@ namespace kest {
 namespace {
 
 constexpr int refreshDelay = 250;    // milliseconds
-constexpr int quietFill = 500;       // milliseconds that a fill may take before it shows how far it is
 constexpr int listMargin = 210;      // twips, left and right of the list
 constexpr int openingHeight = 9000;  // twips
+constexpr int filterWidth = 1800;    // twips
+constexpr int findWidth = 2700;      // twips
+constexpr int saidOfRefused = 10;    // files, by name
 
-enum Column { FileColumn, TypeColumn };
-
-struct ListColumn {
-    QLatin1StringView caption;
-    int width;  // twips
-};
-
-constexpr ListColumn columns[] = {
-    {"Filename"_L1, 2328}, {"Message Type"_L1, 3969}, {"Rego"_L1, 1587},         {"Claim No"_L1, 2293},
-    {"Customer"_L1, 3969}, {"Quote No"_L1, 2117},     {"Vehicle Desc"_L1, 5292},
-};
+constexpr std::array columnWidths{2328, 3969, 1587, 2293, 3969, 2117, 5292};  // twips
 
 struct Folder {
     QString caption;
@@ -60,22 +59,19 @@ struct Folder {
 
 const std::array<Folder, 3> folders{{{u"U&nread"_s, u"unread"_s}, {u"R&ead"_s, u"read"_s}, {u"&Sent"_s, u"sent"_s}}};
 
-/// Sorts "123.0_9" before "123.0_10".
-class MessageItem final : public QTreeWidgetItem {
-public:
-    using QTreeWidgetItem::QTreeWidgetItem;
+const QLocale& written()
+{
+    static const QLocale locale(QLocale::English, QLocale::Australia);
+    return locale;
+}
 
-    bool operator<(const QTreeWidgetItem& other) const override
-    {
-        static const QCollator collator = [] {
-            QCollator natural(QLocale(QLocale::English, QLocale::Australia));  // numbers need a language's rules
-            natural.setNumericMode(true);
-            return natural;
-        }();
-        const int column = treeWidget()->sortColumn();
-        return collator.compare(text(column), other.text(column)) < 0;
-    }
-};
+QString withoutMore(QStringList names)
+{
+    const qsizetype more = names.size() - saidOfRefused;
+    if (more > 0)
+        names = names.first(saidOfRefused) << u"... and %1 more"_s.arg(more);
+    return names.join(u'\n');
+}
 
 template <class Control>
 Control* named(Control* control, const QString& name, const QString& tip = {})
@@ -90,6 +86,7 @@ Control* named(Control* control, const QString& name, const QString& tip = {})
 frmMessageList::frmMessageList() : Form(u"frmMessageList"_s, u"KEST Messages"_s)
 {
     setWindowFlag(Qt::WindowMaximizeButtonHint);
+    setAcceptDrops(true);
     buildControls();
     arrange();
     connectControls();
@@ -115,24 +112,26 @@ void frmMessageList::buildControls()
     Frame2->setAccessibleName(u"Filter"_s);
     Label1 = named(new QLabel(u"&Filter :"_s), u"Label1"_s);
     txtFilter = named(new QLineEdit, u"txtFilter"_s, u"Show the messages with this text in their file name (Enter)"_s);
+    txtFilter->setMinimumWidth(desktop::pixels(filterWidth));
     Label1->setBuddy(txtFilter);
     Command1 = named(new QPushButton(u"&Update"_s), u"Command1"_s, u"Fill the list by the filter"_s);
     Frame2->setVisible(false);
 
-    ListView1 = named(new QTreeWidget, u"ListView1"_s);
+    txtFind =
+        named(new QLineEdit, u"txtFind"_s, u"Show the rows with this text in any column; or just type in the list"_s);
+    txtFind->setAccessibleName(u"Find"_s);
+    txtFind->setPlaceholderText(u"Find (Ctrl+F)"_s);
+    txtFind->setClearButtonEnabled(true);
+    txtFind->setMinimumWidth(desktop::pixels(findWidth));
+
+    ListView1 = named(new QTreeView, u"ListView1"_s);
     ListView1->setAccessibleName(u"Messages"_s);
-    ListView1->setRootIsDecorated(false);
-    ListView1->setUniformRowHeights(true);
-    ListView1->setAllColumnsShowFocus(true);
-    QStringList captions;
-    for (const ListColumn& column : columns)
-        captions << column.caption;
-    ListView1->setHeaderLabels(captions);
-    ListView1->header()->setStretchLastSection(false);
-    for (int i = 0; i < captions.size(); ++i)
-        ListView1->header()->resizeSection(i, desktop::pixels(columns[i].width));
-    ListView1->header()->setSortIndicator(-1,
-                                          Qt::AscendingOrder);  // in the order of the folder until a header is clicked
+    messages = new MessageListModel(this);
+    ListView1->setModel(messages);
+    desktop::prepareList(*ListView1, objectName());
+    for (size_t i = 0; i < columnWidths.size(); ++i)
+        ListView1->header()->resizeSection(static_cast<int>(i), desktop::pixels(columnWidths[i]));
+    new ListSearch(*ListView1, *txtFind);
 
     lblStatus = named(new QLabel, u"lblStatus"_s);
     lblStatus->setTextFormat(Qt::PlainText);  // it shows file names
@@ -173,6 +172,7 @@ void frmMessageList::arrange()
     auto* line = new QHBoxLayout;
     line->addWidget(lblStatus, 1);
     line->addWidget(prgFill);
+    line->addWidget(txtFind);
 
     auto* bottom = new QHBoxLayout;
     bottom->addWidget(cmdProcess);
@@ -190,14 +190,14 @@ void frmMessageList::arrange()
     all->addLayout(bottom);
 
     const QList<QWidget*> order{Option1[Unread], Option1[Read], Option1[Sent], txtFilter, Command1, ListView1,
-                                cmdProcess,      cmdPrint,      cmdView,       Command6,  cmdExit};
+                                txtFind,         cmdProcess,    cmdPrint,      cmdView,   Command6, cmdExit};
     for (qsizetype i = 1; i < order.size(); ++i)
         setTabOrder(order[i - 1], order[i]);
     ListView1->setFocus();
 
     int width = 2 * margin + ListView1->verticalScrollBar()->sizeHint().width() + 2 * ListView1->frameWidth();
-    for (const ListColumn& column : columns)
-        width += desktop::pixels(column.width);
+    for (const int column : columnWidths)
+        width += desktop::pixels(column);
     resize(QSize(width, desktop::pixels(openingHeight)).boundedTo(screen()->availableSize()));
 }
 
@@ -208,12 +208,12 @@ void frmMessageList::connectControls()
     };
     for (size_t i = 0; i < Option1.size(); ++i)
         on(Option1[i], &QRadioButton::clicked, u"Option1_Click"_s, [this, i] { Option1_Click(static_cast<int>(i)); });
-    on(ListView1, &QTreeWidget::currentItemChanged, u"ListView1_ItemClick"_s,
-       [this](const QTreeWidgetItem* item, const QTreeWidgetItem*) {
-           if (item)
-               ListView1_ItemClick(*item);
+    on(ListView1->selectionModel(), &QItemSelectionModel::currentRowChanged, u"ListView1_ItemClick"_s,
+       [this](const QModelIndex& current, const QModelIndex&) {
+           if (current.isValid())
+               ListView1_ItemClick(current.row());
        });
-    on(ListView1, &QTreeWidget::itemDoubleClicked, u"ListView1_DblClick"_s, [this] { ListView1_DblClick(); });
+    on(ListView1, &QTreeView::doubleClicked, u"ListView1_DblClick"_s, [this] { ListView1_DblClick(); });
     on(cmdProcess, &QPushButton::clicked, u"cmdProcess_Click"_s, [this] { cmdProcess_Click(); });
     on(cmdView, &QPushButton::clicked, u"cmdView_Click"_s, [this] { cmdView_Click(); });
     on(cmdPrint, &QPushButton::clicked, u"cmdPrint_Click"_s, [this] { cmdPrint_Click(); });
@@ -228,7 +228,13 @@ void frmMessageList::connectControls()
     };
     on(inList(Qt::Key_Delete), &QShortcut::activated, u"Command6_Click"_s, [this] { Command6_Click(); });
     on(inList(Qt::Key_Return), &QShortcut::activated, u"ListView1_DblClick"_s, [this] { ListView1_DblClick(); });
-    on(new QShortcut(Qt::Key_F5, this), &QShortcut::activated, u"RefreshList"_s, [this] { RefreshList(); });
+    on(txtFind, &QLineEdit::textChanged, u"txtFind_Change"_s, [this] { txtFind_Change(); });
+    on(new QShortcut(Qt::Key_F5, this), &QShortcut::activated, u"Form_KeyRefresh"_s, [this] { Form_KeyRefresh(); });
+    on(new QShortcut(QKeySequence::Paste, this), &QShortcut::activated, u"Form_Paste"_s, [this] { Form_Paste(); });
+    on(new QShortcut(QKeySequence::Find, this), &QShortcut::activated, u"Form_Find"_s, [this] {
+        txtFind->setFocus();
+        txtFind->selectAll();
+    });
 }
 
 void frmMessageList::open()
@@ -280,57 +286,29 @@ void frmMessageList::RefreshList()
 void frmMessageList::fill()
 {
     const QScopedValueRollback filling(busy, busy + 1);
-    QElapsedTimer since;
-    since.start();
-    FillHooks hooks;
-    hooks.submissionResponse = LoadSubmissionResponse;
-    hooks.filterAsked = [this](const QString& filter) { txtFilter->setText(filter); };
-    hooks.progress = [&](qint64 done, qint64 total) {
-        if (since.elapsed() > quietFill)
-            showProgress(done, total);
-    };
-
-    listed.clear();
+    QList<ListedMessage> listed;
     fillFailure.clear();
-    try {
-        EnsureConnection();
-        listed = BuildMessageList(iFolder, hooks);
-    } catch (const RuntimeError& error) {
-        fillFailure = error.description();
+    {
+        desktop::Progress progress(windowTitle(), u"Reading the messages..."_s, prgFill);
+        FillHooks hooks;
+        hooks.submissionResponse = LoadSubmissionResponse;
+        hooks.filterAsked = [this](const QString& filter) { txtFilter->setText(filter); };
+        hooks.progress = [&](qint64 done, qint64 total) { progress.step(done, total); };
+        try {
+            EnsureConnection();
+            listed = BuildMessageList(iFolder, hooks);
+        } catch (const RuntimeError& error) {
+            fillFailure = error.description();
+        }
     }
-    prgFill->setVisible(false);
-    showRows();
+    messages->setMessages(std::move(listed));
+    choose(0);
     lblStatus->setText(status());
 }
 
-void frmMessageList::showRows()
+const QList<ListedMessage>& frmMessageList::rows() const
 {
-    ListView1->setSortingEnabled(false);
-    ListView1->clear();
-    QList<QTreeWidgetItem*> items;
-    items.reserve(listed.size());
-    for (const ListedMessage& message : std::as_const(listed)) {
-        QStringList texts{message.file};
-        texts.append(QStringList(message.row.begin(), message.row.end()));
-        items.append(new MessageItem(texts));
-    }
-    ListView1->addTopLevelItems(items);
-    ListView1->setSortingEnabled(true);
-    if (QTreeWidgetItem* first = ListView1->topLevelItem(0))
-        ListView1->setCurrentItem(first);  // as if it had been clicked
-}
-
-void frmMessageList::showProgress(qint64 done, qint64 total)
-{
-    constexpr qint64 steps = 100;
-    if (!isVisible())
-        return;
-    if (prgFill->isHidden()) {
-        prgFill->setRange(0, steps);
-        prgFill->setVisible(true);
-        layout()->activate();
-    }
-    prgFill->setValue(static_cast<int>(done * steps / total));  // paints itself, so that no event has to be let in
+    return messages->messages();
 }
 
 QString frmMessageList::status() const
@@ -338,13 +316,16 @@ QString frmMessageList::status() const
     if (!fillFailure.isEmpty())
         return "The list could not be filled: "_L1 + fillFailure;
     const QString matching = gsListFilter.isEmpty() ? QString() : u" with \"%1\" in their name"_s.arg(gsListFilter);
-    if (listed.isEmpty())
+    const qsizetype all = rows().size();
+    if (all == 0)
         return "No "_L1 + folders[iFolder].word + " messages"_L1 + matching;
-    return QString::number(listed.size()) + (listed.size() == 1 ? " message"_L1 : " messages"_L1) + matching;
+    const QString counted = written().toString(all) + (all == 1 ? " message"_L1 : " messages"_L1) + matching;
+    return txtFind->text().isEmpty() ? counted : written().toString(messages->rowCount()) + " of "_L1 + counted;
 }
 
 void frmMessageList::Option1_Click(int index)
 {
+    txtFind->clear();
     gsListFilter.clear();
     sCurFile.clear();
     gbFilterAsked = false;
@@ -356,10 +337,10 @@ void frmMessageList::Option1_Click(int index)
     Frame2->setVisible(index != Unread);
 }
 
-void frmMessageList::ListView1_ItemClick(const QTreeWidgetItem& item)
+void frmMessageList::ListView1_ItemClick(int row)
 {
-    sCurFile = item.text(FileColumn);
-    const QString type = item.text(TypeColumn);
+    sCurFile = messages->file(row);
+    const QString type = messages->type(row);
     if (gbTabletLocal)  // on its own database a tablet takes new work only
         cmdProcess->setEnabled(type == "Quote Request"_L1);
     cmdPrint->setEnabled(type != "Request for Revised Quote"_L1 && type != "Quote Deletion"_L1 &&
@@ -374,7 +355,7 @@ void frmMessageList::ListView1_DblClick()
 
 void frmMessageList::cmdProcess_Click()
 {
-    if (ListView1->currentItem())
+    if (hasSelection())
         load(selectedFile());
 }
 
@@ -408,7 +389,7 @@ void frmMessageList::tmrRefresh_Timer()
 
 void frmMessageList::cmdView_Click()
 {
-    if (ListView1->currentItem())
+    if (hasSelection())
         frmViewXML::ShowForm(selectedFile());
 }
 
@@ -426,7 +407,7 @@ void frmMessageList::Command1_Click()
 
 void frmMessageList::Command6_Click()
 {
-    if (!ListView1->currentItem())
+    if (!hasSelection())
         return;
     const QString file = selectedFile();
     if (!desktop::ask("You are about to remove "_L1 + file + " without loading into the system. Are you SURE ?"_L1,
@@ -438,19 +419,114 @@ void frmMessageList::Command6_Click()
     RefreshList();
 }
 
+void frmMessageList::txtFind_Change()
+{
+    const QString chosen = selectedFile();
+    messages->search(txtFind->text());
+    if (messages->rowCount() == 0)
+        sCurFile.clear();  // what is not seen can't be reprinted
+    choose(qMax(messages->rowOf(chosen), 0));
+    lblStatus->setText(status());
+}
+
+// A refresh that the user asks for keeps the user's place, other than those that follow a load or a deletion.
+void frmMessageList::Form_KeyRefresh()
+{
+    const QString chosen = selectedFile();
+    RefreshList();
+    choose(qMax(messages->rowOf(chosen), 0));
+}
+
+void frmMessageList::Form_Paste()
+{
+    const QMimeData* clipboard = QGuiApplication::clipboard()->mimeData();
+    if (iFolder != Unread)
+        lblStatus->setText(u"Files are taken in while the unread messages are shown."_s);
+    else if (!clipboard || !clipboard->hasUrls())
+        lblStatus->setText(u"The clipboard holds no files."_s);
+    else
+        takeIn(clipboard->urls());
+}
+
+void frmMessageList::dragEnterEvent(QDragEnterEvent* event)
+{
+    if (iFolder != Unread || busy || !event->mimeData()->hasUrls())
+        return;
+    event->setDropAction(Qt::CopyAction);  // whoever drags must not take the files away
+    event->accept();
+    lblStatus->setText(u"Let go to take the files in."_s);
+}
+
+void frmMessageList::dragLeaveEvent(QDragLeaveEvent*)
+{
+    lblStatus->setText(status());
+}
+
+void frmMessageList::dropEvent(QDropEvent* event)
+{
+    event->setDropAction(Qt::CopyAction);
+    event->accept();
+    // after the drop: a box would keep the program that the files come from waiting
+    QTimer::singleShot(0, this, [this, brought = event->mimeData()->urls()] {
+        desktop::guarded(u"frmMessageList.ListView1_OLEDragDrop"_s, [&] { takeIn(brought); });
+    });
+}
+
+void frmMessageList::takeIn(const QList<QUrl>& brought)
+{
+    const QScopedValueRollback taking(busy, busy + 1);
+    QStringList paths;
+    QStringList refused;
+    for (const QUrl& file : brought) {
+        if (file.isLocalFile())
+            paths.append(file.toLocalFile());
+        else
+            refused.append(file.toDisplayString() + ": it does not lie on this computer"_L1);
+    }
+    TakenIn taken;
+    {
+        desktop::Progress progress(windowTitle(), u"Taking the files in..."_s, prgFill);
+        taken = TakeInFiles(paths, [&](qint64 done, qint64 total) { progress.step(done, total); });
+    }
+    Form_KeyRefresh();
+    lblStatus->setText(taken.summary() + u' ' + lblStatus->text());
+    refused += taken.refused;
+    if (!refused.isEmpty())
+        desktop::msgBox("Not taken in:\n"_L1 + withoutMore(refused), desktop::Icon::Exclamation);
+}
+
+bool frmMessageList::hasSelection() const
+{
+    return ListView1->currentIndex().isValid();
+}
+
 QString frmMessageList::selectedFile() const
 {
-    return ListView1->currentItem()->text(FileColumn);
+    return hasSelection() ? messages->file(ListView1->currentIndex().row()) : QString();
+}
+
+// As a click on the row; nothing where there is none.
+void frmMessageList::choose(int row)
+{
+    ListView1->setCurrentIndex(messages->index(row, 0));
 }
 
 // As a click on the file's row; false where the list does not show it.
 bool frmMessageList::select(const QString& file)
 {
-    const QList<QTreeWidgetItem*> found = ListView1->findItems(file, Qt::MatchFixedString);
-    if (found.isEmpty())
+    const int row = messages->rowOf(file);
+    if (row < 0)
         return false;
-    ListView1->setCurrentItem(found.first());
+    choose(row);
     return true;
+}
+
+// The order that is remembered from the last time is there only now.
+void frmMessageList::showEvent(QShowEvent* event)
+{
+    Form::showEvent(event);
+    if (!event->spontaneous())
+        choose(0);
 }
 
 }  // namespace kest

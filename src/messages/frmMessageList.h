@@ -13,10 +13,11 @@ class QProgressBar;
 class QPushButton;
 class QRadioButton;
 class QTimer;
-class QTreeWidget;
-class QTreeWidgetItem;
+class QTreeView;
 
 namespace kest {
+
+class MessageListModel;
 
 class frmMessageList final : public desktop::Form {
     Q_OBJECT
@@ -44,13 +45,19 @@ public:
 
     void RefreshList();
 
-    /// The rows of the last fill, and what ended it before its end; empty after a whole fill.
-    const QList<ListedMessage>& rows() const { return listed; }
+    /// The rows of the last fill, whatever is searched for, and what ended it before its end; empty after a whole fill.
+    const QList<ListedMessage>& rows() const;
     const QString& failure() const { return fillFailure; }
+
+protected:
+    void showEvent(QShowEvent* event) override;
+    void dragEnterEvent(QDragEnterEvent* event) override;
+    void dragLeaveEvent(QDragLeaveEvent* event) override;
+    void dropEvent(QDropEvent* event) override;
 
 private:
     void Option1_Click(int index);
-    void ListView1_ItemClick(const QTreeWidgetItem& item);
+    void ListView1_ItemClick(int row);
     void ListView1_DblClick();
     void cmdProcess_Click();
     void cmdView_Click();
@@ -58,16 +65,20 @@ private:
     void Command1_Click();
     void Command6_Click();
     void tmrRefresh_Timer();
+    void txtFind_Change();
+    void Form_KeyRefresh();
+    void Form_Paste();
 
     void buildControls();
     void arrange();
     void connectControls();
     void fill();
-    void showRows();
-    void showProgress(qint64 done, qint64 total);
     QString status() const;
     bool load(const QString& file);
+    void takeIn(const QList<QUrl>& brought);
+    bool hasSelection() const;
     QString selectedFile() const;
+    void choose(int row);
     bool select(const QString& file);
 
     std::array<QRadioButton*, 3> Option1;
@@ -76,7 +87,9 @@ private:
     QLabel* Label1;
     QLineEdit* txtFilter;
     QPushButton* Command1;
-    QTreeWidget* ListView1;
+    QLineEdit* txtFind;
+    QTreeView* ListView1;
+    MessageListModel* messages;
     QLabel* lblStatus;
     QProgressBar* prgFill;
     QPushButton* cmdProcess;
@@ -88,7 +101,6 @@ private:
 
     QString sCurFile;  // last clicked in the list
     int iFolder = Unread;
-    QList<ListedMessage> listed;
     QString fillFailure;
     int busy = 0;  // fills and loads on the way; a delayed refresh waits for their end
 };

@@ -11,6 +11,7 @@
 #include <QCloseEvent>
 #include <QComboBox>
 #include <QFormLayout>
+#include <QHBoxLayout>
 #include <QHeaderView>
 #include <QKeyEvent>
 #include <QLabel>
@@ -82,24 +83,28 @@ void frmExtraInfo::build()
     auto* layout = static_cast<QFormLayout*>(this->layout());
     cmbTransmission->setObjectName("cmbTransmission"_L1);
     cmbTransmission->addItems({u"Automatic"_s, u"Manual"_s});
-    layout->addRow(u"Transmission:"_s, cmbTransmission);
-    txtVIN = addField("txtVIN", u"VIN:"_s);
-    txtOdometer = addField("txtOdometer", u"Odometer:"_s);
-    txtColour = addField("txtColour", u"Colour:"_s);
-    txtCylinders = addField("txtCylinders", u"Cylinders:"_s);
-    txtFuel = addField("txtFuel", u"Fuel Level (%):"_s);
+    layout->addRow(u"&Transmission:"_s, cmbTransmission);
+    txtVIN = addField("txtVIN", u"&VIN:"_s);
+    txtOdometer = addField("txtOdometer", u"&Odometer:"_s);
+    txtColour = addField("txtColour", u"&Colour:"_s);
+    txtCylinders = addField("txtCylinders", u"C&ylinders:"_s);
+    txtFuel = addField("txtFuel", u"&Fuel Level (%):"_s);
     txtFuel->setValidator(new QRegularExpressionValidator(QRegularExpression(u"[0-9]*"_s), txtFuel));
-    txtBuildMonth = addField("txtBuildMonth", u"Build Month"_s);
-    txtBuildYear = addField("txtBuildYear", u"Build Year"_s);
-    txtDamageDesc = addField("txtDamageDesc", u"Damage Description:"_s);
-    txtOldDamageDesc = addField("txtOldDamageDesc", u"Old Damage Description:"_s);
+    txtBuildMonth = addField("txtBuildMonth", u"Build &Month"_s);
+    txtBuildYear = addField("txtBuildYear", u"Build Yea&r"_s);
+    txtDamageDesc = addField("txtDamageDesc", u"&Damage Description:"_s);
+    txtOldDamageDesc = addField("txtOldDamageDesc", u"O&ld Damage Description:"_s);
     txtDamageDesc->setMinimumWidth(desktop::pixels(5400));
-    Command1 = new QPushButton(u"Done"_s);
+    Command1 = new QPushButton(u"Do&ne"_s);
     Command1->setObjectName("Command1"_L1);
-    layout->addRow(Command1);
+    auto* buttons = new QHBoxLayout;
+    buttons->addStretch();
+    buttons->addWidget(Command1);
+    layout->addRow(buttons);
 
     lvColour = new QTreeWidget(this);
     lvColour->setObjectName("lvColour"_L1);
+    lvColour->setAccessibleName(u"Colours"_s);
     lvColour->setHeaderLabel(u"Colour"_s);
     lvColour->setRootIsDecorated(false);
     lvColour->hide();
@@ -115,7 +120,9 @@ void frmExtraInfo::build()
     drop->setToolTip(u"Show the colours (F4)"_s);
     drop->setShortcut(Qt::Key_F4);
     drop->setShortcutContext(Qt::WidgetShortcut);
-    txtColour->findChild<QToolButton*>()->setObjectName("cmdColour"_L1);
+    auto* cmdColour = txtColour->findChild<QToolButton*>();
+    cmdColour->setObjectName("cmdColour"_L1);
+    cmdColour->setAccessibleName(u"Show the colours"_s);
     desktop::onEvent(drop, &QAction::triggered, this, u"frmExtraInfo.txtColour_ButtonClick"_s,
                      [this] { txtColour_ButtonClick(); });
     desktop::onEvent(txtColour, &QLineEdit::textEdited, this, u"frmExtraInfo.txtColour_Change"_s,

@@ -1,6 +1,7 @@
 #include "outbound/frmSubletAuth.h"
 
 #include "outbound/frmViewPDF.h"
+#include "platform/desktop/Lists.h"
 #include "platform/desktop/Script.h"
 #include "platform/desktop/Window.h"
 
@@ -33,10 +34,9 @@ frmSubletAuth::frmSubletAuth(const QList<SubletDocument>& documents)
     ListView1->setObjectName("ListView1"_L1);
     ListView1->setAccessibleName(u"Documents"_s);
     ListView1->setHeaderLabels({u"Description"_s, u"Vendor"_s});
-    ListView1->setRootIsDecorated(false);
-    ListView1->setAllColumnsShowFocus(true);
-    ListView1->setAlternatingRowColors(true);
+    desktop::prepareList(*ListView1, objectName());
     ListView1->header()->resizeSection(0, desktop::pixels(5000));
+    ListView1->header()->setStretchLastSection(true);
     for (const SubletDocument& document : documents) {
         auto* item = new QTreeWidgetItem(ListView1, {document.description, document.vendor});
         item->setData(0, keyRole, u'K' + document.lineNumber);

@@ -30,6 +30,7 @@ constexpr double largestZoom = 8;
 constexpr int printResolution = 300;  // dots per inch
 constexpr double pointsPerInch = 72;
 constexpr int rightMargin = 150;  // twips
+constexpr int stripMargin = 75;   // twips
 
 QString whyNotOpened(QPdfDocument::Error error)
 {
@@ -92,7 +93,8 @@ QWidget* frmViewPDF::tools()
 {
     auto* strip = new QWidget(this);
     auto* row = new QHBoxLayout(strip);
-    row->setContentsMargins({});
+    row->setContentsMargins({desktop::pixels(stripMargin), 0, desktop::pixels(stripMargin), 0});
+    row->setSpacing(0);
     const auto turn = [this](int pages) {
         return [this, pages] { goTo(AcroPDF1->pageNavigator()->currentPage() + pages); };
     };

@@ -105,12 +105,12 @@ frmPrintPreview::frmPrintPreview(const report::Report& report)
     cmdExit->setObjectName(u"cmdExit"_s);
     cmdExit->resize(cmdExit->sizeHint());
     desktop::onEvent(cmdExit, &QPushButton::clicked, this, u"frmPrintPreview.cmdExit_Click"_s, [this] { close(); });
-    setMinimumSize(desktop::pixels(6000, 4500));
     resize(desktop::pixels(13500, 11250));
     crvPreview->hide();
     crvPreview->setReport(report);
     crvPreview->show();
     crvPreview->setFocus();
+    setMinimumSize(crvPreview->minimumSizeHint().width(), desktop::pixels(4500));
     SetDefaultPointer();
 }
 

@@ -58,7 +58,6 @@ frmKEST::frmKEST() : Form(u"frmKEST"_s, u"ORLA Partner Network"_s)
     desktop::onEvent(cmdOK, &QPushButton::clicked, this, u"frmKEST.cmdOK_Click"_s, [this] { cmdOK_Click(); });
 
     cmdExit = desktop::exitButton(this, u"cmdExit"_s, u"Close the panel"_s);
-    cmdExit->setShortcut(QKeySequence(u"Alt+X"_s));
     desktop::onEvent(cmdExit, &QPushButton::clicked, this, u"frmKEST.cmdExit_Click"_s, [this] { close(); });
 
     auto* buttons = new QHBoxLayout;

@@ -1,12 +1,21 @@
 #include "messages/frmMessageList.h"
+#include "platform/desktop/Gestures.h"
 #include "platform/files/files.h"
 #include "shell/SharedVariables.h"
 #include "shell/modLoggerEx.h"
+#include "support/Hands.h"
 #include "support/Shop.h"
 
+#include <QClipboard>
+#include <QDropEvent>
+#include <QGuiApplication>
+#include <QHeaderView>
 #include <QJsonObject>
+#include <QLabel>
+#include <QLineEdit>
+#include <QMimeData>
 #include <QPushButton>
-#include <QTreeWidget>
+#include <QTreeView>
 
 using namespace Qt::StringLiterals;
 
@@ -199,12 +208,146 @@ TEST_F(MessageListWindow, TheFirstRowShownIsChosenWhateverTheOrder)
     EXPECT_EQ(listed(), "a.xml b10.xml b9.xml");
 
     frmMessageList window;
-    auto* list = window.findChild<QTreeWidget*>();
+    auto* list = window.findChild<QTreeView*>();
     list->sortByColumn(0, Qt::DescendingOrder);
     window.open();
-    EXPECT_EQ(list->topLevelItem(0)->text(0), u"b10.xml"_s);
-    EXPECT_EQ(list->currentItem(), list->topLevelItem(0));
+    EXPECT_EQ(list->model()->index(0, 0).data(), u"b10.xml"_s);
+    EXPECT_EQ(list->currentIndex().row(), 0);
     EXPECT_TRUE(window.findChild<QPushButton*>(u"cmdProcess"_s)->isEnabled()) << "as if it had been clicked";
+}
+
+// Three messages of which the search tells one from the others in every way.
+struct Searched : MessageListWindow {
+    Searched()
+    {
+        arrive("a.xml", quoteRequest("QR1").rego("ABC123").set("corporateCustomer", "Tarrant Tyres"));
+        arrive("b.xml", quoteRequest("QR2").rego("XYZ789").set("corporateCustomer", "Holloway Haulage"));
+        arrive("c.xml", cancellation("QR3"));
+    }
+};
+
+TEST_F(Searched, WhatIsTypedInTheListLeavesTheRowsThatHoldIt)
+{
+    struct {
+        const char* keys;
+        const char* rows;
+        const char* line;
+        const char* chosen;  // what "Load" asks for then
+    } const cases[] = {
+        {R"("X", "Y")", "b.xml", "1 of 3 messages", "b.xml"},
+        {R"("H", "O", "L", "L")", "b.xml", "1 of 3 messages", "b.xml"},
+        {R"("R", "E", "Q", "U", "E", "S", "T", "Down")", "a.xml b.xml c.xml", "3 of 3 messages", "b.xml"},
+        {R"("Q", "U", "O", "T", "E", " ", "R", "Down")", "a.xml b.xml c.xml", "3 of 3 messages", "b.xml"},
+        {R"("Z", "Z")", "", "0 of 3 messages", ""},
+        {R"("Z", "Z", "Backspace", "Backspace", "T", "A", "R", "R")", "a.xml", "1 of 3 messages", "a.xml"},
+        {R"("X", "Y", "Escape")", "a.xml b.xml c.xml", "3 messages", "b.xml"},
+    };
+    for (const auto& [keys, rows, line, chosen] : cases) {
+        visit({R"({"key": "ListView1", "keys": [)" + std::string(keys) + "]}", readAll, click("Command6")});
+        EXPECT_EQ(listed(), rows) << keys;
+        EXPECT_EQ(text(0, "lblStatus"), line) << keys;
+        const QStringList asked = desktop->boxTexts();
+        EXPECT_EQ(asked.join(u' ').section(u' ', 5, 5).toStdString(), chosen) << keys;
+    }
+}
+
+TEST_F(Searched, OutlivesARefreshAndEndsWithTheFolder)
+{
+    visit({type("txtFind", "abc"), key("frmMessageList", "F5"), readAll, type("txtFind", "zz"), click("cmdProcess"),
+           click("cmdView"), click("Option1(1)"), click("cmdPrint"), click("Option1(0)"), readAll});
+    EXPECT_EQ(listed(0), "a.xml");
+    EXPECT_EQ(listed(1), "a.xml b.xml c.xml");
+    EXPECT_EQ(desktop->boxes(), QStringList()) << "a row that is not shown is neither loaded nor viewed";
+    EXPECT_EQ(filesIn(gsUnreadPath).size(), 3);
+}
+
+TEST_F(Searched, OrderWidthsAndPlaceOutliveARefreshAndOrderAndWidthsTheWindow)
+{
+    const auto shownFile = [](QTreeView& list) { return list.currentIndex().siblingAtColumn(0).data().toString(); };
+    const auto headers = [](QTreeView& list) {
+        const QHeaderView& header = *list.header();
+        return QString(u"%1 %2 %3"_s)
+            .arg(header.sectionSize(2))
+            .arg(header.sortIndicatorSection())
+            .arg(header.sortIndicatorOrder());
+    };
+    const auto press = [](QWidget& window, QKeyCombination key) { desktop::gestures::press(window, key); };
+    const auto work = [&](QDialog& window) {
+        auto& list = control<QTreeView>(window, "ListView1");
+        press(window, Qt::CTRL | Qt::Key_1);
+        press(window, Qt::CTRL | Qt::Key_1);
+        list.header()->resizeSection(2, 177);
+        EXPECT_EQ(list.model()->index(0, 0).data(), u"c.xml"_s) << "the second time turns the order round";
+        press(list, Qt::Key_Home);
+        press(list, Qt::Key_Down);
+        for (const QKeyCombination key :
+             {QKeyCombination(Qt::Key_F5), Qt::CTRL | Qt::Key_3, Qt::CTRL | Qt::Key_1, Qt::CTRL | Qt::Key_1}) {
+            press(window, key);
+            EXPECT_EQ(shownFile(list), u"b.xml"_s) << key.toCombined();
+        }
+        press(window, Qt::Key_F5);
+        EXPECT_EQ(headers(list), u"177 0 1"_s);
+    };
+    const test::Hands hands({{u"frmMessageList"_s, work}});
+    frmMessageList::ShowForm();
+    const test::Hands again({{u"frmMessageList"_s, [&](QDialog& window) {
+                                  auto& list = control<QTreeView>(window, "ListView1");
+                                  EXPECT_EQ(headers(list), u"177 0 1"_s);
+                                  EXPECT_EQ(shownFile(list), u"c.xml"_s) << "the first row of that order";
+                              }}});
+    frmMessageList::ShowForm();
+}
+
+/// Files on a stick, as a mouse or the clipboard brings them.
+std::unique_ptr<QMimeData> stick(const QString& root, std::initializer_list<std::pair<QString, QString>> files)
+{
+    QList<QUrl> urls;
+    for (const auto& [name, content] : files) {
+        files::makeFolder(root + u"/stick"_s);
+        files::write(root + u"/stick/"_s + name, content);
+        urls.append(QUrl::fromLocalFile(root + u"/stick/"_s + name));
+    }
+    auto data = std::make_unique<QMimeData>();
+    data->setUrls(urls);
+    return data;
+}
+
+TEST_F(Searched, FilesAreDroppedOrPastedWhileTheUnreadMessagesAreShown)
+{
+    const auto drop = [](QDialog& window, const QMimeData& data) {
+        QWidget& list = *control<QTreeView>(window, "ListView1").viewport();
+        QDragEnterEvent enters(QPoint(9, 9), Qt::MoveAction | Qt::CopyAction, &data, Qt::LeftButton, Qt::NoModifier);
+        QCoreApplication::sendEvent(&list, &enters);
+        if (!enters.isAccepted())
+            return false;
+        QDropEvent drops(QPoint(9, 9), Qt::MoveAction | Qt::CopyAction, &data, Qt::LeftButton, Qt::NoModifier);
+        QCoreApplication::sendEvent(&list, &drops);
+        EXPECT_EQ(drops.dropAction(), Qt::CopyAction);
+        desktop::gestures::settle();
+        return true;
+    };
+    const auto paste = [](QDialog& window, std::unique_ptr<QMimeData> data) {
+        QGuiApplication::clipboard()->setMimeData(data.release());
+        desktop::gestures::press(window, Qt::CTRL | Qt::Key_V);
+        return control<QLabel>(window, "lblStatus").text();
+    };
+    const test::Hands hands(
+        {{u"frmMessageList"_s, [&](QDialog& window) {
+              EXPECT_TRUE(drop(window, *stick(root(), {{u"d.xml"_s, cancellation("QR4").text()}, {u"e.doc"_s, {}}})));
+              EXPECT_EQ(control<QLabel>(window, "lblStatus").text(), u"Taken in: 1 message. 4 messages"_s);
+              EXPECT_EQ(paste(window, stick(root(), {{u"QR1_001.jpg"_s, {}}})), u"Taken in: 1 picture. 4 messages"_s);
+              EXPECT_EQ(paste(window, std::make_unique<QMimeData>()), u"The clipboard holds no files."_s);
+              control<QAbstractButton>(window, "Option1(1)").click();
+              EXPECT_FALSE(drop(window, *stick(root(), {{u"f.xml"_s, cancellation("QR5").text()}})));
+              EXPECT_EQ(paste(window, stick(root(), {{u"f.xml"_s, cancellation("QR5").text()}})),
+                        u"Files are taken in while the unread messages are shown."_s);
+          }}});
+    frmMessageList::ShowForm();
+    EXPECT_EQ(filesIn(gsUnreadPath).join(u' '), u"a.xml b.xml c.xml d.xml QR1_001.jpg"_s);
+    EXPECT_EQ(filesIn(root() + u"/stick"_s).size(), 4) << "nothing leaves the place that it comes from";
+    EXPECT_EQ(shown(),
+              "[exclamation] Not taken in:\n"
+              "e.doc: it is no message, picture (.jpg) or description (.txt)");
 }
 
 TEST_F(MessageListWindow, AFileThatHasGoneOrLiesElsewhereIsNotLoaded)

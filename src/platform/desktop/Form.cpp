@@ -51,6 +51,8 @@ void Form::keyPressEvent(QKeyEvent* event)
 {
     if (event->matches(QKeySequence::Cancel))
         close();
+    else if (event->key() == Qt::Key_Tab && event->modifiers() == Qt::ControlModifier)
+        focusNextChild();  // out of a text in which Tab is a character
     else
         QDialog::keyPressEvent(event);
 }
@@ -68,6 +70,7 @@ QPushButton* exitButton(QWidget* parent, const QString& name, const QString& tip
     button->setIconSize({pictureSize, pictureSize});
     button->setToolTip(tip);
     button->setAccessibleName(tip);
+    button->setShortcut(QKeySequence(Qt::ALT | Qt::Key_X));
     button->setAutoDefault(false);
     return button;
 }

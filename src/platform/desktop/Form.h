@@ -20,7 +20,7 @@ protected:
     void showEvent(QShowEvent* event) override;
 };
 
-/// A button with a picture of the way out in place of a caption; `tip` is shown, and read out, in its place.
+/// A button with a picture of the way out in place of a caption, and Alt+X for it; `tip` is shown, and read out.
 QPushButton* exitButton(QWidget* parent, const QString& name, const QString& tip = QStringLiteral("Close"));
 
 /// The picture of a list that drops down, in the colour of the text.

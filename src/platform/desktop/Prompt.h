@@ -66,11 +66,4 @@ private:
     QByteArray utf8_;
 };
 
-/// Work over half a second shows how far it is: called with what was done and how much there is.
-class Progress {
-public:
-    virtual ~Progress() = default;
-    virtual void step(qint64 done, qint64 total) = 0;
-};
-
 }  // namespace kest::desktop

@@ -3,10 +3,12 @@
 #include "platform/desktop/WindowLayout.h"
 
 #include <QApplication>
+#include <QFontMetricsF>
 #include <QPointer>
 #include <QScreen>
 #include <QWindow>
 
+#include <algorithm>
 #include <exception>
 
 namespace kest::desktop {
@@ -50,10 +52,13 @@ private:
     QPointer<QWidget> caller;
 };
 
-double dotsPerInch()
+/// Pixels of a twip at the screen's resolution, and more of them where the font is larger than usual.
+double scale()
 {
+    constexpr double usualLine = 270;  // twips of a line of text up to which the font is a usual one
     const QScreen* screen = QGuiApplication::primaryScreen();
-    return screen ? screen->logicalDotsPerInch() : 96;
+    const double ofScreen = (screen ? screen->logicalDotsPerInch() : 96) / twipsPerInch;
+    return std::max(ofScreen, QFontMetricsF(QApplication::font()).height() / usualLine);
 }
 
 }  // namespace
@@ -110,7 +115,7 @@ void throwKept()
 
 int pixels(int twips)
 {
-    return qRound(twips * dotsPerInch() / twipsPerInch);
+    return qRound(twips * scale());
 }
 
 QSize pixels(int widthTwips, int heightTwips)
@@ -120,7 +125,7 @@ QSize pixels(int widthTwips, int heightTwips)
 
 int twips(int pixels)
 {
-    return qRound(pixels * twipsPerInch / dotsPerInch());
+    return qRound(pixels / scale());
 }
 
 void centre(QWidget& window)

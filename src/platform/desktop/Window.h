@@ -53,7 +53,7 @@ void onEvent(Sender* sender, Signal signal, QObject* window, const QString& sour
     });
 }
 
-/// Sizes in twips (1/1440 inch) as pixels at the screen's logical resolution, and back.
+/// Sizes in twips (1/1440 inch) as pixels, and back: at the screen's logical resolution, larger where the font is.
 int pixels(int twips);
 QSize pixels(int widthTwips, int heightTwips);
 int twips(int pixels);

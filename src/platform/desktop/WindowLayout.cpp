@@ -1,5 +1,6 @@
 #include "platform/desktop/WindowLayout.h"
 
+#include "platform/desktop/Window.h"
 #include "platform/profile.h"
 
 #include <QDialog>
@@ -32,7 +33,7 @@ QStringList widths(const QHeaderView& header)
 {
     QStringList result;
     for (int column = 0; column < header.count(); ++column)
-        result.append(QString::number(isFree(header, column) ? header.sectionSize(column) : 0));
+        result.append(QString::number(isFree(header, column) ? twips(header.sectionSize(column)) : 0));
     return result;
 }
 
@@ -43,7 +44,7 @@ void setWidths(QHeaderView& header, const QStringList& widths)
     for (int column = 0; column < header.count(); ++column) {
         const int width = widths[column].toInt();
         if (width > 0 && isFree(header, column))
-            header.resizeSection(column, width);
+            header.resizeSection(column, pixels(width));
     }
 }
 
@@ -75,9 +76,11 @@ void WindowLayout::restore()
 {
     QSettings file(layoutFile(), QSettings::IniFormat);
     file.beginGroup(window.objectName());
-    const QSize size = file.value(u"size"_s).toSize();
+    const QSize size = file.value(u"size"_s).toSize();  // in twips, as the widths, so that both follow the scale
     if (size.isValid())
-        window.resize(size.expandedTo(window.minimumSizeHint()).boundedTo(window.screen()->availableSize()));
+        window.resize(pixels(size.width(), size.height())
+                          .expandedTo(window.minimumSizeHint())
+                          .boundedTo(window.screen()->availableSize()));
     const QMap<QString, QHeaderView*> lists = headers();
     for (auto list = lists.begin(); list != lists.end(); ++list) {
         setWidths(*list.value(), file.value(list.key() + u"/columns"_s).toStringList());
@@ -94,7 +97,7 @@ void WindowLayout::remember() const
     QSettings file(layoutFile(), QSettings::IniFormat);
     file.beginGroup(window.objectName());
     if (after.size != before.size && !window.isMaximized())
-        file.setValue(u"size"_s, after.size);
+        file.setValue(u"size"_s, QSize(twips(after.size.width()), twips(after.size.height())));
     for (auto list = after.columns.begin(); list != after.columns.end(); ++list)
         if (list.value() != before.columns.value(list.key()))
             file.setValue(list.key() + u"/columns"_s, list.value());

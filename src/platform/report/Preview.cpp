@@ -36,16 +36,20 @@ Preview::Preview(QWidget* parent, const std::function<void()>& print)
     all->setContentsMargins({});
     all->setSpacing(0);
     auto* row = new QHBoxLayout;
+    row->setSpacing(0);  // all tools side by side on a small screen too
     all->addLayout(row);
     all->addWidget(view, 1);
     addTools(*row, print);
     lblPage->setObjectName(u"lblPage"_s);
+    lblPage->setContentsMargins({desktop::pixels(90), 0, desktop::pixels(90), 0});
+    lblPage->setMinimumWidth(lblPage->fontMetrics().horizontalAdvance(u"Page 88 of 88"_s) + desktop::pixels(180));
     row->addWidget(lblPage);
     row->addStretch();
 
     view->setViewMode(QPrintPreviewWidget::SinglePageView);
     view->setZoomMode(QPrintPreviewWidget::FitToWidth);
     sheet->setObjectName(u"crvPages"_s);
+    sheet->setAccessibleName(u"Report"_s);
     sheet->installEventFilter(this);
     setFocusProxy(sheet);
     const QString source = u"frmPrintPreview.crvPreview_View"_s;
@@ -72,7 +76,7 @@ void Preview::addTools(QHBoxLayout& row, const std::function<void()>& print)
         addTool(row, QString::fromLatin1(name), QString::fromLatin1(caption), QString::fromLatin1(hint), keys, action);
     };
     add("cmdPrint", "Print...", "Print", QKeySequence::Print, print);
-    add("cmdSave", "Save as PDF...", "Save as a PDF file", QKeySequence::Save, [this] { saveAsPdf(); });
+    add("cmdSave", "Save PDF...", "Save as a PDF file", QKeySequence::Save, [this] { saveAsPdf(); });
     add("cmdFirst", "First", "First page", Qt::CTRL | Qt::Key_Home, [this] { goTo(1); });
     add("cmdPrevious", "Previous", "Previous page", Qt::CTRL | Qt::Key_PageUp,
         [this] { goTo(view->currentPage() - 1); });
@@ -81,7 +85,7 @@ void Preview::addTools(QHBoxLayout& row, const std::function<void()>& print)
     add("cmdZoomIn", "Zoom in", "Larger", QKeySequence::ZoomIn, [this] { view->zoomIn(zoomStep); });
     add("cmdZoomOut", "Zoom out", "Smaller", QKeySequence::ZoomOut, [this] { view->zoomOut(zoomStep); });
     add("cmdFitWidth", "Fit width", "As wide as the window", Qt::CTRL | Qt::Key_0, [this] { view->fitToWidth(); });
-    add("cmdFitPage", "Whole page", "The whole page", Qt::CTRL | Qt::Key_1, [this] { view->fitInView(); });
+    add("cmdFitPage", "Fit page", "The whole page", Qt::CTRL | Qt::Key_1, [this] { view->fitInView(); });
 }
 
 void Preview::addTool(QHBoxLayout& row, const QString& name, const QString& caption, const QString& hint,

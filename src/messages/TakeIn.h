@@ -1,0 +1,27 @@
+// Takes files that a person brings, by mail or on a stick, into the unread folder, as the transport would have done.
+#pragma once
+
+#include <QStringList>
+
+#include <functional>
+
+namespace kest {
+
+/// What became of the files.
+struct TakenIn {
+    int messages = 0;
+    int pictures = 0;
+    int descriptions = 0;
+    QStringList refused;  // "name: why"
+
+    /// "Taken in: 2 messages, 1 picture."
+    QString summary() const;
+};
+
+/// Copies messages, and the pictures and descriptions of requests, under their own names; each appears whole or not at
+/// all, and what belongs to a message before it. Paths are those of this system. Nothing is taken away where it lay.
+/// Before a file of the same name is replaced a box asks. What is no such file, and what could not be copied, is
+/// refused and the others go on.
+TakenIn TakeInFiles(const QStringList& paths, const std::function<void(qint64 done, qint64 total)>& progress = {});
+
+}  // namespace kest
