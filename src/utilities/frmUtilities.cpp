@@ -100,7 +100,6 @@ QWidget* frmUtilities::quoteInformation()
         text->setMinimumWidth(desktop::pixels(2400));
         if (!field.editable) {
             text->setReadOnly(true);
-            text->setFocusPolicy(Qt::ClickFocus);
             QPalette colours = text->palette();
             colours.setColor(QPalette::Base, colours.color(QPalette::Window));
             text->setPalette(colours);

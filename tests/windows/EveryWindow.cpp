@@ -1,0 +1,161 @@
+#include "windows/EveryWindow.h"
+
+#include "messages/frmMessageList.h"
+#include "outbound/frmExtraInfo.h"
+#include "outbound/frmSubletAuth.h"
+#include "outbound/frmViewPDF.h"
+#include "platform/desktop/Gestures.h"
+#include "platform/files/files.h"
+#include "reports/frmPrintPreview.h"
+#include "shell/SharedVariables.h"
+#include "support/Hands.h"
+#include "utilities/frmLogin.h"
+#include "utilities/frmUtilities.h"
+#include "utilities/frmViewXML.h"
+
+#include <QAbstractButton>
+#include <QAbstractItemView>
+#include <QComboBox>
+#include <QLineEdit>
+#include <QPainter>
+#include <QPdfWriter>
+#include <QPlainTextEdit>
+#include <QScrollBar>
+#include <QTabBar>
+#include <QTimer>
+
+namespace kest::test {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+const QString document = u"c:\\wirdoc\\PDF\\500.0_1.pdf"_s;
+
+void makeDocument()
+{
+    QPdfWriter writer(files::systemPath(document));
+    QPainter painter(&writer);
+    painter.drawText(2000, 2000, u"Authority for sublet work"_s);
+}
+
+bool isBuiltIn(const QWidget& widget)
+{
+    for (const QWidget* above = widget.parentWidget(); above && !above->isWindow(); above = above->parentWidget())
+        if (qobject_cast<const QLineEdit*>(above) || qobject_cast<const QComboBox*>(above) ||
+            qobject_cast<const QAbstractItemView*>(above) || qobject_cast<const QTabBar*>(above))
+            return true;
+    return false;
+}
+
+bool isControl(const QWidget& widget)
+{
+    const bool isView = qobject_cast<const QAbstractScrollArea*>(&widget) && widget.focusPolicy() != Qt::NoFocus;
+    return isView || qobject_cast<const QAbstractButton*>(&widget) || qobject_cast<const QLineEdit*>(&widget) ||
+           qobject_cast<const QComboBox*>(&widget) || qobject_cast<const QTabBar*>(&widget);
+}
+
+}  // namespace
+
+EveryWindow::EveryWindow()
+{
+    files::makeFolder(u"c:\\wirra32\\report"_s);
+    files::writeBytes(u"c:\\wirra32\\report\\710.html"_s, files::readBytes(KEST_SOURCE_DIR "/templates/710.html"_L1));
+    arrive("a.xml", quoteRequest("QR1"));
+    arrive("b.xml", cancellation("QR2"));
+    files::write(gsReadPath + u"500.xml"_s, quoteRequest("QR1").text());
+    auto row = quote("500");
+    quote("500", 1);
+    row.line(1, "MIS", "Wheel alignment").set("VENDOR", vendor("Straight Track").id());
+    makeDocument();
+}
+
+// Boxes are shown by the system that a person uses: no driver gets between.
+void EveryWindow::showBox(const std::function<void()>& show, const Check& check)
+{
+    desktop::usePerson();
+    QTimer timer;
+    QObject::connect(&timer, &QTimer::timeout, &timer, [&] {
+        auto* box = qobject_cast<QDialog*>(QApplication::activeModalWidget());
+        if (!box)
+            return;
+        timer.stop();
+        desktop::gestures::activate(*box);
+        check(*box);
+        box->close();
+    });
+    timer.start(1);
+    show();
+}
+
+void EveryWindow::each(const Check& check)
+{
+    const auto readFolder = [&](QDialog& window) {
+        window.findChild<QAbstractButton*>(u"Option1(1)"_s)->click();
+        check(window);
+    };
+    const struct {
+        const char* name;
+        const char* title;
+        Check check;
+        std::function<void()> show;
+    } windows[] = {
+        {"frmKEST", "the panel", check, [] { eKEST().ShowKESTWindow(u"500"_s, u"0"_s); }},
+        {"frmMessageList", "the unread list", check, [] { frmMessageList::ShowForm(); }},
+        {"frmMessageList", "the read list", readFolder, [] { frmMessageList::ShowForm(); }},
+        {"frmExtraInfo", "", check, [] { frmExtraInfo::ShowForm(u"500"_s, u"0"_s); }},
+        {"frmSubletAuth", "", check, [] { frmSubletAuth::ShowForm(u"500"_s, u"0"_s); }},
+        {"frmViewPDF", "", check, [] { frmViewPDF::ShowForm(document); }},
+        {"frmPrintPreview", "", check, [] { frmPrintPreview::ShowForm(710, QString(), nullptr); }},
+        {"frmLogin", "", check,
+         [] {
+             bool passed = false;
+             frmLogin::ShowForm(passed);
+         }},
+        {"frmUtilities", "", check, [] { frmUtilities::ShowForm(u"500"_s, u"0"_s); }},
+        {"frmViewXML", "", check,
+         [] {
+             gsCurFolder = gsUnreadPath;
+             frmViewXML::ShowForm(u"a.xml"_s);
+         }},
+    };
+    for (const auto& [name, title, checkOfWindow, show] : windows) {
+        SCOPED_TRACE(std::string(name) + ' ' + title);
+        desktop.emplace();
+        int seen = 0;
+        const Hands hands({{QString::fromLatin1(name), [&](QDialog& window) {
+                                ++seen;
+                                checkOfWindow(window);
+                            }}});
+        show();
+        EXPECT_EQ(seen, 1);
+    }
+    {
+        SCOPED_TRACE("message box");
+        showBox([] { desktop::ask(u"Are you SURE ?"_s, desktop::Icon::Critical); }, check);
+    }
+    {
+        SCOPED_TRACE("input box");
+        showBox([] { desktop::inputBox(u"Enter a Quote Number"_s, u"View KEST Messages"_s); }, check);
+    }
+    desktop.emplace();
+}
+
+QList<QWidget*> controlsOf(const QDialog& window)
+{
+    QList<QWidget*> result;
+    for (QWidget* widget : window.findChildren<QWidget*>())
+        if (isControl(*widget) && widget->isVisible() && widget->isEnabled() && !isBuiltIn(*widget))
+            result.append(widget);
+    return result;
+}
+
+std::string nameOf(const QWidget& control)
+{
+    const QString caption = control.property("text").toString();
+    return (control.objectName() + " ("_L1 + QLatin1StringView(control.metaObject()->className()) + ' '_L1 + caption +
+            ')'_L1)
+        .toStdString();
+}
+
+}  // namespace kest::test

@@ -1,0 +1,277 @@
+// What a person may expect of every window: a key for everything, texts that can be read at any size, names for those
+// who hear what others see.
+#include "platform/desktop/Gestures.h"
+#include "windows/EveryWindow.h"
+
+#include <QAbstractButton>
+#include <QAccessible>
+#include <QAction>
+#include <QApplication>
+#include <QCheckBox>
+#include <QComboBox>
+#include <QGroupBox>
+#include <QHeaderView>
+#include <QLabel>
+#include <QLineEdit>
+#include <QMessageBox>
+#include <QPlainTextEdit>
+#include <QPushButton>
+#include <QRadioButton>
+#include <QStyleOptionButton>
+#include <QStyleOptionComboBox>
+#include <QTabBar>
+#include <QToolButton>
+#include <QTreeView>
+
+namespace kest::test {
+namespace {
+
+using namespace Qt::StringLiterals;
+namespace gestures = desktop::gestures;
+
+// --- Keys ---
+
+QKeySequence accessKeyOf(const QWidget& widget)
+{
+    if (const auto* button = qobject_cast<const QAbstractButton*>(&widget))
+        return button->shortcut();
+    if (const auto* label = qobject_cast<const QLabel*>(&widget); label && label->buddy())
+        return QKeySequence::mnemonic(label->text());
+    return {};
+}
+
+/// All that the Tab key comes by on its way round, from what has the focus when the window opens.
+QSet<const QWidget*> tabRound(QDialog& window)
+{
+    QSet<const QWidget*> met;
+    for (int presses = 0; presses < 50; ++presses) {
+        QWidget* here = QApplication::focusWidget();
+        if (!here || met.contains(here))
+            break;
+        met.insert(here);
+        const auto* text = qobject_cast<const QPlainTextEdit*>(here);
+        gestures::press(window,
+                        text && !text->tabChangesFocus() ? Qt::CTRL | Qt::Key_Tab : QKeyCombination(Qt::Key_Tab));
+    }
+    return met;
+}
+
+/// Of a group of options Tab meets the chosen one alone; the arrow keys lead to its fellows.
+bool isMet(const QWidget& control, const QSet<const QWidget*>& met)
+{
+    const auto isFellow = [&](const QWidget* other) {
+        return qobject_cast<const QRadioButton*>(other) && other->parent() == control.parent();
+    };
+    return met.contains(&control) || (control.focusProxy() && met.contains(control.focusProxy())) ||
+           (qobject_cast<const QRadioButton*>(&control) && std::ranges::any_of(met, isFellow));
+}
+
+TEST_F(EveryWindow, HasAKeyForEveryControl)
+{
+    each([](QDialog& window) {
+        const QSet<const QWidget*> met = tabRound(window);
+        for (const QWidget* control : controlsOf(window))
+            EXPECT_TRUE(isMet(*control, met)) << nameOf(*control);
+        for (const QLineEdit* field : window.findChildren<QLineEdit*>())
+            for (const QAction* button : field->actions())
+                EXPECT_TRUE(!button->shortcut().isEmpty() || field->isClearButtonEnabled()) << nameOf(*field);
+    });
+}
+
+TEST_F(EveryWindow, HasEachAccessKeyOnce)
+{
+    each([](QDialog& window) {
+        QMap<QString, const QWidget*> owners;
+        for (const QWidget* widget : window.findChildren<QWidget*>()) {
+            const QString key = widget->isVisible() ? accessKeyOf(*widget).toString() : QString();
+            if (key.isEmpty())
+                continue;
+            EXPECT_FALSE(owners.contains(key)) << key.toStdString() << ": " << nameOf(*widget);
+            owners.insert(key, widget);
+        }
+        for (const QWidget* control : controlsOf(window)) {
+            const auto* button = qobject_cast<const QAbstractButton*>(control);
+            const bool isOfASystemsBox = qobject_cast<QMessageBox*>(&window) || button == nullptr;
+            const bool hasOtherKeys = qobject_cast<const QToolButton*>(control) ||
+                                      (button && button->text() == "OK"_L1) ||
+                                      (button && button->text() == "Cancel"_L1);
+            EXPECT_TRUE(isOfASystemsBox || hasOtherKeys || !button->shortcut().isEmpty()) << nameOf(*control);
+        }
+    });
+}
+
+TEST_F(EveryWindow, IsLeftByEscapeAsByItsCloseBoxAndTakesEnterWhereItHasADefault)
+{
+    const QMap<QString, QString> defaults{
+        {u"frmKEST"_s, u"cmdOK"_s}, {u"frmSubletAuth"_s, u"Command1"_s}, {u"frmLogin"_s, u"cmdOK"_s}};
+    each([&](QDialog& window) {
+        QString taker;
+        for (const QPushButton* button : window.findChildren<QPushButton*>())
+            if (button->isDefault())
+                taker = button->objectName();
+        if (window.objectName().startsWith("frm"_L1)) {
+            EXPECT_EQ(taker, defaults.value(window.objectName()));
+        }
+        gestures::press(window, Qt::Key_Escape);
+        EXPECT_EQ(window.isVisible(), window.objectName() == "frmExtraInfo"_L1) << "only half the values can't be left";
+        window.hide();
+    });
+}
+
+// --- Sizes ---
+
+QString shownText(QString text)
+{
+    return text.remove(QRegularExpression(u"&(?!&)"_s));
+}
+
+/// The place that a control has for its text.
+QSize placeFor(const QWidget& widget)
+{
+    QStyleOptionButton option;
+    option.initFrom(&widget);
+    const auto inside = [&](QStyle::SubElement element) {
+        return widget.style()->subElementRect(element, &option, &widget).size();
+    };
+    if (qobject_cast<const QRadioButton*>(&widget))
+        return inside(QStyle::SE_RadioButtonContents);
+    if (qobject_cast<const QCheckBox*>(&widget))
+        return inside(QStyle::SE_CheckBoxContents);
+    if (qobject_cast<const QPushButton*>(&widget))
+        return inside(QStyle::SE_PushButtonContents);
+    if (const auto* combo = qobject_cast<const QComboBox*>(&widget)) {
+        QStyleOptionComboBox comboOption;
+        comboOption.initFrom(combo);
+        return combo->style()
+            ->subControlRect(QStyle::CC_ComboBox, &comboOption, QStyle::SC_ComboBoxEditField, combo)
+            .size();
+    }
+    return widget.contentsRect().size();
+}
+
+/// What must be seen whole: a caption, an item, a hint. A value that can be scrolled needs its height alone.
+QString textToSee(const QWidget& widget)
+{
+    if (const auto* button = qobject_cast<const QAbstractButton*>(&widget))
+        return shownText(button->text());
+    if (const auto* combo = qobject_cast<const QComboBox*>(&widget)) {
+        QString widest;
+        for (int i = 0; i < combo->count(); ++i)
+            if (combo->itemText(i).size() > widest.size())
+                widest = combo->itemText(i);
+        return widest;
+    }
+    if (const auto* frame = qobject_cast<const QGroupBox*>(&widget))
+        return shownText(frame->title());
+    if (const auto* field = qobject_cast<const QLineEdit*>(&widget))
+        return field->placeholderText();
+    if (const auto* label = qobject_cast<const QLabel*>(&widget); label && !label->wordWrap())
+        return label->buddy() ? shownText(label->text()) : label->text();
+    return {};
+}
+
+void expectColumnsToFit(const QHeaderView& header)
+{
+    for (int column = 0; column < header.count(); ++column)
+        EXPECT_GE(header.sectionSize(column), header.sectionSizeHint(column))
+            << header.model()->headerData(column, Qt::Horizontal).toString().toStdString();
+}
+
+void expectTabsToFit(const QTabBar& bar)
+{
+    for (int tab = 0; tab < bar.count(); ++tab)
+        EXPECT_GE(bar.tabRect(tab).width(), bar.fontMetrics().horizontalAdvance(shownText(bar.tabText(tab))));
+    EXPECT_TRUE(bar.rect().contains(bar.tabRect(bar.count() - 1)));
+}
+
+void expectToFit(const QWidget& widget)
+{
+    const QSize place = placeFor(widget);
+    const QString text = textToSee(widget);
+    const QSize needed = widget.fontMetrics().size(0, text);
+    if (!text.isEmpty() || qobject_cast<const QLineEdit*>(&widget)) {
+        EXPECT_GE(place.height(), needed.height()) << nameOf(widget);
+        EXPECT_GE(place.width(), text.isEmpty() ? 0 : needed.width()) << nameOf(widget);
+    }
+    if (const auto* label = qobject_cast<const QLabel*>(&widget); label && label->wordWrap()) {
+        EXPECT_GE(label->height(), label->heightForWidth(label->width())) << nameOf(widget);
+    }
+    if (const auto* bar = qobject_cast<const QTabBar*>(&widget))
+        expectTabsToFit(*bar);
+    if (const auto* list = qobject_cast<const QTreeView*>(&widget))
+        expectColumnsToFit(*list->header());
+}
+
+TEST_F(EveryWindow, ShowsItsTextsWholeAtAnySizeOfTheFont)
+{
+    const QFont usual = QApplication::font();
+    for (const double factor : {1.0, 1.5, 2.0}) {
+        QFont font = usual;
+        font.setPointSizeF(usual.pointSizeF() * factor);
+        QApplication::setFont(font);
+        SCOPED_TRACE(factor);
+        each([](QDialog& window) {
+            gestures::settle();
+            QList<const QWidget*> whole;
+            for (const QWidget* widget : window.findChildren<QWidget*>()) {
+                if (!widget->isVisible())
+                    continue;
+                expectToFit(*widget);
+                if (!textToSee(*widget).isEmpty())
+                    whole.append(widget);
+            }
+            for (const QWidget* widget : whole) {
+                const QRect place(widget->mapTo(&window, QPoint()), widget->size());
+                EXPECT_TRUE(window.rect().contains(place)) << nameOf(*widget) << " lies outside of its window";
+                for (const QWidget* other : whole)
+                    EXPECT_TRUE(widget == other || widget->isAncestorOf(other) || other->isAncestorOf(widget) ||
+                                !place.intersects({other->mapTo(&window, QPoint()), other->size()}))
+                        << nameOf(*widget) << " lies over " << nameOf(*other);
+            }
+        });
+    }
+    QApplication::setFont(usual);
+}
+
+// --- Names ---
+
+QAccessible::Role roleOf(const QWidget& control)
+{
+    if (qobject_cast<const QRadioButton*>(&control))
+        return QAccessible::RadioButton;
+    if (qobject_cast<const QCheckBox*>(&control))
+        return QAccessible::CheckBox;
+    if (qobject_cast<const QAbstractButton*>(&control))
+        return QAccessible::PushButton;
+    if (qobject_cast<const QLineEdit*>(&control) || qobject_cast<const QPlainTextEdit*>(&control))
+        return QAccessible::EditableText;
+    if (qobject_cast<const QComboBox*>(&control))
+        return QAccessible::ComboBox;
+    if (qobject_cast<const QTabBar*>(&control))
+        return QAccessible::PageTabList;
+    if (qobject_cast<const QTreeView*>(&control))
+        return QAccessible::Tree;
+    if (qobject_cast<const QGroupBox*>(&control))
+        return QAccessible::Grouping;
+    return QAccessible::Client;
+}
+
+TEST_F(EveryWindow, TellsNameAndRoleOfEveryControl)
+{
+    each([](QDialog& window) {
+        QList<QWidget*> all = controlsOf(window);
+        for (QGroupBox* frame : window.findChildren<QGroupBox*>())
+            if (frame->isVisible())
+                all.append(frame);
+        for (QWidget* control : std::as_const(all)) {
+            QAccessibleInterface* heard = QAccessible::queryAccessibleInterface(control);
+            ASSERT_TRUE(heard) << nameOf(*control);
+            EXPECT_FALSE(heard->text(QAccessible::Name).trimmed().isEmpty()) << nameOf(*control);
+            EXPECT_EQ(heard->role(), roleOf(*control)) << nameOf(*control);
+        }
+        EXPECT_FALSE(window.windowTitle().isEmpty());
+    });
+}
+
+}  // namespace
+}  // namespace kest::test
