@@ -54,7 +54,7 @@ diff "$tmp/recorded" "$tmp/installed" || fail "the files installed are not those
 kest2=$root/usr/bin/kest2
 library=$root/usr/lib/libkest2.so.2
 ! readelf -d "$kest2" "$library" | grep -E 'RPATH|RUNPATH' || fail "a search path of the build is left"
-export LD_LIBRARY_PATH=${library%/*} XDG_RUNTIME_DIR=$tmp
+export LD_LIBRARY_PATH=${library%/*} XDG_RUNTIME_DIR=$tmp QT_QPA_PLATFORM=offscreen
 ldd "$kest2" | grep -q "libkest2.so.2 => $library " || fail "the command does not use the installed library"
 desktop-file-validate "$root/usr/share/applications/kest2.desktop"
 for picture in "$root"/usr/share/icons/hicolor/*/apps/kest2.png; do
