@@ -161,4 +161,37 @@ TEST_F(Command, TheJobLinkPasswordIsNeverStoredInClear)
     EXPECT_EQ(kest2({u"joblink"_s, u"set"_s}).exitCode, app::Usage);
 }
 
+TEST_F(Command, TheTransportCarriesOnceOrUntilItIsToldToEnd)
+{
+    EXPECT_EQ(kest2({u"transport"_s, u"--twice"_s}).exitCode, app::Usage);
+    kest2({u"send"_s, u"1004"_s});
+    const QJsonArray carried = kest2({u"transport"_s, u"--once"_s}).json[u"carried"].toArray();
+    EXPECT_EQ(carried[0][u"direction"].toString() + u' ' + carried[0][u"file"].toString(), u"out 1004.0_1.xml"_s);
+    EXPECT_EQ(carried.last()[u"file"].toString(), u"R_1004_0_620552.xml"_s);
+
+    files::write(app::where()[u"component"_s].toString() + u"/insurer.rules"_s, u"nonsense"_s);
+    EXPECT_EQ(kest2({u"transport"_s, u"--once"_s}).exitCode, app::Refused);
+}
+
+TEST(DemoProfile, HasAKESTWebThatWorksOnItsOwnProfile)
+{
+    TestProfile profile;
+    const QString place = profile.root() + u"/it's a demo"_s;
+    ASSERT_EQ(QProcess::execute(QStringLiteral(KEST_COMMAND), {u"--profile"_s, place, u"init"_s, u"--demo"_s}), 0);
+
+    QProcess web;
+    web.start(place + u"/component/KESTWeb.exe"_s);
+    const QString unread = place + u"/drive_c/wirdoc/AUnread"_s;
+    for (int waited = 0; files::list(unread, u"WEB_*"_s).isEmpty() && waited < 20'000; waited += 20)
+        web.waitForFinished(20);
+    EXPECT_EQ(files::list(unread, u"WEB_*"_s), QStringList(u"WEB_000001_QREQ_20601.xml"_s));
+    EXPECT_EQ(QProcess::execute(QStringLiteral(KEST_COMMAND), {u"--profile"_s, place, u"transport"_s, u"--once"_s}),
+              app::Refused)
+        << "one is enough";
+    web.terminate();
+    EXPECT_TRUE(web.waitForFinished());
+    EXPECT_EQ(web.exitStatus(), QProcess::NormalExit);
+    EXPECT_EQ(web.exitCode(), app::Done);
+}
+
 }  // namespace kest::test

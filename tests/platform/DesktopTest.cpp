@@ -3,6 +3,7 @@
 #include "platform/desktop/Form.h"
 #include "platform/desktop/Gestures.h"
 #include "platform/desktop/Prompt.h"
+#include "platform/files/files.h"
 #include "support/ScriptedDesktop.h"
 #include "support/TestProfile.h"
 
@@ -63,15 +64,16 @@ TEST(Seam, AProgramIsStartedUnderItsHostName)
     const QString trace = profile.root() + u"/started"_s;
     QFile program(profile.driveC() + u"/KESTWeb.exe"_s);
     ASSERT_TRUE(program.open(QIODevice::WriteOnly));
-    program.write("#!/bin/sh\ntouch '" + trace.toUtf8() + "'\n");
+    const QByteArray name = '\'' + trace.toUtf8() + '\'';
+    program.write("#!/bin/sh\nprintf %s \"$KEST2_PROFILE\" > " + name + ".new && mv " + name + ".new " + name + '\n');
     program.close();
 
     EXPECT_THROW(desktop::startProgram(u"c:\\KESTWeb.exe"_s), RuntimeError) << "not marked as a program";
     program.setPermissions(program.permissions() | QFile::ExeOwner);
     desktop::startProgram(u"C:\\kestweb.EXE"_s);
-    for (int waited = 0; !QFile::exists(trace) && waited < 5000; waited += 10)
+    for (int waited = 0; !files::exists(trace) && waited < 5000; waited += 10)
         QThread::msleep(10);
-    EXPECT_TRUE(QFile::exists(trace));
+    EXPECT_EQ(files::read(trace), profile.root()) << "it works on the profile of who started it";
     EXPECT_THROW(desktop::startProgram(u"c:\\missing.exe"_s), RuntimeError);
 }
 

@@ -12,6 +12,8 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
+constexpr int mostLines = 32767;  // of a document
+
 xml::Document parsed(const QString& text)
 {
     xml::Document document;
@@ -87,7 +89,8 @@ QuoteDocument quoteDocument(const QString& text)
     for (int section = 0; section < SectionCount; ++section)
         quote.lines[section] = linesOf(document, bodySections()[section]);
     for (const xml::Node& number : document.selectNodes(u"quoteBody//quoteLineNumber"_s))
-        quote.highestLine = std::max(quote.highestLine, number.text().toInt());
+        if (const int line = number.text().toInt(); line <= mostLines)
+            quote.highestLine = std::max(quote.highestLine, line);
     return quote;
 }
 

@@ -1,6 +1,6 @@
 #include "app/transport/TransportCommand.h"
 
-#include "app/transport/frmTransport.h"
+#include "app/transport/TransportWindow.h"
 #include "platform/RuntimeError.h"
 #include "platform/desktop/Prompt.h"
 #include "platform/files/files.h"
@@ -17,12 +17,12 @@ namespace {
 
 bool showWindow()
 {
-    frmTransport window(transportFolders());
+    TransportWindow window(transportFolders());
     if (!window.claim()) {
         desktop::msgBox(u"KESTWeb is running already."_s, desktop::Icon::Information, u"KESTWeb"_s);
         return false;
     }
-    window.ShowForm();
+    window.run();
     return true;
 }
 

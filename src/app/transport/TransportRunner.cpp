@@ -46,7 +46,10 @@ TransportRunner::TransportRunner(const TransportFolders& all, Heard listener)
     settled.setInterval(settleTime);
     interval.setInterval(slowTime);
     connect(&watcher, &QFileSystemWatcher::directoryChanged, &settled, qOverload<>(&QTimer::start));
-    connect(&settled, &QTimer::timeout, this, [this] { carryNow(); });
+    connect(&settled, &QTimer::timeout, this, [this] {
+        if (!files::list(folders.unsent).isEmpty())  // what it took away itself is no reason
+            carryNow();
+    });
     connect(&interval, &QTimer::timeout, this, [this] { carryNow(); });
 }
 

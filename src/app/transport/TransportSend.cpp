@@ -89,7 +89,7 @@ Dice Transport::dice() const
 void Transport::advance(qsizetype index)
 {
     Dealing dealing = known->dealings[index];
-    if (!dealing.document.isEmpty() && files::exists(folders.unsent + dealing.document))
+    if (!dealing.document.isEmpty() && !files::exists(folders.sent + dealing.document))
         return;  // it could not be carried yet
     if (!dealing.message.isEmpty() && files::exists(folders.unread + dealing.message))
         return;  // the shop has not dealt with it

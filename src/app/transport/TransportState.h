@@ -16,7 +16,7 @@ struct Dealing {
     QStringList steps;  // as they stood in the rules when it began
     QString origin;     // "insurer.rules, line 7", for faults
     int waited = 0;     // carries, for the first step
-    QString document;   // of the outgoing folder, until it is carried
+    QString document;   // whose carrying has begun; nothing happens before it is done
     QString message;    // of the incoming folder, which the shop has to deal with first
 };
 

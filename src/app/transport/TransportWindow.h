@@ -10,25 +10,25 @@ class QTreeWidget;
 
 namespace kest::app {
 
-class frmTransport final : public desktop::Form {
+class TransportWindow final : public desktop::Form {
     Q_OBJECT
 public:
-    explicit frmTransport(const TransportFolders& folders);
+    explicit TransportWindow(const TransportFolders& folders);
 
     /// False where another transport works on these folders.
     bool claim() { return runner.claim(); }
     /// Shows the window until it is closed, or the program is told to end.
-    void ShowForm();
+    void run();
 
 private:
-    void show(const Carry& carry);
+    void tell(const Carry& carry);
     void addRow(const QStringList& cells);
 
     TransportRunner runner;
-    QTreeWidget* lvCarried;
-    QLabel* lblStatus;
-    QPushButton* cmdCarry;
-    QPushButton* cmdClose;
+    QTreeWidget* carriedList;
+    QLabel* status;
+    QPushButton* carryButton;
+    QPushButton* closeButton;
     int files = 0;
 };
 
