@@ -353,8 +353,12 @@ Outcome runChecked(const CommandLine& line)
     const Command& command = found->second;
     if (line.arguments.size() < command.fewest || line.arguments.size() > command.most)
         return refused(u"wrong number of arguments for "_s + line.command, Usage);
-    if (command.needs != Needs::Nothing && !profileExists())
-        return refused(u"no profile at "_s + profile::root() + u"; make one with: kest2 init"_s, NoConnection);
+    if (command.needs != Needs::Nothing && !profileExists()) {
+        const QString why = u"no profile at "_s + profile::root() + u"; make one with: kest2 init"_s;
+        if (isInteractive(line))
+            desktop::msgBox(why, desktop::Icon::Critical);  // started from the menu, nobody sees standard error
+        return refused(why, NoConnection);
+    }
     if (command.needs == Needs::Connection)
         return runConnected(command, line);
     return command.run(line);
