@@ -294,8 +294,6 @@ private:
 
     void writeList(Index in)
     {
-        if (isAt(next(next(in)), u"SELECT"))
-            return;  // the literals of a query of its own are compared there
         const Index before = previous(in);
         const TableColumn* column = columnEndingAt(isAt(before, u"NOT") ? previous(before) : before);
         const Index start = next(next(in));
