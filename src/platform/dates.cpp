@@ -69,7 +69,7 @@ std::optional<QDateTime> joined(const QDate& date, const std::optional<QTime>& t
 {
     if (!date.isValid() || !time)
         return {};
-    return QDateTime(date, *time);
+    return columnDate(date, *time);
 }
 
 std::optional<QDateTime> readDate(QStringView text)
@@ -109,6 +109,11 @@ std::optional<QDateTime> readDate(QStringView text)
 }
 
 }  // namespace
+
+QDateTime columnDate(const QDate& date, const QTime& time)
+{
+    return QDateTime(date, time, Qt::UTC);
+}
 
 std::optional<QDateTime> dateIn(const QString& text)
 {

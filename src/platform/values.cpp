@@ -200,13 +200,13 @@ QDateTime toDate(const QVariant& value)
             const QDateTime moment = value.toDateTime();
             if (!moment.date().isValid())
                 failAsNull();
-            return moment;
+            return columnDate(moment.date(), moment.time());
         }
         case QMetaType::QDate: {
             const QDate date = value.toDate();
             if (!date.isValid())
                 failAsNull();
-            return QDateTime(date, QTime(0, 0));
+            return columnDate(date, QTime(0, 0));
         }
         case QMetaType::QString:
             if (const auto moment = dateIn(value.toString()))

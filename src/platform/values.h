@@ -29,6 +29,8 @@ inline bool isTrue(const QVariant& flag)
     return !flag.isNull() && toBool(flag);
 }
 QDateTime toDate(const QVariant& value);
+/// A date as columns hold it: in no time zone, so that the hour which a clock change leaves out is an hour like others.
+QDateTime columnDate(const QDate& date, const QTime& time);
 
 /// The number in a text, or none where the text is no number.
 std::optional<double> numberIn(const QString& text);

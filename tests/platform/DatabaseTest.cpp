@@ -1,6 +1,7 @@
 // Connections and statements: which engine answers, what a comparison means on each, what fails and how.
 #include "platform/Databases.h"
 #include "platform/database/FaultInjection.h"
+#include "platform/values.h"
 
 #include <QElapsedTimer>
 #include <QFile>
@@ -174,7 +175,7 @@ TEST_P(EmbeddedDatabase, ReadsWhatAnotherToolHasWritten)
     EXPECT_EQ(lines.value(u"CODE"_s), QVariant(u"5"_s));
     EXPECT_EQ(lines.text(u"SEQ"_s), u"x"_s);
     EXPECT_EQ(lines.value(u"flag"_s), QVariant(true));
-    EXPECT_EQ(lines.value(u"day"_s), QVariant(QDateTime(QDate(2026, 2, 28), QTime(0, 0))));
+    EXPECT_EQ(lines.value(u"day"_s), QVariant(columnDate(QDate(2026, 2, 28), QTime(0, 0))));
     for (const QString& column : {u"flag"_s, u"day"_s, u"SEQ"_s}) {
         lines.set(column, QVariant());
         lines.update();  // finds the row by the value as it stands in the file

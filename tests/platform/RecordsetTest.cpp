@@ -1,6 +1,7 @@
 // The recordset: what it reads, writes, refuses and finds, on each engine alike.
 #include "platform/Databases.h"
 #include "platform/database/FaultInjection.h"
+#include "platform/values.h"
 
 namespace kest::test {
 
@@ -39,7 +40,23 @@ protected:
     Recordset lines;
 };
 
-const QDateTime someDay(QDate(2026, 2, 28), QTime(13, 5, 59));
+const QDateTime someDay = columnDate(QDate(2026, 2, 28), QTime(13, 5, 59));
+
+/// This process's time zone, for the time of one test.
+class TimeZone {
+public:
+    explicit TimeZone(const char* rule) : before(qgetenv("TZ")) { set(rule); }
+    ~TimeZone() { set(before); }
+    Q_DISABLE_COPY_MOVE(TimeZone)
+
+private:
+    static void set(const QByteArray& rule)
+    {
+        rule.isNull() ? qunsetenv("TZ") : qputenv("TZ", rule);
+        tzset();
+    }
+    QByteArray before;
+};
 
 }  // namespace
 
@@ -138,7 +155,7 @@ TEST_P(RecordsetOn, ARowThatSomeoneElseHasChangedIsNotOverwritten)
         {u"notes"_s, u"NULL"_s, u"'x'"_s, u"b"_s, true},
         {u"amount"_s, u"1"_s, u"2"_s, 3.0, false},  // floating point is left out of the test
         {u"flag"_s, u"1"_s, u"1"_s, false, false},  // the same again is no change
-        {u"day"_s, u"'2026-02-28 13:05:59'"_s, u"day"_s, QDateTime(QDate(2026, 3, 1), QTime()), false},
+        {u"day"_s, u"'2026-02-28 13:05:59'"_s, u"day"_s, columnDate(QDate(2026, 3, 1), QTime(0, 0)), false},
         {u"notes"_s, u"'a'"_s, u"notes"_s, QVariant(), false}};
     for (const Case& c : cases) {
         const QString name = c.column + u' ' + c.before + u' ' + c.theirs;
@@ -154,6 +171,25 @@ TEST_P(RecordsetOn, ARowThatSomeoneElseHasChangedIsNotOverwritten)
     elsewhere(u"DELETE FROM LINE"_s);
     EXPECT_EQ(failure([&] { lines.moveFirst(); }).number(), RowChanged) << "a move updates first";
     EXPECT_EQ(failure([&] { lines.remove(); }).number(), RowChanged);
+}
+
+TEST_P(RecordsetOn, AnHourThatTheClocksLeaveOutIsADateLikeOthers)
+{
+    const TimeZone zone("AEST-10AEDT,M10.1.0,M4.1.0/3");  // 02:00 to 03:00 is left out on 4 October 2026
+    const QString gap = u"4/10/2026 2:30:00 AM"_s;
+    elsewhere(u"INSERT INTO LINE (day) VALUES ('2026-10-04 02:30:00')"_s);
+    for (const QString& date : {u"2026-10-05 12:00:00"_s, gap, u"5/10/2026"_s}) {  // from the gap, into it, out of it
+        lines.requery();
+        EXPECT_EQ(lines.recordCount(), count(u"day='%1'"_s.arg(lines.text(u"day"_s))));
+        lines.set(u"day"_s, date);
+        lines.update();
+    }
+    lines.set(u"day"_s, QDateTime(QDate(2026, 10, 4), QTime(2, 30)));
+    lines.update();
+    lines.requery();
+    EXPECT_EQ(lines.text(u"day"_s), u"04/10/2026 2:30:00 AM"_s);
+    lines.find(u"day='%1'"_s.arg(gap));
+    EXPECT_FALSE(lines.eof());
 }
 
 TEST_P(RecordsetOn, AJoinIsUpdatedInTheTablesThatItsColumnsComeFrom)

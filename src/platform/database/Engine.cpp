@@ -81,15 +81,15 @@ QDateTime storedDate(const QString& text)
     const auto number = [&](int start, int length) { return QStringView(text).sliced(start, length).toInt(); };
     const QDate date(number(0, 4), number(5, 2), number(8, 2));
     const QTime time(number(11, 2), number(14, 2), number(17, 2));
-    return date.isValid() && time.isValid() ? QDateTime(date, time) : QDateTime();
+    return date.isValid() && time.isValid() ? columnDate(date, time) : QDateTime();
 }
 
 QVariant asDate(const QVariant& value)
 {
     if (value.typeId() == QMetaType::QDateTime)
-        return QDateTime(value.toDateTime().date(), value.toDateTime().time());
+        return columnDate(value.toDateTime().date(), value.toDateTime().time());
     if (value.typeId() == QMetaType::QDate)
-        return value.toDate().startOfDay();
+        return columnDate(value.toDate(), QTime(0, 0));
     const QString text = textOf(value);
     if (const QDateTime stored = storedDate(text); stored.isValid())
         return stored;
