@@ -180,6 +180,9 @@ TEST(DemoProfile, HasAKESTWebThatWorksOnItsOwnProfile)
     ASSERT_EQ(QProcess::execute(QStringLiteral(KEST_COMMAND), {u"--profile"_s, place, u"init"_s, u"--demo"_s}), 0);
 
     QProcess web;
+    QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
+    environment.remove(u"KEST2_PROFILE"_s);
+    web.setProcessEnvironment(environment);
     web.start(place + u"/component/KESTWeb.exe"_s);
     const QString unread = place + u"/drive_c/wirdoc/AUnread"_s;
     for (int waited = 0; files::list(unread, u"WEB_*"_s).isEmpty() && waited < 20'000; waited += 20)
