@@ -5,6 +5,7 @@
 #include "platform/files/files.h"
 #include "platform/profile.h"
 #include "shell/SharedVariables.h"
+#include "shell/modDBAccess.h"
 
 #include <QApplication>
 #include <QKeyEvent>
@@ -40,7 +41,7 @@ void searchKey(benchmark::State& state)
     files::makeFolder(gsUnreadPath);
     for (int i = 0; i < state.range(0); ++i)
         files::write(gsUnreadPath + u"%1.xml"_s.arg(i, 6, 10, QChar(u'0')), request(i));
-    gConn = app::openEmbedded(u"WirSql"_s);
+    gcnDB = gConn = app::openEmbedded(u"WirSql"_s);
     frmMessageList window;
     window.open();
     window.show();
@@ -66,6 +67,7 @@ void searchKey(benchmark::State& state)
     }
     state.counters["rows"] = static_cast<double>(state.range(0));
     gConn.reset();
+    gcnDB.reset();
     profile::setRoot({});
 }
 BENCHMARK(searchKey)->Arg(1000)->Arg(10000)->Iterations(280)->Unit(benchmark::kMillisecond);
