@@ -17,6 +17,8 @@ using namespace Qt::StringLiterals;
 namespace kest {
 namespace {
 
+constexpr qsizetype refusalsSaid = 10;  // the others would make a box taller than the screen
+
 enum class Kind { Picture, Description, Message };
 
 // Why a file is refused.
@@ -104,7 +106,15 @@ QString TakenIn::summary() const
     return parts.isEmpty() ? u"Nothing was taken in."_s : "Taken in: "_L1 + parts.join(", "_L1) + u'.';
 }
 
-TakenIn TakeInFiles(const QStringList& paths, const std::function<void(qint64 done, qint64 total)>& progress)
+QString TakenIn::refusals() const
+{
+    QStringList lines = refused.first(qMin(refusalsSaid, refused.size()));
+    if (refused.size() > refusalsSaid)
+        lines.append(u"and %1 more"_s.arg(refused.size() - refusalsSaid));
+    return "Not taken in:\n"_L1 + lines.join(u'\n');
+}
+
+TakenIn TakeInFiles(const QList<QUrl>& urls, const std::function<void(qint64 done, qint64 total)>& progress)
 {
     TakenIn result;
     const auto unlessRefused = [&](const QString& name, const auto& step) {
@@ -118,9 +128,14 @@ TakenIn TakeInFiles(const QStringList& paths, const std::function<void(qint64 do
     };
 
     QList<Brought> brought;
-    for (const QString& path : paths) {
+    for (const QUrl& url : urls) {
+        const QString path = url.toLocalFile();
         const QString name = QFileInfo(path).fileName();
-        unlessRefused(name.isEmpty() ? path : name, [&] { brought.append({path, name, kindOf(path, name)}); });
+        unlessRefused(url.isLocalFile() && !name.isEmpty() ? name : url.toDisplayString(), [&] {
+            if (!url.isLocalFile())
+                throw Refusal{u"it does not lie on this computer"_s};
+            brought.append({path, name, kindOf(path, name)});
+        });
     }
     // a message that is listed before its pictures are there would be held back, or loaded without them
     std::ranges::stable_sort(brought, {}, &Brought::kind);

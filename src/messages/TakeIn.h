@@ -2,6 +2,7 @@
 #pragma once
 
 #include <QStringList>
+#include <QUrl>
 
 #include <functional>
 
@@ -16,12 +17,14 @@ struct TakenIn {
 
     /// "Taken in: 2 messages, 1 picture."
     QString summary() const;
+    /// The first of those refused, a line each, and how many more there are.
+    QString refusals() const;
 };
 
 /// Copies messages, and the pictures and descriptions of requests, under their own names; each appears whole or not at
-/// all, and what belongs to a message before it. Paths are those of this system. Nothing is taken away where it lay.
+/// all, and what belongs to a message before it. Nothing is taken away where it lay.
 /// Before a file of the same name is replaced a box asks. What is no such file, and what could not be copied, is
 /// refused and the others go on.
-TakenIn TakeInFiles(const QStringList& paths, const std::function<void(qint64 done, qint64 total)>& progress = {});
+TakenIn TakeInFiles(const QList<QUrl>& urls, const std::function<void(qint64 done, qint64 total)>& progress = {});
 
 }  // namespace kest

@@ -48,7 +48,6 @@ constexpr int listMargin = 210;      // twips, left and right of the list
 constexpr int openingHeight = 9000;  // twips
 constexpr int filterWidth = 1800;    // twips
 constexpr int findWidth = 2700;      // twips
-constexpr int saidOfRefused = 10;    // files, by name
 
 constexpr std::array columnWidths{2328, 3969, 1587, 2293, 3969, 2117, 5292};  // twips
 
@@ -63,14 +62,6 @@ const QLocale& written()
 {
     static const QLocale locale(QLocale::English, QLocale::Australia);
     return locale;
-}
-
-QString withoutMore(QStringList names)
-{
-    const qsizetype more = names.size() - saidOfRefused;
-    if (more > 0)
-        names = names.first(saidOfRefused) << u"... and %1 more"_s.arg(more);
-    return names.join(u'\n');
 }
 
 template <class Control>
@@ -475,24 +466,15 @@ void frmMessageList::dropEvent(QDropEvent* event)
 void frmMessageList::takeIn(const QList<QUrl>& brought)
 {
     const QScopedValueRollback taking(busy, busy + 1);
-    QStringList paths;
-    QStringList refused;
-    for (const QUrl& file : brought) {
-        if (file.isLocalFile())
-            paths.append(file.toLocalFile());
-        else
-            refused.append(file.toDisplayString() + ": it does not lie on this computer"_L1);
-    }
     TakenIn taken;
     {
         desktop::Progress progress(windowTitle(), u"Taking the files in..."_s, prgFill);
-        taken = TakeInFiles(paths, [&](qint64 done, qint64 total) { progress.step(done, total); });
+        taken = TakeInFiles(brought, [&](qint64 done, qint64 total) { progress.step(done, total); });
     }
     Form_KeyRefresh();
     lblStatus->setText(taken.summary() + u' ' + lblStatus->text());
-    refused += taken.refused;
-    if (!refused.isEmpty())
-        desktop::msgBox("Not taken in:\n"_L1 + withoutMore(refused), desktop::Icon::Exclamation);
+    if (!taken.refused.isEmpty())
+        desktop::msgBox(taken.refusals(), desktop::Icon::Exclamation);
 }
 
 bool frmMessageList::hasSelection() const

@@ -1,5 +1,6 @@
 #include "outbound/frmViewPDF.h"
 
+#include "platform/desktop/Progress.h"
 #include "platform/desktop/Prompt.h"
 #include "platform/desktop/Script.h"
 #include "platform/desktop/Window.h"
@@ -182,7 +183,9 @@ void frmViewPDF::print()
         desktop::msgBox(u"The document can't be printed."_s, desktop::Icon::Critical);
         return;
     }
+    desktop::Progress progress(windowTitle(), u"Printing the document..."_s);
     for (int page = first; page <= last; ++page) {
+        progress.step(page - first, last - first + 1);
         if (page > first)
             printer.newPage();
         const QRect sheet = painter.viewport();

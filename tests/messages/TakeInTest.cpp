@@ -12,11 +12,11 @@ using namespace Qt::StringLiterals;
 class TakingIn : public Shop {
 protected:
     /// The path of a file on the stick.
-    QString bring(const QString& name, const QString& content)
+    QUrl bring(const QString& name, const QString& content)
     {
         files::makeFolder(root() + u"/stick"_s);
         files::write(root() + u"/stick/"_s + name, content);
-        return root() + u"/stick/"_s + name;
+        return QUrl::fromLocalFile(root() + u"/stick/"_s + name);
     }
 };
 
@@ -55,18 +55,26 @@ TEST_F(TakingIn, OnlyMessagesAndWhatBelongsToRequestsAreTaken)
         EXPECT_EQ(files::exists(gsUnreadPath + name), refusal.isEmpty()) << name.toStdString();
         EXPECT_TRUE(files::exists(root() + u"/stick/"_s + name));
     }
-    EXPECT_EQ(TakeInFiles({root(), u"/nowhere/x.xml"_s}).refused.join(u", "_s),
-              root().section(u'/', -1) + u": it is a folder, x.xml: there is no such file"_s);
+    QList<QUrl> others{QUrl::fromLocalFile(root()), QUrl::fromLocalFile(u"/nowhere/x.xml"_s),
+                       QUrl(u"https://shop.example/a.xml"_s)};
+    others.resize(12, others.last());
+    EXPECT_EQ(TakeInFiles(others).refusals().left(180).toStdString(),
+              ("Not taken in:\n" + root().section(u'/', -1).toStdString() +
+               ": it is a folder\nx.xml: there is no such file\n"
+               "https://shop.example/a.xml: it does not lie on this computer\n"
+               "https://shop.example/a.xml: it does not lie on this computer\n")
+                  .substr(0, 180));
+    EXPECT_TRUE(TakeInFiles(others).refusals().endsWith("\nand 2 more"_L1));
     EXPECT_EQ(shown(), "");
 }
 
 TEST_F(TakingIn, PicturesComeBeforeTheMessageThatNamesThem)
 {
-    const QStringList paths{bring(u"a.xml"_s, quoteRequest("QR1").images({"1"}).text()), bring(u"QR1_001.txt"_s, {}),
-                            bring(u"QR1_001.jpg"_s, {})};
+    const QList<QUrl> brought{bring(u"a.xml"_s, quoteRequest("QR1").images({"1"}).text()), bring(u"QR1_001.txt"_s, {}),
+                              bring(u"QR1_001.jpg"_s, {})};
     QStringList counts;
     const TakenIn taken = TakeInFiles(
-        paths, [&](qint64 done, qint64) { counts.append(filesIn(gsUnreadPath).join(u' ') + QString::number(done)); });
+        brought, [&](qint64 done, qint64) { counts.append(filesIn(gsUnreadPath).join(u' ') + QString::number(done)); });
     EXPECT_EQ(counts.join(u", "_s), u"QR1_001.jpg1, QR1_001.jpg QR1_001.txt2, a.xml QR1_001.jpg QR1_001.txt3"_s);
     EXPECT_EQ(taken.summary(), u"Taken in: 1 message, 1 picture, 1 description."_s);
 }
@@ -74,17 +82,18 @@ TEST_F(TakingIn, PicturesComeBeforeTheMessageThatNamesThem)
 TEST_F(TakingIn, AFileThatLiesThereIsReplacedOnlyAfterYes)
 {
     arrive("a.xml", "old");
-    const QString path = bring(u"A.xml"_s, quoteRequest("QR1").text());
-    EXPECT_EQ(TakeInFiles({path}).summary(), u"Nothing was taken in."_s);
+    const QUrl brought = bring(u"A.xml"_s, quoteRequest("QR1").text());
+    EXPECT_EQ(TakeInFiles({brought}).summary(), u"Nothing was taken in."_s);
     EXPECT_EQ(desktop->boxes(), QStringList(u"question||A.xml lies in the unread folder already. Replace it?|no"_s));
     EXPECT_EQ(files::read(gsUnreadPath + u"a.xml"_s), u"old"_s);
     desktop.emplace(R"({"boxes": [{"text": "Replace", "answer": "yes"}]})");
-    EXPECT_EQ(TakeInFiles({path, files::systemPath(gsUnreadPath + u"a.xml"_s)}).refused.join(u' '),
-              u"a.xml: it lies in the unread folder already"_s);
-    EXPECT_EQ(files::read(gsUnreadPath + u"a.xml"_s), files::read(path));
+    EXPECT_EQ(
+        TakeInFiles({brought, QUrl::fromLocalFile(files::systemPath(gsUnreadPath + u"a.xml"_s))}).refused.join(u' '),
+        u"a.xml: it lies in the unread folder already"_s);
+    EXPECT_EQ(files::read(gsUnreadPath + u"a.xml"_s), files::read(brought.toLocalFile()));
     EXPECT_EQ(filesIn(gsUnreadPath).size(), 1);
     gsUnreadPath = u"c:\\gone\\"_s;
-    EXPECT_EQ(TakeInFiles({path}).refused.size(), 1) << "what can't be copied is refused";
+    EXPECT_EQ(TakeInFiles({brought}).refused.size(), 1) << "what can't be copied is refused";
 }
 
 }  // namespace

@@ -2,6 +2,7 @@
 #include "platform/RuntimeError.h"
 #include "platform/desktop/Form.h"
 #include "platform/desktop/Gestures.h"
+#include "platform/desktop/Progress.h"
 #include "platform/desktop/Prompt.h"
 #include "platform/files/files.h"
 #include "support/ScriptedDesktop.h"
@@ -12,6 +13,7 @@
 #include <QInputDialog>
 #include <QJsonDocument>
 #include <QMessageBox>
+#include <QProgressBar>
 #include <QPushButton>
 #include <QScreen>
 #include <QThread>
@@ -158,6 +160,41 @@ TEST_F(Person, KeepsTheWindowAfterAFailureThatNobodyTrapped)
     });
     desktop::showModal(window);
     EXPECT_EQ(reported, QStringList{u"frmSample.cmdOK_Click: no row"_s});
+}
+
+TEST_F(Person, SeesHowFarAWorkIsOnceItTakesHalfASecond)
+{
+    const auto valueShown = [](const QProgressBar* bar) { return bar && bar->isVisible() ? bar->value() : -1; };
+    const auto ownBar = []() -> const QProgressBar* {
+        for (const QWidget* window : QApplication::topLevelWidgets())
+            if (window->windowTitle() == u"KEST Messages"_s)
+                return window->findChild<QProgressBar*>();
+        return nullptr;
+    };
+    desktop::Form window(u"frmSample"_s, u"Sample"_s);
+    QProgressBar bar(&window);
+    bar.hide();
+    for (const bool hasBar : {false, true}) {
+        window.setVisible(hasBar);
+        {
+            desktop::Progress progress(u"KEST Messages"_s, u"Reading"_s, &bar);
+            progress.step(1, 10);
+            EXPECT_EQ(valueShown(ownBar()) + valueShown(&bar), -2);
+            QThread::msleep(501);
+            progress.step(5, 10);
+            EXPECT_EQ(valueShown(ownBar()), hasBar ? -1 : 50);
+            EXPECT_EQ(valueShown(&bar), hasBar ? 50 : -1);
+            ASSERT_TRUE(QGuiApplication::overrideCursor());
+            whenShown<QMessageBox>([](QMessageBox& box) {
+                EXPECT_EQ(QGuiApplication::overrideCursor()->shape(), Qt::ArrowCursor);
+                box.close();
+            });
+            desktop::msgBox(u"Message x.xml unreadable"_s);
+            EXPECT_EQ(QGuiApplication::overrideCursor()->shape(), Qt::WaitCursor);
+        }
+        EXPECT_EQ(valueShown(ownBar()) + valueShown(&bar), -2);
+        EXPECT_FALSE(QGuiApplication::overrideCursor());
+    }
 }
 
 TEST_F(Person, FindsEveryWindowAsItWasLeftAndInTheMiddle)

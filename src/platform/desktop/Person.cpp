@@ -40,6 +40,25 @@ QWidget* topWindow()
     return modal ? modal : QApplication::activeWindow();
 }
 
+/// The pointer of every day while a box is up: where a work that keeps the person waiting asks, it waits itself.
+class OrdinaryPointer {
+public:
+    OrdinaryPointer() : wasOther(QGuiApplication::overrideCursor())
+    {
+        if (wasOther)
+            QGuiApplication::setOverrideCursor(Qt::ArrowCursor);
+    }
+    ~OrdinaryPointer()
+    {
+        if (wasOther)
+            QGuiApplication::restoreOverrideCursor();
+    }
+    Q_DISABLE_COPY_MOVE(OrdinaryPointer)
+
+private:
+    bool wasOther;
+};
+
 /// Boxes and input boxes as windows on top of the active one.
 class PersonAnswerer final : public Answerer {
 public:
@@ -50,6 +69,7 @@ public:
 
 Answer PersonAnswerer::box(const Box& box)
 {
+    const OrdinaryPointer pointer;
     QMessageBox window(topWindow());
     window.setWindowTitle(titleOrDefault(box.title));
     window.setTextFormat(Qt::PlainText);
@@ -68,6 +88,7 @@ Answer PersonAnswerer::box(const Box& box)
 
 QString PersonAnswerer::input(const Input& input)
 {
+    const OrdinaryPointer pointer;
     QInputDialog window(topWindow());
     window.setWindowTitle(titleOrDefault(input.title));
     window.setInputMode(QInputDialog::TextInput);
