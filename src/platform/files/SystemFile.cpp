@@ -2,7 +2,6 @@
 
 #include "platform/RuntimeError.h"
 #include "platform/files/FaultInjection.h"
-#include "platform/files/files.h"
 
 #include <QFile>
 #include <QRandomGenerator>
@@ -233,9 +232,8 @@ void checkFolderWritable(const QString& systemPath)
         throwFileError(PermissionDenied, systemPath);
 }
 
-void replaceFile(const QString& path, const std::function<void(SystemFile&)>& fill)
+void replaceFile(const QString& target, const QString& spelled, const std::function<void(SystemFile&)>& fill)
 {
-    const QString target = systemPath(path);
     checkFolderWritable(target);
     checkWritable(target);
     const QString temporary = folderOf(target) + u'/' + temporaryName();
@@ -251,9 +249,8 @@ void replaceFile(const QString& path, const std::function<void(SystemFile&)>& fi
         throw;
     }
     // what lay there under another spelling takes the new one: at no moment are there two files or none
-    const QString asAsked = spelledPath(path);
-    if (asAsked != target)
-        renameFile(target, asAsked);
+    if (spelled != target)
+        renameFile(target, spelled);
 }
 
 bool sameVolume(const QString& from, const QString& to)

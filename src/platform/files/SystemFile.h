@@ -46,8 +46,8 @@ void checkFolderWritable(const QString& systemPath);
 bool isFile(const QString& systemPath);
 bool isFolder(const QString& systemPath);
 
-/// Puts a file in place that `fill` has written under a temporary name. `path` is the name as it was asked for.
-void replaceFile(const QString& path, const std::function<void(SystemFile&)>& fill);
+/// Puts a file in place that `fill` has written under a temporary name. `spelled` is its path as it was asked for.
+void replaceFile(const QString& target, const QString& spelled, const std::function<void(SystemFile&)>& fill);
 bool sameVolume(const QString& from, const QString& to);
 void renameFile(const QString& from, const QString& to);
 void removeFile(const QString& systemPath);

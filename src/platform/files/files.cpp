@@ -52,7 +52,7 @@ QString read(const QString& path)
 void writeBytes(const QString& path, const QByteArray& bytes)
 {
     failOnRequest(path);
-    replaceFile(path, [&](SystemFile& file) { file.write(bytes); });
+    replaceFile(systemPath(path), spelledPath(path), [&](SystemFile& file) { file.write(bytes); });
 }
 
 void write(const QString& path, const QString& text)
@@ -85,7 +85,7 @@ void copy(const QString& from, const QString& to)
     const QString source = systemPath(from);
     checkReadable(source);
     SystemFile original(source, O_RDONLY);
-    replaceFile(to, [&](SystemFile& file) {
+    replaceFile(systemPath(to), spelledPath(to), [&](SystemFile& file) {
         for (QByteArray bytes = original.read(piece); !bytes.isEmpty(); bytes = original.read(piece))
             file.write(bytes);
     });
