@@ -358,7 +358,9 @@ TEST_F(Loopback, RulesWithAFaultStopEverythingUntilTheyAreMended)
     EXPECT_EQ(files::list(gsUnsentPath).size(), 1);
     rules(u"on quote 1004\n  authorise\n  waive\n"_s);
     carried();
-    EXPECT_EQ(faults(), QStringList(u"insurer.rules, line 1, authorise: the claim is not known; say it with claim="_s));
+    EXPECT_EQ(
+        faults(),
+        QStringList(u"insurer.rules, line 1, quote 1004, authorise: the claim is not known; say it with claim="_s));
     EXPECT_EQ(faults(), QStringList());
 }
 

@@ -16,18 +16,6 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-/// Changes whenever a file does.
-QString stampOf(const QString& path)
-{
-    const QFileInfo file(files::systemPath(path));
-    return QString::number(file.size()) + u' ' + file.lastModified().toString(Qt::ISODateWithMs);
-}
-
-[[noreturn]] void fail(const QString& why)
-{
-    throw RuntimeError(TypeMismatch, why);
-}
-
 Dealing dealingOf(const Rule& rule)
 {
     Dealing dealing;
@@ -36,6 +24,17 @@ Dealing dealingOf(const Rule& rule)
         dealing.steps.append(step.text);
     dealing.origin = u"%1, line %2"_s.arg(Transport::rulesName).arg(rule.line);
     return dealing;
+}
+
+/// "insurer.rules, line 7, quote 1004, waive": where the next step comes from.
+QString nameOf(const Dealing& dealing)
+{
+    QStringList parts(dealing.origin);
+    if (dealing.facts.contains(u"quote"_s))
+        parts.append(u"quote "_s + NormaliseQuoteRef(dealing.facts[u"quote"_s]));
+    parts.append(dealing.steps.first());
+    parts.removeAll({});
+    return parts.join(u", "_s);
 }
 
 }  // namespace
@@ -47,21 +46,26 @@ Carry Transport::carry(const QDate& date)
     result = {};
     today = date;
     if (!tried(rulesName, stampOf(folders.own + rulesName), [&] { readRules(); }) ||
-        !tried(stateName, stampOf(folders.own + stateName), [&] {
-            if (!known)
-                known = TransportState::loaded(folders.own + stateName);
-        }))
+        !tried(stateName, stampOf(folders.own + stateName), [&] { readState(); }))
         return result;
 
     finishMoving();
+    rememberAnswers();
     beginStarts();
     takeDocuments();
     for (qsizetype i = 0; i < known->dealings.size(); ++i)
         if (const Dealing& dealing = known->dealings[i]; !dealing.steps.isEmpty())
-            tried(dealing.origin + u", "_s + dealing.steps.first(), {}, [&] { advance(i); });
+            tried(nameOf(dealing), {}, [&] { advance(i); });
     known->dealings.removeIf([](const Dealing& dealing) { return dealing.steps.isEmpty(); });
     tried(stateName, {}, [&] { save(); });
     return result;
+}
+
+/// Changes whenever the file does.
+QString Transport::stampOf(const QString& path)
+{
+    const QFileInfo file(files::systemPath(path));
+    return QString::number(file.size()) + u' ' + file.lastModified().toString(Qt::ISODateWithMs);
 }
 
 bool Transport::tried(const QString& subject, const QString& stamp, const std::function<void()>& step)
@@ -86,9 +90,23 @@ void Transport::readRules()
     rules = files::exists(file) ? parsedRules(QString::fromUtf8(files::readBytes(file))) : InsurerRules();
 }
 
-void Transport::save() const
+/// A file that was taken away is a wish to begin anew.
+void Transport::readState()
 {
-    known->save(folders.own + stateName);
+    const QString file = folders.own + stateName;
+    if (known && (stored.isEmpty() || files::exists(file)))
+        return;
+    known = files::exists(file) ? TransportState::parsed(files::readBytes(file)) : TransportState();
+    stored.clear();
+}
+
+void Transport::save()
+{
+    const QByteArray text = known->text();
+    if (text == stored)
+        return;
+    files::writeBytes(folders.own + stateName, text);
+    stored = text;
 }
 
 void Transport::beginStarts()
@@ -148,7 +166,7 @@ void Transport::begin(const QuoteDocument& quote, const QString& name)
 
     const QString request = quote.request.isEmpty() ? requestOf(quote.quote) : quote.request;
     const Rule* rule = rules.ruleFor(quote.quote, quote.subquote, request, time);
-    Dealing dealing = rule ? dealingOf(*rule) : Dealing{{}, {}, u"quote "_s + quote.quote, 0, {}, {}};
+    Dealing dealing = rule ? dealingOf(*rule) : Dealing();
     if (dealing.facts.contains(u"claim"_s))
         memory[u"claim"_s] = dealing.facts[u"claim"_s];
     dealing.facts[u"quote"_s] = quote.reference();
@@ -170,7 +188,7 @@ void Transport::takeImage(const QString& name)
         return;
     xml::Document document;
     if (!document.loadXML(files::read(folders.unsent + name)))
-        fail(u"it is no XML: "_s + document.parseError().reason.simplified());
+        throw RuntimeError(TypeMismatch, u"it is no XML: "_s + document.parseError().reason.simplified());
     known->moving = {*picture, name};
     save();
     finishMoving();

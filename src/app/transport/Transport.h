@@ -50,9 +50,11 @@ public:
     Carry carry(const QDate& today = QDate::currentDate());
 
 private:
+    static QString stampOf(const QString& path);
     bool tried(const QString& subject, const QString& stamp, const std::function<void()>& step);
     void readRules();
-    void save() const;
+    void readState();
+    void save();
     QString draw();
 
     // what the shop sends
@@ -64,6 +66,7 @@ private:
     void beginStarts();
 
     // what the insurer sends
+    void rememberAnswers();
     void advance(qsizetype index);
     void perform(const Step& step, Dealing& dealing);
     Matter matterOf(const Step& step) const;
@@ -76,13 +79,13 @@ private:
     Dice dice() const;
 
     QStringList answersOf(const QString& quote, const QString& subquote) const;
-    QString answeredNumber(const QString& quote, const QString& subquote) const;
     QString requestOf(const QString& quote) const;
     std::optional<QuoteDocument> newestDocument(const QString& quote, const QString& subquote) const;
 
     TransportFolders folders;
     InsurerRules rules;
     std::optional<TransportState> known;  // read by the first carry
+    QByteArray stored;                    // the state as its file holds it; empty before it was written or read
     QHash<QString, QString> said;         // the faults that were told, by subject
     Carry result;
     QDate today;

@@ -7,6 +7,7 @@
 #include "shell/Helpers.h"
 
 #include <algorithm>
+#include <tuple>
 
 namespace kest::app {
 
@@ -64,6 +65,52 @@ bool takesAnswersAway(const Step& step, const Matter& matter)
 bool concernsWholeRequest(Act act)
 {
     return act == Act::Revise || act == Act::Reinstate || act == Act::BackOut;
+}
+
+enum Fact : unsigned {
+    DocumentFact = 1,
+    RequestFact = 2,
+    NetworkFact = 4,
+    ClaimFact = 8,
+    VehicleFact = 16,
+    AuthorityFact = 32
+};
+
+/// What a message cannot go without, and the numbers that the insurer gives where there is none.
+struct Completion {
+    unsigned needed;
+    unsigned given;
+};
+
+Completion completionOf(Act act)
+{
+    switch (act) {
+        case Act::Request:
+            return {0, RequestFact | ClaimFact};
+        case Act::Respond:
+            return {0, NetworkFact};
+        case Act::Match:
+            return {DocumentFact | ClaimFact, RequestFact | NetworkFact};
+        case Act::Authorise:
+            return {DocumentFact | RequestFact | NetworkFact | ClaimFact, AuthorityFact};
+        case Act::Adjust:
+            return {DocumentFact | RequestFact | NetworkFact, AuthorityFact};
+        case Act::Revise:
+        case Act::Cancel:
+        case Act::Reinstate:
+        case Act::BackOut:
+            return {RequestFact, 0};
+        case Act::Delete:
+        case Act::Reject:
+            return {NetworkFact, 0};
+        case Act::Waive:
+            return {DocumentFact, 0};
+        case Act::Manual:
+            return {VehicleFact, RequestFact | NetworkFact | ClaimFact};
+        case Act::Marker:
+            break;
+    }
+    return {0, 0};
 }
 
 Photograph photographOf(const Matter& matter, int id, Dice& dice)
@@ -152,110 +199,63 @@ Matter Transport::matterOf(const Step& step) const
     matter.rego = firstOf({told(u"rego"_s), matter.document.rego, request[u"rego"_s]});
     matter.vehicle = firstOf({told(u"vehicle"_s), matter.document.vehicle, request[u"vehicle"_s]});
     matter.version = firstOf({told(u"version"_s), request[u"version"_s], matter.document.version});
-    matter.network = firstOf({told(u"network"_s), quote[u"network"_s], answeredNumber(matter.quote, matter.subquote)});
+    matter.network = firstOf({told(u"network"_s), quote[u"network"_s]});
     return matter;
 }
 
-/// What the message needs and nobody told: the insurer gives a number, or cannot go on.
+/// What nobody told: the insurer gives a number, or cannot go on.
 void Transport::complete(const Step& step, Matter& matter)
 {
-    const auto give = [&](QString& number) {
-        if (number.isEmpty())
-            number = draw();
-    };
-    const auto need = [&](const QString& value, const QString& what, const QString& parameter) {
-        if (value.isEmpty())
-            fail(u"%1 is not known; say it with %2="_s.arg(what, parameter));
-    };
-    const auto needDocument = [&] {
-        if (matter.document.quote.isEmpty())
-            fail(u"no document of quote %1 lies in the folder of sent quotes"_s.arg(matter.reference()));
-    };
-    const auto needRequest = [&] { need(matter.request, u"the request"_s, u"request"_s); };
-    const auto needClaim = [&] { need(matter.claim, u"the claim"_s, u"claim"_s); };
-    const auto needNetwork = [&] { need(matter.network, u"the network's number of the quote"_s, u"network"_s); };
+    if (step.act == Act::Request) {
+        Dice chance = dice();
+        matter = {};
+        matter.request = step.parameters.value(u"number"_s);
+        matter.version = step.parameters.value(u"version"_s, u"1"_s);
+        matter.claim = step.parameters.value(u"claim"_s);
+        matter.rego = step.parameters.value(u"rego"_s, u"KST%1"_s.arg(100 + chance.below(900)));
+        matter.vehicle = step.parameters.value(u"vehicle"_s, u"Corella Meridian"_s);
+    } else if (step.act == Act::Respond) {
+        matter.network = step.parameters.value(u"network"_s);  // a new one for each send
+    } else if (step.act == Act::Revise && !step.parameters.contains(u"version"_s)) {
+        matter.version = QString::number(matter.version.toInt() + 1);
+    }
 
-    switch (step.act) {
-        case Act::Request: {
-            Dice chance = dice();
-            matter.request = step.parameters.value(u"number"_s);
-            matter.version = step.parameters.value(u"version"_s, u"1"_s);
-            matter.claim = step.parameters.value(u"claim"_s);
-            matter.rego = step.parameters.value(u"rego"_s, u"KST%1"_s.arg(100 + chance.below(900)));
-            matter.vehicle = step.parameters.value(u"vehicle"_s, u"Corella Meridian"_s);
-            give(matter.request);
-            return give(matter.claim);
-        }
-        case Act::Respond:
-            matter.network = step.parameters.value(u"network"_s);
-            return give(matter.network);
-        case Act::Match:
-            needDocument();
-            needClaim();
-            give(matter.network);
-            return give(matter.request);
-        case Act::Authorise:
-        case Act::Adjust:
-            needDocument();
-            needNetwork();
-            needRequest();
-            if (step.act == Act::Authorise)
-                needClaim();  // the shop takes it over
-            return give(matter.authorised);
-        case Act::Revise:
-            needRequest();
-            if (!step.parameters.contains(u"version"_s))
-                matter.version = QString::number(matter.version.toInt() + 1);
-            return;
-        case Act::Delete:
-        case Act::Reject:
-            return needNetwork();
-        case Act::Cancel:
-        case Act::Reinstate:
-        case Act::BackOut:
-            return needRequest();
-        case Act::Waive:
-            return needDocument();
-        case Act::Manual:
-            need(matter.rego, u"the vehicle"_s, u"rego"_s);
-            give(matter.request);
-            give(matter.network);
-            return give(matter.claim);
-        case Act::Marker:
-            return;
+    const auto [needed, given] = completionOf(step.act);
+    if (needed & DocumentFact && matter.document.quote.isEmpty())
+        fail(u"no document of quote %1 lies in the folder of sent quotes"_s.arg(matter.reference()));
+    const std::tuple<unsigned, QString&, QString, QString> facts[] = {
+        {RequestFact, matter.request, u"the request"_s, u"request"_s},
+        {NetworkFact, matter.network, u"the network's number of the quote"_s, u"network"_s},
+        {ClaimFact, matter.claim, u"the claim"_s, u"claim"_s},
+        {VehicleFact, matter.rego, u"the vehicle"_s, u"rego"_s},
+        {AuthorityFact, matter.authorised, {}, {}},
+    };
+    for (const auto& [fact, value, what, parameter] : facts) {
+        if (value.isEmpty() && needed & fact)
+            fail(u"%1 is not known; say it with %2="_s.arg(what, parameter));
+        if (value.isEmpty() && given & fact)
+            value = draw();
     }
 }
 
 void Transport::remember(const Step& step, const Matter& matter, Dealing& dealing)
 {
-    Parameters& quote = known->quotes[keyOf(matter.quote, matter.subquote)];
-    const auto rememberRequest = [&] {
+    const QString quote = keyOf(matter.quote, matter.subquote);
+    if (step.act == Act::Request || step.act == Act::Match || step.act == Act::Manual) {
         known->requests[matter.request] = {{u"claim"_s, matter.claim},
                                            {u"rego"_s, matter.rego},
                                            {u"vehicle"_s, matter.vehicle},
                                            {u"version"_s, matter.version}};
         dealing.facts[u"request"_s] = matter.request;
-    };
-    switch (step.act) {
-        case Act::Request:
-        case Act::Manual:
-            return rememberRequest();
-        case Act::Match:
-            rememberRequest();
-            quote[u"request"_s] = matter.request;
-            [[fallthrough]];
-        case Act::Respond:
-            quote[u"network"_s] = matter.network;
-            return;
-        case Act::Revise:
-            known->requests[matter.request][u"version"_s] = matter.version;
-            [[fallthrough]];
-        case Act::Delete:
-            quote.remove(u"network"_s);  // the shop sends the quote again and gets another
-            return;
-        default:
-            return;
     }
+    if (step.act == Act::Match)
+        known->quotes[quote][u"request"_s] = matter.request;
+    if (step.act == Act::Match || step.act == Act::Respond)
+        known->quotes[quote][u"network"_s] = matter.network;
+    if (step.act == Act::Revise)
+        known->requests[matter.request][u"version"_s] = matter.version;
+    if (step.act == Act::Revise || step.act == Act::Delete)
+        known->quotes[quote].remove(u"network"_s);  // the shop sends the quote again and gets another
 }
 
 void Transport::put(const QString& name, const QByteArray& bytes, const QString& what)
@@ -298,6 +298,21 @@ QString Transport::sendMessage(const Step& step, const Matter& matter)
     return name;
 }
 
+/// Answers that another one has sent, such as those that a demo begins with.
+void Transport::rememberAnswers()
+{
+    for (const QString& file : files::list(folders.unread, u"R_*.xml"_s)) {
+        const auto [quote, subquote] = answered(file);
+        if (quote.isEmpty() || known->quotes.value(keyOf(quote, subquote)).contains(u"network"_s))
+            continue;
+        tried(file, stampOf(folders.unread + file), [&] {
+            QString text = files::read(folders.unread + file);
+            known->quotes[keyOf(quote, subquote)][u"network"_s] =
+                ParsedMessage(text).textOf(u"rootns:kestQuoteNumber"_s);
+        });
+    }
+}
+
 QStringList Transport::answersOf(const QString& quote, const QString& subquote) const
 {
     QStringList found;
@@ -317,15 +332,6 @@ void Transport::removeAnswers(const Step& step, const Matter& matter)
     old.removeDuplicates();
     for (const QString& file : old)
         files::remove(folders.unread + file);
-}
-
-QString Transport::answeredNumber(const QString& quote, const QString& subquote) const
-{
-    const QStringList answers = answersOf(quote, subquote);
-    if (answers.isEmpty())
-        return {};
-    QString text = files::read(folders.unread + answers.last());
-    return ParsedMessage(text).textOrEmptyOf(u"rootns:kestQuoteNumber"_s);
 }
 
 QString Transport::requestOf(const QString& quote) const

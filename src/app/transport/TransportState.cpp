@@ -1,7 +1,6 @@
 #include "app/transport/TransportState.h"
 
 #include "platform/RuntimeError.h"
-#include "platform/files/files.h"
 
 #include <QJsonArray>
 #include <QJsonDocument>
@@ -70,15 +69,12 @@ Dealing dealingOf(const QJsonValue& value)
 
 }  // namespace
 
-TransportState TransportState::loaded(const QString& file)
+TransportState TransportState::parsed(const QByteArray& text)
 {
-    TransportState state;
-    if (!files::exists(file))
-        return state;
-    const QJsonDocument document = QJsonDocument::fromJson(files::readBytes(file));
+    const QJsonDocument document = QJsonDocument::fromJson(text);
     if (!document.isObject())
-        throw RuntimeError(TypeMismatch,
-                           u"%1 cannot be read; take it away to begin anew"_s.arg(file.section(u'/', -1)));
+        throw RuntimeError(TypeMismatch, u"it cannot be read; take it away to begin anew"_s);
+    TransportState state;
     state.numbers = document[u"numbers"].toInteger();
     state.messages = document[u"messages"].toInteger();
     state.moving = textsOf(document[u"moving"]);
@@ -90,7 +86,7 @@ TransportState TransportState::loaded(const QString& file)
     return state;
 }
 
-void TransportState::save(const QString& file) const
+QByteArray TransportState::text() const
 {
     QJsonArray ahead;
     for (const Dealing& dealing : dealings)
@@ -102,7 +98,7 @@ void TransportState::save(const QString& file) const
                              {u"quotes"_s, toJson(quotes)},
                              {u"requests"_s, toJson(requests)},
                              {u"dealings"_s, ahead}};
-    files::writeBytes(file, QJsonDocument(object).toJson());
+    return QJsonDocument(object).toJson();
 }
 
 }  // namespace kest::app

@@ -29,9 +29,9 @@ struct TransportState {
     QMap<QString, Parameters> requests;  // by number: claim, rego, vehicle, version
     QList<Dealing> dealings;
 
-    /// A missing file is an empty state; throws TypeMismatch for one that is none.
-    static TransportState loaded(const QString& file);
-    void save(const QString& file) const;
+    /// Throws TypeMismatch for a text that is none.
+    static TransportState parsed(const QByteArray& text);
+    QByteArray text() const;
 };
 
 }  // namespace kest::app
