@@ -174,6 +174,7 @@ TEST_F(Loopback, EachMessageHasTheEffectThatItsTypeTells)
         EXPECT_EQ(stateOf(u"1004"_s), c.state) << c.code.toStdString();
         EXPECT_TRUE(notesOf(u"1004"_s).contains(c.note)) << notesOf(u"1004"_s).toStdString();
     }
+    EXPECT_EQ(desktop->boxes().filter(u"critical|"_s), QStringList());
 }
 
 TEST_F(Loopback, ARequestComesBehindItsPictures)

@@ -163,7 +163,7 @@ void writeAdjusted(const Branch& quote, const Step& step, const Matter& matter, 
 void writeQuote(const Branch& quote, const Matter& matter, const QuoteBody& body)
 {
     quote.add({{"kestQuoteNumber", always, matter.network},
-               {"quoteRequestNumber", always, matter.request},
+               filled("quoteRequestNumber", matter.request),  // an empty one would hold others back in the list
                {"claimNumber", always, matter.claim},
                {"vehicleRegistration", always, matter.rego},
                {"vehicleDescription", always, matter.vehicle}});
@@ -223,7 +223,7 @@ void write(const Branch& root, const Step& step, const Matter& matter, Dice& dic
             return root.add("kestQuoteRequestNumber", matter.request);
         case Act::Reject:
             return root.add({{"kestOriginalQuoteNumber", always, matter.network},
-                             {"kestQuoteRequestNumber", always, matter.request},
+                             filled("kestQuoteRequestNumber", matter.request),
                              {"reasonCode", always, reason(u"LABR"_s)}});
         case Act::Manual:
             return writeQuote(root, matter, manualBodyOf(step, matter, dice));

@@ -123,8 +123,6 @@ void Transport::beginStarts()
     }
 }
 
-// ---- What the shop sends ------------------------------------------------------------------------------------------
-
 void Transport::takeDocuments()
 {
     for (const QString& name : files::list(folders.unsent, u"*.xml"_s))
@@ -172,7 +170,7 @@ void Transport::begin(const QuoteDocument& quote, const QString& name)
     dealing.facts[u"quote"_s] = quote.reference();
     dealing.document = name;
     if (dealing.steps.isEmpty() || parsedStep(dealing.steps.first()).act != Act::Respond)
-        dealing.steps.prepend(u"respond"_s);
+        dealing.steps.prepend(u"respond wait=0"_s);  // whatever the rule has to wait for
     known->dealings.append(dealing);
 }
 

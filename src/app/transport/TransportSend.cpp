@@ -118,7 +118,7 @@ Photograph photographOf(const Matter& matter, int id, Dice& dice)
     static const std::array colours{QColor(52, 86, 160), QColor(190, 194, 200), QColor(150, 40, 44)};
     static const std::array views{u"whole side"_s, u"damage from the left"_s, u"damage from above"_s};
     return {matter.rego + u"  "_s + views[size_t(id - 1) % views.size()],
-            colours[matter.request.size() % colours.size()], (10 + dice.below(80)) / 100.0};
+            colours[size_t(matter.request.right(1).toInt()) % colours.size()], (10 + dice.below(80)) / 100.0};
 }
 
 }  // namespace
