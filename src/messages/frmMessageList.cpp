@@ -120,6 +120,7 @@ void frmMessageList::buildControls()
     messages = new MessageListModel(this);
     ListView1->setModel(messages);
     desktop::prepareList(*ListView1, objectName());
+    ListView1->header()->setSortIndicatorClearable(true);  // back to the order of the folder
     for (size_t i = 0; i < columnWidths.size(); ++i)
         ListView1->header()->resizeSection(static_cast<int>(i), desktop::pixels(columnWidths[i]));
     new ListSearch(*ListView1, *txtFind);

@@ -274,10 +274,11 @@ TEST_F(Searched, OrderWidthsAndPlaceOutliveARefreshAndOrderAndWidthsTheWindow)
     const auto press = [](QWidget& window, QKeyCombination key) { desktop::gestures::press(window, key); };
     const auto work = [&](QDialog& window) {
         auto& list = control<QTreeView>(window, "ListView1");
-        press(window, Qt::CTRL | Qt::Key_1);
-        press(window, Qt::CTRL | Qt::Key_1);
+        for (const char* first : {"a.xml", "c.xml", "a.xml", "a.xml", "c.xml"}) {  // to, fro, none, to, fro
+            press(window, Qt::CTRL | Qt::Key_1);
+            EXPECT_EQ(list.model()->index(0, 0).data(), QString::fromLatin1(first));
+        }
         list.header()->resizeSection(2, 177);
-        EXPECT_EQ(list.model()->index(0, 0).data(), u"c.xml"_s) << "the second time turns the order round";
         press(list, Qt::Key_Home);
         press(list, Qt::Key_Down);
         for (const QKeyCombination key :

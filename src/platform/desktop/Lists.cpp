@@ -14,10 +14,15 @@ namespace {
 
 constexpr int numberKeys = 9;
 
+/// As a click on the header.
 void sortBy(QHeaderView& header, int column)
 {
-    const bool turns = header.sortIndicatorSection() == column && header.sortIndicatorOrder() == Qt::AscendingOrder;
-    header.setSortIndicator(column, turns ? Qt::DescendingOrder : Qt::AscendingOrder);
+    const bool isSorted = header.sortIndicatorSection() == column;
+    const bool isDescending = isSorted && header.sortIndicatorOrder() == Qt::DescendingOrder;
+    if (isDescending && header.isSortIndicatorClearable())
+        header.setSortIndicator(-1, Qt::AscendingOrder);
+    else
+        header.setSortIndicator(column, isSorted && !isDescending ? Qt::DescendingOrder : Qt::AscendingOrder);
 }
 
 }  // namespace

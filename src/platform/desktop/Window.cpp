@@ -68,6 +68,7 @@ void showModal(QDialog& window)
     throwKept();
     if (!window.testAttribute(Qt::WA_Resized))
         window.adjustSize();
+    window.resize(window.size().boundedTo(window.screen()->availableSize()));
     WindowLayout layout(window);
     centre(window);
     {
@@ -130,8 +131,10 @@ int twips(int pixels)
 
 void centre(QWidget& window)
 {
-    const QPoint middle = window.screen()->availableGeometry().center();
-    window.move(middle - QPoint(window.frameGeometry().width() / 2, window.frameGeometry().height() / 2));
+    const QRect screen = window.screen()->availableGeometry();
+    const QSize room = screen.size() - window.frameGeometry().size();
+    window.move(screen.topLeft() +
+                QPoint(qMax(room.width(), 0), qMax(room.height(), 0)) / 2);  // its head is always seen
 }
 
 }  // namespace kest::desktop
