@@ -27,7 +27,9 @@ std::unique_ptr<QWidget> makeWindow(const QString& caption, const QString& what)
     window->setWindowTitle(caption);
     auto* layout = new QVBoxLayout(window.get());
     layout->addWidget(new QLabel(what));
-    layout->addWidget(new QProgressBar);
+    auto* bar = new QProgressBar;
+    bar->setAccessibleName(what);
+    layout->addWidget(bar);
     window->setMinimumWidth(pixels(4500));
     return window;
 }

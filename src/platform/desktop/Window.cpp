@@ -16,6 +16,7 @@ namespace kest::desktop {
 namespace {
 
 constexpr double twipsPerInch = 1440;
+constexpr int titleBar = 450;  // twips, about: the system tells only when the window is there
 
 std::shared_ptr<WindowDriver> windowDriver;
 FailureReporter failureReporter;
@@ -68,7 +69,7 @@ void showModal(QDialog& window)
     throwKept();
     if (!window.testAttribute(Qt::WA_Resized))
         window.adjustSize();
-    window.resize(window.size().boundedTo(window.screen()->availableSize()));
+    window.resize(window.size().boundedTo(window.screen()->availableSize() - pixels(0, titleBar)));
     WindowLayout layout(window);
     centre(window);
     {
