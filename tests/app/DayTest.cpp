@@ -1,0 +1,218 @@
+#include "app/Profile.h"
+#include "app/day/Day.h"
+#include "jobexport/JobLinkSettings.h"
+#include "platform/database/Sql.h"
+#include "platform/files/files.h"
+#include "platform/values.h"
+#include "shell/CredentialCipher.h"
+#include "shell/SharedVariables.h"
+#include "shell/modDBAccess.h"
+#include "support/MariaDbServer.h"
+#include "support/Snapshot.h"
+#include "support/TestProfile.h"
+
+#include <QDir>
+#include <QFile>
+#include <QImage>
+#include <QJsonObject>
+#include <QMap>
+
+#include <gtest/gtest.h>
+
+#include <functional>
+
+namespace kest::test {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+constexpr int backgroundWait = 5000;  // milliseconds
+
+QString orDash(const QString& text)
+{
+    return text.isEmpty() ? u"-"_s : text;
+}
+
+/// What a clerk would look at, by what it is: quotes with their notes and lines, files, the jobs in JobLink.
+using Holdings = QMap<QString, QString>;
+
+void addQuotes(Holdings& all)
+{
+    const QString today = shortDate(QDate::currentDate());
+    for (db::Recordset quote = Opened(u"SELECT * FROM QUOTE1 WHERE QTNNO>'1028'"_s); !quote.eof(); quote.moveNext()) {
+        const QString name = quote.text(u"QTNNO"_s) + u'/' + quote.text(u"Subquote"_s);
+        const QString key = sql("QTNNO='{}' AND Subquote={}", quote.text(u"QTNNO"_s), quote.value(u"Subquote"_s));
+        QStringList totals;
+        for (const char* column : {"TOTAL", "PRTTOTAL", "MISTOTAL", "excess", "contri"})
+            totals << quote.text(QString::fromLatin1(column));
+        all[name] = u"stage %1 %2, request %3 version %4, network %5, authority %6, money %7"_s.arg(
+            quote.text(u"Job_stage"_s), isTrue(quote.value(u"ReadOnly"_s)) ? u"locked"_s : u"open"_s,
+            orDash(quote.text(u"KESTQRNo"_s)), orDash(quote.text(u"KESTQRVer"_s)), orDash(quote.text(u"KESTQuoteNo"_s)),
+            orDash(quote.text(u"KESTAuthNo"_s)), totals.join(u' '));
+        all[name + u" notes"_s] =
+            Opened(u"SELECT remarks FROM QUOTE3 WHERE "_s + key).text(u"remarks"_s).replace(today, u"today"_s);
+        for (db::Recordset line = Opened(u"SELECT * FROM QUOTE2 WHERE "_s + key); !line.eof(); line.moveNext()) {
+            QStringList values;
+            for (const char* column :
+                 {"SEQ_NO", "rrhour", "rahour", "pthour", "rr_rate2", "qty", "unitcost", "itemno", "tosend"})
+                values << orDash(line.text(QString::fromLatin1(column)));
+            all[name + u' ' + line.text(u"category"_s) + u' ' + line.text(u"script"_s)] = values.join(u' ');
+        }
+    }
+}
+
+void addFiles(Holdings& all)
+{
+    const std::pair<QString, QString> folders[] = {{u"unread"_s, gsUnreadPath},
+                                                   {u"read"_s, gsReadPath},
+                                                   {u"unsent"_s, gsUnsentPath},
+                                                   {u"sent"_s, gsSentPath},
+                                                   {u"PDF"_s, gsReadPath + u"..\\PDF\\"_s},
+                                                   {u"images"_s, gsImagesPath}};
+    for (const auto& [name, path] : folders)
+        for (const QString& file : files::list(path))
+            all[name + u' ' + file];
+}
+
+void addJobs(Holdings& all, const MariaDbServer& server)
+{
+    const auto jobLink = std::make_shared<db::Connection>();
+    jobLink->open(server.connectionText(u"jobs"_s));
+    db::Recordset job(jobLink);
+    job.open(
+        u"SELECT nJobID_PK, Status, JobNr, custName, vehReg, COUNT(nJobDtlID_PK) AS details, SUM(lineSale) AS sale "
+        "FROM newJob JOIN newJobHdr h ON h.nJobID_FK=nJobID_PK JOIN newJobDtl d ON d.nJobID_FK=nJobID_PK "
+        "GROUP BY nJobID_PK, Status, JobNr, custName, vehReg"_s);
+    for (; !job.eof(); job.moveNext()) {
+        QStringList values;
+        for (const QString& column : job.columns().sliced(1))
+            values << job.text(column);
+        all[u"job "_s + job.text(u"nJobID_PK"_s)] = values.join(u' ');
+    }
+}
+
+Holdings found(const MariaDbServer& server)
+{
+    Holdings all;
+    addQuotes(all);
+    addFiles(all);
+    addJobs(all, server);
+    return all;
+}
+
+QStringList changes(const Holdings& before, const Holdings& after)
+{
+    QStringList lines;
+    for (auto was = before.begin(); was != before.end(); ++was)
+        if (!after.contains(was.key()))
+            lines << u"- "_s + was.key();
+    for (auto is = after.begin(); is != after.end(); ++is)
+        if (!before.contains(is.key()) || before[is.key()] != *is)
+            lines << (u"+ "_s + is.key() + (is->isEmpty() ? QString() : u": "_s + *is));
+    return lines;
+}
+
+/// The boxes with their exact texts, the reports and documents, and the rows of each list that was read.
+QStringList linesOf(const desktop::Record& record)
+{
+    QStringList lines;
+    for (const QJsonValue box : record.boxes)
+        lines << u"box %1: %2"_s.arg(box[u"icon"].toString(), box[u"text"].toString().replace(u"\r\n"_s, u" / "_s));
+    for (const QJsonValue window : record.windows)
+        if (window[u"name"] == u"frmPrintPreview"_s)
+            lines << u"report %1: %2 rows"_s.arg(window[u"report"].toInt())
+                         .arg(window[u"table"][u"rows"].toArray().size());
+    for (const QJsonValue read : record.reads)
+        for (const QJsonValue row : read[u"values"][u"ListView1"][u"rows"].toArray()) {
+            QStringList cells;
+            for (const QJsonValue cell : row.toArray())
+                cells << cell.toString();
+            lines << u"row "_s + cells.join(u" | "_s);
+        }
+    return lines;
+}
+
+/// The expected lines of each step, from a text in which "== step" heads those of a step.
+QMap<QString, QStringList> expectedSteps()
+{
+    QMap<QString, QStringList> steps;
+    QString step;
+    QFile file(QStringLiteral(KEST_SOURCE_DIR "/tests/app/day.txt"));
+    EXPECT_TRUE(file.open(QIODevice::ReadOnly));
+    for (const QString& line : QString::fromUtf8(file.readAll()).split(u'\n', Qt::SkipEmptyParts)) {
+        if (line.startsWith(u"== "_s))
+            steps[step = line.sliced(3)];
+        else if (!line.startsWith(u'#'))
+            steps[step] << line;
+    }
+    return steps;
+}
+
+bool isBlank(const QImage& picture)
+{
+    const QRgb first = picture.pixel(0, 0);
+    for (int y = 0; y < picture.height(); ++y)
+        for (int x = 0; x < picture.width(); ++x)
+            if (picture.pixel(x, y) != first)
+                return false;
+    return true;
+}
+
+/// Every window and every report has a picture with something on it.
+void checkPictures(const QDir& pictures)
+{
+    const QStringList windows{u"comparison"_s,   u"extra-information"_s, u"login"_s,       u"messages"_s,
+                              u"panel"_s,        u"sublet-document"_s,   u"text"_s,        u"utilities"_s,
+                              u"report-1-710"_s, u"report-1-720"_s,      u"report-1-730"_s};
+    for (const QString& window : windows)
+        EXPECT_FALSE(pictures.entryList({u"*-"_s + window + u".png"_s}).isEmpty()) << window.toStdString();
+    for (const QString& file : pictures.entryList(QDir::Files)) {
+        const QImage picture(pictures.filePath(file));
+        EXPECT_FALSE(picture.isNull() || isBlank(picture)) << file.toStdString();
+    }
+}
+
+using Look = std::function<void(const QString& step, const desktop::Record& shown)>;
+
+/// Plays the day in a shop of its own, looks after each step, and tells what the shop holds at the end.
+std::string played(const MariaDbServer& server, const Look& look)
+{
+    const TestProfile profile;
+    const QDir pictures(profile.root() + u"/pictures"_s);
+    app::initProfile(true);
+    app::Day day(pictures.path());
+    InitCipherKey();
+    StoreJobLinkSettings({u"127.0.0.1"_s, server.port(), u"jobs"_s, server.user(), server.password()});
+    for (const QString& step : app::Day::steps()) {
+        const desktop::Record shown = day.play(step);
+        files::waitForBackground(backgroundWait);
+        look(step, shown);
+    }
+    checkPictures(pictures);
+    return holdings();
+}
+
+}  // namespace
+
+TEST(Day, LeavesAfterEachStepWhatItShouldAndTheSameEachTime)
+{
+    const QMap<QString, QStringList> expected = expectedSteps();
+    EXPECT_EQ(app::Day::steps(), expected.keys());
+    MariaDbServer server;
+    server.createDatabase(u"jobs"_s, files::read(QStringLiteral(KEST_SOURCE_DIR "/sql/joblink.sql")));
+
+    Holdings before;
+    const std::string first = played(server, [&](const QString& step, const desktop::Record& shown) {
+        const Holdings after = found(server);
+        QStringList lines = linesOf(shown);
+        if (!before.isEmpty() && !step.endsWith(u".sql"_s))
+            lines << changes(before, after);
+        before = after;
+        EXPECT_EQ(expected[step].join(u'\n').toStdString(), lines.join(u'\n').toStdString()) << step.toStdString();
+    });
+    const std::string again = played(server, [](const QString&, const desktop::Record&) {});
+    EXPECT_TRUE(first == again) << difference(first, again);
+}
+
+}  // namespace kest::test
