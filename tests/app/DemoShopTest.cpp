@@ -19,7 +19,6 @@
 
 #include <gtest/gtest.h>
 
-#include <memory>
 #include <optional>
 
 namespace kest::test {
@@ -35,8 +34,6 @@ enum class EngineOf { Profile, Server };
 /// The demo shop in the embedded database of its profile, and the same shop on a server.
 class DemoShop : public ::testing::TestWithParam<EngineOf> {
 protected:
-    static void TearDownTestSuite() { server.reset(); }
-
     DemoShop()
     {
         EXPECT_TRUE(app::initProfile(true, today));
@@ -47,17 +44,14 @@ protected:
 
     static void moveToServer()
     {
-        if (!server)
-            server = std::make_unique<MariaDbServer>();
-        server->createDatabase(u"shop"_s);
+        mariaDb().createDatabase(u"shop"_s);
         db::Connection database;
-        database.open(server->connectionText(u"shop"_s));
+        database.open(mariaDb().connectionText(u"shop"_s));
         app::createTables(database, app::Dialect::MariaDb);
         app::fillNewShop(database);
         app::fillDemoShop(database, today);
-        const std::pair<QString, QString> places[] = {{u"ServerName"_s, u"mysql:127.0.0.1:%1"_s.arg(server->port())},
-                                                      {u"DatabaseName"_s, u"shop"_s},
-                                                      {u"SAPwd"_s, server->password()}};
+        const std::pair<QString, QString> places[] = {{u"ServerName"_s, u"mysql:127.0.0.1:%1"_s.arg(mariaDb().port())},
+                                                      {u"DatabaseName"_s, u"shop"_s}};
         for (const auto& [name, value] : places)
             EXPECT_TRUE(settings::setValue(settings::Hive::LocalMachine, u"SOFTWARE\\wirra32\\frmsplash"_s, name,
                                            {settings::Type::Text, value}));
@@ -75,9 +69,6 @@ protected:
     TestProfile profile;
     ScriptedDesktop desktop{R"({"boxes":[{"text":"DELETED","answer":"yes"}]})"};
     std::optional<eKEST> host;
-
-private:
-    static inline std::unique_ptr<MariaDbServer> server;
 };
 
 QMap<QString, MessageRow> listed(int folder)

@@ -30,16 +30,13 @@ QString jobLinkTables()
 
 class JobLink : public Shop {
 protected:
-    static void SetUpTestSuite() { server = std::make_unique<MariaDbServer>(); }
-    static void TearDownTestSuite() { server.reset(); }
-
     JobLink()
     {
-        server->createDatabase(u"jobs"_s, jobLinkTables());
+        mariaDb().createDatabase(u"jobs"_s, jobLinkTables());
         jobs = std::make_shared<db::Connection>();
-        jobs->open(server->connectionText(u"jobs"_s));
+        jobs->open(mariaDb().connectionText(u"jobs"_s));
         InitCipherKey();
-        store(server->password());
+        store(mariaDb().password());
         car("ABC123").set("PAINT_GP", "M1").set("XMission", "Manual").set("Year", "03/2005");
         quote("500").set("qtndate", QDate(2008, 3, 21)).set("QUOTER", "Sam").set("policy_no", "P7");
     }
@@ -47,7 +44,7 @@ protected:
 
     static void store(const QString& password)
     {
-        StoreJobLinkSettings({u"127.0.0.1"_s, server->port(), u"jobs"_s, server->user(), password});
+        StoreJobLinkSettings({u"127.0.0.1"_s, mariaDb().port(), u"jobs"_s, mariaDb().user(), password});
     }
 
     db::Recordset rows(const char* select) const
@@ -76,7 +73,6 @@ protected:
         return found.eof() ? -1 : found.text(u"Status"_s).toInt();
     }
 
-    static inline std::unique_ptr<MariaDbServer> server;
     db::ConnectionPtr jobs;
 };
 
@@ -201,7 +197,7 @@ TEST_F(JobLink, AServerThatRefusesIsPassedOverInSilence)
 {
     store(u"wrong"_s);
     WriteQuote(u"500"_s, u"0"_s);
-    StoreJobLinkSettings({u"127.0.0.1"_s, 1, u"jobs"_s, server->user(), server->password()});
+    StoreJobLinkSettings({u"127.0.0.1"_s, 1, u"jobs"_s, mariaDb().user(), mariaDb().password()});
     QElapsedTimer clock;
     clock.start();
     WriteQuote(u"500"_s, u"0"_s);

@@ -30,29 +30,14 @@ const auto odbcDriver = u"Shop Server"_s;
 class Environment final : public ::testing::Environment {
 public:
     void SetUp() override { MariaDbServer::registerOdbcDriver(odbcList, odbcDriver); }
-    void TearDown() override { server.reset(); }
-
-    std::unique_ptr<MariaDbServer> server;
 
 private:
     QTemporaryDir odbcList;
 };
 
-Environment* const environment = [] {
-    auto made = std::make_unique<Environment>();
-    Environment* kept = made.get();
-    ::testing::AddGlobalTestEnvironment(made.release());  // owned by the test framework from here on
-    return kept;
-}();
+const auto* const environment = ::testing::AddGlobalTestEnvironment(std::make_unique<Environment>().release());
 
 }  // namespace
-
-MariaDbServer& mariaDb()
-{
-    if (!environment->server)
-        environment->server = std::make_unique<MariaDbServer>();
-    return *environment->server;
-}
 
 Databases::Databases()
 {

@@ -15,9 +15,6 @@ namespace kest::test {
 
 enum class On { Embedded, MySql, Odbc };
 
-/// One server for the whole program; it is started by the first test that needs it.
-MariaDbServer& mariaDb();
-
 /// The error that a step throws; number 0 where it throws none.
 template <class Step>
 RuntimeError failure(Step&& step)

@@ -8,6 +8,7 @@
 #include <QDeadlineTimer>
 #include <QDir>
 #include <QFile>
+#include <QFileInfo>
 #include <QStandardPaths>
 #include <QThread>
 
@@ -18,6 +19,7 @@
 #include <unistd.h>
 
 #include <csignal>
+#include <memory>
 #include <stdexcept>
 
 namespace kest::test {
@@ -25,6 +27,8 @@ namespace kest::test {
 using namespace Qt::StringLiterals;
 
 namespace {
+
+std::unique_ptr<MariaDbServer> shared;
 
 constexpr int startMilliseconds = 30000;
 constexpr int stopMilliseconds = 10000;
@@ -63,7 +67,19 @@ QString textFor(const QString& driver, int port, const QString& database, const 
 
 }  // namespace
 
-MariaDbServer::MariaDbServer()
+namespace {
+
+/// In memory where there is such a place: the server waits for the disk at each change of a table, whatever its
+/// options.
+QString folderForData()
+{
+    const QFileInfo memory(u"/dev/shm"_s);
+    return (memory.isWritable() ? memory.filePath() : QDir::tempPath()) + u"/kest2-mariadb-XXXXXX"_s;
+}
+
+}  // namespace
+
+MariaDbServer::MariaDbServer() : folder(folderForData())
 {
     prepareData();
     start();
@@ -97,7 +113,8 @@ void MariaDbServer::start()
                   u"--bind-address=127.0.0.1"_s, u"--port="_s + QString::number(tcpPort),
                   u"--socket="_s + folder.filePath(u"s.sock"_s), u"--pid-file="_s + folder.filePath(u"pid"_s),
                   u"--skip-name-resolve"_s, u"--innodb-buffer-pool-size=16M"_s, u"--innodb-flush-log-at-trx-commit=0"_s,
-                  u"--performance-schema=OFF"_s});
+                  u"--innodb-flush-method=nosync"_s, u"--innodb-doublewrite=0"_s, u"--innodb-log-file-size=8M"_s,
+                  u"--innodb-use-native-aio=0"_s, u"--performance-schema=OFF"_s});
     const QDeadlineTimer deadline(startMilliseconds);
     db::Connection connection;
     while (!attempt([&] { connection.open(textFor(u"MySQL"_s, tcpPort, u"mysql"_s, u"root"_s, {})); })) {
@@ -106,8 +123,9 @@ void MariaDbServer::start()
         QThread::msleep(20);
         server.waitForReadyRead(1);
     }
-    for (const QString& name : {user(), u"sa"_s})  // "sa" is who the component always is
-        connection.execute(sql("GRANT ALL ON *.* TO '{}'@'127.0.0.1' IDENTIFIED BY '{}'", name, password()));
+    // "sa" is who the component always is, and the setting for its password is empty by default
+    for (const auto& [name, secret] : {std::pair(user(), password()), std::pair(u"sa"_s, QString())})
+        connection.execute(sql("GRANT ALL ON *.* TO '{}'@'127.0.0.1' IDENTIFIED BY '{}'", name, secret));
 }
 
 void MariaDbServer::createDatabase(const QString& name, const QString& script)
@@ -130,6 +148,18 @@ void MariaDbServer::kill()
 {
     server.kill();
     server.waitForFinished(stopMilliseconds);
+}
+
+MariaDbServer& mariaDb()
+{
+    if (!shared)
+        shared = std::make_unique<MariaDbServer>();
+    return *shared;
+}
+
+void stopMariaDb()
+{
+    shared.reset();
 }
 
 void MariaDbServer::registerOdbcDriver(const QTemporaryDir& folder, const QString& name)

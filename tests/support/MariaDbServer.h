@@ -1,4 +1,4 @@
-// A MariaDB server of its own for one test program, on a free loopback port, with its data in a temporary folder.
+// A MariaDB server for tests, on a free loopback port, with its data in a temporary folder.
 #pragma once
 
 #include <QProcess>
@@ -36,5 +36,10 @@ private:
     QProcess server;
     int tcpPort = 0;
 };
+
+/// The one server of a test program, started when it is first asked for.
+MariaDbServer& mariaDb();
+/// Before the program ends.
+void stopMariaDb();
 
 }  // namespace kest::test

@@ -1,36 +1,16 @@
 #include "support/Shop.h"
 
-#include "app/QuoteDatabase.h"
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
 #include "shell/SharedVariables.h"
+#include "support/ShopDatabase.h"
 
 namespace kest::test {
 
 using namespace Qt::StringLiterals;
 
 namespace {
-
-/// The database file of a new shop with one model that cars can have; built once, since making tables costs commits.
-const QByteArray& newShopFile()
-{
-    static const QByteArray file = [] {
-        const TestProfile profile;
-        db::ConnectionPtr database = app::openEmbedded(u"WirSql"_s);
-        app::createTables(*database, app::Dialect::Embedded);
-        app::fillNewShop(*database);
-        database->execute(
-            u"INSERT INTO MODEL (MODEL_ID, MODEL_ID1, MAKE, MODEL) "
-            "VALUES ('C120', 'C120', 'CORELLA', 'MERIDIAN GL')"_s);
-        database->execute(
-            u"INSERT INTO ALLMODEL (MODEL_ID, MAKE, MODEL, SCHEDULE) "
-            "VALUES ('C120', 'CORELLA', 'MERIDIAN GL', '')"_s);
-        database->close();
-        return files::readBytes(app::embeddedFile(u"WirSql"_s));
-    }();
-    return file;
-}
 
 void forgetSharedVariables()
 {
@@ -129,15 +109,14 @@ VendorRow vendor(const Text& name)
     return VendorRow("VENDOR", condition);
 }
 
-Shop::Shop() : desktop(std::in_place), newShop_(newShopFile()), root_(profile_.root())
+Shop::Shop() : desktop(std::in_place), root_(profile_.root())
 {
     forgetSharedVariables();
     for (const char* folder : {"AUnread", "ARead", "AUnsent", "ASent", "PDF"})
         files::makeFolder(u"c:\\wirdoc\\"_s + QString::fromLatin1(folder));
     files::makeFolder(u"c:\\wirimg"_s);
-    files::makeFolder(root_ + u"/databases"_s);
     files::makeFolder(root_ + u"/component"_s);
-    files::writeBytes(app::embeddedFile(u"WirSql"_s), newShop_);
+    makeShopDatabase();
     host_.emplace();
 }
 

@@ -46,7 +46,6 @@ protected:
     std::optional<ScriptedDesktop> desktop;
 
 private:
-    QByteArray newShop_;  // before the profile: it is made in one of its own
     TestProfile profile_;
     QString root_;
     std::optional<eKEST> host_;

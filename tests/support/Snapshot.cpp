@@ -1,10 +1,10 @@
 #include "support/Snapshot.h"
 
-#include "app/QuoteDatabase.h"
 #include "inbound/modLoadXML.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
 #include "shell/SharedVariables.h"
+#include "shell/modDBAccess.h"
 
 #include <QDir>
 #include <QDirIterator>
@@ -77,22 +77,11 @@ std::string difference(const std::string& expected, const std::string& found)
     return '\n' + lines.join(u'\n').toStdString();
 }
 
-Snapshot::Snapshot() : files_(filesOnDisk())
-{
-    gConn->close();
-    database_ = files::readBytes(app::embeddedFile(u"WirSql"_s));
-    gConn = app::openEmbedded(u"WirSql"_s);
-}
+Snapshot::Snapshot() : files_(filesOnDisk()) {}
 
 void Snapshot::restore() const
 {
-    gConn->close();
-    const QString place = app::embeddedFile(u"WirSql"_s);
-    for (const char* suffix : {"-wal", "-shm"})
-        QFile::remove(place + QString::fromLatin1(suffix));
-    files::writeBytes(place, database_);
-    gConn = app::openEmbedded(u"WirSql"_s);
-
+    database_.restore();
     const QMap<QString, QByteArray> now = filesOnDisk();
     for (auto file = now.begin(); file != now.end(); ++file) {
         if (!files_.contains(file.key()))

@@ -1,6 +1,8 @@
 // What a shop holds, as text to compare and as a state to go back to.
 #pragma once
 
+#include "support/ShopDatabase.h"
+
 #include <QByteArray>
 #include <QMap>
 #include <QString>
@@ -14,15 +16,16 @@ std::string holdings();
 /// The lines that only one of two such texts has.
 std::string difference(const std::string& expected, const std::string& found);
 
+/// One at a time.
 class Snapshot {
 public:
     Snapshot();
-    /// Files, rows and what a load hands to the file move; the connection is a new one.
+    /// Files, rows and what a load hands to the file move.
     void restore() const;
 
 private:
     QMap<QString, QByteArray> files_;
-    QByteArray database_;
+    SavedShopDatabase database_;
 };
 
 }  // namespace kest::test

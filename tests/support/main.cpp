@@ -1,4 +1,6 @@
 // Runs a test program: no display, the code page's texts in failures, nothing of this workstation's own profile.
+#include "support/MariaDbServer.h"
+
 #include <QApplication>
 
 #include <gtest/gtest.h>
@@ -16,5 +18,7 @@ int main(int argc, char** argv)
         qputenv("QT_QPA_PLATFORM", "offscreen");
     QApplication application(argc, argv);
     ::testing::InitGoogleTest(&argc, argv);
-    return RUN_ALL_TESTS();
+    const int result = RUN_ALL_TESTS();
+    kest::test::stopMariaDb();
+    return result;
 }
