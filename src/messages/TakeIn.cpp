@@ -147,6 +147,8 @@ TakenIn TakeInFiles(const QList<QUrl>& urls, const std::function<void(qint64 don
                 return;
             files::copy(path, files::pathForWriting(gsUnreadPath, name));
             ++(kind == Kind::Message ? result.messages : kind == Kind::Picture ? result.pictures : result.descriptions);
+            if (kind == Kind::Message && !name.startsWith("R_"_L1))
+                result.toList.append(name);
         });
         if (progress)
             progress(++done, brought.size());

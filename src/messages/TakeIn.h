@@ -13,6 +13,7 @@ struct TakenIn {
     int messages = 0;
     int pictures = 0;
     int descriptions = 0;
+    QStringList toList;   // the messages, but for responses, which no list shows
     QStringList refused;  // "name: why"
 
     /// "Taken in: 2 messages, 1 picture."

@@ -38,6 +38,8 @@
 #include <QTreeView>
 #include <QVBoxLayout>
 
+#include <algorithm>
+
 using namespace Qt::StringLiterals;
 
 namespace kest {
@@ -473,7 +475,12 @@ void frmMessageList::takeIn(const QList<QUrl>& brought)
         taken = TakeInFiles(brought, [&](qint64 done, qint64 total) { progress.step(done, total); });
     }
     Form_KeyRefresh();
-    lblStatus->setText(taken.summary() + u' ' + lblStatus->text());
+    const qsizetype waiting = taken.toList.size() - std::ranges::count_if(rows(), [&](const ListedMessage& message) {
+                                  return taken.toList.contains(message.file);
+                              });
+    const QString held = u" %1 not listed yet: held back by missing pictures or an earlier message."_s;
+    lblStatus->setText(taken.summary() + (waiting > 0 && fillFailure.isEmpty() ? held.arg(waiting) : QString()) + u' ' +
+                       lblStatus->text());
     if (!taken.refused.isEmpty())
         desktop::msgBox(taken.refusals(), desktop::Icon::Exclamation);
 }
