@@ -120,7 +120,7 @@ CREATE TABLE CAR (
     COLOUR     VARCHAR(50),
     VIN        VARCHAR(50),
     XMission   VARCHAR(50),
-    Year       VARCHAR(10),
+    Year       VARCHAR(20),
     PAINT_GP   VARCHAR(2)
 ) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_uca1400_as_ci;
 

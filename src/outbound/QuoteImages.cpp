@@ -47,7 +47,7 @@ void WriteImageDocuments(const QString& folder, const QString& quoteNumber, cons
         });
         const QString name = u"I_"_s + image.file;
         files::write(gsUnsentPath + name.chopped(3) + u"xml"_s, request.xml());
-        files::copy(folder + image.file, gsUnsentPath + name);
+        files::copy(files::pathForWriting(folder, image.file), gsUnsentPath + name);
     }
 }
 

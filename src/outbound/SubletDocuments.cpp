@@ -27,7 +27,7 @@ QStringList SubletDocumentNumbers(const QString& QTNNO, const QString& Subquote)
 
     QStringList numbers;
     for (const QString& file : files) {
-        if (!file.startsWith(start))
+        if (!file.startsWith(start, Qt::CaseInsensitive))
             continue;
         const QString number = file.section(u'_', 1).section(u'.', 0, 0);
         if (numberIn(number).value_or(0) > 0 && !numbers.contains(number))

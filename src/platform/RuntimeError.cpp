@@ -5,7 +5,7 @@ namespace kest {
 RuntimeError::RuntimeError(int errorNumber, QString errorDescription, QString errorSource)
     : number_(errorNumber),
       description_(std::move(errorDescription)),
-      source_(std::move(errorSource)),
+      source_(errorSource.isEmpty() ? QStringLiteral("KEST2") : std::move(errorSource)),
       utf8_(description_.toUtf8())
 {
 }

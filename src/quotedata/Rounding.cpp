@@ -14,6 +14,8 @@ double RoundAmount(double& value, int places)
 {
     for (int place = 0; place < places; ++place)
         value *= 10;
+    if (!std::isfinite(value))
+        throw RuntimeError(Overflow, u"Overflow"_s);
 
     const auto whole = static_cast<double>(toLong(RoundDown(value)));
     if (value - whole >= 0.5)

@@ -238,7 +238,7 @@ bool Print(const QString& fileName, bool Reprint)
 {
     QString text = files::read(gsListFolder + fileName);
     const xml::Document message = ParsedMessage(text);
-    const QString type = message.textOf(u"//*[name()='messageType']"_s);
+    const QString type = message.documentElement().textOrEmptyOf(u"//*[name()='messageType']"_s);
     if (type == u"QREQ"_s)
         return PrintRequest(message);
     if (type == u"ADQT"_s)
@@ -247,7 +247,7 @@ bool Print(const QString& fileName, bool Reprint)
         return PrintAuthorised(message, Reprint);
     if (type == u"ARES"_s)
         return PrintResult(message);
-    return true;  // the other types have no report
+    return true;  // the other types have no report, nor has a marker, which names no type
 }
 
 }  // namespace

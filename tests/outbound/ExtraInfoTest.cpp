@@ -146,7 +146,8 @@ TEST_F(ExtraInformation, TheCarTakesItsNormalFormsOnEverySend)
                  {"1998", " a", "Sea Mist", "01", "1998", "01/1998", "Automatic", "sea mist"},
                  {"98", "M", nullptr, "(none)", "(none)", "/", "Manual", "(none)"},
                  {nullptr, nullptr, "GREY", "(none)", "(none)", "/", "Manual", "GREY"},
-                 {"2/2001", "auto", "", "2", "2001", "2/2001", "Manual", "(none)"}};
+                 {"2/2001", "auto", "", "2", "2001", "2/2001", "Manual", "(none)"},
+                 {"March 1998", "", "", "01", "March 1998", "01/March 1998", "Manual", "(none)"}};
     for (const auto& c : cases) {
         sendable().locked(false);
         car("ABC123").set("Year", c.year).set("XMission", c.transmission).set("COLOUR", c.colour);

@@ -66,7 +66,7 @@ TEST(RoundAmount, RoundsTheBinaryValueHalfAwayFromZero)
 
 TEST(RoundAmount, FailsWhereTheScaledAmountDoesNotFit)
 {
-    for (double value : {21474836.48, -21474836.50, 1.5e15})
+    for (double value : {21474836.48, -21474836.50, 1.5e15, 1e307})
         EXPECT_THROW(RoundAmount(value, 2), RuntimeError) << value;
 }
 

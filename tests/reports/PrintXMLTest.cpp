@@ -136,6 +136,7 @@ TEST_F(Printing, EachTypeHasItsReportOrNone)
         {authorisedQuote("501"), "frmPrintPreview730",
          "[critical] Matching quote was not found in database, Please contact MarlinDesk Support."},
         {Text(Message("adqt", "getAdjustedQuoteResponse").text()), "", ""},
+        {marker("500"), "", ""},
     };
     for (const auto& c : cases) {
         print(c.message);
@@ -144,7 +145,9 @@ TEST_F(Printing, EachTypeHasItsReportOrNone)
     }
     Message broken = adjustedQuote("500");
     print(broken.without("assessmentComment"));
-    EXPECT_EQ(shown().substr(0, 67), "[none] An error 91 has occured, Please contact MarlinDesk Support\r\n");
+    const std::string box = shown();
+    EXPECT_EQ(box.substr(0, 67), "[none] An error 91 has occured, Please contact MarlinDesk Support\r\n");
+    EXPECT_EQ(box.substr(box.rfind('-')), "-KEST2");
 }
 
 TEST_F(Printing, TheListWindowReprintsItsReadMessages)
@@ -188,6 +191,7 @@ TEST_F(Printing, EachChangedLineStandsInItsSection)
         return message.labour(1, "D")
             .labour(2, "D")
             .labour(91, "I", {{"labourType", ""}, {"labourGroup", "1"}, {"labourDescription", "Labour unknown"}})
+            .labour(90, "C", {{"labourType", "OTH"}, {"labourGroup", ""}, {"labourDescription", "Labour kept"}})
             .part(92, "I", {{"partDescription", "Parts unknown"}})
             .paint(93, "I", {{"paintWorkType", ""}, {"paintGroup", "1"}, {"paintDescription", "Paint unknown"}})
             .sublet(94, "C", {{"subletType", "OTH"}, {"subletDescription", "Sublet other"}});
@@ -205,12 +209,12 @@ TEST_F(Printing, EachChangedLineStandsInItsSection)
             if (const QString heading = line.trimmed().section(u' ', 0, 0);
                 !line.startsWith(u' ') && heading != "Line"_L1)
                 section = heading;
-            static const QRegularExpression script(u"(Labour|Parts|Paint|Sublet) (deleted|other|unknown|bare)"_s);
+            static const QRegularExpression script(u"(Labour|Parts|Paint|Sublet) (deleted|other|unknown|bare|kept)"_s);
             const auto found = script.match(line);
             count += found.hasMatch() ? 1 : 0;
             EXPECT_TRUE(!found.hasMatch() || found.captured(1) == section) << line.toStdString();
         }
-        EXPECT_EQ(count, name[5] == '1' ? 6 : 7);
+        EXPECT_EQ(count, name[5] == '1' ? 7 : 8);
     }
     const QString unchanged = pdfText(root() + u"/out/3-730.pdf"_s);
     EXPECT_TRUE(unchanged.contains(u"No line of this quote was changed"_s));
