@@ -11,6 +11,7 @@
 
 #include <QStringList>
 
+#include <algorithm>
 #include <utility>
 
 namespace kest {
@@ -317,9 +318,12 @@ bool LoadQREQ(QString& text, const QString& fileName)
     PrintXML(fileName, false);
     TakePhotographs(message.documentElement(), request.number, quoteNumber);
 
+    cinfo.requery();  // another workstation may have counted on while the report was open
     db::Recordset tried(gConn);
     const QString next = NextQuoteNumber(quoteNumber, cinfo, tried, true);
-    if (isNumeric(next)) {  // with a prefix of letters the counter stays, and the search skips what is taken
+    if (std::ranges::all_of(next, [](QChar c) {
+            return c.isDigit();
+        })) {  // with a prefix of letters the counter stays, and the search skips what is taken
         cinfo.set(u"QUOTE_VAL"_s, next);
         cinfo.update();
     }

@@ -19,7 +19,7 @@ std::optional<QTime> readIsoTime(TextReader& reader)
     int second = 0;
     int millisecond = 0;
     if (reader.take(u':')) {
-        const auto seconds = reader.number(2, 2);
+        const auto seconds = reader.number(1, 2);
         if (!seconds)
             return {};
         second = *seconds;

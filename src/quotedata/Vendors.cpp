@@ -3,6 +3,8 @@
 #include "platform/database/Sql.h"
 #include "shell/modDBAccess.h"
 
+#include <utility>
+
 namespace kest {
 
 using namespace Qt::StringLiterals;
@@ -18,9 +20,12 @@ QVariant FindOrAddVendor(const QString& name, const QString& street, const QStri
     db::Recordset vendor = Opened(sql("SELECT * FROM VENDOR WHERE NAME LIKE '%{}%'", name));
     if (vendor.eof()) {
         vendor.addNew();
-        vendor.set(u"Name"_s, name);
-        vendor.set(u"street"_s, street);
-        vendor.set(u"phone"_s, phone);
+        // cut to what the column holds: a long address must not keep a whole authorisation out
+        const std::pair<QString, QString> texts[] = {{u"Name"_s, name}, {u"street"_s, street}, {u"phone"_s, phone}};
+        for (const auto& [column, text] : texts) {
+            const int size = vendor.size(column);
+            vendor.set(column, size > 0 ? text.left(size) : text);
+        }
         for (const QLatin1StringView empty :
              {"contact"_L1, "suburb"_L1, "Fax"_L1, "accno"_L1, "email"_L1, "vendor_abn"_L1})
             vendor.set(empty, u""_s);

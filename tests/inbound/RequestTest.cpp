@@ -186,6 +186,7 @@ TEST_F(Requests, TheQuoteNumberIsTheNextThatIsFree)
         // a number with letters is no count at all
         {"QUOTE_PRE='Q', QUOTE_VAL=50, QUOTE_SUF=''", "Q50", "50"},
         {"QUOTE_PRE='Q'", "Q51", "50"},
+        {"QUOTE_PRE='7E', QUOTE_VAL=20", "7E20", "20"},
     };
     quote("1001");
     quote("1003");

@@ -84,6 +84,7 @@ TEST(Helpers, AMessagesDateIsShownInLocalTime)
         {u"2024-10-05T15:59:59.999Z"_s, u"6/10/2024 1:59 AM"_s},
         {u"2024-10-05T16:00:00.000Z"_s, u"6/10/2024 3:00 AM"_s},
         {u"2024-10-06T02:30:00.000Z"_s, u"6/10/2024 1:30 PM"_s},
+        {u"2024-07-01T02:35:00.00Z"_s, u"1/7/2024 12:35 PM"_s},
         {u"2024-07-01T02:35:00Z"_s, u"1/7/2024 12:03 PM"_s},  // without a fraction the cut takes half of the minute
     };
     for (const auto& [text, expected] : cases)
