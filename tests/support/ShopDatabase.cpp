@@ -7,7 +7,6 @@
 #include "shell/SharedVariables.h"
 #include "shell/modDBAccess.h"
 #include "support/MariaDbServer.h"
-#include "support/TestProfile.h"
 
 #include <QFile>
 
@@ -29,12 +28,11 @@ void fill(db::Connection& database, app::Dialect dialect)
         u"INSERT INTO ALLMODEL (MODEL_ID, MAKE, MODEL, SCHEDULE) VALUES ('C120', 'CORELLA', 'MERIDIAN GL', '')"_s);
 }
 
-/// Built once, since making tables costs commits.
+/// Built once, in the profile of the first test, since making tables costs commits.
 const QByteArray& newShopFile()
 {
     static const QByteArray file = [] {
-        const TestProfile profile;
-        db::ConnectionPtr database = app::openEmbedded(shopName);
+        const db::ConnectionPtr database = app::openEmbedded(shopName);
         fill(*database, app::Dialect::Embedded);
         database->close();
         return files::readBytes(app::embeddedFile(shopName));
