@@ -1,6 +1,7 @@
 // A quote that was written outside the shop's system takes its place among the shop's quotes, with all its lines.
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
+#include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/desktop/Prompt.h"
 #include "platform/values.h"
@@ -201,7 +202,8 @@ bool LoadMANQ(QString& text, const QString& fileName)
     car.set(u"KEST"_s, 1);
     car.update();
 
-    if (quote.eof())
+    const bool isNew = quote.eof();
+    if (isNew)
         quote.addNew();
     if (notes.eof())
         notes.addNew();
@@ -216,7 +218,15 @@ bool LoadMANQ(QString& text, const QString& fileName)
     while (!lines.eof())
         lines.remove();
     car.update();
-    quote.update();
+    {
+        const std::unique_ptr<db::Lock> newQuotes = LockNewQuotes();
+        const db::Recordset standing =
+            Opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key->number, key->subquote));
+        if (isNew && !standing.eof())
+            throw RuntimeError(
+                RowChanged, u"Another workstation has made quote %1/%2 meanwhile."_s.arg(key->number, key->subquote));
+        quote.update();
+    }
     if (!LoadQuoteBody(quote, lines, message))
         return RefuseLines();
     CalcQuoteTotals(quote, lines);

@@ -263,7 +263,9 @@ bool LoadQREQ(QString& text, const QString& fileName)
 {
     const xml::Document message = ParsedMessage(text);
 
+    std::unique_ptr<db::Lock> newQuotes = LockNewQuotes();
     db::Recordset cinfo = Opened(u"SELECT * FROM CINFO"_s);
+    const QVariant counter = cinfo.value(u"QUOTE_VAL"_s);
     db::Recordset insurer = Opened(u"SELECT * FROM INSURER WHERE KEST=1 or name='KEST Universal Insurer'"_s);
     if (!ChooseInsurer(insurer))
         return Refuse(u"Error locating a valid insurer, Please contact MarlinDesk Support."_s);
@@ -279,8 +281,10 @@ bool LoadQREQ(QString& text, const QString& fileName)
 
     const db::Recordset known = Opened(sql("SELECT * FROM QUOTE1 WHERE SUBQUOTE=0 AND KESTQRNO='{}' AND KESTQRVER='{}'",
                                            request.number, request.version));
-    if (!known.eof())
+    if (!known.eof()) {
+        newQuotes.reset();  // a box may stand for hours
         return Refuse(u"Quote Request already exists as quote number "_s + known.text(u"QTNNO"_s) + u'!');
+    }
     request.readRest(message);
 
     const bool carFound = !car.eof();
@@ -313,12 +317,16 @@ bool LoadQREQ(QString& text, const QString& fileName)
     car.set(u"CUST_ID"_s, customer.value(u"CUST_ID"_s));  // a new customer has its number only now
     car.update();
     quote.update();
+    newQuotes.reset();
     notes.update();
 
     PrintXML(fileName, false);
     TakePhotographs(message.documentElement(), request.number, quoteNumber);
 
-    cinfo.requery();  // another workstation may have counted on while the report was open
+    newQuotes = LockNewQuotes();
+    cinfo.requery();
+    if (cinfo.value(u"QUOTE_VAL"_s) != counter)
+        return true;  // another workstation has counted on while the report was open
     db::Recordset tried(gConn);
     const QString next = NextQuoteNumber(quoteNumber, cinfo, tried, true);
     if (std::ranges::all_of(next, [](QChar c) {

@@ -127,6 +127,15 @@ bool LoadXML(QString& text, const QString& fileName)
     }
 }
 
+std::unique_ptr<db::Lock> LockNewQuotes()
+{
+    constexpr int patience = 20;  // seconds; it takes a fraction of one
+    auto lock = std::make_unique<db::Lock>(gConn, u"new quote"_s, patience);
+    if (!lock->isHeld())
+        throw RuntimeError(StatementFailed, u"Another workstation is making a quote."_s);
+    return lock;
+}
+
 void Fill(db::Recordset& row, std::initializer_list<Column> columns)
 {
     for (const Column& column : columns)

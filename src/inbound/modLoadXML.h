@@ -72,6 +72,10 @@ QString NextQuoteNumber(const QString& given, const db::Recordset& cinfo, db::Re
 /// One more than the highest number among the quote's files in the images folder.
 int NextImageNumber(const QString& quoteNumber);
 
+/// Held from the search for a free number until the quote stands: two workstations that load at once find no number
+/// free together. Fails where another one does not let go.
+std::unique_ptr<db::Lock> LockNewQuotes();
+
 struct Column {
     QLatin1StringView name;
     QVariant value;

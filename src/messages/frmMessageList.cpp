@@ -188,8 +188,12 @@ bool frmMessageList::load(const QString& file)
 {
     const QScopedValueRollback loading(busy, busy + 1);
     try {
-        QString text = files::read(gsCurFolder + file);
-        if (!LoadXML(text, file)) {
+        const db::Lock alone(gConn, u"load "_s + file.toUpper());
+        if (!alone.isHeld())
+            desktop::msgBox(u"Message %1 is being loaded on another workstation."_s.arg(file),
+                            desktop::Icon::Information);
+        QString text = alone.isHeld() ? files::read(gsCurFolder + file) : QString();
+        if (!alone.isHeld() || !LoadXML(text, file)) {
             RefreshList();
             tmrRefresh->start();
             return false;

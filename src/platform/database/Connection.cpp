@@ -139,6 +139,17 @@ void Connection::rebuildIndexes()
     engine().rebuildIndexes();
 }
 
+Lock::Lock(ConnectionPtr connection, const QString& name, int seconds) : connection_(std::move(connection)), name_(name)
+{
+    held_ = connection_ && connection_->engine().lock(name_, seconds);
+}
+
+Lock::~Lock()
+{
+    if (held_ && connection_->state() == 1)  // with the connection the lock has gone
+        attempt([&] { connection_->engine().unlock(name_); });
+}
+
 Engine& Connection::engine() const
 {
     if (state() != 1)

@@ -45,9 +45,27 @@ private:
     int commandTimeout_ = 0;
 };
 
+using ConnectionPtr = std::shared_ptr<Connection>;
+
+/// What only one of all that work on a database may do at a time, for as long as the lock lives. It keeps out those who
+/// ask for the same name, and touches no row.
+class Lock {
+public:
+    /// Waits that long for another one to let go.
+    Lock(ConnectionPtr connection, const QString& name, int seconds = 0);
+    ~Lock();
+    Lock(const Lock&) = delete;
+    Lock& operator=(const Lock&) = delete;
+
+    bool isHeld() const { return held_; }
+
+private:
+    ConnectionPtr connection_;
+    QString name_;
+    bool held_ = false;
+};
+
 /// True for a server's name that means this machine.
 bool isThisMachine(const QString& server);
-
-using ConnectionPtr = std::shared_ptr<Connection>;
 
 }  // namespace kest::db

@@ -423,6 +423,8 @@ QString Engine::holds(const QString& column, Kind kind, const QVariant& value) c
         return name + (value.toBool() ? u"<>0"_s : u"=0"_s);
     if (kind == Kind::Date && value.typeId() == QMetaType::QDateTime)
         return sameDate(name, literal(value));
+    if (kind == Kind::LongText)
+        return sameLongText(name, literal(value));
     return name + u'=' + literal(value);
 }
 
@@ -441,6 +443,21 @@ QString Engine::sqlState(const QSqlError& error)
         {207, u"42S22"_s},  {208, u"42S02"_s},  {2601, u"23000"_s}, {2627, u"23000"_s}, {4060, u"42000"_s},
         {18456, u"28000"_s}};
     return states.value(error.nativeErrorCode().section(u';', 0, 0).toInt(), u"HY000"_s);
+}
+
+static QString serverLock(const QString& literal)
+{
+    return u"SHA1(CONCAT(DATABASE(), '/', "_s + literal + u"))"_s;  // a name may have 64 characters
+}
+
+bool Engine::lockOnServer(const QString& name, int seconds)
+{
+    return ask(u"SELECT GET_LOCK(%1, %2)"_s.arg(serverLock(literal(name))).arg(seconds)).values.front().toInt() == 1;
+}
+
+void Engine::unlockOnServer(const QString& name)
+{
+    tell(u"DO RELEASE_LOCK(%1)"_s.arg(serverLock(literal(name))));
 }
 
 std::unique_ptr<TableInfo> Engine::fromInformationSchema(const QString& name, const InformationSchemaTerms& terms)

@@ -65,11 +65,15 @@ public:
     QString quoted(const QString& identifier) const;
     /// A value as a literal that no value can end; Null as NULL.
     virtual QString literal(const QVariant& value) const;
-    /// The condition that a column still holds a value.
+    /// The condition that a column still holds a value; empty for a long text that the engine can't compare.
     QString holds(const QString& column, Kind kind, const QVariant& value) const;
 
     virtual void setTimeout(int seconds) = 0;
     virtual void rebuildIndexes() {}
+
+    /// False where another one holds the name after that time. An engine without such locks lets everybody in.
+    virtual bool lock(const QString&, int /*seconds*/) { return true; }
+    virtual void unlock(const QString&) {}
 
 protected:
     explicit Engine(const QString& driver);
@@ -80,6 +84,9 @@ protected:
     Rows ask(const QString& statement);
     void tell(const QString& statement);
     /// A table as INFORMATION_SCHEMA tells it.
+    /// The lock of MariaDB and MySQL, which is one of the server: its name holds the database's.
+    bool lockOnServer(const QString& name, int seconds);
+    void unlockOnServer(const QString& name);
     std::unique_ptr<TableInfo> fromInformationSchema(const QString& name, const InformationSchemaTerms& terms);
 
     virtual Dialect dialect() const = 0;
@@ -90,6 +97,8 @@ protected:
     virtual QString defaultsOnly() const { return QStringLiteral("DEFAULT VALUES"); }
     /// The condition that a date column holds a literal's moment, however it was written.
     virtual QString sameDate(const QString& column, const QString& dateLiteral) const;
+    /// The condition that a long text is the literal's to the letter.
+    virtual QString sameLongText(const QString& /*column*/, const QString& /*literal*/) const { return {}; }
     virtual bool meansConnectionLost(const QSqlError& error) const = 0;
     virtual QString sqlState(const QSqlError& error);
     virtual void beforeStatement() {}

@@ -26,7 +26,10 @@ public:
         database.setPassword(password);
         database.setConnectOptions(u"CLIENT_FOUND_ROWS=1;MYSQL_OPT_CONNECT_TIMEOUT=%1"_s.arg(connectSeconds));
         openDatabase();
-        tell(u"SET SESSION sql_mode=CONCAT(@@sql_mode, ',NO_BACKSLASH_ESCAPES,PIPES_AS_CONCAT')"_s);
+        // strict: a value that does not fit is refused and not cut, however the server is set
+        tell(
+            u"SET SESSION sql_mode=CONCAT(@@sql_mode, ',NO_BACKSLASH_ESCAPES,PIPES_AS_CONCAT,STRICT_ALL_TABLES'), "
+            "autocommit=1"_s);
         isMariaDb = ask(u"SELECT VERSION()"_s).values.front().toString().contains(u"MariaDB"_s, Qt::CaseInsensitive);
     }
 
@@ -35,6 +38,9 @@ public:
         tell(isMariaDb ? u"SET SESSION max_statement_time="_s + QString::number(seconds)
                        : u"SET SESSION max_execution_time="_s + QString::number(qint64(seconds) * 1000));
     }
+
+    bool lock(const QString& name, int seconds) override { return lockOnServer(name, seconds); }
+    void unlock(const QString& name) override { unlockOnServer(name); }
 
 protected:
     Dialect dialect() const override
@@ -62,6 +68,11 @@ protected:
     }
 
     QString defaultsOnly() const override { return u"() VALUES ()"_s; }
+
+    QString sameLongText(const QString& column, const QString& literal) const override
+    {
+        return u"CONVERT(%1 USING utf8mb4)=%2 COLLATE utf8mb4_bin"_s.arg(column, literal);
+    }
 
     bool meansConnectionLost(const QSqlError& error) const override
     {

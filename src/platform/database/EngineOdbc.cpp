@@ -44,6 +44,13 @@ public:
             tell(u"SET LOCK_TIMEOUT "_s + QString::number(seconds > 0 ? qint64(seconds) * 1000 : -1));
     }
 
+    bool lock(const QString& name, int seconds) override { return !isMySql || lockOnServer(name, seconds); }
+    void unlock(const QString& name) override
+    {
+        if (isMySql)
+            unlockOnServer(name);
+    }
+
 protected:
     Dialect dialect() const override
     {

@@ -4,8 +4,10 @@
 #include "platform/database/Engine.h"
 #include "platform/values.h"
 
+#include <QCryptographicHash>
 #include <QDeadlineTimer>
 #include <QFileInfo>
+#include <QLockFile>
 #include <QSqlDriver>
 #include <QSqlQuery>
 #include <QSqlResult>
@@ -14,6 +16,7 @@
 
 #include <algorithm>
 #include <cstring>
+#include <map>
 
 namespace kest::db {
 
@@ -92,6 +95,19 @@ public:
 
     void rebuildIndexes() override { executeNative(u"REINDEX"_s); }
 
+    /// A file beside the database's. One whose process has ended is no lock.
+    bool lock(const QString& name, int seconds) override
+    {
+        const QByteArray hash = QCryptographicHash::hash(name.toUtf8(), QCryptographicHash::Sha1).toHex();
+        auto file = std::make_unique<QLockFile>(database.databaseName() + u'-' + QString::fromLatin1(hash));
+        file->setStaleLockTime(0);
+        if (!file->tryLock(seconds * 1000) && file->error() == QLockFile::LockFailedError)
+            return false;  // any other failure is one of a folder that can't be written, as the database will tell
+        locks[name] = std::move(file);
+        return true;
+    }
+    void unlock(const QString& name) override { locks.erase(name); }
+
 protected:
     Dialect dialect() const override
     {
@@ -155,6 +171,11 @@ protected:
         return u"datetime("_s + column + u")=datetime("_s + dateLiteral + u')';
     }
 
+    QString sameLongText(const QString& column, const QString& literal) const override
+    {
+        return column + u'=' + literal + u" COLLATE BINARY"_s;
+    }
+
     bool meansConnectionLost(const QSqlError& error) const override
     {
         const int code = error.nativeErrorCode().toInt() & 0xff;
@@ -198,6 +219,7 @@ private:
 
     static int isLate(void* self) { return static_cast<EngineSqlite*>(self)->deadline.hasExpired(); }
 
+    std::map<QString, std::unique_ptr<QLockFile>> locks;
     int timeout = 0;
     QDeadlineTimer deadline{QDeadlineTimer::Forever};
 };

@@ -105,13 +105,14 @@ QString Recordset::Data::keyCondition(const TableInfo& table)
     return conditions.join(u" AND "_s);
 }
 
-/// Long texts can't be compared by every engine in a condition, so the ones about to be written are read again.
+/// Where the engine can't compare long texts in a condition, the ones about to be written are read again.
 void Recordset::Data::checkLongTexts(const TableInfo& table, const QString& key)
 {
     QList<int> longTexts;
     QStringList names;
     for (int column = 0; column < columns.size(); ++column) {
-        if (columns[column].table == table.name && columns[column].kind == Kind::LongText && isChanged(column)) {
+        if (columns[column].table == table.name && columns[column].kind == Kind::LongText && isChanged(column) &&
+            engine().holds(columns[column].name, Kind::LongText, original[size_t(column)]).isEmpty()) {
             longTexts.append(column);
             names.append(engine().quoted(columns[column].name));
         }
@@ -145,8 +146,10 @@ void Recordset::Data::writeChange(const QString& tableName)
         const QString& name = columns[column].name;
         const QVariant& before = original[size_t(column)];
         assignments.append(engine().quoted(name) + u'=' + engine().literal(at(row(), column)));
-        if (isExact(columns[column].kind))
-            condition += u" AND "_s + engine().holds(name, columns[column].kind, before);
+        const Kind kind = columns[column].kind;
+        const QString held = kind == Kind::Number ? QString() : engine().holds(name, kind, before);
+        if (!held.isEmpty())
+            condition += u" AND "_s + held;
         written.append(column);
     }
     checkLongTexts(*table, key);

@@ -1,0 +1,127 @@
+// Two workstations on one database and one set of message folders, the second one being the command `kest2`.
+#include "outbound/SendQuote.h"
+#include "platform/RuntimeError.h"
+#include "platform/database/FaultInjection.h"
+#include "platform/files/files.h"
+#include "shell/SharedVariables.h"
+#include "support/Failure.h"
+#include "support/Shop.h"
+#include "support/Snapshot.h"
+
+#include <QDir>
+#include <QFile>
+#include <QProcess>
+
+namespace kest::test {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+class Workstations : public Shop {
+protected:
+    /// The second profile leads to the first one's database and to its drive C:.
+    Workstations()
+    {
+        QDir().mkpath(second_);
+        for (const QString& shared : {u"/drive_c"_s, u"/databases"_s})
+            EXPECT_TRUE(QFile::link(root() + shared, second_ + shared));
+        QFile settings(root() + u"/registry.ini"_s);
+        EXPECT_TRUE(settings.exists() ? settings.copy(second_ + u"/registry.ini"_s)
+                                      : settings.open(QIODevice::WriteOnly) &&
+                                            QFile(second_ + u"/registry.ini"_s).open(QIODevice::WriteOnly));
+    }
+    ~Workstations() override { db::setStatementFault({}); }
+
+    /// The exit codes of loads that start together, each on a workstation of its own.
+    std::vector<int> loadTogether(const QStringList& messages) const
+    {
+        const QString profiles[] = {root(), second_};
+        std::vector<std::unique_ptr<QProcess>> commands;
+        for (const QString& message : messages) {
+            commands.push_back(std::make_unique<QProcess>());
+            commands.back()->start(QStringLiteral(KEST_COMMAND),
+                                   {u"--profile"_s, profiles[commands.size() - 1], u"load"_s, message});
+        }
+        std::vector<int> codes;
+        for (const auto& command : commands) {
+            EXPECT_TRUE(command->waitForFinished() && command->exitStatus() == QProcess::NormalExit);
+            codes.push_back(command->exitCode());
+        }
+        return codes;
+    }
+
+private:
+    const QString second_ = root() + u"/second"_s;
+};
+
+}  // namespace
+
+TEST_F(Workstations, AMessageThatBothLoadIsLoadedOnce)
+{
+    quote("500").request("QR1").quoteNumber("KQ1").note("Responded Quote Request").line(1);
+    const Message messages[] = {quoteRequest("QR2"), authorisedQuote("500").labour(1, "C").labour(2, "I"),
+                                manualQuote("500").part(1, "I"), cancellation("QR1")};
+    const Snapshot before;
+    for (const Message& message : messages) {
+        arrive("m.xml", message);
+        EXPECT_EQ(loadTogether({u"m.xml"_s}), std::vector({0}));
+        const std::string once = holdings();
+        for (int round = 1; round <= 3; ++round) {
+            before.restore();
+            arrive("m.xml", message);
+            const std::vector<int> codes = loadTogether({u"m.xml"_s, u"m.xml"_s});
+            EXPECT_EQ(codes[0] + codes[1], 1) << "one has loaded it, the other one not";
+            EXPECT_EQ(difference(once, holdings()), "\n");
+        }
+        before.restore();
+    }
+}
+
+TEST_F(Workstations, TwoRequestsTakeTwoNumbers)
+{
+    const Snapshot before;
+    for (int round = 1; round <= 3; ++round) {
+        arrive("m1.xml", quoteRequest("QR1").rego("ONE111"));
+        arrive("m2.xml", quoteRequest("QR2").rego("TWO222"));
+        EXPECT_EQ(loadTogether({u"m1.xml"_s, u"m2.xml"_s}), std::vector({0, 0}));
+        for (const char* number : {"1001", "1002"})
+            EXPECT_EQ(rowCount("QUOTE1", "QTNNO='" + std::string(number) + "'"), 1);
+        EXPECT_EQ(Row("CINFO", "1=1").text("QUOTE_VAL"), "1003");
+        before.restore();
+    }
+}
+
+/// The other workstation loads a message before each statement of a send in turn.
+TEST_F(Workstations, ASendAndALoadLoseNothingOfEachOther)
+{
+    quote("500").request("QR1").note("Active Quote Request").line(1).set("rrhour", 2).set("rr_rate2", 50);
+    arrive("m.xml", cancellation("QR1"));
+    const Snapshot before;
+    int overtakenCount = 0;
+    for (int statement = 1, last = 1; statement <= last; ++statement) {
+        ASSERT_TRUE(OpenHostQuote(u"500"_s, u"0"_s));
+        last = 0;
+        db::setStatementFault([&] {
+            if (++last == statement) {
+                EXPECT_EQ(loadTogether({u"m.xml"_s}), std::vector({0}));
+            }
+            return false;
+        });
+        bool sent = false;
+        const int failure = failureOf([&] { SendQuote(*grsQuote, &sent); });
+        db::setStatementFault({});
+        const bool refused = shown().find("cannot be sent") != std::string::npos;
+        const std::string notes = quote("500").notes();
+        EXPECT_NE(notes.find("QR Cancelled"), std::string::npos) << statement << ": " << notes;
+        EXPECT_EQ(notes.find("Sending KEST Quote") != std::string::npos, sent) << statement << ": " << notes;
+        EXPECT_TRUE(sent || failure == RowChanged || refused) << statement << ": " << failure;
+        overtakenCount += failure == RowChanged;
+        SendQuote(*grsQuote);
+        EXPECT_EQ(shown(), "[critical] This quote request has been cancelled, Quote cannot be sent.");
+        before.restore();
+    }
+    EXPECT_GT(overtakenCount, 0);
+}
+
+}  // namespace kest::test
