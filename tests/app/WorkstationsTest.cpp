@@ -1,11 +1,15 @@
 // Two workstations on one database and one set of message folders, the second one being the command `kest2`.
+#include "messages/frmMessageList.h"
 #include "outbound/SendQuote.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/FaultInjection.h"
 #include "platform/files/files.h"
 #include "shell/SharedVariables.h"
+#include "shell/modDBAccess.h"
 #include "support/Failure.h"
+#include "support/MariaDbServer.h"
 #include "support/Shop.h"
+#include "support/ShopDatabase.h"
 #include "support/Snapshot.h"
 
 #include <QDir>
@@ -122,6 +126,22 @@ TEST_F(Workstations, ASendAndALoadLoseNothingOfEachOther)
         before.restore();
     }
     EXPECT_GT(overtakenCount, 0);
+}
+
+TEST_F(Workstations, ALoadGoesOverANewConnectionWhereTheOldOneHasGone)
+{
+    quote("500").request("QR1");
+    arrive("m.xml", cancellation("QR1"));
+    frmMessageList window;
+    window.open();
+    if (shopIsOnServer()) {
+        db::Connection administrator;
+        administrator.open(mariaDb().connectionText(u"WirSql"_s));
+        administrator.execute(u"KILL "_s + Opened(u"SELECT CONNECTION_ID() AS id"_s).text(u"id"_s));
+    } else {
+        gConn->close();
+    }
+    EXPECT_TRUE(window.loadFile(u"m.xml"_s)) << shown();
 }
 
 }  // namespace kest::test

@@ -141,7 +141,9 @@ void Connection::rebuildIndexes()
 
 Lock::Lock(ConnectionPtr connection, const QString& name, int seconds) : connection_(std::move(connection)), name_(name)
 {
-    held_ = connection_ && connection_->engine().lock(name_, seconds);
+    if (!connection_)
+        throw RuntimeError(CannotOpen, u"There is no connection to the database."_s);
+    held_ = connection_->engine().lock(name_, seconds);
 }
 
 Lock::~Lock()
