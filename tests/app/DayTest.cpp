@@ -162,9 +162,9 @@ bool isBlank(const QImage& picture)
 /// Every window and every report has a picture with something on it.
 void checkPictures(const QDir& pictures)
 {
-    const QStringList windows{u"comparison"_s,   u"extra-information"_s, u"login"_s,       u"messages"_s,
-                              u"panel"_s,        u"sublet-document"_s,   u"text"_s,        u"utilities"_s,
-                              u"report-1-710"_s, u"report-1-720"_s,      u"report-1-730"_s};
+    const QStringList windows{u"comparison"_s, u"extra-information"_s, u"login"_s,        u"messages"_s,
+                              u"panel"_s,      u"sublet-document"_s,   u"text"_s,         u"transport"_s,
+                              u"utilities"_s,  u"report-1-710"_s,      u"report-1-720"_s, u"report-1-730"_s};
     for (const QString& window : windows)
         EXPECT_FALSE(pictures.entryList({u"*-"_s + window + u".png"_s}).isEmpty()) << window.toStdString();
     for (const QString& file : pictures.entryList(QDir::Files)) {

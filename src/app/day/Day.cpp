@@ -2,6 +2,7 @@
 
 #include "app/QuoteDatabase.h"
 #include "app/transport/TransportRunner.h"
+#include "app/transport/TransportWindow.h"
 #include "platform/RuntimeError.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
@@ -79,7 +80,10 @@ desktop::Record Day::play(const QString& step)
     else if (step.endsWith(u".sql"_s))
         writeInHost(text);
     else
-        shown = open(text, quoteInName.match(step).captured(1));
+        shown = driven(text, [&] {
+            const QString quote = quoteInName.match(step).captured(1);
+            component.ShowKESTWindow(quote.isEmpty() ? u"0"_s : quote, u"0"_s);
+        });
     takePictures(step);
     carry();
     return shown;
@@ -90,9 +94,15 @@ void Day::beginWith(const QString& rules)
     for (const QString& file : files::list(gsUnreadPath))
         files::remove(gsUnreadPath + file);
     files::writeBytes(transportFolders().own + Transport::rulesName, rules.toUtf8());
+    driven(u"{\"windows\": {\"KESTWeb\": [[{\"shot\": \"@pictures@/00-transport.png\"}]]}}"_s, [] {
+        TransportWindow window(transportFolders());
+        if (!window.claim())
+            throw RuntimeError(PermissionDenied, u"Another transport works for this shop."_s);
+        window.run();
+    });
 }
 
-desktop::Record Day::open(const QString& text, const QString& quote)
+desktop::Record Day::driven(const QString& text, const std::function<void()>& windows) const
 {
     QString filled = text;
     filled.replace(u"@pictures@"_s, pictures);
@@ -107,7 +117,7 @@ desktop::Record Day::open(const QString& text, const QString& quote)
         report::setOutputFolder({});
         desktop::useScript(nullptr);
     });
-    component.ShowKESTWindow(quote.isEmpty() ? u"0"_s : quote, u"0"_s);
+    windows();
     desktop::throwKept();
     return script->record();
 }

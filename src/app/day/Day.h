@@ -8,12 +8,14 @@
 #include <QString>
 #include <QStringList>
 
+#include <functional>
+
 namespace kest::app {
 
 /// Plays the steps on a demo shop that is as it was made. A step is a file whose name begins with its number:
-/// `.rules` the insurer's rules, with which the day begins on an empty unread folder; `.sql` what the estimator writes
-/// in the host application; `.json` the script that drives the windows, with the number of the quote that the panel is
-/// opened on at the end of its name. After each step the transport carries once.
+/// `.rules` the insurer's rules, with which the day begins on an empty unread folder and KESTWeb's window opens; `.sql`
+/// what the estimator writes in the host application; `.json` the script that drives the windows, with the number of
+/// the quote that the panel is opened on at the end of its name. After each step the transport carries once.
 class Day {
 public:
     /// `pictures` is a folder of this system for the pictures of the windows and of each report's first page.
@@ -27,7 +29,8 @@ public:
 
 private:
     void beginWith(const QString& rules);
-    desktop::Record open(const QString& script, const QString& quote);
+    /// Runs windows that a script drives, and gives what they showed.
+    desktop::Record driven(const QString& script, const std::function<void()>& windows) const;
     void takePictures(const QString& step);
     void carry();
 
