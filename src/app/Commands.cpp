@@ -109,7 +109,7 @@ Outcome open(const QStringList& arguments)
     Text quoteText = quote.data();
     Text subquoteText = subquote.data();
     component->ShowKESTWindow(&quoteText, &subquoteText);
-    const bool connected = gConn != nullptr;
+    const bool connected = gConn && gConn->state() == 1;
     component->Release();
     desktop::throwKept();
     return {.exitCode = connected ? Done : NoConnection};

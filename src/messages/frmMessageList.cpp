@@ -184,24 +184,17 @@ void frmMessageList::cmdProcess_Click()
         load(selectedFile());
 }
 
-/// The right to load a message, on a new connection where the old one has gone since the last click.
-static std::unique_ptr<db::Lock> lockMessage(const QString& file)
-{
-    const auto lock = [&] { return std::make_unique<db::Lock>(GetConnection(), u"load "_s + file.toUpper()); };
-    std::unique_ptr<db::Lock> held;
-    return attempt([&] { held = lock(); }) ? std::move(held) : lock();
-}
-
 bool frmMessageList::load(const QString& file)
 {
     const QScopedValueRollback loading(busy, busy + 1);
     try {
-        const std::unique_ptr<db::Lock> alone = lockMessage(file);
-        if (!alone->isHeld())
+        EnsureConnection();
+        const db::Lock alone(gConn, u"load "_s + file.toUpper());
+        if (!alone.isHeld())
             desktop::msgBox(u"Message %1 is being loaded on another workstation."_s.arg(file),
                             desktop::Icon::Information);
-        QString text = alone->isHeld() ? files::read(gsCurFolder + file) : QString();
-        if (!alone->isHeld() || !LoadXML(text, file)) {
+        QString text = alone.isHeld() ? files::read(gsCurFolder + file) : QString();
+        if (!alone.isHeld() || !LoadXML(text, file)) {
             RefreshList();
             tmrRefresh->start();
             return false;

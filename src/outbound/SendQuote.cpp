@@ -79,6 +79,7 @@ double refuse(const QString& message)
 
 double SendQuote(db::Recordset& quote, bool* sent)
 {
+    EnsureConnection();
     if (quote.eof())
         return refuse(quoteNotFound);
     const QString number = quote.text(u"QTNNO"_s);

@@ -14,6 +14,7 @@
 #include "reports/frmPrintPreview.h"
 #include "shell/Helpers.h"
 #include "shell/SharedVariables.h"
+#include "shell/modDBAccess.h"
 
 #include <QStringList>
 
@@ -256,6 +257,7 @@ bool PrintXML(const QString& fileName, bool Reprint)
 {
     if (fileName.isEmpty())
         return true;
+    EnsureConnection();
     try {
         return Print(fileName, Reprint);
     } catch (const RuntimeError& error) {

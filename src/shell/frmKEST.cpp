@@ -9,6 +9,7 @@
 #include "shell/CredentialCipher.h"
 #include "shell/Helpers.h"
 #include "shell/SharedVariables.h"
+#include "shell/modDBAccess.h"
 #include "utilities/frmLogin.h"
 #include "utilities/frmUtilities.h"
 
@@ -166,6 +167,7 @@ void frmKEST::openUtilities()
     if (!passed)
         return;
     frmUtilities::ShowForm(grsQuote->text(u"QTNNO"_s), grsQuote->text(u"Subquote"_s));
+    EnsureConnection();  // the window may have been open for long
     grsQuote->requery();
 }
 

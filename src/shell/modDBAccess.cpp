@@ -66,7 +66,7 @@ int chosenDriver()
 
 bool isOpen()
 {
-    return gcnDB && gcnDB->state() == 1;
+    return gcnDB && gcnDB->answers();
 }
 
 }  // namespace
@@ -78,16 +78,17 @@ db::ConnectionPtr GetConnection()
 
 bool EnsureConnection()
 {
-    if (!isOpen()) {
-        OpenDatabase();
-        gConn = isOpen() ? gcnDB : nullptr;
-    }
+    if (isOpen())
+        return true;
+    OpenDatabase();
+    gConn = gcnDB;
     return isOpen();
 }
 
 void OpenDatabase()
 {
-    gcnDB = std::make_shared<db::Connection>();
+    if (!gcnDB)
+        gcnDB = std::make_shared<db::Connection>();  // else the same one: recordsets on it, the panel's too, go on
     lastFailure = {};
     attempt([] { ReadConnectionSettings(); });
     attempt([] {

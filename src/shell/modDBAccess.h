@@ -17,7 +17,8 @@ extern QString gsInstance;
 
 /// The open connection, opened where needed, or null when there is none.
 db::ConnectionPtr GetConnection();
-/// True when the connection is open, opened where needed.
+/// True when the connection is open, opened where needed, again too where the server has dropped it. Whatever a user
+/// starts that needs the database asks for this first.
 bool EnsureConnection();
 /// Reads the settings and opens the connection; a failure shows only as a closed connection.
 void OpenDatabase();

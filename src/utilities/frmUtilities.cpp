@@ -7,6 +7,7 @@
 #include "quotedata/NoteChain.h"
 #include "shell/Helpers.h"
 #include "shell/SharedVariables.h"
+#include "shell/modDBAccess.h"
 #include "utilities/ExactTextEdit.h"
 #include "utilities/StatusRepair.h"
 
@@ -156,8 +157,10 @@ QPushButton* frmUtilities::button(const QString& name, const QString& caption, v
 {
     auto* made = new QPushButton(caption);
     made->setObjectName(name);
-    desktop::onEvent(made, &QPushButton::clicked, this, u"frmUtilities.%1_Click"_s.arg(name),
-                     [this, click] { (this->*click)(); });
+    desktop::onEvent(made, &QPushButton::clicked, this, u"frmUtilities.%1_Click"_s.arg(name), [this, click] {
+        EnsureConnection();
+        (this->*click)();
+    });
     return made;
 }
 
@@ -168,6 +171,7 @@ QLineEdit* frmUtilities::box(QLatin1StringView name) const
 
 void frmUtilities::ShowForm(const QString& sQTNNO, const QString& sSubQuote)
 {
+    EnsureConnection();
     frmUtilities form(sQTNNO, sSubQuote.isEmpty() ? u"0"_s : sSubQuote);
     form.AddTabs();
     form.OpenRows();
@@ -229,6 +233,7 @@ void frmUtilities::Fill()
 
 void frmUtilities::TabStrip1_Click()
 {
+    EnsureConnection();
     const QString wanted = TabStrip1->tabData(TabStrip1->currentIndex()).toString().mid(1);
     db::Recordset chosen(gConn);
     chosen.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, wanted));

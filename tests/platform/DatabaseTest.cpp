@@ -139,11 +139,16 @@ TEST_P(Database, AStatementThatTakesTooLongIsGivenUp)
 
 TEST_P(Database, AConnectionThatHasGoneIsNoticedAndCanBeOpenedAgain)
 {
+    const auto drop = [&] {
+        const QString id = query(u"SELECT CONNECTION_ID() AS id"_s).text(u"id"_s);
+        connect()->execute(u"KILL "_s + id);
+    };
+    Recordset lines = query(u"SELECT * FROM LINE"_s);
+    EXPECT_TRUE(connection->answers());
     if (GetParam() == On::Embedded) {
         db::setStatementFault([] { return true; }, CannotOpen);
     } else {
-        const QString id = query(u"SELECT CONNECTION_ID() AS id"_s).text(u"id"_s);
-        connect()->execute(u"KILL "_s + id);
+        drop();
     }
     EXPECT_EQ(failure([&] { query(u"SELECT * FROM LINE"_s); }).number(), CannotOpen);
     EXPECT_EQ(connection->state(), 0);
@@ -152,6 +157,11 @@ TEST_P(Database, AConnectionThatHasGoneIsNoticedAndCanBeOpenedAgain)
     connection->open(connectionText);
     EXPECT_EQ(connection->state(), 1);
     EXPECT_EQ(count(u"1=1"_s), 0);
+    lines.requery();
+    if (GetParam() != On::Embedded) {
+        drop();
+        EXPECT_FALSE(connection->answers()) << "before any statement has failed";
+    }
     Recordset none{db::ConnectionPtr()};
     EXPECT_EQ(failure([&] { none.open(u"SELECT 1"_s); }).number(), NoObject);
 }

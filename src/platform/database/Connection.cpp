@@ -122,6 +122,13 @@ int Connection::state() const
     return engine_ && engine_->isOpen() ? 1 : 0;
 }
 
+bool Connection::answers() const
+{
+    if (state() == 1)
+        attempt([&] { engine_->ping(); });
+    return state() == 1;
+}
+
 void Connection::setCommandTimeout(int seconds)
 {
     commandTimeout_ = seconds;

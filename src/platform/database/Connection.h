@@ -26,6 +26,8 @@ public:
     void close();
     /// 1 while the connection is open, 0 otherwise. A connection that the server has dropped is closed.
     int state() const;
+    /// Asks the server whether it still answers on this connection; one that it has dropped is closed from then on.
+    bool answers() const;
 
     /// Seconds that a statement may take; 0 is no limit.
     void setCommandTimeout(int seconds);

@@ -49,6 +49,8 @@ public:
 
     /// False once the server has dropped the connection.
     bool isOpen() const { return open_; }
+    /// A statement that asks for nothing; throws where the server has dropped the connection.
+    void ping() { tell(QStringLiteral("SELECT 1")); }
 
     // In the dialect of SQL Server:
     Rows select(const QString& statement);

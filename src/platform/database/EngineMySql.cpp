@@ -76,7 +76,8 @@ protected:
 
     bool meansConnectionLost(const QSqlError& error) const override
     {
-        static const QStringList lost{u"2002"_s, u"2003"_s, u"2006"_s, u"2013"_s, u"2055"_s, u"1927"_s, u"1053"_s};
+        static const QStringList lost{u"2002"_s, u"2003"_s, u"2006"_s, u"2013"_s,
+                                      u"2055"_s, u"1927"_s, u"1053"_s, u"4031"_s};
         return lost.contains(error.nativeErrorCode());
     }
 
