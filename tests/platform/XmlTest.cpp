@@ -43,6 +43,14 @@ QString names(const QList<Node>& nodes)
 
 }  // namespace
 
+TEST(XmlErrors, ANulEndsNoText)
+{
+    for (QString text : {u"<a>1</a>|"_s, u"<a>1</a>|<b/>"_s, u"<a>1|</a>"_s, u"|<a>&</a>"_s}) {
+        const quint32 code = codeOf(text.replace(u'|', QChar(u'\0')));
+        EXPECT_TRUE(code != 0 && code != BareAmpersand && code != SecondRoot) << text.toStdString();
+    }
+}
+
 TEST(XmlErrors, TheBareAmpersandAndTheSecondRootHaveCodesOfTheirOwn)
 {
     enum Kind : quint8 { Fine, Ampersand, Root, Other };

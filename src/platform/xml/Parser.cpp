@@ -20,6 +20,7 @@ constexpr quint32 TooLarge = 0xC00CEF01;
 constexpr quint32 TooDeep = 0xC00CEF02;
 constexpr quint32 TooManyAttributes = 0xC00CEF03;
 constexpr quint32 DtdRefused = 0xC00CEF04;
+constexpr quint32 NulCharacter = 0xC00CEF05;
 constexpr quint32 libraryErrors = 0xC00CE800;
 
 constexpr int mostAttributes = 5000;        // of one element: the library compares each with each
@@ -251,6 +252,11 @@ bool parse(DocumentData& data, const QString& text)
     }
     if (hasTooManyAttributes({bytes.constData(), static_cast<size_t>(bytes.size())})) {
         data.error = limitError(TooManyAttributes, u"An element has too many attributes."_s);
+        return false;
+    }
+
+    if (text.contains(QChar(u'\0'))) {  // the library would take it for the end of the text
+        data.error = limitError(NulCharacter, u"There is a character of the code 0."_s);
         return false;
     }
 
