@@ -5,7 +5,9 @@
 
 #include <nettle/blowfish.h>
 
+#include <algorithm>
 #include <array>
+#include <cctype>
 
 namespace kest {
 
@@ -24,11 +26,10 @@ blowfish_ctx cipher{};
 
 quint8 byteOf(QStringView digits)
 {
-    bool isHex = false;
-    const uint value = digits.toUInt(&isHex, 16);
-    if (!isHex || !digits[0].isLetterOrNumber())
+    const auto isHexDigit = [](QChar digit) { return digit.unicode() < 128 && std::isxdigit(digit.unicode()); };
+    if (!std::all_of(digits.begin(), digits.end(), isHexDigit))
         throw RuntimeError(TypeMismatch, u"The stored text holds a pair that is not hexadecimal."_s);
-    return static_cast<quint8>(value);
+    return static_cast<quint8>(digits.toUInt(nullptr, 16));
 }
 
 QByteArray bytesOf(const QString& hex)

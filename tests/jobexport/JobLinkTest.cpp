@@ -239,7 +239,8 @@ TEST(Cipher, WhatIsStoredComesBack)
         EXPECT_EQ(DecryptText(stored.toUpper()), plain);
         EXPECT_EQ(DecryptText(stored + u"00112233445566"_s), plain);
     }
-    EXPECT_THROW(DecryptText(u"zz"_s), RuntimeError);
+    for (const QString& pair : {u"zz"_s, u"a "_s, u"\ta"_s, u"+a"_s})
+        EXPECT_THROW(DecryptText(pair + u"00112233445566"_s), RuntimeError) << pair.toStdString();
 }
 
 }  // namespace
