@@ -49,8 +49,12 @@ QString RegGetValue(Hive hive, const QString& subKey, const QString& valueName)
     const std::optional<settings::Value> value = settings::query(hive, subKey, valueName);
     if (!value)
         return {};
-    if (value->type == Type::Number)
-        return value->data;
+    if (value->type == Type::Number) {  // hexadecimal where someone has edited the file
+        bool isNumber = false;
+        const bool isHex = value->data.trimmed().startsWith(u"0x"_s, Qt::CaseInsensitive);
+        const uint number = value->data.toUInt(&isNumber, isHex ? 16 : 10);
+        return isNumber ? QString::number(number) : QString();
+    }
     if (value->type != Type::Text)
         return {};
     return files::fromCodePage(files::toCodePage(value->data).left(bufferSize - 1));
@@ -64,7 +68,7 @@ bool RegSetValue(Hive hive, const QString& subKey, const QString& valueName, con
         double number = 0;
         if (!attempt([&] { number = leadingNumber(value); }) || std::abs(number) > largestNumber)
             return false;
-        const auto stored = static_cast<quint32>(static_cast<qint64>(number));
+        const auto stored = static_cast<quint32>(static_cast<qint64>(std::nearbyint(number)));
         return settings::setValue(hive, subKey, valueName, {Type::Number, QString::number(stored)});
     }
     return settings::setValue(hive, subKey, valueName, {type, value});

@@ -50,7 +50,7 @@ TEST_F(Settings, TheFirstReadFixesADefaultForAllLaterOnes)
 
 TEST_F(Settings, AValueIsReadByItsType)
 {
-    machineWide(u"number"_s, {Type::Number, u"26"_s});
+    machineWide(u"number"_s, {Type::Number, u"0x1A"_s});
     machineWide(u"binary"_s, {Type::Binary, u"00ff"_s});
     machineWide(u"long"_s, {Type::Text, QString(2000, u'x')});
     EXPECT_EQ(stored(u"number"_s), u"26"_s);
@@ -63,7 +63,7 @@ TEST_F(Settings, AWriteKeepsTheTypeAndNeedsTheKey)
 {
     EXPECT_FALSE(RegSetValue(Hive::LocalMachine, splash, u"a"_s, u"1"_s));
     machineWide(u"number"_s, {Type::Number, u"26"_s});
-    EXPECT_TRUE(RegSetValue(Hive::LocalMachine, splash, u"number"_s, u"12 pieces"_s));
+    EXPECT_TRUE(RegSetValue(Hive::LocalMachine, splash, u"number"_s, u"11.9 pieces"_s));
     EXPECT_FALSE(RegSetValue(Hive::LocalMachine, splash, u"number"_s, u"1e999"_s));
     EXPECT_EQ(settings::query(Hive::LocalMachine, splash, u"number"_s), (settings::Value{Type::Number, u"12"_s}));
     EXPECT_TRUE(RegSetValue(Hive::LocalMachine, splash, u"text"_s, u"12"_s));
