@@ -1,18 +1,13 @@
 // The command kest2: what the windows do, from a terminal.
 #include "app/CommandLine.h"
 #include "app/Commands.h"
+#include "platform/desktop/Display.h"
 
 #include <QApplication>
 
 #include <cstdio>
 
 namespace {
-
-bool hasDisplay()
-{
-    return qEnvironmentVariableIsSet("DISPLAY") || qEnvironmentVariableIsSet("WAYLAND_DISPLAY") ||
-           qEnvironmentVariableIsSet("QT_QPA_PLATFORM");
-}
 
 QStringList words(int argc, char** argv)
 {
@@ -38,7 +33,7 @@ int main(int argc, char** argv)
     }
     if (!line.error.isEmpty())
         return refuse(line, line.error + QLatin1String("\n\n") + usage(), Usage);
-    if (isInteractive(line) && !hasDisplay() && !withoutWindow(line))
+    if (isInteractive(line) && !kest::desktop::hasDisplay() && !withoutWindow(line))
         return refuse(
             line,
             QStringLiteral("there is no display to open the panel on; give a --script, or run it in a desktop "

@@ -1,5 +1,6 @@
 #include "shell/component.h"
 
+#include "platform/desktop/Display.h"
 #include "platform/desktop/Prompt.h"
 #include "platform/desktop/Window.h"
 #include "platform/settings/registry.h"
@@ -35,10 +36,16 @@ QString libraryPath()
     return QString::fromLocal8Bit(info.dli_fname);
 }
 
-/// A host without Qt has no application object, and no answers but a person's.
-void ensureApplication()
+/// A host without Qt has no application object, and no answers but a person's. False where windows can't be shown:
+/// Qt would end the host's process.
+bool ensureApplication()
 {
-    if (!QCoreApplication::instance()) {
+    if (QCoreApplication::instance()) {
+        if (!qobject_cast<QApplication*>(QCoreApplication::instance()))
+            return false;
+    } else {
+        if (!desktop::hasDisplay())
+            return false;
         static int argumentCount = 1;
         static char name[] = "kest2";
         static char* arguments[] = {name, nullptr};
@@ -46,6 +53,7 @@ void ensureApplication()
     }
     if (!desktop::answerer())
         desktop::usePerson();
+    return true;
 }
 
 /// What the reference count and the server's count have in common.
@@ -83,6 +91,22 @@ private:
     std::atomic<std::uint32_t> references = 1;
 };
 
+/// The result of a call. No exception reaches the host, and none that was kept stops the events of its next call.
+template <class Call>
+HResult answered(Call&& call)
+{
+    try {
+        return call();
+    } catch (const desktop::NeedsAnswer&) {
+        desktop::guarded({}, [] { throw; });  // kept on, for the command that runs without a person
+    } catch (const std::bad_alloc&) {
+        return com::OutOfMemory;
+    } catch (const std::exception&) {
+        return com::Fail;
+    }
+    return com::Fail;
+}
+
 class HostObject final : public Counted<IeKEST> {
 public:
     HResult QueryInterface(const com::Guid& iid, void** object) override { return answerFor(IID_IeKEST, iid, object); }
@@ -91,8 +115,11 @@ public:
     {
         if (!sQTNNO || !sSubQuote || !*sQTNNO || !*sSubQuote)
             return com::BadPointer;
-        component.ShowKESTWindow(QString::fromUtf16(*sQTNNO), QString::fromUtf16(*sSubQuote));
-        return com::Ok;
+        return answered([&] {
+            component.ShowKESTWindow(QString::fromUtf16(*sQTNNO), QString::fromUtf16(*sSubQuote));
+            desktop::throwKept();
+            return com::Ok;
+        });
     }
 
 private:
@@ -113,13 +140,14 @@ public:
         *object = nullptr;
         if (outer)
             return com::NoAggregation;
-        ensureApplication();
-        auto* created = new (std::nothrow) HostObject;
-        if (!created)
-            return com::OutOfMemory;
-        const HResult result = created->QueryInterface(iid, object);
-        created->Release();
-        return result;
+        return answered([&] {
+            if (!ensureApplication())
+                return com::Fail;
+            auto* created = new HostObject;
+            const HResult result = created->QueryInterface(iid, object);
+            created->Release();
+            return result;
+        });
     }
 
     HResult LockServer(std::int32_t lock) override

@@ -1,3 +1,4 @@
+#include "platform/database/FaultInjection.h"
 #include "platform/settings/registry.h"
 #include "shell/component.h"
 #include "support/Shop.h"
@@ -16,10 +17,17 @@ using settings::Hive;
 class Component : public test::Shop {
 protected:
     /// What a host program prints on this shop's profile.
-    QString host(const QStringList& arguments)
+    QString host(const QStringList& arguments, const QString& platform = u"offscreen"_s, const QString& display = {})
     {
         QProcess process;
         QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
+        const std::pair<QString, QString> places[] = {
+            {u"QT_QPA_PLATFORM"_s, platform}, {u"DISPLAY"_s, display}, {u"WAYLAND_DISPLAY"_s, {}}};
+        for (const auto& [name, value] : places) {
+            environment.remove(name);
+            if (!value.isEmpty())
+                environment.insert(name, value);
+        }
         environment.insert(u"KEST2_PROFILE"_s, root());
         process.setProcessEnvironment(environment);
         process.setProcessChannelMode(QProcess::ForwardedErrorChannel);
@@ -33,6 +41,32 @@ protected:
 TEST_F(Component, AHostWithoutQtCreatesAndReleasesIt)
 {
     EXPECT_EQ(host({u"create"_s}), u"done\n"_s);
+}
+
+TEST_F(Component, AHostThatCanShowNoWindowsIsRefusedAndLivesOn)
+{
+    EXPECT_EQ(host({u"refused"_s, u"core"_s}), u"refused\n"_s);
+    for (const auto& [platform, display] :
+         {std::pair(u""_s, u""_s), {u""_s, u":7999"_s}, {u"xcb"_s, u":7999"_s}, {u"nosuch"_s, u""_s}})
+        EXPECT_EQ(host({u"refused"_s}, platform, display), u"refused\n"_s) << platform.toStdString();
+}
+
+TEST_F(Component, AFailureOfAnyKindIsAnsweredAndTheNextCallWorks)
+{
+    void* object = nullptr;
+    ASSERT_EQ(DllGetClassObject(CLSID_eKEST, com::IID_IClassFactory, &object), com::Ok);
+    auto* factory = static_cast<com::IClassFactory*>(object);
+    ASSERT_EQ(factory->CreateInstance(nullptr, IID_IeKEST, &object), com::Ok);
+    auto* component = static_cast<IeKEST*>(object);
+    desktop.emplace(R"json({"windows": {"frmKEST": [[{"click": "cmdExit"}]]}})json");
+    std::u16string none = u"0";
+    Text text = none.data();
+    db::setStatementFault([]() -> bool { throw std::bad_alloc(); });
+    EXPECT_EQ(component->ShowKESTWindow(&text, &text), com::OutOfMemory);
+    db::setStatementFault({});
+    EXPECT_EQ(component->ShowKESTWindow(&text, &text), com::Ok);
+    component->Release();
+    factory->Release();
 }
 
 TEST_F(Component, TheHostsQuoteEnablesTheSend)

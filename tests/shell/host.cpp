@@ -1,5 +1,6 @@
 // A host program: it loads the component by dlopen and knows nothing of it but its binary interfaces.
 // kest_host LIBRARY create           creates and releases one object, in a process without Qt's application
+// kest_host LIBRARY refused [core]   meets a refusal, with a core application where the word is given
 // kest_host LIBRARY show QTNNO SUB   shows the panel and closes it like a person, printing what it saw
 #include "shell/component.h"
 
@@ -55,6 +56,9 @@ int main(int argc, char** argv)
     check(argc > 2, "arguments");
     const QString mode = QString::fromLocal8Bit(argv[2]);
     std::unique_ptr<QApplication> application;
+    std::unique_ptr<QCoreApplication> core;
+    if (argc > 3 && qstrcmp(argv[3], "core") == 0)
+        core = std::make_unique<QCoreApplication>(argc, argv);
     if (mode == QLatin1String("show"))
         application = std::make_unique<QApplication>(argc, argv);
 
@@ -72,6 +76,12 @@ int main(int argc, char** argv)
     check(getClassObject(CLSID_eKEST, com::IID_IClassFactory, &object) == com::Ok, "class object");
     auto* factory = static_cast<com::IClassFactory*>(object);
     check(factory->CreateInstance(factory, IID_IeKEST, &object) == com::NoAggregation, "aggregation");
+    if (mode == QLatin1String("refused")) {
+        check(factory->CreateInstance(nullptr, IID_IeKEST, &object) == com::Fail && !object, "refuse");
+        factory->Release();
+        std::puts("refused");
+        return 0;
+    }
     check(factory->CreateInstance(nullptr, IID_IeKEST, &object) == com::Ok, "create");
     auto* component = static_cast<IeKEST*>(object);
     factory->Release();
