@@ -6,6 +6,7 @@
 #include "platform/files/files.h"
 #include "platform/profile.h"
 #include "platform/settings/registry.h"
+#include "shell/ModRegistry.h"
 #include "shell/component.h"
 #include "shell/modDBAccess.h"
 #include "shell/modLoggerEx.h"
@@ -50,27 +51,34 @@ const QList<Setting>& settingsOfNewProfile()
 void writeSettings()
 {
     for (const auto& [key, name, value] : settingsOfNewProfile())
-        if (!settings::createKey(Hive::LocalMachine, key) ||
-            !settings::setValue(Hive::LocalMachine, key, name, {settings::Type::Text, value}))
+        if (RegGetValue(Hive::LocalMachine, key, name).isEmpty() &&
+            (!settings::createKey(Hive::LocalMachine, key) ||
+             !settings::setValue(Hive::LocalMachine, key, name, {settings::Type::Text, value})))
             throw RuntimeError(FileInputOutput, u"The setting %1 cannot be written."_s.arg(name));
 }
 
 /// The host's setting, or what a new profile has.
 QString hostSetting(const QString& name)
 {
-    const auto value = settings::query(Hive::LocalMachine, hostKey, name);
-    if (value && !value->data.isEmpty())
-        return value->data;
+    QString ofNewProfile;
     for (const Setting& setting : settingsOfNewProfile())
         if (setting.name == name)
-            return setting.value;
-    return {};
+            ofNewProfile = setting.value;
+    return GetRegSetting(u"wirra32"_s, u"frmsplash"_s, name, ofNewProfile, CopyUp::No);
+}
+
+/// A host that starts without a profile leaves settings of its own; only what is made here knows the system's version.
+bool isWhole()
+{
+    return !RegGetValue(Hive::LocalMachine, systemKey, u"CurrentVersion"_s).isEmpty();
 }
 
 void makeFolders()
 {
-    for (const QString& folder : {home + u"AUnread"_s, home + u"ARead"_s, home + u"AUnsent"_s, home + u"ASent"_s,
-                                  home + u"PDF"_s, images, reports, profile::componentFolder()})
+    const QString messages = hostSetting(u"EcomHome"_s);
+    for (const QString& folder :
+         {messages + u"AUnread"_s, messages + u"ARead"_s, messages + u"AUnsent"_s, messages + u"ASent"_s,
+          messages + u"PDF"_s, hostSetting(u"ImagesPath"_s), hostSetting(u"ReportPath"_s), profile::componentFolder()})
         files::makeFolder(folder);
 }
 
@@ -105,7 +113,9 @@ void installTemplates()
     for (const QString& name : templates.entryList(QDir::Files)) {
         QFile file(templates.filePath(name));
         file.open(QIODevice::ReadOnly);
-        files::writeBytes(reports + name, file.readAll());
+        const QString place = hostSetting(u"ReportPath"_s) + name;
+        if (!files::exists(place))  // one that is there may be the shop's own
+            files::writeBytes(place, file.readAll());
     }
 }
 
@@ -113,7 +123,7 @@ void installTemplates()
 
 bool initProfile(bool demo, const QDate& today)
 {
-    if (settings::keyExists(Hive::LocalMachine, hostKey)) {
+    if (isWhole()) {
         rebuildIndexes();
         return false;
     }
@@ -123,7 +133,7 @@ bool initProfile(bool demo, const QDate& today)
     if (!files::exists(embeddedFile(databaseName)))
         makeDatabase(demo, today);
     if (demo)
-        putDemoFiles(home, images, today);
+        putDemoFiles(hostSetting(u"EcomHome"_s), hostSetting(u"ImagesPath"_s), today);
     if (DllRegisterServer() != com::Ok)
         throw RuntimeError(FileInputOutput, u"The class cannot be entered into the settings."_s);
     writeSettings();  // last: they tell that the profile is whole
@@ -134,9 +144,8 @@ QJsonObject where()
 {
     const QString messages = hostSetting(u"EcomHome"_s);
     ReadConnectionSettings();
-    const QString file = gsInstance.isEmpty() ? gsDatabase : gsInstance + u'.' + gsDatabase;
-    const bool embedded = db::isThisMachine(gsServer.section(u'\\', 0, 0));
-    const QString database = embedded ? embeddedFile(file) : gsServer + u'/' + gsDatabase;
+    const QString embedded = db::embeddedName(ConnectionText(DriverNumber(CopyUp::No)));
+    const QString database = embedded.isEmpty() ? gsServer + u'/' + gsDatabase : embeddedFile(embedded);
     const auto folder = [](const QString& path) { return QDir::cleanPath(files::systemPath(path)); };
     return {
         {u"profile"_s, profile::root()},

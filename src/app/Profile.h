@@ -7,7 +7,8 @@
 namespace kest::app {
 
 /// Makes the profile: folders, quote database, class registration and settings, with `demo` a shop with quotes,
-/// messages and photographs too. On a profile that exists nothing changes but that the indexes of its databases are
+/// messages and photographs too. What a host that started before has left is kept, and what is missing is made. On a
+/// profile that was made here nothing changes but that the indexes of its databases are
 /// rebuilt, which another tool may have left in another order. True when the profile was made.
 bool initProfile(bool demo, const QDate& today = QDate::currentDate());
 

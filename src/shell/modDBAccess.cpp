@@ -3,7 +3,6 @@
 #include "platform/RuntimeError.h"
 #include "platform/desktop/Prompt.h"
 #include "platform/values.h"
-#include "shell/ModRegistry.h"
 #include "shell/SharedVariables.h"
 
 #include <QSysInfo>
@@ -50,19 +49,19 @@ void ReadConnectionSettings()
         gsServer = u"(local)"_s;
 }
 
-namespace {
-
-int chosenDriver()
+int DriverNumber(CopyUp copyUp)
 {
-    const QString type = GetRegSetting(u"wirra32"_s, u"frmSplash"_s, u"ClientConnectionType"_s, u"0"_s);
+    const QString type = GetRegSetting(u"wirra32"_s, u"frmSplash"_s, u"ClientConnectionType"_s, u"0"_s, copyUp);
     const QString system =
-        GetRegSetting(u"Microsoft"_s, u"Windows NT\\CurrentVersion"_s, u"CurrentVersion"_s, QString());
+        GetRegSetting(u"Microsoft"_s, u"Windows NT\\CurrentVersion"_s, u"CurrentVersion"_s, QString(), copyUp);
     if (system >= u"6.0"_s)
         return 1;
     int number = 0;  // also for a text that is no number
     attempt([&] { number = static_cast<int>(toInteger(type)); });
     return number;
 }
+
+namespace {
 
 bool isOpen()
 {
@@ -93,7 +92,7 @@ void OpenDatabase()
     attempt([] { ReadConnectionSettings(); });
     attempt([] {
         try {
-            gcnDB->open(ConnectionText(chosenDriver()));
+            gcnDB->open(ConnectionText(DriverNumber()));
         } catch (const RuntimeError& error) {
             lastFailure = {error.number(), error.description()};
             throw;

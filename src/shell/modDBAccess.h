@@ -2,6 +2,7 @@
 #pragma once
 
 #include "platform/database/Recordset.h"
+#include "shell/ModRegistry.h"
 
 #include <QString>
 
@@ -26,6 +27,8 @@ void OpenDatabase();
 void ReadConnectionSettings();
 /// The text that the connection is opened with, from the variables above; empty for a driver number that names none.
 QString ConnectionText(int driverNumber);
+/// The number of the driver, by the settings.
+int DriverNumber(CopyUp copyUp = CopyUp::Yes);
 /// A query on a fresh recordset, or none after a critical message when there is no connection.
 std::optional<db::Recordset> OpenRecordset(const QString& select, bool disconnect = false, bool reconnect = false);
 /// A query on the shared connection `gConn`, open. Failures are thrown.

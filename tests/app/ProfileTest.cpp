@@ -6,6 +6,7 @@
 #include "platform/files/files.h"
 #include "platform/settings/registry.h"
 #include "platform/values.h"
+#include "shell/ModRegistry.h"
 #include "support/TestProfile.h"
 
 #include <QDirIterator>
@@ -15,6 +16,7 @@
 #include <QSqlDatabase>
 #include <QSqlError>
 #include <QSqlQuery>
+#include <QTemporaryDir>
 
 #include <gtest/gtest.h>
 
@@ -102,9 +104,30 @@ TEST_F(Profile, IsCompletedAfterAnInterruptedStart)
 {
     files::makeFolder(profile.root() + u"/databases"_s);
     files::writeBytes(app::embeddedFile(u"unfinished"_s), "half a file");
+    // and a host's first start, which copies the settings up that it reads
+    GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"EcomHome"_s, u"d:\\mail\\"_s);
     EXPECT_TRUE(app::initProfile(false));
     EXPECT_EQ(listed(u"SELECT QUOTE_VAL FROM CINFO"_s).size(), 1);
     EXPECT_FALSE(QFileInfo::exists(app::embeddedFile(u"unfinished"_s)));
+    EXPECT_EQ(app::where()[u"unread"_s].toString(), profile.root() + u"/drive_d/mail/AUnread"_s);
+    EXPECT_TRUE(QFileInfo::exists(app::where()[u"unread"_s].toString()));
+    EXPECT_FALSE(app::initProfile(false));
+}
+
+TEST_F(Profile, IsToldWhereTheComponentLooks)
+{
+    ASSERT_TRUE(settings::setUserSetting(u"wirra32"_s, u"frmsplash"_s, u"ReportPath"_s, u"d:\\rep\\"_s));
+    EXPECT_EQ(app::where()[u"reports"_s].toString(), profile.root() + u"/drive_d/rep"_s);
+    EXPECT_EQ(app::where()[u"database"_s].toString(), app::embeddedFile(u"WirSql"_s));
+
+    const QTemporaryDir odbc;
+    QFile drivers(odbc.filePath(u"odbcinst.ini"_s));
+    ASSERT_TRUE(drivers.open(QIODevice::WriteOnly) && drivers.write("[SQL Server]\n") > 0);
+    drivers.close();
+    qputenv("ODBCSYSINI", QFile::encodeName(odbc.path()));
+    EXPECT_EQ(app::where()[u"database"_s].toString(), u"(local)/WirSql"_s);
+    qunsetenv("ODBCSYSINI");
+    EXPECT_FALSE(settings::keyExists(settings::Hive::LocalMachine, u"SOFTWARE"_s)) << "nothing is copied up";
 }
 
 // Other tools compare only the letters of ASCII without regard to case, and leave the others in another order.

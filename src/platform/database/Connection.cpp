@@ -64,9 +64,24 @@ bool isRegistered(const QString& driver)
     return false;
 }
 
-std::unique_ptr<Engine> openLocal(const QString& databaseName, const QString& instance)
+bool isMySql(const QString& driver)
 {
-    const QString name = instance.isEmpty() ? databaseName : instance + u'.' + databaseName;
+    return driver.contains(u"mysql"_s, Qt::CaseInsensitive) || driver.contains(u"mariadb"_s, Qt::CaseInsensitive);
+}
+
+/// True for a server's name that means this machine.
+bool isThisMachine(const QString& server)
+{
+    const QString machine = QSysInfo::machineHostName();
+    for (const QString& name : {u"(local)"_s, u"."_s, u"localhost"_s, machine, machine.section(u'.', 0, 0)}) {
+        if (!name.isEmpty() && server.compare(name, Qt::CaseInsensitive) == 0)
+            return true;
+    }
+    return false;
+}
+
+std::unique_ptr<Engine> openLocal(const QString& name)
+{
     if (!files::isPlainName(name))
         throw RuntimeError(CannotOpen, u"\""_s + name + u"\" is no name of a database."_s);
     return openEmbedded(files::systemPath(profile::root() + u"/databases/"_s + name + u".db"_s));
@@ -78,28 +93,30 @@ std::unique_ptr<Engine> openEngine(const QString& text)
     const QString driver = fields.value(u"driver"_s);
     const QString server = fields.value(u"server"_s);
     const QString databaseName = fields.value(u"database"_s);
-    if (driver.contains(u"mysql"_s, Qt::CaseInsensitive) || driver.contains(u"mariadb"_s, Qt::CaseInsensitive)) {
+    if (isMySql(driver)) {
         return openMySql(server, fields.value(u"port"_s).toInt(), databaseName, fieldOf(fields, u"uid"_s, u"user"_s),
                          fieldOf(fields, u"pwd"_s, u"password"_s));
     }
     if (!driver.isEmpty() && isRegistered(driver))
         return openOdbc(text);
-    if (!driver.isEmpty() && isThisMachine(server.section(u'\\', 0, 0)))
-        return openLocal(databaseName, server.section(u'\\', 1));
+    if (const QString name = embeddedName(text); !name.isEmpty())
+        return openLocal(name);
     throw RuntimeError(CannotOpen, u"No driver on this machine reaches the server \""_s + server + u'"')
         .withDatabaseCodes(u"0"_s, u"IM002"_s);
 }
 
 }  // namespace
 
-bool isThisMachine(const QString& server)
+QString embeddedName(const QString& connectionText)
 {
-    const QString machine = QSysInfo::machineHostName();
-    for (const QString& name : {u"(local)"_s, u"."_s, u"localhost"_s, machine, machine.section(u'.', 0, 0)}) {
-        if (!name.isEmpty() && server.compare(name, Qt::CaseInsensitive) == 0)
-            return true;
-    }
-    return false;
+    const QHash<QString, QString> fields = fieldsOf(connectionText);
+    const QString driver = fields.value(u"driver"_s);
+    const QString server = fields.value(u"server"_s);
+    if (driver.isEmpty() || isMySql(driver) || isRegistered(driver) || !isThisMachine(server.section(u'\\', 0, 0)))
+        return {};
+    const QString instance = server.section(u'\\', 1);
+    const QString database = fields.value(u"database"_s);
+    return instance.isEmpty() ? database : instance + u'.' + database;
 }
 
 Connection::Connection() = default;

@@ -67,7 +67,7 @@ private:
     bool held_ = false;
 };
 
-/// True for a server's name that means this machine.
-bool isThisMachine(const QString& server);
+/// The name of the embedded database that a connection text leads to; empty where a server answers, or nothing.
+QString embeddedName(const QString& connectionText);
 
 }  // namespace kest::db
