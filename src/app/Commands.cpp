@@ -3,6 +3,7 @@
 #include "app/Profile.h"
 #include "app/transport/TransportCommand.h"
 #include "jobexport/JobLinkSettings.h"
+#include "messages/Folders.h"
 #include "messages/frmMessageList.h"
 #include "outbound/SendQuote.h"
 #include "platform/RuntimeError.h"
@@ -23,7 +24,9 @@
 #include <QFile>
 #include <QFileInfo>
 #include <QJsonDocument>
+#include <QPushButton>
 
+#include <algorithm>
 #include <cstdio>
 #include <functional>
 #include <map>
@@ -168,12 +171,41 @@ Outcome list(const QStringList& arguments)
     return {.fields = {{u"rows"_s, rowsAsJson(window.rows())}}, .text = rowsAsText(window.rows())};
 }
 
+QJsonArray boxesShown()
+{
+    return desktop::currentScript()->record().boxes;
+}
+
+/// True where a box has come since then other than those that each fill of the list shows again.
+bool hasTold(const QJsonArray& before)
+{
+    const QJsonArray boxes = boxesShown();
+    return std::any_of(boxes.begin() + before.size(), boxes.end(),
+                       [&](const QJsonValue& box) { return !before.contains(box); });
+}
+
+/// A click on a file's row that was refused or failed. Where no box has told why, a line does.
+int notDone(const frmMessageList& window, const QString& buttonName, const QString& file, const QJsonArray& boxesBefore)
+{
+    if (hasTold(boxesBefore))
+        return Refused;
+    const auto* button = window.findChild<QPushButton*>(buttonName);
+    const QString caption = u'"' + button->text().remove(u'&') + u'"';
+    if (!IsBareName(file))
+        return refused(file + u" is no name of a file of the folder"_s, Refused).exitCode;
+    if (!button->isEnabled())
+        return refused(caption + u" is disabled for "_s + file, Refused).exitCode;
+    return refused(caption + u" does nothing with "_s + file, Refused).exitCode;
+}
+
 Outcome load(const QStringList& arguments)
 {
     frmMessageList window;
     window.open();
+    const QJsonArray boxes = boxesShown();
     const bool loaded = window.loadFile(arguments[0]);
-    return {.exitCode = loaded ? Done : Refused, .fields = {{u"rows"_s, rowsAsJson(window.rows())}}};
+    return {.exitCode = loaded ? Done : notDone(window, u"cmdProcess"_s, arguments[0], boxes),
+            .fields = {{u"rows"_s, rowsAsJson(window.rows())}}};
 }
 
 Outcome reprint(const QStringList& arguments)
@@ -181,8 +213,9 @@ Outcome reprint(const QStringList& arguments)
     frmMessageList window;
     window.open();
     window.chooseFolder(Read);
+    const QJsonArray boxes = boxesShown();
     const bool printed = window.reprintFile(arguments[0]);
-    return {.exitCode = printed ? Done : Refused};
+    return {.exitCode = printed ? Done : notDone(window, u"cmdPrint"_s, arguments[0], boxes)};
 }
 
 QString folderPath(int folder)
@@ -195,9 +228,12 @@ Outcome view(const QStringList& arguments)
     const std::optional<int> folder = folderNamed(arguments[0]);
     if (!folder)
         return refused(u"view takes unread, read or sent, and a file"_s, Usage);
-    if (!files::isPlainName(arguments[1]))
-        return refused(arguments[1] + u" is no name of a file"_s, Refused);
+    if (!IsBareName(arguments[1]))
+        return refused(arguments[1] + u" is no name of a file of the folder"_s, Refused);
+    const QJsonArray boxes = boxesShown();
     const QString text = FormatXML(folderPath(*folder) + arguments[1]);
+    if (text.isEmpty() && !hasTold(boxes))
+        return refused(arguments[1] + u" can't be read"_s, Refused);
     return {.exitCode = text.isEmpty() ? Refused : Done, .fields = {{u"text"_s, text}}, .text = text};
 }
 

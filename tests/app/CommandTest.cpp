@@ -71,9 +71,23 @@ TEST_F(Command, ExitCodesTellUsageProfileAndConnection)
         {{u"setting"_s, u"get"_s, u"wirra32"_s}, app::Usage},
         {{u"list"_s, u"unread"_s, u"--profile"_s, profile.root() + u"/none"_s}, app::NoConnection},
         {{u"view"_s, u"unread"_s, u"../../../registry.ini"_s}, app::Refused},
+        {{u"view"_s, u"unread"_s, u"absent.xml"_s}, app::Refused},
+        {{u"view"_s, u"unread"_s, u"a..xml"_s}, app::Done},
         {{u"load"_s, u"absent.xml"_s}, app::Refused}};
+    files::write(u"c:\\wirdoc\\AUnread\\a..xml"_s, u"<a><messageType>NONE</messageType></a>"_s);
+    files::write(u"c:\\wirdoc\\ARead\\QRCN.xml"_s, files::read(u"c:\\wirdoc\\AUnread\\QRCN_1012.xml"_s));
     for (const auto& [words, code] : cases)
         EXPECT_EQ(kest2(words).exitCode, code) << words.join(u' ').toStdString();
+    const std::pair<QStringList, QString> unsaid[] = {
+        // by any box
+        {{u"load"_s, u"AUnread/QRCN_1012.xml"_s}, u"AUnread/QRCN_1012.xml is no name of a file of the folder"_s},
+        {{u"load"_s, u"a..xml"_s}, u"\"Load\" does nothing with a..xml"_s},
+        {{u"reprint"_s, u"QRCN.xml"_s}, u"\"Reprint\" is disabled for QRCN.xml"_s}};
+    for (const auto& [words, why] : unsaid) {
+        const Ended ended = kest2(words);
+        EXPECT_EQ(ended.exitCode, app::Refused);
+        EXPECT_TRUE(ended.errors.contains(u"kest2: "_s + why)) << ended.errors.toStdString();
+    }
 
     files::remove(profile.root() + u"/databases/WirSql.db"_s);
     const Ended ended = kest2({u"list"_s, u"unread"_s});
