@@ -59,29 +59,47 @@ QString isoDate(const QDate& date)
     return date.toString(Qt::ISODate);
 }
 
-void writeRequestCustomer(const Branch& request, const Step& step, const Told& told)
+Parameters requestCustomer(const Step& step, const Told& told)
 {
-    const Branch customer = request.add("claimCustomer");
-    if (step.parameters.contains(u"company"_s)) {
-        customer.add("companyName", step.parameters[u"company"_s]);
+    if (step.parameters.contains(u"company"_s))
+        return {{u"companyName"_s, step.parameters[u"company"_s]}};
+    Parameters names;  // one by one: each may be made up by a roll
+    names[u"title"_s] = told(u"title"_s, {u"Ms"_s, u"Mr"_s});
+    names[u"firstName"_s] = told(u"firstname"_s, {u"Rowan"_s, u"Casey"_s, u"Alex"_s, u"Jordan"_s});
+    names[u"surname"_s] = told(u"surname"_s, {u"Kestle"_s, u"Marchbank"_s, u"Tarrant"_s, u"Yelland"_s});
+    return names;
+}
+
+void writeCustomer(const Branch& customer, const Parameters& names)
+{
+    if (names.contains(u"companyName"_s)) {
+        customer.add("companyName", names[u"companyName"_s]);
         return;
     }
-    customer.add({{"title", always, told(u"title"_s, {u"Ms"_s, u"Mr"_s})},
-                  {"firstName", always, told(u"firstname"_s, {u"Rowan"_s, u"Casey"_s, u"Alex"_s, u"Jordan"_s})},
-                  {"surname", always, told(u"surname"_s, {u"Kestle"_s, u"Marchbank"_s, u"Tarrant"_s, u"Yelland"_s})}});
+    for (const char* name : {"title", "firstName", "surname"})
+        customer.add(name, names.value(QLatin1StringView(name)));
+}
+
+/// What a list shows for the customer: an insurer fills it for everyone.
+QString corporateCustomer(const Parameters& names)
+{
+    const QStringList words{names.value(u"companyName"_s), names.value(u"title"_s), names.value(u"firstName"_s),
+                            names.value(u"surname"_s)};
+    return words.join(u' ').simplified();
 }
 
 void writeRequest(const Branch& request, const Step& step, const Matter& matter, Dice& dice, const QDate& today)
 {
     const Told told(step, dice);
     const QString damage = told(u"damage"_s, {u"Rear bumper and boot lid"_s, u"Left front guard"_s, u"Right doors"_s});
+    const Parameters customer = requestCustomer(step, told);
     request.add({{"quoteRequestNumber", always, matter.request},
                  {"quoteRequestVersionNumber", always, matter.version},
                  {"claimNumber", always, matter.claim},
                  {"claimDescription", always, u"Damage: "_s + damage},
                  {"claimManager", always, u"Robin Sayle"_s},
-                 {"corporateCustomer", always, {}}});
-    writeRequestCustomer(request, step, told);
+                 {"corporateCustomer", always, corporateCustomer(customer)}});
+    writeCustomer(request.add("claimCustomer"), customer);
     request.add({{"vehicleRegistration", always, matter.rego},
                  {"vehicleDescription", always, matter.vehicle},
                  {"vehicleLocation", always, u"At the repairer"_s},
@@ -110,16 +128,6 @@ void writeRequest(const Branch& request, const Step& step, const Matter& matter,
         images.add("quoteRequestImageId", QString::number(id));
 }
 
-void writeCustomer(const Branch& customer, const Parameters& names)
-{
-    if (names.contains(u"companyName"_s)) {
-        customer.add("companyName", names[u"companyName"_s]);
-        return;
-    }
-    for (const char* name : {"title", "firstName", "surname"})
-        customer.add(name, names.value(QLatin1StringView(name)));
-}
-
 Changes changesOf(const Step& step)
 {
     return {step.number(u"change"_s), step.number(u"add"_s), step.number(u"delete"_s), step.number(u"sublet"_s)};
@@ -134,7 +142,7 @@ void writeAuthorised(const Branch& quote, const Step& step, const Matter& matter
                {"kestOriginalQuoteNumber", always, matter.network},
                {"claimNumber", always, matter.claim},
                {"claimManager", always, u"Robin Sayle"_s},
-               {"corporateCustomer", always, {}}});
+               {"corporateCustomer", always, corporateCustomer(matter.document.customer)}});
     writeCustomer(quote.add("authorisedQuoteClaimCustomer"), matter.document.customer);
     quote.add({{"vehicleRegistration", always, matter.rego},
                {"repairCompletionDate", always, isoDate(today.addDays(daysToRepair))}});
