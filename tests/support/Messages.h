@@ -11,7 +11,7 @@
 
 namespace kest::test {
 
-using Fields = std::initializer_list<std::pair<Text, Text>>;
+using Fields = std::vector<std::pair<Text, Text>>;
 
 class Message {
 public:

@@ -1,0 +1,51 @@
+#include "support/Cases.h"
+
+#include <QFile>
+#include <QRegularExpression>
+
+namespace kest::test {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+QString unquoted(const QString& text)
+{
+    return text.size() > 1 && text.startsWith(u'"') && text.endsWith(u'"') ? text.sliced(1).chopped(1) : text;
+}
+
+}  // namespace
+
+QByteArray dataFile(const std::string& name)
+{
+    QFile file(QString::fromStdString(KEST_SOURCE_DIR "/tests/data/" + name));
+    if (!file.open(QIODevice::ReadOnly))
+        throw std::runtime_error("no file " + name);
+    return file.readAll();
+}
+
+QStringList linesOf(const std::string& name)
+{
+    QStringList lines = QString::fromUtf8(dataFile(name)).split(u'\n', Qt::SkipEmptyParts);
+    lines.removeIf([](const QString& line) { return line.startsWith(u'#'); });
+    return lines;
+}
+
+QStringList cellsOf(const QString& line)
+{
+    QStringList cells = line.split(u'|');
+    for (QString& cell : cells)
+        cell = unquoted(cell.trimmed());
+    return cells;
+}
+
+std::vector<std::pair<QString, QString>> pairsIn(const QString& cell)
+{
+    static const QRegularExpression pair(u"(\\w+)=(\"[^\"]*\"|.*?)(?= +\\w+=|$)"_s);
+    std::vector<std::pair<QString, QString>> pairs;
+    for (const QRegularExpressionMatch& match : pair.globalMatch(cell))
+        pairs.emplace_back(match.captured(1), unquoted(match.captured(2)));
+    return pairs;
+}
+
+}  // namespace kest::test
