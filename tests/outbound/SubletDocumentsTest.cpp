@@ -10,9 +10,6 @@
 #include <QPainter>
 #include <QPdfDocument>
 #include <QPdfWriter>
-#include <QPrintDialog>
-#include <QPrinter>
-#include <QToolButton>
 
 namespace kest {
 
@@ -97,21 +94,12 @@ TEST_F(Sublet, APrintTakesThePagesThatWereChosen)
 {
     realDocument(u"500.0_1.pdf"_s);
     const QString output = root() + u"/printed.pdf"_s;
-    for (const bool onlySecond : {false, true}) {
-        const auto choose = [&](QDialog& window) {
-            QPrinter& printer = *static_cast<QPrintDialog&>(window).printer();
-            printer.setOutputFileName(output);
-            printer.setPrintRange(onlySecond ? QPrinter::PageRange : QPrinter::AllPages);
-            printer.setFromTo(onlySecond ? 2 : 0, onlySecond ? 2 : 0);
-            window.hide();
-            window.setResult(QDialog::Accepted);
-        };
-        const auto print = [](QDialog& window) { test::control<QToolButton>(window, "cmdPrint").click(); };
-        const test::Hands hands({{u"frmViewPDF"_s, print}, {u"PrintDialog"_s, choose}});
+    for (const int only : {0, 2}) {
+        const test::Hands hands(test::printing(u"frmViewPDF"_s, output, only));
         frmViewPDF::ShowForm(u"c:\\wirdoc\\PDF\\500.0_1.pdf"_s);
         QPdfDocument printed;
         ASSERT_EQ(printed.load(output), QPdfDocument::Error::None);
-        EXPECT_EQ(printed.pageCount(), onlySecond ? 1 : 2);
+        EXPECT_EQ(printed.pageCount(), only ? 1 : 2);
     }
 }
 

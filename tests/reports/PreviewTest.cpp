@@ -1,5 +1,6 @@
 // The preview: which template it opens, what it puts in, its window, and the pages as a reader gets them.
 #include "platform/database/Recordset.h"
+#include "platform/desktop/Gestures.h"
 #include "platform/files/files.h"
 #include "platform/report/OutputFolder.h"
 #include "platform/report/Pages.h"
@@ -8,15 +9,13 @@
 #include "reports/Previews.h"
 #include "reports/frmPrintPreview.h"
 #include "shell/SharedVariables.h"
+#include "support/Cases.h"
 #include "support/Hands.h"
 
 #include <QFileInfo>
 #include <QJsonDocument>
-#include <QKeyEvent>
 #include <QLabel>
 #include <QPdfWriter>
-#include <QPrintDialog>
-#include <QPrinter>
 #include <QPushButton>
 #include <QRegularExpression>
 #include <QToolButton>
@@ -31,41 +30,29 @@ class Preview : public Previews {
 protected:
     ~Preview() override { report::setOutputFolder({}); }
 
-    static db::Recordset table(std::initializer_list<std::pair<QString, QString>> cells)
+    /// A table of one row.
+    static db::Recordset table(const QString& cells)
     {
-        db::Recordset rows;
-        for (const auto& [field, value] : cells)
-            rows.declare(field, db::Kind::Text);
-        rows.openDeclared();
-        rows.addNew();
-        for (const auto& [field, value] : cells)
-            rows.set(field, value);
-        return rows;
-    }
-    /// The text of a template filled with one row.
-    QString filled(const QByteArray& content, std::initializer_list<std::pair<QString, QString>> cells)
-    {
-        putTemplate("test.html", content);
-        report::Report opened(u"c:\\wirra32\\report\\test.html"_s);
-        db::Recordset rows = table(cells);
-        opened.setTable(report::tableOf(rows));
-        return opened.body();
+        db::Recordset row;
+        for (const auto& [field, value] : pairsIn(cells))
+            row.declare(field, db::Kind::Text);
+        row.openDeclared();
+        row.addNew();
+        for (const auto& [field, value] : pairsIn(cells))
+            row.set(field, value);
+        return row;
     }
 };
 
 report::Report comparisonOf(int lines, const QString& script, const QString& comment = u"A comment"_s)
 {
-    report::Table rows{{u"quote_ref"_s, u"quote_type"_s, u"comment"_s, u"action"_s, u"line_no"_s, u"category"_s,
-                        u"script"_s, u"amount"_s, u"old_amount"_s, u"qty"_s, u"old_qty"_s, u"quote_total"_s},
-                       {}};
-    const QString indicators[] = {u"I"_s, u"C"_s, u"D"_s};
+    report::Table table{{u"quote_ref"_s, u"quote_type"_s, u"comment"_s, u"action"_s, u"category"_s, u"script"_s}, {}};
     const QString categories[] = {u"RR"_s, u""_s, u"PAIN"_s, u"WHAL"_s};
     for (int i = 0; i < lines; ++i)
-        rows.rows.append({u"500"_s, u"AUTR"_s, comment, indicators[i % 3], QString::number(i + 1),
-                          categories[i * 4 / lines], script.arg(i + 1), u"1234.5"_s, u"99"_s, u"1"_s, u"1"_s,
-                          u"1000"_s});
+        table.rows.append(
+            {u"500"_s, u"AUTR"_s, comment, u"ICD"_s.sliced(i % 3, 1), categories[i * 4 / lines], script.arg(i + 1)});
     report::Report report(u"c:\\wirra32\\report\\730.html"_s);
-    report.setTable(rows);
+    report.setTable(table);
     return report;
 }
 
@@ -73,54 +60,26 @@ report::Report comparisonOf(int lines, const QString& script, const QString& com
 
 TEST_F(Preview, ATemplateIsFilledByFieldConditionAndRow)
 {
-    const std::pair<const char*, const char*> cases[] = {
-        {"{{Name}} {{NAME}}", "A &amp; B A &amp; B"},
-        {"{{amount:money}} {{text:money}} {{day:date}} {{text:date}}", "1234.50 n/a 11/04/2008 n/a"},
-        {"{{#kind=a|b}}in{{/kind=a|b}}{{^kind=a|b}}out{{/kind=a|b}}", "in"},
-        {"{{#kind=b|c}}in{{/kind=b|c}}{{^kind=b|c}}out{{/kind=b|c}}", "out"},
-        {"{{#none=}}empty{{/none=}}{{#kind!=a}}other{{/kind!=a}}", "empty"},
-        {"{{#rows}}[{{name}}]{{/rows}}", "[A &amp; B]"},
-        {"{{#rows:kind=b}}[{{name}}]{{/rows:kind=b}}{{#any:kind=b}}some{{/any:kind=b}}", ""},
-        {"{{#rows:kind=a,none!=}}[{{name}}]{{/rows:kind=a,none!=}}", ""},
-        {"{{#rows:kind=b;none=,kind=a}}[{{name}}]{{/rows:kind=b;none=,kind=a}}{{#any:bs}}some{{/any:bs}}",
-         "[A &amp; B]"},
-        {"<template id=\"x\">({{name}})</template>{{>x}}{{>x}}", "(A &amp; B)(A &amp; B)"},
-        {"{{unknown}}{{Comp}}", "the shop"},
-    };
-    for (const auto& [tags, expected] : cases) {
-        const QByteArray page =
-            "<html><head><script type=\"application/json\">{\"parameters\": [{\"name\": \"Comp\", \"value\": "
-            "\"the shop\"}], \"groups\": {\"bs\": \"kind=b\"}}</script></head><body>" +
-            QByteArray(tags) + "</body></html>";
-        const QString text = filled(page, {{u"name"_s, u"A & B"_s},
-                                           {u"amount"_s, u"1,234.5"_s},
-                                           {u"text"_s, u"n/a"_s},
-                                           {u"day"_s, u"2008-04-11"_s},
-                                           {u"kind"_s, u"A"_s},
-                                           {u"none"_s, u""_s}});
-        EXPECT_EQ(text.section(u"<body>"_s, 1).section(u"</body>"_s, 0, 0).toStdString(), expected) << tags;
+    db::Recordset row = table(u"name=A & B amount=1,234.5 text=n/a day=2008-04-11 kind=A none="_s);
+    for (const auto& [tags, text] : casesIn<2>("reports/template-tags.txt")) {
+        putTemplate("test.html", dataFile("reports/tags.html").replace("@tags@", tags.toUtf8()));
+        report::Report report(u"c:\\wirra32\\report\\test.html"_s);
+        report.setTable(report::tableOf(row));
+        EXPECT_EQ(report.body().section(u"<body>"_s, 1).section(u"</body>"_s, 0, 0), text) << tags.toStdString();
     }
 }
 
 TEST_F(Preview, ParametersAreSetByReportNumberAndName)
 {
-    const QByteArray page =
-        "<html><script type=\"application/json\">{\"parameters\": [{\"name\": \"cOmp\", \"value\": \"1\"}, {\"name\": "
-        "\"TITLE\", \"value\": \"2\"}, {\"name\": \"Third\", \"value\": \"3\"}]}</script><body>x</body></html>";
     for (const char* name : {"710.html", "720.html", "730.html"})
-        putTemplate(name, page);
+        putTemplate(name, dataFile("reports/parameters.html"));
     const auto parameters = [&](qint32 number, const QVariant& value) {
         frmPrintPreview::ShowForm(number, value, nullptr);
-        const QList<QJsonObject> all = windows();
-        return all.isEmpty() ? QJsonObject() : all.first()[u"parameters"].toObject();
+        return QJsonDocument(windows().value(0)[u"parameters"].toObject()).toJson(QJsonDocument::Compact);
     };
-    const auto three = [](const char* a, const char* b, const char* c) {
-        return QJsonObject{
-            {u"cOmp"_s, QLatin1String(a)}, {u"TITLE"_s, QLatin1String(b)}, {u"Third"_s, QLatin1String(c)}};
-    };
-    EXPECT_EQ(parameters(710, u"v"_s), three("v", "v", "v"));
-    EXPECT_EQ(parameters(730, u""_s), three("", "", ""));
-    EXPECT_EQ(parameters(720, QStringList({u"a"_s, u"b"_s})), three("a", "b", "3"));
+    EXPECT_EQ(parameters(710, u"v"_s), R"({"TITLE":"v","Third":"v","cOmp":"v"})");
+    EXPECT_EQ(parameters(730, u""_s), R"({"TITLE":"","Third":"","cOmp":""})");
+    EXPECT_EQ(parameters(720, QStringList({u"a"_s, u"b"_s})), R"({"TITLE":"b","Third":"3","cOmp":"a"})");
 }
 
 TEST_F(Preview, WhatCannotBeShownEndsInSilenceButAnUnknownNumber)
@@ -152,18 +111,18 @@ TEST_F(Preview, EachPreviewIsKeptInTheFolderOfReports)
 {
     const QString folder = root() + u"/out/deep"_s;
     report::setOutputFolder(folder);
-    db::Recordset rows = table({{u"KESTQuoteNo"_s, u"KQ1"_s}, {u"QTNNO"_s, u"500"_s}});
+    db::Recordset rows = table(u"KESTQuoteNo=KQ1 QTNNO=500"_s);
     frmPrintPreview::ShowForm(720, QStringList{u""_s, u"Assessment Result"_s}, &rows);
     frmPrintPreview::ShowForm(720, QStringList{u""_s, u"Assessment Result"_s}, nullptr);
     EXPECT_EQ(filesIn(folder), (QStringList{u"1-720.json"_s, u"1-720.pdf"_s, u"2-720.json"_s, u"2-720.pdf"_s}));
     const QString text = pdfText(folder + u"/1-720.pdf"_s);
     EXPECT_TRUE(text.contains(u"Assessment Result"_s) && text.contains(u"KQ1"_s)) << text.toStdString();
     EXPECT_TRUE(pdfText(folder + u"/2-720.pdf"_s).contains(u"sample"_s));  // the template's own saved rows
-    const auto json = [&](int number) {
-        return QJsonDocument::fromJson(files::readBytes(folder + u"/%1-720.json"_s.arg(number))).object();
+    const auto json = [&](const char* name) {
+        return QJsonDocument::fromJson(files::readBytes(folder + QLatin1StringView(name))).object();
     };
-    EXPECT_EQ(json(1), desktop->record().windows[0].toObject());
-    EXPECT_TRUE(json(2)[u"table"].isNull());
+    EXPECT_EQ(json("/1-720.json"), desktop->record().windows[0].toObject());
+    EXPECT_TRUE(json("/2-720.json")[u"table"].isNull());
 
     windows();
     files::makeFolder(folder + u"/3-720.pdf"_s);  // in the way
@@ -218,50 +177,35 @@ TEST_F(Preview, ARowOfSeveralLinesIsNeverDividedAndALongTextIsWhole)
 
 TEST_F(Preview, TheViewerFillsTheWindowAboveItsButton)
 {
-    db::Recordset rows = table({{u"comment"_s, QString(u"word\n"_s).repeated(300)}});
-    const Hands hands({{u"frmPrintPreview"_s, [](QDialog& window) {
-                            const auto& viewer = control<QWidget>(window, "crvPreview");
-                            const auto& exit = control<QPushButton>(window, "cmdExit");
-                            for (const QSize size : {QSize(700, 500), QSize(900, 800)}) {
-                                window.resize(size);
-                                QCoreApplication::processEvents();
-                                EXPECT_EQ(
-                                    viewer.geometry(),
-                                    QRect(0, 0, size.width(), size.height() - exit.height() - desktop::pixels(160)));
-                                EXPECT_EQ(exit.y() - viewer.height(), desktop::pixels(80));
-                                EXPECT_EQ(size.width() - exit.geometry().right() - 1, desktop::pixels(80));
-                            }
-                            const auto& page = control<QLabel>(window, "lblPage");
-                            EXPECT_EQ(page.text(), u"Page 1 of 5"_s);
-                            QKeyEvent end(QEvent::KeyPress, Qt::Key_End, Qt::NoModifier);
-                            QCoreApplication::sendEvent(&control<QWidget>(window, "crvPages"), &end);
-                            EXPECT_EQ(page.text(), u"Page 5 of 5"_s);
-                            control<QToolButton>(window, "cmdPrevious").click();
-                            EXPECT_EQ(page.text(), u"Page 4 of 5"_s);
-                        }}});
+    db::Recordset rows = table(u"comment="_s + u"word\n"_s.repeated(300));
+    const auto look = [](QDialog& window) {
+        window.resize(900, 800);
+        QCoreApplication::processEvents();
+        const auto& exit = control<QPushButton>(window, "cmdExit");
+        EXPECT_EQ(control<QWidget>(window, "crvPreview").geometry(),
+                  QRect(0, 0, 900, 800 - exit.height() - desktop::pixels(160)));
+        EXPECT_EQ(exit.geometry().right(), 899 - desktop::pixels(80));
+        const auto& page = control<QLabel>(window, "lblPage");
+        EXPECT_EQ(page.text(), u"Page 1 of 5"_s);
+        desktop::gestures::press(control<QWidget>(window, "crvPages"), Qt::Key_End);
+        EXPECT_EQ(page.text(), u"Page 5 of 5"_s);
+        control<QToolButton>(window, "cmdPrevious").click();
+        EXPECT_EQ(page.text(), u"Page 4 of 5"_s);
+    };
+    const Hands hands({{u"frmPrintPreview"_s, look}});
     frmPrintPreview::ShowForm(730, u""_s, &rows);
 }
 
 TEST_F(Preview, ThePrintButtonAsksForAPrinterAndPrintsWhatWasChosen)
 {
     const QString output = root() + u"/printed.pdf"_s;
-    db::Recordset rows = table({{u"comment"_s, QString(u"word\n"_s).repeated(300)}});
-    for (const bool onlySecond : {false, true}) {
-        const auto choose = [&](QDialog& window) {
-            QPrinter& printer = *static_cast<QPrintDialog&>(window).printer();
-            printer.setOutputFileName(output);
-            printer.setPrintRange(onlySecond ? QPrinter::PageRange : QPrinter::AllPages);
-            printer.setFromTo(onlySecond ? 2 : 0, onlySecond ? 2 : 0);
-            window.hide();
-            window.setResult(QDialog::Accepted);
-        };
-        const auto print = [](QDialog& window) { control<QToolButton>(window, "cmdPrint").click(); };
-        const Hands hands({{u"frmPrintPreview"_s, print}, {u"PrintDialog"_s, choose}});
+    db::Recordset rows = table(u"comment="_s + u"word\n"_s.repeated(300));
+    for (const int only : {0, 2}) {
+        const Hands hands(printing(u"frmPrintPreview"_s, output, only));
         frmPrintPreview::ShowForm(730, u""_s, &rows);
         const QString text = pdfText(output);
-        EXPECT_EQ(text.contains(u"Page 1 of 5"_s), !onlySecond);
         EXPECT_TRUE(text.contains(u"Page 2 of 5"_s));
-        EXPECT_EQ(text.count(u'\f'), onlySecond ? 1 : 5);
+        EXPECT_EQ(text.count(u'\f'), only ? 1 : 5);
     }
 }
 

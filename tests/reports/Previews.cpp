@@ -39,12 +39,12 @@ std::string Previews::shownReports()
     return names.join(u' ').toStdString();
 }
 
-std::string Previews::cells(const QJsonObject& window, int row, const char* fields)
+std::string Previews::cells(const QJsonObject& window, int row, const Text& fields)
 {
     const QJsonArray names = window[u"table"][u"fields"].toArray();
     const QJsonArray values = window[u"table"][u"rows"][row].toArray();
     QStringList texts;
-    for (const QString& field : QString::fromLatin1(fields).split(u' ')) {
+    for (const QString& field : QString(fields).split(u' ')) {
         qsizetype at = 0;
         while (at < names.size() && names[at].toString() != field)
             ++at;

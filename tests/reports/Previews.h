@@ -18,7 +18,7 @@ protected:
     /// Their names and report numbers, joined by blanks.
     std::string shownReports();
     /// Of a table of the record: one row's cells in these fields, one that was never set as "-".
-    static std::string cells(const QJsonObject& window, int row, const char* fields);
+    static std::string cells(const QJsonObject& window, int row, const Text& fields);
 
 private:
     qsizetype seen = 0;

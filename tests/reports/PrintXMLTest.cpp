@@ -5,6 +5,7 @@
 #include "reports/Previews.h"
 #include "reports/PrintXML.h"
 #include "shell/SharedVariables.h"
+#include "support/Cases.h"
 
 #include <QPushButton>
 #include <QRegularExpression>
@@ -22,6 +23,12 @@ protected:
         gsListFolder = gsReadPath;
         files::write(gsReadPath + u"message.xml"_s, message);
         PrintXML(u"message.xml"_s, reprint);
+    }
+    QJsonObject onlyWindow()
+    {
+        const QList<QJsonObject> all = windows();
+        EXPECT_EQ(all.size(), 1);
+        return all.value(0);
     }
 };
 
@@ -42,68 +49,44 @@ TEST_F(Printing, ARequestShowsOneRowForEachImage)
     for (const QString& text : {u"Quote request QR1"_s, u"Mr Alex Tarrant"_s, u"Reversed into a bollard"_s,
                                 u"Rear bumper"_s, u"Quote from photographs"_s, u"Bumper & grille, L/H"_s})
         EXPECT_TRUE(page.contains(text)) << text.toStdString();
-    const QList<QJsonObject> shownWindows = windows();
-    ASSERT_EQ(shownWindows.size(), 1);
-    const QJsonObject& window = shownWindows[0];
+    const QJsonObject window = onlyWindow();
     EXPECT_EQ(window[u"report"].toInt(), 710);
     ASSERT_EQ(window[u"table"][u"rows"].toArray().size(), 3);
     const char* images[] = {"1|Bumper & grille, L/H", "2|", "3|"};
-    for (int row = 0; row < 3; ++row) {
-        EXPECT_EQ(cells(window, row, "image_id image_desc"), images[row]);
-        EXPECT_EQ(cells(window, row,
-                        "Corp Quote Qrno Rego Claim Claim_desc Fullname Bay Offsite Quote_due Veh_desc Make "
-                        "Body Built_date Colour_desc Odometer Damage Old_Damage Instruction"),
-                  "|500|QR1|UNIVERSAL|7700001|Reversed into a bollard|Mr Alex Tarrant|3|1|26/3/2008 6:30 AM|"
-                  "Corella Meridian sedan|CORELLA|Sedan|07/2004|Blue|84200|Rear bumper|None|Quote from photographs");
-        EXPECT_EQ(cells(window, row, "Location"), std::string(55, 'x'));
-    }
+    for (int row = 0; row < 3; ++row)
+        EXPECT_EQ(
+            cells(window, row,
+                  "image_id image_desc Corp Quote Qrno Rego Claim Claim_desc Fullname Bay Offsite Quote_due "
+                  "Veh_desc Make Body Built_date Colour_desc Odometer Damage Old_Damage Instruction Location"),
+            images[row] + ("||500|QR1|UNIVERSAL|7700001|Reversed into a bollard|Mr Alex Tarrant|3|1|26/3/2008 6:30 AM|"
+                           "Corella Meridian sedan|CORELLA|Sedan|07/2004|Blue|84200|Rear bumper|None|"
+                           "Quote from photographs|" +
+                           std::string(55, 'x')));
 }
 
 TEST_F(Printing, ValuesOfARequestAreMadeFromWhatTheMessageHolds)
 {
-    const struct {
-        Fields set;
-        const char* fields;
-        const char* expected;
-    } cases[] = {
-        {{}, "image_id image_desc", "-|-"},
-        {{{"extraVehicleInformation/monthOfManufacture", "0"}}, "Built_date", "01/2004"},
-        {{{"extraVehicleInformation/monthOfManufacture", "x11"}}, "Built_date", "11/2004"},
-        {{{"extraVehicleInformation/yearOfManufacture", "0"}}, "Built_date", ""},
-        {{{"extraVehicleInformation/color", "wHIT"}}, "Colour_desc", "White"},
-        {{{"extraVehicleInformation/color", "XXXX"}}, "Colour_desc", "-"},
-        {{{"claimCustomer/companyName", "Ferry & Co"}}, "Fullname", "Ferry & Co"},
-        {{{"claimCustomer/title", ""}, {"claimCustomer/firstName", " Kim "}}, "Fullname", "Kim Tarrant"},
-        {{{"quoteDueTime", ""}, {"offsiteQuoting", "0"}}, "Quote_due Offsite", "|0"},
-    };
     quote("500").request("QR1");
-    for (const auto& c : cases) {
+    for (const auto& [elements, fields, expected] : casesIn<3>("reports/request-values.txt")) {
         Message message = quoteRequest("QR1");
-        for (const auto& [path, value] : c.set)
+        for (const auto& [path, value] : pairsIn(elements))
             message.set(path, value);
         print(message);
-        const QList<QJsonObject> shownWindows = windows();
-        ASSERT_EQ(shownWindows.size(), 1) << c.expected;
-        EXPECT_EQ(cells(shownWindows[0], 0, c.fields), c.expected);
+        EXPECT_EQ(cells(onlyWindow(), 0, fields), expected.toStdString()) << elements.toStdString();
     }
 }
 
 TEST_F(Printing, AResultShowsItsReasonForTheOneQuoteOfTheRequest)
 {
-    const std::pair<const char*, const char*> cases[] = {
-        {"UNSP", "Unspecified Reason"},
-        {"inco", "Quote Incomplete"},
-        {"TLSS", "-"},
-    };
     quote("500", 2).request("QR1");
-    for (const auto& [code, reason] : cases) {
+    for (const auto& [code, reason] :
+         {std::pair("UNSP", "Unspecified Reason"), {"inco", "Quote Incomplete"}, {"TLSS", "-"}}) {
         print(assessmentResult("KQ1").reason(code));
-        const QList<QJsonObject> shownWindows = windows();
-        ASSERT_EQ(shownWindows.size(), 1);
-        EXPECT_EQ(shownWindows[0][u"report"].toInt(), 720);
-        EXPECT_EQ(shownWindows[0][u"parameters"].toObject(),
+        const QJsonObject window = onlyWindow();
+        EXPECT_EQ(window[u"report"].toInt(), 720);
+        EXPECT_EQ(window[u"parameters"].toObject(),
                   (QJsonObject{{u"Comp"_s, u""_s}, {u"Title"_s, u"Assessment Result"_s}}));
-        EXPECT_EQ(cells(shownWindows[0], 0, "KESTQuoteNo QTNNO subquote KESTQRNO reason"),
+        EXPECT_EQ(cells(window, 0, "KESTQuoteNo QTNNO subquote KESTQRNO reason"),
                   std::string("KQ1|500|2|QR1|") + reason);
     }
     quote("501").request("QR1");
@@ -118,33 +101,28 @@ TEST_F(Printing, EachTypeHasItsReportOrNone)
     EXPECT_FALSE(PrintXML(u"gone.xml"_s, true));
     EXPECT_EQ(shown().substr(0, 67), "[none] An error 53 has occured, Please contact MarlinDesk Support\r\n");
     EXPECT_TRUE(PrintXML({}, true));
+    for (const Message& message : {quoteMatch("500"), quoteDeletion("KQ1"), revisionRequest("QR1"), cancellation("QR1"),
+                                   manualQuote("500"), Message("adqt", "getAdjustedQuoteResponse")})
+        print(message);
+    print(marker("500"));
+    EXPECT_EQ(shownReports() + shown(), "");
     const struct {
-        Text message;
-        const char* reports;
-        const char* box;
+        Message message;
+        const char *reports, *box;
     } cases[] = {
         {adjustedQuote("500"), "frmPrintPreview730", ""},
         {authorisedQuote("500"), "frmPrintPreview730", ""},
-        {quoteMatch("500"), "", ""},
-        {quoteDeletion("KQ1"), "", ""},
-        {revisionRequest("QR1"), "", ""},
-        {cancellation("QR1"), "", ""},
-        {manualQuote("500"), "", ""},
         {quoteRequest("QR2"), "", "[critical] Quote does not exist in database, please contact MarlinDesk Support."},
         {adjustedQuote("501"), "", "[critical] Quote not found in database. Please contact MarlinDesk Support."},
         // an authorisation without its quote still opens the report, on the rows that are saved in its template
         {authorisedQuote("501"), "frmPrintPreview730",
-         "[critical] Matching quote was not found in database, Please contact MarlinDesk Support."},
-        {Text(Message("adqt", "getAdjustedQuoteResponse").text()), "", ""},
-        {marker("500"), "", ""},
-    };
-    for (const auto& c : cases) {
-        print(c.message);
-        EXPECT_EQ(shownReports(), c.reports) << QString(c.message).toStdString();
-        EXPECT_EQ(shown(), c.box) << QString(c.message).toStdString();
+         "[critical] Matching quote was not found in database, Please contact MarlinDesk Support."}};
+    for (const auto& [message, reports, box] : cases) {
+        print(message);
+        EXPECT_EQ(shownReports(), reports) << box;
+        EXPECT_EQ(shown(), box);
     }
-    Message broken = adjustedQuote("500");
-    print(broken.without("assessmentComment"));
+    print(adjustedQuote("500").without("assessmentComment"));
     const std::string box = shown();
     EXPECT_EQ(box.substr(0, 67), "[none] An error 91 has occured, Please contact MarlinDesk Support\r\n");
     EXPECT_EQ(box.substr(box.rfind('-')), "-KEST2");
@@ -162,10 +140,8 @@ TEST_F(Printing, TheListWindowReprintsItsReadMessages)
     window.chooseFolder(Read);
     EXPECT_FALSE(button->isHidden());
     EXPECT_TRUE(window.reprintFile(u"a.xml"_s));
-    const QList<QJsonObject> shownWindows = windows();
-    ASSERT_EQ(shownWindows.size(), 1);
-    EXPECT_EQ(cells(shownWindows[0], 0, "action"), "N");  // the deleted line is left out
-    EXPECT_FALSE(window.reprintFile(u"b.xml"_s));         // its button is disabled
+    EXPECT_EQ(cells(onlyWindow(), 0, "action"), "N") << "the deleted line is left out";
+    EXPECT_FALSE(window.reprintFile(u"b.xml"_s)) << "its button is disabled";
     EXPECT_EQ(shownReports(), "");
     window.chooseFolder(Sent);
     EXPECT_TRUE(button->isHidden());

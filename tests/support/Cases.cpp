@@ -33,7 +33,8 @@ QStringList linesOf(const std::string& name)
 
 QStringList cellsOf(const QString& line)
 {
-    QStringList cells = line.split(u'|');
+    static const QRegularExpression bar(u"(?<!\\S)\\|(?!\\S)"_s);
+    QStringList cells = line.split(bar);
     for (QString& cell : cells)
         cell = unquoted(cell.trimmed());
     return cells;
@@ -41,7 +42,8 @@ QStringList cellsOf(const QString& line)
 
 std::vector<std::pair<QString, QString>> pairsIn(const QString& cell)
 {
-    static const QRegularExpression pair(u"(\\w+)=(\"[^\"]*\"|.*?)(?= +\\w+=|$)"_s);
+    static const QRegularExpression pair(u"([\\w/]+)=(\"[^\"]*\"|.*?)(?= +[\\w/]+=|$)"_s,
+                                         QRegularExpression::DotMatchesEverythingOption);
     std::vector<std::pair<QString, QString>> pairs;
     for (const QRegularExpressionMatch& match : pair.globalMatch(cell))
         pairs.emplace_back(match.captured(1), unquoted(match.captured(2)));

@@ -21,10 +21,11 @@ QByteArray dataFile(const std::string& name);
 /// The lines of a file of tests/data, without its comments: those that begin with "#".
 QStringList linesOf(const std::string& name);
 
-/// The cells of a line, with "|" between them. Blanks around a cell don't count, unless it stands in double quotes.
+/// The cells of a line, with "|" and blanks between them. Blanks around a cell don't count, unless it stands in double
+/// quotes.
 QStringList cellsOf(const QString& line);
 
-/// What stands in a cell as "column=value column=value"; a value that begins or ends with a blank stands in quotes.
+/// What stands in a cell as "column=value path/to=value"; a value that begins or ends with a blank stands in quotes.
 std::vector<std::pair<QString, QString>> pairsIn(const QString& cell);
 
 /// Sets the columns of a row that a cell names as `pairsIn` reads it; "-" is Null.

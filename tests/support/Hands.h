@@ -3,6 +3,10 @@
 
 #include "platform/desktop/Window.h"
 
+#include <QPrintDialog>
+#include <QPrinter>
+#include <QToolButton>
+
 #include <map>
 
 namespace kest::test {
@@ -39,6 +43,21 @@ template <class Control>
 Control& control(QDialog& window, const char* name)
 {
     return *window.findChild<Control*>(QString::fromLatin1(name));
+}
+
+/// Clicks "Print" in a window and answers the printer's dialog: into that file, all pages or one alone.
+inline std::map<QString, Hands::Work> printing(const QString& name, const QString& file, int onlyPage)
+{
+    const auto choose = [=](QDialog& dialog) {
+        QPrinter& printer = *static_cast<QPrintDialog&>(dialog).printer();
+        printer.setOutputFileName(file);
+        printer.setPrintRange(onlyPage ? QPrinter::PageRange : QPrinter::AllPages);
+        printer.setFromTo(onlyPage, onlyPage);
+        dialog.hide();
+        dialog.setResult(QDialog::Accepted);
+    };
+    const auto print = [](QDialog& window) { control<QToolButton>(window, "cmdPrint").click(); };
+    return {{name, print}, {QStringLiteral("PrintDialog"), choose}};
 }
 
 }  // namespace kest::test
