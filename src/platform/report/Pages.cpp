@@ -1,6 +1,7 @@
 #include "platform/report/Pages.h"
 
 #include "platform/RuntimeError.h"
+#include "platform/desktop/Progress.h"
 #include "platform/report/Report.h"
 
 #include <QAbstractTextDocumentLayout>
@@ -233,10 +234,12 @@ void paint(const Report& report, QPagedPaintDevice& device, int firstPage, int l
     QPainter painter;
     if (!painter.begin(&device))
         throw RuntimeError(FileInputOutput, u"The report can't be painted."_s);
+    desktop::Progress progress(report.title(), u"Laying out the pages..."_s);
     for (int page = firstPage; page <= last; ++page) {
         if (page > firstPage)
             device.newPage();
         pages.paint(painter, page - 1);
+        progress.step(page - firstPage + 1, last - firstPage + 1);
     }
 }
 
