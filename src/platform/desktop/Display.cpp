@@ -56,10 +56,12 @@ bool hasDisplay()
     QStringList platforms;
     for (const QString& named : qEnvironmentVariable("QT_QPA_PLATFORM").split(u';', Qt::SkipEmptyParts))
         platforms.append(named.section(u':', 0, 0));
-    if (platforms.isEmpty() && qEnvironmentVariableIsSet("DISPLAY"))
-        platforms.append(u"xcb"_s);
-    if (platforms.isEmpty() && qEnvironmentVariableIsSet("WAYLAND_DISPLAY"))
-        platforms.append(u"wayland"_s);
+    if (platforms.isEmpty()) {  // Qt tries them in turn
+        if (qEnvironmentVariableIsSet("DISPLAY"))
+            platforms.append(u"xcb"_s);
+        if (qEnvironmentVariableIsSet("WAYLAND_DISPLAY"))
+            platforms.append(u"wayland"_s);
+    }
     return std::any_of(platforms.cbegin(), platforms.cend(), canStart);
 }
 
