@@ -1,4 +1,5 @@
 #include "messages/Envelope.h"
+#include "support/Cases.h"
 #include "support/Messages.h"
 
 #include <gtest/gtest.h>
@@ -12,13 +13,9 @@ const QString xsi = u"xmlns:xsi=\"http://www.w3.org/2001/XMLSchema-instance\" "_
 
 TEST(Envelope, ATypeCodeHasItsDisplayNameInAnyCase)
 {
-    const std::pair<const char*, const char*> cases[] = {
-        {"qreq", "Quote Request"},  // the others have their names in the list's tests
-        {"EWAP", "Excess Waived/Already Paid"},
-        {"QREQ ", "UNKNOWN - INVALID MESSAGE"},
-        {"", "UNKNOWN - INVALID MESSAGE"},
-    };
-    for (const auto& [code, name] : cases) {
+    for (const auto& [code, name] : {std::pair("qreq", "Quote Request"),  // the others have theirs in the list's tests
+                                     {"EWAP", "Excess Waived/Already Paid"},
+                                     {"QREQ ", "UNKNOWN - INVALID MESSAGE"}}) {
         QString text = Message(code, "getAnyResponse").text();
         EXPECT_EQ(GetMessageTypeName(text), QString::fromLatin1(name)) << code;
         EXPECT_TRUE(text.contains(xsi)) << "the caller's text comes back prepared";
@@ -50,21 +47,9 @@ TEST(Envelope, AmpersandsAreEscapedAsFarAsAParseGoes)
 
 TEST(Envelope, AParseIsSparedOnlyWhereThePreparedTextHoldsTheSame)
 {
-    const QString ns = u"xmlns=\"u\""_s;
-    const std::pair<QString, bool> cases[] = {
-        {u"<a><b/></a>"_s, true},
-        {u"<request><a/><b\n"_s + ns + u"/></request>"_s, true},
-        {u"<a "_s + xsi + ns + u"/>"_s, true},
-        {u"<a "_s + ns + u' ' + xsi.trimmed() + u"/>"_s, false},         // declared twice
-        {u"<a "_s + ns + u"><b xmlns:xsi = 'http://x'/></a>"_s, false},  // not known to be another element
-        {u"<a>the word xmlns<b/></a>"_s, false},                         // becomes part of the text
-        {u"<a b=' xmlns'/>"_s, false},                                   // in an attribute's value
-        {u"<a><![CDATA[<b "_s + ns + u"/>]]></a>"_s, false},             // in a literal section
-        {u"<a><!-- <b "_s + ns + u"/> --></a>"_s, false},
-    };
-    for (const auto& [text, same] : cases) {
-        EXPECT_EQ(IsSameWhenPrepared(text), same) << text.toStdString();
-        if (!same)
+    for (const auto& [text, holds] : casesIn<2>("messages/prepared.txt")) {
+        EXPECT_EQ(IsSameWhenPrepared(text), holds == u"the same"_s) << text.toStdString();
+        if (holds != u"the same"_s)
             continue;
         xml::Document bare;
         ASSERT_TRUE(bare.loadXML(text)) << text.toStdString();
