@@ -2,7 +2,8 @@
 #include "messages/Envelope.h"
 #include "platform/files/files.h"
 #include "shell/SharedVariables.h"
-#include "support/FaultRun.h"
+#include "support/Load.h"
+#include "support/Shop.h"
 #include "support/Snapshot.h"
 
 #include <QRegularExpression>
@@ -55,9 +56,9 @@ std::string withoutCarMark(const std::string& held)
     return QString::fromStdString(held).replace(mark, u"\\1"_s).toStdString();
 }
 
-QStringList linesAbout(const QRegularExpression& what, const std::string& held)
+QStringList linesAbout(const char* what, const std::string& held)
 {
-    return QString::fromStdString(held).split(u'\n').filter(what);
+    return QString::fromStdString(held).split(u'\n').filter(QRegularExpression(QString::fromLatin1(what)));
 }
 
 QString typeOf(const QString& message)
@@ -79,8 +80,8 @@ TEST_P(Hostile, AMessageChangesItsOwnQuoteOrNothing)
     const Snapshot before;
     const bool isMerged = ownType.startsWith(u"AUQT"_s) || ownType.startsWith(u"MANQ"_s);
     int takenCount = 0;
-    int refusedCount = 0;
-    for (const QString& message : variantsOf(GetParam().text())) {
+    const QStringList variants = variantsOf(GetParam().text());
+    for (const QString& message : variants) {
         arrive("m.xml", message);
         const std::string held = holdings();
         const bool taken = loadAsTheWindow(u"m.xml"_s);
@@ -93,18 +94,14 @@ TEST_P(Hostile, AMessageChangesItsOwnQuoteOrNothing)
             }
             EXPECT_TRUE(wasTold || typeOf(message) != ownType) << told;  // an unknown type is passed over in silence
         }
-        EXPECT_EQ(linesAbout(QRegularExpression(u"BYSTANDER"_s), held),
-                  linesAbout(QRegularExpression(u"BYSTANDER"_s), now))
-            << told;
-        const QStringList files = linesAbout(QRegularExpression(u"^/"_s), now);
-        const QStringList inPlace = linesAbout(QRegularExpression(u"^/wir(doc/A|img/)"_s), now);
-        EXPECT_EQ(files, inPlace) << told;
+        EXPECT_EQ(linesAbout("BYSTANDER", held), linesAbout("BYSTANDER", now)) << told;
+        EXPECT_EQ(linesAbout("^/", now), linesAbout("^/wir(doc/A|img/)", now)) << told;
         if (now != held)
             before.restore();
-        (taken ? takenCount : refusedCount)++;
+        takenCount += taken;
     }
     EXPECT_GT(takenCount, 0);
-    EXPECT_GT(refusedCount, 0);
+    EXPECT_LT(takenCount, variants.size());
 }
 
 INSTANTIATE_TEST_SUITE_P(Messages, Hostile,

@@ -1,6 +1,8 @@
 #include "support/Load.h"
 
 #include "inbound/modLoadXML.h"
+#include "messages/Folders.h"
+#include "platform/RuntimeError.h"
 #include "platform/files/files.h"
 #include "shell/SharedVariables.h"
 
@@ -12,6 +14,19 @@ bool load(const Text& message, const Text& fileName)
     gsListFolder = gsUnreadPath;  // as after a fill: a load prints from there
     QString text = message;
     return LoadXML(text, fileName);
+}
+
+bool loadAsTheWindow(const QString& fileName)
+{
+    gsListFolder = gsUnreadPath;
+    bool taken = false;
+    attempt([&] {
+        QString text = files::read(gsUnreadPath + fileName);
+        taken = LoadXML(text, fileName);
+    });
+    if (taken)
+        MoveMessage(fileName, QStringLiteral("read"));
+    return taken;
 }
 
 }  // namespace kest::test

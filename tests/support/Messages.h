@@ -1,13 +1,13 @@
 // Builders for messages of every type, complete and loadable, so that a test states only what matters to it.
 #pragma once
 
+#include "platform/xml/xml.h"
 #include "support/Text.h"
 
 #include <QString>
 
 #include <initializer_list>
 #include <utility>
-#include <vector>
 
 namespace kest::test {
 
@@ -15,8 +15,12 @@ using Fields = std::vector<std::pair<Text, Text>>;
 
 class Message {
 public:
-    /// A network message of that type code; an empty code leaves `messageType` out.
-    Message(const Text& code, const Text& root, Fields fields = {});
+    /// The message in the file of that name in tests/data/messages.
+    static Message sample(const Text& name);
+    /// One with these elements alone; an empty code leaves `messageType` out.
+    Message(const Text& code, const Text& root);
+    Message(const Message& other) : Message(other.text()) {}
+    Message(Message&&) = default;
 
     /// An element by its path below the root, such as "claimCustomer/surname"; made where it is missing.
     Message& set(const Text& path, const Text& text);
@@ -38,46 +42,44 @@ public:
     Message& images(std::initializer_list<Text> ids);
 
     // A line of the quote body; an empty indicator leaves the element out, and "D" carries the number alone.
-    Message& labour(int number, const Text& indicator, Fields fields = {});
-    Message& part(int number, const Text& indicator, Fields fields = {});
-    Message& paint(int number, const Text& indicator, Fields fields = {});
-    Message& sublet(int number, const Text& indicator, Fields fields = {});
+    Message& labour(int number, const Text& change, Fields set = {}) { return line("labour", number, change, set); }
+    Message& part(int number, const Text& change, Fields set = {}) { return line("part", number, change, set); }
+    Message& paint(int number, const Text& change, Fields set = {}) { return line("paint", number, change, set); }
+    Message& sublet(int number, const Text& change, Fields set = {}) { return line("sublet", number, change, set); }
 
-    QString text() const;
+    QString text() const { return document.xml(); }
     operator Text() const { return text(); }
 
 private:
-    struct Element {
-        QString name;
-        QString text;
-        std::vector<Element> children;
-    };
-
-    static Element* childOf(Element& parent, const QString& name);
-    Element& at(const QString& path);
-    bool has(const QString& path);
+    explicit Message(const QString& text);
+    xml::Node at(const QString& path);
+    xml::Node add(xml::Node parent, const QString& name);
     Message& setFirst(std::initializer_list<Text> paths, const Text& text);
-    Message& line(const Text& section, const Text& element, int number, const Text& indicator, Fields defaults,
-                  Fields fields);
-    static void write(const Element& element, const QString& prefix, QString& out);
+    Message& line(const char* element, int number, const QString& change, Fields fields);
 
-    QString code;
-    Element root;
+    xml::Document document;
 };
 
-Message quoteRequest(const Text& request);          // QREQ
-Message quoteMatch(const Text& reference);          // QMQR
-Message manualQuote(const Text& reference);         // MANQ
-Message quoteDeletion(const Text& quoteNumber);     // QTDL
-Message revisionRequest(const Text& request);       // RRQT
-Message cancellation(const Text& request);          // QRCN
-Message cancellationBackout(const Text& request);   // BCQR
-Message adjustedQuote(const Text& reference);       // ADQT
-Message authorisedQuote(const Text& reference);     // AUQT
-Message assessmentResult(const Text& quoteNumber);  // ARES
-Message assessmentBackout(const Text& request);     // BACA
-Message excessWaiver(const Text& reference);        // EWAP
-Message submissionResponse(const Text& quoteNumber, const Text& status = "Submitted");
+/// A complete message of a type, which a test calls with the value of the element that says what it is about.
+struct Sample {
+    const char* name;
+    const char* path;
+    Message operator()(const Text& value) const { return Message::sample(name).set(path, value); }
+};
+
+inline constexpr Sample quoteRequest{"QREQ", "quoteRequestNumber"};
+inline constexpr Sample quoteMatch{"QMQR", "quoteBody/quoteReference"};
+inline constexpr Sample manualQuote{"MANQ", "quoteBody/quoteReference"};
+inline constexpr Sample quoteDeletion{"QTDL", "kestQuoteNumber"};
+inline constexpr Sample revisionRequest{"RRQT", "quoteRequestNumber"};
+inline constexpr Sample cancellation{"QRCN", "quoteRequestNumber"};
+inline constexpr Sample cancellationBackout{"BCQR", "kestQuoteRequestNumber"};
+inline constexpr Sample adjustedQuote{"ADQT", "quoteBody/quoteReference"};
+inline constexpr Sample authorisedQuote{"AUQT", "quoteBody/quoteReference"};
+inline constexpr Sample assessmentResult{"ARES", "kestOriginalQuoteNumber"};
+inline constexpr Sample assessmentBackout{"BACA", "kestQuoteRequestNumber"};
+inline constexpr Sample excessWaiver{"EWAP", "quoteBody/quoteReference"};
+inline constexpr Sample submissionResponse{"response", "kestQuoteNumber"};
 
 /// A marker message, such as the one for a quote that was sent twice.
 QString marker(const Text& quoteNumber, const Text& subquote = "0", const Text& action = "DELDUPE");

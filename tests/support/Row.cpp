@@ -6,11 +6,18 @@
 #include "shell/SharedVariables.h"
 #include "support/Shop.h"
 
+#include <QRegularExpression>
+
 namespace kest::test {
 
 using namespace Qt::StringLiterals;
 
 namespace {
+
+QString withoutDate(QString text)
+{
+    return text.replace(shortDate(QDate::currentDate()), u"today"_s);
+}
 
 db::Recordset opened(const QString& select)
 {
@@ -44,6 +51,19 @@ std::string Row::text(const Text& column) const
 double Row::number(const Text& column) const
 {
     return toDouble(value(column));
+}
+
+::testing::AssertionResult Row::shows(const Text& columns) const
+{
+    static const QRegularExpression pair(u"(\\w+)=.*?(?= \\w+=|$)"_s);
+    const db::Recordset row = rowsOf(table_, condition_);
+    QStringList found;
+    for (const QRegularExpressionMatch& match : pair.globalMatch(columns)) {
+        const QString column = match.captured(1);
+        found += column + u'=' + (row.isNull(column) ? u"-"_s : row.text(column));
+    }
+    const QString now = withoutDate(found.join(u' '));
+    return (now == columns ? ::testing::AssertionSuccess() : ::testing::AssertionFailure()) << now.toStdString();
 }
 
 void Row::write(const Text& column, const Value& value)
@@ -101,8 +121,7 @@ bool QuoteRow::locked() const
 
 std::string QuoteRow::notes() const
 {
-    QString chain = textOrEmpty(texts().value("remarks"));
-    return chain.replace(shortDate(QDate::currentDate()), u"today"_s).toStdString();
+    return withoutDate(textOrEmpty(texts().value("remarks"))).toStdString();
 }
 
 std::string QuoteRow::state() const

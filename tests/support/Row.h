@@ -3,6 +3,8 @@
 
 #include "support/Text.h"
 
+#include <gtest/gtest.h>
+
 #include <string>
 
 namespace kest::test {
@@ -18,6 +20,9 @@ public:
     std::string text(const Text& column) const;
     double number(const Text& column) const;
     bool isNull(const Text& column) const { return value(column).isNull(); }
+    /// Whether the columns are as in "category=MIS script=Front bumper bar VENDOR=-", Null being "-" and today
+    /// "today".
+    ::testing::AssertionResult shows(const Text& columns) const;
 
 protected:
     void write(const Text& column, const Value& value);
