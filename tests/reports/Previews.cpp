@@ -41,16 +41,12 @@ std::string Previews::shownReports()
 
 std::string Previews::cells(const QJsonObject& window, int row, const Text& fields)
 {
-    const QJsonArray names = window[u"table"][u"fields"].toArray();
-    const QJsonArray values = window[u"table"][u"rows"][row].toArray();
+    const QVariantList names = window[u"table"][u"fields"].toArray().toVariantList();
     QStringList texts;
     for (const QString& field : QString(fields).split(u' ')) {
-        qsizetype at = 0;
-        while (at < names.size() && names[at].toString() != field)
-            ++at;
-        texts.append(at == names.size()    ? "no field "_L1 + field
-                     : values[at].isNull() ? u"-"_s
-                                           : values[at].toString());
+        EXPECT_TRUE(names.contains(field)) << field.toStdString();
+        const QJsonValue value = window[u"table"][u"rows"][row][names.indexOf(field)];
+        texts.append(value.isNull() ? u"-"_s : value.toString());
     }
     return texts.join(u'|').toStdString();
 }
