@@ -52,17 +52,6 @@ protected:
 
 }  // namespace
 
-TEST(CommandWords, OptionsMayStandOnEitherSideButNotBehindSetting)
-{
-    const app::CommandLine list = app::parsed({u"--profile"_s, u"p"_s, u"list"_s, u"read"_s, u"--json"_s});
-    EXPECT_EQ(list.profile, u"p"_s);
-    EXPECT_TRUE(list.json);
-    EXPECT_EQ(list.arguments, QStringList(u"read"_s));
-    EXPECT_EQ(app::parsed({u"setting"_s, u"set"_s, u"a"_s, u"b"_s, u"c"_s, u"--json"_s}).arguments.size(), 5);
-    for (const QStringList& wrong : {QStringList(), {u"--nothing"_s}, {u"--profile"_s}})
-        EXPECT_FALSE(app::parsed(wrong).error.isEmpty()) << wrong.join(u' ').toStdString();
-}
-
 TEST_F(Command, ExitCodeAndErrorsTellWhatBecameOfIt)
 {
     files::write(u"c:\\wirdoc\\AUnread\\a..xml"_s, u"<a><messageType>NONE</messageType></a>"_s);

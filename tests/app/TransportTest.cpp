@@ -125,24 +125,7 @@ TEST_F(Loopback, ARequestComesBehindItsPictures)
     EXPECT_EQ(carried(),
               "in 20777_001.jpg, in 20777_001.txt, in 20777_002.jpg, in 20777_002.txt, in WEB_000001_QREQ_20777.xml");
     EXPECT_EQ(loadOne(), "QREQ");
-    EXPECT_EQ(in(gsUnreadPath), "");
-    EXPECT_EQ(files::list(gsImagesPath).size(), 2);
-    EXPECT_EQ(Row("QUOTE1", "KESTQRNo='20777'").text("REGO") + Row("QUOTE1", "KESTQRNo='20777'").text("Claim"),
-              "NEW7777720777");
-}
-
-TEST_F(Loopback, AnAuthorisationChangesAddsAndDeletesLinesOfTheQuoteThatWasSent)
-{
-    rules(u"on quote 1004 claim=7701004\n  authorise change=2 add=3 delete=1 sublet=1 excess=150\n"_s);
-    ASSERT_TRUE(send());
-    carried();
-    listed();
-    carried();
-    EXPECT_EQ(loadOne(), "AUQT");
-    EXPECT_EQ(rowCount("QUOTE2", "SEQ_NO<100"), 3);
-    EXPECT_EQ(rowCount("QUOTE2", "SEQ_NO>=101 AND SEQ_NO<=104"), 4);
-    EXPECT_TRUE(files::readBytes(folders().unread + u"../PDF/1004.0_104.pdf"_s).startsWith("%PDF-1.4"));
-    EXPECT_EQ(quote("1004").text("KESTAuthNo") + quote("1004").text("Claim"), "6000037701004");
+    EXPECT_EQ(rowCount("QUOTE1", "KESTQRNo='20777' AND REGO='NEW777' AND Claim='7720777'"), 1);
 }
 
 TEST_F(Loopback, AStepWaitsUntilTheShopHasDealtWithTheOneBefore)

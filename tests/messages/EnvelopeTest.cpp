@@ -26,15 +26,6 @@ TEST(Envelope, ATypeCodeHasItsDisplayNameInAnyCase)
     EXPECT_EQ(GetMarkerTypeName(marker), u"CORRUPT!"_s);
 }
 
-TEST(Envelope, TheSchemaInstanceIsDeclaredOnceBeforeTheFirstDeclaration)
-{
-    EXPECT_EQ(AddXsiDeclaration(u"<a><b xmlns='u'/><c xmlns='v'/></a>"_s),
-              u"<a><b "_s + xsi + u"xmlns='u'/><c xmlns='v'/></a>"_s);
-    for (const QString& unchanged :
-         {u"<a XMLNS='u'/>"_s, u"<a "_s + xsi + u"xmlns='u'/>"_s, u"<a xmlns='u' "_s + xsi.toUpper() + u"/>"_s})
-        EXPECT_EQ(AddXsiDeclaration(unchanged), unchanged);
-}
-
 TEST(Envelope, AmpersandsAreEscapedAsFarAsAParseGoes)
 {
     QString text = u"a & b &amp;"_s;

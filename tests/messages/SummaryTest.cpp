@@ -218,26 +218,5 @@ TEST_F(MessageList, OneMessageOfARequestIsShownAtATime)
     EXPECT_EQ(listedFiles(Read), "C.xml d.xml e.xml m.xml n.xml");
 }
 
-TEST_F(MessageList, MoreThanTwentyFiveFilesAskForAFilterOnce)
-{
-    desktop.emplace(R"({"inputs": [{"text": "Quote Number", "answer": "12"}]})");
-    for (int i = 0; i < 24; ++i)
-        lie(gsReadPath, u"%1.jpg"_s.arg(i), "");
-    lie(gsReadPath, u"12.0_1.xml"_s, quoteMatch("12"));
-    filled(Read);
-    EXPECT_EQ(desktop->prompts(), QStringList());
-    lie(gsReadPath, u"13.0_1.xml"_s, quoteMatch("13"));
-    EXPECT_EQ(listedFiles(Read), "12.0_1.xml");
-    EXPECT_EQ(desktop->prompts(), QStringList{u"Enter a Quote Number to search by (Leave blank for all quotes)"_s});
-    gsListFilter.clear();
-    EXPECT_EQ(listedFiles(Read), "12.0_1.xml 13.0_1.xml") << "it has been asked";
-    gsListFilter = u"13"_s;
-    gbFilterAsked = false;
-    EXPECT_EQ(listedFiles(Read), "13.0_1.xml") << "there is a filter";
-    EXPECT_EQ(desktop->prompts().size(), 1);
-    filled();
-    EXPECT_EQ(gsListFilter, QString()) << "the unread folder has none";
-}
-
 }  // namespace
 }  // namespace kest::test

@@ -112,17 +112,6 @@ TEST_F(Totals, ANullThatMattersLeavesTheQuoteAsItWas)
     EXPECT_EQ(shown(), "");
 }
 
-TEST_F(Totals, LinesThatAreWalkedAlreadyCountOnlyForASend)
-{
-    part(quote("500"), 1, 1, 40);
-    Opened opened;
-    opened.lines.moveNext();
-    CalcQuoteTotals(opened.header, opened.lines);
-    EXPECT_EQ(quote("500").number("PRTTOTAL"), 40);
-    CalcAuthorisedTotals(opened.header, opened.lines);
-    EXPECT_EQ(quote("500").number("PRTTOTAL"), 0);
-}
-
 TEST_F(Totals, RoundingStoresMoneyAndHoursAndTotalsThem)
 {
     LineRow line = quote("500").line(1, "MIS").set("unitcost", 10.456).set("rahour", 1.005).set("pthour", nullptr);

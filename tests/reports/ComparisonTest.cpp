@@ -37,18 +37,19 @@ protected:
         return BuildAuthReport(ParsedMessage(text), number, subquote, false).has_value();
     }
     /// The cells of the current row, one that was never set as "-".
-    static std::string cells(const db::Recordset& table, const char* fields, QChar between = u'|')
+    static std::string cells(const db::Recordset& table, const Text& fields, QChar between = u'|')
     {
         QStringList texts;
-        for (const QString& field : QString::fromLatin1(fields).split(u' '))
+        for (const QString& field : QString(fields).split(u' '))
             texts.append(table.isNull(field) ? u"-"_s : table.text(field));
         return texts.join(between).toStdString();
     }
-    static std::string column(db::Recordset table, const char* field)
+    /// A field of all rows.
+    static std::string column(db::Recordset table, const Text& field)
     {
         std::string texts;
         for (table.moveFirst(); !table.eof(); table.moveNext())
-            texts += (texts.empty() ? "" : " ") + cells(table, field);
+            texts += (texts.empty() ? "" : ", ") + cells(table, field);
         return texts;
     }
     /// Adds a line as a cell has it: element, indicator and elements.
@@ -98,22 +99,16 @@ TEST_F(Comparison, TheHeaderIsOnEveryRow)
     Message told = authorisedQuote("500/0");
     told.set("kestAuthorisedQuoteNumber", "A number that is too long").set("assessmentComment", "Names & \"quotes\" é");
     told.set("quoteBody/quoteTotal", "1,141.25").set("quoteBody/gst", "103.75").labour(1, "I").labour(2, "I");
-    db::Recordset table = authorised(told);
-    for (table.moveFirst(); !table.eof(); table.moveNext())
-        EXPECT_EQ(cells(table,
-                        "KESTQuoteNo comment authority_no complete_date ass_name ass_ph ass_fax auth_amt quote_ref "
-                        "quote_type quote_total sub_repairer action total_md"),
-                  "A number tha|Names & \"quotes\" é|AU55001|2008-04-11|Morgan Lee Whitby|03 5550 2020|03 5550 2021|"
-                  "1000|500/0|AUTR|1037.5||I|0");
-
+    const db::Recordset ofAuthorised = authorised(told);
     quote("500").set("TOTAL", 242.0);
-    table = adjusted(adjustedQuote("500").set("quoteBody/quoteTotal", "868.730").labour(1, "C"));
-    EXPECT_EQ(cells(table,
-                    "KESTQuoteNo comment authority_no complete_date ass_name ass_ph ass_fax excess contri "
-                    "auth_amt quote_ref quote_type quote_total sub_repairer action total_md"),
-              "KJ1|Repair the bumper|0|||||0|0|0|500|ADJR|868.730||C|242");
-    EXPECT_FALSE(table.hasColumn(u"vendor"_s));
-    EXPECT_EQ(table.columns().size(), 27);
+    const db::Recordset ofAdjusted =
+        adjusted(adjustedQuote("500").set("quoteBody/quoteTotal", "868.730").labour(1, "C"));
+    for (const auto& [field, first, second] : casesIn<3>("reports/comparison-header.txt")) {
+        EXPECT_EQ(column(ofAuthorised, field), (first + u", "_s + first).toStdString()) << field.toStdString();
+        EXPECT_EQ(column(ofAdjusted, field), second.toStdString()) << field.toStdString();
+    }
+    EXPECT_FALSE(ofAdjusted.hasColumn(u"vendor"_s));
+    EXPECT_EQ(ofAdjusted.columns().size(), 27);
 }
 
 TEST_F(Comparison, ExcessAndContributionStandOnlyWhereTheyDiffer)
@@ -145,11 +140,11 @@ TEST_F(Comparison, UnchangedLinesHaveNoRowAndDeletedOnesNoneOnAReprint)
         return message.labour(1, "N").labour(3, "I").part(2, "D").part(4, "").paint(5, "I").paint(6, "");
     };
     // a line without an indicator has that of the line before it in its section, as when it is loaded
-    EXPECT_EQ(column(authorised(lines(authorisedQuote("500"))), "line_no"), "3 2 4 5 6");
-    EXPECT_EQ(column(authorised(lines(authorisedQuote("500"))), "action"), "I D D I I");
-    EXPECT_EQ(column(authorised(lines(authorisedQuote("500")), true), "line_no"), "3 5 6");
-    EXPECT_EQ(column(adjusted(lines(adjustedQuote("500"))), "line_no"), "3 2 4 5 6");
-    EXPECT_EQ(column(adjusted(lines(adjustedQuote("500")), true), "line_no"), "3 5 6");
+    EXPECT_EQ(column(authorised(lines(authorisedQuote("500"))), "line_no"), "3, 2, 4, 5, 6");
+    EXPECT_EQ(column(authorised(lines(authorisedQuote("500"))), "action"), "I, D, D, I, I");
+    EXPECT_EQ(column(authorised(lines(authorisedQuote("500")), true), "line_no"), "3, 5, 6");
+    EXPECT_EQ(column(adjusted(lines(adjustedQuote("500"))), "line_no"), "3, 2, 4, 5, 6");
+    EXPECT_EQ(column(adjusted(lines(adjustedQuote("500")), true), "line_no"), "3, 5, 6");
 }
 
 TEST_F(Comparison, AnAuthorisedQuoteWithoutChangesStillHasARow)
@@ -175,7 +170,8 @@ TEST_F(Comparison, ASubletRepairerIsAVendorAndBecomesOneByAMerePrint)
     message.sublet(1, "I").sublet(2, "N", {{"subletRepairer", "Nobody"}});
     message.sublet(3, "I", {{"subletRepairer", "O'Hara & Sons"}});
     for (int twice = 0; twice < 2; ++twice)
-        EXPECT_EQ(column(authorised(message, true), "vendor"), std::to_string(known) + " " + std::to_string(known + 1));
+        EXPECT_EQ(column(authorised(message, true), "vendor"),
+                  std::to_string(known) + ", " + std::to_string(known + 1));
     EXPECT_EQ(rowCount("VENDOR"), 2);
     const VendorRow made = vendor("O'Hara & Sons");
     EXPECT_EQ(made.text("Account") + made.text("STREET") + made.text("PHONE"), "2938 Foundry Lane03 5550 1010");
