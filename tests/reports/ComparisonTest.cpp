@@ -45,7 +45,8 @@ protected:
         return texts.join(between).toStdString();
     }
     /// A field of all rows.
-    static std::string column(db::Recordset table, const Text& field)
+    template <class Recordset>
+    static std::string column(Recordset&& table, const Text& field)
     {
         std::string texts;
         for (table.moveFirst(); !table.eof(); table.moveNext())
@@ -99,10 +100,9 @@ TEST_F(Comparison, TheHeaderIsOnEveryRow)
     Message told = authorisedQuote("500/0");
     told.set("kestAuthorisedQuoteNumber", "A number that is too long").set("assessmentComment", "Names & \"quotes\" é");
     told.set("quoteBody/quoteTotal", "1,141.25").set("quoteBody/gst", "103.75").labour(1, "I").labour(2, "I");
-    const db::Recordset ofAuthorised = authorised(told);
+    db::Recordset ofAuthorised = authorised(told);
     quote("500").set("TOTAL", 242.0);
-    const db::Recordset ofAdjusted =
-        adjusted(adjustedQuote("500").set("quoteBody/quoteTotal", "868.730").labour(1, "C"));
+    db::Recordset ofAdjusted = adjusted(adjustedQuote("500").set("quoteBody/quoteTotal", "868.730").labour(1, "C"));
     for (const auto& [field, first, second] : casesIn<3>("reports/comparison-header.txt")) {
         EXPECT_EQ(column(ofAuthorised, field), (first + u", "_s + first).toStdString()) << field.toStdString();
         EXPECT_EQ(column(ofAdjusted, field), second.toStdString()) << field.toStdString();
