@@ -48,10 +48,10 @@ protected:
     template <class Recordset>
     static std::string column(Recordset&& table, const Text& field)
     {
-        std::string texts;
+        QStringList texts;
         for (table.moveFirst(); !table.eof(); table.moveNext())
-            texts += (texts.empty() ? "" : ", ") + cells(table, field);
-        return texts;
+            texts << QString::fromStdString(cells(table, field));
+        return texts.join(u", "_s).toStdString();
     }
     /// Adds a line as a cell has it: element, indicator and elements.
     static void add(Message& message, int line, const QString& cell)
