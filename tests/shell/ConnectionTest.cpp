@@ -19,23 +19,19 @@ void setSetting(const QString& key, const QString& value, const QString& section
 
 TEST(ConnectionText, NamesDriverServerAndInstance)
 {
-    struct Case {
-        int driver;
-        QString server, instance, expected;
-    };
-    const Case cases[] = {
-        {0, u"(local)"_s, u""_s, u"Driver={SQL Server};Server=(local)\\;Database=WirSql;Uid=sa;Pwd=secret;"_s},
-        {1, u"SHOP\\"_s, u"A"_s, u"Driver={SQL Native Client};Server=SHOP\\A;Database=WirSql;Uid=sa;Pwd=secret;"_s},
-        {0, u"SHOP"_s, u"A"_s, u"Driver={SQL Server};Server=SHOP\\A;Database=WirSql;Uid=sa;Pwd=secret;"_s},
-        {2, u"SHOP"_s, u"A"_s, u""_s},
-        {1, u"mysql:db.shop:3307"_s, u"A"_s,
-         u"Driver={MySQL};Server=db.shop;Port=3307;Database=WirSql;Uid=sa;Pwd=secret;"_s}};
     gsDatabase = u"WirSql"_s;
     gsSAPwd = u"secret"_s;
-    for (const Case& c : cases) {
-        gsServer = c.server;
-        gsInstance = c.instance;
-        EXPECT_EQ(ConnectionText(c.driver), c.expected);
+    const auto login = u"Database=WirSql;Uid=sa;Pwd=secret;"_s;
+    const std::tuple<int, QString, QString, QString> cases[] = {
+        {0, u"(local)"_s, u""_s, u"Driver={SQL Server};Server=(local)\\;"_s + login},
+        {1, u"SHOP\\"_s, u"A"_s, u"Driver={SQL Native Client};Server=SHOP\\A;"_s + login},
+        {0, u"SHOP"_s, u"A"_s, u"Driver={SQL Server};Server=SHOP\\A;"_s + login},
+        {2, u"SHOP"_s, u"A"_s, u""_s},
+        {1, u"mysql:db.shop:3307"_s, u"A"_s, u"Driver={MySQL};Server=db.shop;Port=3307;"_s + login}};
+    for (const auto& [driver, server, instance, expected] : cases) {
+        gsServer = server;
+        gsInstance = instance;
+        EXPECT_EQ(ConnectionText(driver), expected);
     }
 }
 
@@ -45,16 +41,12 @@ TEST_F(ShopConnection, ATabletWorksOnTheMasterOrOnItsOwn)
 {
     setSetting(u"DatabaseName"_s, u"Own"_s);
     setSetting(u"TabletMasterDatabaseName"_s, u"Master"_s);
-    struct Case {
-        QString useMaster, database;
-        bool local;
-    };
-    const Case cases[] = {{u"1"_s, u"Master"_s, false}, {u"0"_s, u"Own"_s, true}, {u"yes"_s, u"Own"_s, false}};
-    for (const Case& c : cases) {
-        setSetting(u"TabletUseMaster"_s, c.useMaster);
+    for (const auto& [useMaster, database, local] :
+         {std::tuple(u"1"_s, u"Master"_s, false), {u"0"_s, u"Own"_s, true}, {u"yes"_s, u"Own"_s, false}}) {
+        setSetting(u"TabletUseMaster"_s, useMaster);
         OpenDatabase();
-        EXPECT_EQ(gsDatabase, c.database) << c.useMaster.toStdString();
-        EXPECT_EQ(gbTabletLocal, c.local) << c.useMaster.toStdString();
+        EXPECT_EQ(gsDatabase, database) << useMaster.toStdString();
+        EXPECT_EQ(gbTabletLocal, local) << useMaster.toStdString();
     }
     gbTabletLocal = false;
 }

@@ -18,23 +18,20 @@ using namespace kest;
 
 namespace {
 
-template <class Function>
-Function* entry(void* library, const char* name)
-{
-    void* found = dlsym(library, name);
-    if (!found) {
-        std::fprintf(stderr, "no %s\n", name);
-        std::exit(10);
-    }
-    return reinterpret_cast<Function*>(found);
-}
-
 void check(bool holds, const char* what)
 {
     if (holds)
         return;
     std::fprintf(stderr, "failed: %s\n", what);
     std::exit(11);
+}
+
+template <class Function>
+Function* entry(void* library, const char* name)
+{
+    void* found = dlsym(library, name);
+    check(found != nullptr, name);
+    return reinterpret_cast<Function*>(found);
 }
 
 void closePanel()

@@ -1,6 +1,8 @@
 #include "support/Cases.h"
 
 #include <QFile>
+#include <QJsonArray>
+#include <QJsonDocument>
 #include <QRegularExpression>
 
 namespace kest::test {
@@ -38,6 +40,23 @@ QStringList cellsOf(const QString& line)
     for (QString& cell : cells)
         cell = unquoted(cell.trimmed());
     return cells;
+}
+
+QList<QStringList> rowsIn(const std::string& name)
+{
+    QList<QStringList> rows;
+    for (const QString& line : linesOf(name)) {
+        QStringList row = cellsOf(line);
+        for (QString& cell : row) {
+            const QString json = u"[\"%1\"]"_s.arg(cell.replace(u'"', u"\\\""_s));
+            const QJsonArray read = QJsonDocument::fromJson(json.toUtf8()).array();
+            if (read.size() != 1)
+                throw std::runtime_error(name + " has a cell that can't be read: " + json.toStdString());
+            cell = read[0].toString();
+        }
+        rows.append(row);
+    }
+    return rows;
 }
 
 std::vector<std::pair<QString, QString>> pairsIn(const QString& cell)

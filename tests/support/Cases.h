@@ -25,6 +25,9 @@ QStringList linesOf(const std::string& name);
 /// quotes.
 QStringList cellsOf(const QString& line);
 
+/// The rows of a table, whose cells write characters as JSON does: "\n", "\\", "\u20ac".
+QList<QStringList> rowsIn(const std::string& name);
+
 /// What stands in a cell as "column=value path/to=value"; a value that begins or ends with a blank stands in quotes.
 std::vector<std::pair<QString, QString>> pairsIn(const QString& cell);
 

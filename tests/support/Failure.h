@@ -1,4 +1,4 @@
-// The number of the failure that a step ends in, where that number is all that matters.
+// The failure that a step ends in, where its number is all that matters.
 #pragma once
 
 #include "platform/RuntimeError.h"
@@ -15,6 +15,15 @@ int failureOf(Step&& step)
     } catch (const RuntimeError& error) {
         return error.number();
     }
+}
+
+/// What a step gives; "error 13" where it ends in that failure.
+template <class Step>
+QString outcomeOf(Step&& step)
+{
+    QString result;
+    const int failure = failureOf([&] { result = step(); });
+    return failure ? QStringLiteral("error %1").arg(failure) : result;
 }
 
 }  // namespace kest::test
