@@ -1,7 +1,7 @@
 // The text of the viewer: each kind of node, the two repairs, and what is no message.
 #include "platform/files/files.h"
-#include "support/ScriptedDesktop.h"
 #include "support/Cases.h"
+#include "support/ScriptedDesktop.h"
 #include "support/TestProfile.h"
 #include "utilities/FormatXML.h"
 

@@ -1,5 +1,6 @@
 // The window on a quote's network fields: what it shows, what its buttons change, what a save stores.
 #include "shell/SharedVariables.h"
+#include "support/Cases.h"
 #include "support/Hands.h"
 #include "support/Shop.h"
 #include "utilities/frmUtilities.h"
@@ -26,12 +27,13 @@ protected:
         desktop.emplace(("{\"windows\": {\"frmUtilities\": [[" + steps + "]]}}").c_str());
         frmUtilities::ShowForm(u"500"_s, subquote);
     }
-    /// Shows the window on quote 500 to hands; the numbers of the failures that were reported.
-    static QList<int> failuresOf(const test::Hands::Work& work)
+    /// Shows the window on quote 500 to hands; the failures that were reported, each with its source.
+    static QStringList failuresOf(const test::Hands::Work& work)
     {
-        QList<int> failures;
-        desktop::setFailureReporter(
-            [&](const RuntimeError& error, const QString&) { failures.append(error.number()); });
+        QStringList failures;
+        desktop::setFailureReporter([&](const RuntimeError& error, const QString& source) {
+            failures.append(source + u' ' + QString::number(error.number()));
+        });
         const test::Hands hands({{u"frmUtilities"_s, work}});
         frmUtilities::ShowForm(u"500"_s, u"0"_s);
         desktop::setFailureReporter(nullptr);
@@ -60,14 +62,8 @@ const std::string readAll = R"({"read": true})";
 
 TEST_F(Utilities, ShowTheQuoteAndANullAsAnEmptyText)
 {
-    quote("500", 1)
-        .request("QR1", "2")
-        .quoteNumber("KQ1")
-        .authorised("KA1")
-        .set("AuthDate", QDate(2008, 3, 21))
-        .stage(4)
-        .locked(true)
-        .note("Won Quote Request");
+    quote("500", 1).request("QR1", "2").quoteNumber("KQ1").authorised("KA1").note("Won Quote Request");
+    quote("500", 1).set("AuthDate", QDate(2008, 3, 21)).stage(4).locked(true);
     quote("500").set("Job_stage", nullptr).set("INSURER_ID", 999).set("Claim", nullptr);
     work(readAll, u"1"_s);
     EXPECT_EQ(texts(),
@@ -85,7 +81,7 @@ TEST_F(Utilities, ATabForEachRowLoadsItUnlessItHasGone)
     test::anotherQuote("500");
     quote("500", 1).quoteNumber("FIRST").remarks("first");
     quote("500", 2);
-    const QList<int> failures = failuresOf([](QDialog& window) {
+    const QStringList failures = failuresOf([](QDialog& window) {
         auto& tabs = control<QTabBar>(window, "TabStrip1");
         auto& number = control<QLineEdit>(window, "txtQuoteNo");
         QStringList shown;
@@ -103,7 +99,7 @@ TEST_F(Utilities, ATabForEachRowLoadsItUnlessItHasGone)
         number.setText(u"repaired"_s);
         control<QPushButton>(window, "Command1").click();
     });
-    EXPECT_EQ(failures, QList<int>{NoCurrentRow});
+    EXPECT_EQ(failures, QStringList(u"frmUtilities.TabStrip1_Click 3021"_s));
     EXPECT_EQ(quote("500").text("KESTQuoteNo"), "MAIN");
     EXPECT_EQ(quote("500", 1).text("KESTQuoteNo"), "repaired");
 }
@@ -166,30 +162,14 @@ TEST_F(Utilities, AStatusButtonRewritesTickNumberAndNotes)
     const QString whole =
         u"(Authorised Quote) (Tender Failed \"Reason : price\") (Quote Deleted \"Reason : mistake\") "
         "(Submitted KEST Quote) (Won Quote Request)"_s;
-    struct {
-        const char* button;
-        int subquote;
-        std::string state;  // locked, number, authorised, stage
-        QString notes;
-    } const cases[] = {
-        {"Command3", 0, "False||KA1|4", u"(Tender Failed \"Reason : price\") (Active Quote Request)"_s},
-        {"Command3", 1, "False||KA1|4", u"(Tender Failed \"Reason : price\") (Won Quote Request)"_s},
-        {"Command4", 0, "True|KQ1|KA1|4", u"(Sending KEST Quote) (Responded Quote Request)"_s},
-        {"cmdWon", 1, "True|KQ1|KA1|4", u"(Authorised Quote) (Submitted KEST Quote) (Won Quote Request)"_s},
-        {"cmdDeleted", 0, "True|KQ1|KA1|4", u"(Quote Deleted) (Deleted KEST Quote) (Responded Quote Request)"_s},
-        {"cmdLoss", 1, "True|KQ1|KA1|4",
-         u"(Tender Failed) (Quote Deleted) (Deleted KEST Quote) (Loss Quote Request)"_s},
-    };
-    for (const auto& c : cases) {
-        auto row = quote("500", c.subquote);
-        row.quoteNumber("KQ1").authorised("KA1").stage(4).locked(c.state.front() == 'F');
+    for (const auto& [button, subquote, state, notes] : test::casesIn<4>("utilities-buttons.txt")) {
+        auto row = quote("500", subquote.toInt());
+        row.quoteNumber("KQ1").authorised("KA1").stage(4).locked(state.startsWith(u"False"_s));
         row.remarks(QString(whole).replace(u'(', u'(' + old));
-        work("{\"click\": \"" + std::string(c.button) + "\"}, " + save, QString::number(c.subquote));
-        EXPECT_EQ(QString::fromStdString(row.notes()).remove(old), c.notes) << c.button << c.subquote;
-        EXPECT_EQ(row.text("ReadOnly") + '|' + row.text("KESTQuoteNo") + '|' + row.text("KESTAuthNo") + '|' +
-                      row.text("Job_stage"),
-                  c.state)
-            << c.button;
+        work("{\"click\": \"" + button.toStdString() + "\"}, " + save, subquote);
+        EXPECT_EQ(QString::fromStdString(row.notes()).remove(old), notes) << button.toStdString() << subquote.toInt();
+        EXPECT_EQ(row.text("ReadOnly") + ' ' + row.text("KESTQuoteNo"), state.toStdString()) << button.toStdString();
+        EXPECT_EQ(row.text("KESTAuthNo") + ' ' + row.text("Job_stage"), "KA1 4") << button.toStdString();
     }
 }
 
@@ -207,7 +187,7 @@ TEST_F(Utilities, ASaveThatFailsIsReportedAndTheWindowStays)
     };
     for (const auto& c : cases) {
         quote("500").quoteNumber("before").remarks("before");
-        const QList<int> failures = failuresOf([&](QDialog& window) {
+        const QStringList failures = failuresOf([&](QDialog& window) {
             gConn->execute(QString::fromLatin1(c.meanwhile));
             control<QLineEdit>(window, "txtQuoteNo").setText(u"repaired"_s);
             control<QLineEdit>(window, "txtAuthDate").setText(QString::fromStdString(c.date));
@@ -216,7 +196,7 @@ TEST_F(Utilities, ASaveThatFailsIsReportedAndTheWindowStays)
             EXPECT_TRUE(window.isVisible());
             EXPECT_EQ(control<QLineEdit>(window, "txtAuthDate").hasFocus(), c.failure == TypeMismatch);
         });
-        EXPECT_EQ(failures, QList<int>{c.failure}) << c.meanwhile;
+        EXPECT_EQ(failures, QStringList(u"frmUtilities.Command1_Click "_s + QString::number(c.failure))) << c.meanwhile;
         EXPECT_EQ(quote("500").text("KESTQuoteNo") + '|' + quote("500").notes(), c.stored) << c.meanwhile;
     }
 }
