@@ -2,12 +2,8 @@
 #include "outbound/ExtraInfo.h"
 #include "outbound/frmExtraInfo.h"
 #include "platform/desktop/Prompt.h"
-#include "shell/SharedVariables.h"
-#include "support/Cases.h"
 
 namespace kest::test {
-
-using namespace Qt::StringLiterals;
 
 class ExtraInformation : public Sending {
 protected:

@@ -1,15 +1,9 @@
 // Whole quote documents, each made from the lines in one file of tests/data/outbound and compared with another.
 #include "Sending.h"
-#include "platform/files/files.h"
-#include "shell/SharedVariables.h"
-#include "shell/modDBAccess.h"
-#include "support/Cases.h"
 
 #include <QXmlStreamReader>
 
 namespace kest::test {
-
-using namespace Qt::StringLiterals;
 
 namespace {
 

@@ -1,18 +1,12 @@
 #include "Sending.h"
-#include "outbound/SendQuote.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/FaultInjection.h"
 #include "platform/files/FaultInjection.h"
-#include "platform/files/files.h"
-#include "shell/SharedVariables.h"
-#include "support/Cases.h"
 #include "support/Failure.h"
 
 #include <QDir>
 
 namespace kest::test {
-
-using namespace Qt::StringLiterals;
 
 namespace {
 

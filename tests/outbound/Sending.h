@@ -1,21 +1,48 @@
 // A shop that sends quotes, and what then lies in its outgoing folder.
 #pragma once
 
+#include "outbound/SendQuote.h"
+#include "platform/database/Sql.h"
+#include "platform/files/files.h"
+#include "platform/xml/xml.h"
+#include "shell/SharedVariables.h"
+#include "shell/modDBAccess.h"
+#include "support/Cases.h"
 #include "support/Shop.h"
 
 namespace kest::test {
 
+using namespace Qt::StringLiterals;
+
 class Sending : public Shop {
 protected:
     /// The panel is open on the quote and "Send Quote" is chosen; the total that was sent.
-    static double send(const Text& number, int subquote = 0);
+    static double send(const Text& number, int subquote = 0)
+    {
+        db::Recordset panel =
+            Opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", QString(number), subquote));
+        return SendQuote(panel);
+    }
     /// A file of the outgoing folder, "" where it is missing.
-    static QString outgoing(const QString& file);
+    static QString outgoing(const QString& file)
+    {
+        return files::exists(gsUnsentPath + file) ? files::read(gsUnsentPath + file) : QString();
+    }
     /// The text of an element of an outgoing document by its path below the root, "(none)" where it is missing.
-    static std::string sent(const QString& path, const QString& file = QStringLiteral("500.0_1.xml"));
-
+    static std::string sent(const QString& path, const QString& file = u"500.0_1.xml"_s)
+    {
+        xml::Document document;
+        document.loadXML(u"<request>"_s + outgoing(file) + u"</request>"_s);
+        const xml::Node node = document.selectSingleNode(u"/request/"_s + path);
+        return node ? node.text().toStdString() : "(none)";
+    }
     /// A main quote with one labour line of 100, which passes all checks.
-    static QuoteRow sendable(const Text& number = "500", int subquote = 0);
+    static QuoteRow sendable(const Text& number = "500", int subquote = 0)
+    {
+        QuoteRow row = quote(number, subquote);
+        row.line(1).set("rr_rate2", 50).set("rrhour", 2);
+        return row;
+    }
 };
 
 }  // namespace kest::test

@@ -1,7 +1,6 @@
 // The preview: which template it opens, what it puts in, its window, and the pages as a reader gets them.
 #include "platform/database/Recordset.h"
 #include "platform/desktop/Gestures.h"
-#include "platform/files/files.h"
 #include "platform/report/OutputFolder.h"
 #include "platform/report/Pages.h"
 #include "platform/settings/registry.h"
@@ -19,8 +18,6 @@
 #include <QToolButton>
 
 namespace kest::test {
-
-using namespace Qt::StringLiterals;
 
 namespace {
 

@@ -1,30 +1,73 @@
 // The reports that a test's desktop has shown, and the shop's templates for them.
 #pragma once
 
+#include "platform/files/files.h"
 #include "support/Shop.h"
 
+#include <QFile>
+#include <QJsonArray>
 #include <QJsonObject>
+#include <QProcess>
 
 namespace kest::test {
 
+using namespace Qt::StringLiterals;
+
 class Previews : public Shop {
 protected:
-    Previews();
+    Previews()
+    {
+        files::makeFolder(u"c:\\wirra32\\report"_s);
+        for (const char* name : {"710.html", "720.html", "730.html"})
+            putTemplate(name, files::readBytes(QStringLiteral(KEST_SOURCE_DIR "/templates/") + QLatin1String(name)));
+    }
 
     /// Puts a template under the report's name.
-    static void putTemplate(const char* name, const QByteArray& content);
+    static void putTemplate(const char* name, const QByteArray& content)
+    {
+        files::writeBytes(u"c:\\wirra32\\report\\"_s + QString::fromLatin1(name), content);
+    }
     /// The windows shown since the last call.
-    QList<QJsonObject> windows();
+    QList<QJsonObject> windows()
+    {
+        QList<QJsonObject> shown;
+        for (; seen < desktop->record().windows.size(); ++seen)
+            shown.append(desktop->record().windows[seen].toObject());
+        return shown;
+    }
     /// Their names and report numbers, joined by blanks.
-    std::string shownReports();
+    std::string shownReports()
+    {
+        QStringList names;
+        for (const QJsonObject& window : windows())
+            names.append(window[u"name"].toString() + window[u"report"].toVariant().toString());
+        return names.join(u' ').toStdString();
+    }
     /// Of a table of the record: one row's cells in these fields, one that was never set as "-".
-    static std::string cells(const QJsonObject& window, int row, const Text& fields);
+    static std::string cells(const QJsonObject& window, int row, const Text& fields)
+    {
+        const QVariantList names = window[u"table"][u"fields"].toArray().toVariantList();
+        QStringList texts;
+        for (const QString& field : QString(fields).split(u' ')) {
+            EXPECT_TRUE(names.contains(field)) << field.toStdString();
+            const QJsonValue value = window[u"table"][u"rows"][row][names.indexOf(field)];
+            texts.append(value.isNull() ? u"-"_s : value.toString());
+        }
+        return texts.join(u'|').toStdString();
+    }
 
 private:
     qsizetype seen = 0;
 };
 
 /// The text of a PDF file as a reader sees it, pages divided by form feeds.
-QString pdfText(const QString& file);
+inline QString pdfText(const QString& file)
+{
+    QProcess reader;
+    reader.start(u"pdftotext"_s, {u"-layout"_s, u"-enc"_s, u"UTF-8"_s, file, u"-"_s});
+    EXPECT_TRUE(reader.waitForFinished());
+    EXPECT_EQ(reader.exitCode(), 0);
+    return QString::fromUtf8(reader.readAllStandardOutput());
+}
 
 }  // namespace kest::test

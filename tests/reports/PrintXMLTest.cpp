@@ -1,6 +1,5 @@
 // Which report a message gives, with which values, and what is said where it gives none.
 #include "messages/frmMessageList.h"
-#include "platform/files/files.h"
 #include "platform/report/OutputFolder.h"
 #include "reports/Previews.h"
 #include "reports/PrintXML.h"
@@ -10,8 +9,6 @@
 #include <QRegularExpression>
 
 namespace kest::test {
-
-using namespace Qt::StringLiterals;
 
 namespace {
 
@@ -137,13 +134,9 @@ TEST_F(Printing, TheListWindowReprintsItsReadMessages)
 TEST_F(Printing, AnAuthorisationAlsoShowsItsSubletDocuments)
 {
     quote("500", 1).request("QR1").line(7, "MIS", "Alignment").set("qty", 1.0);
-    quote("500").request("QR2");
-    for (const auto& [document, reports] : {std::pair{"500.0_7.pdf", "frmPrintPreview730"},
-                                            std::pair{"500.1_7.pdf", "frmPrintPreview730 frmSubletAuth"}}) {
-        files::writeBytes(u"c:\\wirdoc\\PDF\\"_s + QLatin1String(document), "%PDF-1.4");
-        print(authorisedQuote("500/1"));
-        EXPECT_EQ(shownReports(), reports);
-    }
+    files::writeBytes(u"c:\\wirdoc\\PDF\\500.1_7.pdf"_s, "%PDF-1.4");
+    print(authorisedQuote("500/1"));
+    EXPECT_EQ(shownReports(), "frmPrintPreview730 frmSubletAuth");
 }
 
 TEST_F(Printing, EachChangedLineStandsInItsSection)
