@@ -42,17 +42,15 @@ void makeDocument()
 bool isBuiltIn(const QWidget& widget)
 {
     for (const QWidget* above = widget.parentWidget(); above && !above->isWindow(); above = above->parentWidget())
-        if (qobject_cast<const QLineEdit*>(above) || qobject_cast<const QComboBox*>(above) ||
-            qobject_cast<const QAbstractItemView*>(above) || qobject_cast<const QTabBar*>(above))
+        if (isA<QLineEdit, QComboBox, QAbstractItemView, QTabBar>(*above))
             return true;
     return false;
 }
 
 bool isControl(const QWidget& widget)
 {
-    const bool isView = qobject_cast<const QAbstractScrollArea*>(&widget) && widget.focusPolicy() != Qt::NoFocus;
-    return isView || qobject_cast<const QAbstractButton*>(&widget) || qobject_cast<const QLineEdit*>(&widget) ||
-           qobject_cast<const QComboBox*>(&widget) || qobject_cast<const QTabBar*>(&widget);
+    const bool isView = isA<QAbstractScrollArea>(widget) && widget.focusPolicy() != Qt::NoFocus;
+    return isView || isA<QAbstractButton, QLineEdit, QComboBox, QTabBar>(widget);
 }
 
 }  // namespace
@@ -85,6 +83,7 @@ void EveryWindow::showBox(const std::function<void()>& show, const Check& check)
         box->close();
     });
     timer.start(1);
+    SCOPED_TRACE("a box");
     show();
 }
 
@@ -94,33 +93,26 @@ void EveryWindow::each(const Check& check)
         window.findChild<QAbstractButton*>(u"Option1(1)"_s)->click();
         check(window);
     };
+    bool passed = false;
     const struct {
         const char* name;
-        const char* title;
         Check check;
         std::function<void()> show;
     } windows[] = {
-        {"frmKEST", "the panel", check, [] { eKEST().ShowKESTWindow(u"500"_s, u"0"_s); }},
-        {"frmMessageList", "the unread list", check, [] { frmMessageList::ShowForm(); }},
-        {"frmMessageList", "the read list", readFolder, [] { frmMessageList::ShowForm(); }},
-        {"frmExtraInfo", "", check, [] { frmExtraInfo::ShowForm(u"500"_s, u"0"_s); }},
-        {"frmSubletAuth", "", check, [] { frmSubletAuth::ShowForm(u"500"_s, u"0"_s); }},
-        {"frmViewPDF", "", check, [] { frmViewPDF::ShowForm(document); }},
-        {"frmPrintPreview", "", check, [] { frmPrintPreview::ShowForm(710, QString(), nullptr); }},
-        {"frmLogin", "", check,
-         [] {
-             bool passed = false;
-             frmLogin::ShowForm(passed);
-         }},
-        {"frmUtilities", "", check, [] { frmUtilities::ShowForm(u"500"_s, u"0"_s); }},
-        {"frmViewXML", "", check,
-         [] {
-             gsCurFolder = gsUnreadPath;
-             frmViewXML::ShowForm(u"a.xml"_s);
-         }},
+        {"frmKEST", check, [] { eKEST().ShowKESTWindow(u"500"_s, u"0"_s); }},
+        {"frmMessageList", check, [] { frmMessageList::ShowForm(); }},
+        {"frmMessageList", readFolder, [] { frmMessageList::ShowForm(); }},
+        {"frmExtraInfo", check, [] { frmExtraInfo::ShowForm(u"500"_s, u"0"_s); }},
+        {"frmSubletAuth", check, [] { frmSubletAuth::ShowForm(u"500"_s, u"0"_s); }},
+        {"frmViewPDF", check, [] { frmViewPDF::ShowForm(document); }},
+        {"frmPrintPreview", check, [] { frmPrintPreview::ShowForm(710, QString(), nullptr); }},
+        {"frmLogin", check, [&] { frmLogin::ShowForm(passed); }},
+        {"frmUtilities", check, [] { frmUtilities::ShowForm(u"500"_s, u"0"_s); }},
+        {"frmViewXML", check, [] { frmViewXML::ShowForm(u"a.xml"_s); }},
     };
-    for (const auto& [name, title, checkOfWindow, show] : windows) {
-        SCOPED_TRACE(std::string(name) + ' ' + title);
+    gsCurFolder = gsUnreadPath;
+    for (const auto& [name, checkOfWindow, show] : windows) {
+        SCOPED_TRACE(name);
         desktop.emplace();
         int seen = 0;
         const Hands hands({{QString::fromLatin1(name), [&](QDialog& window) {
@@ -130,14 +122,8 @@ void EveryWindow::each(const Check& check)
         show();
         EXPECT_EQ(seen, 1);
     }
-    {
-        SCOPED_TRACE("message box");
-        showBox([] { desktop::ask(u"Are you SURE ?"_s, desktop::Icon::Critical); }, check);
-    }
-    {
-        SCOPED_TRACE("input box");
-        showBox([] { desktop::inputBox(u"Enter a Quote Number"_s, u"View KEST Messages"_s); }, check);
-    }
+    showBox([] { desktop::ask(u"Are you SURE ?"_s, desktop::Icon::Critical); }, check);
+    showBox([] { desktop::inputBox(u"Enter a Quote Number"_s, u"View KEST Messages"_s); }, check);
     desktop.emplace();
 }
 

@@ -3,9 +3,9 @@
 
 #include "support/Shop.h"
 
-#include <functional>
+#include <QDialog>
 
-class QDialog;
+#include <functional>
 
 namespace kest::test {
 
@@ -22,6 +22,12 @@ protected:
 private:
     static void showBox(const std::function<void()>& show, const Check& check);
 };
+
+template <class... Kinds>
+bool isA(const QWidget& widget)
+{
+    return (qobject_cast<const Kinds*>(&widget) || ...);
+}
 
 /// The controls that a person works, as far as they are shown and enabled: without the parts that the toolkit builds
 /// into them, which go by their owner's keys and name.
