@@ -1,5 +1,4 @@
 #include "messages/Envelope.h"
-#include "support/Cases.h"
 #include "support/Messages.h"
 
 #include <gtest/gtest.h>
@@ -34,19 +33,6 @@ TEST(Envelope, AmpersandsAreEscapedAsFarAsAParseGoes)
     QString hostile(xml::Document::maximumBytes / 5 + 1, u'&');
     EXPECT_FALSE(EscapeAmpersands(hostile));
     EXPECT_EQ(hostile.size(), xml::Document::maximumBytes / 5 + 1);
-}
-
-TEST(Envelope, AParseIsSparedOnlyWhereThePreparedTextHoldsTheSame)
-{
-    for (const auto& [text, holds] : casesIn<2>("messages/prepared.txt")) {
-        EXPECT_EQ(IsSameWhenPrepared(text), holds == u"the same"_s) << text.toStdString();
-        if (holds != u"the same"_s)
-            continue;
-        xml::Document bare;
-        ASSERT_TRUE(bare.loadXML(text)) << text.toStdString();
-        QString prepared = text;
-        EXPECT_EQ(ParsedMessage(prepared).documentElement().text(), bare.documentElement().text());
-    }
 }
 
 }  // namespace

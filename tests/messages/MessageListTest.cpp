@@ -229,25 +229,21 @@ TEST_F(Searched, OrderWidthsAndPlaceOutliveARefreshAndOrderAndWidthsTheWindow)
     };
     const auto work = [&](QDialog& window) {
         auto& list = control<QTreeView>(window, "ListView1");
-        for (const char* first : {"a.xml", "c.xml", "a.xml", "a.xml", "c.xml"}) {  // to, fro, none, to, fro
-            desktop::gestures::press(window, Qt::CTRL | Qt::Key_1);
-            EXPECT_EQ(list.model()->index(0, 0).data(), QString::fromLatin1(first));
-        }
         list.header()->resizeSection(2, 177);
-        desktop::gestures::press(list, Qt::Key_Home);
         desktop::gestures::press(list, Qt::Key_Down);
-        for (const QKeyCombination key : {QKeyCombination(Qt::Key_F5), Qt::CTRL | Qt::Key_3, Qt::CTRL | Qt::Key_1,
-                                          Qt::CTRL | Qt::Key_1, QKeyCombination(Qt::Key_F5)}) {
-            desktop::gestures::press(window, key);
-            EXPECT_TRUE(state(list).startsWith(u"b.xml chosen, width 177"_s)) << key.toCombined();
+        for (const int order : {0, 1, 0, 0, 1}) {  // to, fro, none, to, fro
+            desktop::gestures::press(window, Qt::CTRL | Qt::Key_1);
+            EXPECT_EQ(list.model()->index(0, 0).data(), order == 0 ? u"a.xml"_s : u"c.xml"_s);
+            desktop::gestures::press(window, Qt::Key_F5);
+            EXPECT_TRUE(state(list).startsWith(u"b.xml chosen, width 177"_s)) << state(list).toStdString();
         }
         EXPECT_EQ(state(list), u"b.xml chosen, width 177, order 1 of column 0"_s);
     };
     const auto look = [&](QDialog& window) {
         EXPECT_EQ(state(control<QTreeView>(window, "ListView1")), u"c.xml chosen, width 177, order 1 of column 0"_s);
     };
-    for (const test::Hands::Work& visit : {test::Hands::Work(work), test::Hands::Work(look)}) {
-        const test::Hands hands({{u"frmMessageList"_s, visit}});
+    for (const Hands::Work& visit : {Hands::Work(work), Hands::Work(look)}) {
+        const Hands hands({{u"frmMessageList"_s, visit}});
         frmMessageList::ShowForm();
     }
 }
@@ -292,7 +288,7 @@ TEST_F(Searched, FilesAreDroppedOrPastedWhileTheUnreadMessagesAreShown)
         EXPECT_EQ(paste(stick(u"f.xml"_s, cancellation("QR5").text())),
                   u"Files are taken in while the unread messages are shown."_s);
     };
-    const test::Hands hands({{u"frmMessageList"_s, work}});
+    const Hands hands({{u"frmMessageList"_s, work}});
     frmMessageList::ShowForm();
     EXPECT_EQ(filesIn(gsUnreadPath).join(u' '), u"a.xml b.xml c.xml c2.xml d.xml"_s);
     EXPECT_EQ(filesIn(root() + u"/stick"_s).size(), 4) << "nothing leaves the place that it comes from";

@@ -55,10 +55,8 @@ TEST_F(ExtraInformation, EnterGoesFromFieldToField)
         "'Return', 'r', 'Return', '4', 'Return', '5', 'x', '0', 'Return', '7', 'Return', '7', '7', 'Return', 'd']}, "_s +
         done);
     EXPECT_EQ(desktop->boxTexts(), QStringList());
-    std::string stored = quote("500").text("kms");
-    for (const char* column : {"VIN", "COLOUR", "CYLINDERS", "Year"})
-        stored += ' ' + car("ABC123").text(column);
-    EXPECT_EQ(stored, "2 1 Red 4 7/1977");
+    EXPECT_TRUE(car("ABC123").shows("VIN=1 COLOUR=Red CYLINDERS=4 Year=7/1977"));
+    EXPECT_TRUE(quote("500").shows("kms=2"));
 }
 
 TEST_F(ExtraInformation, AYearOfTwoDigitsIsWidenedWhenItIsLeft)

@@ -159,10 +159,8 @@ TEST_F(Preview, TheViewerFillsTheWindowAboveItsButton)
     const auto look = [](QDialog& window) {
         window.resize(900, 800);
         QCoreApplication::processEvents();
-        const auto& exit = control<QPushButton>(window, "cmdExit");
-        EXPECT_EQ(control<QWidget>(window, "crvPreview").geometry(),
-                  QRect(0, 0, 900, 800 - exit.height() - desktop::pixels(160)));
-        EXPECT_EQ(exit.geometry().right(), 899 - desktop::pixels(80));
+        const int below = control<QPushButton>(window, "cmdExit").height() + desktop::pixels(160);
+        EXPECT_EQ(control<QWidget>(window, "crvPreview").geometry(), QRect(0, 0, 900, 800 - below));
         const auto& page = control<QLabel>(window, "lblPage");
         EXPECT_EQ(page.text(), u"Page 1 of 5"_s);
         desktop::gestures::press(control<QWidget>(window, "crvPages"), Qt::Key_End);
