@@ -1,5 +1,6 @@
 #include "inbound/modLoadXML.h"
 #include "platform/RuntimeError.h"
+#include "support/Cases.h"
 #include "support/Load.h"
 #include "support/Shop.h"
 
@@ -17,47 +18,14 @@ void takeResponse(const Text& file, const Text& number, const Text& status = "Su
 
 }  // namespace
 
-TEST_F(Assessments, AResultClosesAMainQuoteAndHandsASupplementaryOneBack)
-{
-    const std::pair<const char*, const char*> cases[] = {
-        {"PART", "(today : Tender Failed \"Reason : Part Price\") (01/02/2008 : Lose Quote Request)"},
-        {"tlss", "(today : Tender Failed \"Reason : Total Loss\") (01/02/2008 : Total Loss Quote Request)"},
-        {"abc", "(today : Tender Failed \"Reason : Unknown Reason Code - ABC\") (01/02/2008 : Lose Quote Request)"},
-    };
-    for (const auto& [code, notes] : cases) {
-        quote("500").quoteNumber("KQ1").stage(3).remarks("(01/02/2008 : Responded Quote Request)");
-        EXPECT_TRUE(load(assessmentResult("KQ1").reason(code)));
-        EXPECT_EQ(quote("500").state(), std::string("10 locked KQ1 ") + notes);
-    }
-    quote("500", 1).quoteNumber("KQ2").stage(3).locked(true);
-    EXPECT_TRUE(load(assessmentResult("KQ2").reason("tlss")));
-    EXPECT_EQ(quote("500", 1).state(), "1 open KQ2 (today : Quote Rejected \"Reason : Total Loss\")");
-}
-
 TEST_F(Assessments, ABackOutUndoesWhatWasDecided)
 {
-    const struct {
-        int subquote;
-        const char *authorised, *before, *after, *authorisation;
-    } cases[] = {
-        {0, "KA1", "(02/02/2008 : Authorised Quote) (01/02/2008 : Won Quote Request)",
-         "(02/02/2008 : Deleted Authorised Quote) (01/02/2008 : Responded Quote Request)", "KESTAuthNo=- AuthDate=-"},
-        {0, "", "(01/02/2008 : Lose Quote Request)",
-         "(today : Fail Tender Backout) (01/02/2008 : Responded Quote Request)", "KESTAuthNo= AuthDate=01/02/2008"},
-        // the number of a supplementary quote's authorisation stays
-        {1, "KA1", "(01/02/2008 : Quote Rejected \"Reason : Part Price\")",
-         "(today : Rejected Supplementary Backout) (01/02/2008 : Quote Rejected \"Reason : Part Price\")",
-         "KESTAuthNo=KA1 AuthDate=01/02/2008"},
-        {1, "KA1", "(02/02/2008 : Authorised Quote) (01/02/2008 : Rejected Supplementary Backout)",
-         "(02/02/2008 : Deleted Authorised Quote) (01/02/2008 : Rejected Supplementary Backout)",
-         "KESTAuthNo=KA1 AuthDate=-"},
-    };
-    for (const auto& c : cases) {
-        QuoteRow row = quote("500", c.subquote).request("QR1").authorised(c.authorised).stage(4).remarks(c.before);
+    for (const auto& [subquote, authority, before, after, authorisation] : casesIn<5>("inbound/back-outs.txt")) {
+        QuoteRow row = quote("500", subquote.toInt()).request("QR1").authorised(authority).stage(4).remarks(before);
         row.set("AuthDate", "01/02/2008");
         EXPECT_TRUE(load(assessmentBackout("QR1")));
-        EXPECT_EQ(row.state(), std::string("3 locked - ") + c.after);
-        EXPECT_TRUE(row.shows(c.authorisation)) << c.before;
+        EXPECT_EQ(row.state(), "3 locked - " + after.toStdString());
+        EXPECT_TRUE(row.shows(authorisation)) << before.toStdString();
     }
 }
 

@@ -3,6 +3,7 @@
 #include "platform/files/files.h"
 #include "shell/SharedVariables.h"
 #include "shell/modDBAccess.h"
+#include "support/Cases.h"
 #include "support/Load.h"
 #include "support/Shop.h"
 
@@ -50,20 +51,6 @@ TEST_F(AuthorisedQuotes, TheHeaderIsWritten)
     EXPECT_EQ(quote("500").notes(), "(today : Authorised Quote) (01/02/2008 : Won Quote Request)");
 }
 
-TEST_F(AuthorisedQuotes, TheAssessorsSurnameComesFirst)
-{
-    const std::pair<const char*, const char*> names[] = {
-        {"Morgan Whitby", "Whitby, Morgan"},
-        {"Whitby", "Whitby"},
-        {"", ""},
-        {"Kim Featherstonehaugh-Lee", "Featherstonehau, Kim"},
-    };
-    for (const auto& [name, stored] : names) {
-        EXPECT_TRUE(load(authorisedQuote("500").set("orlaContact/name", name)));
-        EXPECT_EQ(quote("500").text("assess"), stored);
-    }
-}
-
 TEST_F(AuthorisedQuotes, TheQuoteIsFoundByNumberOrByTheNetworksNumbers)
 {
     quote("500", 2).request("QR1").line(1);
@@ -88,14 +75,6 @@ TEST_F(AuthorisedQuotes, TheQuoteIsFoundByNumberOrByTheNetworksNumbers)
     EXPECT_EQ(shown(), "[none] Error: Cannot load an Authorisation onto a blank quote!");
 }
 
-TEST_F(AuthorisedQuotes, AnUnknownRegistrationIsThatOfTheQuote)
-{
-    for (const char* unknown : {" tba ", "UNIVERSAL", "Advise", ""}) {
-        EXPECT_TRUE(load(authorisedQuote("500").rego(unknown)));
-        EXPECT_EQ(quote("500").text("REGO"), "ABC123");
-    }
-}
-
 TEST_F(AuthorisedQuotes, ARefusalSaysWhyInThisOrder)
 {
     quote("700").rego("GONE").set("INSURER_ID", nullptr);
@@ -112,32 +91,15 @@ TEST_F(AuthorisedQuotes, ARefusalSaysWhyInThisOrder)
     EXPECT_EQ(car("GONE").number("KEST"), 1);  // written before the insurer is looked at
 }
 
-TEST_F(AuthorisedQuotes, ExcessAndContributionComeOverToTheMainQuote)
+TEST_F(AuthorisedQuotes, AssessorRegistrationAndExcessComeOverToTheMainQuote)
 {
-    const struct {
-        const char *excess, *contribution;  // of the message; null is absent
-        Value heldExcess, heldContribution;
-        const char* stored;
-    } cases[] = {
-        {"400", "110", 500, 0, "excess=400 contri=100"},
-        {"400.006", "110", 400, 100, "excess=400.01 contri=100"},
-        {"$1,250.50 incl", "about 220", 0, 0, "excess=1250.5 contri=200"},  // of other text its digits and points
-        {nullptr, nullptr, 500, 90, "excess=0 contri=0"},
-        {"400", "110", nullptr, nullptr, "excess=- contri=-"},  // what the quote does not have stays out
-        {"1.2.3", "", 7, 7, "excess=0 contri=0"},
-    };
-    quote("500", 1).set("excess", 7).set("contri", 8).line(1);
-    for (const auto& c : cases) {
-        quote("500").set("excess", c.heldExcess).set("contri", c.heldContribution);
-        for (const char* reference : {"500", "500/1"}) {
-            Message message = authorisedQuote(reference);
-            c.excess ? message.set("excess", c.excess) : message.without("excess");
-            c.contribution ? message.set("customerContribution", c.contribution)
-                           : message.without("customerContribution");
-            EXPECT_TRUE(load(message));
-        }
-        EXPECT_TRUE(quote("500").shows(c.stored));
-        EXPECT_TRUE(quote("500", 1).shows("excess=7 contri=8"));
+    quote("500", 1).request("QR1").set("excess", 7).set("contri", 8).line(1);
+    for (const auto& [elements, before, after] : casesIn<3>("inbound/authorised-columns.txt")) {
+        fill(quote("500"), before);
+        EXPECT_TRUE(load(authorisedQuote("500").with(elements)));
+        EXPECT_TRUE(load(authorisedQuote("500/1").with(elements)));
+        EXPECT_TRUE(quote("500").shows(after)) << elements.toStdString();
+        EXPECT_TRUE(quote("500", 1).shows("excess=7 contri=8")) << elements.toStdString();
     }
 }
 

@@ -1,6 +1,7 @@
 // The way of a manual quote among the shop's quotes: which quote it becomes, and what replaces what was there.
 #include "shell/SharedVariables.h"
 #include "shell/modDBAccess.h"
+#include "support/Cases.h"
 #include "support/Load.h"
 #include "support/Shop.h"
 #include "support/Snapshot.h"
@@ -21,61 +22,28 @@ std::string loadedQuote()
     return row.eof() ? "none" : (row.text(u"QTNNO"_s) + u'/' + row.text(u"Subquote"_s)).toStdString();
 }
 
-Message supplementary(const Text& reference)
-{
-    return manualQuote(reference).set("quoteBody/quoteType", "AS");
-}
-
 }  // namespace
 
-TEST_F(ManualQuotes, AMainQuoteIsMatchedByNumberThenByRequestElseNew)
+TEST_F(ManualQuotes, EachIsMatchedByNumberThenByRequestElseNewAndTakesTheNextSubquoteOfItsParent)
 {
     quote("500").rego("abc123 ").request("QR5");
     quote("501").rego("XYZ789").request("QR6");
     quote("502").rego("ABC-123").request("QR7");
-    const std::pair<Message, std::string> cases[] = {
-        {manualQuote("500"), "500/0"},
-        {manualQuote("500/3").rego(" ABC123"), "500/0"},  // the subquote of a main quote says nothing
-        {manualQuote("501"), "1002/0"},  // that number belongs to another car, and the search has begun with it
-        {manualQuote("MANQ"), "1001/0"},
-        {manualQuote("7"), "1001/0"},  // too short for a number
-        {manualQuote("888"), "888/0"},
-        {manualQuote("888").request("QR5"), "500/0"},
-        {manualQuote("888").request("QR7"), "502/0"},
-        {manualQuote("888").request("QR6"), "888/0"},
-    };
+    quote("600").request("QR8");
+    quote("600", 2).request("QR8");
     car(" ABC123");
     const Snapshot before;
-    for (const auto& [message, quote] : cases) {
-        EXPECT_TRUE(load(message)) << shown();
-        EXPECT_EQ(loadedQuote(), quote);
-        EXPECT_EQ(gsMatchedQTNNO.toStdString() + "/0", quote);
+    for (const auto& [elements, quote] : casesIn<2>("inbound/manual-quotes.txt")) {
+        const bool taken = quote != u"none"_s;
+        EXPECT_EQ(load(Message::told(u"MANQ "_s + elements)), taken) << elements.toStdString();
+        EXPECT_EQ(shown(), taken ? "" : "[critical] Failed matching to existing parent KEST Quote")
+            << elements.toStdString();
+        EXPECT_EQ(loadedQuote(), quote.toStdString()) << elements.toStdString();
+        EXPECT_EQ(gsMatchedQTNNO, taken ? quote.section(u'/', 0, 0) : QString()) << elements.toStdString();
         EXPECT_EQ(Opened(u"SELECT * FROM CINFO"_s).text(u"QUOTE_VAL"_s), u"1001"_s);  // the counter stays
         before.restore();
     }
-}
-
-TEST_F(ManualQuotes, ASupplementaryQuoteTakesTheNextSubquoteOfItsParent)
-{
-    quote("500").request("QR5");
-    quote("500", 2).request("QR5");
-    const std::pair<Message, std::string> cases[] = {
-        {supplementary("500/5"), "500/5"},
-        {supplementary("500/2"), "500/3"},
-        {supplementary("500").request("QR5"), "500/3"},  // 500 is taken, so the request tells the parent
-        {supplementary("77/1").request("QR5"), "500/3"},
-        {supplementary("500"), "none"},
-        {supplementary("77/1"), "none"},
-    };
-    const Snapshot before;
-    for (const auto& [message, quote] : cases) {
-        const bool taken = quote != "none";
-        EXPECT_EQ(load(message), taken);
-        EXPECT_EQ(shown(), taken ? "" : "[critical] Failed matching to existing parent KEST Quote");
-        EXPECT_EQ(loadedQuote(), quote);
-        before.restore();
-    }
-    EXPECT_FALSE(load(supplementary("500/x")));
+    EXPECT_FALSE(load(Message::told("MANQ quoteBody/quoteType=AS quoteBody/quoteReference=500/x")));
     EXPECT_NE(shown().find("modLoadXML.LoadXML"), std::string::npos);
 }
 

@@ -4,6 +4,7 @@
 #include "outbound/SubletDocuments.h"
 #include "platform/files/files.h"
 #include "shell/SharedVariables.h"
+#include "support/Cases.h"
 #include "support/Shop.h"
 
 namespace kest::test {
@@ -46,6 +47,12 @@ std::string numbers(const Text& number = "500")
     return found.join(u' ').toStdString();
 }
 
+Fields fieldsIn(const QString& cell)
+{
+    const auto pairs = pairsIn(cell);
+    return {pairs.begin(), pairs.end()};
+}
+
 const QString pdf = u"JVBERi0x"_s;  // "%PDF-1"
 
 Message withDocument(int number, const Text& change, const Text& document = pdf)
@@ -57,29 +64,16 @@ Message withDocument(int number, const Text& change, const Text& document = pdf)
 
 TEST_F(QuoteBody, ANewLineIsFilledAsItsSectionSays)
 {
-    EXPECT_TRUE(apply(body()
-                          .labour(1, "I", {{"labourType", "RR"}, {"labourAmount", "1,045.60"}})
-                          .labour(2, "I", {{"labourType", "REPR"}, {"labourAmount", " 84 "}})
-                          .labour(3, "I", {{"labourType", "OTH"}, {"labourAmount", "12.5"}})
-                          .labour(4, "I", {{"labourType", "GLAS"}, {"labourAmount", "not read"}})
-                          .part(5, "I", {{"partDescription", "L/H guard"}, {"partQuantity", "2"}})
-                          .paint(6, "I", {{"paintDescription", std::string(40, 'd')}})
-                          .sublet(7, "I")));
-    const std::string expected[] = {
-        "category=R&R script=Front bumper bar rrhour=1045.6 rahour=0 rr_rate2=1 unitcost=0 directbill=- itemno=137",
-        "category=RA script=Front bumper bar rrhour=0 rahour=84 rr_rate2=1 unitcost=0 directbill=- itemno=138",
-        "category=MIS script=Front bumper bar rrhour=0 rahour=0 rr_rate2=0 unitcost=12.5 directbill=R itemno=990",
-        "category=- script=- rrhour=0 rahour=0 rr_rate2=0 unitcost=0 directbill=- itemno=999",
-        "category=PRT script=L/H guard PartNo=52119-7K220 MARK=  qty=2 unitcost=200 rrhour=250 SIDE=L VENDOR=0 "
-        "itemno=780 Report=False",
-        "category=PAINT script=" + std::string(39, 'd') + " pthour=150 rr_rate2=1 opg_rate=1 allow_tick=7 itemno=139",
-        "category=MIS script=Four wheel alignment Report_on=0 unitcost=0 directbill=R itemno=991",
-    };
-    for (int number = 1; number <= 7; ++number)
-        EXPECT_TRUE(line(number).shows(expected[number - 1] + " blend=0 Tag=1 delitem=False tosend=A"));
-    for (int number = 1; number <= 4; ++number)
-        EXPECT_TRUE(line(number).shows("opg_rate=0 VENDOR=0 PartNo= allow_tick=7"));
-    EXPECT_EQ(numbers(), "1 2 3 4 5 6 7");
+    const auto cases = casesIn<3>("inbound/new-lines.txt");
+    Message message = body();
+    int number = 0;
+    for (const auto& [kind, elements, columns] : cases)
+        message.line(kind, ++number, "I", fieldsIn(elements));
+    EXPECT_TRUE(apply(message));
+    number = 0;
+    for (const auto& [kind, elements, columns] : cases)
+        EXPECT_TRUE(line(++number).shows(columns + u" blend=0 Tag=1 delitem=False tosend=A"_s))
+            << elements.toStdString();
 }
 
 TEST_F(QuoteBody, TheIndicatorSaysWhatHappensToTheLine)
@@ -143,26 +137,6 @@ TEST_F(QuoteBody, AChangeKeepsWhatTheShopSet)
     EXPECT_TRUE(line(2).shows("script=L/H lamp SIDE=R qty=3 Report=True MARK=C"));
     EXPECT_TRUE(line(3).shows("script=Glass VENDOR=17 unitcost=44 Report_on=1"));
     EXPECT_EQ(rowCount("VENDOR", "NAME='Nobody knows'"), 0);
-}
-
-TEST_F(QuoteBody, SideKindAndBlendAreReadFromTheTexts)
-{
-    const std::pair<Message, const char*> cases[] = {
-        {body().part(1, "I", {{"partDescription", "l/h mirror"}, {"partType", "RECY"}}), "SIDE=L MARK=U"},
-        {body().part(1, "I", {{"partDescription", "R/H MIRROR"}, {"partType", "EXCH"}}), "SIDE=R MARK=X"},
-        {body().part(1, "I", {{"partDescription", "Mirror L/H"}, {"partType", "recy"}}), "SIDE=O MARK=-"},
-        {body().paint(1, "I", {{"paintDescription", "Door BLEND"}}), "script=Door"},
-        {body().paint(1, "I", {{"paintDescription", "Door blend "}}), "script=Door "},
-        {body().paint(1, "I", {{"paintDescription", "BLEND"}}), "script="},
-        {body().paint(1, "I", {{"paintDescription", "Blend door"}}), "script=Blend door"},
-        {body().paint(1, "I", {{"paintDescription", "A description of forty characters, blend"}}),
-         "script=A description of forty characters,"},
-    };
-    for (const auto& [message, expected] : cases) {
-        gConn->execute(u"DELETE FROM QUOTE2"_s);
-        EXPECT_TRUE(apply(message));
-        EXPECT_TRUE(line(1).shows(expected));
-    }
 }
 
 TEST_F(QuoteBody, TheRepairerOfANewSubletLineIsFoundOrAdded)
@@ -289,23 +263,11 @@ TEST_F(QuoteBody, ItemNumbersComeFromThePoolOfTheCategory)
 
 TEST_F(QuoteBody, AValueThatDoesNotConvertEndsTheBodyAtItsLine)
 {
-    const auto first = [] { return body().labour(1, "I"); };
-    Message wrong[] = {
-        first().labour(2, "I", {{"labourAmount", "$10"}}),
-        first().labour(2, "I", {{"labourAmount", ""}}),
-        first().labour(2, "I", {{"labourAmount", "1e400"}}),
-        first().labour(2, "I", {{"quoteLineNumber", "3000000000"}}),
-        first().part(2, "I", {{"partQuantity", "2x"}}),
-        first().part(2, "I", {{"partUnitPrice", "1,00.5"}}),
-        first().part(2, "I", {{"partMarkUpPercentage", "10%"}}),
-        first().paint(2, "I", {{"paintAmount", "ten"}}),
-        first().labour(2, "N").without("quoteBody/labours/labour[2]/labourAmount"),  // one that stays is read too
-    };
-    for (Message& message : wrong) {
+    for (const auto& [kind, indicator, elements] : casesIn<3>("inbound/wrong-lines.txt")) {
         gConn->execute(u"DELETE FROM QUOTE2"_s);
-        EXPECT_FALSE(apply(message.sublet(3, "I")));
+        EXPECT_FALSE(apply(body().labour(1, "I").line(kind, 2, indicator, fieldsIn(elements)).sublet(3, "I")));
         EXPECT_FALSE(shown().empty());
-        EXPECT_EQ(numbers(), "1");
+        EXPECT_EQ(numbers(), "1") << elements.toStdString();
     }
     EXPECT_FALSE(apply(body().labour(4, "D").labour(5, "I").without("quoteBody/gst")));
     EXPECT_EQ(numbers(), "1");

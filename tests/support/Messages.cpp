@@ -1,8 +1,7 @@
 #include "support/Messages.h"
 
 #include "messages/Envelope.h"
-
-#include <QFile>
+#include "support/Cases.h"
 
 #include <stdexcept>
 
@@ -14,10 +13,7 @@ namespace {
 
 QString textOfSample(const QString& name)
 {
-    QFile file(u"%1/%2.xml"_s.arg(QStringLiteral(KEST_SOURCE_DIR "/tests/data/messages"), name));
-    if (!file.open(QIODevice::ReadOnly))
-        throw std::runtime_error("no sample message " + name.toStdString());
-    return QString::fromUtf8(file.readAll());
+    return QString::fromUtf8(dataFile("messages/" + name.toStdString() + ".xml"));
 }
 
 QString pathTo(const QString& path)
@@ -82,6 +78,18 @@ Message& Message::without(const Text& path)
     return *this;
 }
 
+Message& Message::with(const Text& elements)
+{
+    for (const auto& [path, value] : pairsIn(elements))
+        value == u"-"_s ? without(path) : set(path, value);
+    return *this;
+}
+
+Message Message::told(const Text& text)
+{
+    return sample(QString(text).section(u' ', 0, 0)).with(QString(text).section(u' ', 1));
+}
+
 Message& Message::images(std::initializer_list<Text> ids)
 {
     const xml::Node list = at(u"quoteRequestImageIds"_s);
@@ -90,15 +98,14 @@ Message& Message::images(std::initializer_list<Text> ids)
     return *this;
 }
 
-Message& Message::line(const char* element, int number, const QString& change, Fields fields)
+Message& Message::line(const Text& kind, int number, const Text& change, const Fields& fields)
 {
     static const Message lines = sample("lines");
-    const QString kind = QString::fromLatin1(element);
-    const xml::Node line = add(at(u"quoteBody/%1s"_s.arg(kind)), kind);
-    if (!change.isEmpty())
+    const xml::Node line = add(at(u"quoteBody/%1s"_s.arg(QString(kind))), kind);
+    if (!QString(change).isEmpty())
         add(line, u"quoteLineChangeIndicator"_s).setText(change);
     add(line, u"quoteLineNumber"_s).setText(QString::number(number));
-    if (change != u"D"_s)
+    if (QString(change) != u"D"_s)
         for (const xml::Node& usual : lines.document.selectNodes(pathTo(kind) + u"/*"_s))
             add(line, usual.localName()).setText(usual.text());
     for (const auto& [name, value] : fields) {

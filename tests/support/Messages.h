@@ -18,6 +18,8 @@ class Message {
 public:
     /// The message in the file of that name in tests/data/messages.
     static Message sample(const Text& name);
+    /// A sample and what is otherwise in it: "AUQT excess=400 quoteBody/quoteReference=500/2".
+    static Message told(const Text& text);
     /// One with these elements alone; an empty code leaves `messageType` out.
     Message(const Text& code, const Text& root);
     Message(const Message& other) : Message(other.text()) {}
@@ -26,6 +28,8 @@ public:
     /// An element by its path below the root, such as "claimCustomer/surname"; made where it is missing.
     Message& set(const Text& path, const Text& text);
     Message& without(const Text& path);
+    /// Sets elements as "claimCustomer/surname=Tarrant excess=-"; "-" leaves one out.
+    Message& with(const Text& elements);
 
     // the element that carries this value in the message's own type
     Message& request(const Text& number) { return setFirst({"quoteRequestNumber", "kestQuoteRequestNumber"}, number); }
@@ -48,6 +52,8 @@ public:
     Message& paint(int number, const Text& change, Fields set = {}) { return line("paint", number, change, set); }
     Message& sublet(int number, const Text& change, Fields set = {}) { return line("sublet", number, change, set); }
 
+    Message& line(const Text& kind, int number, const Text& change, const Fields& fields);
+
     QString text() const { return document.xml(); }
     operator Text() const { return text(); }
 
@@ -56,7 +62,6 @@ private:
     xml::Node at(const QString& path);
     xml::Node add(xml::Node parent, const QString& name);
     Message& setFirst(std::initializer_list<Text> paths, const Text& text);
-    Message& line(const char* element, int number, const QString& change, Fields fields);
 
     xml::Document document;
 };
