@@ -62,14 +62,9 @@ TEST_F(Totals, TheFractionIsCutFromTheText)
 
 TEST_F(Totals, EachSectionSumsItsRoundedLines)
 {
-    quote("500").line(1, "R&R").set("rr_rate2", 38.5).set("rrhour", 1.25);   // 48.125
-    quote("500").line(2, "RA").set("rr_rate2", 40).set("rahour", 2);         // 80
-    quote("500").line(3, "PAINT").set("rr_rate2", 46.1).set("pthour", 1.5);  // 69.15
-    quote("500").line(4, "OPG").set("opg_rate", 10).set("pthour", 0.5);      // 5
-    part(quote("500"), 5, 3, 10.111);                                        // 30.333
-    quote("500").line(6, "MIS").set("unitcost", 10.456);
-    quote("500").line(7, "mis").set("unitcost", 99);  // no section of that spelling
-
+    int number = 0;
+    for (const auto& [category, columns] : casesIn<2>("quotedata/sections.txt"))
+        fill(quote("500").line(++number, category), columns);
     // Authorised labour is one sum, and the sections stay.
     quote("500").set("RR_TOTAL", 1).set("RA_TOTAL", 2).set("PAINT_TOTAL", 3);
     calc(CalcAuthorisedTotals);
