@@ -202,18 +202,9 @@ TEST(ConnectionText, ChoosesTheEngineThatAnswers)
     for (const QString& name : {u"Shop.db"_s, u"BRANCH.Shop.db"_s})
         QFile(profile.root() + u"/databases/"_s + name).open(QIODevice::WriteOnly);
     files::write(profile.root() + u"/databases/junk.db"_s, QString(5000, u'x'));
-    const std::pair<QString, bool> cases[] = {
-        {u"Driver={SQL Server};Server=(local)\\;Database=Shop;Uid=sa;Pwd=;"_s, true},
-        {u"Driver={SQL Native Client};Server=(LOCAL)\\BRANCH;Database=shop;Uid=sa;Pwd=a=b;"_s, true},
-        {u"Driver={SQL Server};Server="_s + QSysInfo::machineHostName() + u"\\;Database=Shop;"_s, true},
-        {u"Driver={SQL Server};Server=(local)\\OTHER;Database=Shop;"_s, false},
-        {u"Driver={SQL Server};Server=(local)\\;Database=NoShop;"_s, false},
-        {u"Driver={SQL Server};Server=(local)\\;Database=junk;"_s, false},
-        {u"Driver={SQL Server};Server=(local)\\;Database=../databases/Shop;"_s, false},
-        {u"Driver={SQL Server};Server=elsewhere\\;Database=Shop;"_s, false},
-        {u"Database=Shop;"_s, false},
-        {QString(), false}};
-    for (const auto& [text, opens] : cases) {
+    for (auto [text, outcome] : casesIn<2>("connection-texts.txt")) {
+        text.replace(u"THISHOST"_s, QSysInfo::machineHostName());
+        const bool opens = outcome == u"opens"_s;
         db::Connection connection;
         EXPECT_EQ(failure([&] { connection.open(text); }).number(), opens ? 0 : CannotOpen) << text.toStdString();
         EXPECT_EQ(connection.state(), opens ? 1 : 0) << text.toStdString();
@@ -260,23 +251,10 @@ TEST(ConnectionText, AServerThatRefusesOrDoesNotAnswerCostsSeconds)
 
 TEST(PastedStatement, FillsPlacesByWhereTheyStand)
 {
-    const std::tuple<const char*, QVariant, QString> cases[] = {
-        {"A='{}'", u"O'Brien"_s, u"A='O''Brien'"_s},
-        {"A='{}'", u"{}"_s, u"A='{}'"_s},
-        {"A='{}'", QVariant(), u"A=''"_s},
-        {"A LIKE '%{}%'", u"x"_s, u"A LIKE '%x%'"_s},
-        {"A='it''s {}'", u"'"_s, u"A='it''s '''"_s},
-        {"A={}", u" 0042 "_s, u"A=0042"_s},
-        {"A={}", u"1,234.5"_s, u"A=1234.5"_s},
-        {"A={}", 2.5, u"A=2.5"_s},
-        {"A={}", true, u"A=1"_s},
-        {"A={}", QVariant(), u"A=NULL"_s},
-        {"A={}", u"1 OR 1=1"_s, u"error 13"_s},
-        {"A={}", u""_s, u"error 13"_s},
-        {"A={}", u"'"_s, u"error 13"_s},
-    };
-    for (const auto& [statement, value, expected] : cases)
-        EXPECT_EQ(outcomeOf([&] { return sql(statement, value); }), expected);
+    for (const auto& [statement, value, expected] : casesIn<3>("statements.txt"))
+        EXPECT_EQ(outcomeOf([&] { return sql(statement.toUtf8().constData(), value); }), expected);
+    EXPECT_EQ(sql("A={} AND B={} AND C='{}'", 2.5, true, 5), u"A=2.5 AND B=1 AND C='5'"_s);
+    EXPECT_EQ(sql("A={} AND B='{}'", QVariant(), QVariant()), u"A=NULL AND B=''"_s);
     EXPECT_EQ(sql("A='{}' AND B={} AND C='{}'", u"{}'"_s, 1, u"c"_s), u"A='{}''' AND B=1 AND C='c'"_s);
 }
 

@@ -175,29 +175,23 @@ TEST_F(Utilities, AStatusButtonRewritesTickNumberAndNotes)
 
 TEST_F(Utilities, ASaveThatFailsIsReportedAndTheWindowStays)
 {
-    struct {
-        const char* meanwhile;
-        std::string date;
-        int failure;
-        std::string stored;
-    } const cases[] = {
-        {"UPDATE QUOTE1 SET KESTQuoteNo='host' WHERE QTNNO='500'", "", RowChanged, "host|before"},
-        {"UPDATE QUOTE3 SET remarks='host' WHERE QTNNO='500'", "", RowChanged, "repaired|host"},
-        {"DELETE FROM QUOTE2", "no date", TypeMismatch, "before|before"},
-    };
-    for (const auto& c : cases) {
+    const std::tuple<const char*, QString, int, std::string> cases[] = {
+        {"UPDATE QUOTE1 SET KESTQuoteNo='host' WHERE QTNNO='500'", u""_s, RowChanged, "host|before"},
+        {"UPDATE QUOTE3 SET remarks='host' WHERE QTNNO='500'", u""_s, RowChanged, "repaired|host"},
+        {"DELETE FROM QUOTE2", u"no date"_s, TypeMismatch, "before|before"}};
+    for (const auto& [meanwhile, date, failure, stored] : cases) {
         quote("500").quoteNumber("before").remarks("before");
         const QStringList failures = failuresOf([&](QDialog& window) {
-            gConn->execute(QString::fromLatin1(c.meanwhile));
+            gConn->execute(QString::fromLatin1(meanwhile));
             control<QLineEdit>(window, "txtQuoteNo").setText(u"repaired"_s);
-            control<QLineEdit>(window, "txtAuthDate").setText(QString::fromStdString(c.date));
+            control<QLineEdit>(window, "txtAuthDate").setText(date);
             control<QPushButton>(window, "Command4").click();
             control<QPushButton>(window, "Command1").click();
             EXPECT_TRUE(window.isVisible());
-            EXPECT_EQ(control<QLineEdit>(window, "txtAuthDate").hasFocus(), c.failure == TypeMismatch);
+            EXPECT_EQ(control<QLineEdit>(window, "txtAuthDate").hasFocus(), failure == TypeMismatch);
         });
-        EXPECT_EQ(failures, QStringList(u"frmUtilities.Command1_Click "_s + QString::number(c.failure))) << c.meanwhile;
-        EXPECT_EQ(quote("500").text("KESTQuoteNo") + '|' + quote("500").notes(), c.stored) << c.meanwhile;
+        EXPECT_EQ(failures, QStringList(u"frmUtilities.Command1_Click "_s + QString::number(failure))) << meanwhile;
+        EXPECT_EQ(quote("500").text("KESTQuoteNo") + '|' + quote("500").notes(), stored) << meanwhile;
     }
 }
 
