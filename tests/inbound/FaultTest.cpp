@@ -9,7 +9,6 @@
 namespace kest::test {
 
 using namespace Qt::StringLiterals;
-using DisturbedLoads = Shop;
 
 namespace {
 
@@ -23,7 +22,16 @@ const KnownDifference hasNoComparison{
     "a comparison that failed is passed over with its box, and adds no vendor for its lines",
     "first load: taken.*error.*second load: "};
 
-class DisturbedLines : public Shop {
+class DisturbedLoads : public Shop {
+protected:
+    void disturb(const Message& message, const std::vector<KnownDifference>& known = {}, const char* script = "{}")
+    {
+        arrive("m.xml", message);
+        expectAsIfNeverDisturbed(u"m.xml"_s, known, script);
+    }
+};
+
+class DisturbedLines : public DisturbedLoads {
 protected:
     DisturbedLines()
     {
@@ -45,29 +53,23 @@ TEST_F(DisturbedLoads, ARequest)
     };
     arrive("QR1_001.jpg", "picture");
     arrive("QR1_001.txt", "its text");
-    arrive("m.xml", quoteRequest("QR1").images({"1"}));
-    expectAsIfNeverDisturbed(u"m.xml"_s, known);
+    disturb(quoteRequest("QR1").images({"1"}), known);
 
     car("ABC123").set("COLOUR", "bLUE");
-    arrive("m.xml", quoteRequest("QR1").rego("ABC123"));
-    expectAsIfNeverDisturbed(u"m.xml"_s, known);
+    disturb(quoteRequest("QR1").rego("ABC123"), known);
 
     // Without a first name and a company name the new customer is not found by name, so a second one is made.
     known.push_back({"the customer stands without a car", "second load: taken"});
-    arrive("m.xml", quoteRequest("QR1").set("claimCustomer/firstName", ""));
-    expectAsIfNeverDisturbed(u"m.xml"_s, known);
+    disturb(quoteRequest("QR1").set("claimCustomer/firstName", ""), known);
 }
 
 TEST_F(DisturbedLoads, StatusMessagesChangeTheirNotesInPlace)
 {
     quote("500").request("QR1").quoteNumber("KQ1").stage(3).note("Responded Quote Request").line(1);
     for (const Message& message : {quoteMatch("500"), revisionRequest("QR1"), cancellation("QR1"),
-                                   cancellationBackout("QR1"), assessmentResult("KQ1"), assessmentBackout("QR1")}) {
-        arrive("m.xml", message);
-        expectAsIfNeverDisturbed(u"m.xml"_s, {keepsItsName, isFiledTwice});
-    }
-    arrive("m.xml", excessWaiver("500"));  // keeps its name at all times
-    expectAsIfNeverDisturbed(u"m.xml"_s);
+                                   cancellationBackout("QR1"), assessmentResult("KQ1"), assessmentBackout("QR1")})
+        disturb(message, {keepsItsName, isFiledTwice});
+    disturb(excessWaiver("500"));  // keeps its name at all times
 }
 
 TEST_F(DisturbedLoads, ADeletion)
@@ -77,31 +79,27 @@ TEST_F(DisturbedLoads, ADeletion)
         keepsItsName,
     };
     quote("500").quoteNumber("KQ1").note("Responded Quote Request");
-    arrive("m.xml", quoteDeletion("KQ1"));
-    expectAsIfNeverDisturbed(u"m.xml"_s, known);
+    disturb(quoteDeletion("KQ1"), known);
 
     quote("500", 1).quoteNumber("KQ2").line(1);
-    arrive("m.xml", quoteDeletion("KQ2"));
-    expectAsIfNeverDisturbed(u"m.xml"_s, known, R"({"boxes": [{"text": "DELETED", "answer": "yes"}]})");
+    disturb(quoteDeletion("KQ2"), known, R"({"boxes": [{"text": "DELETED", "answer": "yes"}]})");
 }
 
 TEST_F(DisturbedLoads, ABackOut)
 {
     quote("500").request("QR1").authorised("KA1").stage(4).note("Won Quote Request").note("Authorised Quote");
-    arrive("m.xml", assessmentBackout("QR1"));
-    expectAsIfNeverDisturbed(
-        u"m.xml"_s,
+    disturb(
+        assessmentBackout("QR1"),
         {{"the authorisation's number is gone, so it counts as a failed tender", "Fail Tender Backout"}, keepsItsName});
 
     quote("500", 1).request("QR1").note("Quote Rejected \"Reason : Part Price\"");
-    expectAsIfNeverDisturbed(u"m.xml"_s, {keepsItsName, isFiledTwice});
+    disturb(assessmentBackout("QR1"), {keepsItsName, isFiledTwice});
 }
 
 TEST_F(DisturbedLoads, AnAdjustment)
 {
     quote("500").request("QR1").line(1);
-    arrive("m.xml", adjustedQuote("500"));
-    expectAsIfNeverDisturbed(u"m.xml"_s, {{"the file stayed, and each load adds a note", "first load: taken"}});
+    disturb(adjustedQuote("500"), {{"the file stayed, and each load adds a note", "first load: taken"}});
 }
 
 TEST_F(DisturbedLoads, ASubmissionResponse)
@@ -118,37 +116,36 @@ TEST_F(DisturbedLoads, ASubmissionResponse)
 
 TEST_F(DisturbedLines, AnAuthorisationThatChangesAndDeletesLines)
 {
-    arrive("m.xml", authorisedQuote("500")
-                        .set("excess", "400")
-                        .set("customerContribution", "110")
-                        .labour(1, "C", {{"labourType", "REPR"}})
-                        .part(2, "C", {{"partQuantity", "2"}})
-                        .paint(3, "C")
-                        .sublet(4, "D"));
-    expectAsIfNeverDisturbed(u"m.xml"_s, {keepsItsName, isFiledTwice, hasNoComparison, hasNoTotals});
+    disturb(authorisedQuote("500")
+                .set("excess", "400")
+                .set("customerContribution", "110")
+                .labour(1, "C", {{"labourType", "REPR"}})
+                .part(2, "C", {{"partQuantity", "2"}})
+                .paint(3, "C")
+                .sublet(4, "D"),
+            {keepsItsName, isFiledTwice, hasNoComparison, hasNoTotals});
 }
 
 TEST_F(DisturbedLines, AnAuthorisationThatAddsLines)
 {
-    arrive("m.xml", authorisedQuote("500").labour(6, "I").sublet(7, "I", {{"subletAuthorityDocument", "JVBERi0x"}}));
-    expectAsIfNeverDisturbed(u"m.xml"_s, {{"the line's document lay there already", "/PDF/500.0_8.pdf: "},
-                                          {"a line that the first load added is added again", "SEQ_NO=6 .* SEQ_NO=6 "},
-                                          keepsItsName,
-                                          hasNoTotals});
+    disturb(authorisedQuote("500").labour(6, "I").sublet(7, "I", {{"subletAuthorityDocument", "JVBERi0x"}}),
+            {{"the line's document lay there already", "/PDF/500.0_8.pdf: "},
+             {"a line that the first load added is added again", "SEQ_NO=6 .* SEQ_NO=6 "},
+             keepsItsName,
+             hasNoTotals});
 }
 
 TEST_F(DisturbedLines, AManualQuoteInThePlaceOfAnother)
 {
     car("ABC123").set("COLOUR", "sILVER");
     arrive("waiting.xml", quoteRequest("QR1"));
-    arrive("m.xml", manualQuote("500").labour(1, "I").part(2, "I").paint(3, "I").sublet(4, "I"));
-    expectAsIfNeverDisturbed(u"m.xml"_s, {isFiledTwice, hasNoTotals});
+    disturb(manualQuote("500").labour(1, "I").part(2, "I").paint(3, "I").sublet(4, "I"), {isFiledTwice, hasNoTotals});
 }
 
 TEST_F(DisturbedLines, AManualQuoteThatIsNew)
 {
-    arrive("m.xml", manualQuote("MANQ").request("QR9").labour(1, "I"));
-    expectAsIfNeverDisturbed(u"m.xml"_s, {{isFiledTwice.first, "/ARead/1001.0_2.xml: "}, hasNoTotals});
+    disturb(manualQuote("MANQ").request("QR9").labour(1, "I"),
+            {{isFiledTwice.first, "/ARead/1001.0_2.xml: "}, hasNoTotals});
 }
 
 TEST_F(DisturbedLines, AManualQuoteWhoseCarWasTypedWithBlanks)
@@ -156,12 +153,11 @@ TEST_F(DisturbedLines, AManualQuoteWhoseCarWasTypedWithBlanks)
     car("ABC 123");
     car("ABC123").set("VIN", "in the way");
     quote("500").rego("ABC 123");
-    arrive("m.xml", manualQuote("500").labour(1, "I"));
-    expectAsIfNeverDisturbed(
-        u"m.xml"_s, {{"the car took its new registration, and the quote did not, so the car now stands in its own way",
-                      "second load: not taken.*CAR REGO=ABC123\\.\\. "},
-                     isFiledTwice,
-                     hasNoTotals});
+    disturb(manualQuote("500").labour(1, "I"),
+            {{"the car took its new registration, and the quote did not, so the car now stands in its own way",
+              "second load: not taken.*CAR REGO=ABC123\\.\\. "},
+             isFiledTwice,
+             hasNoTotals});
 }
 
 }  // namespace kest::test
