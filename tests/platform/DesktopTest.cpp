@@ -53,15 +53,12 @@ TEST(Seam, TheScriptAnswersByTheFirstEntryThatFitsAndElseByTheDefault)
 
 TEST(Seam, AProgramIsStartedUnderItsHostName)
 {
-    TestProfile profile;
-    ScriptedDesktop desk;
+    const TestProfile profile;
+    const ScriptedDesktop desk;
     const QString trace = profile.root() + u"/started"_s;
+    files::write(u"c:\\KESTWeb.exe"_s,
+                 u"#!/bin/sh\nprintf %s \"$KEST2_PROFILE\" > '%1.new' && mv '%1.new' '%1'\n"_s.arg(trace));
     QFile program(profile.driveC() + u"/KESTWeb.exe"_s);
-    ASSERT_TRUE(program.open(QIODevice::WriteOnly));
-    const QByteArray name = '\'' + trace.toUtf8() + '\'';
-    program.write("#!/bin/sh\nprintf %s \"$KEST2_PROFILE\" > " + name + ".new && mv " + name + ".new " + name + '\n');
-    program.close();
-
     EXPECT_THROW(desktop::startProgram(u"c:\\KESTWeb.exe"_s), RuntimeError) << "not marked as a program";
     program.setPermissions(program.permissions() | QFile::ExeOwner);
     desktop::startProgram(u"C:\\kestweb.EXE"_s);
