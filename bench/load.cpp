@@ -6,6 +6,7 @@
 #include "platform/profile.h"
 #include "quotedata/NoteChain.h"
 #include "shell/SharedVariables.h"
+#include "shell/modDBAccess.h"
 
 #include <QCoreApplication>
 #include <QElapsedTimer>
@@ -32,7 +33,7 @@ public:
             files::makeFolder(path);
             *variable = path;
         }
-        gConn = app::openEmbedded(u"WirSql"_s);
+        gcnDB = gConn = app::openEmbedded(u"WirSql"_s);
         app::createTables(*gConn, app::Dialect::Embedded);
         app::fillNewShop(*gConn);
     }
@@ -40,6 +41,7 @@ public:
     ~BenchShop()
     {
         gConn.reset();
+        gcnDB.reset();
         profile::setRoot({});
     }
 

@@ -9,6 +9,7 @@
 #include "platform/report/Pages.h"
 #include "reports/BuildAuthReport.h"
 #include "shell/SharedVariables.h"
+#include "shell/modDBAccess.h"
 
 #include <QAbstractTextDocumentLayout>
 #include <QApplication>
@@ -32,7 +33,7 @@ public:
     {
         profile::setRoot(folder.path());
         files::makeFolder(folder.path() + u"/databases"_s);
-        gConn = app::openEmbedded(u"WirSql"_s);
+        gcnDB = gConn = app::openEmbedded(u"WirSql"_s);
         app::createTables(*gConn, app::Dialect::Embedded);
         app::fillNewShop(*gConn);
         gConn->execute(
@@ -68,6 +69,7 @@ public:
     ~ChangedQuote()
     {
         gConn.reset();
+        gcnDB.reset();
         profile::setRoot({});
     }
     Q_DISABLE_COPY_MOVE(ChangedQuote)

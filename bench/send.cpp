@@ -8,6 +8,7 @@
 #include "platform/xml/xml.h"
 #include "quotedata/QuoteTotals.h"
 #include "shell/SharedVariables.h"
+#include "shell/modDBAccess.h"
 
 #include <QCoreApplication>
 #include <QElapsedTimer>
@@ -55,7 +56,7 @@ public:
             files::makeFolder(path);
             *variable = path;
         }
-        gConn = app::openEmbedded(u"WirSql"_s);
+        gcnDB = gConn = app::openEmbedded(u"WirSql"_s);
         app::createTables(*gConn, app::Dialect::Embedded);
         app::fillNewShop(*gConn);
         run(u"INSERT INTO ALLMODEL (MODEL_ID, MAKE, MODEL) VALUES ('C120', 'CORELLA', 'MERIDIAN GL')"_s);
@@ -79,6 +80,7 @@ public:
     ~BenchShop()
     {
         gConn.reset();
+        gcnDB.reset();
         profile::setRoot({});
     }
 
