@@ -1,8 +1,8 @@
 // Files under the host's names: where they lie, what a failure leaves behind, which names are taken.
 #include "platform/files/files.h"
 #include "platform/values.h"
-#include "support/Failure.h"
 #include "support/Cases.h"
+#include "support/Failure.h"
 #include "support/TestProfile.h"
 
 #include <QDir>

@@ -1,8 +1,8 @@
 // A script's steps work a window as a person does, and a step that a person could not take ends the run.
 #include "platform/RuntimeError.h"
 #include "platform/desktop/Form.h"
-#include "support/ScriptedDesktop.h"
 #include "support/Cases.h"
+#include "support/ScriptedDesktop.h"
 #include "support/TestProfile.h"
 
 #include <QCheckBox>

@@ -1,7 +1,7 @@
 // Numbers, flags, dates and texts: what is read, what is refused, what is written.
 #include "platform/values.h"
-#include "support/Failure.h"
 #include "support/Cases.h"
+#include "support/Failure.h"
 #include "support/TestProfile.h"
 
 #include <cmath>

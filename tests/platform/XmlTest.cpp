@@ -1,7 +1,7 @@
 // Documents: what is refused and by which code, what a node answers, how a document is written.
 #include "platform/xml/xml.h"
-#include "support/Failure.h"
 #include "support/Cases.h"
+#include "support/Failure.h"
 #include "support/TestProfile.h"
 
 #include <QElapsedTimer>
