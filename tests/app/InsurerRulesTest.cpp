@@ -25,8 +25,8 @@ QString faultsOf(const QString& rules)
 
 TEST(InsurerRules, AFaultIsToldWithItsLine)
 {
-    for (const auto& [rules, faults] : casesIn<2>("transport/rule-faults.txt"))
-        EXPECT_EQ(faultsOf(QString(rules).replace(u"\\n"_s, u"\n"_s)).replace(u'\n', u"\\n"_s), faults);
+    for (const QStringList& row : rowsIn("transport/rule-faults.txt"))
+        EXPECT_EQ(faultsOf(row[0]), row[1]);
     EXPECT_TRUE(
         faultsOf(u"on quote 1\n authorize"_s).startsWith(u"line 2: \"authorize\" is no step; a step is request"_s));
     EXPECT_EQ(faultsOf(files::read(QStringLiteral(KEST_SOURCE_DIR "/sql/demo/insurer.rules"))), QString());

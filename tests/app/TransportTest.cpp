@@ -1,13 +1,13 @@
 #include "app/transport/Transport.h"
 #include "app/transport/TransportCommand.h"
 #include "inbound/modLoadXML.h"
-#include "messages/Folders.h"
 #include "messages/Summary.h"
 #include "outbound/SendQuote.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
 #include "shell/SharedVariables.h"
 #include "support/Cases.h"
+#include "support/Load.h"
 #include "support/Shop.h"
 
 #include <QFile>
@@ -74,9 +74,7 @@ protected:
     {
         const QStringList files = listed();
         EXPECT_EQ(files.size(), 1) << files.join(u' ').toStdString();
-        QString text = files::read(gsUnreadPath + files.value(0));
-        EXPECT_TRUE(LoadXML(text, files.value(0)));
-        MoveMessage(files.value(0), u"read"_s);
+        EXPECT_TRUE(loadAsTheWindow(files.value(0)));
         return files.value(0).section(u'_', 2, 2).toStdString();
     }
     static std::string in(const QString& folder) { return files::list(folder).join(u' ').toStdString(); }

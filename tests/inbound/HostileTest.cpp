@@ -71,7 +71,7 @@ class Hostile : public Shop, public ::testing::WithParamInterface<Message> {};
 TEST_P(Hostile, AMessageChangesItsOwnQuoteOrNothing)
 {
     const char* const bystander = "BYSTANDER";
-    car(bystander).customer(bystander);
+    car(bystander).set("CUST_ID", customer(bystander).id());
     quote(bystander).rego(bystander).request(bystander).quoteNumber(bystander).line(1);
     quote("BYSTANDER2").rego(bystander).request("", "").quoteNumber("").line(1);
     files::write(gsUnsentPath + u"BYSTANDER.xml"_s, u"BYSTANDER"_s);

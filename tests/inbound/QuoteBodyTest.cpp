@@ -28,7 +28,7 @@ protected:
         return LoadQuoteBody(header, lines, document);
     }
 
-    static LineRow line(int number) { return quote("500").line(number); }
+    static Row line(int number) { return quote("500").line(number); }
     static QStringList documents() { return filesIn(SubletFolder()); }
 };
 
@@ -45,12 +45,6 @@ std::string numbers(const Text& number = "500")
     for (; !rows.eof(); rows.moveNext())
         found += rows.text(u"SEQ_NO"_s);
     return found.join(u' ').toStdString();
-}
-
-Fields fieldsIn(const QString& cell)
-{
-    const auto pairs = pairsIn(cell);
-    return {pairs.begin(), pairs.end()};
 }
 
 const QString pdf = u"JVBERi0x"_s;  // "%PDF-1"
@@ -78,27 +72,15 @@ TEST_F(QuoteBody, ANewLineIsFilledAsItsSectionSays)
 
 TEST_F(QuoteBody, TheIndicatorSaysWhatHappensToTheLine)
 {
-    const struct {
-        const char* indicator;
-        int line;
-        const char *numbers, *firstScript;
-    } cases[] = {
-        {"", 1, "1 2 1", "old"}, {"I", 1, "1 2 1", "old"}, {"C", 1, "1 2", "new"}, {"C", 3, "1 2", "old"},
-        {"N", 1, "1 2", "old"},  {"N", 3, "1 2", "old"},   {"D", 2, "1", "old"},   {"D", 3, "1 2", "old"},
-    };
-    for (const auto& c : cases) {
-        for (const Message& message : {body().labour(c.line, c.indicator, {{"labourDescription", "new"}}),
-                                       body().part(c.line, c.indicator, {{"partDescription", "new"}}),
-                                       body().paint(c.line, c.indicator, {{"paintDescription", "new"}}),
-                                       body().sublet(c.line, c.indicator, {{"subletDescription", "new"}})}) {
+    for (const auto& [indicator, number, left, first] : casesIn<4>("inbound/indicators.txt"))
+        for (const QString& kind : {u"labour"_s, u"part"_s, u"paint"_s, u"sublet"_s}) {
             gConn->execute(u"DELETE FROM QUOTE2"_s);
             quote("500").line(1, "R&R", "old");
             quote("500").line(2, "PRT");
-            EXPECT_TRUE(apply(message));
-            EXPECT_EQ(numbers() + ' ' + line(1).text("script"), std::string(c.numbers) + ' ' + c.firstScript)
-                << c.indicator << c.line;
+            EXPECT_TRUE(apply(body().line(kind, number.toInt(), indicator, {{kind + u"Description"_s, "new"}})));
+            EXPECT_EQ(numbers() + ' ' + line(1).text("script"), (left + u' ' + first).toStdString())
+                << indicator.toStdString() << number.toStdString();
         }
-    }
 }
 
 TEST_F(QuoteBody, ALineWithoutIndicatorDoesAsTheOneBeforeItInItsSection)
@@ -235,18 +217,11 @@ TEST_F(QuoteBody, LinesWithoutNumberGoOnFromTheLastOne)
 
 TEST_F(QuoteBody, ItemNumbersComeFromThePoolOfTheCategory)
 {
-    const struct {
-        const char* category;
-        int count;
-        const char *first, *last;
-    } pools[] = {
-        {"R&R", 45, "137", "459"}, {"RA", 45, "137", "459"}, {"PAINT", 45, "137", "459"}, {"OPG ", 9, "153", "464"},
-        {"PRT", 21, "780", "800"}, {"MIS", 7, "990", "998"}, {"NONE", 0, "999", "999"},
-    };
-    for (const auto& pool : pools) {
+    for (const auto& [category, size, first, last] : casesIn<4>("inbound/item-numbers.txt")) {
+        const int count = size.toInt();
         gConn->execute(u"DELETE FROM QUOTE2"_s);
-        for (int number = 1; number <= pool.count + 2; ++number)
-            quote("500").line(number, pool.category);
+        for (int number = 1; number <= count + 2; ++number)
+            quote("500").line(number, category);
         QStringList given;
         for (db::Recordset lines = Opened(u"SELECT * FROM QUOTE2"_s); !lines.eof(); lines.moveNext()) {
             const QString number = lines.text(u"SEQ_NO"_s);
@@ -254,10 +229,9 @@ TEST_F(QuoteBody, ItemNumbersComeFromThePoolOfTheCategory)
             EXPECT_EQ(lines.text(u"SEQ_NO"_s), number);  // still on its line
             lines.set(u"itemno"_s, given.last());
         }
-        EXPECT_EQ(given.first(), QString::fromLatin1(pool.first));
-        EXPECT_EQ(given[qMax(0, pool.count - 1)], QString::fromLatin1(pool.last));
-        EXPECT_EQ(given.mid(pool.count), QStringList(2, u"999"_s)) << pool.category;
-        EXPECT_EQ(given.removeDuplicates(), 1) << pool.category;
+        EXPECT_EQ(given.first() + given[qMax(0, count - 1)], first + last) << category.toStdString();
+        EXPECT_EQ(given.mid(count), QStringList(2, u"999"_s)) << category.toStdString();
+        EXPECT_EQ(given.removeDuplicates(), 1) << category.toStdString();
     }
 }
 

@@ -120,7 +120,7 @@ TEST_F(Requests, AKnownCarKeepsEverythingButItsColoursSpelling)
     EXPECT_EQ(rowCount("CUSTOMER"), 1);
 
     // requests without a known registration share one car, and with it its customer
-    car("UNIVERSAL").customer("Nobody");
+    car("UNIVERSAL").set("CUST_ID", customer("Nobody").id());
     EXPECT_TRUE(load(quoteRequest("QR8").rego(" advise")));
     EXPECT_EQ(Row("QUOTE1", "KESTQRNo='QR8'").text("REGO"), "UNIVERSAL");
     // a car whose customer has gone gets a new one

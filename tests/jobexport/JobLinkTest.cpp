@@ -63,9 +63,9 @@ protected:
         return texts.join(u'|').toStdString();
     }
     static void exportQuote() { WriteQuote(u"500"_s, u"0"_s); }
-    static RowOf<LineRow> insurer()
+    static Row insurer()
     {
-        return RowOf<LineRow>("INSURER", "INSURER_ID=" + quote("500").text("INSURER_ID"));
+        return Row("INSURER", "INSURER_ID=" + quote("500").text("INSURER_ID"));
     }
     int statusOfTheJob() const
     {

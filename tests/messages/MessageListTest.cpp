@@ -248,13 +248,10 @@ TEST_F(Searched, OrderWidthsAndPlaceOutliveARefreshAndOrderAndWidthsTheWindow)
 
 TEST_F(Searched, FilesAreDroppedOrPastedWhileTheUnreadMessagesAreShown)
 {
-    /// A file on a stick, as a mouse or the clipboard brings it.
+    /// A file as a mouse or the clipboard brings it.
     const auto stick = [this](const QString& name, const QString& content) {
-        const QString path = root() + u"/stick/"_s + name;
-        files::makeFolder(root() + u"/stick"_s);
-        files::write(path, content);
         auto data = std::make_unique<QMimeData>();
-        data->setUrls({QUrl::fromLocalFile(path)});
+        data->setUrls({bring(name, content)});
         return data;
     };
     const auto drop = [](QDialog& window, const QMimeData& data) {

@@ -31,11 +31,6 @@ protected:
         return line.substr(std::min(line.size(), QString(name).toStdString().size() + 2));
     }
 
-    static void lie(const QString& folder, const QString& name, const Text& content)
-    {
-        files::write(folder + name, content);
-    }
-
     std::string listedFiles(int folder = Unread)
     {
         QStringList names;
@@ -49,10 +44,7 @@ TEST_F(MessageList, AMessageShowsWhatItSaysAndTheCustomerOfItsCar)
 {
     car("ABC123");
     for (const auto& [message, expected] : casesIn<2>("messages/rows.txt")) {
-        Message told = Message::sample(message.section(u' ', 0, 0));
-        for (const auto& [path, text] : pairsIn(message))
-            text == u"-"_s ? told.without(path) : told.set(path, text);
-        EXPECT_EQ(row(told), expected.toStdString()) << message.toStdString();
+        EXPECT_EQ(row(Message::told(message)), expected.toStdString()) << message.toStdString();
     }
     EXPECT_EQ(row(Message("QREQ", "getQuoteRequestResponse")), "Quote Request|-||-|-|-");
     EXPECT_EQ(row(Message("qreq", "getQuoteRequestResponse")), "ERROR|||||");
@@ -116,7 +108,7 @@ TEST_F(MessageList, AMarkerShowsItsQuote)
 TEST_F(MessageList, ASentQuoteShowsItsDocument)
 {
     const auto sent = [&](const Text& document) {
-        lie(gsSentPath, u"a.xml"_s, document);
+        files::write(gsSentPath + u"a.xml"_s, document);
         return filled(Sent);
     };
     const Text document = sentDocument("500/2");
@@ -159,8 +151,8 @@ TEST_F(MessageList, WhatCannotBeReadIsReportedAndTheRestIsListed)
     QFile huge(files::systemPath(gsUnreadPath) + u"/huge.xml"_s);
     ASSERT_TRUE(huge.open(QIODevice::WriteOnly) && huge.resize(xml::Document::maximumBytes + 1));
     arrive("last.xml", quoteRequest("QR1"));
-    lie(gsUnreadPath, u"Schrägstück \u20ac.xml"_s, quoteRequest("QR2"));
-    lie(gsUnreadPath, u"\u043f\u0438\u0441\u044c\u043c\u043e.xml"_s, quoteRequest("QR3"));
+    files::write(gsUnreadPath + u"Schrägstück \u20ac.xml"_s, quoteRequest("QR2").text());
+    files::write(gsUnreadPath + u"\u043f\u0438\u0441\u044c\u043c\u043e.xml"_s, quoteRequest("QR3").text());
 
     EXPECT_EQ(listedFiles(), "last.xml Schrägstück \u20ac.xml \u043f\u0438\u0441\u044c\u043c\u043e.xml");
     QStringList expected;
@@ -184,7 +176,7 @@ TEST_F(MessageList, ARequestWaitsUnreadForAllItsPictures)
     EXPECT_EQ(listedFiles(), "") << "a name that leaves the folder is no picture";
     EXPECT_EQ(shown(), "");
 
-    lie(gsReadPath, u"in.xml"_s, quoteRequest("QR1").images({"7"}));
+    files::write(gsReadPath + u"in.xml"_s, quoteRequest("QR1").images({"7"}).text());
     EXPECT_EQ(listedFiles(Read), "in.xml");
 }
 

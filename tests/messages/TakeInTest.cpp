@@ -10,16 +10,7 @@ namespace {
 
 using namespace Qt::StringLiterals;
 
-class TakingIn : public Shop {
-protected:
-    /// The path of a file on the stick.
-    QUrl bring(const QString& name, const QString& content)
-    {
-        files::makeFolder(root() + u"/stick"_s);
-        files::write(root() + u"/stick/"_s + name, content);
-        return QUrl::fromLocalFile(root() + u"/stick/"_s + name);
-    }
-};
+using TakingIn = Shop;
 
 TEST_F(TakingIn, OnlyMessagesAndWhatBelongsToRequestsAreTaken)
 {

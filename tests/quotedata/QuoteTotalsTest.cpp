@@ -33,7 +33,7 @@ std::string totals()
     return all;
 }
 
-LineRow part(QuoteRow quote, int sequence, const Value& quantity, const Value& price)
+Row part(QuoteRow quote, int sequence, const Value& quantity, const Value& price)
 {
     return quote.line(sequence, "PRT").set("qty", quantity).set("rrhour", price);
 }
@@ -77,14 +77,14 @@ TEST_F(Totals, EachSectionSumsItsRoundedLines)
 TEST_F(Totals, OnlyLinesThatStandForWorkCount)
 {
     for (const char* change : {"delitem=1", "delitem=NULL", "Report_on=1", "rrhour=NULL", "rrhour=NULL, qty=NULL"}) {
-        LineRow line = part(quote("500"), 1, 2, 50);
+        Row line = part(quote("500"), 1, 2, 50);
         gConn->execute(u"UPDATE QUOTE2 SET "_s + QLatin1StringView(change));
         quote("500").set("PRTTOTAL", 7);
         calc(CalcQuoteTotals);
         EXPECT_EQ(quote("500").number("PRTTOTAL"), 0) << change;
         gConn->execute(u"DELETE FROM QUOTE2"_s);
     }
-    LineRow replaced = part(quote("500"), 1, 2, 50);
+    Row replaced = part(quote("500"), 1, 2, 50);
     quote("500").line(9, "PRT").set("DELETEDITEM", qint64(replaced.number("itemid"))).set("delitem", true);
     calc(CalcQuoteTotals);
     EXPECT_EQ(totals(), "0 0 0 0 0 0");
@@ -109,7 +109,7 @@ TEST_F(Totals, ANullThatMattersLeavesTheQuoteAsItWas)
 
 TEST_F(Totals, RoundingStoresMoneyAndHoursAndTotalsThem)
 {
-    LineRow line = quote("500").line(1, "MIS");
+    Row line = quote("500").line(1, "MIS");
     fill(line, "unitcost=10.456 rahour=1.005 pthour=- rrhour=-2.345 qty=1.234 rr_rate2=3.333 opg_rate=4.444");
     Opened opened;
     RoundQuoteLines(opened.header);

@@ -5,8 +5,6 @@
 #include "support/Cases.h"
 #include "support/Shop.h"
 
-#include <map>
-
 namespace kest::test {
 
 using namespace Qt::StringLiterals;
@@ -56,15 +54,7 @@ protected:
     /// Adds a line as a cell has it: element, indicator and elements.
     static void add(Message& message, int line, const QString& cell)
     {
-        static const std::map<QString, Message& (Message::*)(int, const Text&, Fields)> elements{
-            {u"labour"_s, &Message::labour},
-            {u"part"_s, &Message::part},
-            {u"paint"_s, &Message::paint},
-            {u"sublet"_s, &Message::sublet}};
-        Fields fields;
-        for (const auto& [name, value] : pairsIn(cell))
-            fields.emplace_back(name, value);
-        (message.*elements.at(cell.section(u' ', 0, 0)))(line, cell.section(u' ', 1, 1), fields);
+        message.line(cell.section(u' ', 0, 0), line, cell.section(u' ', 1, 1), fieldsIn(cell));
     }
 };
 
@@ -173,7 +163,7 @@ TEST_F(Comparison, ASubletRepairerIsAVendorAndBecomesOneByAMerePrint)
         EXPECT_EQ(column(authorised(message, true), "vendor"),
                   std::to_string(known) + ", " + std::to_string(known + 1));
     EXPECT_EQ(rowCount("VENDOR"), 2);
-    const VendorRow made = vendor("O'Hara & Sons");
+    const Row made = vendor("O'Hara & Sons");
     EXPECT_EQ(made.text("Account") + made.text("STREET") + made.text("PHONE"), "2938 Foundry Lane03 5550 1010");
     EXPECT_FALSE(made.isNull("vendor_abn"));
     adjusted(adjustedQuote("500").sublet(4, "I", {{"subletRepairer", "Another"}}));

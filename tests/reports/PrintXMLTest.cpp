@@ -62,10 +62,7 @@ TEST_F(Printing, ValuesOfARequestAreMadeFromWhatTheMessageHolds)
 {
     quote("500").request("QR1");
     for (const auto& [elements, fields, expected] : casesIn<3>("reports/request-values.txt")) {
-        Message message = quoteRequest("QR1");
-        for (const auto& [path, value] : pairsIn(elements))
-            message.set(path, value);
-        print(message);
+        print(quoteRequest("QR1").with(elements));
         EXPECT_EQ(cells(onlyWindow(), 0, fields), expected.toStdString()) << elements.toStdString();
     }
 }

@@ -10,12 +10,10 @@
 #include <QFile>
 #include <QFileInfo>
 #include <QStandardPaths>
+#include <QTcpServer>
 #include <QThread>
 
-#include <arpa/inet.h>
-#include <netinet/in.h>
 #include <sys/prctl.h>
-#include <sys/socket.h>
 #include <unistd.h>
 
 #include <csignal>
@@ -44,30 +42,11 @@ QString thisUser()
     return geteuid() == 0 ? u"root"_s : qEnvironmentVariable("USER", QString::number(geteuid()));
 }
 
-int freePort()
-{
-    const int listener = socket(AF_INET, SOCK_STREAM, 0);
-    sockaddr_in address{};
-    address.sin_family = AF_INET;
-    address.sin_addr.s_addr = htonl(INADDR_LOOPBACK);
-    socklen_t length = sizeof address;
-    const bool bound = bind(listener, reinterpret_cast<sockaddr*>(&address), length) == 0 &&
-                       getsockname(listener, reinterpret_cast<sockaddr*>(&address), &length) == 0;
-    close(listener);
-    if (!bound)
-        throw std::runtime_error("no free port on the loopback interface");
-    return ntohs(address.sin_port);
-}
-
 QString textFor(const QString& driver, int port, const QString& database, const QString& user, const QString& password)
 {
     return u"Driver={%1};Server=127.0.0.1;Port=%2;Database=%3;Uid=%4;Pwd=%5;"_s.arg(driver, QString::number(port),
                                                                                     database, user, password);
 }
-
-}  // namespace
-
-namespace {
 
 /// In memory where there is such a place: the server waits for the disk at each change of a table, whatever its
 /// options.
@@ -105,16 +84,18 @@ void MariaDbServer::prepareData()
 
 void MariaDbServer::start()
 {
-    tcpPort = freePort();
+    QTcpServer free;
+    if (!free.listen(QHostAddress::LocalHost))
+        throw std::runtime_error("no free port on the loopback interface");
+    tcpPort = free.serverPort();
+    free.close();
     server.setProcessChannelMode(QProcess::MergedChannels);
     server.setChildProcessModifier([] { prctl(PR_SET_PDEATHSIG, SIGKILL); });
-    server.start(program(u"mariadbd"_s),
-                 {u"--no-defaults"_s, u"--user="_s + thisUser(), u"--datadir="_s + folder.filePath(u"data"_s),
-                  u"--bind-address=127.0.0.1"_s, u"--port="_s + QString::number(tcpPort),
-                  u"--socket="_s + folder.filePath(u"s.sock"_s), u"--pid-file="_s + folder.filePath(u"pid"_s),
-                  u"--skip-name-resolve"_s, u"--innodb-buffer-pool-size=16M"_s, u"--innodb-flush-log-at-trx-commit=0"_s,
-                  u"--innodb-flush-method=nosync"_s, u"--innodb-doublewrite=0"_s, u"--innodb-log-file-size=8M"_s,
-                  u"--innodb-use-native-aio=0"_s, u"--performance-schema=OFF"_s});
+    server.start(
+        program(u"mariadbd"_s),
+        {QStringLiteral("--defaults-file=" KEST_SOURCE_DIR "/tests/data/mariadb.cnf"), u"--user="_s + thisUser(),
+         u"--datadir="_s + folder.filePath(u"data"_s), u"--port="_s + QString::number(tcpPort),
+         u"--socket="_s + folder.filePath(u"s.sock"_s), u"--pid-file="_s + folder.filePath(u"pid"_s)});
     const QDeadlineTimer deadline(startMilliseconds);
     db::Connection connection;
     while (!attempt([&] { connection.open(textFor(u"MySQL"_s, tcpPort, u"mysql"_s, u"root"_s, {})); })) {

@@ -23,6 +23,12 @@ QString pathTo(const QString& path)
 
 }  // namespace
 
+Fields fieldsIn(const QString& cell)
+{
+    const auto pairs = pairsIn(cell);
+    return {pairs.begin(), pairs.end()};
+}
+
 Message::Message(const QString& text)
 {
     SetupDocument(document);

@@ -14,6 +14,9 @@ namespace kest::test {
 
 using Fields = std::vector<std::pair<Text, Text>>;
 
+/// The elements of a line as `pairsIn` reads them.
+Fields fieldsIn(const QString& cell);
+
 class Message {
 public:
     /// The message in the file of that name in tests/data/messages.

@@ -3,9 +3,8 @@
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
-#include "shell/SharedVariables.h"
+#include "shell/modDBAccess.h"
 #include "support/Cases.h"
-#include "support/Shop.h"
 
 namespace kest::test {
 
@@ -18,16 +17,14 @@ QString withoutDate(QString text)
     return text.replace(shortDate(QDate::currentDate()), u"today"_s);
 }
 
-db::Recordset opened(const QString& select)
-{
-    db::Recordset rows(gConn);
-    rows.open(select);
-    return rows;
-}
-
 db::Recordset rowsOf(const QString& table, const QString& condition)
 {
-    return opened(u"SELECT * FROM %1 WHERE %2"_s.arg(table, condition));
+    return Opened(u"SELECT * FROM %1 WHERE %2"_s.arg(table, condition));
+}
+
+QString keyOf(const QString& number, int subquote)
+{
+    return sql("QTNNO='{}' AND Subquote={}", number, subquote);
 }
 
 }  // namespace
@@ -65,11 +62,18 @@ double Row::number(const Text& column) const
            << others.join(u' ').toStdString();
 }
 
-void Row::write(const Text& column, const Value& value)
+Row& Row::set(const Text& column, const Value& value)
 {
     db::Recordset row = rowsOf(table_, condition_);
     row.set(column, value);
     row.update();
+    return *this;
+}
+
+int Row::id() const
+{
+    const db::Recordset row = rowsOf(table_, condition_);
+    return row.value(row.columns().first()).toInt();
 }
 
 int rowCount(const Text& table, const Text& condition)
@@ -77,19 +81,27 @@ int rowCount(const Text& table, const Text& condition)
     return rowsOf(table, condition).recordCount();
 }
 
-CarRow& CarRow::customer(const Text& name)
+void addRow(const Text& table, std::initializer_list<std::pair<const char*, Value>> values)
 {
-    return set("CUST_ID", test::customer(name).id());
+    db::Recordset rows = rowsOf(table, u"1=0"_s);
+    rows.addNew();
+    for (const auto& [column, value] : values)
+        rows.set(QString::fromLatin1(column), value);
+    rows.update();
 }
 
-QuoteRow::QuoteRow(const Text& number, int subquote, const Text& condition)
-    : RowOf("QUOTE1", condition), quoteNumber_(number), subquote_(subquote)
+QuoteRow::QuoteRow(const Text& number, int subquote, const Text& order)
+    : Row("QUOTE1", keyOf(number, subquote) + u" ORDER BY "_s + order),
+      quoteNumber_(number),
+      subquote_(subquote),
+      key_(keyOf(number, subquote))
 {
 }
 
-QString QuoteRow::key() const
+QuoteRow& QuoteRow::set(const Text& column, const Value& value)
 {
-    return sql("QTNNO='{}' AND Subquote={}", quoteNumber_, subquote_);
+    Row::set(column, value);
+    return *this;
 }
 
 QuoteRow& QuoteRow::request(const Text& number, const Text& version)
@@ -106,16 +118,13 @@ QuoteRow& QuoteRow::note(const Text& words, const Text& day)
 
 QuoteRow& QuoteRow::remarks(const Text& text, const Text& column)
 {
-    db::Recordset row = rowsOf(u"QUOTE3"_s, key());
-    row.set(column, QString(text));
-    row.update();
+    texts().set(column, QString(text));
     return *this;
 }
 
 bool QuoteRow::locked() const
 {
-    const QVariant readOnly = value("ReadOnly");
-    return !readOnly.isNull() && toBool(readOnly);
+    return isTrue(value("ReadOnly"));
 }
 
 std::string QuoteRow::notes() const
@@ -132,29 +141,25 @@ std::string QuoteRow::state() const
 
 Row QuoteRow::texts() const
 {
-    return Row("QUOTE3", key());
+    return Row("QUOTE3", key_);
 }
 
-LineRow QuoteRow::line(int sequence, const Text& category, const Text& script)
+Row QuoteRow::line(int sequence, const Text& category, const Text& script)
 {
-    const QString condition = key() + sql(" AND SEQ_NO={}", sequence);
-    if (rowCount("QUOTE2", condition) == 0) {
-        db::Recordset lines = rowsOf(u"QUOTE2"_s, key());
-        lines.addNew();
-        lines.set(u"QTNNO"_s, quoteNumber_);
-        lines.set(u"Subquote"_s, subquote_);
-        lines.set(u"SEQ_NO"_s, sequence);
-        lines.set(u"category"_s, QString(category));
-        lines.set(u"script"_s, QString(script));
-        lines.set(u"PartNo"_s, QString());
-        lines.update();
-    }
-    return LineRow("QUOTE2", condition);
+    const Row line("QUOTE2", key_ + sql(" AND SEQ_NO={}", sequence));
+    if (!line.exists())
+        addRow("QUOTE2", {{"QTNNO", quoteNumber_},
+                          {"Subquote", subquote_},
+                          {"SEQ_NO", sequence},
+                          {"category", QString(category)},
+                          {"script", QString(script)},
+                          {"PartNo", ""}});
+    return line;
 }
 
 int QuoteRow::lines() const
 {
-    return rowCount("QUOTE2", key());
+    return rowCount("QUOTE2", key_);
 }
 
 }  // namespace kest::test

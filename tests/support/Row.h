@@ -5,7 +5,9 @@
 
 #include <gtest/gtest.h>
 
+#include <initializer_list>
 #include <string>
+#include <utility>
 
 namespace kest::test {
 
@@ -20,13 +22,12 @@ public:
     std::string text(const Text& column) const;
     double number(const Text& column) const;
     bool isNull(const Text& column) const { return value(column).isNull(); }
+    /// What stands in the first column.
+    int id() const;
     /// Whether the columns are as in "category=MIS script=Front bumper bar VENDOR=-", Null being "-" and today
     /// "today".
     ::testing::AssertionResult shows(const Text& columns) const;
-
-protected:
-    void write(const Text& column, const Value& value);
-    const QString& condition() const { return condition_; }
+    Row& set(const Text& column, const Value& value);
 
 private:
     QString table_;
@@ -36,46 +37,15 @@ private:
 /// Rows of `table` that meet the condition.
 int rowCount(const Text& table, const Text& condition = "1=1");
 
-/// A row whose setters can be chained.
-template <class Self>
-class RowOf : public Row {
-public:
-    using Row::Row;
-    Self& set(const Text& column, const Value& value)
-    {
-        write(column, value);
-        return static_cast<Self&>(*this);
-    }
-};
-
-class LineRow : public RowOf<LineRow> {
-public:
-    using RowOf::RowOf;
-};
-
-class CarRow : public RowOf<CarRow> {
-public:
-    using RowOf::RowOf;
-    CarRow& customer(const Text& name);
-};
-
-class CustomerRow : public RowOf<CustomerRow> {
-public:
-    using RowOf::RowOf;
-    int id() const { return int(number("CUST_ID")); }
-};
-
-class VendorRow : public RowOf<VendorRow> {
-public:
-    using RowOf::RowOf;
-    int id() const { return int(number("VENDOR_ID")); }
-};
+void addRow(const Text& table, std::initializer_list<std::pair<const char*, Value>> values);
 
 /// A quote: its header, and through it the note chain and the lines.
-class QuoteRow : public RowOf<QuoteRow> {
+class QuoteRow : public Row {
 public:
-    QuoteRow(const Text& number, int subquote, const Text& condition);
+    /// `order` says which one counts where there are several.
+    QuoteRow(const Text& number, int subquote, const Text& order);
 
+    QuoteRow& set(const Text& column, const Value& value);
     QuoteRow& request(const Text& number, const Text& version = "1");
     QuoteRow& quoteNumber(const Text& number) { return set("KESTQuoteNo", Value(QString(number))); }
     QuoteRow& authorised(const Text& number) { return set("KESTAuthNo", Value(QString(number))); }
@@ -97,13 +67,13 @@ public:
     Row texts() const;
 
     /// The line of that number; made with `category` where the quote has none.
-    LineRow line(int sequence, const Text& category = "R&R", const Text& script = "Front bumper bar");
+    Row line(int sequence, const Text& category = "R&R", const Text& script = "Front bumper bar");
     int lines() const;
 
 private:
     QString quoteNumber_;
     int subquote_;
-    QString key() const;
+    QString key_;
 };
 
 }  // namespace kest::test

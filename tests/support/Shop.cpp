@@ -1,6 +1,5 @@
 #include "support/Shop.h"
 
-#include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
 #include "shell/SharedVariables.h"
@@ -22,33 +21,18 @@ void forgetSharedVariables()
     gbFilterAsked = gbTabletLocal = false;
 }
 
-void add(const QString& table, std::initializer_list<std::pair<QString, Value>> values)
-{
-    db::Recordset rows(gConn);
-    rows.open(u"SELECT * FROM %1 WHERE 1=0"_s.arg(table));
-    rows.addNew();
-    for (const auto& [column, value] : values)
-        rows.set(column, value);
-    rows.update();
-}
-
-QString conditionOf(const QString& number, int subquote)
-{
-    return sql("QTNNO='{}' AND Subquote={}", number, subquote);
-}
-
 void addQuote(const QString& number, int subquote)
 {
     car("ABC123");
-    add(u"QUOTE1"_s, {{u"QTNNO"_s, number},
-                      {u"Subquote"_s, subquote},
-                      {u"REGO"_s, "ABC123"},
-                      {u"INSURER_ID"_s, 1},
-                      {u"Claim"_s, "7700001"},
-                      {u"QUOTER"_s, "Pat Ferrier"},
-                      {u"excess"_s, 0},
-                      {u"contri"_s, 0},
-                      {u"Job_stage"_s, 1}});
+    addRow("QUOTE1", {{"QTNNO", number},
+                      {"Subquote", subquote},
+                      {"REGO", "ABC123"},
+                      {"INSURER_ID", 1},
+                      {"Claim", "7700001"},
+                      {"QUOTER", "Pat Ferrier"},
+                      {"excess", 0},
+                      {"contri", 0},
+                      {"Job_stage", 1}});
 }
 
 }  // namespace
@@ -57,56 +41,56 @@ QuoteRow quote(const Text& number, int subquote)
 {
     if (!quoteExists(number, subquote)) {
         addQuote(number, subquote);
-        add(u"QUOTE3"_s, {{u"QTNNO"_s, QString(number)}, {u"Subquote"_s, subquote}});
+        addRow("QUOTE3", {{"QTNNO", QString(number)}, {"Subquote", subquote}});
     }
-    return QuoteRow(number, subquote, conditionOf(number, subquote) + u" ORDER BY rec_id"_s);
+    return QuoteRow(number, subquote, "rec_id");
 }
 
 QuoteRow anotherQuote(const Text& number, int subquote)
 {
     addQuote(number, subquote);
-    return QuoteRow(number, subquote, conditionOf(number, subquote) + u" ORDER BY rec_id DESC"_s);
+    return QuoteRow(number, subquote, "rec_id DESC");
 }
 
 bool quoteExists(const Text& number, int subquote)
 {
-    return rowCount("QUOTE1", conditionOf(number, subquote)) > 0;
+    return QuoteRow(number, subquote, "rec_id").exists();
 }
 
-CarRow car(const Text& rego)
+Row car(const Text& rego)
 {
-    const QString condition = sql("REGO='{}'", QString(rego));
-    if (rowCount("CAR", condition) == 0)
-        add(u"CAR"_s, {{u"REGO"_s, QString(rego)},
-                       {u"KEST"_s, 0},
-                       {u"CUST_ID"_s, customer("Holloway").id()},
-                       {u"MODEL_ID"_s, "C120"},
-                       {u"BODY_ID"_s, "4"},
-                       {u"BODY_ID2"_s, "4S"},
-                       {u"COLOUR"_s, "Silver"},
-                       {u"Year"_s, "03/2005"},
-                       {u"PAINT_GP"_s, "M1"}});
-    return CarRow("CAR", condition);
+    const Row row("CAR", sql("REGO='{}'", QString(rego)));
+    if (!row.exists())
+        addRow("CAR", {{"REGO", QString(rego)},
+                       {"KEST", 0},
+                       {"CUST_ID", customer("Holloway").id()},
+                       {"MODEL_ID", "C120"},
+                       {"BODY_ID", "4"},
+                       {"BODY_ID2", "4S"},
+                       {"COLOUR", "Silver"},
+                       {"Year", "03/2005"},
+                       {"PAINT_GP", "M1"}});
+    return row;
 }
 
-CustomerRow customer(const Text& name)
+Row customer(const Text& name)
 {
-    const QString condition = sql("NAME='{}'", QString(name));
-    if (rowCount("CUSTOMER", condition) == 0)
-        add(u"CUSTOMER"_s, {{u"NAME"_s, QString(name)},
-                            {u"FIRSTNAME"_s, "Kim"},
-                            {u"SALUTATION"_s, "Ms"},
-                            {u"street"_s, "14 Banksia Street"},
-                            {u"suburb"_s, "Wattlebridge 3999"}});
-    return CustomerRow("CUSTOMER", condition);
+    const Row row("CUSTOMER", sql("NAME='{}'", QString(name)));
+    if (!row.exists())
+        addRow("CUSTOMER", {{"NAME", QString(name)},
+                            {"FIRSTNAME", "Kim"},
+                            {"SALUTATION", "Ms"},
+                            {"street", "14 Banksia Street"},
+                            {"suburb", "Wattlebridge 3999"}});
+    return row;
 }
 
-VendorRow vendor(const Text& name)
+Row vendor(const Text& name)
 {
-    const QString condition = sql("NAME='{}'", QString(name));
-    if (rowCount("VENDOR", condition) == 0)
-        add(u"VENDOR"_s, {{u"NAME"_s, QString(name)}, {u"Account"_s, 293}});
-    return VendorRow("VENDOR", condition);
+    const Row row("VENDOR", sql("NAME='{}'", QString(name)));
+    if (!row.exists())
+        addRow("VENDOR", {{"NAME", QString(name)}, {"Account", 293}});
+    return row;
 }
 
 Shop::Shop() : desktop(std::in_place), root_(profile_.root())
@@ -130,6 +114,14 @@ Shop::~Shop()
 void Shop::arrive(const Text& name, const Text& content)
 {
     files::write(gsUnreadPath + name, content);
+}
+
+QUrl Shop::bring(const QString& name, const QString& content)
+{
+    const QString stick = root() + u"/stick/"_s;
+    files::makeFolder(stick);
+    files::write(stick + name, content);
+    return QUrl::fromLocalFile(stick + name);
 }
 
 std::string Shop::shown()

@@ -8,6 +8,7 @@
 #include "support/TestProfile.h"
 
 #include <QStringList>
+#include <QUrl>
 
 #include <gtest/gtest.h>
 
@@ -23,9 +24,9 @@ QuoteRow quote(const Text& number, int subquote = 0);
 QuoteRow anotherQuote(const Text& number, int subquote = 0);
 bool quoteExists(const Text& number, int subquote = 0);
 /// Silver, of a known model, of the customer "Holloway".
-CarRow car(const Text& rego);
-CustomerRow customer(const Text& name);
-VendorRow vendor(const Text& name);
+Row car(const Text& rego);
+Row customer(const Text& name);
+Row vendor(const Text& name);
 
 class Shop : public ::testing::Test {
 protected:
@@ -36,6 +37,8 @@ protected:
 
     /// Puts a file into the unread folder, as the transport does.
     void arrive(const Text& name, const Text& content);
+    /// Puts a file onto a stick that a person brings.
+    QUrl bring(const QString& name, const QString& content);
     /// Names of the files of a folder such as `gsReadPath`.
     static QStringList filesIn(const QString& folder);
     /// The boxes shown since the last call, each as "[critical] text" or "[critical] title: text", joined by line

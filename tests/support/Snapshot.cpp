@@ -66,14 +66,9 @@ std::string difference(const std::string& expected, const std::string& found)
     const QStringList before = QString::fromStdString(expected).split(u'\n');
     const QStringList after = QString::fromStdString(found).split(u'\n');
     QStringList lines;
-    for (const QString& line : before) {
-        if (!after.contains(line))
-            lines += u"- "_s + line;
-    }
-    for (const QString& line : after) {
-        if (!before.contains(line))
-            lines += u"+ "_s + line;
-    }
+    for (const QString& line : before + after)
+        if (before.contains(line) != after.contains(line))
+            lines += (before.contains(line) ? u"- "_s : u"+ "_s) + line;
     return '\n' + lines.join(u'\n').toStdString();
 }
 
@@ -83,16 +78,10 @@ void Snapshot::restore() const
 {
     database_.restore();
     const QMap<QString, QByteArray> now = filesOnDisk();
-    for (auto file = now.begin(); file != now.end(); ++file) {
-        if (!files_.contains(file.key()))
-            QFile::remove(file.key());
-    }
-    for (auto file = files_.begin(); file != files_.end(); ++file) {
-        if (now.value(file.key()) == file.value() && now.contains(file.key()))
-            continue;
-        QFile::remove(file.key());
+    for (const QString& file : now.keys())
+        QFile::remove(file);
+    for (auto file = files_.begin(); file != files_.end(); ++file)
         files::writeBytes(file.key(), file.value());
-    }
     gsMatchedQTNNO.clear();
     gsDeletedQTNNO.clear();
     gsDeletedSubquote.clear();
