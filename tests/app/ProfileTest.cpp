@@ -2,17 +2,15 @@
 #include "app/QuoteDatabase.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Recordset.h"
-#include "platform/files/files.h"
 #include "platform/settings/registry.h"
 #include "shell/ModRegistry.h"
-#include "support/TestProfile.h"
+#include "support/MariaDbServer.h"
+#include "support/Shop.h"
 
-#include <QFile>
 #include <QFileInfo>
 #include <QJsonObject>
 #include <QSqlDatabase>
 #include <QSqlQuery>
-#include <QTemporaryDir>
 
 #include <gtest/gtest.h>
 
@@ -25,7 +23,7 @@ namespace {
 const QDate today(2008, 3, 21);
 
 /// The first column of each row, joined by blanks.
-std::string listed(const QString& select)
+std::string column(const QString& select)
 {
     QStringList texts;
     db::Recordset rows(app::openEmbedded(u"WirSql"_s));
@@ -34,9 +32,18 @@ std::string listed(const QString& select)
     return texts.join(u' ').toStdString();
 }
 
-class Profile : public ::testing::Test {
-protected:
+struct Profile : ::testing::Test {
     TestProfile profile;
+};
+
+struct DemoShop : Profile {
+    DemoShop()
+    {
+        app::initProfile(true, today);
+        host.emplace();
+    }
+    ScriptedDesktop desktop{R"({"boxes":[{"text":"DELETED","answer":"yes"}]})"};
+    std::optional<eKEST> host;
 };
 
 }  // namespace
@@ -52,11 +59,11 @@ TEST_F(Profile, IsMadeWhole)
     EXPECT_EQ(where[u"unread"_s].toString(), profile.driveC() + u"/wirdoc/AUnread"_s);
 
     // what a first quote request needs
-    EXPECT_EQ(listed(u"SELECT NAME FROM INSURER WHERE KEST=1"_s), "KEST Universal Insurer");
-    EXPECT_EQ(listed(u"SELECT MODEL_ID1 FROM MODEL WHERE MODEL_ID1='Z000'"_s), "Z000");
-    EXPECT_NE(listed(u"SELECT QUOTE_VAL FROM CINFO"_s), "");
-    EXPECT_EQ(listed(u"SELECT ReportID FROM ReportDefinition ORDER BY ReportID"_s), "710 720 730");
-    EXPECT_EQ(listed(u"SELECT QTNNO FROM QUOTE1"_s), "");
+    EXPECT_EQ(column(u"SELECT NAME FROM INSURER WHERE KEST=1"_s), "KEST Universal Insurer");
+    EXPECT_EQ(column(u"SELECT MODEL_ID1 FROM MODEL WHERE MODEL_ID1='Z000'"_s), "Z000");
+    EXPECT_NE(column(u"SELECT QUOTE_VAL FROM CINFO"_s), "");
+    EXPECT_EQ(column(u"SELECT ReportID FROM ReportDefinition ORDER BY ReportID"_s), "710 720 730");
+    EXPECT_EQ(column(u"SELECT QTNNO FROM QUOTE1"_s), "");
 }
 
 TEST_F(Profile, IsNotTouchedOnceItExists)
@@ -68,7 +75,7 @@ TEST_F(Profile, IsNotTouchedOnceItExists)
     EXPECT_FALSE(app::initProfile(true, today));
     EXPECT_EQ(files::readBytes(profile.root() + u"/registry.ini"_s), registry);
     EXPECT_EQ(files::list(app::where()[u"unread"_s].toString()), QStringList());
-    EXPECT_EQ(listed(u"SELECT QTNNO FROM QUOTE1"_s), "");
+    EXPECT_EQ(column(u"SELECT QTNNO FROM QUOTE1"_s), "");
     EXPECT_EQ(app::where()[u"images"_s].toString(), profile.root() + u"/drive_d/pictures"_s);
 }
 
@@ -79,7 +86,7 @@ TEST_F(Profile, IsCompletedAfterAnInterruptedStart)
     // and a host's first start, which copies the settings up that it reads
     GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"EcomHome"_s, u"d:\\mail\\"_s);
     EXPECT_TRUE(app::initProfile(false));
-    EXPECT_NE(listed(u"SELECT QUOTE_VAL FROM CINFO"_s), "");
+    EXPECT_NE(column(u"SELECT QUOTE_VAL FROM CINFO"_s), "");
     EXPECT_FALSE(QFileInfo::exists(app::embeddedFile(u"unfinished"_s)));
     EXPECT_EQ(app::where()[u"unread"_s].toString(), profile.root() + u"/drive_d/mail/AUnread"_s);
     EXPECT_TRUE(QFileInfo::exists(app::where()[u"unread"_s].toString()));
@@ -93,10 +100,7 @@ TEST_F(Profile, IsToldWhereTheComponentLooks)
     EXPECT_EQ(app::where()[u"database"_s].toString(), app::embeddedFile(u"WirSql"_s));
 
     const QTemporaryDir odbc;
-    QFile drivers(odbc.filePath(u"odbcinst.ini"_s));
-    ASSERT_TRUE(drivers.open(QIODevice::WriteOnly) && drivers.write("[SQL Server]\n") > 0);
-    drivers.close();
-    qputenv("ODBCSYSINI", QFile::encodeName(odbc.path()));
+    MariaDbServer::registerOdbcDriver(odbc, u"SQL Server"_s);
     EXPECT_EQ(app::where()[u"database"_s].toString(), u"(local)/WirSql"_s);
     qunsetenv("ODBCSYSINI");
     EXPECT_FALSE(settings::keyExists(settings::Hive::LocalMachine, u"SOFTWARE"_s)) << "nothing is copied up";
@@ -118,7 +122,7 @@ TEST_F(Profile, FindsWhatAnotherToolWroteOnceInitHasRebuiltTheIndexes)
     const auto found = [] {
         int count = 0;
         for (int number = 10; number < 50; ++number)
-            count += listed(u"SELECT REGO FROM CAR WHERE REGO='\u00e9%1'"_s.arg(number)).empty() ? 0 : 1;
+            count += column(u"SELECT REGO FROM CAR WHERE REGO='\u00e9%1'"_s.arg(number)).empty() ? 0 : 1;
         return count;
     };
     ASSERT_LT(found(), 40);
@@ -132,18 +136,32 @@ TEST_F(Profile, ItsTablesTakeWhatAHostWrites)
     ASSERT_TRUE(app::initProfile(false));
     db::ConnectionPtr database = app::openEmbedded(u"WirSql"_s);
     database->execute(u"INSERT INTO QUOTE2 (QTNNO) VALUES ('9')"_s);
-    EXPECT_EQ(listed(u"SELECT rrhour+rahour+pthour+rr_rate2+opg_rate+qty+unitcost+VENDOR+blend+delitem+DELETEDITEM+"
+    EXPECT_EQ(column(u"SELECT rrhour+rahour+pthour+rr_rate2+opg_rate+qty+unitcost+VENDOR+blend+delitem+DELETEDITEM+"
                      "Report+Report_on FROM QUOTE2"_s),
               "0");
-    EXPECT_EQ(listed(u"SELECT COUNT(*) FROM QUOTE2 WHERE SEQ_NO IS NULL AND allow_tick IS NULL AND itemno IS NULL "
+    EXPECT_EQ(column(u"SELECT COUNT(*) FROM QUOTE2 WHERE SEQ_NO IS NULL AND allow_tick IS NULL AND itemno IS NULL "
                      "AND PartNo IS NULL AND MARK IS NULL"_s),
               "1");
 
     for (int twice = 0; twice < 2; ++twice)
         database->execute(u"INSERT INTO QUOTE1 (QTNNO, Subquote) VALUES ('9', 0)"_s);
-    EXPECT_EQ(listed(u"SELECT rec_id FROM QUOTE1 WHERE QTNNO='9'"_s), "1 2");
+    EXPECT_EQ(column(u"SELECT rec_id FROM QUOTE1 WHERE QTNNO='9'"_s), "1 2");
     database->execute(u"INSERT INTO CAR (REGO) VALUES ('ABC123')"_s);
     EXPECT_THROW(database->execute(u"INSERT INTO CAR (REGO) VALUES ('abc123 ')"_s), RuntimeError);
+}
+
+TEST_F(DemoShop, HoldsTogetherAndItsMessagesAreListedAndLoad)
+{
+    for (const QString& rows : linesOf("app/demo-faults.txt"))
+        EXPECT_EQ(rowCount(rows.section(u' ', 0, 0), rows.section(u' ', 2)), 0) << rows.toStdString();
+    EXPECT_EQ(rowCount("QUOTE1"), 30);
+    const QStringList names = listed();
+    EXPECT_EQ(names.size(), 15) << names.join(u' ').toStdString();
+    EXPECT_EQ(desktop.boxTexts(),
+              QStringList(u"Message QREQ_20554_1.xml unreadable, Please contact MarlinDesk Support."_s));
+    for (const QString& file : names)
+        EXPECT_EQ(loadAsTheWindow(file), file != u"MDMSG_1009.xml"_s) << file.toStdString();
+    EXPECT_EQ(listed(), QStringList(u"QREQ_20551_2.xml"_s)) << "it waited behind the first of its request";
 }
 
 TEST(Schema, HasTheSameColumnsOnAllEngines)

@@ -1,13 +1,7 @@
 #include "app/transport/Transport.h"
 #include "app/transport/TransportCommand.h"
-#include "inbound/modLoadXML.h"
-#include "messages/Summary.h"
 #include "outbound/SendQuote.h"
-#include "platform/files/files.h"
 #include "platform/profile.h"
-#include "shell/SharedVariables.h"
-#include "support/Cases.h"
-#include "support/Load.h"
 #include "support/Shop.h"
 
 #include <QFile>
@@ -60,14 +54,6 @@ protected:
         if (OpenHostQuote(u"1004"_s, u"0"_s))
             SendQuote(*grsQuote, &sent);
         return sent;
-    }
-    /// The list fill, which applies the answers; the files that it lists.
-    static QStringList listed()
-    {
-        QStringList files;
-        for (const ListedMessage& message : BuildMessageList(Unread, {LoadSubmissionResponse, {}, {}}))
-            files << message.file;
-        return files;
     }
     /// Loads the one message that is listed, and gives its type.
     static std::string loadOne()

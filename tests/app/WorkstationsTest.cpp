@@ -3,8 +3,6 @@
 #include "outbound/SendQuote.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/FaultInjection.h"
-#include "platform/files/files.h"
-#include "shell/SharedVariables.h"
 #include "shell/modDBAccess.h"
 #include "support/Failure.h"
 #include "support/MariaDbServer.h"
@@ -30,10 +28,10 @@ protected:
         QDir().mkpath(second_);
         for (const QString& shared : {u"/drive_c"_s, u"/databases"_s})
             EXPECT_TRUE(QFile::link(root() + shared, second_ + shared));
-        QFile settings(root() + u"/registry.ini"_s);
-        EXPECT_TRUE(settings.exists() ? settings.copy(second_ + u"/registry.ini"_s)
-                                      : settings.open(QIODevice::WriteOnly) &&
-                                            QFile(second_ + u"/registry.ini"_s).open(QIODevice::WriteOnly));
+        const QString settings = u"/registry.ini"_s;
+        if (!files::exists(root() + settings))
+            files::writeBytes(root() + settings, {});
+        files::writeBytes(second_ + settings, files::readBytes(root() + settings));
     }
     ~Workstations() override { db::setStatementFault({}); }
 

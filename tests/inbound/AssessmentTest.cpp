@@ -1,7 +1,5 @@
 #include "inbound/modLoadXML.h"
 #include "platform/RuntimeError.h"
-#include "support/Cases.h"
-#include "support/Load.h"
 #include "support/Shop.h"
 
 namespace kest::test {

@@ -1,10 +1,6 @@
 // The way of an authorised quote into the shop's quote: which quote it finds, what it refuses, what it writes.
 #include "inbound/modLoadXML.h"
-#include "platform/files/files.h"
-#include "shell/SharedVariables.h"
 #include "shell/modDBAccess.h"
-#include "support/Cases.h"
-#include "support/Load.h"
 #include "support/Shop.h"
 
 #include <QFile>

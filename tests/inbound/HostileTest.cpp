@@ -1,8 +1,5 @@
 // Messages from outside with each element missing, doubled or holding what nobody expects.
 #include "messages/Envelope.h"
-#include "platform/files/files.h"
-#include "shell/SharedVariables.h"
-#include "support/Load.h"
 #include "support/Shop.h"
 #include "support/Snapshot.h"
 
@@ -19,16 +16,8 @@ const QString leaves = u"//*[not(*)]"_s;
 /// The message, and every one that differs from it in a single element.
 QStringList variantsOf(QString text)
 {
-    const QString wrong[] = {
-        u""_s,
-        u"x'; DELETE FROM CAR; --"_s,
-        u"O'Hara\" <b> %_[a-z]"_s,
-        u"../../AUnsent/out"_s,
-        u"-1e400"_s,
-        u"99999999999"_s,
-        u"31/02/2008"_s,
-        QString(1'000'000, u'7'),
-    };
+    QStringList wrong = linesOf("inbound/hostile-values.txt");
+    wrong << QString() << QString(1'000'000, u'7');
     QStringList variants{text};
     const auto changed = [&](qsizetype leaf, auto change) {
         xml::Document message = ParsedMessage(text);

@@ -1,8 +1,5 @@
 #include "inbound/modLoadXML.h"
-#include "platform/files/files.h"
-#include "shell/SharedVariables.h"
 #include "shell/modLoggerEx.h"
-#include "support/Load.h"
 #include "support/Shop.h"
 
 #include <QFile>

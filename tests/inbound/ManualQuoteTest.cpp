@@ -1,8 +1,5 @@
 // The way of a manual quote among the shop's quotes: which quote it becomes, and what replaces what was there.
-#include "shell/SharedVariables.h"
 #include "shell/modDBAccess.h"
-#include "support/Cases.h"
-#include "support/Load.h"
 #include "support/Shop.h"
 #include "support/Snapshot.h"
 

@@ -2,9 +2,6 @@
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
 #include "outbound/SubletDocuments.h"
-#include "platform/files/files.h"
-#include "shell/SharedVariables.h"
-#include "support/Cases.h"
 #include "support/Shop.h"
 
 namespace kest::test {
@@ -259,17 +256,6 @@ TEST_F(QuoteBody, WhatIsOddButANumberIsTaken)
     EXPECT_EQ(numbers(), "6 6 70000 2147483647");
     EXPECT_TRUE(line(70000).shows("qty=-2 unitcost=-1000 rrhour=-1250"));
     EXPECT_EQ(line(6).text("script"), "the first of them");
-}
-
-TEST_F(QuoteBody, TenThousandLines)
-{
-    Message message = body();
-    for (int line = 1; line <= 10'000; ++line)
-        message.labour(line, "I");
-    gConn->execute(u"BEGIN"_s);  // 20,000 commits that nobody needs on the disk
-    EXPECT_TRUE(apply(message));
-    EXPECT_EQ(quote("500").lines(), 10'000);
-    EXPECT_EQ(quote("500").line(10'000).text("itemno"), "999");
 }
 
 }  // namespace kest::test

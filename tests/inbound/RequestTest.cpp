@@ -1,11 +1,5 @@
 #include "inbound/modLoadXML.h"
-#include "platform/files/files.h"
-#include "shell/SharedVariables.h"
-#include "support/Cases.h"
-#include "support/Load.h"
 #include "support/Shop.h"
-
-#include <vector>
 
 namespace kest::test {
 
@@ -17,11 +11,11 @@ class Requests : public Shop {
 protected:
     static void run(const Text& statement) { gConn->execute(statement); }
     static Row cinfo() { return Row("CINFO", "1=1"); }
-    static void insurers(std::vector<const char*> names)
+    static void insurers(const QString& names)
     {
         run("DELETE FROM INSURER");
-        for (const char* name : names)
-            run(std::string("INSERT INTO INSURER (NAME, KEST, M1_RATE) VALUES ('") + name + "', 1, 46)");
+        for (const QString& name : names.split(u", "_s, Qt::SkipEmptyParts))
+            addRow("INSURER", {{"NAME", name}, {"KEST", 1}, {"M1_RATE", 46}});
     }
 };
 
@@ -68,25 +62,23 @@ TEST_F(Requests, ATextThatAStatementCouldTripOverIsATextLikeAnyOther)
 
 TEST_F(Requests, TheUniversalInsurerIsPreferredAmongMany)
 {
-    const std::pair<std::vector<const char*>, const char*> cases[] = {
-        {{"A", "B"}, "A"},
-        {{"A", "KEST Universal Insurer"}, "A"},
-        {{"KEST Universal Insurer", "B"}, "B"},
-        {{"A", "B", "KEST Universal Insurer", "C"}, "KEST Universal Insurer"},
-    };
+    const QString universal = u"KEST Universal Insurer"_s;
     int request = 0;
-    for (const auto& [names, chosen] : cases) {
+    for (const auto& [names, chosen] : {std::pair(u"A, B"_s, u"A"_s),
+                                        {u"A, "_s + universal, u"A"_s},
+                                        {universal + u", B"_s, u"B"_s},
+                                        {u"A, B, %1, C"_s.arg(universal), universal}}) {
         insurers(names);
         const Row made("QUOTE1", "KESTQRNo='QR" + std::to_string(++request) + "'");
         EXPECT_TRUE(load(quoteRequest("QR" + std::to_string(request))));
-        EXPECT_EQ(made.text("INSURER_ID"), Row("INSURER", std::string("NAME='") + chosen + "'").text("INSURER_ID"));
+        EXPECT_EQ(made.text("INSURER_ID"), Row("INSURER", u"NAME='%1'"_s.arg(chosen)).text("INSURER_ID"));
         EXPECT_EQ(made.text("excess_gst"), "2") << "an insurer without a rule for the tax on the excess";
     }
 
     insurers({});
     EXPECT_FALSE(load(quoteRequest("QR98")));
     EXPECT_EQ(shown(), "[critical] Error locating a valid insurer, Please contact MarlinDesk Support.");
-    insurers({"A", "B", "C"});
+    insurers(u"A, B, C"_s);
     EXPECT_FALSE(load(quoteRequest("QR99")));
     EXPECT_NE(shown().find("Error Number: 3021"), std::string::npos);
 }

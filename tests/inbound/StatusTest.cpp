@@ -1,6 +1,3 @@
-#include "shell/SharedVariables.h"
-#include "support/Cases.h"
-#include "support/Load.h"
 #include "support/Shop.h"
 
 namespace kest::test {

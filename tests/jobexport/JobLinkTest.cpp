@@ -4,10 +4,7 @@
 #include "platform/database/FaultInjection.h"
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
-#include "platform/files/files.h"
 #include "shell/CredentialCipher.h"
-#include "shell/SharedVariables.h"
-#include "support/Cases.h"
 #include "support/MariaDbServer.h"
 #include "support/Shop.h"
 
@@ -63,10 +60,7 @@ protected:
         return texts.join(u'|').toStdString();
     }
     static void exportQuote() { WriteQuote(u"500"_s, u"0"_s); }
-    static Row insurer()
-    {
-        return Row("INSURER", "INSURER_ID=" + quote("500").text("INSURER_ID"));
-    }
+    static Row insurer() { return Row("INSURER", "INSURER_ID=" + quote("500").text("INSURER_ID")); }
     int statusOfTheJob() const
     {
         auto found = rows("SELECT Status FROM newJob ORDER BY nJobID_PK DESC");

@@ -1,7 +1,4 @@
 #include "messages/Folders.h"
-#include "platform/files/files.h"
-#include "shell/SharedVariables.h"
-#include "support/Cases.h"
 #include "support/Shop.h"
 
 using namespace Qt::StringLiterals;

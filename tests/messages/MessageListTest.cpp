@@ -1,8 +1,5 @@
 #include "messages/frmMessageList.h"
 #include "platform/desktop/Gestures.h"
-#include "platform/files/files.h"
-#include "shell/SharedVariables.h"
-#include "support/Cases.h"
 #include "support/Hands.h"
 #include "support/Shop.h"
 

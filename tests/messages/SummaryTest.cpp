@@ -1,7 +1,3 @@
-#include "messages/Summary.h"
-#include "platform/files/files.h"
-#include "shell/SharedVariables.h"
-#include "support/Cases.h"
 #include "support/Shop.h"
 
 #include <QFile>
@@ -31,13 +27,7 @@ protected:
         return line.substr(std::min(line.size(), QString(name).toStdString().size() + 2));
     }
 
-    std::string listedFiles(int folder = Unread)
-    {
-        QStringList names;
-        for (const QString& line : QString::fromStdString(filled(folder)).split(u'\n', Qt::SkipEmptyParts))
-            names << line.section(u':', 0, 0);
-        return names.join(u' ').toStdString();
-    }
+    static std::string listedFiles(int folder = Unread) { return listed(folder).join(u' ').toStdString(); }
 };
 
 TEST_F(MessageList, AMessageShowsWhatItSaysAndTheCustomerOfItsCar)
@@ -60,26 +50,16 @@ TEST_F(MessageList, OtherMessagesShowTheirQuote)
 {
     const std::string found = "|ABC123|7700001|Ms Kim Holloway|500|CORELLA MERIDIAN GL";
     const std::string newest = "|ABC123|88|Ms Kim Holloway|500/1|CORELLA MERIDIAN GL";
-    const struct {
-        Message message;
-        std::string type;
-        bool takesTheNewest = false;
-    } cases[] = {{quoteDeletion("KQ1"), "Quote Deletion"},
-                 {revisionRequest("QR1"), "Request for Revised Quote", true},
-                 {cancellation("QR1"), "Quote Request Cancellation"},
-                 {adjustedQuote("500"), "Adjusted Quote"},
-                 {authorisedQuote("500"), "Authorised Quote"},
-                 {assessmentResult("KQ1"), "Assessment Result"},
-                 {assessmentBackout("QR1"), "Backout Assessment", true},
-                 {cancellationBackout("QR1"), "Backout Quote Request Cancellation"}};
-    for (const auto& one : cases)
-        EXPECT_EQ(row(one.message), one.type + "|-|-|-|-|-");
+    const auto expectRows = [&](const std::string& ofOldest, const std::string& ofNewest) {
+        for (const auto& [message, type, meant] : casesIn<3>("messages/quote-rows.txt"))
+            EXPECT_EQ(row(Message::told(message)), type.toStdString() + (meant == u"newest"_s ? ofNewest : ofOldest));
+    };
+    const std::string none = "|-|-|-|-|-";
+    expectRows(none, none);
     quote("500").request("QR1").quoteNumber("KQ1");
-    for (const auto& one : cases)
-        EXPECT_EQ(row(one.message), one.type + found);
+    expectRows(found, found);
     quote("500", 1).request("QR1").quoteNumber("KQ1").claim("88");
-    for (const auto& one : cases)
-        EXPECT_EQ(row(one.message), one.type + (one.takesTheNewest ? newest : "|-|-|-|-|-"));
+    expectRows(none, newest);
 }
 
 TEST_F(MessageList, AQuoteRowShowsWhatCanBeFound)

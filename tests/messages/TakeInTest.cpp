@@ -1,8 +1,5 @@
 // Files that a person brings: which are taken, in which order, and what becomes of one whose name is taken.
 #include "messages/TakeIn.h"
-#include "platform/files/files.h"
-#include "shell/SharedVariables.h"
-#include "support/Cases.h"
 #include "support/Shop.h"
 
 namespace kest::test {

@@ -3,11 +3,8 @@
 
 #include "outbound/SendQuote.h"
 #include "platform/database/Sql.h"
-#include "platform/files/files.h"
 #include "platform/xml/xml.h"
-#include "shell/SharedVariables.h"
 #include "shell/modDBAccess.h"
-#include "support/Cases.h"
 #include "support/Shop.h"
 
 namespace kest::test {

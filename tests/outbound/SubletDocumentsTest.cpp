@@ -2,8 +2,6 @@
 #include "outbound/SubletDocuments.h"
 #include "outbound/frmSubletAuth.h"
 #include "outbound/frmViewPDF.h"
-#include "platform/files/files.h"
-#include "shell/SharedVariables.h"
 #include "support/Hands.h"
 #include "support/Shop.h"
 

@@ -1,9 +1,7 @@
 #include "platform/RuntimeError.h"
 #include "quotedata/QuoteTotals.h"
 #include "quotedata/Rounding.h"
-#include "shell/SharedVariables.h"
 #include "shell/modDBAccess.h"
-#include "support/Cases.h"
 #include "support/Shop.h"
 
 namespace kest::test {

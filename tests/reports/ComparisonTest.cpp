@@ -2,7 +2,6 @@
 #include "messages/Envelope.h"
 #include "reports/BuildAuthReport.h"
 #include "reports/QuoteComparison.h"
-#include "support/Cases.h"
 #include "support/Shop.h"
 
 namespace kest::test {
@@ -51,11 +50,6 @@ protected:
             texts << QString::fromStdString(cells(table, field));
         return texts.join(u", "_s).toStdString();
     }
-    /// Adds a line as a cell has it: element, indicator and elements.
-    static void add(Message& message, int line, const QString& cell)
-    {
-        message.line(cell.section(u' ', 0, 0), line, cell.section(u' ', 1, 1), fieldsIn(cell));
-    }
 };
 
 }  // namespace
@@ -68,8 +62,8 @@ TEST_F(Comparison, EachLineStandsBesideTheShops)
     for (const auto& [number, shop, insurer, ofAuthorised, ofAdjusted] : casesIn<5>("reports/comparison.txt")) {
         if (!shop.isEmpty())
             fill(quote("500").line(number.toInt()), shop);
-        add(authorisation, number.toInt(), insurer);
-        add(suggestion, number.toInt(), insurer);
+        for (Message* message : {&authorisation, &suggestion})
+            message->line(insurer.section(u' ', 0, 0), number.toInt(), insurer.section(u' ', 1, 1), fieldsIn(insurer));
     }
     db::Recordset tables[] = {authorised(authorisation), adjusted(suggestion)};
     for (const auto& [number, shop, insurer, ofAuthorised, ofAdjusted] : casesIn<5>("reports/comparison.txt"))

@@ -7,8 +7,6 @@
 #include "reports/BuildAuthReport.h"
 #include "reports/Previews.h"
 #include "reports/frmPrintPreview.h"
-#include "shell/SharedVariables.h"
-#include "support/Cases.h"
 #include "support/Hands.h"
 
 #include <QJsonDocument>

@@ -1,7 +1,6 @@
 // The reports that a test's desktop has shown, and the shop's templates for them.
 #pragma once
 
-#include "platform/files/files.h"
 #include "support/Shop.h"
 
 #include <QFile>

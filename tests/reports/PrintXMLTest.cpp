@@ -3,8 +3,6 @@
 #include "platform/report/OutputFolder.h"
 #include "reports/Previews.h"
 #include "reports/PrintXML.h"
-#include "shell/SharedVariables.h"
-#include "support/Cases.h"
 
 #include <QRegularExpression>
 
@@ -92,26 +90,13 @@ TEST_F(Printing, EachTypeHasItsReportOrNone)
     EXPECT_FALSE(PrintXML(u"gone.xml"_s, true));
     EXPECT_EQ(shown().substr(0, 67), "[none] An error 53 has occured, Please contact MarlinDesk Support\r\n");
     EXPECT_TRUE(PrintXML({}, true));
-    for (const Message& message : {quoteMatch("500"), quoteDeletion("KQ1"), revisionRequest("QR1"), cancellation("QR1"),
-                                   manualQuote("500"), Message("adqt", "getAdjustedQuoteResponse")})
-        print(message);
     print(marker("500"));
+    print(Message("adqt", "getAdjustedQuoteResponse"));
     EXPECT_EQ(shownReports() + shown(), "");
-    const struct {
-        Message message;
-        const char *reports, *box;
-    } cases[] = {
-        {adjustedQuote("500"), "frmPrintPreview730", ""},
-        {authorisedQuote("500"), "frmPrintPreview730", ""},
-        {quoteRequest("QR2"), "", "[critical] Quote does not exist in database, please contact MarlinDesk Support."},
-        {adjustedQuote("501"), "", "[critical] Quote not found in database. Please contact MarlinDesk Support."},
-        // an authorisation without its quote still opens the report, on the rows that are saved in its template
-        {authorisedQuote("501"), "frmPrintPreview730",
-         "[critical] Matching quote was not found in database, Please contact MarlinDesk Support."}};
-    for (const auto& [message, reports, box] : cases) {
-        print(message);
-        EXPECT_EQ(shownReports(), reports) << box;
-        EXPECT_EQ(shown(), box);
+    for (const auto& [message, reports, box] : casesIn<3>("reports/reports.txt")) {
+        print(Message::told(message));
+        EXPECT_EQ(shownReports(), reports.toStdString()) << message.toStdString();
+        EXPECT_EQ(shown(), box.toStdString()) << message.toStdString();
     }
     print(adjustedQuote("500").without("assessmentComment"));
     EXPECT_EQ(shown().substr(0, 67), "[none] An error 91 has occured, Please contact MarlinDesk Support\r\n");

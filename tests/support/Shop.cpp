@@ -1,8 +1,9 @@
 #include "support/Shop.h"
 
+#include "inbound/modLoadXML.h"
+#include "messages/Folders.h"
+#include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
-#include "platform/files/files.h"
-#include "shell/SharedVariables.h"
 #include "support/ShopDatabase.h"
 
 namespace kest::test {
@@ -91,6 +92,35 @@ Row vendor(const Text& name)
     if (!row.exists())
         addRow("VENDOR", {{"NAME", QString(name)}, {"Account", 293}});
     return row;
+}
+
+bool load(const Text& message, const Text& fileName)
+{
+    files::write(gsUnreadPath + fileName, message);
+    gsListFolder = gsUnreadPath;  // as after a fill: a load prints from there
+    QString text = message;
+    return LoadXML(text, fileName);
+}
+
+bool loadAsTheWindow(const QString& fileName)
+{
+    gsListFolder = gsUnreadPath;
+    bool taken = false;
+    attempt([&] {
+        QString text = files::read(gsUnreadPath + fileName);
+        taken = LoadXML(text, fileName);
+    });
+    if (taken)
+        MoveMessage(fileName, u"read"_s);
+    return taken;
+}
+
+QStringList listed(int folder)
+{
+    QStringList names;
+    for (const ListedMessage& message : BuildMessageList(folder, {LoadSubmissionResponse, {}, {}}))
+        names << message.file;
+    return names;
 }
 
 Shop::Shop() : desktop(std::in_place), root_(profile_.root())

@@ -1,7 +1,12 @@
-// A repair shop of its own for one test: profile, folders, quote database, connection and shared variables.
+// A repair shop of its own for one test: profile, folders, quote database, connection and shared variables; with what
+// every such test reads them by.
 #pragma once
 
+#include "messages/Summary.h"
+#include "platform/files/files.h"
+#include "shell/SharedVariables.h"
 #include "shell/eKEST.h"
+#include "support/Cases.h"
 #include "support/Messages.h"
 #include "support/Row.h"
 #include "support/ScriptedDesktop.h"
@@ -27,6 +32,16 @@ bool quoteExists(const Text& number, int subquote = 0);
 Row car(const Text& rego);
 Row customer(const Text& name);
 Row vendor(const Text& name);
+
+/// The message arrives in the unread folder under that name, and goes through LoadXML.
+bool load(const Text& message, const Text& fileName = "message.xml");
+
+/// Loads a message as the list window does after a click on "Load", the move to the read folder included; false where a
+/// failure reaches the window.
+bool loadAsTheWindow(const QString& fileName);
+
+/// The files that the list window's fill lists; answers to quotes that were sent are applied.
+QStringList listed(int folder = Unread);
 
 class Shop : public ::testing::Test {
 protected:

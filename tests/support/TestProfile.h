@@ -1,6 +1,9 @@
 // A profile of its own for one test, in a temporary folder that goes with it.
 #pragma once
 
+#include "platform/profile.h"
+
+#include <QDir>
 #include <QString>
 #include <QTemporaryDir>
 
@@ -15,8 +18,14 @@ namespace kest::test {
 
 class TestProfile {
 public:
-    TestProfile();
-    ~TestProfile();
+    TestProfile()
+    {
+        EXPECT_TRUE(folder.isValid());
+        QDir().mkpath(driveC());
+        profile::setRoot(folder.path());
+    }
+    ~TestProfile() { profile::setRoot({}); }
+    Q_DISABLE_COPY_MOVE(TestProfile)
 
     QString root() const { return folder.path(); }
     /// Where drive C: lies on this system.
