@@ -21,9 +21,11 @@
 #include "utilities/FormatXML.h"
 
 #include <QCoreApplication>
+#include <QDir>
 #include <QFile>
 #include <QFileInfo>
 #include <QJsonDocument>
+#include <QLabel>
 #include <QPushButton>
 
 #include <algorithm>
@@ -76,16 +78,25 @@ Outcome refused(const QString& why, int exitCode)
     return {.exitCode = exitCode};
 }
 
+/// An embedded database whose file is gone; a server's is no path of this system.
+bool isMissing(const QString& database)
+{
+    return QDir::isAbsolutePath(database) && !QFile::exists(database);
+}
+
 Outcome init(const QStringList& arguments)
 {
     const bool demo = arguments.contains(u"--demo"_s);
     if (arguments.size() > (demo ? 1 : 0))
         return refused(u"init takes --demo and nothing else"_s, Usage);
-    const bool made = initProfile(demo);
-    if (made && demo)
+    if (!initProfile(demo)) {
+        if (const QString database = where()[u"database"_s].toString(); isMissing(database))
+            return refused(u"the profile is there already, but not its database: "_s + database, Refused);
+        return {.text = u"The profile is there already: "_s + profile::root() + u'\n'};
+    }
+    if (demo)
         installTransport(QCoreApplication::applicationFilePath());
-    return {.text =
-                (made ? u"The profile is ready: "_s : u"The profile is there already: "_s) + profile::root() + u'\n'};
+    return {.text = u"The profile is ready: "_s + profile::root() + u'\n'};
 }
 
 Outcome showWhere(const QStringList&)
@@ -204,6 +215,8 @@ Outcome load(const QStringList& arguments)
     window.open();
     const QJsonArray boxes = boxesShown();
     const bool loaded = window.loadFile(arguments[0]);
+    if (loaded && files::exists(gsUnreadPath + arguments[0]))
+        say(u"kest2: "_s + window.findChild<QLabel*>(u"lblStatus"_s)->text() + u'\n', stderr);
     return {.exitCode = loaded ? Done : notDone(window, u"cmdProcess"_s, arguments[0], boxes),
             .fields = {{u"rows"_s, rowsAsJson(window.rows())}}};
 }

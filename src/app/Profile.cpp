@@ -12,6 +12,7 @@
 #include "shell/modLoggerEx.h"
 
 #include <QDir>
+#include <QLockFile>
 
 namespace kest::app {
 
@@ -127,6 +128,12 @@ bool initProfile(bool demo, const QDate& today)
         rebuildIndexes();
         return false;
     }
+    files::makeFolder(profile::root());
+    QLockFile making(profile::root() + u"/init.lock"_s);  // another init would take the unfinished database away
+    if (!making.lock())
+        throw RuntimeError(PermissionDenied, u"Nothing can be written in "_s + profile::root());
+    if (isWhole())
+        return false;
     makeFolders();
     files::makeFolder(profile::root() + u"/databases"_s);
     installTemplates();

@@ -201,6 +201,9 @@ bool frmMessageList::load(const QString& file)
         }
         MoveMessage(file, u"read"_s);
         RefreshList();
+        if (files::exists(gsCurFolder + file))
+            lblStatus->setText(
+                u"%1 is loaded, but could not be moved to the read messages: do not load it again."_s.arg(file));
         desktop::msgBox(u"Message Loaded"_s);
         return true;
     } catch (const RuntimeError& error) {

@@ -1,6 +1,7 @@
 #include "app/transport/TransportRunner.h"
 
 #include "app/Profile.h"
+#include "platform/RuntimeError.h"
 #include "platform/files/files.h"
 
 #include <QJsonObject>
@@ -56,7 +57,11 @@ TransportRunner::TransportRunner(const TransportFolders& all, Heard listener)
 bool TransportRunner::claim()
 {
     files::makeFolder(folders.own);
-    return lock.tryLock();
+    if (lock.tryLock())
+        return true;
+    if (lock.error() == QLockFile::PermissionError)
+        throw RuntimeError(PermissionDenied, u"Nothing can be written in "_s + files::systemPath(folders.own));
+    return false;
 }
 
 void TransportRunner::start()
