@@ -1,5 +1,6 @@
 // The window on a quote's network fields: what it shows, what its buttons change, what a save stores.
 #include "shell/SharedVariables.h"
+#include "shell/modDBAccess.h"
 #include "support/Cases.h"
 #include "support/Hands.h"
 #include "support/Shop.h"
@@ -182,7 +183,9 @@ TEST_F(Utilities, ASaveThatFailsIsReportedAndTheWindowStays)
     for (const auto& [meanwhile, date, failure, stored] : cases) {
         quote("500").quoteNumber("before").remarks("before");
         const QStringList failures = failuresOf([&](QDialog& window) {
-            gConn->execute(QString::fromLatin1(meanwhile));
+            db::Connection workstation;
+            workstation.open(ConnectionText(DriverNumber()));
+            workstation.execute(QString::fromLatin1(meanwhile));
             control<QLineEdit>(window, "txtQuoteNo").setText(u"repaired"_s);
             control<QLineEdit>(window, "txtAuthDate").setText(date);
             control<QPushButton>(window, "Command4").click();

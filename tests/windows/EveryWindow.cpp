@@ -1,5 +1,6 @@
 #include "windows/EveryWindow.h"
 
+#include "app/transport/TransportWindow.h"
 #include "messages/frmMessageList.h"
 #include "outbound/frmExtraInfo.h"
 #include "outbound/frmSubletAuth.h"
@@ -109,6 +110,7 @@ void EveryWindow::each(const Check& check)
         {"frmLogin", check, [&] { frmLogin::ShowForm(passed); }},
         {"frmUtilities", check, [] { frmUtilities::ShowForm(u"500"_s, u"0"_s); }},
         {"frmViewXML", check, [] { frmViewXML::ShowForm(u"a.xml"_s); }},
+        {"KESTWeb", check, [] { app::TransportWindow(app::transportFolders()).run(); }},
     };
     gsCurFolder = gsUnreadPath;
     for (const auto& [name, checkOfWindow, show] : windows) {

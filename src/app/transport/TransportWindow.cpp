@@ -3,6 +3,7 @@
 #include "platform/desktop/Window.h"
 
 #include <QHBoxLayout>
+#include <QHeaderView>
 #include <QLabel>
 #include <QPushButton>
 #include <QTime>
@@ -27,9 +28,11 @@ TransportWindow::TransportWindow(const TransportFolders& folders)
     carriedList->setHeaderLabels({u"Time"_s, u"Direction"_s, u"File"_s, u"What it is"_s});
     carriedList->setRootIsDecorated(false);
     carriedList->setUniformRowHeights(true);
-    carriedList->setColumnWidth(0, desktop::pixels(1100));
-    carriedList->setColumnWidth(1, desktop::pixels(1200));
+    carriedList->setColumnWidth(0, desktop::pixels(1200));
+    carriedList->setColumnWidth(1, desktop::pixels(1400));
     carriedList->setColumnWidth(2, desktop::pixels(3900));
+    carriedList->setColumnWidth(3, desktop::pixels(4600));
+    carriedList->header()->setStretchLastSection(false);
     heading->setBuddy(carriedList);
 
     status = new QLabel(this);
@@ -53,7 +56,7 @@ TransportWindow::TransportWindow(const TransportFolders& folders)
     layout->addWidget(heading);
     layout->addWidget(carriedList);
     layout->addLayout(buttons);
-    resize(desktop::pixels(11000, 5400));
+    resize(desktop::pixels(11600, 5400));
 }
 
 void TransportWindow::run()
