@@ -258,4 +258,15 @@ TEST_F(QuoteBody, WhatIsOddButANumberIsTaken)
     EXPECT_EQ(line(6).text("script"), "the first of them");
 }
 
+TEST_F(QuoteBody, TenThousandLines)
+{
+    Message message = body();
+    for (int line = 1; line <= 10'000; ++line)
+        message.labour(line, "I");
+    gConn->execute(u"BEGIN"_s);  // 20,000 commits that nobody needs on the disk
+    EXPECT_TRUE(apply(message));
+    EXPECT_EQ(quote("500").lines(), 10'000);
+    EXPECT_EQ(quote("500").line(10'000).text("itemno"), "999");
+}
+
 }  // namespace kest::test
