@@ -30,7 +30,7 @@ public:
         profile::setRoot(folder.filePath(u"shop"_s));
         app::initProfile(true);
         host = std::make_unique<eKEST>();
-        QFile tables(QStringLiteral(KEST_JOBLINK_TABLES));
+        QFile tables(QStringLiteral(KEST_SOURCE_DIR "/sql/joblink.sql"));
         if (!tables.open(QIODevice::ReadOnly))
             qFatal("no tables");
         server.createDatabase(u"jobs"_s, QString::fromUtf8(tables.readAll()));
