@@ -9,6 +9,7 @@
 #include <QDir>
 #include <QFile>
 #include <QFileInfo>
+#include <QProcessEnvironment>
 #include <QStandardPaths>
 #include <QTcpServer>
 #include <QThread>
@@ -73,7 +74,13 @@ MariaDbServer::~MariaDbServer()
 
 void MariaDbServer::prepareData()
 {
+    // a server that starts takes the temporary tables away that it finds, those of others too
+    QDir(folder.path()).mkdir(u"tmp"_s);
+    QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
+    environment.insert(u"TMPDIR"_s, folder.filePath(u"tmp"_s));
+    server.setProcessEnvironment(environment);
     QProcess install;
+    install.setProcessEnvironment(environment);
     install.setProcessChannelMode(QProcess::MergedChannels);
     install.start(program(u"mariadb-install-db"_s),
                   {u"--no-defaults"_s, u"--user="_s + thisUser(), u"--datadir="_s + folder.filePath(u"data"_s),
