@@ -263,13 +263,14 @@ bool LoadQREQ(QString& text, const QString& fileName)
 {
     const xml::Document message = ParsedMessage(text);
 
-    std::unique_ptr<db::Lock> newQuotes = LockNewQuotes();
     db::Recordset cinfo = Opened(u"SELECT * FROM CINFO"_s);
-    const QVariant counter = cinfo.value(u"QUOTE_VAL"_s);
     db::Recordset insurer = Opened(u"SELECT * FROM INSURER WHERE KEST=1 or name='KEST Universal Insurer'"_s);
     if (!ChooseInsurer(insurer))
         return Refuse(u"Error locating a valid insurer, Please contact MarlinDesk Support."_s);
 
+    std::unique_ptr<db::Lock> newQuotes = LockNewQuotes();
+    cinfo.requery();  // as it stands now that no other workstation counts
+    const QVariant counter = cinfo.value(u"QUOTE_VAL"_s);
     db::Recordset quote(gConn);
     const QString quoteNumber = NextQuoteNumber({}, cinfo, quote, false);
     db::Recordset notes = Opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}'", quoteNumber));
@@ -329,9 +330,9 @@ bool LoadQREQ(QString& text, const QString& fileName)
         return true;  // another workstation has counted on while the report was open
     db::Recordset tried(gConn);
     const QString next = NextQuoteNumber(quoteNumber, cinfo, tried, true);
-    if (std::ranges::all_of(next, [](QChar c) {
-            return c.isDigit();
-        })) {  // with a prefix of letters the counter stays, and the search skips what is taken
+    // with a prefix of letters the counter stays, and the search skips what is taken
+    const bool isCount = std::ranges::all_of(next, [](QChar c) { return c.isDigit(); });
+    if (isCount) {
         cinfo.set(u"QUOTE_VAL"_s, next);
         cinfo.update();
     }
