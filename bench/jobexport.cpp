@@ -1,12 +1,12 @@
 // What an export to JobLink costs beside the bare inserts on the same server.
-#include "app/Profile.h"
+#include "setup/Profile.h"
 #include "jobexport/JobLinkSettings.h"
 #include "jobexport/WriteQuote.h"
 #include "platform/database/Sql.h"
-#include "platform/desktop/Script.h"
+#include "platform/script/Script.h"
 #include "platform/profile.h"
-#include "shell/CredentialCipher.h"
-#include "shell/SharedVariables.h"
+#include "base/CredentialCipher.h"
+#include "base/SharedVariables.h"
 #include "shell/eKEST.h"
 #include "support/MariaDbServer.h"
 

@@ -1,12 +1,12 @@
 // The loads of authorised and manual quotes by their number of lines, against the bare statements of the same load.
-#include "app/QuoteDatabase.h"
+#include "setup/QuoteDatabase.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
-#include "shell/SharedVariables.h"
-#include "shell/modDBAccess.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 
 #include <QCoreApplication>
 #include <QElapsedTimer>

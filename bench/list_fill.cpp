@@ -1,9 +1,9 @@
 // The fill of the message list against its floor: each file read and parsed once.
 #include "messages/Envelope.h"
-#include "messages/Summary.h"
+#include "messagelist/Summary.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
-#include "shell/SharedVariables.h"
+#include "base/SharedVariables.h"
 
 #include <QCoreApplication>
 #include <QElapsedTimer>

@@ -1,11 +1,11 @@
 // Search as you type in the message list: the time of one key over all rows, what the list then shows painted.
-#include "app/QuoteDatabase.h"
+#include "setup/QuoteDatabase.h"
 #include "messages/Envelope.h"
-#include "messages/frmMessageList.h"
+#include "messagelist/frmMessageList.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
-#include "shell/SharedVariables.h"
-#include "shell/modDBAccess.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 
 #include <QApplication>
 #include <QKeyEvent>

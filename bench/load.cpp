@@ -1,12 +1,12 @@
 // The load of a message against its floor: the bare statements that it needs, on the same database; and the note chain.
-#include "app/QuoteDatabase.h"
+#include "setup/QuoteDatabase.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
 #include "quotedata/NoteChain.h"
-#include "shell/SharedVariables.h"
-#include "shell/modDBAccess.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 
 #include <QCoreApplication>
 #include <QElapsedTimer>

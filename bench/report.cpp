@@ -1,15 +1,15 @@
 // Report 730: the table's cost for each line of the quote, and the PDF against the bare painting of the same document.
-#include "platform/report/Report.h"
+#include "platform/print/Report.h"
 
-#include "app/QuoteDatabase.h"
+#include "setup/QuoteDatabase.h"
 #include "messages/Envelope.h"
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
-#include "platform/report/Pages.h"
+#include "platform/print/Pages.h"
 #include "reports/BuildAuthReport.h"
-#include "shell/SharedVariables.h"
-#include "shell/modDBAccess.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 
 #include <QAbstractTextDocumentLayout>
 #include <QApplication>

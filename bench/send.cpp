@@ -1,14 +1,14 @@
 // A send against its floor, the bare statements that it needs and the serialisation of the same tree; and the totals.
-#include "app/QuoteDatabase.h"
+#include "setup/QuoteDatabase.h"
 #include "outbound/SendQuote.h"
 #include "platform/database/Sql.h"
-#include "platform/desktop/Prompt.h"
+#include "platform/Prompt.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
 #include "platform/xml/xml.h"
 #include "quotedata/QuoteTotals.h"
-#include "shell/SharedVariables.h"
-#include "shell/modDBAccess.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 
 #include <QCoreApplication>
 #include <QElapsedTimer>

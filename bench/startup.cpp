@@ -1,5 +1,5 @@
 // Process start to the shown panel, against a program that shows one empty window.
-#include "app/Profile.h"
+#include "setup/Profile.h"
 #include "platform/profile.h"
 
 #include <QApplication>

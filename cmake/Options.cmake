@@ -10,7 +10,6 @@ target_compile_definitions(
     INTERFACE QT_NO_CAST_FROM_ASCII QT_NO_CAST_TO_ASCII QT_NO_URL_CAST_FROM_STRING QT_NO_CAST_FROM_BYTEARRAY
               QT_NO_FOREACH QT_NO_NARROWING_CONVERSIONS_IN_CONNECT
               QT_DISABLE_DEPRECATED_BEFORE=0x060400 KEST_VERSION="${PROJECT_VERSION}")
-target_include_directories(kest_options INTERFACE ${PROJECT_SOURCE_DIR}/src)
 
 find_program(MOLD mold)
 if(MOLD)
@@ -22,9 +21,3 @@ if(KEST_SANITIZE)
     add_compile_options(-fsanitize=${KEST_SANITIZE} -fno-omit-frame-pointer -fno-sanitize-recover=all)
     add_link_options(-fsanitize=${KEST_SANITIZE})
 endif()
-
-function(kest_precompile target)
-    if(KEST_PCH)
-        target_precompile_headers(${target} PRIVATE ${ARGN})
-    endif()
-endfunction()

@@ -2,19 +2,19 @@
 
 #include "app/MessageCommands.h"
 #include "app/Outcome.h"
-#include "app/Profile.h"
-#include "app/transport/TransportCommand.h"
+#include "setup/Profile.h"
+#include "app/TransportCommand.h"
 #include "jobexport/JobLinkSettings.h"
 #include "platform/RuntimeError.h"
-#include "platform/desktop/Script.h"
+#include "platform/script/Script.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
-#include "platform/report/OutputFolder.h"
+#include "platform/print/OutputFolder.h"
 #include "platform/settings/registry.h"
-#include "shell/CredentialCipher.h"
-#include "shell/ModRegistry.h"
-#include "shell/SharedVariables.h"
+#include "base/CredentialCipher.h"
+#include "base/ModRegistry.h"
+#include "base/SharedVariables.h"
 #include "shell/component.h"
 #include "shell/eKEST.h"
 
@@ -62,7 +62,7 @@ Outcome init(const QStringList& arguments)
     const bool demo = arguments.contains(u"--demo"_s);
     if (arguments.size() > (demo ? 1 : 0))
         return refused(u"init takes --demo and nothing else"_s, Usage);
-    if (!initProfile(demo)) {
+    if (!initProfile(registerClass, demo)) {
         if (const QString database = where()[u"database"_s].toString(); isMissing(database))
             return refused(u"the profile is there already, but not its database: "_s + database, Refused);
         return {.text = u"The profile is there already: "_s + profile::root() + u'\n'};

@@ -1,12 +1,12 @@
 #include "app/MessageCommands.h"
 
 #include "messages/Folders.h"
-#include "messages/frmMessageList.h"
+#include "messagelist/frmMessageList.h"
 #include "outbound/SendQuote.h"
-#include "platform/desktop/Script.h"
+#include "platform/script/Script.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
-#include "shell/SharedVariables.h"
+#include "base/SharedVariables.h"
 #include "shell/eKEST.h"
 #include "utilities/FormatXML.h"
 

@@ -2,9 +2,9 @@
 #include "inbound/modLoadXML.h"
 #include "jobexport/WriteQuote.h"
 #include "messages/Envelope.h"
-#include "outbound/frmSubletAuth.h"
+#include "sublets/frmSubletAuth.h"
 #include "platform/database/Sql.h"
-#include "platform/desktop/Prompt.h"
+#include "platform/Prompt.h"
 #include "platform/values.h"
 #include "quotedata/NoteChain.h"
 #include "quotedata/QuoteTotals.h"
@@ -13,8 +13,8 @@
 #include "reports/BuildAuthReport.h"
 #include "reports/ReportTable.h"
 #include "reports/frmPrintPreview.h"
-#include "shell/Helpers.h"
-#include "shell/modLoggerEx.h"
+#include "base/Helpers.h"
+#include "base/modLoggerEx.h"
 
 #include <optional>
 #include <utility>

@@ -2,11 +2,11 @@
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
 #include "platform/database/Sql.h"
-#include "platform/desktop/Prompt.h"
+#include "platform/Prompt.h"
 #include "quotedata/NoteChain.h"
 #include "quotedata/StateTable.h"
 #include "reports/PrintXML.h"
-#include "shell/Helpers.h"
+#include "base/Helpers.h"
 
 #include <utility>
 

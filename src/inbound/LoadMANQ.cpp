@@ -3,13 +3,13 @@
 #include "messages/Envelope.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
-#include "platform/desktop/Prompt.h"
+#include "platform/Prompt.h"
 #include "platform/values.h"
 #include "quotedata/QuoteTotals.h"
 #include "quotedata/StateTable.h"
 #include "reports/PrintXML.h"
-#include "shell/Helpers.h"
-#include "shell/SharedVariables.h"
+#include "base/Helpers.h"
+#include "base/SharedVariables.h"
 
 #include <optional>
 #include <tuple>

@@ -6,8 +6,8 @@
 #include "platform/values.h"
 #include "quotedata/StateTable.h"
 #include "reports/PrintXML.h"
-#include "shell/Helpers.h"
-#include "shell/SharedVariables.h"
+#include "base/Helpers.h"
+#include "base/SharedVariables.h"
 
 #include <QStringList>
 

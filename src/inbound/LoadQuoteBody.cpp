@@ -5,7 +5,7 @@
 #include "platform/files/files.h"
 #include "platform/values.h"
 #include "quotedata/Vendors.h"
-#include "shell/modLoggerEx.h"
+#include "base/modLoggerEx.h"
 
 #include <QList>
 

@@ -2,12 +2,12 @@
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
 #include "platform/database/Sql.h"
-#include "platform/desktop/Prompt.h"
+#include "platform/Prompt.h"
 #include "platform/values.h"
 #include "quotedata/StateTable.h"
 #include "reports/PrintXML.h"
-#include "shell/Helpers.h"
-#include "shell/SharedVariables.h"
+#include "base/Helpers.h"
+#include "base/SharedVariables.h"
 
 #include <QStringList>
 

@@ -3,12 +3,12 @@
 #include "messages/Folders.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
-#include "platform/desktop/Prompt.h"
+#include "platform/Prompt.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
-#include "shell/Helpers.h"
-#include "shell/SharedVariables.h"
-#include "shell/modLoggerEx.h"
+#include "base/Helpers.h"
+#include "base/SharedVariables.h"
+#include "base/modLoggerEx.h"
 
 #include <QStringList>
 

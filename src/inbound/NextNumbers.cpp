@@ -1,11 +1,11 @@
 // The numbers that a loaded line takes where the message leaves them open: its own, its item code, its document's.
 #include "inbound/modLoadXML.h"
-#include "outbound/SubletDocuments.h"
+#include "sublets/SubletDocuments.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
-#include "shell/Helpers.h"
+#include "base/Helpers.h"
 
 #include <QSet>
 

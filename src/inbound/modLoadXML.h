@@ -3,7 +3,7 @@
 
 #include "platform/database/Recordset.h"
 #include "platform/xml/xml.h"
-#include "shell/modDBAccess.h"
+#include "base/modDBAccess.h"
 
 #include <QString>
 #include <QVariant>

@@ -1,7 +1,7 @@
 #include "jobexport/Address.h"
 
 #include "platform/values.h"
-#include "shell/Helpers.h"
+#include "base/Helpers.h"
 
 namespace kest::joblink {
 

@@ -2,8 +2,8 @@
 
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
-#include "shell/CredentialCipher.h"
-#include "shell/SharedVariables.h"
+#include "base/CredentialCipher.h"
+#include "base/SharedVariables.h"
 
 namespace kest {
 

@@ -4,12 +4,12 @@
 #include "platform/RuntimeError.h"
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
-#include "platform/desktop/Prompt.h"
+#include "platform/Prompt.h"
 #include "platform/values.h"
 #include "quotedata/Rounding.h"
-#include "shell/CredentialCipher.h"
-#include "shell/SharedVariables.h"
-#include "shell/modDBAccess.h"
+#include "base/CredentialCipher.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 
 #include <array>
 #include <utility>

@@ -5,8 +5,8 @@
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
-#include "shell/Helpers.h"
-#include "shell/SharedVariables.h"
+#include "base/Helpers.h"
+#include "base/SharedVariables.h"
 
 #include <limits>
 #include <tuple>

@@ -2,7 +2,7 @@
 
 #include "outbound/QuoteRows.h"
 #include "platform/database/Sql.h"
-#include "shell/modDBAccess.h"
+#include "base/modDBAccess.h"
 
 using namespace Qt::StringLiterals;
 

@@ -4,9 +4,9 @@
 #include "platform/database/Sql.h"
 #include "platform/values.h"
 #include "quotedata/Rounding.h"
-#include "shell/Helpers.h"
-#include "shell/modDBAccess.h"
-#include "shell/modLoggerEx.h"
+#include "base/Helpers.h"
+#include "base/modDBAccess.h"
+#include "base/modLoggerEx.h"
 
 #include <cmath>
 

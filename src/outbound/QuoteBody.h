@@ -1,7 +1,7 @@
 // The body of a quote document: its labour, paint, parts, report items and sublets, their sums and the tax.
 #pragma once
 
-#include "outbound/Branch.h"
+#include "platform/xml/Branch.h"
 #include "outbound/LineNumbers.h"
 #include "platform/database/Recordset.h"
 

@@ -1,7 +1,7 @@
 #include "outbound/QuoteHead.h"
 
 #include "platform/values.h"
-#include "shell/Helpers.h"
+#include "base/Helpers.h"
 
 using namespace Qt::StringLiterals;
 

@@ -1,7 +1,7 @@
 // Everything of a quote document that stands before its body: whom it concerns, and the vehicle.
 #pragma once
 
-#include "outbound/Branch.h"
+#include "platform/xml/Branch.h"
 #include "outbound/ExtraInfo.h"
 #include "outbound/QuoteRows.h"
 

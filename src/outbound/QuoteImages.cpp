@@ -1,9 +1,9 @@
 #include "outbound/QuoteImages.h"
 
-#include "outbound/Branch.h"
+#include "platform/xml/Branch.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
-#include "shell/SharedVariables.h"
+#include "base/SharedVariables.h"
 
 #include <cmath>
 

@@ -2,13 +2,13 @@
 
 #include "outbound/modCreateXML.h"
 #include "platform/database/Sql.h"
-#include "platform/desktop/Prompt.h"
+#include "platform/Prompt.h"
 #include "platform/values.h"
 #include "quotedata/NoteChain.h"
 #include "quotedata/QuoteTotals.h"
-#include "shell/Helpers.h"
-#include "shell/SharedVariables.h"
-#include "shell/modDBAccess.h"
+#include "base/Helpers.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 
 using namespace Qt::StringLiterals;
 

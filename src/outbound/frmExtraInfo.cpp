@@ -1,10 +1,10 @@
 #include "outbound/frmExtraInfo.h"
 
 #include "platform/database/Sql.h"
-#include "platform/desktop/Prompt.h"
+#include "platform/Prompt.h"
 #include "platform/desktop/Window.h"
 #include "platform/values.h"
-#include "shell/modDBAccess.h"
+#include "base/modDBAccess.h"
 
 #include <QAction>
 #include <QApplication>

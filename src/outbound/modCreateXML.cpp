@@ -6,12 +6,12 @@
 #include "outbound/QuoteImages.h"
 #include "outbound/frmExtraInfo.h"
 #include "platform/RuntimeError.h"
-#include "platform/desktop/Prompt.h"
+#include "platform/Prompt.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
 #include "quotedata/StateTable.h"
-#include "shell/ModRegistry.h"
-#include "shell/SharedVariables.h"
+#include "base/ModRegistry.h"
+#include "base/SharedVariables.h"
 
 #include <QSet>
 

@@ -4,7 +4,7 @@
 #include "platform/database/Sql.h"
 #include "platform/values.h"
 #include "quotedata/Rounding.h"
-#include "shell/modDBAccess.h"
+#include "base/modDBAccess.h"
 
 using namespace Qt::StringLiterals;
 

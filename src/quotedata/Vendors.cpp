@@ -1,7 +1,7 @@
 #include "quotedata/Vendors.h"
 
 #include "platform/database/Sql.h"
-#include "shell/modDBAccess.h"
+#include "base/modDBAccess.h"
 
 #include <utility>
 

@@ -2,13 +2,13 @@
 
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
-#include "platform/desktop/Prompt.h"
+#include "platform/Prompt.h"
 #include "platform/values.h"
 #include "quotedata/QuoteTotals.h"
 #include "quotedata/Rounding.h"
 #include "reports/QuoteComparison.h"
-#include "shell/Helpers.h"
-#include "shell/SharedVariables.h"
+#include "base/Helpers.h"
+#include "base/SharedVariables.h"
 
 #include <tuple>
 

@@ -1,20 +1,20 @@
 #include "reports/PrintXML.h"
 
 #include "messages/Envelope.h"
-#include "outbound/SubletDocuments.h"
-#include "outbound/frmSubletAuth.h"
+#include "sublets/SubletDocuments.h"
+#include "sublets/frmSubletAuth.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
-#include "platform/desktop/Prompt.h"
+#include "platform/Prompt.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
 #include "reports/BuildAuthReport.h"
 #include "reports/QuoteComparison.h"
 #include "reports/ReportTable.h"
 #include "reports/frmPrintPreview.h"
-#include "shell/Helpers.h"
-#include "shell/SharedVariables.h"
-#include "shell/modDBAccess.h"
+#include "base/Helpers.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 
 #include <QStringList>
 

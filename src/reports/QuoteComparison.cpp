@@ -5,7 +5,7 @@
 #include "platform/values.h"
 #include "quotedata/Vendors.h"
 #include "reports/ReportTable.h"
-#include "shell/SharedVariables.h"
+#include "base/SharedVariables.h"
 
 #include <span>
 #include <vector>

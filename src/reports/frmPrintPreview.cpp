@@ -3,17 +3,16 @@
 #include "platform/RuntimeError.h"
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
-#include "platform/desktop/Prompt.h"
-#include "platform/desktop/Script.h"
+#include "platform/Prompt.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
-#include "platform/report/OutputFolder.h"
-#include "platform/report/Pages.h"
-#include "platform/report/Preview.h"
+#include "platform/print/OutputFolder.h"
+#include "platform/print/Pages.h"
+#include "platform/print/Preview.h"
 #include "platform/values.h"
 #include "reports/ReportTable.h"
-#include "shell/ModRegistry.h"
-#include "shell/SharedVariables.h"
+#include "base/ModRegistry.h"
+#include "base/SharedVariables.h"
 
 #include <QGuiApplication>
 #include <QPrintDialog>
@@ -72,7 +71,7 @@ QJsonValue AsJson(const std::optional<report::Table>& table)
     return QJsonObject{{u"fields"_s, QJsonArray::fromStringList(table->fields)}, {u"rows"_s, rows}};
 }
 
-/// For a run without a person: what was shown, in the form of its answer.
+/// Describes the preview for an unattended run.
 void Record(qint32 number, const report::Report& report, const std::optional<report::Table>& table)
 {
     QJsonObject parameters;
@@ -82,8 +81,7 @@ void Record(qint32 number, const report::Report& report, const std::optional<rep
                             {u"report"_s, number},
                             {u"parameters"_s, parameters},
                             {u"table"_s, AsJson(table)}};
-    if (desktop::Script* script = desktop::currentScript())
-        script->addWindow(shown);
+    desktop::recordWindow(shown);
     report::writeOutput(number, report, shown);
 }
 

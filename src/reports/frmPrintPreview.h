@@ -2,7 +2,7 @@
 #pragma once
 
 #include "platform/desktop/Form.h"
-#include "platform/report/Report.h"
+#include "platform/print/Report.h"
 
 #include <QVariant>
 

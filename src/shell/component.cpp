@@ -1,7 +1,7 @@
 #include "shell/component.h"
 
 #include "platform/desktop/Display.h"
-#include "platform/desktop/Prompt.h"
+#include "platform/Prompt.h"
 #include "platform/desktop/Window.h"
 #include "platform/settings/registry.h"
 #include "shell/eKEST.h"
@@ -165,17 +165,21 @@ bool enter(const QString& key, const QString& name, const QString& value)
 
 }  // namespace
 
+bool registerClass()
+{
+    return enter(classKey(), {}, programId) && enter(classKey() + u"\\InprocServer32"_s, {}, libraryPath()) &&
+           enter(classKey() + u"\\InprocServer32"_s, u"ThreadingModel"_s, u"Apartment"_s) &&
+           enter(classKey() + u"\\ProgID"_s, {}, programId) &&
+           enter(programId + u"\\CLSID"_s, {}, com::text(CLSID_eKEST));
+}
+
 }  // namespace kest
 
 using namespace kest;
 
 HResult DllRegisterServer()
 {
-    const bool entered =
-        enter(classKey(), {}, programId) && enter(classKey() + u"\\InprocServer32"_s, {}, libraryPath()) &&
-        enter(classKey() + u"\\InprocServer32"_s, u"ThreadingModel"_s, u"Apartment"_s) &&
-        enter(classKey() + u"\\ProgID"_s, {}, programId) && enter(programId + u"\\CLSID"_s, {}, com::text(CLSID_eKEST));
-    return entered ? com::Ok : com::CannotWriteKey;
+    return registerClass() ? com::Ok : com::CannotWriteKey;
 }
 
 HResult DllUnregisterServer()

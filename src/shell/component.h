@@ -1,7 +1,7 @@
 // The in-process server: the four entry points, and the class that they offer.
 #pragma once
 
-#include "platform/com/com.h"
+#include "shell/com.h"
 
 namespace kest {
 
@@ -21,6 +21,9 @@ struct IeKEST : com::IUnknown {
 protected:
     ~IeKEST() = default;
 };
+
+/// Enters the class into the settings store; false if a key can't be written.
+bool registerClass();
 
 }  // namespace kest
 

@@ -1,13 +1,13 @@
 #include "shell/eKEST.h"
 
 #include "platform/database/Sql.h"
-#include "platform/desktop/Prompt.h"
+#include "platform/Prompt.h"
 #include "platform/desktop/Window.h"
-#include "shell/ModRegistry.h"
-#include "shell/SharedVariables.h"
+#include "base/ModRegistry.h"
+#include "base/SharedVariables.h"
 #include "shell/frmKEST.h"
-#include "shell/modDBAccess.h"
-#include "shell/modLoggerEx.h"
+#include "base/modDBAccess.h"
+#include "base/modLoggerEx.h"
 
 namespace kest {
 

@@ -2,7 +2,7 @@
 
 #include "messages/Envelope.h"
 #include "platform/RuntimeError.h"
-#include "platform/desktop/Prompt.h"
+#include "platform/Prompt.h"
 #include "platform/files/files.h"
 #include "platform/xml/xml.h"
 

@@ -1,6 +1,6 @@
 #include "utilities/frmLogin.h"
 
-#include "platform/desktop/Prompt.h"
+#include "platform/Prompt.h"
 #include "platform/desktop/Window.h"
 #include "platform/values.h"
 

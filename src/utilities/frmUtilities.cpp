@@ -1,13 +1,13 @@
 #include "utilities/frmUtilities.h"
 
 #include "platform/database/Sql.h"
-#include "platform/desktop/Prompt.h"
+#include "platform/Prompt.h"
 #include "platform/desktop/Window.h"
 #include "platform/values.h"
 #include "quotedata/NoteChain.h"
-#include "shell/Helpers.h"
-#include "shell/SharedVariables.h"
-#include "shell/modDBAccess.h"
+#include "base/Helpers.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 #include "utilities/ExactTextEdit.h"
 #include "utilities/StatusRepair.h"
 

@@ -1,9 +1,9 @@
 #include "utilities/frmViewXML.h"
 
-#include "platform/desktop/Prompt.h"
+#include "platform/Prompt.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
-#include "shell/SharedVariables.h"
+#include "base/SharedVariables.h"
 #include "utilities/ExactTextEdit.h"
 #include "utilities/FormatXML.h"
 #include "utilities/frmLogin.h"

@@ -1,6 +1,7 @@
 #include "app/CommandLine.h"
-#include "app/Profile.h"
+#include "setup/Profile.h"
 #include "platform/files/files.h"
+#include "shell/component.h"
 #include "support/Cases.h"
 #include "support/TestProfile.h"
 
@@ -27,7 +28,7 @@ struct Ended {
 /// The command as a service person runs it, on a demo shop of its own.
 class Command : public ::testing::Test {
 protected:
-    Command() { app::initProfile(true); }
+    Command() { app::initProfile(registerClass, true); }
 
     Ended kest2(const QString& words, const QByteArray& script = {}, const QByteArray& input = {}) const
     {

@@ -1,9 +1,9 @@
 // Two workstations on one database and one set of message folders, the second one being the command `kest2`.
-#include "messages/frmMessageList.h"
+#include "messagelist/frmMessageList.h"
 #include "outbound/SendQuote.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/FaultInjection.h"
-#include "shell/modDBAccess.h"
+#include "base/modDBAccess.h"
 #include "support/Failure.h"
 #include "support/MariaDbServer.h"
 #include "support/Shop.h"

@@ -1,6 +1,6 @@
 // The way of an authorised quote into the shop's quote: which quote it finds, what it refuses, what it writes.
 #include "inbound/modLoadXML.h"
-#include "shell/modDBAccess.h"
+#include "base/modDBAccess.h"
 #include "support/Shop.h"
 
 #include <QFile>

@@ -1,5 +1,5 @@
 #include "inbound/modLoadXML.h"
-#include "shell/modLoggerEx.h"
+#include "base/modLoggerEx.h"
 #include "support/Shop.h"
 
 #include <QFile>

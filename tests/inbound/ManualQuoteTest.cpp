@@ -1,5 +1,5 @@
 // The way of a manual quote among the shop's quotes: which quote it becomes, and what replaces what was there.
-#include "shell/modDBAccess.h"
+#include "base/modDBAccess.h"
 #include "support/Shop.h"
 #include "support/Snapshot.h"
 

@@ -1,7 +1,7 @@
 // What the lines of a message do to the lines of a quote: by section, by change indicator, and with bad values.
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
-#include "outbound/SubletDocuments.h"
+#include "sublets/SubletDocuments.h"
 #include "support/Shop.h"
 
 namespace kest::test {

@@ -4,7 +4,7 @@
 #include "platform/database/FaultInjection.h"
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
-#include "shell/CredentialCipher.h"
+#include "base/CredentialCipher.h"
 #include "support/MariaDbServer.h"
 #include "support/Shop.h"
 

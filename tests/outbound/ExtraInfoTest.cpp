@@ -1,7 +1,7 @@
 #include "Sending.h"
 #include "outbound/ExtraInfo.h"
 #include "outbound/frmExtraInfo.h"
-#include "platform/desktop/Prompt.h"
+#include "platform/Prompt.h"
 
 namespace kest::test {
 

@@ -4,7 +4,7 @@
 #include "outbound/SendQuote.h"
 #include "platform/database/Sql.h"
 #include "platform/xml/xml.h"
-#include "shell/modDBAccess.h"
+#include "base/modDBAccess.h"
 #include "support/Shop.h"
 
 namespace kest::test {

@@ -1,6 +1,6 @@
 #include "platform/Databases.h"
 
-#include "app/QuoteDatabase.h"
+#include "setup/QuoteDatabase.h"
 
 #include <memory>
 

@@ -1,7 +1,7 @@
 #include "platform/RuntimeError.h"
 #include "quotedata/QuoteTotals.h"
 #include "quotedata/Rounding.h"
-#include "shell/modDBAccess.h"
+#include "base/modDBAccess.h"
 #include "support/Shop.h"
 
 namespace kest::test {

@@ -1,8 +1,8 @@
 // The preview: which template it opens, what it puts in, its window, and the pages as a reader gets them.
 #include "platform/database/Recordset.h"
-#include "platform/desktop/Gestures.h"
-#include "platform/report/OutputFolder.h"
-#include "platform/report/Pages.h"
+#include "platform/script/Gestures.h"
+#include "platform/print/OutputFolder.h"
+#include "platform/print/Pages.h"
 #include "platform/settings/registry.h"
 #include "reports/BuildAuthReport.h"
 #include "reports/Previews.h"

@@ -1,6 +1,6 @@
 // Which report a message gives, with which values, and what is said where it gives none.
-#include "messages/frmMessageList.h"
-#include "platform/report/OutputFolder.h"
+#include "messagelist/frmMessageList.h"
+#include "platform/print/OutputFolder.h"
 #include "reports/Previews.h"
 #include "reports/PrintXML.h"
 

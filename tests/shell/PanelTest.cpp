@@ -1,7 +1,7 @@
 #include "platform/database/FaultInjection.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
-#include "shell/SharedVariables.h"
+#include "base/SharedVariables.h"
 #include "shell/eKEST.h"
 #include "support/Shop.h"
 #include "utilities/frmLogin.h"

@@ -1,6 +1,6 @@
 #include "support/MariaDbServer.h"
 
-#include "app/QuoteDatabase.h"
+#include "setup/QuoteDatabase.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Connection.h"
 #include "platform/database/Sql.h"

@@ -3,7 +3,7 @@
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
-#include "shell/modDBAccess.h"
+#include "base/modDBAccess.h"
 #include "support/Cases.h"
 
 namespace kest::test {

@@ -1,7 +1,7 @@
 // A desktop without a person: a script answers boxes and drives windows as long as the test lasts.
 #pragma once
 
-#include "platform/desktop/Script.h"
+#include "platform/script/Script.h"
 
 #include <QJsonArray>
 #include <QStringList>

@@ -2,9 +2,9 @@
 // every such test reads them by.
 #pragma once
 
-#include "messages/Summary.h"
+#include "messagelist/Summary.h"
 #include "platform/files/files.h"
-#include "shell/SharedVariables.h"
+#include "base/SharedVariables.h"
 #include "shell/eKEST.h"
 #include "support/Cases.h"
 #include "support/Messages.h"

@@ -1,11 +1,11 @@
 #include "support/ShopDatabase.h"
 
-#include "app/QuoteDatabase.h"
+#include "setup/QuoteDatabase.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
-#include "shell/ModRegistry.h"
-#include "shell/SharedVariables.h"
-#include "shell/modDBAccess.h"
+#include "base/ModRegistry.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 #include "support/MariaDbServer.h"
 
 #include <QFile>

@@ -3,8 +3,8 @@
 #include "inbound/modLoadXML.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
-#include "shell/SharedVariables.h"
-#include "shell/modDBAccess.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 
 #include <QDir>
 #include <QDirIterator>

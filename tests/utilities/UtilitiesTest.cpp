@@ -1,6 +1,6 @@
 // The window on a quote's network fields: what it shows, what its buttons change, what a save stores.
-#include "shell/SharedVariables.h"
-#include "shell/modDBAccess.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 #include "support/Cases.h"
 #include "support/Hands.h"
 #include "support/Shop.h"

@@ -1,6 +1,6 @@
 // The text viewer: what a save writes, what stops it, and leaving with unsaved typing.
 #include "platform/files/files.h"
-#include "shell/SharedVariables.h"
+#include "base/SharedVariables.h"
 #include "support/ScriptedDesktop.h"
 #include "support/TestProfile.h"
 #include "utilities/ExactTextEdit.h"

@@ -1,6 +1,6 @@
 // What a person may expect of every window: a key for everything, texts that can be read at any size, names for those
 // who hear what others see.
-#include "platform/desktop/Gestures.h"
+#include "platform/script/Gestures.h"
 #include "windows/EveryWindow.h"
 
 #include <QAbstractButton>

@@ -1,5 +1,5 @@
 #include "platform/desktop/Programs.h"
-#include "platform/desktop/Prompt.h"
+#include "platform/Prompt.h"
 #include "platform/desktop/Window.h"
 
 #include <QApplication>
@@ -64,7 +64,7 @@ class PersonAnswerer final : public Answerer {
 public:
     Answer box(const Box& box) override;
     QString input(const Input& input) override;
-    void start(const QString& systemPath) override { startDetached(systemPath); }
+    void start(const QString& path) override { startDetached(path); }
 };
 
 Answer PersonAnswerer::box(const Box& box)

@@ -1,6 +1,7 @@
 #include "platform/desktop/Programs.h"
 
 #include "platform/RuntimeError.h"
+#include "platform/files/files.h"
 #include "platform/profile.h"
 
 #include <QFileInfo>
@@ -10,8 +11,9 @@ namespace kest::desktop {
 
 using namespace Qt::StringLiterals;
 
-void startDetached(const QString& systemPath)
+void startDetached(const QString& path)
 {
+    const QString systemPath = files::systemPath(path);
     if (!QFileInfo(systemPath).isFile())
         throw RuntimeError(FileNotFound, u"File not found: "_s + systemPath);
     QProcess program;

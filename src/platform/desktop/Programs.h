@@ -5,8 +5,8 @@
 
 namespace kest::desktop {
 
-/// The program finds the profile by KEST2_PROFILE. Throws FileNotFound, or PermissionDenied for a file that this system
+/// Starts the program, a path in the host's form, which finds the profile by KEST2_PROFILE. Throws FileNotFound, or PermissionDenied for a file that this system
 /// cannot run.
-void startDetached(const QString& systemPath);
+void startDetached(const QString& path);
 
 }  // namespace kest::desktop

@@ -1,6 +1,6 @@
 #include "platform/desktop/Progress.h"
 
-#include "platform/desktop/Script.h"
+#include "platform/Prompt.h"
 #include "platform/desktop/Window.h"
 
 #include <QApplication>
@@ -83,7 +83,7 @@ void Progress::show()
         bar->show();
         if (QLayout* layout = bar->window()->layout())
             layout->activate();
-    } else if (!currentScript()) {
+    } else if (isPersonPresent()) {
         ownWindow = makeWindow(caption, what);
         bar = ownWindow->findChild<QProgressBar*>();
         putOnScreen(*ownWindow);

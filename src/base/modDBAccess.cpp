@@ -1,0 +1,153 @@
+#include "base/modDBAccess.h"
+
+#include "platform/RuntimeError.h"
+#include "platform/Prompt.h"
+#include "platform/values.h"
+#include "base/SharedVariables.h"
+
+#include <QSysInfo>
+
+namespace kest {
+
+using namespace Qt::StringLiterals;
+
+db::ConnectionPtr gcnDB;
+QString gsSAPwd;
+QString gsDatabase;
+QString gsServer;
+QString gsInstance;
+
+namespace {
+
+constexpr int commandTimeout = 120;  // seconds
+constexpr auto mysqlServer = "mysql:"_L1;
+
+struct Failure {
+    int number = 0;
+    QString description;
+};
+Failure lastFailure;  // of the last attempt to open the connection
+
+QString splashSetting(const QString& key, const QString& fallback = {})
+{
+    return GetRegSetting(u"wirra32"_s, u"frmsplash"_s, key, fallback, CopyUp::No);
+}
+
+}  // namespace
+
+void ReadConnectionSettings()
+{
+    const QString useMaster = splashSetting(u"TabletUseMaster"_s);
+    const QString prefix = useMaster == u"1"_s ? u"TabletMaster"_s : QString();
+    gsSAPwd = splashSetting(prefix + u"SAPwd"_s);
+    gsDatabase = splashSetting(prefix + u"DatabaseName"_s, u"WirSql"_s);
+    gsInstance = splashSetting(prefix + u"InstanceName"_s);
+    gsServer = splashSetting(prefix + u"ServerName"_s, u"(local)"_s);
+    gbTabletLocal = useMaster == u"0"_s;
+
+    if (gsServer == GetComputerName())
+        gsServer = u"(local)"_s;
+}
+
+int DriverNumber(CopyUp copyUp)
+{
+    const QString type = GetRegSetting(u"wirra32"_s, u"frmSplash"_s, u"ClientConnectionType"_s, u"0"_s, copyUp);
+    const QString system =
+        GetRegSetting(u"Microsoft"_s, u"Windows NT\\CurrentVersion"_s, u"CurrentVersion"_s, QString(), copyUp);
+    if (system >= u"6.0"_s)
+        return 1;
+    int number = 0;  // also for a text that is no number
+    attempt([&] { number = static_cast<int>(toInteger(type)); });
+    return number;
+}
+
+namespace {
+
+bool isOpen()
+{
+    return gcnDB && gcnDB->answers();
+}
+
+}  // namespace
+
+db::ConnectionPtr GetConnection()
+{
+    return EnsureConnection() ? gcnDB : nullptr;
+}
+
+bool EnsureConnection()
+{
+    if (isOpen())
+        return true;
+    OpenDatabase();
+    gConn = gcnDB;
+    return isOpen();
+}
+
+void OpenDatabase()
+{
+    if (!gcnDB)
+        gcnDB = std::make_shared<db::Connection>();  // else the same one: recordsets on it, the panel's too, go on
+    lastFailure = {};
+    attempt([] { ReadConnectionSettings(); });
+    attempt([] {
+        try {
+            gcnDB->open(ConnectionText(DriverNumber()));
+        } catch (const RuntimeError& error) {
+            lastFailure = {error.number(), error.description()};
+            throw;
+        }
+    });
+    attempt([] { gcnDB->setCommandTimeout(commandTimeout); });
+}
+
+QString ConnectionText(int driverNumber)
+{
+    if (gsServer.startsWith(mysqlServer, Qt::CaseInsensitive)) {
+        const QStringList address = gsServer.mid(mysqlServer.size()).split(u':');
+        return u"Driver={MySQL};Server="_s + address.value(0) + u";Port="_s + address.value(1, u"3306"_s) +
+               u";Database="_s + gsDatabase + u";Uid=sa;Pwd="_s + gsSAPwd + u';';
+    }
+    const QString server = gsServer.endsWith(u'\\') ? gsServer : gsServer + u'\\';
+    const QString tail =
+        u"Server="_s + server + gsInstance + u";Database="_s + gsDatabase + u";Uid=sa;Pwd="_s + gsSAPwd + u';';
+    switch (driverNumber) {
+        case 0:
+            return u"Driver={SQL Server};"_s + tail;
+        case 1:
+            return u"Driver={SQL Native Client};"_s + tail;
+        default:
+            return {};
+    }
+}
+
+std::optional<db::Recordset> OpenRecordset(const QString& select, bool disconnect, bool reconnect)
+{
+    if (reconnect)
+        gcnDB.reset();
+    if (!EnsureConnection()) {
+        desktop::msgBox(
+            QString::number(lastFailure.number) + u": Could not Initialize Database! - "_s + lastFailure.description,
+            desktop::Icon::Critical);
+        return std::nullopt;
+    }
+    db::Recordset rows(gcnDB);
+    rows.open(select);
+    if (disconnect)
+        rows.disconnect();
+    return rows;
+}
+
+db::Recordset Opened(const QString& select)
+{
+    db::Recordset rows(gConn);
+    rows.open(select);
+    return rows;
+}
+
+QString GetComputerName()
+{
+    return QSysInfo::machineHostName();
+}
+
+}  // namespace kest

@@ -1,0 +1,74 @@
+#include "base/modLoggerEx.h"
+
+#include "platform/Prompt.h"
+#include "platform/files/files.h"
+#include "platform/profile.h"
+
+#include <QDateTime>
+#include <QLocale>
+
+namespace kest {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+constexpr qint64 fullAt = 1'048'576;  // bytes
+constexpr auto lineBreak = "\r\n"_L1;
+
+QString record(int line, const QString& source, const QString& number, const QString& description)
+{
+    const QString now = QLocale::c().toString(QDateTime::currentDateTime(), u"dd/MM/yyyy h:mm:ss AP"_s);
+    return now + u": Line No: "_s + QString::number(line) + lineBreak +  //
+           u"\t\tSource: "_s + source + lineBreak +                      //
+           u"\t\tError Number: "_s + number + lineBreak +                //
+           u"\t\tDescription: "_s + description + lineBreak;
+}
+
+}  // namespace
+
+void LogError(int line, const QString& source, const QString& number, const QString& description, const QString& title,
+              int mode)
+{
+    if (mode == BoxOnly || mode == BoxAndFile)
+        desktop::msgBox(u"Line No: "_s + QString::number(line) + lineBreak + u"Source: "_s + source + lineBreak +
+                            u"Error Number: "_s + number + lineBreak + u"Description: "_s + description,
+                        desktop::Icon::Critical, title);
+    if (mode != BoxAndFile)
+        return;
+
+    const QString text = record(line, source, number, description);
+    if (LogIsFull(ErrorLogPath()))
+        files::write(ErrorLogPath(), text);
+    else
+        files::append(ErrorLogPath(), text);
+}
+
+void LogError(const RuntimeError& error, const QString& source, const QString& title)
+{
+    LogError(0, source, QString::number(error.number()), error.description(), title, BoxAndFile);
+}
+
+bool LogIsFull(const QString& path)
+{
+    return files::exists(path) && files::size(path) >= fullAt;
+}
+
+QString ErrorLogPath()
+{
+    return profile::componentFolder() + u"/kest2error.log"_s;
+}
+
+QString QuoteClean(const QString& text)
+{
+    qsizetype first = 0;
+    qsizetype last = text.size();
+    while (first < last && text[first] == u' ')
+        ++first;
+    while (last > first && text[last - 1] == u' ')
+        --last;
+    QString cleaned = text.mid(first, last - first);
+    return cleaned.replace(u'"', u'\'');
+}
+
+}  // namespace kest

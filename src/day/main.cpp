@@ -1,0 +1,52 @@
+// The command kest2-day: plays the working day on a fresh demo shop, up to and with the step whose name is given.
+#include "day/Day.h"
+#include "platform/RuntimeError.h"
+#include "platform/Prompt.h"
+#include "platform/files/files.h"
+#include "platform/profile.h"
+
+#include <QApplication>
+
+#include <cstdio>
+
+namespace {
+
+constexpr int backgroundWait = 30'000;  // milliseconds
+
+int play(const QStringList& words)
+{
+    using namespace kest;
+    profile::setRoot(words[1]);
+    app::Day day(words[2]);
+    for (const QString& step : app::Day::steps()) {
+        std::puts(qUtf8Printable(step));
+        std::fflush(stdout);
+        day.play(step);
+        if (step.section(u'.', 0, 0) == words.value(3))
+            break;
+    }
+    files::waitForBackground(backgroundWait);
+    return 0;
+}
+
+}  // namespace
+
+int main(int argc, char** argv)
+{
+    if (!qEnvironmentVariableIsSet("QT_QPA_PLATFORM"))
+        qputenv("QT_QPA_PLATFORM", "offscreen");
+    QApplication application(argc, argv);
+    const QStringList words = QCoreApplication::arguments();
+    if (words.size() < 3) {
+        std::fputs("kest2-day PROFILE PICTURES [LAST STEP]\n", stderr);
+        return 2;
+    }
+    try {
+        return play(words);
+    } catch (const kest::desktop::NeedsAnswer& needed) {
+        std::fprintf(stderr, "kest2-day: %s\n", qUtf8Printable(needed.reason()));
+    } catch (const kest::RuntimeError& error) {
+        std::fprintf(stderr, "kest2-day: %s\n", qUtf8Printable(error.description()));
+    }
+    return 1;
+}

@@ -1,0 +1,91 @@
+#include "loopback/TransportWindow.h"
+
+#include "platform/desktop/Window.h"
+
+#include <QHBoxLayout>
+#include <QHeaderView>
+#include <QLabel>
+#include <QPushButton>
+#include <QTime>
+#include <QTreeWidget>
+#include <QVBoxLayout>
+
+namespace kest::app {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+constexpr int mostRows = 2000;
+}
+
+TransportWindow::TransportWindow(const TransportFolders& folders)
+    : Form(u"KESTWeb"_s, u"KESTWeb"_s), runner(folders, [this](const Carry& carry) { tell(carry); })
+{
+    auto* heading = new QLabel(u"C&arried between the shop and the insurer:"_s, this);
+    carriedList = new QTreeWidget(this);
+    carriedList->setObjectName(u"carriedList"_s);
+    carriedList->setAccessibleName(u"Carried files"_s);
+    carriedList->setHeaderLabels({u"Time"_s, u"Direction"_s, u"File"_s, u"What it is"_s});
+    carriedList->setRootIsDecorated(false);
+    carriedList->setUniformRowHeights(true);
+    carriedList->setColumnWidth(0, desktop::pixels(1200));
+    carriedList->setColumnWidth(1, desktop::pixels(1400));
+    carriedList->setColumnWidth(2, desktop::pixels(3900));
+    carriedList->setColumnWidth(3, desktop::pixels(4600));
+    carriedList->header()->setStretchLastSection(false);
+    heading->setBuddy(carriedList);
+
+    status = new QLabel(this);
+    status->setObjectName(u"status"_s);
+    status->setAccessibleName(u"Status"_s);
+    status->setWordWrap(true);
+
+    carryButton = new QPushButton(u"&Carry Now"_s, this);
+    carryButton->setObjectName(u"carryButton"_s);
+    desktop::onEvent(carryButton, &QPushButton::clicked, this, u"KESTWeb.carryNow_clicked"_s,
+                     [this] { runner.carryNow(); });
+    closeButton = new QPushButton(u"C&lose"_s, this);
+    closeButton->setObjectName(u"closeButton"_s);
+    desktop::onEvent(closeButton, &QPushButton::clicked, this, u"KESTWeb.close_clicked"_s, [this] { close(); });
+
+    auto* buttons = new QHBoxLayout;
+    buttons->addWidget(status, 1);
+    buttons->addWidget(carryButton);
+    buttons->addWidget(closeButton);
+    auto* layout = new QVBoxLayout(this);
+    layout->addWidget(heading);
+    layout->addWidget(carriedList);
+    layout->addLayout(buttons);
+    resize(desktop::pixels(11600, 5400));
+}
+
+void TransportWindow::run()
+{
+    const OnTermination termination([this] { close(); });
+    runner.start();
+    desktop::showModal(*this);
+}
+
+void TransportWindow::tell(const Carry& carry)
+{
+    for (const Carried& file : carry.carried)
+        addRow({file.direction == Carried::Out ? u"To insurer"_s : u"To shop"_s, file.file, file.what});
+    for (const QString& fault : carry.faults)
+        addRow({u"Fault"_s, {}, fault});
+    files += int(carry.carried.size());
+    status->setText(u"Last looked at %1; %2 carried so far."_s.arg(
+        QTime::currentTime().toString(u"HH:mm:ss"_s), files == 1 ? u"1 file"_s : u"%1 files"_s.arg(files)));
+}
+
+void TransportWindow::addRow(const QStringList& cells)
+{
+    auto* row = new QTreeWidgetItem(QStringList(QTime::currentTime().toString(u"HH:mm:ss"_s)) + cells);
+    for (int column = 0; column < row->columnCount(); ++column)
+        row->setToolTip(column, row->text(column));
+    carriedList->addTopLevelItem(row);
+    if (carriedList->topLevelItemCount() > mostRows)
+        delete carriedList->takeTopLevelItem(0);
+    carriedList->scrollToItem(row);
+}
+
+}  // namespace kest::app

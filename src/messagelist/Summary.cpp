@@ -1,0 +1,193 @@
+#include "messagelist/Summary.h"
+
+#include "messages/Envelope.h"
+#include "messages/Folders.h"
+#include "platform/RuntimeError.h"
+#include "platform/Prompt.h"
+#include "platform/files/files.h"
+#include "base/Helpers.h"
+#include "base/SharedVariables.h"
+
+#include <utility>
+
+using namespace Qt::StringLiterals;
+
+namespace kest {
+namespace {
+
+constexpr qsizetype unaskedFiles = 25;      // a folder with more of them asks for a filter
+constexpr qsizetype shortestSentText = 30;  // with its wrapping
+
+QString pathOf(int folder)
+{
+    switch (folder) {
+        case Unread:
+            return gsUnreadPath;
+        case Read:
+            return gsReadPath;
+        default:
+            return gsSentPath;
+    }
+}
+
+void settleFilter(int folder, qsizetype fileCount, const FillHooks& hooks)
+{
+    if (folder == Unread) {
+        gsListFilter.clear();
+        return;
+    }
+    if (!gsListFilter.isEmpty() || fileCount <= unaskedFiles || gbFilterAsked)
+        return;
+    gsListFilter =
+        desktop::inputBox(u"Enter a Quote Number to search by (Leave blank for all quotes)"_s, u"View KEST Messages"_s);
+    if (hooks.filterAsked)
+        hooks.filterAsked(gsListFilter);
+    gbFilterAsked = true;
+}
+
+void reportUnreadable(const QString& file)
+{
+    desktop::msgBox("Message "_L1 + file + " unreadable, Please contact MarlinDesk Support."_L1,
+                    desktop::Icon::Critical);
+}
+
+// One fill: its document serves all files, so that the memory in use is that of one file.
+class Fill {
+public:
+    Fill(int chosenFolder, const FillHooks& fillHooks) : folder(chosenFolder), hooks(fillHooks)
+    {
+        SetupDocument(document);
+    }
+
+    void take(const QString& file);
+
+    QList<ListedMessage> listed;
+
+private:
+    bool parse(const QString& path);
+    const xml::Document& prepared();
+
+    QString text;  // of the file in hand, and its document
+    xml::Document document;
+    xml::Document reparsed;
+    int folder;
+    const FillHooks& hooks;
+};
+
+void Fill::take(const QString& file)
+{
+    if (!parse(gsCurFolder + file)) {
+        reportUnreadable(file);
+    } else if (folder == Sent) {
+        listed.append({file, GetMessageRow(prepared(), u"SENT"_s)});
+    } else if (file.startsWith("R_"_L1)) {
+        hooks.submissionResponse(text, file);
+    } else if (file.contains("MDMSG"_L1)) {
+        if (IsMarker(document)) {
+            const xml::Document& marker = prepared();
+            listed.append({file, GetMarkerRow(marker, GetMarkerTypeName(marker))});
+        }
+    } else {
+        const bool held = (folder == Unread && !AllImagesPresent(document)) ||
+                          (IsHeldBehindEarlier(document, listed, file) && folder == Unread);
+        if (!held) {
+            const xml::Document& message = prepared();
+            listed.append({file, GetMessageRow(message, GetMessageTypeName(message))});
+        }
+    }
+}
+
+bool Fill::parse(const QString& path)
+{
+    if (files::size(path) > xml::Document::maximumBytes)
+        return false;
+    text = files::read(path);
+    if (folder != Sent)
+        return ParseWithRepairs(document, text);
+    if (!EscapeAmpersands(text))
+        return false;
+    text = WrappedInRequest(text);
+    return document.loadXML(text) && text.size() >= shortestSentText;
+}
+
+// What rows are drawn from: the document with the schema-instance declaration, which some texts do not survive. The
+// second parse is spared where it would find the same.
+const xml::Document& Fill::prepared()
+{
+    if (IsSameWhenPrepared(text))
+        return document;
+    reparsed = ParsedMessage(text);
+    return reparsed;
+}
+
+}  // namespace
+
+QList<ListedMessage> BuildMessageList(int folder, const FillHooks& hooks)
+{
+    gsCurFolder = pathOf(folder);
+    gsListFolder = gsCurFolder;
+    gdicQuoteRequests.clear();
+    if (!files::folderExists(gsCurFolder))
+        throw RuntimeError(PathNotFound, gsCurFolder + ": the folder is not there"_L1);
+    const QStringList names = files::list(gsCurFolder);
+    settleFilter(folder, names.size(), hooks);
+
+    Fill fill(folder, hooks);
+    qint64 done = 0;
+    for (const QString& file : names) {
+        if (file.endsWith("xml"_L1) && file.contains(gsListFilter) && IsBareName(file)) {
+            try {
+                fill.take(file);
+            } catch (const RuntimeError& error) {
+                throw RuntimeError(error.number(), file + ": "_L1 + error.description(), error.source());
+            }
+        }
+        if (hooks.progress)
+            hooks.progress(++done, names.size());
+    }
+    return std::move(fill.listed);
+}
+
+bool AllImagesPresent(const xml::Document& message)
+{
+    const xml::Node root = message.documentElement();
+    const QList<xml::Node> ids = root.selectNodes(u"rootns:quoteRequestImageIds/*"_s);
+    bool present = ids.isEmpty();
+    for (const xml::Node& id : ids) {
+        const QString number = id.text();
+        if (number.isEmpty())
+            continue;
+        const QString name =
+            root.textOrEmptyOf(u"rootns:quoteRequestNumber"_s) + u'_' + PadZeroLeft(number, 3) + ".jpg"_L1;
+        present = files::isPlainName(name) && files::exists(gsUnreadPath + name);
+        if (!present)
+            return false;
+    }
+    return present;
+}
+
+bool IsHeldBehindEarlier(const xml::Document& message, QList<ListedMessage>& listed, const QString& file)
+{
+    bool held = true;  // also after a failure on the way
+    attempt([&] {
+        const xml::Node root = message.documentElement();
+        xml::Node number = root.selectSingleNode(u"rootns:quoteRequestNumber"_s);
+        if (!number)
+            number = root.selectSingleNode(u"rootns:kestQuoteRequestNumber"_s);
+        if (!number) {
+            held = false;
+            return;
+        }
+        const QString request = number.text();
+        if (gdicQuoteRequests.contains(request) && message.textOf(u"messageType"_s) == "MANQ"_L1) {
+            const QString earlier = gdicQuoteRequests.take(request);
+            listed.removeIf([&](const ListedMessage& one) { return one.file == earlier; });
+        }
+        held = gdicQuoteRequests.contains(request);
+        if (!held)
+            gdicQuoteRequests.insert(request, file);
+    });
+    return held;
+}
+
+}  // namespace kest

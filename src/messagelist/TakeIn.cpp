@@ -1,0 +1,159 @@
+#include "messagelist/TakeIn.h"
+
+#include "messages/Envelope.h"
+#include "platform/RuntimeError.h"
+#include "platform/database/Sql.h"
+#include "platform/Prompt.h"
+#include "platform/files/files.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
+
+#include <QFileInfo>
+
+#include <algorithm>
+
+using namespace Qt::StringLiterals;
+
+namespace kest {
+namespace {
+
+constexpr qsizetype refusalsSaid = 10;  // the others would make a box taller than the screen
+
+enum class Kind { Picture, Description, Message };
+
+// Why a file is refused.
+struct Refusal {
+    QString why;
+};
+
+// One that is none, or whose quote is gone, would end every fill of the list.
+void checkResponse(const xml::Document& document, const QString& name)
+{
+    if (document.textOrEmptyOf(u"rootns:kestQuoteNumber"_s).isEmpty() ||
+        document.textOrEmptyOf(u"rootns:quoteSubmissionStatus"_s).isEmpty())
+        throw Refusal{u"it is no response of the network"_s};
+    if (Opened(sql("SELECT QTNNO FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", name.section(u'_', 1, 1),
+                   name.section(u'_', 2).left(1)))
+            .eof())
+        throw Refusal{u"the quote that it answers is not there"_s};
+}
+
+void checkMessage(const QString& path, const QString& name)
+{
+    if (files::size(path) > xml::Document::maximumBytes)
+        throw Refusal{u"it is too large for a message"_s};
+    QString text = files::read(path);
+    xml::Document document;
+    SetupDocument(document);
+    if (!ParseWithRepairs(document, text))
+        throw Refusal{u"it can't be read as XML"_s};
+    if (name.startsWith("R_"_L1))
+        return checkResponse(document, name);
+    const bool isNetworkMessage = !name.contains("MDMSG"_L1) && GetMessageTypeName(document) != MessageTypeName({});
+    if (!isNetworkMessage && !IsMarker(document))
+        throw Refusal{u"it is no message of the network"_s};
+}
+
+Kind kindOf(const QString& path, const QString& name)
+{
+    if (files::folderExists(path))
+        throw Refusal{u"it is a folder"_s};
+    if (!files::isPlainName(name) || !files::exists(path))
+        throw Refusal{u"there is no such file"_s};
+    if (QFileInfo(path).canonicalPath() == QFileInfo(files::systemPath(gsUnreadPath)).canonicalFilePath())
+        throw Refusal{u"it lies in the unread folder already"_s};
+    if (name.endsWith("xml"_L1)) {
+        checkMessage(path, name);
+        return Kind::Message;
+    }
+    if (name.endsWith(".xml"_L1, Qt::CaseInsensitive))
+        throw Refusal{u"the name of a message ends in small letters, \"xml\""_s};
+    const bool isPicture = files::matches(name, u"*.jpg"_s);
+    if (!isPicture && !files::matches(name, u"*.txt"_s))
+        throw Refusal{u"it is no message, picture (.jpg) or description (.txt)"_s};
+    if (!files::matches(name, u"?*_???*.???"_s))
+        throw Refusal{u"its name is not that of a request's picture, such as 20551_001.jpg"_s};
+    return isPicture ? Kind::Picture : Kind::Description;
+}
+
+bool mayBeWritten(const QString& name)
+{
+    return !files::exists(gsUnreadPath + name) ||
+           desktop::ask(name + " lies in the unread folder already. Replace it?"_L1, desktop::Icon::Question, {},
+                        desktop::Answer::No);
+}
+
+struct Brought {
+    QString path;
+    QString name;
+    Kind kind;
+};
+
+QString counted(int count, const QString& one)
+{
+    return QString::number(count) + u' ' + one + (count == 1 ? QString() : u"s"_s);
+}
+
+}  // namespace
+
+QString TakenIn::summary() const
+{
+    QStringList parts;
+    for (const auto& [count, one] :
+         {std::pair(messages, u"message"_s), {pictures, u"picture"_s}, {descriptions, u"description"_s}})
+        if (count > 0)
+            parts.append(counted(count, one));
+    return parts.isEmpty() ? u"Nothing was taken in."_s : "Taken in: "_L1 + parts.join(", "_L1) + u'.';
+}
+
+QString TakenIn::refusals() const
+{
+    QStringList lines = refused.first(qMin(refusalsSaid, refused.size()));
+    if (refused.size() > refusalsSaid)
+        lines.append(u"and %1 more"_s.arg(refused.size() - refusalsSaid));
+    return "Not taken in:\n"_L1 + lines.join(u'\n');
+}
+
+TakenIn TakeInFiles(const QList<QUrl>& urls, const std::function<void(qint64 done, qint64 total)>& progress)
+{
+    TakenIn result;
+    const auto unlessRefused = [&](const QString& name, const auto& step) {
+        try {
+            step();
+        } catch (const Refusal& refusal) {
+            result.refused.append(name + ": "_L1 + refusal.why);
+        } catch (const RuntimeError& error) {
+            result.refused.append(name + ": "_L1 + error.description());
+        }
+    };
+
+    QList<Brought> brought;
+    for (const QUrl& url : urls) {
+        const QString path = url.toLocalFile();
+        const QString name = QFileInfo(path).fileName();
+        unlessRefused(url.isLocalFile() && !name.isEmpty() ? name : url.toDisplayString(), [&] {
+            if (!url.isLocalFile())
+                throw Refusal{u"it does not lie on this computer"_s};
+            brought.append({path, name, kindOf(path, name)});
+        });
+    }
+    // a message that is listed before its pictures are there would be held back, or loaded without them
+    std::ranges::stable_sort(brought, {}, &Brought::kind);
+
+    qint64 done = 0;
+    for (const auto& [path, name, kind] : std::as_const(brought)) {
+        unlessRefused(name, [&] {
+            if (!mayBeWritten(name))
+                return;
+            files::copy(path, files::pathForWriting(gsUnreadPath, name));
+            ++(kind == Kind::Message ? result.messages : kind == Kind::Picture ? result.pictures : result.descriptions);
+            if (kind == Kind::Message && !name.startsWith("R_"_L1))
+                result.toList.append(name);
+        });
+        if (progress)
+            progress(++done, brought.size());
+    }
+    return result;
+}
+
+}  // namespace kest

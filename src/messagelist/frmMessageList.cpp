@@ -1,0 +1,362 @@
+#include "messagelist/frmMessageList.h"
+
+#include "inbound/modLoadXML.h"
+#include "messages/Folders.h"
+#include "messagelist/MessageListModel.h"
+#include "messagelist/TakeIn.h"
+#include "platform/RuntimeError.h"
+#include "platform/desktop/Progress.h"
+#include "platform/Prompt.h"
+#include "platform/desktop/Window.h"
+#include "platform/files/files.h"
+#include "reports/PrintXML.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
+#include "base/modLoggerEx.h"
+#include "utilities/frmViewXML.h"
+
+#include <QClipboard>
+#include <QDropEvent>
+#include <QGuiApplication>
+#include <QLabel>
+#include <QLineEdit>
+#include <QLocale>
+#include <QMimeData>
+#include <QProgressBar>
+#include <QPushButton>
+#include <QScopedValueRollback>
+#include <QThread>
+#include <QTimer>
+#include <QTreeView>
+
+#include <algorithm>
+
+using namespace Qt::StringLiterals;
+
+namespace kest {
+namespace {
+
+constexpr std::array folderWords{"unread"_L1, "read"_L1, "sent"_L1};
+
+const QLocale& written()
+{
+    static const QLocale locale(QLocale::English, QLocale::Australia);
+    return locale;
+}
+
+}  // namespace
+
+frmMessageList::frmMessageList() : Form(u"frmMessageList"_s, u"KEST Messages"_s)
+{
+    setWindowFlag(Qt::WindowMaximizeButtonHint);
+    setAcceptDrops(true);
+    buildControls();
+    arrange();
+    connectControls();
+}
+
+void frmMessageList::ShowForm()
+{
+    frmMessageList window;
+    window.open();
+    desktop::showModal(window);
+}
+
+void frmMessageList::open()
+{
+    iFolder = Unread;
+    Option1[Unread]->setChecked(true);
+    RefreshList();
+}
+
+void frmMessageList::chooseFolder(int folder)
+{
+    Option1[folder]->setChecked(true);
+    Option1_Click(folder);
+}
+
+void frmMessageList::updateFilter(const QString& filter)
+{
+    txtFilter->setText(filter);
+    Command1_Click();
+}
+
+bool frmMessageList::loadFile(const QString& file)
+{
+    if (!IsBareName(file) || (select(file) && !cmdProcess->isEnabled()))
+        return false;
+    const bool loaded = load(file);
+    if (tmrRefresh->isActive()) {
+        tmrRefresh->stop();
+        QThread::msleep(static_cast<unsigned long>(tmrRefresh->interval()));
+        tmrRefresh_Timer();
+    }
+    return loaded;
+}
+
+bool frmMessageList::reprintFile(const QString& file)
+{
+    if (select(file) && !cmdPrint->isEnabled())
+        return false;
+    sCurFile = file;
+    return cmdPrint_Click();
+}
+
+void frmMessageList::RefreshList()
+{
+    gdicQuoteRequests.clear();
+    fill();
+}
+
+void frmMessageList::fill()
+{
+    const QScopedValueRollback filling(busy, busy + 1);
+    QList<ListedMessage> listed;
+    fillFailure.clear();
+    {
+        desktop::Progress progress(windowTitle(), u"Reading the messages..."_s, prgFill);
+        FillHooks hooks;
+        hooks.submissionResponse = LoadSubmissionResponse;
+        hooks.filterAsked = [this](const QString& filter) { txtFilter->setText(filter); };
+        hooks.progress = [&](qint64 done, qint64 total) { progress.step(done, total); };
+        try {
+            EnsureConnection();
+            listed = BuildMessageList(iFolder, hooks);
+        } catch (const RuntimeError& error) {
+            fillFailure = error.description();
+        }
+    }
+    messages->setMessages(std::move(listed));
+    choose(0);
+    lblStatus->setText(status());
+}
+
+const QList<ListedMessage>& frmMessageList::rows() const
+{
+    return messages->messages();
+}
+
+QString frmMessageList::status() const
+{
+    if (!fillFailure.isEmpty())
+        return "The list could not be filled: "_L1 + fillFailure;
+    const QString matching = gsListFilter.isEmpty() ? QString() : u" with \"%1\" in their name"_s.arg(gsListFilter);
+    const qsizetype all = rows().size();
+    if (all == 0)
+        return "No "_L1 + folderWords[iFolder] + " messages"_L1 + matching;
+    const QString counted = written().toString(all) + (all == 1 ? " message"_L1 : " messages"_L1) + matching;
+    return txtFind->text().isEmpty() ? counted : written().toString(messages->rowCount()) + " of "_L1 + counted;
+}
+
+void frmMessageList::Option1_Click(int index)
+{
+    txtFind->clear();
+    gsListFilter.clear();
+    sCurFile.clear();
+    gbFilterAsked = false;
+    txtFilter->clear();
+    iFolder = index;
+    RefreshList();
+    cmdProcess->setVisible(index == Unread);
+    cmdPrint->setVisible(index == Read);
+    Frame2->setVisible(index != Unread);
+}
+
+void frmMessageList::ListView1_ItemClick(int row)
+{
+    sCurFile = messages->file(row);
+    const QString type = messages->type(row);
+    if (gbTabletLocal)  // on its own database a tablet takes new work only
+        cmdProcess->setEnabled(type == "Quote Request"_L1);
+    cmdPrint->setEnabled(type != "Request for Revised Quote"_L1 && type != "Quote Deletion"_L1 &&
+                         type != "Quote Request Cancellation"_L1);
+}
+
+void frmMessageList::ListView1_DblClick()
+{
+    if (iFolder == Sent)
+        cmdView_Click();
+}
+
+void frmMessageList::cmdProcess_Click()
+{
+    if (hasSelection())
+        load(selectedFile());
+}
+
+bool frmMessageList::load(const QString& file)
+{
+    const QScopedValueRollback loading(busy, busy + 1);
+    try {
+        EnsureConnection();
+        const db::Lock alone(gConn, u"load "_s + file.toUpper());
+        if (!alone.isHeld())
+            desktop::msgBox(u"Message %1 is being loaded on another workstation."_s.arg(file),
+                            desktop::Icon::Information);
+        QString text = alone.isHeld() ? files::read(gsCurFolder + file) : QString();
+        if (!alone.isHeld() || !LoadXML(text, file)) {
+            RefreshList();
+            tmrRefresh->start();
+            return false;
+        }
+        MoveMessage(file, u"read"_s);
+        RefreshList();
+        if (files::exists(gsCurFolder + file))
+            lblStatus->setText(
+                u"%1 is loaded, but could not be moved to the read messages: do not load it again."_s.arg(file));
+        desktop::msgBox(u"Message Loaded"_s);
+        return true;
+    } catch (const RuntimeError& error) {
+        LogError(error, u"frmMessageList.cmdProcess_Click"_s, u"cmdProcess_Click"_s);
+        return false;
+    }
+}
+
+void frmMessageList::tmrRefresh_Timer()
+{
+    if (busy)
+        tmrRefresh->start();
+    else
+        RefreshList();
+}
+
+void frmMessageList::cmdView_Click()
+{
+    if (hasSelection())
+        frmViewXML::ShowForm(selectedFile());
+}
+
+bool frmMessageList::cmdPrint_Click()
+{
+    return PrintXML(sCurFile, true);
+}
+
+void frmMessageList::Command1_Click()
+{
+    gsListFilter = txtFilter->text();
+    gbFilterAsked = true;
+    fill();
+}
+
+void frmMessageList::Command6_Click()
+{
+    if (!hasSelection())
+        return;
+    const QString file = selectedFile();
+    if (!desktop::ask("You are about to remove "_L1 + file + " without loading into the system. Are you SURE ?"_L1,
+                      desktop::Icon::Critical, {}, desktop::Answer::No))
+        return;
+    files::remove(gsCurFolder + file);
+    if (sCurFile == file)
+        sCurFile.clear();
+    RefreshList();
+}
+
+void frmMessageList::txtFind_Change()
+{
+    const QString chosen = selectedFile();
+    messages->search(txtFind->text());
+    if (messages->rowCount() == 0)
+        sCurFile.clear();  // what is not seen can't be reprinted
+    choose(qMax(messages->rowOf(chosen), 0));
+    lblStatus->setText(status());
+}
+
+// A refresh that the user asks for keeps the user's place, other than those that follow a load or a deletion.
+void frmMessageList::Form_KeyRefresh()
+{
+    const QString chosen = selectedFile();
+    RefreshList();
+    choose(qMax(messages->rowOf(chosen), 0));
+}
+
+void frmMessageList::Form_Paste()
+{
+    const QMimeData* clipboard = QGuiApplication::clipboard()->mimeData();
+    if (iFolder != Unread)
+        lblStatus->setText(u"Files are taken in while the unread messages are shown."_s);
+    else if (!clipboard || !clipboard->hasUrls())
+        lblStatus->setText(u"The clipboard holds no files."_s);
+    else
+        takeIn(clipboard->urls());
+}
+
+void frmMessageList::dragEnterEvent(QDragEnterEvent* event)
+{
+    if (iFolder != Unread || busy || !event->mimeData()->hasUrls())
+        return;
+    event->setDropAction(Qt::CopyAction);  // whoever drags must not take the files away
+    event->accept();
+    lblStatus->setText(u"Let go to take the files in."_s);
+}
+
+void frmMessageList::dragLeaveEvent(QDragLeaveEvent*)
+{
+    lblStatus->setText(status());
+}
+
+void frmMessageList::dropEvent(QDropEvent* event)
+{
+    event->setDropAction(Qt::CopyAction);
+    event->accept();
+    // after the drop: a box would keep the program that the files come from waiting
+    QTimer::singleShot(0, this, [this, brought = event->mimeData()->urls()] {
+        desktop::guarded(u"frmMessageList.ListView1_OLEDragDrop"_s, [&] { takeIn(brought); });
+    });
+}
+
+void frmMessageList::takeIn(const QList<QUrl>& brought)
+{
+    const QScopedValueRollback taking(busy, busy + 1);
+    TakenIn taken;
+    {
+        desktop::Progress progress(windowTitle(), u"Taking the files in..."_s, prgFill);
+        taken = TakeInFiles(brought, [&](qint64 done, qint64 total) { progress.step(done, total); });
+    }
+    Form_KeyRefresh();
+    const qsizetype waiting = taken.toList.size() - std::ranges::count_if(rows(), [&](const ListedMessage& message) {
+                                  return taken.toList.contains(message.file);
+                              });
+    const QString held = u" %1 not listed yet: held back by missing pictures or an earlier message."_s;
+    lblStatus->setText(taken.summary() + (waiting > 0 && fillFailure.isEmpty() ? held.arg(waiting) : QString()) + u' ' +
+                       lblStatus->text());
+    if (!taken.refused.isEmpty())
+        desktop::msgBox(taken.refusals(), desktop::Icon::Exclamation);
+}
+
+bool frmMessageList::hasSelection() const
+{
+    const QModelIndex row = ListView1->currentIndex();
+    return row.isValid() && ListView1->selectionModel()->isSelected(row);  // Ctrl+click takes the choice away
+}
+
+QString frmMessageList::selectedFile() const
+{
+    return hasSelection() ? messages->file(ListView1->currentIndex().row()) : QString();
+}
+
+// As a click on the row; nothing where there is none.
+void frmMessageList::choose(int row)
+{
+    ListView1->setCurrentIndex(messages->index(row, 0));
+}
+
+// As a click on the file's row; false where the list does not show it.
+bool frmMessageList::select(const QString& file)
+{
+    const int row = messages->rowOf(file);
+    if (row < 0)
+        return false;
+    choose(row);
+    return true;
+}
+
+// The order that is remembered from the last time is there only now.
+void frmMessageList::showEvent(QShowEvent* event)
+{
+    Form::showEvent(event);
+    if (!event->spontaneous())
+        choose(0);
+}
+
+}  // namespace kest

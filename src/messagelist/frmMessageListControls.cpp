@@ -1,0 +1,192 @@
+// What the list window is made of: its controls, where they stand, and what their events run.
+#include "messagelist/ListSearch.h"
+#include "messagelist/MessageListModel.h"
+#include "messagelist/frmMessageList.h"
+#include "platform/desktop/Lists.h"
+#include "platform/desktop/Window.h"
+
+#include <QGroupBox>
+#include <QHBoxLayout>
+#include <QHeaderView>
+#include <QLabel>
+#include <QLineEdit>
+#include <QProgressBar>
+#include <QPushButton>
+#include <QRadioButton>
+#include <QScreen>
+#include <QScrollBar>
+#include <QShortcut>
+#include <QTimer>
+#include <QTreeView>
+#include <QVBoxLayout>
+
+using namespace Qt::StringLiterals;
+
+namespace kest {
+namespace {
+
+constexpr int refreshDelay = 250;    // milliseconds
+constexpr int listMargin = 210;      // twips, left and right of the list
+constexpr int openingHeight = 9000;  // twips
+constexpr int filterWidth = 1800;    // twips
+constexpr int findWidth = 2700;      // twips
+
+constexpr std::array columnWidths{2328, 3969, 1587, 2293, 3969, 2117, 5292};  // twips
+
+struct Folder {
+    QString caption;
+    QString word;
+};
+
+const std::array<Folder, 3> folders{{{u"U&nread"_s, u"unread"_s}, {u"R&ead"_s, u"read"_s}, {u"&Sent"_s, u"sent"_s}}};
+
+template <class Control>
+Control* named(Control* control, const QString& name, const QString& tip = {})
+{
+    control->setObjectName(name);
+    control->setToolTip(tip);
+    return control;
+}
+
+}  // namespace
+
+void frmMessageList::buildControls()
+{
+    Frame1 = named(new QGroupBox, u"Frame1"_s);
+    Frame1->setAccessibleName(u"Folder"_s);
+    for (size_t i = 0; i < Option1.size(); ++i)
+        Option1[i] = named(new QRadioButton(folders[i].caption), u"Option1(%1)"_s.arg(i),
+                           "Show the "_L1 + folders[i].word + " messages"_L1);
+    Option1[Unread]->setChecked(true);
+
+    Frame2 = named(new QGroupBox, u"Frame2"_s);
+    Frame2->setAccessibleName(u"Filter"_s);
+    Label1 = named(new QLabel(u"&Filter :"_s), u"Label1"_s);
+    txtFilter = named(new QLineEdit, u"txtFilter"_s, u"Show the messages with this text in their file name (Enter)"_s);
+    txtFilter->setMinimumWidth(desktop::pixels(filterWidth));
+    Label1->setBuddy(txtFilter);
+    Command1 = named(new QPushButton(u"&Update"_s), u"Command1"_s, u"Fill the list by the filter"_s);
+    Frame2->setVisible(false);
+
+    txtFind =
+        named(new QLineEdit, u"txtFind"_s, u"Show the rows with this text in any column; or just type in the list"_s);
+    txtFind->setAccessibleName(u"Find"_s);
+    txtFind->setPlaceholderText(u"Find (Ctrl+F)"_s);
+    txtFind->setClearButtonEnabled(true);
+    txtFind->setMinimumWidth(desktop::pixels(findWidth));
+
+    ListView1 = named(new QTreeView, u"ListView1"_s);
+    ListView1->setAccessibleName(u"Messages"_s);
+    messages = new MessageListModel(this);
+    ListView1->setModel(messages);
+    desktop::prepareList(*ListView1, objectName());
+    ListView1->header()->setSortIndicatorClearable(true);  // back to the order of the folder
+    for (size_t i = 0; i < columnWidths.size(); ++i)
+        ListView1->header()->resizeSection(static_cast<int>(i), desktop::pixels(columnWidths[i]));
+    new ListSearch(*ListView1, *txtFind);
+
+    lblStatus = named(new QLabel, u"lblStatus"_s);
+    lblStatus->setTextFormat(Qt::PlainText);  // it shows file names
+    lblStatus->setWordWrap(true);
+    prgFill = named(new QProgressBar, u"prgFill"_s);
+    prgFill->setAccessibleName(u"Progress"_s);
+    prgFill->setVisible(false);
+
+    cmdProcess = named(new QPushButton(u"&Load"_s), u"cmdProcess"_s, u"Take the message into the quotes"_s);
+    cmdPrint = named(new QPushButton(u"Re&print"_s), u"cmdPrint"_s, u"Show the message's report"_s);
+    cmdPrint->setVisible(false);
+    cmdView = named(new QPushButton(u"&View"_s), u"cmdView"_s, u"Show the message's text"_s);
+    Command6 = named(new QPushButton(u"&Delete"_s), u"Command6"_s, u"Remove the message's file (Del)"_s);
+    cmdExit = desktop::exitButton(this, u"cmdExit"_s, u"Close (Esc)"_s);
+
+    tmrRefresh = new QTimer(this);
+    tmrRefresh->setObjectName(u"tmrRefresh"_s);
+    tmrRefresh->setSingleShot(true);
+    tmrRefresh->setInterval(refreshDelay);
+}
+
+void frmMessageList::arrange()
+{
+    auto* options = new QHBoxLayout(Frame1);
+    for (QRadioButton* option : Option1)
+        options->addWidget(option);
+    auto* filter = new QHBoxLayout(Frame2);
+    filter->addWidget(Label1);
+    filter->addWidget(txtFilter);
+    filter->addWidget(Command1);
+
+    auto* top = new QHBoxLayout;
+    top->addWidget(Frame1);
+    top->addWidget(Frame2);
+    top->addStretch();
+    top->addWidget(Command6);
+
+    auto* line = new QHBoxLayout;
+    line->addWidget(lblStatus, 1);
+    line->addWidget(prgFill);
+    line->addWidget(txtFind);
+
+    auto* bottom = new QHBoxLayout;
+    bottom->addWidget(cmdProcess);
+    bottom->addWidget(cmdPrint);
+    bottom->addWidget(cmdView);  // moves to the left where neither of the two is shown
+    bottom->addStretch();
+    bottom->addWidget(cmdExit);
+
+    auto* all = new QVBoxLayout(this);
+    const int margin = desktop::pixels(listMargin);
+    all->setContentsMargins(margin, margin, margin, margin);
+    all->addLayout(top);
+    all->addWidget(ListView1, 1);
+    all->addLayout(line);
+    all->addLayout(bottom);
+
+    const QList<QWidget*> order{Option1[Unread], Option1[Read], Option1[Sent], txtFilter, Command1, ListView1,
+                                txtFind,         cmdProcess,    cmdPrint,      cmdView,   Command6, cmdExit};
+    for (qsizetype i = 1; i < order.size(); ++i)
+        setTabOrder(order[i - 1], order[i]);
+    ListView1->setFocus();
+
+    int width = 2 * margin + ListView1->verticalScrollBar()->sizeHint().width() + 2 * ListView1->frameWidth();
+    for (const int column : columnWidths)
+        width += desktop::pixels(column);
+    resize(QSize(width, desktop::pixels(openingHeight)).boundedTo(screen()->availableSize()));
+}
+
+void frmMessageList::connectControls()
+{
+    const auto on = [this](auto* sender, auto signal, const QString& event, auto routine) {
+        desktop::onEvent(sender, signal, this, "frmMessageList."_L1 + event, routine);
+    };
+    for (size_t i = 0; i < Option1.size(); ++i)
+        on(Option1[i], &QRadioButton::clicked, u"Option1_Click"_s, [this, i] { Option1_Click(static_cast<int>(i)); });
+    on(ListView1->selectionModel(), &QItemSelectionModel::currentRowChanged, u"ListView1_ItemClick"_s,
+       [this](const QModelIndex& current, const QModelIndex&) {
+           if (current.isValid())
+               ListView1_ItemClick(current.row());
+       });
+    on(ListView1, &QTreeView::doubleClicked, u"ListView1_DblClick"_s, [this] { ListView1_DblClick(); });
+    on(cmdProcess, &QPushButton::clicked, u"cmdProcess_Click"_s, [this] { cmdProcess_Click(); });
+    on(cmdView, &QPushButton::clicked, u"cmdView_Click"_s, [this] { cmdView_Click(); });
+    on(cmdPrint, &QPushButton::clicked, u"cmdPrint_Click"_s, [this] { cmdPrint_Click(); });
+    on(Command1, &QPushButton::clicked, u"Command1_Click"_s, [this] { Command1_Click(); });
+    on(txtFilter, &QLineEdit::returnPressed, u"txtFilter_KeyDown"_s, [this] { Command1_Click(); });
+    on(Command6, &QPushButton::clicked, u"Command6_Click"_s, [this] { Command6_Click(); });
+    on(cmdExit, &QPushButton::clicked, u"cmdExit_Click"_s, [this] { close(); });
+    on(tmrRefresh, &QTimer::timeout, u"tmrRefresh_Timer"_s, [this] { tmrRefresh_Timer(); });
+
+    const auto inList = [this](Qt::Key key) {
+        return new QShortcut(key, ListView1, nullptr, nullptr, Qt::WidgetShortcut);
+    };
+    on(inList(Qt::Key_Delete), &QShortcut::activated, u"Command6_Click"_s, [this] { Command6_Click(); });
+    on(inList(Qt::Key_Return), &QShortcut::activated, u"ListView1_DblClick"_s, [this] { ListView1_DblClick(); });
+    on(txtFind, &QLineEdit::textChanged, u"txtFind_Change"_s, [this] { txtFind_Change(); });
+    on(new QShortcut(Qt::Key_F5, this), &QShortcut::activated, u"Form_KeyRefresh"_s, [this] { Form_KeyRefresh(); });
+    on(new QShortcut(QKeySequence::Paste, this), &QShortcut::activated, u"Form_Paste"_s, [this] { Form_Paste(); });
+    on(new QShortcut(QKeySequence::Find, this), &QShortcut::activated, u"Form_Find"_s, [this] {
+        txtFind->setFocus();
+        txtFind->selectAll();
+    });
+}
+
+}  // namespace kest

@@ -1,0 +1,255 @@
+#include "platform/print/Pages.h"
+
+#include "platform/RuntimeError.h"
+#include "platform/desktop/Progress.h"
+#include "platform/print/Report.h"
+
+#include <QAbstractTextDocumentLayout>
+#include <QGuiApplication>
+#include <QPainter>
+#include <QPdfWriter>
+#include <QScreen>
+#include <QTextBlock>
+#include <QTextTable>
+
+#include <algorithm>
+#include <limits>
+
+namespace kest::report {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+constexpr double margin = 15;       // millimetres
+constexpr int pdfResolution = 600;  // dots per inch
+constexpr double gap = 6;           // points between the body and header or footer
+constexpr double pointsPerInch = 72;
+
+double heightOf(const QTextDocument& document)
+{
+    return document.documentLayout()->documentSize().height();
+}
+
+QRectF rectOf(const QTextBlock& block)
+{
+    return block.document()->documentLayout()->blockBoundingRect(block);
+}
+
+}  // namespace
+
+Pages::Pages(const Report& shown, QPagedPaintDevice& onto) : report(shown), device(onto)
+{
+    const double space = gap / pointsPerInch * device.logicalDpiY();
+    const QSizeF paper = device.pageLayout().paintRectPixels(device.logicalDpiX()).size();
+    width = paper.width();
+    height = paper.height();
+    headerHeight = heightOf(*laidOut(report.header(1, 1))) + space;
+    footerHeight = heightOf(*laidOut(report.footer(1, 1))) + space;
+    body = laidOut(report.body());
+    collect(*body->rootFrame());
+    slice();
+}
+
+std::unique_ptr<QTextDocument> Pages::laidOut(const QString& html) const
+{
+    auto document = std::make_unique<QTextDocument>();
+    document->documentLayout()->setPaintDevice(&device);
+    document->setDocumentMargin(0);
+    document->setDefaultFont(QFont(u"Liberation Sans"_s, 9));
+    document->setHtml(html);
+    document->setTextWidth(width);
+    return document;
+}
+
+void Pages::collect(const QTextFrame& frame)
+{
+    for (auto at = frame.begin(); !at.atEnd(); ++at) {
+        if (const auto* table = qobject_cast<const QTextTable*>(at.currentFrame())) {
+            collect(*table);
+        } else if (at.currentFrame()) {
+            collect(*at.currentFrame());
+        } else {
+            const qsizetype first = lines.size();
+            collectLines(at.currentBlock());
+            for (qsizetype i = first; i < lines.size(); ++i)
+                pieces.append({.top = lines[i].first,
+                               .bottom = lines[i].second,
+                               .staysWithNext = at.currentBlock().blockFormat().headingLevel() > 0,
+                               .block = at.currentBlock(),
+                               .line = static_cast<int>(i - first)});
+        }
+    }
+}
+
+void Pages::collect(const QTextTable& table)
+{
+    const QTextTableFormat format = table.format();
+    const double scale = device.logicalDpiY() / QGuiApplication::primaryScreen()->logicalDotsPerInchY();
+    const double above = (format.cellPadding() + format.border()) * scale;
+    QList<double> tops;
+    double end = 0;
+    for (int row = 0; row < table.rows(); ++row) {
+        double top = std::numeric_limits<double>::max();
+        for (int column = 0; column < table.columns(); ++column) {
+            const QTextTableCell cell = table.cellAt(row, column);
+            if (cell.row() != row)
+                continue;
+            top = std::min(top, rectOf(cell.firstCursorPosition().block()).top());
+            for (auto at = cell.begin(); !at.atEnd(); ++at) {
+                if (at.currentBlock().isValid())
+                    collectLines(at.currentBlock());
+            }
+            end = std::max(end, rectOf(cell.lastCursorPosition().block()).bottom());
+        }
+        tops.append(top - above);
+    }
+    tops.append(end + above);
+    const int heads = std::min(format.headerRowCount(), table.rows());
+    for (int row = 0; row < table.rows(); ++row) {
+        Piece piece{.top = tops[row], .bottom = tops[row + 1]};
+        if (row < heads) {
+            piece.bottom = tops[std::min(heads + 1, table.rows())];  // a head stays with its first row
+        } else if (heads > 0) {
+            piece.headTop = tops[0];
+            piece.headBottom = tops[heads];
+        }
+        pieces.append(piece);
+    }
+}
+
+void Pages::collectLines(const QTextBlock& block)
+{
+    const double top = rectOf(block).top();
+    const QTextLayout& layout = *block.layout();
+    for (int i = 0; i < layout.lineCount(); ++i) {
+        const QRectF line = layout.lineAt(i).rect();
+        lines.append({top + line.top(), top + line.bottom()});
+    }
+}
+
+void Pages::slice()
+{
+    for (qsizetype i = pieces.size() - 1; i-- > 0;)
+        if (pieces[i].staysWithNext)
+            pieces[i].bottom = pieces[i + 1].bottom;
+
+    const double room = height - headerHeight - footerHeight;
+    const double end = heightOf(*body);
+    double top = 0;
+    qsizetype first = 0;  // the piece that the page begins with
+    do {
+        Slice page{.top = top, .bottom = end, .firstPiece = first};
+        if (first < pieces.size() && pieces[first].headBottom <= top) {
+            page.headTop = pieces[first].headTop;
+            page.headBottom = pieces[first].headBottom;
+        }
+        const double limit = top + room - (page.headBottom - page.headTop);
+        qsizetype next = first;
+        while (next < pieces.size() && pieces[next].bottom <= limit)
+            ++next;
+        if (next < pieces.size())
+            page.bottom = next > first ? pieces[next].top : lastLineAbove(top, limit);
+        slices.append(page);
+        top = page.bottom;
+        for (first = next; first < pieces.size() && pieces[first].bottom <= top;)
+            ++first;
+    } while (top < end);
+}
+
+/// Where a piece that is taller than a page is cut: below the last whole line.
+double Pages::lastLineAbove(double top, double limit) const
+{
+    double cut = limit;
+    for (bool moved = true; moved;) {
+        moved = false;
+        for (const auto& [lineTop, lineBottom] : lines) {
+            if (lineTop < cut && cut < lineBottom) {
+                cut = lineTop;
+                moved = true;
+            }
+        }
+    }
+    return cut > top ? cut : limit;
+}
+
+void Pages::draw(QPainter& painter, const QTextDocument& document, double at, double from, double to) const
+{
+    if (to <= from)
+        return;
+    painter.save();
+    painter.translate(0, at - from);
+    const QRectF shown(0, from, width, to - from);
+    QAbstractTextDocumentLayout::PaintContext context;
+    const double point = device.logicalDpiY() / pointsPerInch;
+    context.clip = shown.adjusted(0, point, 0, -point);  // what only touches the cut would come on both pages
+    context.palette.setColor(QPalette::Text, Qt::black);
+    painter.setClipRect(shown);
+    document.documentLayout()->draw(&painter, context);
+    painter.restore();
+}
+
+/// The lines of a paragraph that began on the page before, down to the place that is returned. The layout's own drawing
+/// would put the line above the cut here too, hidden but there for whoever searches the file.
+double Pages::drawRestOfParagraph(QPainter& painter, const Slice& slice, double at) const
+{
+    if (slice.firstPiece >= pieces.size() || pieces[slice.firstPiece].line == 0)
+        return slice.top;
+    const QTextBlock& block = pieces[slice.firstPiece].block;
+    const QRectF rect = rectOf(block);
+    painter.save();
+    painter.translate(0, at - slice.top);
+    for (int i = pieces[slice.firstPiece].line; i < block.layout()->lineCount(); ++i)
+        if (const QTextLine line = block.layout()->lineAt(i); rect.top() + line.rect().bottom() <= slice.bottom)
+            line.draw(&painter, rect.topLeft());
+    painter.restore();
+    return std::min(rect.bottom(), slice.bottom);
+}
+
+void Pages::paint(QPainter& painter, int page) const
+{
+    const Slice& slice = slices[page];
+    const auto header = laidOut(report.header(page + 1, count()));
+    draw(painter, *header, 0, 0, heightOf(*header));
+    draw(painter, *body, headerHeight, slice.headTop, slice.headBottom);
+    const double at = headerHeight + slice.headBottom - slice.headTop;
+    const double from = drawRestOfParagraph(painter, slice, at);
+    draw(painter, *body, at + from - slice.top, from, slice.bottom);
+    const auto footer = laidOut(report.footer(page + 1, count()));
+    draw(painter, *footer, height - heightOf(*footer), 0, heightOf(*footer));
+}
+
+void setPaper(QPagedPaintDevice& device)
+{
+    device.setPageLayout(QPageLayout(QPageSize(QPageSize::A4), QPageLayout::Portrait,
+                                     QMarginsF(margin, margin, margin, margin), QPageLayout::Millimeter));
+}
+
+void paint(const Report& report, QPagedPaintDevice& device, int firstPage, int lastPage)
+{
+    const Pages pages(report, device);
+    const int last = lastPage > 0 ? std::min(lastPage, pages.count()) : pages.count();
+    if (firstPage > last)
+        return;  // to begin would bring out an empty page
+    QPainter painter;
+    if (!painter.begin(&device))
+        throw RuntimeError(FileInputOutput, u"The report can't be painted."_s);
+    desktop::Progress progress(report.title(), u"Laying out the pages..."_s);
+    for (int page = firstPage; page <= last; ++page) {
+        if (page > firstPage)
+            device.newPage();
+        pages.paint(painter, page - 1);
+        progress.step(page - firstPage + 1, last - firstPage + 1);
+    }
+}
+
+void writePdf(const Report& report, const QString& systemPath)
+{
+    QPdfWriter writer(systemPath);
+    writer.setResolution(pdfResolution);
+    writer.setTitle(report.title());
+    setPaper(writer);
+    paint(report, writer);
+}
+
+}  // namespace kest::report

@@ -1,0 +1,50 @@
+// Shows a report as it will be printed: pages, zoom, page keys, and the buttons for them.
+#pragma once
+
+#include "platform/print/Report.h"
+
+#include <QWidget>
+
+#include <functional>
+#include <memory>
+#include <optional>
+
+class QAbstractScrollArea;
+class QHBoxLayout;
+class QKeySequence;
+class QLabel;
+class QPrintPreviewWidget;
+class QPrinter;
+
+namespace kest::report {
+
+class Preview final : public QWidget {
+    Q_OBJECT
+public:
+    /// `print` is what the print button does: the view prints nothing by itself.
+    Preview(QWidget* parent, const std::function<void()>& print);
+    ~Preview() override;
+
+    void setReport(Report report);
+    /// The one that was set.
+    const Report& report() const { return shown.value(); }
+
+protected:
+    bool eventFilter(QObject* watched, QEvent* event) override;
+
+private:
+    void addTools(QHBoxLayout& row, const std::function<void()>& print);
+    void addTool(QHBoxLayout& row, const QString& name, const QString& caption, const QString& hint,
+                 const QKeySequence& keys, const std::function<void()>& action);
+    void goTo(int page);
+    void saveAsPdf();
+    void showPage();
+
+    std::optional<Report> shown;
+    std::unique_ptr<QPrinter> paper;
+    QPrintPreviewWidget* view;
+    QAbstractScrollArea* sheet;
+    QLabel* lblPage;
+};
+
+}  // namespace kest::report

@@ -1,0 +1,171 @@
+#include "setup/Profile.h"
+
+#include "setup/DemoShop.h"
+#include "setup/QuoteDatabase.h"
+#include "platform/RuntimeError.h"
+#include "platform/files/files.h"
+#include "platform/profile.h"
+#include "platform/settings/registry.h"
+#include "base/ModRegistry.h"
+#include "base/modDBAccess.h"
+#include "base/modLoggerEx.h"
+
+#include <QDir>
+#include <QLockFile>
+
+namespace kest::app {
+
+using namespace Qt::StringLiterals;
+using settings::Hive;
+
+namespace {
+
+const QString hostKey = u"SOFTWARE\\wirra32\\frmsplash"_s;
+const QString systemKey = u"SOFTWARE\\Microsoft\\Windows NT\\CurrentVersion"_s;
+
+const QString home = u"c:\\wirdoc\\"_s;
+const QString images = u"c:\\wirimg\\"_s;
+const QString reports = u"c:\\wirra32\\report\\"_s;
+const QString databaseName = u"WirSql"_s;
+
+struct Setting {
+    QString key;
+    QString name;
+    QString value;
+};
+
+const QList<Setting>& settingsOfNewProfile()
+{
+    static const QList<Setting> all = {
+        {hostKey, u"EcomHome"_s, home},
+        {hostKey, u"ImagesPath"_s, images},
+        {hostKey, u"ReportPath"_s, reports},
+        {hostKey, u"ServerName"_s, u"(local)"_s},
+        {hostKey, u"DatabaseName"_s, databaseName},
+        {hostKey, u"ClientConnectionType"_s, u"0"_s},
+        {systemKey, u"CurrentVersion"_s, u"10.0"_s},
+    };
+    return all;
+}
+
+void writeSettings()
+{
+    for (const auto& [key, name, value] : settingsOfNewProfile())
+        if (RegGetValue(Hive::LocalMachine, key, name).isEmpty() &&
+            (!settings::createKey(Hive::LocalMachine, key) ||
+             !settings::setValue(Hive::LocalMachine, key, name, {settings::Type::Text, value})))
+            throw RuntimeError(FileInputOutput, u"The setting %1 cannot be written."_s.arg(name));
+}
+
+/// The host's setting, or what a new profile has.
+QString hostSetting(const QString& name)
+{
+    QString ofNewProfile;
+    for (const Setting& setting : settingsOfNewProfile())
+        if (setting.name == name)
+            ofNewProfile = setting.value;
+    return GetRegSetting(u"wirra32"_s, u"frmsplash"_s, name, ofNewProfile, CopyUp::No);
+}
+
+/// A host that starts without a profile leaves settings of its own; only what is made here knows the system's version.
+bool isWhole()
+{
+    return !RegGetValue(Hive::LocalMachine, systemKey, u"CurrentVersion"_s).isEmpty();
+}
+
+void makeFolders()
+{
+    const QString messages = hostSetting(u"EcomHome"_s);
+    for (const QString& folder :
+         {messages + u"AUnread"_s, messages + u"ARead"_s, messages + u"AUnsent"_s, messages + u"ASent"_s,
+          messages + u"PDF"_s, hostSetting(u"ImagesPath"_s), hostSetting(u"ReportPath"_s), profile::componentFolder()})
+        files::makeFolder(folder);
+}
+
+void makeDatabase(bool demo, const QDate& today)
+{
+    // under another name until it is whole: a database of this name is one that a shop works with
+    const QString unfinished = u"unfinished"_s;
+    for (const QString& leftOver : files::list(profile::root() + u"/databases"_s, unfinished + u".db*"_s))
+        files::remove(profile::root() + u"/databases/"_s + leftOver);
+    const db::ConnectionPtr database = openEmbedded(unfinished);
+    database->execute(u"BEGIN"_s);  // nothing is there to keep: one write to the disk instead of hundreds
+    createTables(*database, Dialect::Embedded);
+    fillNewShop(*database);
+    if (demo)
+        fillDemoShop(*database, today);
+    database->execute(u"COMMIT"_s);
+    database->close();
+    files::move(embeddedFile(unfinished), embeddedFile(databaseName));
+}
+
+void rebuildIndexes()
+{
+    const QString folder = profile::root() + u"/databases"_s;
+    for (const QString& file : files::list(folder, u"*.db"_s))
+        attempt([&] { openEmbedded(file.chopped(3))->rebuildIndexes(); });  // a file may be no database
+}
+
+void installTemplates()
+{
+    registerResources();
+    const QDir templates(u":/templates"_s);
+    for (const QString& name : templates.entryList(QDir::Files)) {
+        QFile file(templates.filePath(name));
+        file.open(QIODevice::ReadOnly);
+        const QString place = hostSetting(u"ReportPath"_s) + name;
+        if (!files::exists(place))  // one that is there may be the shop's own
+            files::writeBytes(place, file.readAll());
+    }
+}
+
+}  // namespace
+
+bool initProfile(const std::function<bool()>& registerClass, bool demo, const QDate& today)
+{
+    if (isWhole()) {
+        rebuildIndexes();
+        return false;
+    }
+    files::makeFolder(profile::root());
+    QLockFile making(profile::root() + u"/init.lock"_s);  // another init would take the unfinished database away
+    if (!making.lock())
+        throw RuntimeError(PermissionDenied, u"Nothing can be written in "_s + profile::root());
+    if (isWhole())
+        return false;
+    makeFolders();
+    files::makeFolder(profile::root() + u"/databases"_s);
+    installTemplates();
+    if (!files::exists(embeddedFile(databaseName)))
+        makeDatabase(demo, today);
+    if (demo)
+        putDemoFiles(hostSetting(u"EcomHome"_s), hostSetting(u"ImagesPath"_s), today);
+    if (!registerClass())
+        throw RuntimeError(FileInputOutput, u"The class cannot be entered into the settings."_s);
+    writeSettings();  // last: they tell that the profile is whole
+    return true;
+}
+
+QJsonObject where()
+{
+    const QString messages = hostSetting(u"EcomHome"_s);
+    ReadConnectionSettings();
+    const QString embedded = db::embeddedName(ConnectionText(DriverNumber(CopyUp::No)));
+    const QString database = embedded.isEmpty() ? gsServer + u'/' + gsDatabase : embeddedFile(embedded);
+    const auto folder = [](const QString& path) { return QDir::cleanPath(files::systemPath(path)); };
+    return {
+        {u"profile"_s, profile::root()},
+        {u"database"_s, database},
+        {u"unread"_s, folder(messages + u"AUnread"_s)},
+        {u"read"_s, folder(messages + u"ARead"_s)},
+        {u"unsent"_s, folder(messages + u"AUnsent"_s)},
+        {u"sent"_s, folder(messages + u"ASent"_s)},
+        {u"images"_s, folder(hostSetting(u"ImagesPath"_s))},
+        {u"pdf"_s, folder(messages + u"PDF"_s)},
+        {u"reports"_s, folder(hostSetting(u"ReportPath"_s))},
+        {u"log"_s, QDir::cleanPath(files::systemPath(ErrorLogPath()))},
+        {u"component"_s, profile::componentFolder()},
+    };
+}
+
+}  // namespace kest::app

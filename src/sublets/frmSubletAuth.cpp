@@ -1,0 +1,96 @@
+#include "sublets/frmSubletAuth.h"
+
+#include "sublets/frmViewPDF.h"
+#include "platform/Prompt.h"
+#include "platform/desktop/Lists.h"
+#include "platform/desktop/Window.h"
+
+#include <QHBoxLayout>
+#include <QHeaderView>
+#include <QPushButton>
+#include <QTreeWidget>
+#include <QVBoxLayout>
+
+using namespace Qt::StringLiterals;
+
+namespace kest {
+
+namespace {
+
+constexpr int fileRole = Qt::UserRole;  // the tag: the document's file name
+constexpr int keyRole = Qt::UserRole + 1;
+
+}  // namespace
+
+frmSubletAuth::frmSubletAuth(const QList<SubletDocument>& documents)
+    : Form(u"frmSubletAuth"_s, u"Sublet Authority Documents"_s),
+      folder(SubletFolder()),
+      ListView1(new QTreeWidget),
+      Command1(new QPushButton),
+      Command2(new QPushButton)
+{
+    resize(desktop::pixels(9000, 4800));
+
+    ListView1->setObjectName("ListView1"_L1);
+    ListView1->setAccessibleName(u"Documents"_s);
+    ListView1->setHeaderLabels({u"Description"_s, u"Vendor"_s});
+    desktop::prepareList(*ListView1, objectName());
+    ListView1->header()->resizeSection(0, desktop::pixels(5000));
+    ListView1->header()->setStretchLastSection(true);
+    for (const SubletDocument& document : documents) {
+        auto* item = new QTreeWidgetItem(ListView1, {document.description, document.vendor});
+        item->setData(0, keyRole, u'K' + document.lineNumber);
+        item->setData(0, fileRole, document.file);
+        item->setToolTip(0, document.description);
+        item->setToolTip(1, document.vendor);
+    }
+    ListView1->setCurrentItem(ListView1->topLevelItem(0));
+
+    Command1->setObjectName("Command1"_L1);
+    Command1->setText(u"&Open"_s);
+    Command1->setDefault(true);
+    Command2->setObjectName("Command2"_L1);
+    Command2->setText(u"&Close"_s);
+
+    auto* buttons = new QHBoxLayout;
+    buttons->addStretch();
+    buttons->addWidget(Command1);
+    buttons->addWidget(Command2);
+    auto* layout = new QVBoxLayout(this);
+    layout->addWidget(ListView1);
+    layout->addLayout(buttons);
+
+    desktop::onEvent(Command1, &QPushButton::clicked, this, u"frmSubletAuth.Command1_Click"_s,
+                     [this] { Command1_Click(); });
+    desktop::onEvent(Command2, &QPushButton::clicked, this, u"frmSubletAuth.Command2_Click"_s,
+                     [this] { Command2_Click(); });
+    desktop::onEvent(ListView1, &QTreeWidget::itemDoubleClicked, this, u"frmSubletAuth.ListView1_DblClick"_s,
+                     [this] { Command1_Click(); });
+}
+
+void frmSubletAuth::ShowForm(const QString& QTNNO, const QString& Subquote)
+{
+    const QStringList numbers = SubletDocumentNumbers(QTNNO, Subquote);
+    if (numbers.isEmpty())
+        return;
+    const QList<SubletDocument> documents = SubletDocuments(QTNNO, Subquote, numbers);
+    QJsonArray rows;
+    for (const SubletDocument& document : documents)
+        rows.append(QJsonArray{document.description, document.vendor});
+    desktop::recordWindow({{u"name"_s, u"frmSubletAuth"_s}, {u"rows"_s, rows}});
+    frmSubletAuth form(documents);
+    desktop::showModal(form);
+}
+
+void frmSubletAuth::Command1_Click()
+{
+    for (const QTreeWidgetItem* chosen : ListView1->selectedItems())
+        frmViewPDF::ShowForm(folder + chosen->data(0, fileRole).toString());
+}
+
+void frmSubletAuth::Command2_Click()
+{
+    close();
+}
+
+}  // namespace kest

@@ -1,0 +1,72 @@
+#include "base/ModRegistry.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
+#include "support/ScriptedDesktop.h"
+#include "support/Shop.h"
+
+#include <gtest/gtest.h>
+
+namespace kest {
+namespace {
+
+using namespace Qt::StringLiterals;
+
+void setSetting(const QString& key, const QString& value, const QString& section = u"wirra32\\frmsplash"_s)
+{
+    RegCreateSubKey(settings::Hive::LocalMachine, u"SOFTWARE\\"_s + section);
+    ASSERT_TRUE(RegSetValue(settings::Hive::LocalMachine, u"SOFTWARE\\"_s + section, key, value));
+}
+
+TEST(ConnectionText, NamesDriverServerAndInstance)
+{
+    gsDatabase = u"WirSql"_s;
+    gsSAPwd = u"secret"_s;
+    const auto login = u"Database=WirSql;Uid=sa;Pwd=secret;"_s;
+    const std::tuple<int, QString, QString, QString> cases[] = {
+        {0, u"(local)"_s, u""_s, u"Driver={SQL Server};Server=(local)\\;"_s + login},
+        {1, u"SHOP\\"_s, u"A"_s, u"Driver={SQL Native Client};Server=SHOP\\A;"_s + login},
+        {0, u"SHOP"_s, u"A"_s, u"Driver={SQL Server};Server=SHOP\\A;"_s + login},
+        {2, u"SHOP"_s, u"A"_s, u""_s},
+        {1, u"mysql:db.shop:3307"_s, u"A"_s, u"Driver={MySQL};Server=db.shop;Port=3307;"_s + login}};
+    for (const auto& [driver, server, instance, expected] : cases) {
+        gsServer = server;
+        gsInstance = instance;
+        EXPECT_EQ(ConnectionText(driver), expected);
+    }
+}
+
+class ShopConnection : public test::Shop {};
+
+TEST_F(ShopConnection, ATabletWorksOnTheMasterOrOnItsOwn)
+{
+    setSetting(u"DatabaseName"_s, u"Own"_s);
+    setSetting(u"TabletMasterDatabaseName"_s, u"Master"_s);
+    for (const auto& [useMaster, database, local] :
+         {std::tuple(u"1"_s, u"Master"_s, false), {u"0"_s, u"Own"_s, true}, {u"yes"_s, u"Own"_s, false}}) {
+        setSetting(u"TabletUseMaster"_s, useMaster);
+        OpenDatabase();
+        EXPECT_EQ(gsDatabase, database) << useMaster.toStdString();
+        EXPECT_EQ(gbTabletLocal, local) << useMaster.toStdString();
+    }
+    gbTabletLocal = false;
+}
+
+TEST_F(ShopConnection, AnUnknownDriverNumberOnAnOldSystemOpensNothing)
+{
+    setSetting(u"ClientConnectionType"_s, u"7"_s);
+    setSetting(u"CurrentVersion"_s, u"5.1"_s, u"Microsoft\\Windows NT\\CurrentVersion"_s);
+    OpenDatabase();
+    EXPECT_EQ(GetConnection(), nullptr);
+    setSetting(u"CurrentVersion"_s, u"6.1"_s, u"Microsoft\\Windows NT\\CurrentVersion"_s);
+    EXPECT_NE(GetConnection(), nullptr);
+}
+
+TEST_F(ShopConnection, AMissingDatabaseIsTold)
+{
+    setSetting(u"DatabaseName"_s, u"Nowhere"_s);
+    EXPECT_FALSE(OpenRecordset(u"SELECT * FROM CINFO"_s, false, true));
+    EXPECT_TRUE(desktop->boxTexts().value(0).startsWith(u"-2147467259: Could not Initialize Database! - "_s));
+}
+
+}  // namespace
+}  // namespace kest

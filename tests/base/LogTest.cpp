@@ -1,0 +1,73 @@
+#include "platform/RuntimeError.h"
+#include "platform/files/files.h"
+#include "platform/profile.h"
+#include "base/modLoggerEx.h"
+#include "support/ScriptedDesktop.h"
+#include "support/TestProfile.h"
+
+#include <QDir>
+#include <QRegularExpression>
+
+#include <gtest/gtest.h>
+
+namespace kest {
+namespace {
+
+using namespace Qt::StringLiterals;
+
+class ErrorLog : public ::testing::Test {
+protected:
+    ErrorLog() { files::makeFolder(profile::componentFolder()); }
+    static void report(int mode) { LogError(7, u"modX.LoadY"_s, u"94"_s, u"Null here"_s, u"LoadY"_s, mode); }
+
+    test::TestProfile profile;
+    test::ScriptedDesktop desktop;
+};
+
+TEST_F(ErrorLog, TheModeChoosesBoxAndRecord)
+{
+    const std::tuple<int, qsizetype, int> cases[] = {
+        {2, 0, 0}, {BoxOnly, 1, 0}, {BoxAndFile, 2, 1}, {BoxAndFile, 3, 2}};
+    for (const auto& [mode, boxes, records] : cases) {
+        report(mode);
+        EXPECT_EQ(desktop.boxes().size(), boxes) << mode;
+        ASSERT_EQ(files::exists(ErrorLogPath()), records > 0) << mode;
+        const QString log = records ? files::read(ErrorLogPath()) : QString();
+        EXPECT_TRUE(
+            QRegularExpression(
+                u"^(\\d\\d/\\d\\d/\\d{4} \\d\\d?:\\d\\d:\\d\\d [AP]M: Line No: 7\r\n\t\tSource: modX\\.LoadY\r\n"
+                "\t\tError Number: 94\r\n\t\tDescription: Null here\r\n){%1}$"_s.arg(records))
+                .match(log)
+                .hasMatch())
+            << log.toStdString();
+    }
+    EXPECT_EQ(desktop.boxes().last(),
+              u"critical|LoadY|Line No: 7\r\nSource: modX.LoadY\r\nError Number: 94\r\nDescription: Null here|ok"_s);
+}
+
+TEST_F(ErrorLog, AFullFileStartsAnew)
+{
+    EXPECT_FALSE(LogIsFull(ErrorLogPath()));
+    files::write(ErrorLogPath(), QString(1'048'575, u'x'));
+    report(BoxAndFile);
+    EXPECT_GT(files::size(ErrorLogPath()), 1'048'576);
+    files::write(ErrorLogPath(), QString(1'048'576, u'x'));
+    report(BoxAndFile);
+    EXPECT_LT(files::size(ErrorLogPath()), 200);
+}
+
+TEST_F(ErrorLog, AnUnwritableFileEndsTheCallersPathAfterTheBox)
+{
+    ASSERT_TRUE(QDir(profile::componentFolder()).removeRecursively());
+    EXPECT_THROW(report(BoxAndFile), RuntimeError);
+    EXPECT_EQ(desktop.boxes().size(), 1);
+}
+
+TEST(QuoteClean, TrimsBlanksAndTurnsDoubleQuotes)
+{
+    EXPECT_EQ(QuoteClean(u"  6\" \"bar\"\t "_s), u"6' 'bar'\t"_s);
+    EXPECT_EQ(QuoteClean(u"   "_s), u""_s);
+}
+
+}  // namespace
+}  // namespace kest

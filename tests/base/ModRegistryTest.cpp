@@ -1,0 +1,63 @@
+#include "base/ModRegistry.h"
+#include "support/TestProfile.h"
+
+namespace kest {
+namespace {
+
+using namespace Qt::StringLiterals;
+using settings::Hive;
+using settings::Type;
+
+const QString splash = u"SOFTWARE\\wirra32\\frmsplash"_s;
+
+class Settings : public ::testing::Test {
+protected:
+    static void machineWide(const QString& name, const settings::Value& value)
+    {
+        ASSERT_TRUE(settings::createKey(Hive::LocalMachine, splash));
+        ASSERT_TRUE(settings::setValue(Hive::LocalMachine, splash, name, value));
+    }
+    static QString stored(const QString& name) { return RegGetValue(Hive::LocalMachine, splash, name); }
+    static bool store(const QString& name, const QString& text)
+    {
+        return RegSetValue(Hive::LocalMachine, splash, name, text);
+    }
+    static QString setting(const QString& fallback, CopyUp copyUp = CopyUp::Yes)
+    {
+        return GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"EcomHome"_s, fallback, copyUp);
+    }
+
+    test::TestProfile profile;
+};
+
+TEST_F(Settings, AMachineWideValueComesBeforeTheUsersAndTheDefaultWhichTheFirstReadFixes)
+{
+    EXPECT_EQ(setting(u"default"_s, CopyUp::No), u"default"_s);
+    EXPECT_EQ(setting(u""_s), u""_s);
+    EXPECT_FALSE(settings::keyExists(Hive::LocalMachine, splash));
+    settings::setUserSetting(u"wirra32"_s, u"frmsplash"_s, u"EcomHome"_s, u"user"_s);
+    EXPECT_EQ(setting(u"default"_s, CopyUp::No), u"user"_s);
+    machineWide(u"EcomHome"_s, {Type::Text, u""_s});
+    EXPECT_EQ(setting(u"default"_s), u"user"_s);
+    settings::setUserSetting(u"wirra32"_s, u"frmsplash"_s, u"EcomHome"_s, u"changed"_s);
+    EXPECT_EQ(setting(u"elsewhere"_s), u"user"_s);
+}
+
+TEST_F(Settings, AValueIsReadAndWrittenByItsType)
+{
+    EXPECT_FALSE(store(u"a"_s, u"1"_s)) << "the key must be there";
+    machineWide(u"number"_s, {Type::Number, u"0x1A"_s});
+    machineWide(u"binary"_s, {Type::Binary, u"00ff"_s});
+    machineWide(u"long"_s, {Type::Text, QString(2000, u'x')});
+    EXPECT_EQ(stored(u"NUMBER"_s), u"26"_s);
+    EXPECT_EQ(stored(u"binary"_s), u""_s);
+    EXPECT_EQ(stored(u"long"_s).size(), 1023);
+    EXPECT_TRUE(store(u"number"_s, u"11.9 pieces"_s));
+    EXPECT_FALSE(store(u"number"_s, u"1e999"_s));
+    EXPECT_TRUE(store(u"text"_s, u"12"_s));
+    EXPECT_EQ(settings::query(Hive::LocalMachine, splash, u"number"_s), (settings::Value{Type::Number, u"12"_s}));
+    EXPECT_EQ(settings::query(Hive::LocalMachine, splash, u"text"_s), (settings::Value{Type::Text, u"12"_s}));
+}
+
+}  // namespace
+}  // namespace kest

@@ -1,0 +1,180 @@
+#include "setup/Profile.h"
+#include "day/Day.h"
+#include "jobexport/JobLinkSettings.h"
+#include "platform/files/files.h"
+#include "platform/values.h"
+#include "base/CredentialCipher.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
+#include "shell/component.h"
+#include "support/Cases.h"
+#include "support/MariaDbServer.h"
+#include "support/Snapshot.h"
+#include "support/TestProfile.h"
+
+#include <QDir>
+#include <QImage>
+#include <QJsonObject>
+#include <QMap>
+
+#include <gtest/gtest.h>
+
+#include <functional>
+
+namespace kest::test {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+constexpr int backgroundWait = 5000;  // milliseconds
+
+/// What a clerk would look at, by what it is: quotes with their notes and lines, files, the jobs in JobLink.
+using Holdings = QMap<QString, QString>;
+
+/// The columns of each row by its first one.
+void addRows(Holdings& all, db::Recordset rows)
+{
+    for (; !rows.eof(); rows.moveNext()) {
+        QStringList values;
+        for (const QString& column : rows.columns().sliced(1))
+            values << column + u' ' + (rows.text(column).isEmpty() ? u"-"_s : rows.text(column));
+        all[rows.text(rows.columns().first())] =
+            values.join(u", "_s).replace(shortDate(QDate::currentDate()), u"today"_s);
+    }
+}
+
+Holdings found(const MariaDbServer& server)
+{
+    Holdings all;
+    addRows(all, Opened(u"SELECT QTNNO||'/'||Subquote AS name, Job_stage AS stage, ReadOnly AS locked, "
+                        "KESTQRNo AS request, KESTQRVer AS version, KESTQuoteNo AS network, KESTAuthNo AS authority, "
+                        "TOTAL AS labour, PRTTOTAL AS parts, MISTOTAL AS miscellaneous, excess, "
+                        "contri AS contribution FROM QUOTE1 WHERE QTNNO>'1028'"_s));
+    addRows(all, Opened(u"SELECT QTNNO||'/'||Subquote||' texts' AS name, remarks FROM QUOTE3 "
+                        "WHERE QTNNO>'1028'"_s));
+    addRows(all, Opened(u"SELECT QTNNO||'/'||Subquote||' '||category||' '||script AS name, SEQ_NO, rrhour, rahour, "
+                        "pthour, rr_rate2, qty, unitcost, itemno, tosend FROM QUOTE2 WHERE QTNNO>'1028'"_s));
+    const auto jobLink = std::make_shared<db::Connection>();
+    jobLink->open(server.connectionText(u"jobs"_s));
+    db::Recordset jobs(jobLink);
+    jobs.open(
+        u"SELECT CONCAT('job ', nJobID_PK) AS name, Status, JobNr, custName, vehReg, COUNT(nJobDtlID_PK) AS details, "
+        "SUM(lineSale) AS sale FROM newJob JOIN newJobHdr h ON h.nJobID_FK=nJobID_PK "
+        "JOIN newJobDtl d ON d.nJobID_FK=nJobID_PK GROUP BY nJobID_PK, Status, JobNr, custName, vehReg"_s);
+    addRows(all, std::move(jobs));
+    for (const auto& [name, path] : {std::pair(u"unread "_s, gsUnreadPath),
+                                     {u"read "_s, gsReadPath},
+                                     {u"unsent "_s, gsUnsentPath},
+                                     {u"sent "_s, gsSentPath},
+                                     {u"PDF "_s, gsReadPath + u"..\\PDF\\"_s},
+                                     {u"images "_s, gsImagesPath}})
+        for (const QString& file : files::list(path))
+            all[name + file];
+    return all;
+}
+
+QStringList changes(const Holdings& before, const Holdings& after)
+{
+    QStringList lines;
+    for (auto was = before.begin(); was != before.end(); ++was)
+        if (!after.contains(was.key()))
+            lines << u"- "_s + was.key();
+    for (auto is = after.begin(); is != after.end(); ++is)
+        if (!before.contains(is.key()) || before[is.key()] != *is)
+            lines << (u"+ "_s + is.key() + (is->isEmpty() ? QString() : u": "_s + *is));
+    return lines;
+}
+
+/// The boxes with their exact texts, the reports and documents, and the rows of each list that was read.
+QStringList told(const desktop::Record& record)
+{
+    QStringList lines;
+    for (const QJsonValue box : record.boxes)
+        lines << u"box %1: %2"_s.arg(box[u"icon"].toString(), box[u"text"].toString().replace(u"\r\n"_s, u" / "_s));
+    for (const QJsonValue window : record.windows)
+        if (window[u"name"] == u"frmPrintPreview"_s)
+            lines << u"report %1: %2 rows"_s.arg(window[u"report"].toInt())
+                         .arg(window[u"table"][u"rows"].toArray().size());
+    for (const QJsonValue read : record.reads)
+        for (const QJsonValue row : read[u"values"][u"ListView1"][u"rows"].toArray()) {
+            QStringList cells;
+            for (const QJsonValue cell : row.toArray())
+                cells << cell.toString();
+            lines << u"row "_s + cells.join(u" | "_s);
+        }
+    return lines;
+}
+
+/// The expected lines of each step, from a text in which "== step" heads those of a step.
+QMap<QString, QStringList> expectedSteps()
+{
+    QMap<QString, QStringList> steps;
+    QString step;
+    for (const QString& line : test::linesOf("app/day.txt"))
+        if (line.startsWith(u"== "_s))
+            steps[step = line.sliced(3)];
+        else
+            steps[step] << line;
+    return steps;
+}
+
+/// Every window and every report has a picture with something on it.
+void checkPictures(const QDir& pictures)
+{
+    const QStringList windows{u"comparison"_s, u"extra-information"_s, u"login"_s,        u"messages"_s,
+                              u"panel"_s,      u"sublet-document"_s,   u"text"_s,         u"transport"_s,
+                              u"utilities"_s,  u"report-1-710"_s,      u"report-1-720"_s, u"report-1-730"_s};
+    for (const QString& window : windows)
+        EXPECT_FALSE(pictures.entryList({u"*-"_s + window + u".png"_s}).isEmpty()) << window.toStdString();
+    for (const QString& file : pictures.entryList(QDir::Files)) {
+        const QImage picture(pictures.filePath(file));
+        QImage blank = picture;
+        blank.fill(picture.pixelColor(0, 0));
+        EXPECT_FALSE(picture == blank) << file.toStdString();
+    }
+}
+
+using Look = std::function<void(const QString& step, const desktop::Record& shown)>;
+
+/// Plays the day in a shop of its own, looks after each step, and tells what the shop holds at the end.
+std::string played(const MariaDbServer& server, const Look& look)
+{
+    const TestProfile profile;
+    const QDir pictures(profile.root() + u"/pictures"_s);
+    app::initProfile(registerClass, true);
+    app::Day day(pictures.path());
+    InitCipherKey();
+    StoreJobLinkSettings({u"127.0.0.1"_s, server.port(), u"jobs"_s, server.user(), server.password()});
+    for (const QString& step : app::Day::steps()) {
+        const desktop::Record shown = day.play(step);
+        files::waitForBackground(backgroundWait);
+        look(step, shown);
+    }
+    checkPictures(pictures);
+    return holdings();
+}
+
+}  // namespace
+
+TEST(Day, LeavesAfterEachStepWhatItShouldAndTheSameEachTime)
+{
+    const QMap<QString, QStringList> expected = expectedSteps();
+    EXPECT_EQ(app::Day::steps(), expected.keys());
+    MariaDbServer server;
+    server.createDatabase(u"jobs"_s, files::read(QStringLiteral(KEST_SOURCE_DIR "/sql/joblink.sql")));
+
+    Holdings before;
+    const std::string first = played(server, [&](const QString& step, const desktop::Record& shown) {
+        const Holdings after = found(server);
+        QStringList lines = told(shown);
+        if (!before.isEmpty() && !step.endsWith(u".sql"_s))
+            lines << changes(before, after);
+        before = after;
+        EXPECT_EQ(expected[step].join(u'\n').toStdString(), lines.join(u'\n').toStdString()) << step.toStdString();
+    });
+    const std::string again = played(server, [](const QString&, const desktop::Record&) {});
+    EXPECT_TRUE(first == again) << difference(first, again);
+}
+
+}  // namespace kest::test

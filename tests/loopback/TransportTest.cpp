@@ -1,0 +1,243 @@
+#include "loopback/Transport.h"
+#include "app/TransportCommand.h"
+#include "outbound/SendQuote.h"
+#include "platform/profile.h"
+#include "support/Shop.h"
+
+#include <QFile>
+
+namespace kest::test {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+const QDate today(2008, 3, 21);
+
+/// A shop with a quote that can be sent, and the transport beside it.
+class Loopback : public Shop {
+protected:
+    Loopback()
+    {
+        desktop.emplace(R"({"boxes":[{"text":"DELETED","answer":"yes"}]})");
+        quote("1004").request("20504").note("Active Quote Request");
+        fill(quote("1004").line(1, "R&R", "Bumper"), "rrhour=2 rr_rate2=50");
+        fill(quote("1004").line(2, "RA", "Guard"), "rahour=3 rr_rate2=50");
+        fill(quote("1004").line(3, "PAINT", "Guard"), "pthour=1 rr_rate2=50");
+        fill(quote("1004").line(4, "PRT", "Lamp"), "qty=1 unitcost=80 rrhour=100");
+        rules({});
+        restart();
+    }
+
+    void restart() { transport.emplace(folders()); }
+    static app::TransportFolders folders()
+    {
+        return {gsUnreadPath, gsUnsentPath, gsSentPath, profile::componentFolder() + u'/'};
+    }
+    void rules(const QString& text) { files::write(folders().own + app::Transport::rulesName, text); }
+
+    /// What was carried, as "out file" and "in file"; faults fail the test.
+    std::string carried()
+    {
+        const app::Carry carry = transport->carry(today);
+        EXPECT_EQ(carry.faults, QStringList());
+        QStringList all;
+        for (const app::Carried& file : carry.carried)
+            all << (file.direction == app::Carried::Out ? u"out "_s : u"in "_s) + file.file;
+        return all.join(u", "_s).toStdString();
+    }
+    std::string faults() { return transport->carry(today).faults.join(u'\n').toStdString(); }
+
+    static bool send()
+    {
+        bool sent = false;
+        if (OpenHostQuote(u"1004"_s, u"0"_s))
+            SendQuote(*grsQuote, &sent);
+        return sent;
+    }
+    /// Loads the one message that is listed, and gives its type.
+    static std::string loadOne()
+    {
+        const QStringList files = listed();
+        EXPECT_EQ(files.size(), 1) << files.join(u' ').toStdString();
+        EXPECT_TRUE(loadAsTheWindow(files.value(0)));
+        return files.value(0).section(u'_', 2, 2).toStdString();
+    }
+    static std::string in(const QString& folder) { return files::list(folder).join(u' ').toStdString(); }
+
+    std::optional<app::Transport> transport;
+};
+
+}  // namespace
+
+TEST_F(Loopback, ASentQuoteIsCarriedAndAnswered)
+{
+    ASSERT_TRUE(send());
+    const QString document = files::read(gsUnsentPath + u"1004.0_1.xml"_s);
+    EXPECT_EQ(carried(), "out 1004.0_1.xml, in R_1004_0_600002.xml");
+    EXPECT_EQ(in(gsUnsentPath), "");
+    EXPECT_EQ(files::read(gsSentPath + u"1004.0_1.xml"_s), document);
+
+    EXPECT_EQ(listed(), QStringList());
+    EXPECT_EQ(quote("1004").state(),
+              "3 locked 600002 (today : Submitted KEST Quote) (01/02/2008 : Responded Quote Request)");
+    EXPECT_EQ(carried(), "") << "a second carry has nothing to do";
+}
+
+TEST_F(Loopback, EachMessageHasTheEffectThatItsTypeTells)
+{
+    ASSERT_TRUE(send());
+    carried();
+    const QString answer = files::list(gsUnreadPath).value(0);
+    const QString text = files::read(gsUnreadPath + answer);
+    for (const auto& [step, type, stage, note] : casesIn<4>("loopback/effects.txt")) {
+        files::write(gsUnreadPath + answer, text);
+        listed();
+        rules(u"on start quote=1004 claim=7701004\n  "_s + step);
+        carried();
+        EXPECT_EQ(loadOne(), type.toStdString());
+        listed();  // an old answer would lock the quote again
+        const QString state = QString::fromStdString(quote("1004").state());
+        EXPECT_TRUE(state.startsWith(stage + u' ') && state.contains(u" : %1)"_s.arg(note))) << state.toStdString();
+    }
+    EXPECT_EQ(desktop->boxes().filter(u"critical|"_s), QStringList());
+}
+
+TEST_F(Loopback, AStepWaitsUntilTheShopHasDealtWithTheOneBefore)
+{
+    rules(u"on start\n  request number=20777 pictures=1\n  cancel\n  reinstate wait=1\n"_s);
+    EXPECT_EQ(carried(), "in 20777_001.jpg, in 20777_001.txt, in WEB_000001_QREQ_20777.xml");
+    EXPECT_EQ(carried(), "");
+    EXPECT_EQ(loadOne(), "QREQ");
+    EXPECT_EQ(carried(), "in WEB_000002_QRCN_20777.xml");
+    files::remove(gsUnreadPath + u"WEB_000002_QRCN_20777.xml"_s);
+    EXPECT_EQ(carried(), "") << "it waits one carry longer";
+    EXPECT_EQ(carried(), "in WEB_000003_BCQR_20777.xml");
+    EXPECT_EQ(carried(), "");
+}
+
+TEST_F(Loopback, AQuoteSentAgainFollowsItsNextRuleAndHasOneAnswer)
+{
+    rules(u"on quote 1004\n  revise\n  adjust\non quote 1004\n  adjust\n"_s);
+    ASSERT_TRUE(send());
+    carried();
+    listed();
+    carried();
+    EXPECT_EQ(loadOne(), "RRQT");
+    EXPECT_EQ(in(gsUnreadPath), "");
+    ASSERT_TRUE(send());
+    EXPECT_EQ(carried(), "out 1004.0_2.xml, in R_1004_0_600003.xml");
+    EXPECT_EQ(carried(), "in WEB_000002_ADQT_1004.xml") << "what the first rule had left is over";
+}
+
+TEST_F(Loopback, APictureAndItsDocumentGoTogether)
+{
+    const QString document = u"<request><kestQuoteNumber>1004/0</kestQuoteNumber></request>"_s;
+    files::write(gsUnsentPath + u"I_1004_0001.xml"_s, document);
+    files::write(gsUnsentPath + u"I_1004_0002.jpg"_s, u"picture"_s);
+    EXPECT_EQ(carried(), "");
+    files::write(gsUnsentPath + u"I_1004_0001.JPG"_s, u"picture"_s);
+    files::write(gsSentPath + u"I_1004_0001.jpg"_s, u"of an earlier send"_s);
+    EXPECT_EQ(carried(), "out I_1004_0001.JPG, out I_1004_0001.xml");
+    EXPECT_EQ(files::read(gsSentPath + u"I_1004_0001.jpg"_s), u"picture"_s);
+    EXPECT_EQ(in(gsUnsentPath), "I_1004_0002.jpg");
+}
+
+TEST_F(Loopback, WhatCannotBeSentStaysAndIsToldOnceForEachChange)
+{
+    for (const QString& text :
+         {u"<quoteBody>"_s, QString(), u"\u0001\u00ff&"_s, sentDocument(""), sentDocument("1004/12"),
+          sentDocument("../1004/0"), sentDocument("10_04/0"), u"<!DOCTYPE x []><quoteBody/>"_s}) {
+        files::write(gsUnsentPath + u"odd.xml"_s, text);
+        EXPECT_TRUE(faults().starts_with("odd.xml")) << text.toStdString();
+        EXPECT_EQ(faults(), "") << text.toStdString();
+        EXPECT_EQ(files::read(gsUnsentPath + u"odd.xml"_s), text);
+    }
+    files::write(gsUnsentPath + u"I_odd.xml"_s, u"<request>"_s);
+    files::write(gsUnsentPath + u"I_odd.jpg"_s, {});
+    EXPECT_NE(faults(), "");
+    files::remove(gsUnsentPath + u"I_odd.xml"_s);
+
+    ASSERT_TRUE(send());
+    files::write(gsSentPath + u"1004.0_1.xml"_s, u"another"_s);
+    EXPECT_EQ(faults(), "1004.0_1.xml: a document of this name was sent already");
+    EXPECT_EQ(files::read(gsSentPath + u"1004.0_1.xml"_s), u"another"_s);
+    EXPECT_EQ(in(gsUnreadPath), "");
+}
+
+TEST_F(Loopback, WhatFailedIsDoneAgainWithTheSameNumbers)
+{
+    ASSERT_TRUE(send());
+    for (const QString& folder : {gsSentPath, gsUnreadPath}) {
+        const QFile::Permissions read = QFile::ReadOwner | QFile::ExeOwner;
+        ASSERT_TRUE(QFile::setPermissions(files::systemPath(folder), read));
+        for (int twice = 0; twice < 2; ++twice) {
+            EXPECT_NE(faults(), "");
+            restart();
+        }
+        EXPECT_EQ(in(gsUnreadPath), "") << "no answer to a quote that has not gone";
+        EXPECT_EQ(in(gsUnsentPath), folder == gsSentPath ? "1004.0_1.xml" : "");
+        ASSERT_TRUE(QFile::setPermissions(files::systemPath(folder), read | QFile::WriteOwner));
+    }
+    EXPECT_EQ(carried(), "in R_1004_0_600002.xml");
+}
+
+TEST_F(Loopback, RulesWithAFaultStopEverythingUntilTheyAreMended)
+{
+    rules(u"on quote 1004\n  nothing\n"_s);
+    ASSERT_TRUE(send());
+    EXPECT_NE(faults().find("insurer.rules: line 2: "), std::string::npos);
+    EXPECT_EQ(faults(), "");
+    EXPECT_EQ(in(gsUnsentPath), "1004.0_1.xml");
+    rules(u"on quote 1004\n  authorise\n  waive\n"_s);
+    carried();
+    EXPECT_EQ(faults(), "insurer.rules, line 1, quote 1004, authorise: the claim is not known; say it with claim=");
+    EXPECT_EQ(faults(), "");
+}
+
+TEST_F(Loopback, TheSameSeedSendsTheSameWhateverComesBetween)
+{
+    ASSERT_TRUE(send());
+    const QByteArray document = files::readBytes(gsUnsentPath + u"1004.0_1.xml"_s);
+    const auto run = [&](const QString& seed, bool restarting) {
+        QMap<QString, QByteArray> sent;
+        rules(seed +
+              u"\non start\n  request pictures=1\non quote 1004 claim=1\n"
+              "  adjust change=2 add=2\n  authorise change=1 sublet=1\n"_s);
+        files::writeBytes(gsUnsentPath + u"1004.0_1.xml"_s, document);
+        for (int i = 0; i < 5; ++i) {
+            if (restarting || i == 0)
+                restart();
+            carried();
+            for (const QString& file : files::list(gsUnreadPath)) {
+                sent[file] = files::readBytes(gsUnreadPath + file);
+                files::remove(gsUnreadPath + file);
+            }
+        }
+        files::remove(gsSentPath + u"1004.0_1.xml"_s);
+        files::remove(folders().own + app::Transport::stateName);
+        return sent;
+    };
+    const auto once = run(u"seed 20551"_s, false);
+    EXPECT_EQ(once.size(), 6);
+    EXPECT_EQ(run(u"seed 20551"_s, true), once);
+    EXPECT_NE(run(u"seed 20552"_s, false), once);
+}
+
+TEST_F(Loopback, TheWindowShowsWhatIsCarriedAndASecondOneSaysSo)
+{
+    desktop.emplace(R"({"windows":{"KESTWeb":[[{"click":"carryButton"}, {"read":["carriedList","status"]},
+        {"key":"KESTWeb","keys":"Alt+L"}]]}})");
+    ASSERT_TRUE(send());
+    EXPECT_TRUE(app::runTransport(app::TransportMode::Window, {}));
+    EXPECT_EQ(desktop->read(u"carriedList"_s, u"rows"_s)[0][2].toString(), u"1004.0_1.xml"_s);
+    EXPECT_TRUE(desktop->read(u"status"_s).toString().endsWith(u"2 files carried so far."_s));
+
+    app::TransportRunner first(folders(), [](const app::Carry&) {});
+    ASSERT_TRUE(first.claim());
+    EXPECT_FALSE(app::runTransport(app::TransportMode::Window, {}));
+    EXPECT_EQ(desktop->boxTexts().last(), u"KESTWeb is running already."_s);
+    EXPECT_FALSE(app::runTransport(app::TransportMode::Once, {}));
+}
+
+}  // namespace kest::test

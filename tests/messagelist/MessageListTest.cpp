@@ -1,0 +1,291 @@
+#include "messagelist/frmMessageList.h"
+#include "platform/script/Gestures.h"
+#include "support/Hands.h"
+#include "support/Shop.h"
+
+#include <QClipboard>
+#include <QDropEvent>
+#include <QGuiApplication>
+#include <QHeaderView>
+#include <QLabel>
+#include <QMimeData>
+#include <QTreeView>
+
+using namespace Qt::StringLiterals;
+
+namespace kest::test {
+namespace {
+
+class MessageListWindow : public Shop {
+protected:
+    /// Opens the window, carries out the steps, and closes it.
+    void visit(const QStringList& steps, const QString& answers = u"\"boxes\": []"_s)
+    {
+        desktop.emplace(
+            u"{\"windows\": {\"frmMessageList\": [[%1]], \"frmViewXML\": [[{\"read\": [\"txtXML\"]}]]}, %2}"_s
+                .arg(steps.join(u','), answers)
+                .toUtf8());
+        frmMessageList::ShowForm();
+    }
+
+    /// What the numbered reading step saw of a control.
+    QJsonValue seen(int reading, const QString& control, const QString& what) const
+    {
+        return desktop->record().reads.at(reading)[u"values"_s][control][what];
+    }
+
+    std::string text(int reading, const QString& control) const
+    {
+        return seen(reading, control, u"text"_s).toString().toStdString();
+    }
+
+    /// The rows of the list and the line under it.
+    std::string listed(int reading = 0) const
+    {
+        QStringList names;
+        for (const QJsonValue row : seen(reading, u"ListView1"_s, u"rows"_s).toArray())
+            names << row[0].toString();
+        return names.join(u' ').toStdString() + ": " + text(reading, u"lblStatus"_s);
+    }
+};
+
+// Steps of a visit.
+const QString readAll = uR"({"read": ["ListView1", "cmdProcess", "cmdPrint", "Frame2", "txtFilter", "lblStatus"]})"_s;
+
+QString click(const char* control)
+{
+    return u"{\"click\": \"%1\"}"_s.arg(QLatin1StringView(control));
+}
+
+QString type(const char* control, const char* text)
+{
+    return u"{\"set\": \"%1\", \"text\": \"%2\"}"_s.arg(QLatin1StringView(control), QLatin1StringView(text));
+}
+
+QString key(const char* control, const QString& names)
+{
+    return u"{\"key\": \"%1\", \"keys\": [\"%2\"]}"_s.arg(QLatin1StringView(control),
+                                                          QString(names).replace(u" "_s, u"\", \""_s));
+}
+
+TEST_F(MessageListWindow, ALoadedMessageMakesRoomForTheNextOfItsRequest)
+{
+    quote("500").request("QR1");
+    arrive("a.xml", cancellation("QR1"));
+    arrive("b.xml", cancellation("QR1"));
+    visit({readAll, click("cmdProcess"), readAll});
+    EXPECT_EQ(listed(0) + ", " + listed(1) + ", " + shown(),
+              "a.xml: 1 message, b.xml: 1 message, [none] Message Loaded");
+}
+
+TEST_F(MessageListWindow, ARefusedMessageStaysAndTheListIsFilledTwiceMore)
+{
+    arrive("a.xml", cancellation("QR1"));
+    arrive("b.xml", "");
+    visit({click("cmdProcess"), uR"({"wait": 600})"_s, readAll});
+    EXPECT_EQ(listed(), "a.xml: 1 message");
+    const QString unreadable = u"Message b.xml unreadable, Please contact MarlinDesk Support."_s;
+    EXPECT_EQ(desktop->boxTexts().count(unreadable), 3);
+    EXPECT_EQ(desktop->boxTexts().size(), 4);
+    EXPECT_NE(desktop->boxTexts().value(1), unreadable) << "the refusal comes before the list is filled again";
+}
+
+TEST_F(MessageListWindow, EachFolderHasItsControls)
+{
+    arrive("a.xml", quoteRequest("QR1"));
+    files::write(gsReadPath + u"b.xml"_s, quoteMatch("123").text());
+    visit({readAll, click("Option1(1)"), readAll, click("Option1(2)"), readAll, click("cmdView"), click("Command6"),
+           click("Option1(0)"), readAll});
+    const char* expected[] = {"a.xml: 1 message cmdProcess", "b.xml: 1 message cmdPrint Frame2",
+                              ": No sent messages Frame2", "a.xml: 1 message cmdProcess"};
+    for (int reading = 0; reading < 4; ++reading) {
+        std::string shown = listed(reading);
+        for (const QString& control : {u"cmdProcess"_s, u"cmdPrint"_s, u"Frame2"_s})
+            shown += seen(reading, control, u"visible"_s).toBool() ? ' ' + control.toStdString() : "";
+        EXPECT_EQ(shown, expected[reading]);
+    }
+    EXPECT_EQ(desktop->boxes(), QStringList()) << "View and Delete do nothing without a message";
+}
+
+TEST_F(MessageListWindow, TheFilterNarrowsTheReadMessages)
+{
+    for (int i = 0; i < 25; ++i)
+        files::write(gsReadPath + u"%1.0_1.xml"_s.arg(100 + i), quoteMatch("123").text());
+    visit({click("Option1(1)"), readAll});
+    EXPECT_EQ(text(0, u"lblStatus"_s), "25 messages");
+    EXPECT_EQ(desktop->prompts(), QStringList()) << "so many are listed unasked";
+    files::write(gsReadPath + u"125.0_1.xml"_s, quoteMatch("123").text());
+    visit({click("Option1(1)"), readAll, type("txtFilter", "11"), click("Command1"), readAll, type("txtFilter", "125"),
+           key("txtFilter", u"Return"_s), readAll, type("txtFilter", ""), click("Command1"), readAll,
+           click("Option1(2)"), readAll},
+          uR"("inputs": [{"text": "Quote Number", "answer": "124"}])"_s);
+    EXPECT_EQ(text(0, u"txtFilter"_s), "124") << "the answer to the prompt";
+    const char* lines[] = {"1 message with \"124\" in their name", "10 messages with \"11\" in their name",
+                           "1 message with \"125\" in their name", "26 messages"};
+    for (int reading = 0; reading < 4; ++reading)
+        EXPECT_EQ(text(reading, u"lblStatus"_s), lines[reading]);
+    EXPECT_EQ(desktop->prompts(), QStringList{u"Enter a Quote Number to search by (Leave blank for all quotes)"_s})
+        << "an empty filter that was typed asks nothing";
+    EXPECT_EQ(text(4, u"txtFilter"_s), "") << "another folder begins without a filter";
+}
+
+TEST_F(MessageListWindow, ATabletOnItsOwnDatabaseLoadsRequestsOnly)
+{
+    gbTabletLocal = true;
+    arrive("a.xml", quoteRequest("QR1"));
+    arrive("b.xml", cancellation("QR2"));
+    visit({readAll, key("ListView1", u"Down"_s), readAll, uR"({"select": "ListView1", "item": 0})"_s, readAll});
+    for (int reading = 0; reading < 3; ++reading)
+        EXPECT_EQ(seen(reading, u"cmdProcess"_s, u"enabled"_s).toBool(), reading != 1);
+    frmMessageList window;
+    window.open();
+    EXPECT_FALSE(window.loadFile(u"b.xml"_s)) << "its button is disabled";
+    EXPECT_EQ(desktop->boxes(), QStringList());
+}
+
+TEST_F(MessageListWindow, AMessageIsRemovedOnlyAfterYes)
+{
+    arrive("a.xml", quoteRequest("QR1"));
+    arrive("b.xml", quoteRequest("QR2"));
+    visit({key("ListView1", u"Delete"_s), readAll});
+    EXPECT_EQ(listed(), "a.xml b.xml: 2 messages");
+    EXPECT_EQ(desktop->boxes(), QStringList{u"critical||You are about to remove a.xml without loading into the "
+                                            "system. Are you SURE ?|no"_s});
+    visit({key("ListView1", u"Delete"_s), readAll}, uR"("boxes": [{"text": "remove a.xml", "answer": "yes"}])"_s);
+    EXPECT_EQ(listed(), "b.xml: 1 message");
+    EXPECT_EQ(filesIn(gsUnreadPath), QStringList{u"b.xml"_s});
+}
+
+TEST_F(MessageListWindow, ADoubleClickShowsASentMessageAndNoOther)
+{
+    arrive("a.xml", quoteRequest("QR1"));
+    files::write(gsSentPath + u"s.xml"_s, sentDocument("500"));
+    const QString doubleClick = uR"({"doubleClick": "ListView1"})"_s;
+    visit({doubleClick, click("Option1(2)")});
+    EXPECT_EQ(desktop->record().reads.size(), 0);
+    visit({click("Option1(2)"), doubleClick});
+    EXPECT_TRUE(text(0, u"txtXML"_s).starts_with("<request>"));
+}
+
+TEST_F(MessageListWindow, TheLineUnderTheListNamesTheFileThatEndedTheFill)
+{
+    arrive("a.xml", quoteRequest("QR1"));
+    arrive("R_500_0.xml", submissionResponse("KQ1"));
+    visit({readAll});
+    EXPECT_TRUE(listed().starts_with(": ") && listed().find("R_500_0.xml") != std::string::npos) << listed();
+    quote("500");
+    visit({readAll});
+    EXPECT_EQ(listed(), "a.xml: 1 message");
+    EXPECT_EQ(quote("500").text("KESTQuoteNo"), "KQ1");
+    gsUnreadPath = u"c:\\gone\\"_s;
+    visit({readAll});
+    EXPECT_NE(listed().find("c:\\gone\\"), std::string::npos);
+    EXPECT_EQ(desktop->boxes(), QStringList());
+}
+
+// Three messages of which the search tells one from the others in every way.
+struct Searched : MessageListWindow {
+    Searched()
+    {
+        arrive("a.xml", quoteRequest("QR1").rego("ABC123").set("corporateCustomer", "Tarrant Tyres"));
+        arrive("b.xml", quoteRequest("QR2").rego("XYZ789").set("corporateCustomer", "Holloway Haulage"));
+        arrive("c.xml", cancellation("QR3"));
+    }
+};
+
+TEST_F(Searched, WhatIsTypedInTheListLeavesTheRowsThatHoldIt)
+{
+    for (const auto& [keys, rows, line, chosen] : casesIn<4>("messages/search.txt")) {
+        visit({key("ListView1", keys), readAll, click("Command6")});
+        EXPECT_EQ(listed(), (rows + u": "_s + line).toStdString()) << keys.toStdString();
+        EXPECT_EQ(desktop->boxTexts().join(u' ').section(u' ', 5, 5), chosen) << keys.toStdString();
+    }
+}
+
+TEST_F(Searched, OutlivesARefreshAndEndsWithTheFolder)
+{
+    files::write(gsReadPath + u"r.xml"_s, quoteRequest("QR9").text());
+    visit({type("txtFind", "abc"), key("frmMessageList", u"F5"_s), readAll, type("txtFind", "zz"), click("cmdProcess"),
+           click("cmdView"), click("Option1(1)"), readAll, type("txtFind", "zz"), click("cmdPrint"), readAll});
+    EXPECT_EQ(listed(0) + ", " + listed(1) + ", " + listed(2),
+              "a.xml: 1 of 3 messages, r.xml: 1 message, : 0 of 1 message");
+    EXPECT_EQ(desktop->boxes(), QStringList()) << "a row that is not shown is not loaded, viewed or printed";
+    EXPECT_EQ(filesIn(gsUnreadPath).size(), 3);
+}
+
+TEST_F(Searched, OrderWidthsAndPlaceOutliveARefreshAndOrderAndWidthsTheWindow)
+{
+    const auto state = [](QTreeView& list) {
+        return u"%1 chosen, width %2, order %3 of column %4"_s
+            .arg(list.currentIndex().siblingAtColumn(0).data().toString())
+            .arg(list.header()->sectionSize(2))
+            .arg(list.header()->sortIndicatorOrder())
+            .arg(list.header()->sortIndicatorSection());
+    };
+    const auto work = [&](QDialog& window) {
+        auto& list = control<QTreeView>(window, "ListView1");
+        list.header()->resizeSection(2, 177);
+        desktop::gestures::press(list, Qt::Key_Down);
+        for (const int order : {0, 1, 0, 0, 1}) {  // to, fro, none, to, fro
+            desktop::gestures::press(window, Qt::CTRL | Qt::Key_1);
+            EXPECT_EQ(list.model()->index(0, 0).data(), order == 0 ? u"a.xml"_s : u"c.xml"_s);
+            desktop::gestures::press(window, Qt::Key_F5);
+            EXPECT_TRUE(state(list).startsWith(u"b.xml chosen, width 177"_s)) << state(list).toStdString();
+        }
+        EXPECT_EQ(state(list), u"b.xml chosen, width 177, order 1 of column 0"_s);
+    };
+    const auto look = [&](QDialog& window) {
+        EXPECT_EQ(state(control<QTreeView>(window, "ListView1")), u"c.xml chosen, width 177, order 1 of column 0"_s);
+    };
+    for (const Hands::Work& visit : {Hands::Work(work), Hands::Work(look)}) {
+        const Hands hands({{u"frmMessageList"_s, visit}});
+        frmMessageList::ShowForm();
+    }
+}
+
+TEST_F(Searched, FilesAreDroppedOrPastedWhileTheUnreadMessagesAreShown)
+{
+    /// A file as a mouse or the clipboard brings it.
+    const auto stick = [this](const QString& name, const QString& content) {
+        auto data = std::make_unique<QMimeData>();
+        data->setUrls({bring(name, content)});
+        return data;
+    };
+    const auto drop = [](QDialog& window, const QMimeData& data) {
+        QWidget& list = *control<QTreeView>(window, "ListView1").viewport();
+        QDragEnterEvent enters(QPoint(9, 9), Qt::MoveAction | Qt::CopyAction, &data, Qt::LeftButton, Qt::NoModifier);
+        QCoreApplication::sendEvent(&list, &enters);
+        QDropEvent drops(QPoint(9, 9), Qt::MoveAction | Qt::CopyAction, &data, Qt::LeftButton, Qt::NoModifier);
+        if (enters.isAccepted())
+            QCoreApplication::sendEvent(&list, &drops);
+        desktop::gestures::settle();
+        return enters.isAccepted() && drops.dropAction() == Qt::CopyAction;
+    };
+    const auto work = [&](QDialog& window) {
+        const auto& line = control<QLabel>(window, "lblStatus");
+        const auto paste = [&](std::unique_ptr<QMimeData> data) {
+            QGuiApplication::clipboard()->setMimeData(data.release());
+            desktop::gestures::press(window, Qt::CTRL | Qt::Key_V);
+            return line.text();
+        };
+        EXPECT_TRUE(drop(window, *stick(u"d.xml"_s, cancellation("QR4").text())));
+        EXPECT_EQ(line.text(), u"Taken in: 1 message. 4 messages"_s);
+        EXPECT_EQ(paste(stick(u"c2.xml"_s, cancellation("QR3").text())),
+                  u"Taken in: 1 message. 1 not listed yet: held back by missing pictures or an earlier message. "
+                  "4 messages"_s);
+        EXPECT_EQ(paste(std::make_unique<QMimeData>()), u"The clipboard holds no files."_s);
+        paste(stick(u"e.doc"_s, {}));
+        control<QAbstractButton>(window, "Option1(1)").click();
+        EXPECT_FALSE(drop(window, *stick(u"f.xml"_s, cancellation("QR5").text())));
+        EXPECT_EQ(paste(stick(u"f.xml"_s, cancellation("QR5").text())),
+                  u"Files are taken in while the unread messages are shown."_s);
+    };
+    const Hands hands({{u"frmMessageList"_s, work}});
+    frmMessageList::ShowForm();
+    EXPECT_EQ(filesIn(gsUnreadPath).join(u' '), u"a.xml b.xml c.xml c2.xml d.xml"_s);
+    EXPECT_EQ(filesIn(root() + u"/stick"_s).size(), 4) << "nothing leaves the place that it comes from";
+    EXPECT_TRUE(shown().starts_with("[exclamation] Not taken in:\ne.doc: "));
+}
+
+}  // namespace
+}  // namespace kest::test

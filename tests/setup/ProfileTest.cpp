@@ -1,0 +1,182 @@
+#include "setup/Profile.h"
+#include "setup/QuoteDatabase.h"
+#include "platform/RuntimeError.h"
+#include "platform/database/Recordset.h"
+#include "platform/settings/registry.h"
+#include "base/ModRegistry.h"
+#include "shell/component.h"
+#include "support/MariaDbServer.h"
+#include "support/Shop.h"
+
+#include <QFileInfo>
+#include <QJsonObject>
+#include <QSqlDatabase>
+#include <QSqlQuery>
+
+#include <gtest/gtest.h>
+
+namespace kest::test {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+const QDate today(2008, 3, 21);
+
+/// The first column of each row, joined by blanks.
+std::string column(const QString& select)
+{
+    QStringList texts;
+    db::Recordset rows(app::openEmbedded(u"WirSql"_s));
+    for (rows.open(select); !rows.eof(); rows.moveNext())
+        texts << rows.text(rows.columns().first());
+    return texts.join(u' ').toStdString();
+}
+
+struct Profile : ::testing::Test {
+    TestProfile profile;
+};
+
+struct DemoShop : Profile {
+    DemoShop()
+    {
+        app::initProfile(registerClass, true, today);
+        host.emplace();
+    }
+    ScriptedDesktop desktop{R"({"boxes":[{"text":"DELETED","answer":"yes"}]})"};
+    std::optional<eKEST> host;
+};
+
+}  // namespace
+
+TEST_F(Profile, IsMadeWhole)
+{
+    EXPECT_TRUE(app::initProfile(registerClass, false));
+
+    const QJsonObject where = app::where();
+    EXPECT_EQ(where.keys().join(u' '), u"component database images log pdf profile read reports sent unread unsent"_s);
+    for (const QString& key : where.keys())
+        EXPECT_TRUE(key == u"log"_s || QFileInfo::exists(where[key].toString())) << key.toStdString();
+    EXPECT_EQ(where[u"unread"_s].toString(), profile.driveC() + u"/wirdoc/AUnread"_s);
+
+    // what a first quote request needs
+    EXPECT_EQ(column(u"SELECT NAME FROM INSURER WHERE KEST=1"_s), "KEST Universal Insurer");
+    EXPECT_EQ(column(u"SELECT MODEL_ID1 FROM MODEL WHERE MODEL_ID1='Z000'"_s), "Z000");
+    EXPECT_NE(column(u"SELECT QUOTE_VAL FROM CINFO"_s), "");
+    EXPECT_EQ(column(u"SELECT ReportID FROM ReportDefinition ORDER BY ReportID"_s), "710 720 730");
+    EXPECT_EQ(column(u"SELECT QTNNO FROM QUOTE1"_s), "");
+}
+
+TEST_F(Profile, IsNotTouchedOnceItExists)
+{
+    EXPECT_TRUE(app::initProfile(registerClass, false, today));
+    EXPECT_TRUE(settings::setValue(settings::Hive::LocalMachine, u"SOFTWARE\\wirra32\\frmsplash"_s, u"ImagesPath"_s,
+                                   {settings::Type::Text, u"d:\\pictures\\"_s}));
+    const QByteArray registry = files::readBytes(profile.root() + u"/registry.ini"_s);
+    EXPECT_FALSE(app::initProfile(registerClass, true, today));
+    EXPECT_EQ(files::readBytes(profile.root() + u"/registry.ini"_s), registry);
+    EXPECT_EQ(files::list(app::where()[u"unread"_s].toString()), QStringList());
+    EXPECT_EQ(column(u"SELECT QTNNO FROM QUOTE1"_s), "");
+    EXPECT_EQ(app::where()[u"images"_s].toString(), profile.root() + u"/drive_d/pictures"_s);
+}
+
+TEST_F(Profile, IsCompletedAfterAnInterruptedStart)
+{
+    files::makeFolder(profile.root() + u"/databases"_s);
+    files::writeBytes(app::embeddedFile(u"unfinished"_s), "half a file");
+    // and a host's first start, which copies the settings up that it reads
+    GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"EcomHome"_s, u"d:\\mail\\"_s);
+    EXPECT_TRUE(app::initProfile(registerClass, false));
+    EXPECT_NE(column(u"SELECT QUOTE_VAL FROM CINFO"_s), "");
+    EXPECT_FALSE(QFileInfo::exists(app::embeddedFile(u"unfinished"_s)));
+    EXPECT_EQ(app::where()[u"unread"_s].toString(), profile.root() + u"/drive_d/mail/AUnread"_s);
+    EXPECT_TRUE(QFileInfo::exists(app::where()[u"unread"_s].toString()));
+    EXPECT_FALSE(app::initProfile(registerClass, false));
+}
+
+TEST_F(Profile, IsToldWhereTheComponentLooks)
+{
+    ASSERT_TRUE(settings::setUserSetting(u"wirra32"_s, u"frmsplash"_s, u"ReportPath"_s, u"d:\\rep\\"_s));
+    EXPECT_EQ(app::where()[u"reports"_s].toString(), profile.root() + u"/drive_d/rep"_s);
+    EXPECT_EQ(app::where()[u"database"_s].toString(), app::embeddedFile(u"WirSql"_s));
+
+    const QTemporaryDir odbc;
+    MariaDbServer::registerOdbcDriver(odbc, u"SQL Server"_s);
+    EXPECT_EQ(app::where()[u"database"_s].toString(), u"(local)/WirSql"_s);
+    qunsetenv("ODBCSYSINI");
+    EXPECT_FALSE(settings::keyExists(settings::Hive::LocalMachine, u"SOFTWARE"_s)) << "nothing is copied up";
+}
+
+// Other tools compare only the letters of ASCII without regard to case, and leave the others in another order.
+TEST_F(Profile, FindsWhatAnotherToolWroteOnceInitHasRebuiltTheIndexes)
+{
+    ASSERT_TRUE(app::initProfile(registerClass, false));
+    {
+        QSqlDatabase tool = QSqlDatabase::addDatabase(u"QSQLITE"_s, u"tool"_s);
+        tool.setDatabaseName(app::embeddedFile(u"WirSql"_s));
+        ASSERT_TRUE(tool.open());
+        for (int number = 10; number < 50; ++number)
+            tool.exec(
+                u"INSERT INTO CAR (REGO) VALUES ('%1%2')"_s.arg(QChar(number % 2 ? u'\u00e9' : u'\u00c9')).arg(number));
+    }
+    QSqlDatabase::removeDatabase(u"tool"_s);
+    const auto found = [] {
+        int count = 0;
+        for (int number = 10; number < 50; ++number)
+            count += column(u"SELECT REGO FROM CAR WHERE REGO='\u00e9%1'"_s.arg(number)).empty() ? 0 : 1;
+        return count;
+    };
+    ASSERT_LT(found(), 40);
+    EXPECT_FALSE(app::initProfile(registerClass, false));
+    EXPECT_EQ(found(), 40);
+}
+
+// A line that a load adds counts in totals and documents; what was never filled in stays told apart from 0.
+TEST_F(Profile, ItsTablesTakeWhatAHostWrites)
+{
+    ASSERT_TRUE(app::initProfile(registerClass, false));
+    db::ConnectionPtr database = app::openEmbedded(u"WirSql"_s);
+    database->execute(u"INSERT INTO QUOTE2 (QTNNO) VALUES ('9')"_s);
+    EXPECT_EQ(column(u"SELECT rrhour+rahour+pthour+rr_rate2+opg_rate+qty+unitcost+VENDOR+blend+delitem+DELETEDITEM+"
+                     "Report+Report_on FROM QUOTE2"_s),
+              "0");
+    EXPECT_EQ(column(u"SELECT COUNT(*) FROM QUOTE2 WHERE SEQ_NO IS NULL AND allow_tick IS NULL AND itemno IS NULL "
+                     "AND PartNo IS NULL AND MARK IS NULL"_s),
+              "1");
+
+    for (int twice = 0; twice < 2; ++twice)
+        database->execute(u"INSERT INTO QUOTE1 (QTNNO, Subquote) VALUES ('9', 0)"_s);
+    EXPECT_EQ(column(u"SELECT rec_id FROM QUOTE1 WHERE QTNNO='9'"_s), "1 2");
+    database->execute(u"INSERT INTO CAR (REGO) VALUES ('ABC123')"_s);
+    EXPECT_THROW(database->execute(u"INSERT INTO CAR (REGO) VALUES ('abc123 ')"_s), RuntimeError);
+}
+
+TEST_F(DemoShop, HoldsTogetherAndItsMessagesAreListedAndLoad)
+{
+    for (const QString& rows : linesOf("app/demo-faults.txt"))
+        EXPECT_EQ(rowCount(rows.section(u' ', 0, 0), rows.section(u' ', 2)), 0) << rows.toStdString();
+    EXPECT_EQ(rowCount("QUOTE1"), 30);
+    const QStringList names = listed();
+    EXPECT_EQ(names.size(), 15) << names.join(u' ').toStdString();
+    EXPECT_EQ(desktop.boxTexts(),
+              QStringList(u"Message QREQ_20554_1.xml unreadable, Please contact MarlinDesk Support."_s));
+    for (const QString& file : names)
+        EXPECT_EQ(loadAsTheWindow(file), file != u"MDMSG_1009.xml"_s) << file.toStdString();
+    EXPECT_EQ(listed(), QStringList(u"QREQ_20551_2.xml"_s)) << "it waited behind the first of its request";
+}
+
+TEST(Schema, HasTheSameColumnsOnAllEngines)
+{
+    const auto columns = [](const QString& name) {
+        QStringList words;
+        const QStringList lines = files::read(QStringLiteral(KEST_SOURCE_DIR "/sql/") + name).split(u'\n');
+        for (const QString& line : lines)
+            if (!line.startsWith(u"--"_s) && !line.startsWith(u')'))
+                words << line.simplified().section(u' ', 0, line.startsWith(u' ') ? 0 : 2) +
+                             (line.contains(u"DEFAULT 0"_s) ? u" 0"_s : QString());
+        return words;
+    };
+    EXPECT_EQ(columns(u"quote-embedded.sql"_s), columns(u"quote-mariadb.sql"_s));
+}
+
+}  // namespace kest::test

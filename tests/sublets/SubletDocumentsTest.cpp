@@ -1,0 +1,104 @@
+// The documents that authorise sublet work: which belong to a quote, how they are listed, and one that is no PDF.
+#include "sublets/SubletDocuments.h"
+#include "sublets/frmSubletAuth.h"
+#include "sublets/frmViewPDF.h"
+#include "support/Hands.h"
+#include "support/Shop.h"
+
+#include <QPainter>
+#include <QPdfDocument>
+#include <QPdfWriter>
+
+namespace kest {
+
+using namespace Qt::StringLiterals;
+using test::quote;
+using test::Shop;
+
+namespace {
+
+class Sublet : public Shop {
+protected:
+    static void document(const char* name, const QByteArray& content = "%PDF-1.4")
+    {
+        files::writeBytes(u"c:\\wirdoc\\PDF\\"_s + QString::fromLatin1(name), content);
+    }
+    /// A PDF document of two pages.
+    static void realDocument(const QString& name)
+    {
+        QPdfWriter writer(files::systemPath(u"c:\\wirdoc\\PDF\\"_s + name));
+        QPainter painter(&writer);
+        painter.drawText(2000, 2000, u"Authority for sublet work"_s);
+        writer.newPage();
+        painter.drawText(2000, 2000, u"Conditions"_s);
+    }
+    QJsonArray windows() const { return desktop->record().windows; }
+};
+
+}  // namespace
+
+TEST_F(Sublet, ADocumentBelongsToTheQuoteWithWhoseNumberItsNameBegins)
+{
+    for (const char* name : {"500.1_7.pdf", "500.1_12.PDF", "500.1_7.old.pdf", "500.10_4.pdf", "500.0_3.pdf",
+                             "5001.1_3.pdf", "500.1_0.pdf", "500.1_x.pdf", "500.1_-2.pdf", "500.1.pdf"})
+        document(name);
+    EXPECT_EQ(SubletDocumentNumbers(u"500"_s, u"1"_s), (QStringList{u"4"_s, u"12"_s, u"7"_s}));
+    document("Q7.0_2.pdf");
+    EXPECT_EQ(SubletDocumentNumbers(u"q7"_s, u"0"_s), QStringList(u"2"_s));
+    EXPECT_EQ(SubletDocumentNumbers(u"500"_s, u"10"_s), QStringList(u"4"_s));
+    gsUnreadPath = u"c:\\nowhere\\AUnread\\"_s;
+    EXPECT_EQ(SubletDocumentNumbers(u"500"_s, u"1"_s), QStringList());
+}
+
+TEST_F(Sublet, TheListShowsLineAndVendorAndLeavesOutWhatHasNoLine)
+{
+    auto row = quote("500");
+    row.line(1, "MIS", "Wheel alignment").set("VENDOR", test::vendor("Straight Track").id());
+    row.line(2, "MIS", "Windscreen").set("VENDOR", 0);
+    row.line(3, "MIS", "Trim").set("VENDOR", nullptr);
+    for (const char* name : {"500.0_1.pdf", "500.0_2.pdf", "500.0_3.pdf", "500.0_9.pdf"})
+        document(name);
+    frmSubletAuth::ShowForm(u"500"_s, u"1"_s);
+    EXPECT_EQ(windows().size(), 0) << "no documents, no window";
+    frmSubletAuth::ShowForm(u"500"_s, u"0"_s);
+    ASSERT_EQ(windows().size(), 1);
+    EXPECT_EQ(windows()[0][u"rows"_s],
+              (QJsonArray{QJsonArray{u"Wheel alignment"_s, u"Straight Track"_s}, QJsonArray{u"Windscreen"_s, QString()},
+                          QJsonArray{u"Trim"_s, QString()}}));
+}
+
+TEST_F(Sublet, OpenShowsTheChosenDocument)
+{
+    auto row = quote("500");
+    row.line(1, "MIS", "Wheel alignment");
+    row.line(2, "MIS", "Windscreen");
+    document("500.0_1.pdf", "this is no PDF");
+    realDocument(u"500.0_2.pdf"_s);
+    desktop.emplace(R"({"windows": {"frmSubletAuth": [[ {"click": "Command1"},
+        {"select": "ListView1", "item": "Windscreen"}, {"click": "Command1"}, {"click": "Command2"} ]],
+        "frmViewPDF": [[ {"key": "AcroPDF1", "keys": ["Ctrl+=", "Ctrl+0", "End"]}, {"read": true} ]]}})");
+    frmSubletAuth::ShowForm(u"500"_s, u"0"_s);
+    EXPECT_EQ(shown(),
+              "[critical] The document c:\\wirdoc\\PDF\\500.0_1.pdf can't be shown: the file is no PDF document.");
+    ASSERT_EQ(windows().size(), 2);
+    EXPECT_EQ(windows()[1][u"file"_s], u"c:\\wirdoc\\PDF\\500.0_2.pdf"_s);
+    EXPECT_EQ(desktop->read(u"lblPage"_s), u"Page 2 of 2"_s);
+
+    frmViewPDF::ShowForm(u"c:\\wirdoc\\PDF\\gone.pdf"_s);
+    EXPECT_EQ(shown(), "[critical] The document c:\\wirdoc\\PDF\\gone.pdf can't be shown: the file is not there.");
+}
+
+TEST_F(Sublet, APrintTakesThePagesThatWereChosen)
+{
+    realDocument(u"500.0_1.pdf"_s);
+    const QString output = root() + u"/printed.pdf"_s;
+    for (const int only : {0, 2}) {
+        const test::Hands hands(test::printing(u"frmViewPDF"_s, output, only));
+        frmViewPDF::ShowForm(u"c:\\wirdoc\\PDF\\500.0_1.pdf"_s);
+        QPdfDocument printed;
+        ASSERT_EQ(printed.load(output), QPdfDocument::Error::None);
+        EXPECT_EQ(printed.pageCount(), only ? 1 : 2);
+    }
+}
+
+}  // namespace kest
