@@ -3,6 +3,7 @@
 #include "setup/DemoShop.h"
 #include "setup/QuoteDatabase.h"
 #include "platform/RuntimeError.h"
+#include "platform/files/Lock.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
 #include "platform/settings/registry.h"
@@ -11,7 +12,6 @@
 #include "base/modLoggerEx.h"
 
 #include <QDir>
-#include <QLockFile>
 
 namespace kest::app {
 
@@ -128,9 +128,11 @@ bool initProfile(const std::function<bool()>& registerClass, bool demo, const QD
         return false;
     }
     files::makeFolder(profile::root());
-    QLockFile making(profile::root() + u"/init.lock"_s);  // another init would take the unfinished database away
-    if (!making.lock())
-        throw RuntimeError(PermissionDenied, u"Nothing can be written in "_s + profile::root());
+    // another init would take the unfinished database away
+    constexpr int longestInit = 60000;  // milliseconds
+    const files::Lock making(profile::root() + u"/init.lock"_s, {}, longestInit);
+    if (!making.isHeld())
+        throw RuntimeError(PermissionDenied, u"Another \"kest2 init\" is still making "_s + profile::root());
     if (isWhole())
         return false;
     makeFolders();

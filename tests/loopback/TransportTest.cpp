@@ -84,6 +84,17 @@ TEST_F(Loopback, ASentQuoteIsCarriedAndAnswered)
     EXPECT_EQ(carried(), "") << "a second carry has nothing to do";
 }
 
+TEST_F(Loopback, OneTransportWorksOnTheFoldersAndADeadOneLocksNobodyOut)
+{
+    for (const QString& leftOver : {u""_s, u"1\nkest2\nanother-machine\n"_s}) {
+        files::write(folders().own + u"KESTWeb.lock"_s, leftOver);
+        app::TransportRunner first(folders(), [](const app::Carry&) {});
+        app::TransportRunner second(folders(), [](const app::Carry&) {});
+        EXPECT_TRUE(first.claim()) << leftOver.toStdString();
+        EXPECT_FALSE(second.claim());
+    }
+}
+
 TEST_F(Loopback, EachMessageHasTheEffectThatItsTypeTells)
 {
     ASSERT_TRUE(send());
