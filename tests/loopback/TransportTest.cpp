@@ -1,5 +1,5 @@
-#include "loopback/Transport.h"
 #include "app/TransportCommand.h"
+#include "loopback/Transport.h"
 #include "outbound/SendQuote.h"
 #include "platform/profile.h"
 #include "support/Shop.h"
@@ -51,7 +51,7 @@ protected:
     static bool send()
     {
         bool sent = false;
-        if (OpenHostQuote(u"1004"_s, u"0"_s))
+        if (openHostQuote(u"1004"_s, u"0"_s))
             SendQuote(*grsQuote, &sent);
         return sent;
     }
