@@ -70,7 +70,7 @@ QString DecryptText(const QString& hex)
     return files::fromCodePage(bytes);
 }
 
-QString encryptText(const QString& plain)
+QString EncryptText(const QString& plain)
 {
     if (plain.isEmpty())
         return {};

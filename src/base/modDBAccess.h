@@ -1,8 +1,8 @@
 // The one connection to the host's database.
 #pragma once
 
-#include "base/ModRegistry.h"
 #include "platform/database/Recordset.h"
+#include "base/ModRegistry.h"
 
 #include <QString>
 
@@ -24,15 +24,15 @@ bool EnsureConnection();
 /// Reads the settings and opens the connection; a failure shows only as a closed connection.
 void OpenDatabase();
 /// Takes server, instance, database and password from the settings, which stay where they are.
-void readConnectionSettings();
+void ReadConnectionSettings();
 /// The text that the connection is opened with, from the variables above; empty for a driver number that names none.
-QString connectionText(int driverNumber);
+QString ConnectionText(int driverNumber);
 /// The number of the driver, by the settings.
-int driverNumber(CopyUp copyUp = CopyUp::Yes);
+int DriverNumber(CopyUp copyUp = CopyUp::Yes);
 /// A query on a fresh recordset, or none after a critical message when there is no connection.
 std::optional<db::Recordset> OpenRecordset(const QString& select, bool disconnect = false, bool reconnect = false);
 /// A query on the shared connection `gConn`, open. Failures are thrown.
-db::Recordset opened(const QString& select);
+db::Recordset Opened(const QString& select);
 /// This machine's name; empty on failure.
 QString GetComputerName();
 

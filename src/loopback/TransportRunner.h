@@ -2,14 +2,13 @@
 #pragma once
 
 #include "loopback/Transport.h"
-#include "platform/files/Lock.h"
 
 #include <QFileSystemWatcher>
+#include <QLockFile>
 #include <QObject>
 #include <QTimer>
 
 #include <functional>
-#include <optional>
 
 namespace kest::app {
 
@@ -23,7 +22,7 @@ public:
 
     TransportRunner(const TransportFolders& folders, Heard heard);
 
-    /// False while another transport works on these folders. Throws if nothing can be written there.
+    /// False where another transport works on these folders. A crash leaves no lock behind.
     bool claim();
     void start();
     void carryNow();
@@ -34,7 +33,7 @@ private:
     TransportFolders folders;
     Transport transport;
     Heard heard;
-    std::optional<files::Lock> lock;
+    QLockFile lock;
     QFileSystemWatcher watcher;
     QTimer settled;
     QTimer interval;

@@ -1,12 +1,12 @@
 #include "messagelist/Summary.h"
 
-#include "base/Helpers.h"
-#include "base/SharedVariables.h"
 #include "messages/Envelope.h"
 #include "messages/Folders.h"
-#include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
+#include "platform/Prompt.h"
 #include "platform/files/files.h"
+#include "base/Helpers.h"
+#include "base/SharedVariables.h"
 
 #include <utility>
 
@@ -83,7 +83,7 @@ void Fill::take(const QString& file)
     } else if (file.startsWith("R_"_L1)) {
         hooks.submissionResponse(text, file);
     } else if (file.contains("MDMSG"_L1)) {
-        if (isMarker(document)) {
+        if (IsMarker(document)) {
             const xml::Document& marker = prepared();
             listed.append({file, GetMarkerRow(marker, GetMarkerTypeName(marker))});
         }
@@ -103,10 +103,10 @@ bool Fill::parse(const QString& path)
         return false;
     text = files::read(path);
     if (folder != Sent)
-        return parseWithRepairs(document, text);
-    if (!escapeAmpersands(text))
+        return ParseWithRepairs(document, text);
+    if (!EscapeAmpersands(text))
         return false;
-    text = wrappedInRequest(text);
+    text = WrappedInRequest(text);
     return document.loadXML(text) && text.size() >= shortestSentText;
 }
 
@@ -114,9 +114,9 @@ bool Fill::parse(const QString& path)
 // second parse is spared where it would find the same.
 const xml::Document& Fill::prepared()
 {
-    if (isSameWhenPrepared(text))
+    if (IsSameWhenPrepared(text))
         return document;
-    reparsed = parsedMessage(text);
+    reparsed = ParsedMessage(text);
     return reparsed;
 }
 
@@ -135,7 +135,7 @@ QList<ListedMessage> BuildMessageList(int folder, const FillHooks& hooks)
     Fill fill(folder, hooks);
     qint64 done = 0;
     for (const QString& file : names) {
-        if (file.endsWith("xml"_L1) && file.contains(gsListFilter) && isBareName(file)) {
+        if (file.endsWith("xml"_L1) && file.contains(gsListFilter) && IsBareName(file)) {
             try {
                 fill.take(file);
             } catch (const RuntimeError& error) {

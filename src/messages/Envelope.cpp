@@ -57,7 +57,7 @@ QString AddXsiDeclaration(const QString& text)
     return text.first(first) + schemaInstance + text.sliced(first);
 }
 
-bool isSameWhenPrepared(const QString& text)
+bool IsSameWhenPrepared(const QString& text)
 {
     const qsizetype first = text.indexOf("xmlns"_L1);
     if (first < 0 || text.contains(schemaInstance, Qt::CaseInsensitive))
@@ -71,7 +71,7 @@ bool isSameWhenPrepared(const QString& text)
     return isAttribute && !before.contains("<!"_L1) && !before.contains("<?"_L1);
 }
 
-QString messageTypeName(const QString& code)
+QString MessageTypeName(const QString& code)
 {
     for (const auto& [known, name] : displayNames)
         if (code == known)
@@ -81,19 +81,19 @@ QString messageTypeName(const QString& code)
 
 QString GetMessageTypeName(QString& text)
 {
-    return GetMessageTypeName(parsedMessage(text));
+    return GetMessageTypeName(ParsedMessage(text));
 }
 
 QString GetMessageTypeName(const xml::Document& message)
 {
     QString code;
     attempt([&] { code = message.textOf(u"messageType"_s).toUpper(); });
-    return messageTypeName(code);
+    return MessageTypeName(code);
 }
 
 QString GetMarkerTypeName(QString& text)
 {
-    return GetMarkerTypeName(parsedMessage(text));
+    return GetMarkerTypeName(ParsedMessage(text));
 }
 
 QString GetMarkerTypeName(const xml::Document& marker)
@@ -107,13 +107,13 @@ QString GetMarkerTypeName(const xml::Document& marker)
     return action == "DELDUPE"_L1 ? u"Quote Send Error"_s : QString(unknownMessage);
 }
 
-bool isMarker(const xml::Document& message)
+bool IsMarker(const xml::Document& message)
 {
     const xml::Node first = message.firstChild().firstChild();
     return first && first.text() == "MDMSG"_L1;
 }
 
-bool escapeAmpersands(QString& text)
+bool EscapeAmpersands(QString& text)
 {
     if (text.size() + 4 * text.count(u'&') > xml::Document::maximumBytes)
         return false;
@@ -121,26 +121,26 @@ bool escapeAmpersands(QString& text)
     return true;
 }
 
-QString wrappedInRequest(const QString& text)
+QString WrappedInRequest(const QString& text)
 {
     return "<request>"_L1 + text + "</request>"_L1;
 }
 
-bool parseWithRepairs(xml::Document& document, QString& text)
+bool ParseWithRepairs(xml::Document& document, QString& text)
 {
     for (int repairs = 0; !document.loadXML(text); ++repairs) {
         const quint32 error = document.parseError().errorCode;
         if (repairs == repairsAllowed)
             return false;
         if (error == xml::SecondRoot)
-            text = wrappedInRequest(text);
-        else if (error != xml::BareAmpersand || !escapeAmpersands(text))
+            text = WrappedInRequest(text);
+        else if (error != xml::BareAmpersand || !EscapeAmpersands(text))
             return false;
     }
     return true;
 }
 
-xml::Document parsedMessage(QString& text)
+xml::Document ParsedMessage(QString& text)
 {
     xml::Document document;
     SetupDocument(document);

@@ -17,10 +17,10 @@ void SetupDocument(xml::Document& document);
 QString AddXsiDeclaration(const QString& text);
 /// True where a document parsed from the bare text and one parsed from the prepared text hold the same, so that a
 /// parse can be spared. In doubt false.
-bool isSameWhenPrepared(const QString& text);
+bool IsSameWhenPrepared(const QString& text);
 
 /// The display name of a type code in upper case, or "UNKNOWN - INVALID MESSAGE".
-QString messageTypeName(const QString& code);
+QString MessageTypeName(const QString& code);
 /// The display name of a network message. Changes `text` to the prepared one; never fails.
 QString GetMessageTypeName(QString& text);
 /// The same, of a message that was parsed before.
@@ -29,19 +29,19 @@ QString GetMessageTypeName(const xml::Document& message);
 QString GetMarkerTypeName(QString& text);
 QString GetMarkerTypeName(const xml::Document& marker);
 /// True for a marker message, whatever its file's name.
-bool isMarker(const xml::Document& message);
+bool IsMarker(const xml::Document& message);
 
 /// Every "&" becomes "&amp;", those of entities included. False, and nothing changes, where the outcome would be longer
 /// than a parse takes: it can be five times as long.
-bool escapeAmpersands(QString& text);
+bool EscapeAmpersands(QString& text);
 /// The text between "<request>" and "</request>".
-QString wrappedInRequest(const QString& text);
+QString WrappedInRequest(const QString& text);
 
 /// Parses a text into the document, at need after the two repairs, which change `text`. False where it stays
 /// unreadable.
-bool parseWithRepairs(xml::Document& document, QString& text);
+bool ParseWithRepairs(xml::Document& document, QString& text);
 /// A prepared text parsed for the message code's paths: SetupDocument, AddXsiDeclaration, loadXML. `text` comes back
 /// prepared. The caller asks `parseError`.
-xml::Document parsedMessage(QString& text);
+xml::Document ParsedMessage(QString& text);
 
 }  // namespace kest

@@ -1,13 +1,13 @@
 #include "shell/eKEST.h"
 
+#include "platform/database/Sql.h"
+#include "platform/Prompt.h"
+#include "platform/desktop/Window.h"
 #include "base/ModRegistry.h"
 #include "base/SharedVariables.h"
+#include "shell/frmKEST.h"
 #include "base/modDBAccess.h"
 #include "base/modLoggerEx.h"
-#include "platform/Prompt.h"
-#include "platform/database/Sql.h"
-#include "platform/desktop/Window.h"
-#include "shell/frmKEST.h"
 
 namespace kest {
 
@@ -54,13 +54,13 @@ void eKEST::ShowKESTWindow(const QString& sQTNNO, const QString& sSubQuote)
 {
     desktop::guarded(u"eKEST.ShowKESTWindow"_s, [&] {
         frmKEST panel;
-        if (!openHostQuote(sQTNNO, sSubQuote))
+        if (!OpenHostQuote(sQTNNO, sSubQuote))
             return;
         desktop::showModal(panel);
     });
 }
 
-bool hasConnection()
+bool HasConnection()
 {
     gConn = GetConnection();
     if (!gConn)
@@ -69,9 +69,9 @@ bool hasConnection()
     return gConn != nullptr;
 }
 
-bool openHostQuote(const QString& sQTNNO, const QString& sSubQuote)
+bool OpenHostQuote(const QString& sQTNNO, const QString& sSubQuote)
 {
-    if (!hasConnection())
+    if (!HasConnection())
         return false;
     grsQuote = std::make_shared<db::Recordset>(gConn);
     grsQuote->open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", sQTNNO, sSubQuote));

@@ -1,9 +1,9 @@
 // Two workstations on one database and one set of message folders, the second one being the command `kest2`.
-#include "base/modDBAccess.h"
 #include "messagelist/frmMessageList.h"
 #include "outbound/SendQuote.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/FaultInjection.h"
+#include "base/modDBAccess.h"
 #include "support/Failure.h"
 #include "support/MariaDbServer.h"
 #include "support/Shop.h"
@@ -102,7 +102,7 @@ TEST_F(Workstations, ASendAndALoadLoseNothingOfEachOther)
     const Snapshot before;
     int overtakenCount = 0;
     for (int statement = 1, last = 1; statement <= last; ++statement) {
-        ASSERT_TRUE(openHostQuote(u"500"_s, u"0"_s));
+        ASSERT_TRUE(OpenHostQuote(u"500"_s, u"0"_s));
         last = 0;
         db::setStatementFault([&] {
             if (++last == statement) {
@@ -135,7 +135,7 @@ TEST_F(Workstations, ALoadGoesOverANewConnectionWhereTheOldOneHasGone)
     if (shopIsOnServer()) {
         db::Connection administrator;
         administrator.open(mariaDb().connectionText(u"WirSql"_s));
-        administrator.execute(u"KILL "_s + opened(u"SELECT CONNECTION_ID() AS id"_s).text(u"id"_s));
+        administrator.execute(u"KILL "_s + Opened(u"SELECT CONNECTION_ID() AS id"_s).text(u"id"_s));
     } else {
         gConn->close();
     }

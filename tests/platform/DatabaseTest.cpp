@@ -195,7 +195,7 @@ TEST_P(EmbeddedDatabase, ReadsWhatAnotherToolHasWritten)
 
 INSTANTIATE_TEST_SUITE_P(Alone, EmbeddedDatabase, ::testing::Values(On::Embedded));
 
-TEST(connectionText, ChoosesTheEngineThatAnswers)
+TEST(ConnectionText, ChoosesTheEngineThatAnswers)
 {
     const TestProfile profile;
     QDir().mkpath(profile.root() + u"/databases"_s);
@@ -212,7 +212,7 @@ TEST(connectionText, ChoosesTheEngineThatAnswers)
     EXPECT_FALSE(QFile::exists(profile.root() + u"/databases/NoShop.db"_s)) << "a missing database is not made";
 }
 
-TEST(connectionText, AServerThatRefusesOrDoesNotAnswerCostsSeconds)
+TEST(ConnectionText, AServerThatRefusesOrDoesNotAnswerCostsSeconds)
 {
     const int silent = socket(AF_INET, SOCK_STREAM, 0);
     sockaddr_in address{};

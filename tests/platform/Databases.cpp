@@ -1,8 +1,7 @@
 #include "platform/Databases.h"
 
 #include "setup/QuoteDatabase.h"
-
-#include <memory>
+#include "support/OdbcDrivers.h"
 
 namespace kest::test {
 
@@ -24,19 +23,6 @@ CREATE TABLE LINE (id INTEGER NOT NULL AUTO_INCREMENT PRIMARY KEY, CODE VARCHAR(
 CREATE TABLE CAR (REGO VARCHAR(20) NOT NULL PRIMARY KEY, owner VARCHAR(30), CODE VARCHAR(20));
 CREATE TABLE Tints (Code VARCHAR(20), Script VARCHAR(30) DEFAULT 'none');)"_s;
 
-const auto odbcDriver = u"Shop Server"_s;
-
-/// ODBC reads the list of drivers once, so it is registered before any test runs and stays.
-class Environment final : public ::testing::Environment {
-public:
-    void SetUp() override { MariaDbServer::registerOdbcDriver(odbcList, odbcDriver); }
-
-private:
-    QTemporaryDir odbcList;
-};
-
-const auto* const environment = ::testing::AddGlobalTestEnvironment(std::make_unique<Environment>().release());
-
 }  // namespace
 
 Databases::Databases()
@@ -48,8 +34,9 @@ Databases::Databases()
             made->execute(statement);
     } else {
         mariaDb().createDatabase(u"shop"_s, mariaDbSchema);
-        connectionText = GetParam() == On::MySql ? mariaDb().connectionText(u"shop"_s)
-                                                 : mariaDb().connectionText(u"shop"_s, odbcDriver);
+        connectionText = GetParam() == On::MySql
+                             ? mariaDb().connectionText(u"shop"_s)
+                             : mariaDb().connectionText(u"shop"_s, QString::fromLatin1(odbcMariaDb));
     }
     connection = connect();
 }

@@ -1,11 +1,11 @@
-#include "setup/Profile.h"
-#include "setup/QuoteDatabase.h"
+#include "base/ModRegistry.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Recordset.h"
 #include "platform/settings/registry.h"
-#include "base/ModRegistry.h"
+#include "setup/Profile.h"
+#include "setup/QuoteDatabase.h"
 #include "shell/component.h"
-#include "support/MariaDbServer.h"
+#include "support/OdbcDrivers.h"
 #include "support/Shop.h"
 
 #include <QFileInfo>
@@ -100,10 +100,10 @@ TEST_F(Profile, IsToldWhereTheComponentLooks)
     EXPECT_EQ(app::where()[u"reports"_s].toString(), profile.root() + u"/drive_d/rep"_s);
     EXPECT_EQ(app::where()[u"database"_s].toString(), app::embeddedFile(u"WirSql"_s));
 
-    const QTemporaryDir odbc;
-    MariaDbServer::registerOdbcDriver(odbc, u"SQL Server"_s);
-    EXPECT_EQ(app::where()[u"database"_s].toString(), u"(local)/WirSql"_s);
-    qunsetenv("ODBCSYSINI");
+    {
+        const OdbcDrivers drivers(OdbcDrivers::WithSqlServer);
+        EXPECT_EQ(app::where()[u"database"_s].toString(), u"(local)/WirSql"_s);
+    }
     EXPECT_FALSE(settings::keyExists(settings::Hive::LocalMachine, u"SOFTWARE"_s)) << "nothing is copied up";
 }
 

@@ -1,14 +1,13 @@
 #include "support/MariaDbServer.h"
 
-#include "setup/QuoteDatabase.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Connection.h"
 #include "platform/database/Sql.h"
+#include "setup/QuoteDatabase.h"
+#include "support/ServerFolder.h"
 
 #include <QDeadlineTimer>
 #include <QDir>
-#include <QFile>
-#include <QFileInfo>
 #include <QProcessEnvironment>
 #include <QStandardPaths>
 #include <QTcpServer>
@@ -49,17 +48,9 @@ QString textFor(const QString& driver, int port, const QString& database, const 
                                                                                     database, user, password);
 }
 
-/// In memory where there is such a place: the server waits for the disk at each change of a table, whatever its
-/// options.
-QString folderForData()
-{
-    const QFileInfo memory(u"/dev/shm"_s);
-    return (memory.isWritable() ? memory.filePath() : QDir::tempPath()) + u"/kest2-mariadb-XXXXXX"_s;
-}
-
 }  // namespace
 
-MariaDbServer::MariaDbServer() : folder(folderForData())
+MariaDbServer::MariaDbServer() : folder(serverFolder(u"mariadb"_s))
 {
     prepareData();
     start();
@@ -148,21 +139,6 @@ MariaDbServer& mariaDb()
 void stopMariaDb()
 {
     shared.reset();
-}
-
-void MariaDbServer::registerOdbcDriver(const QTemporaryDir& folder, const QString& name)
-{
-    QString library;
-    for (const QString& place : {u"x86_64-linux-gnu/odbc"_s, u"aarch64-linux-gnu/odbc"_s, u"odbc"_s}) {
-        const QString candidate = u"/usr/lib/%1/libmaodbc.so"_s.arg(place);
-        if (QFile::exists(candidate))
-            library = candidate;
-    }
-    QFile list(folder.filePath(u"odbcinst.ini"_s));
-    if (!list.open(QIODevice::WriteOnly))
-        throw std::runtime_error("odbcinst.ini can't be written");
-    list.write(u"[%1]\nDriver=%2\n"_s.arg(name, library).toUtf8());
-    qputenv("ODBCSYSINI", QFile::encodeName(folder.path()));
 }
 
 }  // namespace kest::test

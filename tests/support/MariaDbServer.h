@@ -25,9 +25,6 @@ public:
     /// Ends the server as a power cut would.
     void kill();
 
-    /// Registers MariaDB's ODBC driver under a name, for this process alone; before ODBC is first used.
-    static void registerOdbcDriver(const QTemporaryDir& folder, const QString& name);
-
 private:
     void prepareData();
     void start();
