@@ -1,11 +1,10 @@
 // Two workstations on one database and one set of message folders, the second one being the command `kest2`.
+#include "base/modDBAccess.h"
 #include "messagelist/frmMessageList.h"
 #include "outbound/SendQuote.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/FaultInjection.h"
-#include "base/modDBAccess.h"
 #include "support/Failure.h"
-#include "support/MariaDbServer.h"
 #include "support/Shop.h"
 #include "support/ShopDatabase.h"
 #include "support/Snapshot.h"
@@ -132,13 +131,7 @@ TEST_F(Workstations, ALoadGoesOverANewConnectionWhereTheOldOneHasGone)
     arrive("m.xml", cancellation("QR1"));
     frmMessageList window;
     window.open();
-    if (shopIsOnServer()) {
-        db::Connection administrator;
-        administrator.open(mariaDb().connectionText(u"WirSql"_s));
-        administrator.execute(u"KILL "_s + Opened(u"SELECT CONNECTION_ID() AS id"_s).text(u"id"_s));
-    } else {
-        gConn->close();
-    }
+    dropConnection();
     EXPECT_TRUE(window.loadFile(u"m.xml"_s)) << shown();
 }
 

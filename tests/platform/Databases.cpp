@@ -23,6 +23,13 @@ CREATE TABLE LINE (id INTEGER NOT NULL AUTO_INCREMENT PRIMARY KEY, CODE VARCHAR(
 CREATE TABLE CAR (REGO VARCHAR(20) NOT NULL PRIMARY KEY, owner VARCHAR(30), CODE VARCHAR(20));
 CREATE TABLE Tints (Code VARCHAR(20), Script VARCHAR(30) DEFAULT 'none');)"_s;
 
+const auto tdsSchema =
+    uR"(
+CREATE TABLE LINE (id INT IDENTITY(1,1) NOT NULL PRIMARY KEY, CODE VARCHAR(20), SEQ INT,
+    amount FLOAT DEFAULT 0, flag BIT DEFAULT 0, day DATETIME, notes TEXT);
+CREATE TABLE CAR (REGO VARCHAR(20) NOT NULL PRIMARY KEY, owner VARCHAR(30), CODE VARCHAR(20));
+CREATE TABLE Tints (Code VARCHAR(20), Script VARCHAR(30) DEFAULT 'none');)"_s;
+
 }  // namespace
 
 Databases::Databases()
@@ -32,6 +39,9 @@ Databases::Databases()
         const db::ConnectionPtr made = app::openEmbedded(u"shop"_s);
         for (const QString& statement : app::statementsIn(embeddedSchema))
             made->execute(statement);
+    } else if (GetParam() == On::Tds) {
+        tdsServer().createDatabase(u"shop"_s, tdsSchema);
+        connectionText = tdsServer().connectionText(u"shop"_s);
     } else {
         mariaDb().createDatabase(u"shop"_s, mariaDbSchema);
         connectionText = GetParam() == On::MySql

@@ -5,6 +5,7 @@
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
 #include "support/MariaDbServer.h"
+#include "support/TdsServer.h"
 #include "support/TestProfile.h"
 
 #include <QString>
@@ -13,7 +14,7 @@
 
 namespace kest::test {
 
-enum class On { Embedded, MySql, Odbc };
+enum class On { Embedded, MySql, Odbc, Tds };
 
 /// The error that a step throws; number 0 where it throws none.
 template <class Step>

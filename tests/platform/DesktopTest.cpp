@@ -1,10 +1,10 @@
 // The seam of boxes, input boxes and programs; the guard of window events; what is remembered of a window.
+#include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
 #include "platform/desktop/Form.h"
-#include "platform/script/Gestures.h"
 #include "platform/desktop/Progress.h"
-#include "platform/Prompt.h"
 #include "platform/files/files.h"
+#include "platform/script/Gestures.h"
 #include "support/ScriptedDesktop.h"
 #include "support/TestProfile.h"
 

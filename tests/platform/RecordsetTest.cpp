@@ -300,6 +300,7 @@ TEST_P(RecordsetOn, AFilterShowsTheRowsThatMatchAndADisconnectedOneLivesOn)
 }
 
 INSTANTIATE_TEST_SUITE_P(Engines, RecordsetOn, ::testing::Values(On::Embedded, On::MySql, On::Odbc));
+INSTANTIATE_TEST_SUITE_P(DISABLED_SqlServer, RecordsetOn, ::testing::Values(On::Tds));
 
 TEST(DeclaredTable, CutsTextsAndCountsItsPendingRow)
 {

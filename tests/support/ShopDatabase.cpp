@@ -1,14 +1,18 @@
 #include "support/ShopDatabase.h"
 
-#include "setup/QuoteDatabase.h"
-#include "platform/files/files.h"
-#include "platform/profile.h"
 #include "base/ModRegistry.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
+#include "platform/files/files.h"
+#include "platform/profile.h"
+#include "setup/QuoteDatabase.h"
 #include "support/MariaDbServer.h"
+#include "support/TdsServer.h"
 
 #include <QFile>
+#include <QRegularExpression>
+
+#include <gtest/gtest.h>
 
 namespace kest::test {
 
@@ -18,14 +22,19 @@ namespace {
 
 const auto shopName = u"WirSql"_s;  // by default, on every engine
 
-void fill(db::Connection& database, app::Dialect dialect)
+void fillShop(db::Connection& database)
 {
-    app::createTables(database, dialect);
     app::fillNewShop(database);
     database.execute(
         u"INSERT INTO MODEL (MODEL_ID, MODEL_ID1, MAKE, MODEL) VALUES ('C120', 'C120', 'CORELLA', 'MERIDIAN GL')"_s);
     database.execute(
         u"INSERT INTO ALLMODEL (MODEL_ID, MAKE, MODEL, SCHEDULE) VALUES ('C120', 'CORELLA', 'MERIDIAN GL', '')"_s);
+}
+
+void fill(db::Connection& database, app::Dialect dialect)
+{
+    app::createTables(database, dialect);
+    fillShop(database);
 }
 
 /// Built once, in the profile of the first test, since making tables costs commits.
@@ -40,60 +49,118 @@ const QByteArray& newShopFile()
     return file;
 }
 
-/// The shop's database on the server, and copies of it beside it. No table is made anew, that would cost a test more
-/// than all else.
+enum class Engine { Embedded, MariaDb, Tds };
+
+Engine engine()
+{
+    const QString name = qEnvironmentVariable("KEST2_TEST_ENGINE");
+    return name == u"mariadb"_s ? Engine::MariaDb : name == u"tds"_s ? Engine::Tds : Engine::Embedded;
+}
+
+/// The tables as a host has them on SQL Server; only tests make them.
+QString tdsSchema()
+{
+    app::registerResources();
+    QFile file(u":/sql/quote-mariadb.sql"_s);
+    EXPECT_TRUE(file.open(QIODevice::ReadOnly));
+    QString script = QString::fromUtf8(file.readAll());
+    const std::pair<QString, QString> words[] = {
+        {u"INTEGER NOT NULL AUTO_INCREMENT"_s, u"INT IDENTITY(1,1) NOT NULL"_s},
+        {u"INTEGER"_s, u"INT"_s},
+        {u"DOUBLE"_s, u"FLOAT"_s},
+        {u"BOOLEAN"_s, u"BIT"_s},
+        {u"LONGTEXT"_s, u"TEXT"_s}};
+    for (const auto& [theirs, ours] : words)
+        script.replace(theirs, ours);
+    return script.remove(QRegularExpression(u" DEFAULT CHARACTER SET [^;]*"_s));
+}
+
+/// The shop's database on a server, and copies of it beside it: making tables anew would cost a test more than all
+/// else.
 class ServerShop {
 public:
-    ServerShop()
+    ServerShop(QString name, QString ownNumber) : serverName(std::move(name)), connectionNumber(std::move(ownNumber)) {}
+    virtual ~ServerShop() = default;
+    virtual void copy(const QString& from, const QString& to) = 0;
+
+    const QString serverName;        // as a setting
+    const QString connectionNumber;  // what gives the number by which the server knows a connection
+    const db::ConnectionPtr administrator = std::make_shared<db::Connection>();
+
+    const QString shop = shopName;
+    const QString saved = u"saved"_s;
+    const QString fresh = u"fresh"_s;
+};
+
+class MariaDbShop final : public ServerShop {
+public:
+    MariaDbShop() : ServerShop(u"mysql:127.0.0.1:%1"_s.arg(mariaDb().port()), u"CONNECTION_ID()"_s)
     {
         for (const QString& name : {shop, saved, fresh})
             mariaDb().createDatabase(name);
-        connection_->open(mariaDb().connectionText(fresh));
-        fill(*connection_, app::Dialect::MariaDb);
-        db::Recordset names(connection_);
+        administrator->open(mariaDb().connectionText(fresh));
+        fill(*administrator, app::Dialect::MariaDb);
+        db::Recordset names(administrator);
         names.open(u"SELECT TABLE_NAME, AUTO_INCREMENT FROM INFORMATION_SCHEMA.TABLES WHERE TABLE_SCHEMA=DATABASE()"_s);
         for (; !names.eof(); names.moveNext()) {
             const QString table = names.text(u"TABLE_NAME"_s);
             tables_[table] = !names.isNull(u"AUTO_INCREMENT"_s);
             for (const QString& name : {shop, saved})
-                connection_->execute(u"CREATE TABLE %1.%2 LIKE %2"_s.arg(name, table));
+                administrator->execute(u"CREATE TABLE %1.%2 LIKE %2"_s.arg(name, table));
         }
     }
 
-    void copy(const QString& from, const QString& to)
+    void copy(const QString& from, const QString& to) override
     {
         for (auto table = tables_.begin(); table != tables_.end(); ++table) {
             const QString clear = table.value() ? u"TRUNCATE TABLE "_s : u"DELETE FROM "_s;  // which keeps the counter
-            connection_->execute(clear + to + u'.' + table.key());
-            connection_->execute(u"INSERT INTO %1.%3 SELECT * FROM %2.%3"_s.arg(to, from, table.key()));
+            administrator->execute(clear + to + u'.' + table.key());
+            administrator->execute(u"INSERT INTO %1.%3 SELECT * FROM %2.%3"_s.arg(to, from, table.key()));
         }
     }
 
-    const QString shop = shopName;
-    const QString saved = u"saved"_s;
-    const QString fresh = u"fresh"_s;
-
 private:
-    db::ConnectionPtr connection_ = std::make_shared<db::Connection>();
     QMap<QString, bool> tables_;  // true for one that numbers its rows
+};
+
+class TdsShop final : public ServerShop {
+public:
+    TdsShop() : ServerShop(tdsServer().address(), u"@@SPID"_s)
+    {
+        for (const QString& name : {shop, saved})
+            tdsServer().createDatabase(name);
+        tdsServer().createDatabase(fresh, tdsSchema());
+        administrator->open(tdsServer().connectionText(fresh));
+        fillShop(*administrator);
+    }
+
+    void copy(const QString& from, const QString& to) override
+    {
+        administrator->execute(u"EXEC standin_copy @from='%1', @to='%2'"_s.arg(from, to));
+    }
 };
 
 ServerShop& serverShop()
 {
-    static ServerShop made;
-    return made;
+    static const std::unique_ptr<ServerShop> made =
+        engine() == Engine::Tds ? std::unique_ptr<ServerShop>(new TdsShop) : std::make_unique<MariaDbShop>();
+    return *made;
 }
 
 }  // namespace
 
-bool shopIsOnServer()
+void dropConnection()
 {
-    return qEnvironmentVariable("KEST2_TEST_ENGINE") == u"mariadb"_s;
+    if (engine() == Engine::Embedded)
+        gConn->close();
+    else
+        serverShop().administrator->execute(
+            u"KILL "_s + Opened(u"SELECT %1 AS id"_s.arg(serverShop().connectionNumber)).text(u"id"_s));
 }
 
 void makeShopDatabase()
 {
-    if (!shopIsOnServer()) {
+    if (engine() == Engine::Embedded) {
         const QByteArray& file = newShopFile();
         files::makeFolder(profile::root() + u"/databases"_s);
         files::writeBytes(app::embeddedFile(shopName), file);
@@ -102,12 +169,12 @@ void makeShopDatabase()
     serverShop().copy(serverShop().fresh, serverShop().shop);
     RegCreateSubKey(settings::Hive::LocalMachine, u"SOFTWARE\\wirra32\\frmsplash"_s);
     RegSetValue(settings::Hive::LocalMachine, u"SOFTWARE\\wirra32\\frmsplash"_s, u"ServerName"_s,
-                u"mysql:127.0.0.1:%1"_s.arg(mariaDb().port()));
+                serverShop().serverName);
 }
 
 SavedShopDatabase::SavedShopDatabase()
 {
-    if (shopIsOnServer()) {
+    if (engine() != Engine::Embedded) {
         serverShop().copy(serverShop().shop, serverShop().saved);
         return;
     }
@@ -118,7 +185,7 @@ SavedShopDatabase::SavedShopDatabase()
 
 void SavedShopDatabase::restore() const
 {
-    if (shopIsOnServer()) {
+    if (engine() != Engine::Embedded) {
         serverShop().copy(serverShop().saved, serverShop().shop);
         return;
     }

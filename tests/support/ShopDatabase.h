@@ -1,11 +1,12 @@
-// The quote database of a test's shop: embedded, or on a MariaDB server where KEST2_TEST_ENGINE says "mariadb".
+// The quote database of a test's shop: embedded, or on a server that KEST2_TEST_ENGINE names, "mariadb" or "tds".
 #pragma once
 
 #include <QByteArray>
 
 namespace kest::test {
 
-bool shopIsOnServer();
+/// The component's connection to it goes, as when a server is started anew.
+void dropConnection();
 
 /// Puts a new shop with one model that cars can have where the settings of the profile then lead: on a server
 /// `ServerName` is set, and nothing else.

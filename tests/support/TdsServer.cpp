@@ -65,13 +65,6 @@ void TdsServer::createDatabase(const QString& name, const QString& script)
         connection.execute(statement);
 }
 
-void TdsServer::copyDatabase(const QString& from, const QString& to)
-{
-    db::Connection connection;
-    connection.open(connectionText(u"master"_s));
-    connection.execute(u"EXEC standin_copy @from='%1', @to='%2'"_s.arg(from, to));
-}
-
 QString TdsServer::connectionText(const QString& database) const
 {
     return u"Driver={%1};Server=%2;Port=1433;Database=%3;Uid=%4;Pwd=;App=test;"_s.arg(QLatin1StringView(odbcTds),

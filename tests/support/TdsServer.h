@@ -23,8 +23,6 @@ public:
 
     /// Makes an empty database, in place of one of that name, and runs the statements of a script in it.
     void createDatabase(const QString& name, const QString& script = {});
-    /// Makes one database as the other one is now.
-    void copyDatabase(const QString& from, const QString& to);
     QString connectionText(const QString& database) const;
 
 private:
