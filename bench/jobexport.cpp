@@ -1,12 +1,12 @@
 // What an export to JobLink costs beside the bare inserts on the same server.
-#include "setup/Profile.h"
+#include "base/CredentialCipher.h"
+#include "base/SharedVariables.h"
 #include "jobexport/JobLinkSettings.h"
 #include "jobexport/WriteQuote.h"
 #include "platform/database/Sql.h"
-#include "platform/script/Script.h"
 #include "platform/profile.h"
-#include "base/CredentialCipher.h"
-#include "base/SharedVariables.h"
+#include "platform/script/Script.h"
+#include "setup/Profile.h"
 #include "shell/eKEST.h"
 #include "support/MariaDbServer.h"
 
@@ -36,7 +36,7 @@ public:
         server.createDatabase(u"jobs"_s, QString::fromUtf8(tables.readAll()));
         jobs.open(server.connectionText(u"jobs"_s));
         InitCipherKey();
-        StoreJobLinkSettings({u"127.0.0.1"_s, server.port(), u"jobs"_s, server.user(), server.password()});
+        storeJobLinkSettings({u"127.0.0.1"_s, server.port(), u"jobs"_s, server.user(), server.password()});
     }
 
     void setLines(int lines)

@@ -1,15 +1,15 @@
 // Report 730: the table's cost for each line of the quote, and the PDF against the bare painting of the same document.
 #include "platform/print/Report.h"
 
-#include "setup/QuoteDatabase.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 #include "messages/Envelope.h"
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
-#include "platform/profile.h"
 #include "platform/print/Pages.h"
+#include "platform/profile.h"
 #include "reports/BuildAuthReport.h"
-#include "base/SharedVariables.h"
-#include "base/modDBAccess.h"
+#include "setup/QuoteDatabase.h"
 
 #include <QAbstractTextDocumentLayout>
 #include <QApplication>
@@ -64,7 +64,7 @@ public:
         text += element(u"quoteBody"_s, element(u"quoteReference"_s, u"500"_s) + element(u"gst"_s, u"1"_s) +
                                             element(u"quoteTotal"_s, u"11"_s) + element(u"labours"_s, labours));
         text += u"</p754:getAuthorisedQuoteResponse>"_s;
-        message = ParsedMessage(text);
+        message = parsedMessage(text);
     }
     ~ChangedQuote()
     {

@@ -2,19 +2,19 @@
 
 #include "app/MessageCommands.h"
 #include "app/Outcome.h"
-#include "setup/Profile.h"
 #include "app/TransportCommand.h"
-#include "jobexport/JobLinkSettings.h"
-#include "platform/RuntimeError.h"
-#include "platform/script/Script.h"
-#include "platform/desktop/Window.h"
-#include "platform/files/files.h"
-#include "platform/profile.h"
-#include "platform/print/OutputFolder.h"
-#include "platform/settings/registry.h"
 #include "base/CredentialCipher.h"
 #include "base/ModRegistry.h"
 #include "base/SharedVariables.h"
+#include "jobexport/JobLinkSettings.h"
+#include "platform/RuntimeError.h"
+#include "platform/desktop/Window.h"
+#include "platform/files/files.h"
+#include "platform/print/OutputFolder.h"
+#include "platform/profile.h"
+#include "platform/script/Script.h"
+#include "platform/settings/registry.h"
+#include "setup/Profile.h"
 #include "shell/component.h"
 #include "shell/eKEST.h"
 
@@ -176,7 +176,7 @@ Outcome jobLink(const QStringList& arguments)
         return refused(
             u"the password may hold no \";\", no blank at its ends and only characters of the code page 1252"_s,
             Refused);
-    StoreJobLinkSettings(settings);
+    storeJobLinkSettings(settings);
     return {.text = u"JobLink's settings are stored.\n"_s};
 }
 
@@ -231,7 +231,7 @@ bool profileExists()
 Outcome runConnected(const Command& command, const CommandLine& line)
 {
     const eKEST component;
-    if (!HasConnection())
+    if (!hasConnection())
         return {.exitCode = NoConnection};
     InitCipherKey();  // as the panel does: a load may export to JobLink
     return command.run(line);

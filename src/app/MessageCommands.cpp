@@ -1,12 +1,12 @@
 #include "app/MessageCommands.h"
 
-#include "messages/Folders.h"
+#include "base/SharedVariables.h"
 #include "messagelist/frmMessageList.h"
+#include "messages/Folders.h"
 #include "outbound/SendQuote.h"
-#include "platform/script/Script.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
-#include "base/SharedVariables.h"
+#include "platform/script/Script.h"
 #include "shell/eKEST.h"
 #include "utilities/FormatXML.h"
 
@@ -75,7 +75,7 @@ int notDone(const frmMessageList& window, const QString& buttonName, const QStri
         return Refused;
     const auto* button = window.findChild<QPushButton*>(buttonName);
     const QString caption = u'"' + button->text().remove(u'&') + u'"';
-    if (!IsBareName(file))
+    if (!isBareName(file))
         return refused(file + u" is no name of a file of the folder"_s, Refused).exitCode;
     if (!button->isEnabled())
         return refused(caption + u" is disabled for "_s + file, Refused).exitCode;
@@ -137,7 +137,7 @@ Outcome view(const QStringList& arguments)
     const std::optional<int> folder = folderNamed(arguments[0]);
     if (!folder)
         return refused(u"view takes unread, read or sent, and a file"_s, Usage);
-    if (!IsBareName(arguments[1]))
+    if (!isBareName(arguments[1]))
         return refused(arguments[1] + u" is no name of a file of the folder"_s, Refused);
     const QJsonArray boxes = boxesShown();
     const QString text = FormatXML(folderPath(*folder) + arguments[1]);
@@ -148,7 +148,7 @@ Outcome view(const QStringList& arguments)
 
 Outcome send(const QStringList& arguments)
 {
-    OpenHostQuote(arguments[0], arguments.value(1, u"0"_s));
+    openHostQuote(arguments[0], arguments.value(1, u"0"_s));
     bool sent = false;
     desktop::guarded(u"frmKEST.cmdOK_Click"_s, [&] { SendQuote(*grsQuote, &sent); });
     desktop::throwKept();

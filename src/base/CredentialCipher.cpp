@@ -70,7 +70,7 @@ QString DecryptText(const QString& hex)
     return files::fromCodePage(bytes);
 }
 
-QString EncryptText(const QString& plain)
+QString encryptText(const QString& plain)
 {
     if (plain.isEmpty())
         return {};

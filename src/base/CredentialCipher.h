@@ -14,6 +14,6 @@ QString DecryptText(const QString& hex);
 
 /// The form in which a credential is stored, so that DecryptText gives it back. Characters outside the code page
 /// Windows-1252 become "?".
-QString EncryptText(const QString& plain);
+QString encryptText(const QString& plain);
 
 }  // namespace kest

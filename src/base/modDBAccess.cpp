@@ -1,9 +1,9 @@
 #include "base/modDBAccess.h"
 
-#include "platform/RuntimeError.h"
-#include "platform/Prompt.h"
-#include "platform/values.h"
 #include "base/SharedVariables.h"
+#include "platform/Prompt.h"
+#include "platform/RuntimeError.h"
+#include "platform/values.h"
 
 #include <QSysInfo>
 
@@ -35,7 +35,7 @@ QString splashSetting(const QString& key, const QString& fallback = {})
 
 }  // namespace
 
-void ReadConnectionSettings()
+void readConnectionSettings()
 {
     const QString useMaster = splashSetting(u"TabletUseMaster"_s);
     const QString prefix = useMaster == u"1"_s ? u"TabletMaster"_s : QString();
@@ -49,7 +49,7 @@ void ReadConnectionSettings()
         gsServer = u"(local)"_s;
 }
 
-int DriverNumber(CopyUp copyUp)
+int driverNumber(CopyUp copyUp)
 {
     const QString type = GetRegSetting(u"wirra32"_s, u"frmSplash"_s, u"ClientConnectionType"_s, u"0"_s, copyUp);
     const QString system =
@@ -89,10 +89,10 @@ void OpenDatabase()
     if (!gcnDB)
         gcnDB = std::make_shared<db::Connection>();  // else the same one: recordsets on it, the panel's too, go on
     lastFailure = {};
-    attempt([] { ReadConnectionSettings(); });
+    attempt([] { readConnectionSettings(); });
     attempt([] {
         try {
-            gcnDB->open(ConnectionText(DriverNumber()));
+            gcnDB->open(connectionText(driverNumber()));
         } catch (const RuntimeError& error) {
             lastFailure = {error.number(), error.description()};
             throw;
@@ -101,7 +101,7 @@ void OpenDatabase()
     attempt([] { gcnDB->setCommandTimeout(commandTimeout); });
 }
 
-QString ConnectionText(int driverNumber)
+QString connectionText(int driverNumber)
 {
     if (gsServer.startsWith(mysqlServer, Qt::CaseInsensitive)) {
         const QStringList address = gsServer.mid(mysqlServer.size()).split(u':');
@@ -138,7 +138,7 @@ std::optional<db::Recordset> OpenRecordset(const QString& select, bool disconnec
     return rows;
 }
 
-db::Recordset Opened(const QString& select)
+db::Recordset opened(const QString& select)
 {
     db::Recordset rows(gConn);
     rows.open(select);

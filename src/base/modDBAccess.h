@@ -1,8 +1,8 @@
 // The one connection to the host's database.
 #pragma once
 
-#include "platform/database/Recordset.h"
 #include "base/ModRegistry.h"
+#include "platform/database/Recordset.h"
 
 #include <QString>
 
@@ -24,15 +24,15 @@ bool EnsureConnection();
 /// Reads the settings and opens the connection; a failure shows only as a closed connection.
 void OpenDatabase();
 /// Takes server, instance, database and password from the settings, which stay where they are.
-void ReadConnectionSettings();
+void readConnectionSettings();
 /// The text that the connection is opened with, from the variables above; empty for a driver number that names none.
-QString ConnectionText(int driverNumber);
+QString connectionText(int driverNumber);
 /// The number of the driver, by the settings.
-int DriverNumber(CopyUp copyUp = CopyUp::Yes);
+int driverNumber(CopyUp copyUp = CopyUp::Yes);
 /// A query on a fresh recordset, or none after a critical message when there is no connection.
 std::optional<db::Recordset> OpenRecordset(const QString& select, bool disconnect = false, bool reconnect = false);
 /// A query on the shared connection `gConn`, open. Failures are thrown.
-db::Recordset Opened(const QString& select);
+db::Recordset opened(const QString& select);
 /// This machine's name; empty on failure.
 QString GetComputerName();
 

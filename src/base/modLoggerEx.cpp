@@ -38,10 +38,10 @@ void LogError(int line, const QString& source, const QString& number, const QStr
         return;
 
     const QString text = record(line, source, number, description);
-    if (LogIsFull(ErrorLogPath()))
-        files::write(ErrorLogPath(), text);
+    if (LogIsFull(errorLogPath()))
+        files::write(errorLogPath(), text);
     else
-        files::append(ErrorLogPath(), text);
+        files::append(errorLogPath(), text);
 }
 
 void LogError(const RuntimeError& error, const QString& source, const QString& title)
@@ -54,7 +54,7 @@ bool LogIsFull(const QString& path)
     return files::exists(path) && files::size(path) >= fullAt;
 }
 
-QString ErrorLogPath()
+QString errorLogPath()
 {
     return profile::componentFolder() + u"/kest2error.log"_s;
 }

@@ -18,7 +18,7 @@ void LogError(const RuntimeError& error, const QString& source, const QString& t
 /// True when the file exists and is at least 1,048,576 bytes long.
 bool LogIsFull(const QString& path);
 /// Where records go.
-QString ErrorLogPath();
+QString errorLogPath();
 
 /// Blanks trimmed at both ends, every double quote turned into a single one.
 QString QuoteClean(const QString& text);

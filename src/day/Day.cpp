@@ -1,13 +1,13 @@
 #include "day/Day.h"
 
-#include "setup/QuoteDatabase.h"
+#include "base/SharedVariables.h"
 #include "loopback/TransportRunner.h"
 #include "loopback/TransportWindow.h"
 #include "platform/RuntimeError.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
 #include "platform/print/OutputFolder.h"
-#include "base/SharedVariables.h"
+#include "setup/QuoteDatabase.h"
 #include "utilities/frmLogin.h"
 
 #include <QDir>
@@ -106,7 +106,7 @@ desktop::Record Day::driven(const QString& text, const std::function<void()>& wi
 {
     QString filled = text;
     filled.replace(u"@pictures@"_s, pictures);
-    filled.replace(u"@password@"_s, QString::number(DayPassword(QDate::currentDate())));
+    filled.replace(u"@password@"_s, QString::number(dayPassword(QDate::currentDate())));
     const auto script = std::make_shared<desktop::Script>(QJsonDocument::fromJson(filled.toUtf8()).object());
     for (const QString& window : {u"frmPrintPreview"_s, u"frmSubletAuth"_s, u"frmViewPDF"_s})
         script->recordAndClose(window);

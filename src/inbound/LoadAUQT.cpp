@@ -1,10 +1,11 @@
 // The insurer accepts a quote, as it stands or with changed lines, under an authority number.
+#include "base/Helpers.h"
+#include "base/modLoggerEx.h"
 #include "inbound/modLoadXML.h"
 #include "jobexport/WriteQuote.h"
 #include "messages/Envelope.h"
-#include "sublets/frmSubletAuth.h"
-#include "platform/database/Sql.h"
 #include "platform/Prompt.h"
+#include "platform/database/Sql.h"
 #include "platform/values.h"
 #include "quotedata/NoteChain.h"
 #include "quotedata/QuoteTotals.h"
@@ -13,8 +14,7 @@
 #include "reports/BuildAuthReport.h"
 #include "reports/ReportTable.h"
 #include "reports/frmPrintPreview.h"
-#include "base/Helpers.h"
-#include "base/modLoggerEx.h"
+#include "sublets/frmSubletAuth.h"
 
 #include <optional>
 #include <utility>
@@ -73,12 +73,12 @@ Authorisation::Authorisation(const xml::Document& message)
 
 /// The quote of that number, else the one of that request, network number and car, whose number and subquote then take
 /// the place of the given ones. Where several are so, the first, and the given ones stand.
-db::Recordset OpenQuote(const Authorisation& told, QString& number, QString& subquote)
+db::Recordset openQuote(const Authorisation& told, QString& number, QString& subquote)
 {
-    db::Recordset quote = Opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+    db::Recordset quote = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
     if (!quote.eof() || told.originalNumber.trimmed().isEmpty())
         return quote;
-    quote = Opened(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' AND KESTQuoteNo='{}' AND REGO = '{}'", told.request,
+    quote = opened(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' AND KESTQuoteNo='{}' AND REGO = '{}'", told.request,
                        told.originalNumber, told.rego));
     if (quote.recordCount() == 1) {
         number = quote.text(u"QTNNO"_s);
@@ -88,9 +88,9 @@ db::Recordset OpenQuote(const Authorisation& told, QString& number, QString& sub
 }
 
 /// Excess and customer's contribution, which the main quote alone carries. An amount that the quote lacks stays out.
-void TakeOverMoney(const Authorisation& told, const QString& number, const QString& subquote)
+void takeOverMoney(const Authorisation& told, const QString& number, const QString& subquote)
 {
-    db::Recordset quote = Opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+    db::Recordset quote = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
     const auto has = [&](const QString& column) { return !quote.text(column).trimmed().isEmpty(); };
 
     const double excess = SafeVal(told.excess, u"0"_s);
@@ -107,7 +107,7 @@ void TakeOverMoney(const Authorisation& told, const QString& number, const QStri
 }
 
 /// "Whitby, Morgan Lee" of "Morgan Lee Whitby".
-QString SurnameFirst(const QString& name)
+QString surnameFirst(const QString& name)
 {
     constexpr qsizetype surnameLength = 15;  // characters
     const qsizetype blank = name.lastIndexOf(u' ');
@@ -116,34 +116,34 @@ QString SurnameFirst(const QString& name)
     return given.isEmpty() ? surname : surname + u", "_s + given;
 }
 
-void FillHeader(db::Recordset& quote, const Authorisation& told, const QString& rego, const db::Recordset& insurer)
+void fillHeader(db::Recordset& quote, const Authorisation& told, const QString& rego, const db::Recordset& insurer)
 {
-    Fill(quote, {
-                    {"KESTQRNo"_L1, told.request},
-                    {"KESTQuoteNo"_L1, told.originalNumber},
-                    {"KESTAuthNo"_L1, told.authorisedNumber},
-                    {"Claim"_L1, told.claim},
-                    {"REGO"_L1, rego},
-                    {"assess"_L1, SurnameFirst(told.assessor)},
-                    {"AuthDate"_L1, shortDate(QDate::currentDate())},
-                    {"targetdate"_L1, toDate(told.completionDate)},
-                    {"INSURER_ID"_L1, insurer.value(u"INSURER_ID"_s)},
-                    {"RR_RATE"_L1, 1},
-                    {"RA_RATE"_L1, 1},
-                    {"paint_rate"_L1, 1},
-                    {"QSENT"_L1, u"R"_s},
-                    {"excess_gst"_L1, 1},
-                });
-    FillWithoutTotals(quote);
+    fillColumn(quote, {
+                          {"KESTQRNo"_L1, told.request},
+                          {"KESTQuoteNo"_L1, told.originalNumber},
+                          {"KESTAuthNo"_L1, told.authorisedNumber},
+                          {"Claim"_L1, told.claim},
+                          {"REGO"_L1, rego},
+                          {"assess"_L1, surnameFirst(told.assessor)},
+                          {"AuthDate"_L1, shortDate(QDate::currentDate())},
+                          {"targetdate"_L1, toDate(told.completionDate)},
+                          {"INSURER_ID"_L1, insurer.value(u"INSURER_ID"_s)},
+                          {"RR_RATE"_L1, 1},
+                          {"RA_RATE"_L1, 1},
+                          {"paint_rate"_L1, 1},
+                          {"QSENT"_L1, u"R"_s},
+                          {"excess_gst"_L1, 1},
+                      });
+    fillWithoutTotals(quote);
 }
 
-bool RefusePlainly(const QString& text)
+bool refusePlainly(const QString& text)
 {
     desktop::msgBox(text);
     return false;
 }
 
-void ShowResults(const db::Recordset& quote, std::optional<db::Recordset>& comparison, const QString& number,
+void showResults(const db::Recordset& quote, std::optional<db::Recordset>& comparison, const QString& number,
                  const QString& subquote)
 {
     WriteQuote(quote.text(u"QTNNO"_s), quote.text(u"Subquote"_s));
@@ -155,54 +155,54 @@ void ShowResults(const db::Recordset& quote, std::optional<db::Recordset>& compa
     }
 }
 
-bool Authorise(QString& text)
+bool authorise(QString& text)
 {
-    const xml::Document message = ParsedMessage(text);
+    const xml::Document message = parsedMessage(text);
     const Authorisation told(message);
     auto [number, subquote] = SplitQuoteRef(told.reference);
 
-    db::Recordset quote = OpenQuote(told, number, subquote);
+    db::Recordset quote = openQuote(told, number, subquote);
     if (quote.eof())
-        return Refuse(u"Couldn't Locate Matching KEST Quote, Please contact MarlinDesk Support."_s);
+        return refuse(u"Couldn't Locate Matching KEST Quote, Please contact MarlinDesk Support."_s);
     const QString rego = told.rego == unknownRego ? quote.text(u"REGO"_s) : told.rego;
     const QVariant rowSubquote = quote.value(u"Subquote"_s);
-    db::Recordset lines = Opened(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, rowSubquote));
+    db::Recordset lines = opened(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, rowSubquote));
     if (lines.eof())
-        return RefusePlainly(u"Error: Cannot load an Authorisation onto a blank quote!"_s);
-    db::Recordset notes = Opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, rowSubquote));
-    db::Recordset car = Opened(sql("SELECT * FROM CAR WHERE REGO='{}'", rego));
+        return refusePlainly(u"Error: Cannot load an Authorisation onto a blank quote!"_s);
+    db::Recordset notes = opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, rowSubquote));
+    db::Recordset car = opened(sql("SELECT * FROM CAR WHERE REGO='{}'", rego));
     const db::Recordset insurer =
-        Opened(sql("SELECT * FROM INSURER WHERE INSURER_ID={}", quote.value(u"INSURER_ID"_s)));
+        opened(sql("SELECT * FROM INSURER WHERE INSURER_ID={}", quote.value(u"INSURER_ID"_s)));
     if (car.eof())
-        return RefusePlainly(u"Could not locate Car listed on Authorisation. Please Contact MarlinDesk Support."_s);
+        return refusePlainly(u"Could not locate Car listed on Authorisation. Please Contact MarlinDesk Support."_s);
     car.set(u"KEST"_s, 1);
     car.update();
     if (insurer.eof())
-        return Refuse(u"Error locating a valid insurer, Please contact MarlinDesk Support."_s);
+        return refuse(u"Error locating a valid insurer, Please contact MarlinDesk Support."_s);
     if (notes.eof())
         notes.addNew();
 
     // before the lines change: it shows them as they are now
     std::optional<db::Recordset> comparison = BuildAuthReport(message, number, subquote, false);
     if (subquote == u"0"_s)
-        TakeOverMoney(told, number, subquote);
+        takeOverMoney(told, number, subquote);
     quote.requery();
-    FillHeader(quote, told, rego, insurer);
+    fillHeader(quote, told, rego, insurer);
     if (!GetNoteStatus(u"Quote Request"_s, notes.text(u"remarks"_s)).isEmpty())
-        Apply(requestWon, quote, notes);
-    Apply(quoteAuthorised, quote, notes);
+        applyTransition(requestWon, quote, notes);
+    applyTransition(quoteAuthorised, quote, notes);
     quote.update();
 
     if (!LoadQuoteBody(quote, lines, message))
-        return RefusePlainly(u"Error processing Quote Items, Please contact MarlinDesk Support."_s);
-    Fill(notes, {{"QTNNO"_L1, quote.value(u"QTNNO"_s)}, {"Subquote"_L1, quote.value(u"Subquote"_s)}});
+        return refusePlainly(u"Error processing Quote Items, Please contact MarlinDesk Support."_s);
+    fillColumn(notes, {{"QTNNO"_L1, quote.value(u"QTNNO"_s)}, {"Subquote"_L1, quote.value(u"Subquote"_s)}});
     notes.update();
     if (lines.recordCount() > 0)
         lines.moveFirst();  // a last line that was not found leaves the lines at their end, where nothing counts
     CalcAuthorisedTotals(quote, lines);
     if (comparison)
-        FinishAuthReport(*comparison, quote, lines);
-    ShowResults(quote, comparison, number, subquote);
+        finishAuthReport(*comparison, quote, lines);
+    showResults(quote, comparison, number, subquote);
     return true;
 }
 
@@ -211,7 +211,7 @@ bool Authorise(QString& text)
 bool LoadAUQT(QString& text, const QString&)
 {
     try {
-        return Authorise(text);
+        return authorise(text);
     } catch (const RuntimeError& error) {
         LogError(error, u"modLoadXML.LoadAUQT"_s, u"LoadAUQT"_s);
         return false;

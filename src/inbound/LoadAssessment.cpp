@@ -1,12 +1,12 @@
 // What became of a quote after it was sent: adjustments, assessment results and their back-outs, submission responses.
+#include "base/Helpers.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
-#include "platform/database/Sql.h"
 #include "platform/Prompt.h"
+#include "platform/database/Sql.h"
 #include "quotedata/NoteChain.h"
 #include "quotedata/StateTable.h"
 #include "reports/PrintXML.h"
-#include "base/Helpers.h"
 
 #include <utility>
 
@@ -22,7 +22,7 @@ constexpr std::pair<QLatin1StringView, QLatin1StringView> reasonTexts[] = {
     {"METH"_L1, "Method of Repair"_L1},   {"TLSS"_L1, "Total Loss"_L1},       {"NOTP"_L1, "Repair not Proceeding"_L1},
 };
 
-QString ReasonText(const QString& code)
+QString reasonText(const QString& code)
 {
     for (const auto& [known, text] : reasonTexts) {
         if (known == code)
@@ -31,16 +31,16 @@ QString ReasonText(const QString& code)
     return u"Unknown Reason Code - "_s + code;
 }
 
-bool RefuseRequestNumber()
+bool refuseRequestNumber()
 {
-    return Refuse(u"Couldn't Locate Matching KEST Quote Request Number, Please contact MarlinDesk Support."_s);
+    return refuse(u"Couldn't Locate Matching KEST Quote Request Number, Please contact MarlinDesk Support."_s);
 }
 
 /// The state that a quote goes back to. An authorisation is told from a failed tender by its number, a rejected
 /// supplementary quote by its note.
-const Transition& BackOutOf(const db::Recordset& quote, const db::Recordset& notes)
+const Transition& backOutOf(const db::Recordset& quote, const db::Recordset& notes)
 {
-    if (!IsSupplementary(quote))
+    if (!isSupplementary(quote))
         return quote.text(u"KESTAuthNo"_s).isEmpty() ? failedTenderBackedOut : authorisationBackedOut;
     const QString remarks = notes.text(u"remarks"_s);
     bool rejected = !GetNoteStatus(u"Rejected"_s, remarks).isEmpty();
@@ -53,27 +53,27 @@ const Transition& BackOutOf(const db::Recordset& quote, const db::Recordset& not
 
 bool LoadADQT(QString& text, const QString& fileName)
 {
-    const xml::Document message = ParsedMessage(text);
+    const xml::Document message = parsedMessage(text);
     const auto [number, subquote] =
         SplitQuoteRef(message.textOf(u"//rootns:getAdjustedQuoteResponse/rootns:quoteBody/rootns:quoteReference"_s));
     const QString request = message.textOf(u"//rootns:quoteRequestNumber"_s);
 
-    db::Recordset quote = Opened(
+    db::Recordset quote = opened(
         sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}' AND KESTQRNo='{}'", number, subquote, request));
     if (quote.eof() && !request.trimmed().isEmpty())
-        quote = Opened(sql("SELECT TOP 1 * FROM QUOTE1 WHERE KESTQRNo='{}' order by rec_id DESC", request));
+        quote = opened(sql("SELECT TOP 1 * FROM QUOTE1 WHERE KESTQRNo='{}' order by rec_id DESC", request));
     if (quote.eof())
-        return Refuse(u"Error locating Quote in Database, Please contact Marlindesk Support."_s);
+        return refuse(u"Error locating Quote in Database, Please contact Marlindesk Support."_s);
 
-    const db::Recordset lines = Opened(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'",
+    const db::Recordset lines = opened(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'",
                                            quote.value(u"QTNNO"_s), quote.value(u"Subquote"_s)));
-    db::Recordset notes = OpenNotes(quote);
+    db::Recordset notes = openNotes(quote);
     if (lines.eof()) {
         desktop::msgBox(u"Error: Cannot load an Adjustment onto a blank quote!"_s);
         return false;
     }
 
-    Apply(adjustmentSuggested, quote, notes);
+    applyTransition(adjustmentSuggested, quote, notes);
     quote.update();
     notes.update();
     PrintXML(fileName, false);
@@ -82,17 +82,17 @@ bool LoadADQT(QString& text, const QString& fileName)
 
 bool LoadARES(QString& text, const QString&)
 {
-    const xml::Document message = ParsedMessage(text);
+    const xml::Document message = parsedMessage(text);
     const QString number = message.textOf(u"//rootns:getAssmntResultResponse/rootns:kestOriginalQuoteNumber"_s);
-    db::Recordset quote = Opened(sql("SELECT * FROM QUOTE1 WHERE KESTQuoteNo='{}' ORDER BY rec_id DESC", number));
-    if (IsUnknown(number, quote))
-        return RefuseRequestNumber();
+    db::Recordset quote = opened(sql("SELECT * FROM QUOTE1 WHERE KESTQuoteNo='{}' ORDER BY rec_id DESC", number));
+    if (isUnknown(number, quote))
+        return refuseRequestNumber();
     quote.moveLast();  // the oldest quote with that number
-    db::Recordset notes = OpenNotes(quote);
+    db::Recordset notes = openNotes(quote);
 
     const QString code = message.textOf(u"//rootns:getAssmntResultResponse/rootns:reasonCode"_s).toUpper();
     const Transition& lost = code == u"TLSS"_s ? totalLoss : tenderFailed;
-    Apply(IsSupplementary(quote) ? supplementaryRejected : lost, quote, notes, ReasonText(code));
+    applyTransition(isSupplementary(quote) ? supplementaryRejected : lost, quote, notes, reasonText(code));
     quote.update();
     notes.update();
     return true;
@@ -100,14 +100,14 @@ bool LoadARES(QString& text, const QString&)
 
 bool LoadBACA(QString& text, const QString& fileName)
 {
-    const xml::Document message = ParsedMessage(text);
+    const xml::Document message = parsedMessage(text);
     const QString request = message.textOf(u"//rootns:getBackoutAssmntResponse/rootns:kestQuoteRequestNumber"_s);
-    db::Recordset quote = Opened(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request));
-    if (IsUnknown(request, quote))
-        return RefuseRequestNumber();
-    db::Recordset notes = OpenNotes(quote);  // of the newest quote of the request
+    db::Recordset quote = opened(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request));
+    if (isUnknown(request, quote))
+        return refuseRequestNumber();
+    db::Recordset notes = openNotes(quote);  // of the newest quote of the request
 
-    Apply(BackOutOf(quote, notes), quote, notes);
+    applyTransition(backOutOf(quote, notes), quote, notes);
     quote.update();
     notes.update();
     PrintXML(fileName, false);
@@ -118,14 +118,14 @@ void LoadSubmissionResponse(QString& text, const QString& fileName)
 {
     const QString number = fileName.section(u'_', 1, 1);
     const QString subquote = fileName.section(u'_', 2).left(1);
-    db::Recordset quote = Opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
-    db::Recordset notes = Opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+    db::Recordset quote = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+    db::Recordset notes = opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
 
-    const xml::Document message = ParsedMessage(text);
+    const xml::Document message = parsedMessage(text);
     const xml::Node root = message.documentElement();
     quote.set(u"KESTQuoteNo"_s, root.textOf(u"rootns:kestQuoteNumber"_s));
     if (root.textOf(u"rootns:quoteSubmissionStatus"_s) == u"Submitted"_s)
-        Apply(quoteSubmitted, quote, notes);
+        applyTransition(quoteSubmitted, quote, notes);
     quote.update();
     notes.update();
 }

@@ -1,15 +1,15 @@
 // A quote that was written outside the shop's system takes its place among the shop's quotes, with all its lines.
+#include "base/Helpers.h"
+#include "base/SharedVariables.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
+#include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
-#include "platform/Prompt.h"
 #include "platform/values.h"
 #include "quotedata/QuoteTotals.h"
 #include "quotedata/StateTable.h"
 #include "reports/PrintXML.h"
-#include "base/Helpers.h"
-#include "base/SharedVariables.h"
 
 #include <optional>
 #include <tuple>
@@ -50,47 +50,47 @@ ManualQuote::ManualQuote(const xml::Document& message)
     std::tie(told.number, told.subquote) = SplitQuoteRef(element("quoteBody/rootns:quoteReference"_L1));
 }
 
-QString NewNumber(const QString& given, const db::Recordset& cinfo)
+QString newNumber(const QString& given, const db::Recordset& cinfo)
 {
     db::Recordset tried(gConn);
     return NextQuoteNumber(given, cinfo, tried, false);
 }
 
-QString Behind(const db::Recordset& quote)
+QString behind(const db::Recordset& quote)
 {
     return QString::number(toLong(quote.value(u"Subquote"_s)) + 1);
 }
 
-QuoteKey KeyOf(const db::Recordset& quote)
+QuoteKey keyOf(const db::Recordset& quote)
 {
     return {quote.text(u"QTNNO"_s), quote.text(u"Subquote"_s)};
 }
 
 /// The next subquote of the quote that it belongs to; none after a box where the shop has no such quote.
-std::optional<QuoteKey> MatchSupplementary(const ManualQuote& manual, const db::Recordset& cinfo)
+std::optional<QuoteKey> matchSupplementary(const ManualQuote& manual, const db::Recordset& cinfo)
 {
     const qint64 subquote = toLong(manual.told.subquote);
-    const QString number = subquote == 0 ? NewNumber(manual.told.number, cinfo) : manual.told.number;
+    const QString number = subquote == 0 ? newNumber(manual.told.number, cinfo) : manual.told.number;
 
     db::Recordset quotes =
-        Opened(sql("SELECT QTNNO, subquote FROM QUOTE1 WHERE QTNNO = '{}' ORDER BY subquote", number));
+        opened(sql("SELECT QTNNO, subquote FROM QUOTE1 WHERE QTNNO = '{}' ORDER BY subquote", number));
     if (!quotes.eof()) {
         quotes.moveLast();
         const bool isAbove = subquote > toLong(quotes.value(u"subquote"_s));
-        return QuoteKey{number, isAbove ? manual.told.subquote : Behind(quotes)};
+        return QuoteKey{number, isAbove ? manual.told.subquote : behind(quotes)};
     }
     quotes =
-        Opened(sql("SELECT QTNNO, SUBQUOTE FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY SUBQUOTE DESC", manual.request));
-    if (!IsUnknown(manual.request, quotes))
-        return QuoteKey{quotes.text(u"QTNNO"_s), Behind(quotes)};
-    Refuse(u"Failed matching to existing parent KEST Quote"_s);
+        opened(sql("SELECT QTNNO, SUBQUOTE FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY SUBQUOTE DESC", manual.request));
+    if (!isUnknown(manual.request, quotes))
+        return QuoteKey{quotes.text(u"QTNNO"_s), behind(quotes)};
+    refuse(u"Failed matching to existing parent KEST Quote"_s);
     return {};
 }
 
 /// A registration that no car has: the given one, or with dots behind it.
-QString FreeRego(const QString& rego)
+QString freeRego(const QString& rego)
 {
-    db::Recordset cars = Opened(sql("SELECT REGO FROM CAR WHERE REGO LIKE '{}%' ORDER BY REGO", rego));
+    db::Recordset cars = opened(sql("SELECT REGO FROM CAR WHERE REGO LIKE '{}%' ORDER BY REGO", rego));
     QString free = rego;
     for (cars.find(sql("REGO='{}'", free)); !cars.eof(); cars.find(sql("REGO='{}'", free)))
         free += u'.';
@@ -99,9 +99,9 @@ QString FreeRego(const QString& rego)
 
 /// The shop typed the registration with blanks or dashes: its car and its quote take the network's spelling, and a car
 /// that already bears it moves out of the way.
-void RepairRego(const QString& typed, const QString& rego, const QuoteKey& quote)
+void repairRego(const QString& typed, const QString& rego, const QuoteKey& quote)
 {
-    const QString free = FreeRego(rego);
+    const QString free = freeRego(rego);
     gConn->execute(sql("UPDATE CAR SET REGO='{}' WHERE REGO='{}'", free, rego));
     gConn->execute(sql("UPDATE CAR SET REGO='{}' WHERE REGO='{}'", rego, typed));
     gConn->execute(
@@ -109,61 +109,61 @@ void RepairRego(const QString& typed, const QString& rego, const QuoteKey& quote
 }
 
 /// The quote of that number or of that request, where it is of the same car; else a new number.
-QuoteKey MatchMain(const ManualQuote& manual, const db::Recordset& cinfo)
+QuoteKey matchMain(const ManualQuote& manual, const db::Recordset& cinfo)
 {
     const QString rego = manual.rego.trimmed().toUpper();
     const auto isOfCar = [&](const QString& typed) { return AlphaNumericOnly(typed).toUpper() == rego; };
 
-    const db::Recordset numbered = Opened(
+    const db::Recordset numbered = opened(
         sql("SELECT QTNNO, subquote, Rego FROM QUOTE1 WHERE QTNNO = '{}' ORDER BY subquote", manual.told.number));
     if (!numbered.eof()) {
         const QString typed = numbered.text(u"Rego"_s);
         if (typed.trimmed().toUpper() == rego)
-            return KeyOf(numbered);
+            return keyOf(numbered);
         if (isOfCar(typed)) {
-            RepairRego(typed, manual.rego, KeyOf(numbered));
-            return KeyOf(numbered);
+            repairRego(typed, manual.rego, keyOf(numbered));
+            return keyOf(numbered);
         }
-        return {NewNumber(manual.told.number, cinfo), u"0"_s};
+        return {newNumber(manual.told.number, cinfo), u"0"_s};
     }
     const db::Recordset requested =
-        Opened(sql("SELECT QTNNO, Subquote, Rego FROM QUOTE1 WHERE KESTQRNO='{}'", manual.request));
-    if (!IsUnknown(manual.request, requested) && isOfCar(requested.text(u"Rego"_s)))
-        return KeyOf(requested);
-    return {NewNumber(manual.told.number, cinfo), u"0"_s};
+        opened(sql("SELECT QTNNO, Subquote, Rego FROM QUOTE1 WHERE KESTQRNO='{}'", manual.request));
+    if (!isUnknown(manual.request, requested) && isOfCar(requested.text(u"Rego"_s)))
+        return keyOf(requested);
+    return {newNumber(manual.told.number, cinfo), u"0"_s};
 }
 
-void FillHeader(db::Recordset& quote, const ManualQuote& manual, const QuoteKey& key, const db::Recordset& insurer,
+void fillHeader(db::Recordset& quote, const ManualQuote& manual, const QuoteKey& key, const db::Recordset& insurer,
                 const db::Recordset& cinfo)
 {
-    Fill(quote, {
-                    {"KESTQRNo"_L1, manual.request},
-                    {"KESTQuoteNo"_L1, manual.networkNumber},
-                    {"Claim"_L1, manual.claim},
-                    {"REGO"_L1, manual.rego},
-                    {"qtndate"_L1, shortDate(QDate::currentDate())},
-                    {"INSURER_ID"_L1, insurer.value(u"INSURER_ID"_s)},
-                    {"RR_RATE"_L1, 1},
-                    {"RA_RATE"_L1, 1},
-                    {"paint_rate"_L1, 1},
-                    {"QSENT"_L1, u"R"_s},
-                    {"excess"_L1, 0},
-                    {"contri"_L1, 0},
-                    {"NEWPC"_L1, insurer.value(u"new_mu"_s)},
-                    {"SECONDPC"_L1, cinfo.value(u"second_mu"_s)},
-                    {"RECOREPC"_L1, cinfo.value(u"recore_mu"_s)},
-                    {"AFTERPC"_L1, cinfo.value(u"after_mu"_s)},
-                    {"assess"_L1, u""_s},
-                    {"excess_gst"_L1, 1},
-                    {"Type"_L1, u"MTA"_s},
-                    {"ExtraInfo"_L1, true},
-                    {"QTNNO"_L1, key.number},
-                    {"Subquote"_L1, key.subquote},
-                });
-    FillWithoutTotals(quote);
+    fillColumn(quote, {
+                          {"KESTQRNo"_L1, manual.request},
+                          {"KESTQuoteNo"_L1, manual.networkNumber},
+                          {"Claim"_L1, manual.claim},
+                          {"REGO"_L1, manual.rego},
+                          {"qtndate"_L1, shortDate(QDate::currentDate())},
+                          {"INSURER_ID"_L1, insurer.value(u"INSURER_ID"_s)},
+                          {"RR_RATE"_L1, 1},
+                          {"RA_RATE"_L1, 1},
+                          {"paint_rate"_L1, 1},
+                          {"QSENT"_L1, u"R"_s},
+                          {"excess"_L1, 0},
+                          {"contri"_L1, 0},
+                          {"NEWPC"_L1, insurer.value(u"new_mu"_s)},
+                          {"SECONDPC"_L1, cinfo.value(u"second_mu"_s)},
+                          {"RECOREPC"_L1, cinfo.value(u"recore_mu"_s)},
+                          {"AFTERPC"_L1, cinfo.value(u"after_mu"_s)},
+                          {"assess"_L1, u""_s},
+                          {"excess_gst"_L1, 1},
+                          {"Type"_L1, u"MTA"_s},
+                          {"ExtraInfo"_L1, true},
+                          {"QTNNO"_L1, key.number},
+                          {"Subquote"_L1, key.subquote},
+                      });
+    fillWithoutTotals(quote);
 }
 
-bool RefuseLines()
+bool refuseLines()
 {
     desktop::msgBox(u"Error processing Quote Items, Please contact MarlinDesk Support."_s);
     return false;
@@ -173,26 +173,26 @@ bool RefuseLines()
 
 bool LoadMANQ(QString& text, const QString& fileName)
 {
-    const xml::Document message = ParsedMessage(text);
-    const db::Recordset cinfo = Opened(u"SELECT * FROM CINFO"_s);
-    db::Recordset colours = Opened(u"SELECT * FROM KESTColours"_s);
-    const db::Recordset insurer = Opened(u"SELECT * FROM INSURER WHERE KEST=1"_s);
+    const xml::Document message = parsedMessage(text);
+    const db::Recordset cinfo = opened(u"SELECT * FROM CINFO"_s);
+    db::Recordset colours = opened(u"SELECT * FROM KESTColours"_s);
+    const db::Recordset insurer = opened(u"SELECT * FROM INSURER WHERE KEST=1"_s);
     if (insurer.eof())
-        return Refuse(u"Error locating a valid insurer, Please contact MarlinDesk Support."_s);
+        return refuse(u"Error locating a valid insurer, Please contact MarlinDesk Support."_s);
 
     const ManualQuote manual(message);
     const std::optional<QuoteKey> key =
-        manual.isSupplementary ? MatchSupplementary(manual, cinfo) : MatchMain(manual, cinfo);
+        manual.isSupplementary ? matchSupplementary(manual, cinfo) : matchMain(manual, cinfo);
     if (!key)
         return false;
 
-    db::Recordset quote = Opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}' ORDER BY rec_id DESC",
+    db::Recordset quote = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}' ORDER BY rec_id DESC",
                                      key->number, key->subquote));
     db::Recordset lines =
-        Opened(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key->number, key->subquote));
+        opened(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key->number, key->subquote));
     db::Recordset notes =
-        Opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key->number, key->subquote));
-    db::Recordset car = Opened(sql("SELECT * FROM CAR WHERE REGO='{}'", manual.rego));
+        opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key->number, key->subquote));
+    db::Recordset car = opened(sql("SELECT * FROM CAR WHERE REGO='{}'", manual.rego));
     if (car.eof()) {
         desktop::msgBox(u"Could not find a car with registration number "_s + manual.rego +
                             u"\r\nPlease create the car and customer before loading this quote"_s,
@@ -207,32 +207,32 @@ bool LoadMANQ(QString& text, const QString& fileName)
         quote.addNew();
     if (notes.eof())
         notes.addNew();
-    FillHeader(quote, manual, *key, insurer, cinfo);
-    Apply(manualQuoteLoaded, quote, notes);
-    RespellColour(car, colours);
+    fillHeader(quote, manual, *key, insurer, cinfo);
+    applyTransition(manualQuoteLoaded, quote, notes);
+    respellColour(car, colours);
     car.set(u"REGO"_s, manual.rego);
 
     // From here on a failure leaves the quote without its lines until the message is loaded again.
-    if (!CheckQuoteBody(message))
-        return RefuseLines();
+    if (!checkQuoteBody(message))
+        return refuseLines();
     while (!lines.eof())
         lines.remove();
     car.update();
     {
-        const std::unique_ptr<db::Lock> newQuotes = LockNewQuotes();
+        const std::unique_ptr<db::Lock> newQuotes = lockNewQuotes();
         const db::Recordset standing =
-            Opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key->number, key->subquote));
+            opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key->number, key->subquote));
         if (isNew && !standing.eof())
             throw RuntimeError(
                 RowChanged, u"Another workstation has made quote %1/%2 meanwhile."_s.arg(key->number, key->subquote));
         quote.update();
     }
     if (!LoadQuoteBody(quote, lines, message))
-        return RefuseLines();
+        return refuseLines();
     CalcQuoteTotals(quote, lines);
     quote.update();
 
-    Fill(notes, {{"QTNNO"_L1, quote.value(u"QTNNO"_s)}, {"Subquote"_L1, quote.value(u"Subquote"_s)}});
+    fillColumn(notes, {{"QTNNO"_L1, quote.value(u"QTNNO"_s)}, {"Subquote"_L1, quote.value(u"Subquote"_s)}});
     notes.update();
     PrintXML(fileName, false);
     gsMatchedQTNNO = quote.text(u"QTNNO"_s);

@@ -1,4 +1,6 @@
 // A quote request becomes a new, empty quote of the shop, with car, customer, note and photographs.
+#include "base/Helpers.h"
+#include "base/SharedVariables.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
 #include "platform/database/Sql.h"
@@ -6,8 +8,6 @@
 #include "platform/values.h"
 #include "quotedata/StateTable.h"
 #include "reports/PrintXML.h"
-#include "base/Helpers.h"
-#include "base/SharedVariables.h"
 
 #include <QStringList>
 
@@ -26,7 +26,7 @@ constexpr std::pair<QLatin1StringView, QLatin1StringView> paintGroups[] = {
     {"SOLD"_L1, "S1"_L1}, {"CLER"_L1, "S2"_L1}, {"META"_L1, "M1"_L1}, {"PEAR"_L1, "M2"_L1}, {"HARL"_L1, "M3"_L1},
 };
 
-QString PaintGroup(const QString& paintType)
+QString paintGroup(const QString& paintType)
 {
     for (const auto& [type, group] : paintGroups) {
         if (type == paintType)
@@ -35,7 +35,7 @@ QString PaintGroup(const QString& paintType)
     return u"S3"_s;
 }
 
-QString Transmission(const QString& code)
+QString transmission(const QString& code)
 {
     if (code == u"A"_s)
         return u"Automatic"_s;
@@ -111,7 +111,7 @@ void Request::readRest(const xml::Document& message)
 }
 
 /// Stands on the insurer that requests are made out to; false where there is none.
-bool ChooseInsurer(db::Recordset& insurer)
+bool chooseInsurer(db::Recordset& insurer)
 {
     if (insurer.eof())
         return false;
@@ -123,7 +123,7 @@ bool ChooseInsurer(db::Recordset& insurer)
 }
 
 /// The car's customer, or the one of that name; a new row where there is none.
-db::Recordset OpenCustomer(const db::Recordset& car, const Request& request)
+db::Recordset openCustomer(const db::Recordset& car, const Request& request)
 {
     db::Recordset customer(gConn);
     if (!car.eof()) {
@@ -138,25 +138,25 @@ db::Recordset OpenCustomer(const db::Recordset& car, const Request& request)
     return customer;
 }
 
-void FillCustomer(db::Recordset& customer, const Request& request)
+void fillCustomer(db::Recordset& customer, const Request& request)
 {
     const QString none = u""_s;
-    Fill(customer, {
-                       {"NAME"_L1, request.companyName.isEmpty() ? request.surname : request.companyName},
-                       {"FIRSTNAME"_L1, request.firstName},
-                       {"SALUTATION"_L1, request.title},
-                       {"Account"_L1, 190},
-                       {"street"_L1, none},
-                       {"suburb"_L1, none},
-                       {"PHONE_B"_L1, none},
-                       {"Fax"_L1, none},
-                       {"PHONE_P"_L1, none},
-                       {"email"_L1, none},
-                       {"mobile"_L1, none},
-                   });
+    fillColumn(customer, {
+                             {"NAME"_L1, request.companyName.isEmpty() ? request.surname : request.companyName},
+                             {"FIRSTNAME"_L1, request.firstName},
+                             {"SALUTATION"_L1, request.title},
+                             {"Account"_L1, 190},
+                             {"street"_L1, none},
+                             {"suburb"_L1, none},
+                             {"PHONE_B"_L1, none},
+                             {"Fax"_L1, none},
+                             {"PHONE_P"_L1, none},
+                             {"email"_L1, none},
+                             {"mobile"_L1, none},
+                         });
 }
 
-QString BuildDate(const Request& request)
+QString buildDate(const Request& request)
 {
     if (request.builtYear <= 0)
         return u""_s;
@@ -164,7 +164,7 @@ QString BuildDate(const Request& request)
     return PadZeroLeft(QString::number(month), 2) + u'/' + QString::number(request.builtYear);
 }
 
-QString ColourOf(const QString& code, db::Recordset& colours)
+QString colourOf(const QString& code, db::Recordset& colours)
 {
     if (code.isEmpty())
         return u""_s;
@@ -172,69 +172,69 @@ QString ColourOf(const QString& code, db::Recordset& colours)
     return colours.eof() ? u""_s : colours.text(u"Script"_s).trimmed();
 }
 
-void FillNewCar(db::Recordset& car, const Request& request, const db::Recordset& model, db::Recordset& colours)
+void fillNewCar(db::Recordset& car, const Request& request, const db::Recordset& model, db::Recordset& colours)
 {
     const QString none = u""_s;
-    Fill(car, {
-                  {"PAINT_GP"_L1, PaintGroup(request.paintType)},
-                  {"REGO"_L1, request.rego},
-                  {"KEST"_L1, 1},
-                  {"MODEL_ID"_L1, model.value(u"MODEL_ID"_s)},
-                  {"BODY_ID"_L1, u"4"_s},
-                  {"BODY_ID2"_L1, u"4S"_s},
-                  {"ENGINE"_L1, none},
-                  {"SCHEDULE"_L1, none},
-                  {"MTA_SCHED"_L1, none},
-                  {"TRI_SCHED"_L1, none},
-                  {"UN_SCHED"_L1, none},
-                  {"paint_code"_L1, none},
-                  {"TRIM_CODE"_L1, none},
-                  {"OPT_CODE"_L1, none},
-                  {"MODEL_NO"_L1, none},
-                  {"Year"_L1, BuildDate(request)},
-                  {"COLOUR"_L1, ColourOf(request.colourCode, colours)},
-                  {"VIN"_L1, request.vin},
-                  {"XMission"_L1, Transmission(request.transmission)},
-              });
+    fillColumn(car, {
+                        {"PAINT_GP"_L1, paintGroup(request.paintType)},
+                        {"REGO"_L1, request.rego},
+                        {"KEST"_L1, 1},
+                        {"MODEL_ID"_L1, model.value(u"MODEL_ID"_s)},
+                        {"BODY_ID"_L1, u"4"_s},
+                        {"BODY_ID2"_L1, u"4S"_s},
+                        {"ENGINE"_L1, none},
+                        {"SCHEDULE"_L1, none},
+                        {"MTA_SCHED"_L1, none},
+                        {"TRI_SCHED"_L1, none},
+                        {"UN_SCHED"_L1, none},
+                        {"paint_code"_L1, none},
+                        {"TRIM_CODE"_L1, none},
+                        {"OPT_CODE"_L1, none},
+                        {"MODEL_NO"_L1, none},
+                        {"Year"_L1, buildDate(request)},
+                        {"COLOUR"_L1, colourOf(request.colourCode, colours)},
+                        {"VIN"_L1, request.vin},
+                        {"XMission"_L1, transmission(request.transmission)},
+                    });
     if (!request.cylinders.isEmpty())
         car.set(u"CYLINDERS"_s, SafeVal(request.cylinders, u"0"_s));
 }
 
-void FillQuote(db::Recordset& quote, const QString& quoteNumber, const Request& request, const db::Recordset& insurer,
+void fillQuote(db::Recordset& quote, const QString& quoteNumber, const Request& request, const db::Recordset& insurer,
                const db::Recordset& cinfo)
 {
-    Fill(quote, {
-                    {"QUOTER"_L1, u""_s},
-                    {"QTNNO"_L1, quoteNumber},
-                    {"Subquote"_L1, 0},
-                    {"qtndate"_L1, shortDate(QDate::currentDate())},
-                    {"INSURER_ID"_L1, insurer.value(u"INSURER_ID"_s)},
-                    {"KESTQRNo"_L1, request.number},
-                    {"KESTQRVer"_L1, request.version},
-                    {"Claim"_L1, request.claim},
-                    {"REGO"_L1, request.rego},
-                    {"RR_RATE"_L1, insurer.value(u"RR_RATE"_s)},
-                    {"RA_RATE"_L1, insurer.value(u"RA_RATE"_s)},
-                    {"QSENT"_L1, u"R"_s},
-                    {"excess"_L1, 0},
-                    {"contri"_L1, 0},
-                    {"NEWPC"_L1, insurer.value(u"new_mu"_s)},
-                    {"SECONDPC"_L1, cinfo.value(u"second_mu"_s)},
-                    {"RECOREPC"_L1, cinfo.value(u"recore_mu"_s)},
-                    {"AFTERPC"_L1, cinfo.value(u"after_mu"_s)},
-                    {"assess"_L1, u""_s},
-                    {"excess_gst"_L1, insurer.isNull(u"excess_gst"_s) ? 2 : insurer.value(u"excess_gst"_s)},
-                    {"Type"_L1, u"MTA"_s},
-                    {"ExtraInfo"_L1, request.extraInformation},
-                });
-    FillWithoutTotals(quote);
+    fillColumn(quote, {
+                          {"QUOTER"_L1, u""_s},
+                          {"QTNNO"_L1, quoteNumber},
+                          {"Subquote"_L1, 0},
+                          {"qtndate"_L1, shortDate(QDate::currentDate())},
+                          {"INSURER_ID"_L1, insurer.value(u"INSURER_ID"_s)},
+                          {"KESTQRNo"_L1, request.number},
+                          {"KESTQRVer"_L1, request.version},
+                          {"Claim"_L1, request.claim},
+                          {"REGO"_L1, request.rego},
+                          {"RR_RATE"_L1, insurer.value(u"RR_RATE"_s)},
+                          {"RA_RATE"_L1, insurer.value(u"RA_RATE"_s)},
+                          {"QSENT"_L1, u"R"_s},
+                          {"excess"_L1, 0},
+                          {"contri"_L1, 0},
+                          {"NEWPC"_L1, insurer.value(u"new_mu"_s)},
+                          {"SECONDPC"_L1, cinfo.value(u"second_mu"_s)},
+                          {"RECOREPC"_L1, cinfo.value(u"recore_mu"_s)},
+                          {"AFTERPC"_L1, cinfo.value(u"after_mu"_s)},
+                          {"assess"_L1, u""_s},
+                          {"excess_gst"_L1, insurer.isNull(u"excess_gst"_s) ? 2 : insurer.value(u"excess_gst"_s)},
+                          {"Type"_L1, u"MTA"_s},
+                          {"ExtraInfo"_L1, request.extraInformation},
+                      });
+    fillWithoutTotals(quote);
     if (!request.odometer.isEmpty())
         quote.set(u"kms"_s, request.odometer);
 }
 
 /// A name that no image has. Three digits are all that the search for the next number reads, so behind 999 it finds
 /// names that are taken.
-QString NewImagePath(const QString& quoteNumber)
+QString newImagePath(const QString& quoteNumber)
 {
     for (int number = NextImageNumber(quoteNumber);; ++number) {
         const QString name = quoteNumber + u"_0"_s + PadZeroLeft(QString::number(number), 3) + u".jpg"_s;
@@ -245,13 +245,13 @@ QString NewImagePath(const QString& quoteNumber)
 }
 
 /// Takes the request's pictures that have arrived into the host's images of the quote.
-void TakePhotographs(const xml::Node& root, const QString& requestNumber, const QString& quoteNumber)
+void takePhotographs(const xml::Node& root, const QString& requestNumber, const QString& quoteNumber)
 {
     for (const xml::Node& imageId : root.selectNodes(u"rootns:quoteRequestImageIds/*"_s)) {
         const QString arrived = requestNumber + u'_' + PadZeroLeft(imageId.text(), 3);
         if (!files::isPlainName(arrived) || !files::exists(gsUnreadPath + arrived + u".jpg"_s))
             continue;
-        files::move(gsUnreadPath + arrived + u".jpg"_s, NewImagePath(quoteNumber));
+        files::move(gsUnreadPath + arrived + u".jpg"_s, newImagePath(quoteNumber));
         if (files::exists(gsUnreadPath + arrived + u".txt"_s))
             files::remove(gsUnreadPath + arrived + u".txt"_s);
     }
@@ -261,30 +261,30 @@ void TakePhotographs(const xml::Node& root, const QString& requestNumber, const 
 
 bool LoadQREQ(QString& text, const QString& fileName)
 {
-    const xml::Document message = ParsedMessage(text);
+    const xml::Document message = parsedMessage(text);
 
-    db::Recordset cinfo = Opened(u"SELECT * FROM CINFO"_s);
-    db::Recordset insurer = Opened(u"SELECT * FROM INSURER WHERE KEST=1 or name='KEST Universal Insurer'"_s);
-    if (!ChooseInsurer(insurer))
-        return Refuse(u"Error locating a valid insurer, Please contact MarlinDesk Support."_s);
+    db::Recordset cinfo = opened(u"SELECT * FROM CINFO"_s);
+    db::Recordset insurer = opened(u"SELECT * FROM INSURER WHERE KEST=1 or name='KEST Universal Insurer'"_s);
+    if (!chooseInsurer(insurer))
+        return refuse(u"Error locating a valid insurer, Please contact MarlinDesk Support."_s);
 
-    std::unique_ptr<db::Lock> newQuotes = LockNewQuotes();
+    std::unique_ptr<db::Lock> newQuotes = lockNewQuotes();
     cinfo.requery();  // as it stands now that no other workstation counts
     const QVariant counter = cinfo.value(u"QUOTE_VAL"_s);
     db::Recordset quote(gConn);
     const QString quoteNumber = NextQuoteNumber({}, cinfo, quote, false);
-    db::Recordset notes = Opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}'", quoteNumber));
+    db::Recordset notes = opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}'", quoteNumber));
     Request request;
     request.readKey(message);
-    db::Recordset car = Opened(sql("SELECT * FROM CAR WHERE REGO='{}'", request.rego));
-    const db::Recordset model = Opened(u"SELECT * FROM MODEL WHERE MODEL_ID1='Z000'"_s);
-    db::Recordset colours = Opened(u"SELECT * FROM KESTColours"_s);
+    db::Recordset car = opened(sql("SELECT * FROM CAR WHERE REGO='{}'", request.rego));
+    const db::Recordset model = opened(u"SELECT * FROM MODEL WHERE MODEL_ID1='Z000'"_s);
+    db::Recordset colours = opened(u"SELECT * FROM KESTColours"_s);
 
-    const db::Recordset known = Opened(sql("SELECT * FROM QUOTE1 WHERE SUBQUOTE=0 AND KESTQRNO='{}' AND KESTQRVER='{}'",
+    const db::Recordset known = opened(sql("SELECT * FROM QUOTE1 WHERE SUBQUOTE=0 AND KESTQRNO='{}' AND KESTQRVER='{}'",
                                            request.number, request.version));
     if (!known.eof()) {
         newQuotes.reset();  // a box may stand for hours
-        return Refuse(u"Quote Request already exists as quote number "_s + known.text(u"QTNNO"_s) + u'!');
+        return refuse(u"Quote Request already exists as quote number "_s + known.text(u"QTNNO"_s) + u'!');
     }
     request.readRest(message);
 
@@ -293,7 +293,7 @@ bool LoadQREQ(QString& text, const QString& fileName)
         car.set(u"KEST"_s, 1);
         car.update();
     }
-    db::Recordset customer = OpenCustomer(car, request);
+    db::Recordset customer = openCustomer(car, request);
     const bool customerFound = !customer.eof();
     if (!customerFound)
         customer.addNew();
@@ -303,15 +303,15 @@ bool LoadQREQ(QString& text, const QString& fileName)
     if (notes.eof())
         notes.addNew();
 
-    FillQuote(quote, quoteNumber, request, insurer, cinfo);
-    Fill(notes, {{"QTNNO"_L1, quoteNumber}, {"Subquote"_L1, 0}});
-    Apply(quoteRequested, quote, notes);
+    fillQuote(quote, quoteNumber, request, insurer, cinfo);
+    fillColumn(notes, {{"QTNNO"_L1, quoteNumber}, {"Subquote"_L1, 0}});
+    applyTransition(quoteRequested, quote, notes);
     if (!customerFound)
-        FillCustomer(customer, request);
+        fillCustomer(customer, request);
     if (carFound)
-        RespellColour(car, colours);
+        respellColour(car, colours);
     else
-        FillNewCar(car, request, model, colours);
+        fillNewCar(car, request, model, colours);
     quote.set(u"paint_rate"_s, insurer.value(car.text(u"PAINT_GP"_s) + u"_RATE"_s));
 
     customer.update();
@@ -322,9 +322,9 @@ bool LoadQREQ(QString& text, const QString& fileName)
     notes.update();
 
     PrintXML(fileName, false);
-    TakePhotographs(message.documentElement(), request.number, quoteNumber);
+    takePhotographs(message.documentElement(), request.number, quoteNumber);
 
-    newQuotes = LockNewQuotes();
+    newQuotes = lockNewQuotes();
     cinfo.requery();
     if (cinfo.value(u"QUOTE_VAL"_s) != counter)
         return true;  // another workstation has counted on while the report was open
@@ -362,7 +362,7 @@ int NextImageNumber(const QString& quoteNumber)
 {
     int highest = 0;
     for (const QString& name : files::list(gsImagesPath, quoteNumber + u"_*"_s)) {
-        // Behind the number, "_" and the subquote's digit. Without regard to case, as the folder finds names.
+        // behind the number, "_" and the subquote's digit. Without regard to case, as the folder finds names.
         if (!name.startsWith(quoteNumber + u'_', Qt::CaseInsensitive))
             continue;
         bool isNumber = false;

@@ -1,11 +1,11 @@
 // The lines of a message become lines of a quote: section by section, each with a word on what is to happen to it.
+#include "base/modLoggerEx.h"
 #include "inbound/modLoadXML.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
 #include "quotedata/Vendors.h"
-#include "base/modLoggerEx.h"
 
 #include <QList>
 
@@ -32,7 +32,7 @@ constexpr std::pair<QLatin1StringView, Change> changes[] = {
     {"N"_L1, Change::Keep}, {"D"_L1, Change::Delete},
 };
 
-Change ChangeOf(const QString& indicator)
+Change changeOf(const QString& indicator)
 {
     for (const auto& [known, change] : changes) {
         if (known == indicator)
@@ -54,20 +54,20 @@ struct Line {
 };
 
 /// The lines of a section. One that does not say what is to happen does as the one before it.
-QList<Line> LinesOf(const xml::Node& body, QLatin1StringView section)
+QList<Line> linesOf(const xml::Node& body, QLatin1StringView section)
 {
     QList<Line> lines;
     QString indicator;
     for (const xml::Node& node : body.selectNodes(u"rootns:"_s + section + u"/*"_s)) {
         if (const xml::Node own = node.selectSingleNode(u"rootns:quoteLineChangeIndicator"_s))
             indicator = own.text();
-        lines.append({node, ChangeOf(indicator)});
+        lines.append({node, changeOf(indicator)});
     }
     return lines;
 }
 
 /// Stands on the row that a line is to fill, a new one where it is added. False where there is nothing to fill.
-bool StandOnRow(db::Recordset& rows, Change change, qint64 number)
+bool standOnRow(db::Recordset& rows, Change change, qint64 number)
 {
     if (rows.recordCount() > 0)
         rows.moveFirst();
@@ -90,23 +90,23 @@ bool StandOnRow(db::Recordset& rows, Change change, qint64 number)
     return change == Change::Alter;
 }
 
-void FillKey(db::Recordset& row, const db::Recordset& quote, qint64 number)
+void fillKey(db::Recordset& row, const db::Recordset& quote, qint64 number)
 {
     const QString qtnno = quote.text(u"QTNNO"_s);
     const QString subquote = quote.text(u"Subquote"_s);
-    Fill(row, {{"QTNNO"_L1, quote.value(u"QTNNO"_s)},
-               {"Subquote"_L1, quote.value(u"Subquote"_s)},
-               {"SEQ_NO"_L1, NextLineNumber(number, qtnno, subquote)}});
+    fillColumn(row, {{"QTNNO"_L1, quote.value(u"QTNNO"_s)},
+                     {"Subquote"_L1, quote.value(u"Subquote"_s)},
+                     {"SEQ_NO"_L1, NextLineNumber(number, qtnno, subquote)}});
 }
 
-void FillWhereEmpty(db::Recordset& row, const QString& column, const QVariant& value)
+void fillWhereEmpty(db::Recordset& row, const QString& column, const QVariant& value)
 {
     if (row.text(column).isEmpty())
         row.set(column, value);
 }
 
 /// Stores the line before a code is looked for: the look goes through the rows and passes over what fails on its way.
-void StoreWithItemNo(db::Recordset& row)
+void storeWithItemNo(db::Recordset& row)
 {
     row.update();
     if (row.text(u"itemno"_s).isEmpty())
@@ -116,45 +116,47 @@ void StoreWithItemNo(db::Recordset& row)
 
 // The rate of a loaded line is 1, so that its amount of money stands in the hours.
 
-void FillLabourAmount(db::Recordset& row, const QString& type, const QString& script, const QString& amount)
+void fillLabourAmount(db::Recordset& row, const QString& type, const QString& script, const QString& amount)
 {
     if (type == u"RR"_s)
-        Fill(row,
-             {{"category"_L1, u"R&R"_s}, {"script"_L1, script}, {"rrhour"_L1, toDouble(amount)}, {"rr_rate2"_L1, 1}});
+        fillColumn(
+            row,
+            {{"category"_L1, u"R&R"_s}, {"script"_L1, script}, {"rrhour"_L1, toDouble(amount)}, {"rr_rate2"_L1, 1}});
     else if (type == u"REPR"_s)
-        Fill(row,
-             {{"category"_L1, u"RA"_s}, {"script"_L1, script}, {"rahour"_L1, toDouble(amount)}, {"rr_rate2"_L1, 1}});
+        fillColumn(
+            row,
+            {{"category"_L1, u"RA"_s}, {"script"_L1, script}, {"rahour"_L1, toDouble(amount)}, {"rr_rate2"_L1, 1}});
     else if (type == u"OTH"_s)
-        Fill(row, {{"category"_L1, u"MIS"_s},
-                   {"script"_L1, script},
-                   {"unitcost"_L1, toDouble(amount)},
-                   {"rr_rate2"_L1, 0},
-                   {"directbill"_L1, u"R"_s}});
+        fillColumn(row, {{"category"_L1, u"MIS"_s},
+                         {"script"_L1, script},
+                         {"unitcost"_L1, toDouble(amount)},
+                         {"rr_rate2"_L1, 0},
+                         {"directbill"_L1, u"R"_s}});
 }
 
-void TakeLabour(const db::Recordset& quote, db::Recordset& row, const Line& line)
+void takeLabour(const db::Recordset& quote, db::Recordset& row, const Line& line)
 {
     const qint64 number = line.number();
     const QString type = line.text("labourType"_L1);
     const QString script = line.text("labourDescription"_L1).left(descriptionLength);
     const QString amount = line.text("labourAmount"_L1);
-    if (!StandOnRow(row, line.change, number))
+    if (!standOnRow(row, line.change, number))
         return;
 
-    FillKey(row, quote, number);
-    FillLabourAmount(row, type, script, amount);
-    FillWhereEmpty(row, u"allow_tick"_s, tickOfNewLine);
-    Fill(row, {{"opg_rate"_L1, 0},
-               {"Tag"_L1, 1},
-               {"delitem"_L1, false},
-               {"VENDOR"_L1, 0},
-               {"tosend"_L1, u"A"_s},
-               {"PartNo"_L1, u""_s},
-               {"blend"_L1, 0}});
-    StoreWithItemNo(row);
+    fillKey(row, quote, number);
+    fillLabourAmount(row, type, script, amount);
+    fillWhereEmpty(row, u"allow_tick"_s, tickOfNewLine);
+    fillColumn(row, {{"opg_rate"_L1, 0},
+                     {"Tag"_L1, 1},
+                     {"delitem"_L1, false},
+                     {"VENDOR"_L1, 0},
+                     {"tosend"_L1, u"A"_s},
+                     {"PartNo"_L1, u""_s},
+                     {"blend"_L1, 0}});
+    storeWithItemNo(row);
 }
 
-void FillMark(db::Recordset& row, const QString& partType)
+void fillMark(db::Recordset& row, const QString& partType)
 {
     if (partType == u"NEW"_s)
         row.set(u"MARK"_s, u" "_s);
@@ -165,9 +167,9 @@ void FillMark(db::Recordset& row, const QString& partType)
 }
 
 /// The side of the car where the description begins with it; a side that a person set stays.
-void FillSide(db::Recordset& row, const QString& description)
+void fillSide(db::Recordset& row, const QString& description)
 {
-    FillWhereEmpty(row, u"SIDE"_s, u"O"_s);
+    fillWhereEmpty(row, u"SIDE"_s, u"O"_s);
     if (row.text(u"SIDE"_s) != u"O"_s)
         return;
     const QString start = description.toUpper().left(3);
@@ -177,7 +179,7 @@ void FillSide(db::Recordset& row, const QString& description)
         row.set(u"SIDE"_s, u"R"_s);
 }
 
-void TakePart(const db::Recordset& quote, db::Recordset& row, const Line& line)
+void takePart(const db::Recordset& quote, db::Recordset& row, const Line& line)
 {
     const qint64 number = line.number();
     const QString partNumber = line.text("partNumber"_L1).left(partNumberLength);
@@ -188,27 +190,28 @@ void TakePart(const db::Recordset& quote, db::Recordset& row, const Line& line)
     const QString percentageText = line.text("partMarkUpPercentage"_L1);
     line.text("partAmount"_L1);
     line.text("partMarkUpAmount"_L1);
-    if (!StandOnRow(row, line.change, number))
+    if (!standOnRow(row, line.change, number))
         return;
 
-    FillKey(row, quote, number);
-    Fill(row,
-         {{"category"_L1, u"PRT"_s}, {"script"_L1, description.left(descriptionLength)}, {"PartNo"_L1, partNumber}});
-    FillMark(row, type);
+    fillKey(row, quote, number);
+    fillColumn(
+        row,
+        {{"category"_L1, u"PRT"_s}, {"script"_L1, description.left(descriptionLength)}, {"PartNo"_L1, partNumber}});
+    fillMark(row, type);
     const double quantity = toDouble(quantityText);
     if (quantity == 0)
         row.set(u"Report"_s, true);
     else
         row.set(u"qty"_s, quantity);
     const double price = toDouble(priceText);
-    Fill(row, {{"unitcost"_L1, price}, {"rrhour"_L1, price + price * toDouble(percentageText) / 100}});
-    FillSide(row, description);
-    Fill(row, {{"VENDOR"_L1, 0}, {"blend"_L1, 0}, {"Tag"_L1, 1}, {"delitem"_L1, false}, {"tosend"_L1, u"A"_s}});
-    StoreWithItemNo(row);
+    fillColumn(row, {{"unitcost"_L1, price}, {"rrhour"_L1, price + price * toDouble(percentageText) / 100}});
+    fillSide(row, description);
+    fillColumn(row, {{"VENDOR"_L1, 0}, {"blend"_L1, 0}, {"Tag"_L1, 1}, {"delitem"_L1, false}, {"tosend"_L1, u"A"_s}});
+    storeWithItemNo(row);
 }
 
 /// Without the marker of blended paint at its end.
-QString WithoutBlend(const QString& description)
+QString withoutBlend(const QString& description)
 {
     constexpr qsizetype marker = 6;  // characters: the word and the blank before it
     if (!description.toUpper().trimmed().endsWith(u"BLEND"_s))
@@ -216,23 +219,23 @@ QString WithoutBlend(const QString& description)
     return description.chopped(qMin(marker, description.size()));
 }
 
-void TakePaint(const db::Recordset& quote, db::Recordset& row, const Line& line)
+void takePaint(const db::Recordset& quote, db::Recordset& row, const Line& line)
 {
     const qint64 number = line.number();
     line.text("paintWorkType"_L1);
-    const QString script = WithoutBlend(line.text("paintDescription"_L1)).left(descriptionLength);
+    const QString script = withoutBlend(line.text("paintDescription"_L1)).left(descriptionLength);
     const QString amount = line.text("paintAmount"_L1);
-    if (!StandOnRow(row, line.change, number))
+    if (!standOnRow(row, line.change, number))
         return;
 
-    FillKey(row, quote, number);
-    FillWhereEmpty(row, u"category"_s, u"PAINT"_s);  // other paint work that was changed stays what it is
-    Fill(row, {{"script"_L1, script}, {"pthour"_L1, toDouble(amount)}});
-    FillWhereEmpty(row, u"blend"_s, 0);
-    Fill(row, {{"Tag"_L1, 1}, {"delitem"_L1, false}, {"tosend"_L1, u"A"_s}, {"rr_rate2"_L1, 1}});
-    FillWhereEmpty(row, u"allow_tick"_s, tickOfNewLine);
+    fillKey(row, quote, number);
+    fillWhereEmpty(row, u"category"_s, u"PAINT"_s);  // other paint work that was changed stays what it is
+    fillColumn(row, {{"script"_L1, script}, {"pthour"_L1, toDouble(amount)}});
+    fillWhereEmpty(row, u"blend"_s, 0);
+    fillColumn(row, {{"Tag"_L1, 1}, {"delitem"_L1, false}, {"tosend"_L1, u"A"_s}, {"rr_rate2"_L1, 1}});
+    fillWhereEmpty(row, u"allow_tick"_s, tickOfNewLine);
     row.set(u"opg_rate"_s, 1);
-    StoreWithItemNo(row);
+    storeWithItemNo(row);
 }
 
 /// What the lines of the section have told so far: an element that a line lacks keeps what the line before it told.
@@ -260,16 +263,16 @@ void Sublet::read(const Line& line)
 
 /// The number of a line that has none but brings a document: above all lines of the quote, or above the line before it
 /// where the quote has none.
-qint64 NumberForDocument(const QString& qtnno, const QString& subquote, qint64 before)
+qint64 numberForDocument(const QString& qtnno, const QString& subquote, qint64 before)
 {
     const db::Recordset rows =
-        Opened(sql("SELECT MAX(SEQ_NO) FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", qtnno, subquote));
+        opened(sql("SELECT MAX(SEQ_NO) FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", qtnno, subquote));
     const QVariant highest = rows.value(rows.columns().constFirst());
     return NextDocumentLine(highest.isNull() ? before : toLong(highest));
 }
 
 /// Stores the document that a line brings; the line's number, which may have to be worked out for it.
-qint64 TakeDocument(const db::Recordset& quote, const Line& line, qint64 before)
+qint64 takeDocument(const db::Recordset& quote, const Line& line, qint64 before)
 {
     qint64 number = line.number();
     const xml::Node document = line.node.selectSingleNode(u"rootns:subletAuthorityDocument"_s);
@@ -278,65 +281,66 @@ qint64 TakeDocument(const db::Recordset& quote, const Line& line, qint64 before)
     const QString qtnno = quote.text(u"QTNNO"_s);
     const QString subquote = quote.text(u"Subquote"_s);
     if (number == 0)
-        number = NumberForDocument(qtnno, subquote, before);
+        number = numberForDocument(qtnno, subquote, before);
     const QString path = NextDocumentName(qtnno, subquote, number);
     files::writeBytes(path, files::fromBase64(document.text()));
     gbSubletDocumentArrived = true;
     return number;
 }
 
-void TakeSublet(const db::Recordset& quote, db::Recordset& row, const Line& line, Sublet& told)
+void takeSublet(const db::Recordset& quote, db::Recordset& row, const Line& line, Sublet& told)
 {
     told.read(line);
-    told.number = TakeDocument(quote, line, told.number);
-    if (!StandOnRow(row, line.change, told.number))
+    told.number = takeDocument(quote, line, told.number);
+    if (!standOnRow(row, line.change, told.number))
         return;
 
-    FillKey(row, quote, told.number);
-    Fill(row, {{"category"_L1, u"MIS"_s}, {"script"_L1, told.description.left(descriptionLength)}, {"blend"_L1, 0}});
+    fillKey(row, quote, told.number);
+    fillColumn(row,
+               {{"category"_L1, u"MIS"_s}, {"script"_L1, told.description.left(descriptionLength)}, {"blend"_L1, 0}});
     if (line.change == Change::Insert) {
-        Fill(row, {{"Report_on"_L1, 0},
-                   {"delitem"_L1, false},
-                   {"tosend"_L1, u"A"_s},
-                   {"unitcost"_L1, 0},
-                   {"Tag"_L1, 1},
-                   {"itemno"_L1, u""_s},
-                   {"directbill"_L1, u"R"_s},
-                   {"VENDOR"_L1, FindOrAddVendor(told.repairer.left(repairerLength), told.address, told.phone)}});
+        fillColumn(row, {{"Report_on"_L1, 0},
+                         {"delitem"_L1, false},
+                         {"tosend"_L1, u"A"_s},
+                         {"unitcost"_L1, 0},
+                         {"Tag"_L1, 1},
+                         {"itemno"_L1, u""_s},
+                         {"directbill"_L1, u"R"_s},
+                         {"VENDOR"_L1, findOrAddVendor(told.repairer.left(repairerLength), told.address, told.phone)}});
     }
-    StoreWithItemNo(row);
+    storeWithItemNo(row);
 }
 
 constexpr QLatin1StringView sections[] = {"labours"_L1, "parts"_L1, "paints"_L1, "sublets"_L1};
 
-xml::Node BodyOf(const xml::Document& message)
+xml::Node bodyOf(const xml::Document& message)
 {
     const xml::Node body = message.selectSingleNode(u"rootns:quoteBody"_s);
     for (const QLatin1StringView section : sections)
-        LinesOf(body, section);
+        linesOf(body, section);
     return body;
 }
 
-void TakeLines(const db::Recordset& quote, db::Recordset& rows, const xml::Document& message)
+void takeLines(const db::Recordset& quote, db::Recordset& rows, const xml::Document& message)
 {
-    const xml::Node body = BodyOf(message);
+    const xml::Node body = bodyOf(message);
     for (const QLatin1StringView total :
          {"labourTotal"_L1, "partTotal"_L1, "partMarkUpTotal"_L1, "gst"_L1, "paintTotal"_L1, "quoteTotal"_L1})
         body.textOf(u"rootns:"_s + total);
 
-    for (const Line& line : LinesOf(body, "labours"_L1))
-        TakeLabour(quote, rows, line);
-    for (const Line& line : LinesOf(body, "parts"_L1))
-        TakePart(quote, rows, line);
-    for (const Line& line : LinesOf(body, "paints"_L1))
-        TakePaint(quote, rows, line);
+    for (const Line& line : linesOf(body, "labours"_L1))
+        takeLabour(quote, rows, line);
+    for (const Line& line : linesOf(body, "parts"_L1))
+        takePart(quote, rows, line);
+    for (const Line& line : linesOf(body, "paints"_L1))
+        takePaint(quote, rows, line);
     Sublet told;
-    for (const Line& line : LinesOf(body, "sublets"_L1))
-        TakeSublet(quote, rows, line, told);
+    for (const Line& line : linesOf(body, "sublets"_L1))
+        takeSublet(quote, rows, line, told);
 }
 
 template <class Step>
-bool Trapped(Step step)
+bool trapped(Step step)
 {
     try {
         step();
@@ -351,12 +355,12 @@ bool Trapped(Step step)
 
 bool LoadQuoteBody(const db::Recordset& rsQuote, db::Recordset& rsLines, const xml::Document& message)
 {
-    return Trapped([&] { TakeLines(rsQuote, rsLines, message); });
+    return trapped([&] { takeLines(rsQuote, rsLines, message); });
 }
 
-bool CheckQuoteBody(const xml::Document& message)
+bool checkQuoteBody(const xml::Document& message)
 {
-    return Trapped([&] { BodyOf(message); });
+    return trapped([&] { bodyOf(message); });
 }
 
 }  // namespace kest

@@ -1,13 +1,13 @@
 // The six messages that move a quote through its network life without touching its lines.
+#include "base/Helpers.h"
+#include "base/SharedVariables.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
-#include "platform/database/Sql.h"
 #include "platform/Prompt.h"
+#include "platform/database/Sql.h"
 #include "platform/values.h"
 #include "quotedata/StateTable.h"
 #include "reports/PrintXML.h"
-#include "base/Helpers.h"
-#include "base/SharedVariables.h"
 
 #include <QStringList>
 
@@ -25,10 +25,10 @@ constexpr QLatin1StringView noSuchQuoteNumber =
 constexpr QLatin1StringView noSuchRequest =
     "Couldn't Locate Matching KEST Quote Request Number, Please contact MarlinDesk Support."_L1;
 
-db::Recordset OpenByReference(const QString& reference)
+db::Recordset openByReference(const QString& reference)
 {
     const auto [number, subquote] = SplitQuoteRef(reference);
-    return Opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+    return opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
 }
 
 void tell(const QStringList& lines)
@@ -37,15 +37,15 @@ void tell(const QStringList& lines)
 }
 
 /// As a rule the main quote; `eof` where the request has none.
-db::Recordset OpenOldestOfRequest(const QString& request)
+db::Recordset openOldestOfRequest(const QString& request)
 {
-    db::Recordset quote = Opened(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request));
+    db::Recordset quote = opened(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request));
     if (!quote.eof())
         quote.moveLast();
     return quote;
 }
 
-bool AgreesToDeletion()
+bool agreesToDeletion()
 {
     const QStringList lines{
         u"This Supplimentary Quote will be DELETED."_s,
@@ -55,7 +55,7 @@ bool AgreesToDeletion()
     return desktop::ask(lines.join(u"\r\n"_s), desktop::Icon::None, {}, desktop::Answer::No);
 }
 
-void DeleteQuoteRows(const QVariant& number, const QVariant& subquote)
+void deleteQuoteRows(const QVariant& number, const QVariant& subquote)
 {
     gConn->execute(sql("DELETE FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE={}", number, subquote));
     gConn->execute(sql("DELETE FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE={}", number, subquote));
@@ -66,18 +66,18 @@ void DeleteQuoteRows(const QVariant& number, const QVariant& subquote)
 
 bool LoadQMQR(QString& text, const QString& fileName)
 {
-    const xml::Document message = ParsedMessage(text);
-    db::Recordset quote = OpenByReference(message.textOf(quoteReference));
+    const xml::Document message = parsedMessage(text);
+    db::Recordset quote = openByReference(message.textOf(quoteReference));
     if (quote.eof())
-        return Refuse(noSuchQuote);
-    db::Recordset notes = OpenNotes(quote);
+        return refuse(noSuchQuote);
+    db::Recordset notes = openNotes(quote);
 
     quote.set(u"KESTQuoteNo"_s, message.textOf(u"//rootns:getQuoteResponse/rootns:kestQuoteNumber"_s));
     quote.set(u"KESTQRNo"_s, message.textOf(u"//rootns:getQuoteResponse/rootns:quoteRequestNumber"_s));
     quote.set(u"KESTQRVer"_s, 1);
     quote.set(u"Claim"_s, message.textOf(u"//rootns:getQuoteResponse/rootns:claimNumber"_s));
     quote.set(u"ExtraInfo"_s, true);
-    Apply(quoteMatched, quote, notes);
+    applyTransition(quoteMatched, quote, notes);
     quote.update();
     notes.update();
     PrintXML(fileName, false);
@@ -86,15 +86,15 @@ bool LoadQMQR(QString& text, const QString& fileName)
 
 bool LoadEWAP(QString& text, const QString& fileName)
 {
-    const xml::Document message = ParsedMessage(text);
+    const xml::Document message = parsedMessage(text);
     const QString reference = message.textOf(quoteReference);
-    db::Recordset quote = OpenByReference(reference);
+    db::Recordset quote = openByReference(reference);
     if (quote.eof())
-        return Refuse(noSuchQuote);
-    db::Recordset notes = OpenNotes(quote);
+        return refuse(noSuchQuote);
+    db::Recordset notes = openNotes(quote);
 
     quote.set(u"excess"_s, 0);
-    Apply(excessWaived, quote, notes);
+    applyTransition(excessWaived, quote, notes);
     desktop::msgBox(
         u"ORLA has removed the excess from this quote due to a special arrangement, "
         "Please update your invoices accordingly.\r\nQuote: "_s +
@@ -107,29 +107,29 @@ bool LoadEWAP(QString& text, const QString& fileName)
 
 bool LoadQTDL(QString& text, const QString&)
 {
-    const xml::Document message = ParsedMessage(text);
+    const xml::Document message = parsedMessage(text);
     const QString networkNumber = message.textOf(u"//rootns:getQuoteDeletionResponse/rootns:kestQuoteNumber"_s);
-    db::Recordset quote = Opened(sql("SELECT * FROM QUOTE1 WHERE KESTQuoteNo='{}'", networkNumber));
-    if (IsUnknown(networkNumber, quote))
-        return Refuse(noSuchQuoteNumber);
+    db::Recordset quote = opened(sql("SELECT * FROM QUOTE1 WHERE KESTQuoteNo='{}'", networkNumber));
+    if (isUnknown(networkNumber, quote))
+        return refuse(noSuchQuoteNumber);
 
     const QVariant number = quote.value(u"QTNNO"_s);
     const QVariant subquote = quote.value(u"Subquote"_s);
-    const QString label = QuoteLabel(quote);
+    const QString label = quoteLabel(quote);
     const QString reason = message.textOf(u"//rootns:getQuoteDeletionResponse/rootns:reason"_s);
     gsDeletedQTNNO = textOrEmpty(number);  // the file is named after a quote that may be gone by then
     gsDeletedSubquote = textOrEmpty(subquote);
 
     // The notes go to the main quote, also where a supplementary quote is deleted.
-    db::Recordset notes = Opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='0'", number));
+    db::Recordset notes = opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='0'", number));
     bool taken = true;
-    if (!IsSupplementary(quote)) {
-        Apply(quoteDeleted, quote, notes, reason);
+    if (!isSupplementary(quote)) {
+        applyTransition(quoteDeleted, quote, notes, reason);
         quote.update();
         notes.update();
-    } else if ((taken = AgreesToDeletion())) {
-        DeleteQuoteRows(number, subquote);
-        Apply(supplementaryDeleted, quote, notes, label);
+    } else if ((taken = agreesToDeletion())) {
+        deleteQuoteRows(number, subquote);
+        applyTransition(supplementaryDeleted, quote, notes, label);
         notes.update();
     }
 
@@ -140,35 +140,35 @@ bool LoadQTDL(QString& text, const QString&)
 
 bool LoadRRQT(QString& text, const QString&)
 {
-    const xml::Document message = ParsedMessage(text);
+    const xml::Document message = parsedMessage(text);
     const QString request = message.textOf(u"//rootns:getReqForRevQteResponse/rootns:quoteRequestNumber"_s);
-    db::Recordset quote = Opened(sql("SELECT TOP 1 * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request));
-    if (IsUnknown(request, quote))
-        return Refuse(noSuchRequest);
-    db::Recordset notes = OpenNotes(quote);
+    db::Recordset quote = opened(sql("SELECT TOP 1 * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request));
+    if (isUnknown(request, quote))
+        return refuse(noSuchRequest);
+    db::Recordset notes = openNotes(quote);
 
     const QString comments = message.textOf(u"//rootns:getReqForRevQteResponse/rootns:comments"_s);
     quote.set(u"KESTQRVer"_s, message.textOf(u"//rootns:getReqForRevQteResponse/rootns:quoteRequestVersionNumber"_s));
-    Apply(revisionRequested, quote, notes, comments);
+    applyTransition(revisionRequested, quote, notes, comments);
     quote.update();
     notes.update();
 
-    tell({u"ORLA has requested quote "_s + QuoteLabel(quote) + u" be revised."_s, u"Reason: "_s + comments,
+    tell({u"ORLA has requested quote "_s + quoteLabel(quote) + u" be revised."_s, u"Reason: "_s + comments,
           u"Please re-open and edit the quote then re-send to the insurer."_s});
     return true;
 }
 
 bool LoadQRCN(QString& text, const QString&)
 {
-    const xml::Document message = ParsedMessage(text);
+    const xml::Document message = parsedMessage(text);
     const QString request = message.textOf(u"//rootns:getQRCancellationResponse/rootns:quoteRequestNumber"_s);
-    db::Recordset quote = OpenOldestOfRequest(request);
-    if (IsUnknown(request, quote))
-        return Refuse(noSuchRequest);
-    db::Recordset notes = OpenNotes(quote);
+    db::Recordset quote = openOldestOfRequest(request);
+    if (isUnknown(request, quote))
+        return refuse(noSuchRequest);
+    db::Recordset notes = openNotes(quote);
 
     const QString reason = message.textOf(u"//rootns:getQRCancellationResponse/rootns:qrCancellationReason"_s);
-    Apply(requestCancelled, quote, notes, reason);
+    applyTransition(requestCancelled, quote, notes, reason);
     notes.update();
     quote.update();
     return true;
@@ -176,14 +176,14 @@ bool LoadQRCN(QString& text, const QString&)
 
 bool LoadBCQR(QString& text, const QString&)
 {
-    const xml::Document message = ParsedMessage(text);
+    const xml::Document message = parsedMessage(text);
     const QString request = message.textOf(u"//rootns:getBackoutCancelledQRResponse/rootns:kestQuoteRequestNumber"_s);
-    db::Recordset quote = OpenOldestOfRequest(request);
-    if (IsUnknown(request, quote))
-        return Refuse(noSuchRequest);
-    db::Recordset notes = OpenNotes(quote);
+    db::Recordset quote = openOldestOfRequest(request);
+    if (isUnknown(request, quote))
+        return refuse(noSuchRequest);
+    db::Recordset notes = openNotes(quote);
 
-    Apply(requestReinstated, quote, notes);
+    applyTransition(requestReinstated, quote, notes);
     notes.update();
     quote.update();
     return true;

@@ -1,14 +1,14 @@
-#include "inbound/modLoadXML.h"
-#include "messages/Envelope.h"
-#include "messages/Folders.h"
-#include "platform/RuntimeError.h"
-#include "platform/database/Sql.h"
-#include "platform/Prompt.h"
-#include "platform/files/files.h"
-#include "platform/values.h"
 #include "base/Helpers.h"
 #include "base/SharedVariables.h"
 #include "base/modLoggerEx.h"
+#include "inbound/modLoadXML.h"
+#include "messages/Envelope.h"
+#include "messages/Folders.h"
+#include "platform/Prompt.h"
+#include "platform/RuntimeError.h"
+#include "platform/database/Sql.h"
+#include "platform/files/files.h"
+#include "platform/values.h"
 
 #include <QStringList>
 
@@ -29,7 +29,7 @@ constexpr Loader loaders[] = {
     {"ARES"_L1, LoadARES}, {"BACA"_L1, LoadBACA}, {"BCQR"_L1, LoadBCQR}, {"EWAP"_L1, LoadEWAP},
 };
 
-void ReportParseError(const xml::ParseError& error, const QString& fileName)
+void reportParseError(const xml::ParseError& error, const QString& fileName)
 {
     const QStringList lines{
         u"Error loading XML file: "_s + fileName,
@@ -48,7 +48,7 @@ bool isNotice(const xml::Node& root)
 }
 
 /// A notice of the estimating product is shown and put aside; it is never a message that was taken.
-void TakeNotice(const xml::Node& root, const QString& fileName)
+void takeNotice(const xml::Node& root, const QString& fileName)
 {
     desktop::msgBox(root.textOf(u"body"_s), desktop::Icon::Exclamation);
     for (int number = 0; number <= 999; ++number) {
@@ -61,10 +61,10 @@ void TakeNotice(const xml::Node& root, const QString& fileName)
     }
 }
 
-void WithdrawIfRequest(const QString& path, const QString& requestNumber)
+void withdrawIfRequest(const QString& path, const QString& requestNumber)
 {
     QString text = files::read(path);
-    const xml::Document waiting = ParsedMessage(text);
+    const xml::Document waiting = parsedMessage(text);
     if (waiting.parseError().errorCode != 0)
         return;
     const xml::Node root = waiting.documentElement();
@@ -74,13 +74,13 @@ void WithdrawIfRequest(const QString& path, const QString& requestNumber)
 }
 
 /// A quote request that a manual quote answers may still wait unread; it must not make a second quote.
-void WithdrawWaitingRequests(const QString& requestNumber)
+void withdrawWaitingRequests(const QString& requestNumber)
 {
     for (const QString& name : files::list(gsUnreadPath)) {
-        if (!IsBareName(name))
+        if (!isBareName(name))
             continue;
         try {
-            WithdrawIfRequest(gsUnreadPath + name, requestNumber);
+            withdrawIfRequest(gsUnreadPath + name, requestNumber);
         } catch (const RuntimeError& error) {
             if (error.number() != FileNotFound)  // taken by the transport since the folder was listed
                 throw;
@@ -90,23 +90,23 @@ void WithdrawWaitingRequests(const QString& requestNumber)
 
 bool Load(QString& text, const QString& fileName)
 {
-    xml::Document message = ParsedMessage(text);
-    if (message.parseError().errorCode == xml::BareAmpersand && EscapeAmpersands(text))
+    xml::Document message = parsedMessage(text);
+    if (message.parseError().errorCode == xml::BareAmpersand && escapeAmpersands(text))
         message.loadXML(text);
     if (message.parseError().errorCode != 0) {
-        ReportParseError(message.parseError(), fileName);
+        reportParseError(message.parseError(), fileName);
         return false;
     }
 
     const xml::Node root = message.documentElement();
     if (isNotice(root)) {
-        TakeNotice(root, fileName);
+        takeNotice(root, fileName);
         return false;
     }
 
     const QString messageType = root.textOf(u"messageType"_s);
     if (messageType == u"MANQ"_s)
-        WithdrawWaitingRequests(root.textOf(u"//rootns:getQuoteResponse/rootns:quoteRequestNumber"_s));
+        withdrawWaitingRequests(root.textOf(u"//rootns:getQuoteResponse/rootns:quoteRequestNumber"_s));
 
     for (const Loader& loader : loaders) {
         if (loader.messageType == messageType.toUpper())
@@ -127,7 +127,7 @@ bool LoadXML(QString& text, const QString& fileName)
     }
 }
 
-std::unique_ptr<db::Lock> LockNewQuotes()
+std::unique_ptr<db::Lock> lockNewQuotes()
 {
     constexpr int patience = 20;  // seconds; it takes a fraction of one
     auto lock = std::make_unique<db::Lock>(gConn, u"new quote"_s, patience);
@@ -136,21 +136,21 @@ std::unique_ptr<db::Lock> LockNewQuotes()
     return lock;
 }
 
-void Fill(db::Recordset& row, std::initializer_list<Column> columns)
+void fillColumn(db::Recordset& row, std::initializer_list<Column> columns)
 {
     for (const Column& column : columns)
         row.set(column.name, column.value);
 }
 
-void FillWithoutTotals(db::Recordset& quote)
+void fillWithoutTotals(db::Recordset& quote)
 {
     for (const char16_t* column : {u"RR_TOTAL", u"RA_TOTAL", u"PAINT_TOTAL", u"TOTAL", u"PRTTOTAL", u"MISTOTAL",
                                    u"override", u"rr_override", u"ra_override", u"paint_override", u"CONTACTID"})
         quote.set(QString::fromUtf16(column), 0);
-    Fill(quote, {{"quotechanged"_L1, true}, {"invoiced"_L1, false}});
+    fillColumn(quote, {{"quotechanged"_L1, true}, {"invoiced"_L1, false}});
 }
 
-void RespellColour(db::Recordset& car, db::Recordset& colours)
+void respellColour(db::Recordset& car, db::Recordset& colours)
 {
     const QString colour = car.text(u"COLOUR"_s);
     if (colour.isEmpty())
@@ -159,32 +159,32 @@ void RespellColour(db::Recordset& car, db::Recordset& colours)
     car.set(u"COLOUR"_s, colours.eof() ? u""_s : colours.text(u"Script"_s).trimmed());
 }
 
-db::Recordset OpenNotes(const db::Recordset& quote)
+db::Recordset openNotes(const db::Recordset& quote)
 {
-    return Opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quote.value(u"QTNNO"_s),
+    return opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quote.value(u"QTNNO"_s),
                       quote.value(u"Subquote"_s)));
 }
 
-bool IsUnknown(const QString& number, const db::Recordset& quote)
+bool isUnknown(const QString& number, const db::Recordset& quote)
 {
     return number.trimmed().isEmpty() || quote.eof();
 }
 
-bool Refuse(const QString& text)
+bool refuse(const QString& text)
 {
     desktop::msgBox(text, desktop::Icon::Critical);
     return false;
 }
 
-bool IsSupplementary(const db::Recordset& quote)
+bool isSupplementary(const db::Recordset& quote)
 {
     return toLong(quote.value(u"Subquote"_s)) > 0;
 }
 
-QString QuoteLabel(const db::Recordset& quote)
+QString quoteLabel(const db::Recordset& quote)
 {
     const QString number = quote.text(u"QTNNO"_s);
-    return IsSupplementary(quote) ? number + u'/' + quote.text(u"Subquote"_s) : number;
+    return isSupplementary(quote) ? number + u'/' + quote.text(u"Subquote"_s) : number;
 }
 
 }  // namespace kest

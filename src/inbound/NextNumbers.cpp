@@ -1,11 +1,11 @@
 // The numbers that a loaded line takes where the message leaves them open: its own, its item code, its document's.
+#include "base/Helpers.h"
 #include "inbound/modLoadXML.h"
-#include "sublets/SubletDocuments.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
-#include "base/Helpers.h"
+#include "sublets/SubletDocuments.h"
 
 #include <QSet>
 
@@ -36,7 +36,7 @@ const CodePool codePools[] = {
     {"OPG"_L1, otherPaintCodes}, {"PRT"_L1, partCodes},  {"MIS"_L1, miscellaneousCodes},
 };
 
-std::span<const CodeRange> CodesOf(const QString& category)
+std::span<const CodeRange> codesOf(const QString& category)
 {
     for (const CodePool& pool : codePools) {
         if (pool.category == category)
@@ -45,7 +45,7 @@ std::span<const CodeRange> CodesOf(const QString& category)
     return {};
 }
 
-bool IsTaken(db::Recordset& rows, const QString& code)
+bool isTaken(db::Recordset& rows, const QString& code)
 {
     rows.moveFirst();
     rows.find(sql("itemno = '{}'", code));
@@ -53,11 +53,11 @@ bool IsTaken(db::Recordset& rows, const QString& code)
 }
 
 /// The first code of the ranges that no row has; empty where all are taken.
-QString FreeCode(db::Recordset& rows, std::span<const CodeRange> ranges)
+QString freeCode(db::Recordset& rows, std::span<const CodeRange> ranges)
 {
     for (const auto& [first, last] : ranges) {
         for (int code = first; code <= last; ++code) {
-            if (!IsTaken(rows, QString::number(code)))
+            if (!isTaken(rows, QString::number(code)))
                 return QString::number(code);
         }
     }
@@ -79,7 +79,7 @@ qint64 NextLineNumber(qint64 number, const QString& qtnno, const QString& subquo
     if (number > 0)
         return number;
     const db::Recordset rows =
-        Opened(sql("SELECT MAX(SEQ_NO) FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", qtnno, subquote));
+        opened(sql("SELECT MAX(SEQ_NO) FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", qtnno, subquote));
     const bool isSameQuote = lastNumber.qtnno == qtnno && lastNumber.subquote == subquote;
     const qint64 highest = isSameQuote ? lastNumber.number : toLong(rows.value(rows.columns().constFirst()));
     lastNumber = {qtnno, subquote, highest + 1};
@@ -91,7 +91,7 @@ QString NextItemNo(db::Recordset& rsLines)
     QString chosen = u"999"_s;
     const int position = rsLines.absolutePosition();
     attempt([&] {
-        const QString code = FreeCode(rsLines, CodesOf(rsLines.text(u"category"_s).trimmed()));
+        const QString code = freeCode(rsLines, codesOf(rsLines.text(u"category"_s).trimmed()));
         if (!code.isEmpty())
             chosen = code;
     });
@@ -104,7 +104,7 @@ QString NextItemNo(db::Recordset& rsLines)
 
 qint64 NextDocumentLine(qint64 highest)
 {
-    for (const QString& name : files::list(SubletFolder())) {
+    for (const QString& name : files::list(subletFolder())) {
         if (name.startsWith(u'.') || GetExtensionUpper(name) != u"PDF"_s)  // a name with a dot in front is hidden
             continue;
         const QString lastCharacter = name.left(name.lastIndexOf(u'.')).right(1);
@@ -119,7 +119,7 @@ QString NextDocumentName(const QString& qtnno, const QString& subquote, qint64 n
         return {};
     QSet<qint64> taken;
     qint64 highest = 0;
-    for (const QString& name : files::list(SubletFolder(), u"*pdf"_s)) {
+    for (const QString& name : files::list(subletFolder(), u"*pdf"_s)) {
         const bool isOfQuote =
             name.startsWith(qtnno, Qt::CaseInsensitive) && name.mid(qtnno.size() + 1, subquote.size()) == subquote;
         bool isNumber = false;
@@ -130,7 +130,7 @@ QString NextDocumentName(const QString& qtnno, const QString& subquote, qint64 n
         highest = qMax(highest, found);
     }
     const qint64 free = taken.contains(number) ? highest + 1 : number;
-    return files::pathForWriting(SubletFolder(), qtnno + u'.' + subquote + u'_' + QString::number(free) + u".pdf"_s);
+    return files::pathForWriting(subletFolder(), qtnno + u'.' + subquote + u'_' + QString::number(free) + u".pdf"_s);
 }
 
 }  // namespace kest

@@ -1,9 +1,9 @@
 // The road of a message into the quote tables: the one door, the loaders behind it, and what the loaders share.
 #pragma once
 
+#include "base/modDBAccess.h"
 #include "platform/database/Recordset.h"
 #include "platform/xml/xml.h"
-#include "base/modDBAccess.h"
 
 #include <QString>
 #include <QVariant>
@@ -46,7 +46,7 @@ bool LoadAUQT(QString& text, const QString& fileName);  // traps its own failure
 /// something unknown fails the body before any line is touched.
 bool LoadQuoteBody(const db::Recordset& rsQuote, db::Recordset& rsLines, const xml::Document& message);
 /// False, with the error log written, where `LoadQuoteBody` would touch no line.
-bool CheckQuoteBody(const xml::Document& message);
+bool checkQuoteBody(const xml::Document& message);
 /// A line brought a document that authorises sublet work. Whoever shows the documents takes the mark away.
 extern bool gbSubletDocumentArrived;
 
@@ -74,27 +74,27 @@ int NextImageNumber(const QString& quoteNumber);
 
 /// Held from the search for a free number until the quote stands: two workstations that load at once find no number
 /// free together. Fails where another one does not let go.
-std::unique_ptr<db::Lock> LockNewQuotes();
+std::unique_ptr<db::Lock> lockNewQuotes();
 
 struct Column {
     QLatin1StringView name;
     QVariant value;
 };
 /// Sets columns of the current row, in their order.
-void Fill(db::Recordset& row, std::initializer_list<Column> columns);
+void fillColumn(db::Recordset& row, std::initializer_list<Column> columns);
 /// Takes the totals and the host's overrides off a header that a load builds; the host has to look at the quote again.
-void FillWithoutTotals(db::Recordset& quote);
+void fillWithoutTotals(db::Recordset& quote);
 /// Puts a car's colour in the spelling of the colour table, and empties one that is not in it.
-void RespellColour(db::Recordset& car, db::Recordset& colours);
+void respellColour(db::Recordset& car, db::Recordset& colours);
 /// The row of the long texts that belongs to the quote.
-db::Recordset OpenNotes(const db::Recordset& quote);
+db::Recordset openNotes(const db::Recordset& quote);
 /// True where a message's number leads to no quote. An empty one never does: quotes of the host's own may hold it.
-bool IsUnknown(const QString& number, const db::Recordset& quote);
+bool isUnknown(const QString& number, const db::Recordset& quote);
 /// Says with a critical box why a message is not taken; false.
-bool Refuse(const QString& text);
+bool refuse(const QString& text);
 /// True for a subquote above 0.
-bool IsSupplementary(const db::Recordset& quote);
+bool isSupplementary(const db::Recordset& quote);
 /// "123", or "123/2" for a supplementary quote.
-QString QuoteLabel(const db::Recordset& quote);
+QString quoteLabel(const db::Recordset& quote);
 
 }  // namespace kest

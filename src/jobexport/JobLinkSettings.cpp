@@ -1,15 +1,15 @@
 #include "jobexport/JobLinkSettings.h"
 
-#include "platform/database/Recordset.h"
-#include "platform/database/Sql.h"
 #include "base/CredentialCipher.h"
 #include "base/SharedVariables.h"
+#include "platform/database/Recordset.h"
+#include "platform/database/Sql.h"
 
 namespace kest {
 
 using namespace Qt::StringLiterals;
 
-void StoreJobLinkSettings(const JobLinkSettings& settings)
+void storeJobLinkSettings(const JobLinkSettings& settings)
 {
     db::Recordset row(gConn);
     row.open(u"SELECT * FROM ExternalSettings WHERE TAG='JOBLINK'"_s);
@@ -21,7 +21,7 @@ void StoreJobLinkSettings(const JobLinkSettings& settings)
     row.set(u"Port"_s, settings.port);
     row.set(u"Property1"_s, settings.database);
     row.set(u"UserName"_s, settings.user);
-    row.set(u"passWord"_s, EncryptText(settings.password));
+    row.set(u"passWord"_s, encryptText(settings.password));
     row.update();
 }
 

@@ -14,6 +14,6 @@ struct JobLinkSettings {
 };
 
 /// Writes the row, in place of one that is there. The cipher's key must be set. Throws RuntimeError.
-void StoreJobLinkSettings(const JobLinkSettings& settings);
+void storeJobLinkSettings(const JobLinkSettings& settings);
 
 }  // namespace kest

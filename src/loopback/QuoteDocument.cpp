@@ -17,7 +17,7 @@ constexpr int mostLines = 32767;  // of a document
 xml::Document parsed(const QString& text)
 {
     xml::Document document;
-    if (!document.loadXML(WrappedInRequest(text)))
+    if (!document.loadXML(wrappedInRequest(text)))
         throw RuntimeError(TypeMismatch, u"it is no XML: "_s + document.parseError().reason.simplified());
     return document;
 }

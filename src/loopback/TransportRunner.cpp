@@ -1,7 +1,6 @@
 #include "loopback/TransportRunner.h"
 
 #include "setup/Profile.h"
-#include "platform/RuntimeError.h"
 #include "platform/files/files.h"
 
 #include <QJsonObject>
@@ -40,9 +39,8 @@ TransportFolders transportFolders()
 }
 
 TransportRunner::TransportRunner(const TransportFolders& all, Heard listener)
-    : folders(all), transport(all), heard(std::move(listener)), lock(files::systemPath(all.own + u"KESTWeb.lock"_s))
+    : folders(all), transport(all), heard(std::move(listener))
 {
-    lock.setStaleLockTime(0);  // however old: its process tells whether it holds
     settled.setSingleShot(true);
     settled.setInterval(settleTime);
     interval.setInterval(slowTime);
@@ -57,11 +55,8 @@ TransportRunner::TransportRunner(const TransportFolders& all, Heard listener)
 bool TransportRunner::claim()
 {
     files::makeFolder(folders.own);
-    if (lock.tryLock())
-        return true;
-    if (lock.error() == QLockFile::PermissionError)
-        throw RuntimeError(PermissionDenied, u"Nothing can be written in "_s + files::systemPath(folders.own));
-    return false;
+    lock.emplace(folders.own + u"KESTWeb.lock"_s);
+    return lock->isHeld();
 }
 
 void TransportRunner::start()

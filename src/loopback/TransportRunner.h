@@ -2,13 +2,14 @@
 #pragma once
 
 #include "loopback/Transport.h"
+#include "platform/files/Lock.h"
 
 #include <QFileSystemWatcher>
-#include <QLockFile>
 #include <QObject>
 #include <QTimer>
 
 #include <functional>
+#include <optional>
 
 namespace kest::app {
 
@@ -22,7 +23,7 @@ public:
 
     TransportRunner(const TransportFolders& folders, Heard heard);
 
-    /// False where another transport works on these folders. A crash leaves no lock behind.
+    /// False while another transport works on these folders. Throws if nothing can be written there.
     bool claim();
     void start();
     void carryNow();
@@ -33,7 +34,7 @@ private:
     TransportFolders folders;
     Transport transport;
     Heard heard;
-    QLockFile lock;
+    std::optional<files::Lock> lock;
     QFileSystemWatcher watcher;
     QTimer settled;
     QTimer interval;

@@ -1,10 +1,10 @@
 // The insurer's side of the transport: what is known about a quote, and the messages about it.
-#include "setup/DemoShop.h"
+#include "base/Helpers.h"
 #include "loopback/Transport.h"
 #include "messages/Envelope.h"
 #include "platform/RuntimeError.h"
 #include "platform/files/files.h"
-#include "base/Helpers.h"
+#include "setup/DemoShop.h"
 
 #include <algorithm>
 #include <tuple>
@@ -287,7 +287,7 @@ QString Transport::sendMessage(const Step& step, const Matter& matter)
     }
     const QString code = messageCode(step.act);
     const QString about = matter.quote.isEmpty() ? u"request "_s + matter.request : u"quote "_s + matter.reference();
-    const QString type = step.act == Act::Marker ? u"Marker"_s : MessageTypeName(code);
+    const QString type = step.act == Act::Marker ? u"Marker"_s : messageTypeName(code);
     QString name;
     do {
         // listed in the order of sending, behind what is named by its type
@@ -308,7 +308,7 @@ void Transport::rememberAnswers()
         tried(file, stampOf(folders.unread + file), [&] {
             QString text = files::read(folders.unread + file);
             known->quotes[keyOf(quote, subquote)][u"network"_s] =
-                ParsedMessage(text).textOf(u"rootns:kestQuoteNumber"_s);
+                parsedMessage(text).textOf(u"rootns:kestQuoteNumber"_s);
         });
     }
 }

@@ -1,11 +1,11 @@
-#include "messages/Envelope.h"
+#include "base/Helpers.h"
+#include "base/SharedVariables.h"
 #include "messagelist/Summary.h"
+#include "messages/Envelope.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
-#include "base/Helpers.h"
-#include "base/SharedVariables.h"
 
 using namespace Qt::StringLiterals;
 
@@ -182,7 +182,7 @@ MessageRow sentRow(const xml::Document& document)
 MessageRow GetMessageRow(const QString& text, const QString& typeName)
 {
     QString prepared = text;
-    return GetMessageRow(ParsedMessage(prepared), typeName);
+    return GetMessageRow(parsedMessage(prepared), typeName);
 }
 
 MessageRow GetMessageRow(const xml::Document& message, const QString& typeName)
@@ -210,7 +210,7 @@ MessageRow GetMessageRow(const xml::Document& message, const QString& typeName)
 MessageRow GetMarkerRow(const QString& text, const QString& typeName)
 {
     QString prepared = text;
-    return GetMarkerRow(ParsedMessage(prepared), typeName);
+    return GetMarkerRow(parsedMessage(prepared), typeName);
 }
 
 MessageRow GetMarkerRow(const xml::Document& marker, const QString& typeName)

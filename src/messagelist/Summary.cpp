@@ -1,12 +1,12 @@
 #include "messagelist/Summary.h"
 
-#include "messages/Envelope.h"
-#include "messages/Folders.h"
-#include "platform/RuntimeError.h"
-#include "platform/Prompt.h"
-#include "platform/files/files.h"
 #include "base/Helpers.h"
 #include "base/SharedVariables.h"
+#include "messages/Envelope.h"
+#include "messages/Folders.h"
+#include "platform/Prompt.h"
+#include "platform/RuntimeError.h"
+#include "platform/files/files.h"
 
 #include <utility>
 
@@ -83,7 +83,7 @@ void Fill::take(const QString& file)
     } else if (file.startsWith("R_"_L1)) {
         hooks.submissionResponse(text, file);
     } else if (file.contains("MDMSG"_L1)) {
-        if (IsMarker(document)) {
+        if (isMarker(document)) {
             const xml::Document& marker = prepared();
             listed.append({file, GetMarkerRow(marker, GetMarkerTypeName(marker))});
         }
@@ -103,10 +103,10 @@ bool Fill::parse(const QString& path)
         return false;
     text = files::read(path);
     if (folder != Sent)
-        return ParseWithRepairs(document, text);
-    if (!EscapeAmpersands(text))
+        return parseWithRepairs(document, text);
+    if (!escapeAmpersands(text))
         return false;
-    text = WrappedInRequest(text);
+    text = wrappedInRequest(text);
     return document.loadXML(text) && text.size() >= shortestSentText;
 }
 
@@ -114,9 +114,9 @@ bool Fill::parse(const QString& path)
 // second parse is spared where it would find the same.
 const xml::Document& Fill::prepared()
 {
-    if (IsSameWhenPrepared(text))
+    if (isSameWhenPrepared(text))
         return document;
-    reparsed = ParsedMessage(text);
+    reparsed = parsedMessage(text);
     return reparsed;
 }
 
@@ -135,7 +135,7 @@ QList<ListedMessage> BuildMessageList(int folder, const FillHooks& hooks)
     Fill fill(folder, hooks);
     qint64 done = 0;
     for (const QString& file : names) {
-        if (file.endsWith("xml"_L1) && file.contains(gsListFilter) && IsBareName(file)) {
+        if (file.endsWith("xml"_L1) && file.contains(gsListFilter) && isBareName(file)) {
             try {
                 fill.take(file);
             } catch (const RuntimeError& error) {

@@ -1,12 +1,12 @@
 #include "messagelist/TakeIn.h"
 
-#include "messages/Envelope.h"
-#include "platform/RuntimeError.h"
-#include "platform/database/Sql.h"
-#include "platform/Prompt.h"
-#include "platform/files/files.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
+#include "messages/Envelope.h"
+#include "platform/Prompt.h"
+#include "platform/RuntimeError.h"
+#include "platform/database/Sql.h"
+#include "platform/files/files.h"
 
 #include <QFileInfo>
 
@@ -32,7 +32,7 @@ void checkResponse(const xml::Document& document, const QString& name)
     if (document.textOrEmptyOf(u"rootns:kestQuoteNumber"_s).isEmpty() ||
         document.textOrEmptyOf(u"rootns:quoteSubmissionStatus"_s).isEmpty())
         throw Refusal{u"it is no response of the network"_s};
-    if (Opened(sql("SELECT QTNNO FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", name.section(u'_', 1, 1),
+    if (opened(sql("SELECT QTNNO FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", name.section(u'_', 1, 1),
                    name.section(u'_', 2).left(1)))
             .eof())
         throw Refusal{u"the quote that it answers is not there"_s};
@@ -45,12 +45,12 @@ void checkMessage(const QString& path, const QString& name)
     QString text = files::read(path);
     xml::Document document;
     SetupDocument(document);
-    if (!ParseWithRepairs(document, text))
+    if (!parseWithRepairs(document, text))
         throw Refusal{u"it can't be read as XML"_s};
     if (name.startsWith("R_"_L1))
         return checkResponse(document, name);
-    const bool isNetworkMessage = !name.contains("MDMSG"_L1) && GetMessageTypeName(document) != MessageTypeName({});
-    if (!isNetworkMessage && !IsMarker(document))
+    const bool isNetworkMessage = !name.contains("MDMSG"_L1) && GetMessageTypeName(document) != messageTypeName({});
+    if (!isNetworkMessage && !isMarker(document))
         throw Refusal{u"it is no message of the network"_s};
 }
 
@@ -114,7 +114,7 @@ QString TakenIn::refusals() const
     return "Not taken in:\n"_L1 + lines.join(u'\n');
 }
 
-TakenIn TakeInFiles(const QList<QUrl>& urls, const std::function<void(qint64 done, qint64 total)>& progress)
+TakenIn takeInFiles(const QList<QUrl>& urls, const std::function<void(qint64 done, qint64 total)>& progress)
 {
     TakenIn result;
     const auto unlessRefused = [&](const QString& name, const auto& step) {

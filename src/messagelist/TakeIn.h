@@ -26,6 +26,6 @@ struct TakenIn {
 /// all, and what belongs to a message before it. Nothing is taken away where it lay.
 /// Before a file of the same name is replaced a box asks. What is no such file, and what could not be copied, is
 /// refused and the others go on.
-TakenIn TakeInFiles(const QList<QUrl>& urls, const std::function<void(qint64 done, qint64 total)>& progress = {});
+TakenIn takeInFiles(const QList<QUrl>& urls, const std::function<void(qint64 done, qint64 total)>& progress = {});
 
 }  // namespace kest

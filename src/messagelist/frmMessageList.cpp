@@ -1,18 +1,18 @@
 #include "messagelist/frmMessageList.h"
 
-#include "inbound/modLoadXML.h"
-#include "messages/Folders.h"
-#include "messagelist/MessageListModel.h"
-#include "messagelist/TakeIn.h"
-#include "platform/RuntimeError.h"
-#include "platform/desktop/Progress.h"
-#include "platform/Prompt.h"
-#include "platform/desktop/Window.h"
-#include "platform/files/files.h"
-#include "reports/PrintXML.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "base/modLoggerEx.h"
+#include "inbound/modLoadXML.h"
+#include "messagelist/MessageListModel.h"
+#include "messagelist/TakeIn.h"
+#include "messages/Folders.h"
+#include "platform/Prompt.h"
+#include "platform/RuntimeError.h"
+#include "platform/desktop/Progress.h"
+#include "platform/desktop/Window.h"
+#include "platform/files/files.h"
+#include "reports/PrintXML.h"
 #include "utilities/frmViewXML.h"
 
 #include <QClipboard>
@@ -83,7 +83,7 @@ void frmMessageList::updateFilter(const QString& filter)
 
 bool frmMessageList::loadFile(const QString& file)
 {
-    if (!IsBareName(file) || (select(file) && !cmdProcess->isEnabled()))
+    if (!isBareName(file) || (select(file) && !cmdProcess->isEnabled()))
         return false;
     const bool loaded = load(file);
     if (tmrRefresh->isActive()) {
@@ -311,7 +311,7 @@ void frmMessageList::takeIn(const QList<QUrl>& brought)
     TakenIn taken;
     {
         desktop::Progress progress(windowTitle(), u"Taking the files in..."_s, prgFill);
-        taken = TakeInFiles(brought, [&](qint64 done, qint64 total) { progress.step(done, total); });
+        taken = takeInFiles(brought, [&](qint64 done, qint64 total) { progress.step(done, total); });
     }
     Form_KeyRefresh();
     const qsizetype waiting = taken.toList.size() - std::ranges::count_if(rows(), [&](const ListedMessage& message) {

@@ -57,7 +57,7 @@ QString AddXsiDeclaration(const QString& text)
     return text.first(first) + schemaInstance + text.sliced(first);
 }
 
-bool IsSameWhenPrepared(const QString& text)
+bool isSameWhenPrepared(const QString& text)
 {
     const qsizetype first = text.indexOf("xmlns"_L1);
     if (first < 0 || text.contains(schemaInstance, Qt::CaseInsensitive))
@@ -71,7 +71,7 @@ bool IsSameWhenPrepared(const QString& text)
     return isAttribute && !before.contains("<!"_L1) && !before.contains("<?"_L1);
 }
 
-QString MessageTypeName(const QString& code)
+QString messageTypeName(const QString& code)
 {
     for (const auto& [known, name] : displayNames)
         if (code == known)
@@ -81,19 +81,19 @@ QString MessageTypeName(const QString& code)
 
 QString GetMessageTypeName(QString& text)
 {
-    return GetMessageTypeName(ParsedMessage(text));
+    return GetMessageTypeName(parsedMessage(text));
 }
 
 QString GetMessageTypeName(const xml::Document& message)
 {
     QString code;
     attempt([&] { code = message.textOf(u"messageType"_s).toUpper(); });
-    return MessageTypeName(code);
+    return messageTypeName(code);
 }
 
 QString GetMarkerTypeName(QString& text)
 {
-    return GetMarkerTypeName(ParsedMessage(text));
+    return GetMarkerTypeName(parsedMessage(text));
 }
 
 QString GetMarkerTypeName(const xml::Document& marker)
@@ -107,13 +107,13 @@ QString GetMarkerTypeName(const xml::Document& marker)
     return action == "DELDUPE"_L1 ? u"Quote Send Error"_s : QString(unknownMessage);
 }
 
-bool IsMarker(const xml::Document& message)
+bool isMarker(const xml::Document& message)
 {
     const xml::Node first = message.firstChild().firstChild();
     return first && first.text() == "MDMSG"_L1;
 }
 
-bool EscapeAmpersands(QString& text)
+bool escapeAmpersands(QString& text)
 {
     if (text.size() + 4 * text.count(u'&') > xml::Document::maximumBytes)
         return false;
@@ -121,26 +121,26 @@ bool EscapeAmpersands(QString& text)
     return true;
 }
 
-QString WrappedInRequest(const QString& text)
+QString wrappedInRequest(const QString& text)
 {
     return "<request>"_L1 + text + "</request>"_L1;
 }
 
-bool ParseWithRepairs(xml::Document& document, QString& text)
+bool parseWithRepairs(xml::Document& document, QString& text)
 {
     for (int repairs = 0; !document.loadXML(text); ++repairs) {
         const quint32 error = document.parseError().errorCode;
         if (repairs == repairsAllowed)
             return false;
         if (error == xml::SecondRoot)
-            text = WrappedInRequest(text);
-        else if (error != xml::BareAmpersand || !EscapeAmpersands(text))
+            text = wrappedInRequest(text);
+        else if (error != xml::BareAmpersand || !escapeAmpersands(text))
             return false;
     }
     return true;
 }
 
-xml::Document ParsedMessage(QString& text)
+xml::Document parsedMessage(QString& text)
 {
     xml::Document document;
     SetupDocument(document);

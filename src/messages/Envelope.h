@@ -17,10 +17,10 @@ void SetupDocument(xml::Document& document);
 QString AddXsiDeclaration(const QString& text);
 /// True where a document parsed from the bare text and one parsed from the prepared text hold the same, so that a
 /// parse can be spared. In doubt false.
-bool IsSameWhenPrepared(const QString& text);
+bool isSameWhenPrepared(const QString& text);
 
 /// The display name of a type code in upper case, or "UNKNOWN - INVALID MESSAGE".
-QString MessageTypeName(const QString& code);
+QString messageTypeName(const QString& code);
 /// The display name of a network message. Changes `text` to the prepared one; never fails.
 QString GetMessageTypeName(QString& text);
 /// The same, of a message that was parsed before.
@@ -29,19 +29,19 @@ QString GetMessageTypeName(const xml::Document& message);
 QString GetMarkerTypeName(QString& text);
 QString GetMarkerTypeName(const xml::Document& marker);
 /// True for a marker message, whatever its file's name.
-bool IsMarker(const xml::Document& message);
+bool isMarker(const xml::Document& message);
 
 /// Every "&" becomes "&amp;", those of entities included. False, and nothing changes, where the outcome would be longer
 /// than a parse takes: it can be five times as long.
-bool EscapeAmpersands(QString& text);
+bool escapeAmpersands(QString& text);
 /// The text between "<request>" and "</request>".
-QString WrappedInRequest(const QString& text);
+QString wrappedInRequest(const QString& text);
 
 /// Parses a text into the document, at need after the two repairs, which change `text`. False where it stays
 /// unreadable.
-bool ParseWithRepairs(xml::Document& document, QString& text);
+bool parseWithRepairs(xml::Document& document, QString& text);
 /// A prepared text parsed for the message code's paths: SetupDocument, AddXsiDeclaration, loadXML. `text` comes back
 /// prepared. The caller asks `parseError`.
-xml::Document ParsedMessage(QString& text);
+xml::Document parsedMessage(QString& text);
 
 }  // namespace kest

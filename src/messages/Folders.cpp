@@ -1,12 +1,12 @@
 #include "messages/Folders.h"
 
+#include "base/Helpers.h"
+#include "base/SharedVariables.h"
 #include "messages/Envelope.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
-#include "base/Helpers.h"
-#include "base/SharedVariables.h"
 
 #include <limits>
 #include <tuple>
@@ -123,14 +123,14 @@ QString plainOrNone(const QString& name)
 
 }  // namespace
 
-bool IsBareName(const QString& file)
+bool isBareName(const QString& file)
 {
     return !file.isEmpty() && !file.contains(u'/') && !file.contains(u'\\');
 }
 
 void MoveMessage(const QString& file, const QString& action)
 {
-    if (action == "read"_L1 && IsBareName(file) && files::exists(gsUnreadPath + file)) {
+    if (action == "read"_L1 && isBareName(file) && files::exists(gsUnreadPath + file)) {
         QString name =
             gsMatchedQTNNO.isEmpty() ? GetReadFileName(gsUnreadPath + file) : GetMatchedFileName(gsMatchedQTNNO);
         if (name.isEmpty())
@@ -174,7 +174,7 @@ MessageQuoteKey GetMessageQuoteKey(const QString& text)
     MessageQuoteKey key;
     attempt([&] {
         QString prepared = text;
-        const xml::Document message = ParsedMessage(prepared);
+        const xml::Document message = parsedMessage(prepared);
         const QString type = message.textOf(u"messageType"_s).toUpper();
         for (const KeySource& source : keySources)
             if (type == source.type)

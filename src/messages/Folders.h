@@ -6,7 +6,7 @@
 namespace kest {
 
 /// True for the name of a file without a folder. A name that the transport chose may hold what a path would split.
-bool IsBareName(const QString& file);
+bool isBareName(const QString& file);
 
 /// Moves a file of the unread folder to the read folder under its new name; any action but "read" moves nothing.
 /// Never fails: a copy that failed leaves the message in place. Forgets `gsMatchedQTNNO`.

@@ -1,8 +1,8 @@
 #include "outbound/ExtraInfo.h"
 
+#include "base/modDBAccess.h"
 #include "outbound/QuoteRows.h"
 #include "platform/database/Sql.h"
-#include "base/modDBAccess.h"
 
 using namespace Qt::StringLiterals;
 
@@ -32,26 +32,26 @@ std::pair<QString, QString> buildDate(const QString& year)
 
 }  // namespace
 
-QString TransmissionOf(const db::Recordset& car)
+QString transmissionOf(const db::Recordset& car)
 {
     const QString transmission = trimmed(car, "XMISSION").toUpper();
     return transmission == "A"_L1 || transmission == "AUTOMATIC"_L1 ? u"Automatic"_s : u"Manual"_s;
 }
 
 ExtraInfo::ExtraInfo(const QString& quoteNumber, const QString& subquote)
-    : quoteRow(Opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quoteNumber, subquote)))
+    : quoteRow(opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quoteNumber, subquote)))
 {
     if (quoteRow.recordCount() != 1) {
         missing = u"Couldn't locate quote in database, Please contact MarlinDesk Support"_s;
         return;
     }
-    carRow = Opened(sql("SELECT * FROM CAR WHERE REGO='{}'", quoteRow.value(u"REGO"_s)));
+    carRow = opened(sql("SELECT * FROM CAR WHERE REGO='{}'", quoteRow.value(u"REGO"_s)));
     if (carRow.recordCount() != 1) {
         missing = u"Missing relationship : Car, Please contact MarlinDesk Support"_s;
         return;
     }
-    modelRow = Opened(sql("SELECT MAKE, MODEL FROM ALLMODEL WHERE MODEL_ID='{}'", carRow.value(u"MODEL_ID"_s)));
-    customerRow = Opened(sql("SELECT SALUTATION + ' ' + FIRSTNAME + ' ' + NAME AS NAME FROM CUSTOMER WHERE CUST_ID={}",
+    modelRow = opened(sql("SELECT MAKE, MODEL FROM ALLMODEL WHERE MODEL_ID='{}'", carRow.value(u"MODEL_ID"_s)));
+    customerRow = opened(sql("SELECT SALUTATION + ' ' + FIRSTNAME + ' ' + NAME AS NAME FROM CUSTOMER WHERE CUST_ID={}",
                              carRow.value(u"CUST_ID"_s)));
     if (modelRow.recordCount() != 1 || customerRow.recordCount() != 1)
         missing = u"Missing relationship : Model or Customer, Please contact MarlinDesk Support"_s;
@@ -82,7 +82,7 @@ ExtraValues ExtraInfo::values() const
     const auto [month, year] = buildDate(carRow.text(u"Year"_s));
 
     ExtraValues values;
-    values[Transmission] = TransmissionOf(carRow);
+    values[Transmission] = transmissionOf(carRow);
     values[VIN] = trimmed(carRow, "VIN");
     values[Odometer] = trimmed(quoteRow, "kms");
     values[Cylinders] = trimmed(carRow, "CYLINDERS");

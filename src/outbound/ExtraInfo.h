@@ -25,7 +25,7 @@ enum ExtraValue : size_t {
 using ExtraValues = std::array<QString, 10>;
 
 /// "Automatic" or "Manual", from the letter or the word that the car has.
-QString TransmissionOf(const db::Recordset& car);
+QString transmissionOf(const db::Recordset& car);
 
 /// The values, or the message that says which record is missing.
 using ExtraInfoResult = std::variant<ExtraValues, QString>;

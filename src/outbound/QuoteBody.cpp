@@ -1,12 +1,12 @@
 #include "outbound/QuoteBody.h"
 
+#include "base/Helpers.h"
+#include "base/modDBAccess.h"
+#include "base/modLoggerEx.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
 #include "quotedata/Rounding.h"
-#include "base/Helpers.h"
-#include "base/modDBAccess.h"
-#include "base/modLoggerEx.h"
 
 #include <cmath>
 
@@ -65,41 +65,41 @@ QuoteBody::QuoteBody(const QString& q, const QString& s, const QString& authoris
     : reference(QString(q + u'/' + s).trimmed()), isMainQuote(s == "0"_L1), isAuthorised(authorisedNumber.size() > 1)
 {
     removeAndReplace =
-        Opened(sql("SELECT ITEMID, PARTNO, SCRIPT, RRHOUR, RR_RATE2, SEQ_NO FROM QUOTE2 WHERE "
+        opened(sql("SELECT ITEMID, PARTNO, SCRIPT, RRHOUR, RR_RATE2, SEQ_NO FROM QUOTE2 WHERE "
                    "CATEGORY='R&R' AND PARTNO <> 'M' AND REPORT_ON='0' AND SUBQUOTE='{}' AND QTNNO='{}'",
                    s, q));
     repair =
-        Opened(sql("SELECT ITEMID, PARTNO, SCRIPT, RAHOUR, RR_RATE2, SEQ_NO FROM QUOTE2 WHERE CATEGORY='RA' AND "
+        opened(sql("SELECT ITEMID, PARTNO, SCRIPT, RAHOUR, RR_RATE2, SEQ_NO FROM QUOTE2 WHERE CATEGORY='RA' AND "
                    "REPORT_ON='0' AND SUBQUOTE='{}' AND QTNNO='{}'",
                    s, q));
     mechanical =
-        Opened(sql("SELECT ITEMID, PARTNO, SCRIPT, RRHOUR, RR_RATE2, SEQ_NO FROM QUOTE2 WHERE CATEGORY='R&R' "
+        opened(sql("SELECT ITEMID, PARTNO, SCRIPT, RRHOUR, RR_RATE2, SEQ_NO FROM QUOTE2 WHERE CATEGORY='R&R' "
                    "AND PARTNO='M' AND REPORT_ON='0' AND SUBQUOTE='{}' AND QTNNO='{}'",
                    s, q));
     miscellaneous =
-        Opened(sql("SELECT ITEMID, SCRIPT, VENDOR, UNITCOST, SEQ_NO FROM QUOTE2 WHERE CATEGORY='MIS' AND "
+        opened(sql("SELECT ITEMID, SCRIPT, VENDOR, UNITCOST, SEQ_NO FROM QUOTE2 WHERE CATEGORY='MIS' AND "
                    "REPORT_ON='0' AND SUBQUOTE='{}' AND QTNNO='{}'",
                    s, q));
     partLines =
-        Opened(sql("SELECT ITEMID, SCRIPT, UNITCOST, RRHOUR, QTY, PARTNO, SEQ_NO, MARK FROM QUOTE2 WHERE "
+        opened(sql("SELECT ITEMID, SCRIPT, UNITCOST, RRHOUR, QTY, PARTNO, SEQ_NO, MARK FROM QUOTE2 WHERE "
                    "CATEGORY='PRT' AND REPORT_ON='0' AND SUBQUOTE='{}' AND QTNNO='{}'",
                    s, q));
     paint =
-        Opened(sql("SELECT ITEMID, SCRIPT, PTHOUR, RR_RATE2, BLEND, SEQ_NO FROM QUOTE2 WHERE CATEGORY='PAINT' AND "
+        opened(sql("SELECT ITEMID, SCRIPT, PTHOUR, RR_RATE2, BLEND, SEQ_NO FROM QUOTE2 WHERE CATEGORY='PAINT' AND "
                    "REPORT_ON='0' AND SUBQUOTE='{}' AND QTNNO='{}'",
                    s, q));
     otherPaint =
-        Opened(sql("SELECT ITEMID, SCRIPT, PTHOUR, OPG_RATE, BLEND, SEQ_NO FROM QUOTE2 WHERE CATEGORY='OPG' "
+        opened(sql("SELECT ITEMID, SCRIPT, PTHOUR, OPG_RATE, BLEND, SEQ_NO FROM QUOTE2 WHERE CATEGORY='OPG' "
                    "AND REPORT_ON='0' AND SUBQUOTE='{}' AND QTNNO='{}'",
                    s, q));
     sublet =
-        Opened(sql("SELECT QUOTE2.ITEMID, QUOTE2.SCRIPT, QUOTE2.UNITCOST, QUOTE2.VENDOR, QUOTE2.SEQ_NO, "
+        opened(sql("SELECT QUOTE2.ITEMID, QUOTE2.SCRIPT, QUOTE2.UNITCOST, QUOTE2.VENDOR, QUOTE2.SEQ_NO, "
                    "QUOTE2.PARTNO, VENDOR.NAME, VENDOR.STREET, VENDOR.SUBURB, VENDOR.PHONE FROM QUOTE2 INNER JOIN "
                    "VENDOR ON QUOTE2.VENDOR = VENDOR.VENDOR_ID WHERE (QUOTE2.CATEGORY = 'MIS') AND REPORT_ON='0' "
                    "AND (QUOTE2.SUBQUOTE='{}') AND (QUOTE2.QTNNO = '{}')",
                    s, q));
     reportItem =
-        Opened(sql("SELECT ITEMID, SCRIPT, RRHOUR, RAHOUR, PTHOUR, RR_RATE2, SEQ_NO FROM QUOTE2 WHERE "
+        opened(sql("SELECT ITEMID, SCRIPT, RRHOUR, RAHOUR, PTHOUR, RR_RATE2, SEQ_NO FROM QUOTE2 WHERE "
                    "REPORT_ON=1 AND SUBQUOTE='{}' AND QTNNO='{}'",
                    s, q));
 }
@@ -260,7 +260,7 @@ void QuoteBody::addReportItems(const Branch* reportItems)
 
 void QuoteBody::addSublets(const Branch* sublets)
 {
-    db::Recordset types = Opened(u"SELECT Type, Script FROM SUBLET WHERE Sublet=1"_s);
+    db::Recordset types = opened(u"SELECT Type, Script FROM SUBLET WHERE Sublet=1"_s);
     const auto subletType = [&](const QString& partNumber) {
         if (types.recordCount() > 0)
             types.moveFirst();

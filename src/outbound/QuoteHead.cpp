@@ -1,7 +1,7 @@
 #include "outbound/QuoteHead.h"
 
-#include "platform/values.h"
 #include "base/Helpers.h"
+#include "platform/values.h"
 
 using namespace Qt::StringLiterals;
 
@@ -45,7 +45,7 @@ QString phoneNumber(const db::Recordset& customer, const char* column)
     return AlphaNumericOnly(trimmed(customer, column)).left(10);
 }
 
-void AddCustomer(const Branch& request, const db::Recordset& customer)
+void addCustomer(const Branch& request, const db::Recordset& customer)
 {
     const auto isEmptyText = [&](const QString& column) {  // a Null is not: it may be a person's
         return !customer.isNull(column) && customer.text(column).isEmpty();
@@ -78,7 +78,7 @@ ExtraValues vehicleValues(const QuoteRows& rows, const std::optional<ExtraValues
     if (asked.isNull() || isTrue(asked))  // a quote of which nobody has said counts as answered
         return values;
 
-    values[Transmission] = TransmissionOf(car);
+    values[Transmission] = transmissionOf(car);
     values[Cylinders] = QString(text(car, "ENG_SIZE") + u' ' + text(car, "CYLINDERS")).trimmed();
     values[VIN] = trimmed(car, "VIN");
     values[Odometer] = trimmed(rows.quote, "kms");
@@ -86,7 +86,7 @@ ExtraValues vehicleValues(const QuoteRows& rows, const std::optional<ExtraValues
     return values;
 }
 
-void AddVehicle(const Branch& request, const QuoteRows& rows, const std::optional<ExtraValues>& extra)
+void addVehicle(const Branch& request, const QuoteRows& rows, const std::optional<ExtraValues>& extra)
 {
     const ExtraValues values = vehicleValues(rows, extra);
     const bool asked = isTrue(rows.quote.value(u"ExtraInfo"_s));
@@ -114,7 +114,7 @@ void AddVehicle(const Branch& request, const QuoteRows& rows, const std::optiona
 
 }  // namespace
 
-InsurerReference ReferenceOf(const QuoteRows& rows)
+InsurerReference referenceOf(const QuoteRows& rows)
 {
     InsurerReference reference;
     if (!rows.isMainQuote()) {
@@ -129,14 +129,14 @@ InsurerReference ReferenceOf(const QuoteRows& rows)
     return reference;
 }
 
-std::optional<qint64> RepairDays(const db::Recordset& quote)
+std::optional<qint64> repairDays(const db::Recordset& quote)
 {
     if (quote.isNull(u"CAR_IN"_s) || quote.isNull(u"targetdate"_s))
         return {};
     return toDate(quote.value(u"CAR_IN"_s)).date().daysTo(toDate(quote.value(u"targetdate"_s)).date());
 }
 
-void AddHead(const Branch& request, const QuoteRows& rows, const InsurerReference& reference,
+void addHead(const Branch& request, const QuoteRows& rows, const InsurerReference& reference,
              const std::optional<ExtraValues>& extra, std::optional<qint64> repairDays)
 {
     const bool hasRequest = !reference.requestNumber.isEmpty();
@@ -149,13 +149,13 @@ void AddHead(const Branch& request, const QuoteRows& rows, const InsurerReferenc
         {"quotationSoftwareVersion", always, QStringLiteral(KEST_VERSION)},
         {"quoteCreator", always, text(rows.quote, "QUOTER")},
     });
-    AddCustomer(request, rows.customer);
+    addCustomer(request, rows.customer);
     request.add({
         {"vehicleRegistration", always, trimmed(rows.car, "REGO")},
         {"vehicleDescription", always, QString(text(rows.model, "MAKE") + u' ' + text(rows.model, "MODEL")).trimmed()},
     });
     if (rows.isMainQuote())
-        AddVehicle(request, rows, extra);
+        addVehicle(request, rows, extra);
     request.add({
         {"quoteComments", always, text(rows.notes, "P_REMARKS")},
         {"repairDaysRequired", repairDays.has_value(), QString::number(repairDays.value_or(0))},

@@ -1,9 +1,9 @@
 // Everything of a quote document that stands before its body: whom it concerns, and the vehicle.
 #pragma once
 
-#include "platform/xml/Branch.h"
 #include "outbound/ExtraInfo.h"
 #include "outbound/QuoteRows.h"
+#include "platform/xml/Branch.h"
 
 #include <QString>
 
@@ -18,13 +18,13 @@ struct InsurerReference {
     QString requestNumber;
     QString requestVersion;
 };
-InsurerReference ReferenceOf(const QuoteRows& rows);
+InsurerReference referenceOf(const QuoteRows& rows);
 
 /// Whole days from the car's coming in to its completion; none where one of the two dates is open.
-std::optional<qint64> RepairDays(const db::Recordset& quote);
+std::optional<qint64> repairDays(const db::Recordset& quote);
 
 /// Appends the elements before the body, in the document's order.
-void AddHead(const Branch& request, const QuoteRows& rows, const InsurerReference& reference,
+void addHead(const Branch& request, const QuoteRows& rows, const InsurerReference& reference,
              const std::optional<ExtraValues>& extra, std::optional<qint64> repairDays);
 
 }  // namespace kest

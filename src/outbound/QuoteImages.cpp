@@ -1,9 +1,9 @@
 #include "outbound/QuoteImages.h"
 
-#include "platform/xml/Branch.h"
+#include "base/SharedVariables.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
-#include "base/SharedVariables.h"
+#include "platform/xml/Branch.h"
 
 #include <cmath>
 
@@ -11,21 +11,21 @@ using namespace Qt::StringLiterals;
 
 namespace kest {
 
-QList<QuoteImage> QuoteImages(const QString& folder, const QString& quoteNumber, const QString& subquote)
+QList<QuoteImage> quoteImages(const QString& folder, const QString& quoteNumber, const QString& subquote)
 {
     const QString stem = quoteNumber + u'_' + subquote;
     QList<QuoteImage> images;
     if (!files::folderExists(folder))
         return images;
     for (const QString& file : files::list(folder, stem + u"*.jpg"_s)) {
-        const QString id = ImageId(file);
+        const QString id = imageId(file);
         if (file.startsWith(stem, Qt::CaseInsensitive) && !id.isEmpty())  // a quote number may hold a "*"
             images.append({file, id});
     }
     return images;
 }
 
-QString ImageId(const QString& file)
+QString imageId(const QString& file)
 {
     const QString name = file.trimmed();
     const qsizetype behindUnderscore = name.indexOf(u'_') + 1;
@@ -34,9 +34,9 @@ QString ImageId(const QString& file)
     return number ? numberText(std::trunc(*number)) : QString();
 }
 
-void WriteImageDocuments(const QString& folder, const QString& quoteNumber, const QString& subquote)
+void writeImageDocuments(const QString& folder, const QString& quoteNumber, const QString& subquote)
 {
-    for (const QuoteImage& image : QuoteImages(folder, quoteNumber, subquote)) {
+    for (const QuoteImage& image : quoteImages(folder, quoteNumber, subquote)) {
         xml::Document document;
         const Branch request(document, "request");
         request.add({

@@ -13,12 +13,12 @@ struct QuoteImage {
 
 /// The images of a quote in a folder, in the order of their names. A name from which no id can be read is no image of
 /// the quote, in the quote document and in the image documents alike.
-QList<QuoteImage> QuoteImages(const QString& folder, const QString& quoteNumber, const QString& subquote);
+QList<QuoteImage> quoteImages(const QString& folder, const QString& quoteNumber, const QString& subquote);
 
 /// The number behind a name's first underscore, without leading zeros: 123_0012.jpg gives 12. Empty where none stands.
-QString ImageId(const QString& file);
+QString imageId(const QString& file);
 
 /// Puts a document and a copy of each image into the outgoing folder.
-void WriteImageDocuments(const QString& folder, const QString& quoteNumber, const QString& subquote);
+void writeImageDocuments(const QString& folder, const QString& quoteNumber, const QString& subquote);
 
 }  // namespace kest

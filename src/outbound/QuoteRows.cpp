@@ -1,8 +1,8 @@
 #include "outbound/QuoteRows.h"
 
+#include "base/modDBAccess.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
-#include "base/modDBAccess.h"
 
 using namespace Qt::StringLiterals;
 
@@ -22,23 +22,23 @@ QuoteRows::QuoteRows(db::Recordset& quoteRecord)
     : quote(quoteRecord), number(quote.text(u"QTNNO"_s)), subquote(quote.text(u"Subquote"_s))
 {
     car =
-        Opened(sql("SELECT TOP 1 REGO, BODY_ID2, MODEL_ID, CUST_ID, YEAR, COLOUR, CYLINDERS, PAINT_GP, XMISSION, "
+        opened(sql("SELECT TOP 1 REGO, BODY_ID2, MODEL_ID, CUST_ID, YEAR, COLOUR, CYLINDERS, PAINT_GP, XMISSION, "
                    "ENG_SIZE, VIN FROM CAR WHERE CAR.REGO='{}'",
                    quote.value(u"REGO"_s)));
     require(car, u"car"_s, *this);
     customer =
-        Opened(sql("SELECT CUST_ID, SALUTATION, FIRSTNAME, NAME, PHONE_P, PHONE_B FROM CUSTOMER WHERE CUST_ID='{}'",
+        opened(sql("SELECT CUST_ID, SALUTATION, FIRSTNAME, NAME, PHONE_P, PHONE_B FROM CUSTOMER WHERE CUST_ID='{}'",
                    car.value(u"CUST_ID"_s)));
     require(customer, u"customer"_s, *this);
-    model = Opened(
+    model = opened(
         sql("SELECT MODEL_ID, MAKE, MODEL, SCHEDULE FROM ALLMODEL WHERE MODEL_ID='{}'", car.value(u"MODEL_ID"_s)));
-    body = Opened(sql("SELECT body_id2, body_desc2 FROM BODY2 WHERE BODY2.body_id2='{}'", car.value(u"BODY_ID2"_s)));
-    notes = Opened(
+    body = opened(sql("SELECT body_id2, body_desc2 FROM BODY2 WHERE BODY2.body_id2='{}'", car.value(u"BODY_ID2"_s)));
+    notes = opened(
         sql("SELECT QTNNO, SUBQUOTE, REMARKS, P_REMARKS, INCIDENT_NOTES FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'",
             number, subquote));
     require(notes, u"notes row"_s, *this);
     if (!isMainQuote())
-        mainQuote = Opened(sql("select * from quote1 where qtnno = '{}' and subquote = '0'", number));
+        mainQuote = opened(sql("select * from quote1 where qtnno = '{}' and subquote = '0'", number));
 }
 
 QString text(const db::Recordset& record, const char* column)

@@ -1,14 +1,14 @@
 #include "outbound/SendQuote.h"
 
-#include "outbound/modCreateXML.h"
-#include "platform/database/Sql.h"
-#include "platform/Prompt.h"
-#include "platform/values.h"
-#include "quotedata/NoteChain.h"
-#include "quotedata/QuoteTotals.h"
 #include "base/Helpers.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
+#include "outbound/modCreateXML.h"
+#include "platform/Prompt.h"
+#include "platform/database/Sql.h"
+#include "platform/values.h"
+#include "quotedata/NoteChain.h"
+#include "quotedata/QuoteTotals.h"
 
 using namespace Qt::StringLiterals;
 
@@ -19,10 +19,10 @@ namespace {
 const QString quoteNotFound = u"Quote not found in database, Please contact MarlinDesk Support."_s;
 
 /// Why a main quote may not go; empty where it may.
-QString MainQuoteRefusal(const db::Recordset& quote, const QString& remarks)
+QString mainQuoteRefusal(const db::Recordset& quote, const QString& remarks)
 {
     const db::Recordset insurer =
-        Opened(sql("SELECT NAME, KEST FROM INSURER WHERE INSURER_ID={}", quote.value(u"INSURER_ID"_s)));
+        opened(sql("SELECT NAME, KEST FROM INSURER WHERE INSURER_ID={}", quote.value(u"INSURER_ID"_s)));
     if (insurer.eof())
         return u"Could not locate Insurer! Please contact MarlinDesk Support."_s;
     if (!insurer.isNull(u"KEST"_s) && !isTrue(insurer.value(u"KEST"_s)))
@@ -31,7 +31,7 @@ QString MainQuoteRefusal(const db::Recordset& quote, const QString& remarks)
         return u"This quote has already been sent via TIDE, you cannot use KEST to send this quote."_s;
     if (SafeVal(quote.text(u"Claim"_s), u"0"_s) <= 0)
         return u"An Invalid claim number has been entered, please check the Claim Number and try again."_s;
-    const db::Recordset customer = Opened(sql(
+    const db::Recordset customer = opened(sql(
         "SELECT * FROM CUSTOMER WHERE CUST_ID IN (SELECT CUST_ID FROM CAR WHERE REGO='{}')", quote.value(u"REGO"_s)));
     if (customer.eof())
         return u"Error locating customer record, Quote cannot be sent."_s;
@@ -43,15 +43,15 @@ QString MainQuoteRefusal(const db::Recordset& quote, const QString& remarks)
 }
 
 /// Why the quote may not go; empty where it may.
-QString Refusal(const db::Recordset& quote, const QString& number, const QString& subquote)
+QString refusalOf(const db::Recordset& quote, const QString& number, const QString& subquote)
 {
-    const db::Recordset zeroQuantities = Opened(
+    const db::Recordset zeroQuantities = opened(
         sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}' AND CATEGORY='PRT' AND QTY=0", number, subquote));
     if (!zeroQuantities.eof())
         return u"Items with a Quantity of 0 cannot be sent to ORLA. Please check the quote details and try again."_s;
 
     const db::Recordset notes =
-        Opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+        opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
     const QString remarks = notes.eof() ? QString() : notes.text(u"remarks"_s);
     if (quote.recordCount() == 0)
         return quoteNotFound;
@@ -66,7 +66,7 @@ QString Refusal(const db::Recordset& quote, const QString& number, const QString
         return GetNoteStatus(u"KEST Quote"_s, remarks) == "Submitted"_L1
                    ? u"This additional has already been submitted to ORLA, you cannot send a quote twice."_s
                    : QString();
-    return MainQuoteRefusal(quote, remarks);
+    return mainQuoteRefusal(quote, remarks);
 }
 
 double refuse(const QString& message)
@@ -83,13 +83,13 @@ double SendQuote(db::Recordset& quote, bool* sent)
     if (quote.eof())
         return refuse(quoteNotFound);
     const QString number = quote.text(u"QTNNO"_s);
-    quote = Opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' ORDER BY SUBQUOTE DESC", number));
+    quote = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' ORDER BY SUBQUOTE DESC", number));
     if (quote.eof())
         return refuse(quoteNotFound);
     const QString subquote = quote.text(u"Subquote"_s);
-    quote = Opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+    quote = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
 
-    if (const QString refusal = Refusal(quote, number, subquote); !refusal.isEmpty())
+    if (const QString refusal = refusalOf(quote, number, subquote); !refusal.isEmpty())
         return refuse(refusal);
 
     RoundQuoteLines(quote);

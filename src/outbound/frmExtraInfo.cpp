@@ -1,10 +1,10 @@
 #include "outbound/frmExtraInfo.h"
 
-#include "platform/database/Sql.h"
+#include "base/modDBAccess.h"
 #include "platform/Prompt.h"
+#include "platform/database/Sql.h"
 #include "platform/desktop/Window.h"
 #include "platform/values.h"
-#include "base/modDBAccess.h"
 
 #include <QAction>
 #include <QApplication>
@@ -145,7 +145,7 @@ QLineEdit* frmExtraInfo::addField(const char* name, const QString& label)
 
 void frmExtraInfo::fillColours()
 {
-    db::Recordset colours = Opened(u"SELECT * FROM KESTCOLOURS"_s);
+    db::Recordset colours = opened(u"SELECT * FROM KESTCOLOURS"_s);
     const QSignalBlocker fillIsNoChoice(lvColour);
     for (; !colours.eof(); colours.moveNext()) {
         const double place = leadingNumber(colours.text(u"id"_s)) - 1;
@@ -206,7 +206,7 @@ std::pair<QWidget*, QString> frmExtraInfo::complaint() const
         return {txtCylinders, u"Number of Cylinders must be entered."_s};
     if (txtColour->text().isEmpty())
         return {txtColour, u"Colour must be entered."_s};
-    if (Opened(sql("SELECT Script from KESTColours WHERE Script='{}'", txtColour->text())).eof())
+    if (opened(sql("SELECT Script from KESTColours WHERE Script='{}'", txtColour->text())).eof())
         return {txtColour, u"You must select a valid KEST Colour"_s};
     return {};
 }

@@ -1,17 +1,17 @@
 #include "outbound/modCreateXML.h"
 
+#include "base/ModRegistry.h"
+#include "base/SharedVariables.h"
 #include "messages/Envelope.h"
 #include "outbound/QuoteBody.h"
 #include "outbound/QuoteHead.h"
 #include "outbound/QuoteImages.h"
 #include "outbound/frmExtraInfo.h"
-#include "platform/RuntimeError.h"
 #include "platform/Prompt.h"
+#include "platform/RuntimeError.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
 #include "quotedata/StateTable.h"
-#include "base/ModRegistry.h"
-#include "base/SharedVariables.h"
 
 #include <QSet>
 
@@ -30,7 +30,7 @@ double refuse(const QString& message)
 }
 
 /// The name of the quote's next document, counted by those that have gone out: one that still waits is replaced.
-QString DocumentName(const QuoteRows& rows)
+QString documentName(const QuoteRows& rows)
 {
     const QString stem = rows.number + u'.' + rows.subquote + u'_';
     QSet<QString> sent;
@@ -49,16 +49,16 @@ QString DocumentName(const QuoteRows& rows)
 }
 
 /// The text between the root's tags: the transport puts a root of its own around it.
-QString WithoutRoot(const QString& text)
+QString withoutRoot(const QString& text)
 {
     const qsizetype behindRoot = text.indexOf(u'>') + 1;
     return text.mid(behindRoot, text.size() - behindRoot - u"</request>"_s.size());
 }
 
-void AddImages(const Branch& request, const QuoteRows& rows)
+void addImages(const Branch& request, const QuoteRows& rows)
 {
     const QString folder = GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"ImagesPath"_s, u"c:\\wirimg\\"_s);
-    const QList<QuoteImage> images = QuoteImages(folder, rows.number, rows.subquote);
+    const QList<QuoteImage> images = quoteImages(folder, rows.number, rows.subquote);
     request.add("imageCount", QString::number(images.size()));
     if (images.isEmpty())
         return;
@@ -67,11 +67,11 @@ void AddImages(const Branch& request, const QuoteRows& rows)
         ids.add("quoteImageId", image.id);
 }
 
-void MarkAsSent(QuoteRows& rows)
+void markAsSent(QuoteRows& rows)
 {
     if (rows.isMainQuote() && !text(rows.quote, "KESTQRNo").isEmpty())
-        Apply(requestAnswered, rows.quote, rows.notes);
-    Apply(quoteSent, rows.quote, rows.notes);
+        applyTransition(requestAnswered, rows.quote, rows.notes);
+    applyTransition(quoteSent, rows.quote, rows.notes);
     rows.quote.update();
     rows.notes.update();
 }
@@ -86,7 +86,7 @@ double CreateQuoteXML(db::Recordset& quote)
 
     if (rows.model.eof() || text(rows.model, "MAKE").toUpper().contains("UNIVERSAL"_L1))
         return refuse(u"Please Select a Make and Model for this car"_s);
-    const InsurerReference reference = ReferenceOf(rows);
+    const InsurerReference reference = referenceOf(rows);
     if (!rows.isMainQuote() && reference.authorisedQuoteNumber.trimmed().isEmpty())
         return refuse(u"The main quote has no ORLA quote number yet, this additional cannot be sent."_s);
 
@@ -99,29 +99,29 @@ double CreateQuoteXML(db::Recordset& quote)
     if (const auto* values = std::get_if<ExtraValues>(&answer))
         extra = *values;
 
-    const std::optional<qint64> repairDays = RepairDays(quote);
-    if (repairDays.value_or(0) < 0)
+    const std::optional<qint64> days = repairDays(quote);
+    if (days.value_or(0) < 0)
         return refuse(u"Cannot have a target completion date before the start date. Please check the quote details."_s);
 
     xml::Document document;
     const Branch request(document, "request", GetNamespaceURI());
-    AddHead(request, rows, reference, extra, repairDays);
+    addHead(request, rows, reference, extra, days);
     const double total = body.addTo(request);
     if (total == 0)
         return refuse(
             u"Error: Cannot send $0 variations to ORLA. Please call your assessor to discuss the variation."_s);
-    AddImages(request, rows);
+    addImages(request, rows);
 
     // the document stands whole in the folder before the quote is locked: a full disk must not lock it
-    files::write(files::pathForWriting(gsUnsentPath, DocumentName(rows)), WithoutRoot(request.xml()));
-    MarkAsSent(rows);
+    files::write(files::pathForWriting(gsUnsentPath, documentName(rows)), withoutRoot(request.xml()));
+    markAsSent(rows);
     desktop::msgBox(u"Quote Sent."_s, desktop::Icon::Information);
     return total;
 }
 
 void CreateImageXML(const QString& imagesPath, db::Recordset& quote)
 {
-    WriteImageDocuments(imagesPath, quote.text(u"QTNNO"_s), quote.text(u"Subquote"_s));
+    writeImageDocuments(imagesPath, quote.text(u"QTNNO"_s), quote.text(u"Subquote"_s));
 }
 
 }  // namespace kest

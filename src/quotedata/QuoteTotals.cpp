@@ -1,10 +1,10 @@
 #include "quotedata/QuoteTotals.h"
 
+#include "base/modDBAccess.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
 #include "quotedata/Rounding.h"
-#include "base/modDBAccess.h"
 
 using namespace Qt::StringLiterals;
 
@@ -28,7 +28,7 @@ struct SectionTotals {
 
 /// True when no other line points at this one as its deleted counterpart and it is not deleted itself. Leaves `lines`
 /// where it was.
-bool Counts(db::Recordset& lines)
+bool counts(db::Recordset& lines)
 {
     const qint64 id = toLong(lines.value(u"itemid"_s));
     lines.moveFirst();
@@ -40,25 +40,25 @@ bool Counts(db::Recordset& lines)
     return !replaced && !deleted.isNull() && !toBool(deleted);
 }
 
-bool IsZero(const QVariant& value)
+bool isZero(const QVariant& value)
 {
     return !value.isNull() && toDouble(value) == 0;
 }
 
-bool IsReportItem(const db::Recordset& line)
+bool isReportItem(const db::Recordset& line)
 {
     return isTrue(line.value(u"Report_on"_s));
 }
 
 /// The rounded product; 0 where one of the factors is 0, whatever the other one holds.
-double Amount(const db::Recordset& line, const QVariant& factor, const QVariant& hours)
+double amount(const db::Recordset& line, const QVariant& factor, const QVariant& hours)
 {
-    if (IsZero(hours) || IsZero(factor) || IsReportItem(line))
+    if (isZero(hours) || isZero(factor) || isReportItem(line))
         return 0;
     return RoundAmount(toDouble(factor) * toDouble(hours), 2);
 }
 
-void AddLine(SectionTotals& totals, const db::Recordset& line, EmptyHours emptyHours)
+void addLine(SectionTotals& totals, const db::Recordset& line, EmptyHours emptyHours)
 {
     const auto hours = [&](const QString& column) {
         const QVariant value = line.value(column);
@@ -70,30 +70,30 @@ void AddLine(SectionTotals& totals, const db::Recordset& line, EmptyHours emptyH
     };
     const QString category = line.text(u"category"_s);
     if (category == "PRT"_L1)
-        totals.parts += Amount(line, line.value(u"qty"_s), hours(u"rrhour"_s));  // rrhour: selling price of one unit
+        totals.parts += amount(line, line.value(u"qty"_s), hours(u"rrhour"_s));  // rrhour: selling price of one unit
     else if (category == "R&R"_L1)
-        addLabour(totals.removeAndReplace, Amount(line, line.value(u"rr_rate2"_s), hours(u"rrhour"_s)));
+        addLabour(totals.removeAndReplace, amount(line, line.value(u"rr_rate2"_s), hours(u"rrhour"_s)));
     else if (category == "RA"_L1)
-        addLabour(totals.repair, Amount(line, line.value(u"rr_rate2"_s), hours(u"rahour"_s)));
+        addLabour(totals.repair, amount(line, line.value(u"rr_rate2"_s), hours(u"rahour"_s)));
     else if (category == "PAINT"_L1)
-        addLabour(totals.paint, Amount(line, line.value(u"rr_rate2"_s), hours(u"pthour"_s)));
+        addLabour(totals.paint, amount(line, line.value(u"rr_rate2"_s), hours(u"pthour"_s)));
     else if (category == "OPG"_L1)
-        addLabour(totals.otherPaint, Amount(line, line.value(u"opg_rate"_s), hours(u"pthour"_s)));
-    else if (category == "MIS"_L1 && !IsReportItem(line))
+        addLabour(totals.otherPaint, amount(line, line.value(u"opg_rate"_s), hours(u"pthour"_s)));
+    else if (category == "MIS"_L1 && !isReportItem(line))
         totals.miscellaneous += toDouble(line.value(u"unitcost"_s));
 }
 
 /// From the current line on.
-SectionTotals TotalsOf(db::Recordset& lines, EmptyHours emptyHours)
+SectionTotals totalsOf(db::Recordset& lines, EmptyHours emptyHours)
 {
     SectionTotals totals;
     for (; !lines.eof(); lines.moveNext())
-        if (Counts(lines))
-            AddLine(totals, lines, emptyHours);
+        if (counts(lines))
+            addLine(totals, lines, emptyHours);
     return totals;
 }
 
-double RoundedColumn(const db::Recordset& line, const QString& column)
+double roundedColumn(const db::Recordset& line, const QString& column)
 {
     try {
         return RoundAmount(toDouble(line.value(column)), 2);
@@ -110,7 +110,7 @@ void CalcQuoteTotals(db::Recordset& quote, db::Recordset& lines)
     attempt([&] {
         if (lines.recordCount() > 0)
             lines.moveFirst();
-        const SectionTotals totals = TotalsOf(lines, EmptyHours::CountAsZero);
+        const SectionTotals totals = totalsOf(lines, EmptyHours::CountAsZero);
         quote.set(u"TOTAL"_s, totals.labour());
         quote.set(u"PRTTOTAL"_s, totals.parts);
         quote.set(u"MISTOTAL"_s, totals.miscellaneous);
@@ -128,7 +128,7 @@ void CalcAuthorisedTotals(db::Recordset& quote, db::Recordset& lines)
     attempt([&] {
         if (!lines.eof())
             lines.moveFirst();
-        const SectionTotals totals = TotalsOf(lines, EmptyHours::Fail);
+        const SectionTotals totals = totalsOf(lines, EmptyHours::Fail);
         quote.set(u"TOTAL"_s, totals.inOrder);
         quote.set(u"PRTTOTAL"_s, totals.parts);
         quote.set(u"MISTOTAL"_s, totals.miscellaneous);
@@ -140,12 +140,12 @@ void CalcAuthorisedTotals(db::Recordset& quote, db::Recordset& lines)
 
 void RoundQuoteLines(db::Recordset& quote)
 {
-    db::Recordset lines = Opened(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quote.value(u"QTNNO"_s),
+    db::Recordset lines = opened(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quote.value(u"QTNNO"_s),
                                      quote.value(u"Subquote"_s)));
     for (; !lines.eof(); lines.moveNext()) {
         for (const auto& column : {u"unitcost"_s, u"rrhour"_s, u"rahour"_s, u"pthour"_s})
             if (!lines.text(column).isEmpty())
-                lines.set(column, RoundedColumn(lines, column));
+                lines.set(column, roundedColumn(lines, column));
         lines.update();
     }
     lines.requery();

@@ -6,7 +6,7 @@ namespace kest {
 
 using namespace Qt::StringLiterals;
 
-void Apply(const Transition& transition, db::Recordset& quote, db::Recordset& notes, const QString& told)
+void applyTransition(const Transition& transition, db::Recordset& quote, db::Recordset& notes, const QString& told)
 {
     if (transition.stage)
         quote.set(u"Job_stage"_s, *transition.stage);

@@ -27,11 +27,12 @@ struct Transition {
 
 /// Sets stage and lock on the quote's row, clears its columns, and adds the notes, in their order, to the remarks of
 /// its note row. Neither row is updated yet.
-void Apply(const Transition& transition, db::Recordset& quote, db::Recordset& notes, const QString& told = {});
+void applyTransition(const Transition& transition, db::Recordset& quote, db::Recordset& notes,
+                     const QString& told = {});
 
 // Job_stage: 1 open for quoting, 3 with the insurer, 4 authorised, 9 request cancelled, 10 tender failed. The lock is
 // ReadOnly. Notes: subject, status, detail, whether always new; the one added last stands first in the chain.
-// Behind the notes: the columns that become Null.
+// behind the notes: the columns that become Null.
 
 // clang-format off
 inline constexpr Transition quoteRequested          { 1,  {},    {{"Quote Request", "Active"}} };

@@ -1,7 +1,7 @@
 #include "quotedata/Vendors.h"
 
-#include "platform/database/Sql.h"
 #include "base/modDBAccess.h"
+#include "platform/database/Sql.h"
 
 #include <utility>
 
@@ -15,9 +15,9 @@ constexpr int vendorAccount = 293;  // of the ledger
 
 }  // namespace
 
-QVariant FindOrAddVendor(const QString& name, const QString& street, const QString& phone)
+QVariant findOrAddVendor(const QString& name, const QString& street, const QString& phone)
 {
-    db::Recordset vendor = Opened(sql("SELECT * FROM VENDOR WHERE NAME LIKE '%{}%'", name));
+    db::Recordset vendor = opened(sql("SELECT * FROM VENDOR WHERE NAME LIKE '%{}%'", name));
     if (vendor.eof()) {
         vendor.addNew();
         // cut to what the column holds: a long address must not keep a whole authorisation out

@@ -7,6 +7,6 @@
 namespace kest {
 
 /// The number of the vendor whose name holds `name`; of a new one where the shop knows none.
-QVariant FindOrAddVendor(const QString& name, const QString& street, const QString& phone);
+QVariant findOrAddVendor(const QString& name, const QString& street, const QString& phone);
 
 }  // namespace kest

@@ -1,14 +1,14 @@
 #include "reports/BuildAuthReport.h"
 
+#include "base/Helpers.h"
+#include "base/SharedVariables.h"
+#include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
-#include "platform/Prompt.h"
 #include "platform/values.h"
 #include "quotedata/QuoteTotals.h"
 #include "quotedata/Rounding.h"
 #include "reports/QuoteComparison.h"
-#include "base/Helpers.h"
-#include "base/SharedVariables.h"
 
 #include <tuple>
 
@@ -18,13 +18,13 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-std::pair<QString, QString> QuoteOf(const xml::Document& document)
+std::pair<QString, QString> quoteOf(const xml::Document& document)
 {
     return SplitQuoteRef(document.textOf(u"//rootns:quoteBody/rootns:quoteReference"_s));
 }
 
 /// The quote of the message's request; where there is none it is closed, and a box has said so.
-db::Recordset OpenQuote(const xml::Document& document, const QString& number, const QString& subquote,
+db::Recordset openQuote(const xml::Document& document, const QString& number, const QString& subquote,
                         const QString& refusal)
 {
     db::Recordset quote(gConn);
@@ -37,7 +37,7 @@ db::Recordset OpenQuote(const xml::Document& document, const QString& number, co
     return quote;
 }
 
-db::Recordset OpenLines(const db::Recordset& quote)
+db::Recordset openLines(const db::Recordset& quote)
 {
     db::Recordset lines(gConn);
     lines.open(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quote.value(u"QTNNO"_s),
@@ -46,7 +46,7 @@ db::Recordset OpenLines(const db::Recordset& quote)
 }
 
 /// "0" where the message tells the amount that the main quote holds, else the message's text.
-QString Changed(const QString& told, double (*asInQuote)(double), const db::Recordset& mainQuote, const QString& column)
+QString changed(const QString& told, double (*asInQuote)(double), const db::Recordset& mainQuote, const QString& column)
 {
     if (told.isEmpty())
         return told;
@@ -56,12 +56,12 @@ QString Changed(const QString& told, double (*asInQuote)(double), const db::Reco
     return isSame ? u"0"_s : told;
 }
 
-double WithTaxTakenOff(double amount)
+double withTaxTakenOff(double amount)
 {
     return amount / 11 * 10;
 }
 
-ComparisonHeader AuthorisedHeader(const xml::Document& document, const QString& number)
+ComparisonHeader authorisedHeader(const xml::Document& document, const QString& number)
 {
     db::Recordset mainQuote(gConn);
     mainQuote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE=0", number));
@@ -71,16 +71,16 @@ ComparisonHeader AuthorisedHeader(const xml::Document& document, const QString& 
     const auto asTold = [](double told) { return told; };
     const QString excess = document.textOrEmptyOf(u"//rootns:excess"_s);
     const QString contribution = document.textOrEmptyOf(u"//rootns:customerContribution"_s);
-    return ReadHeader(document, ComparisonOf::AuthorisedQuote) +
+    return readHeader(document, ComparisonOf::AuthorisedQuote) +
            ComparisonHeader{
-               {u"excess"_s, Changed(excess, asTold, mainQuote, u"excess"_s)},
-               {u"contri"_s, Changed(contribution, WithTaxTakenOff, mainQuote, u"contri"_s)},
+               {u"excess"_s, changed(excess, asTold, mainQuote, u"excess"_s)},
+               {u"contri"_s, changed(contribution, withTaxTakenOff, mainQuote, u"contri"_s)},
                {u"quote_total"_s, amount(u"quoteTotal"_s) - amount(u"gst"_s)},
            };
 }
 
 /// So that the report of a quote that was taken as it stands prints, with its header and its total.
-void AddUnchanged(db::Recordset& table, const ComparisonHeader& header)
+void addUnchanged(db::Recordset& table, const ComparisonHeader& header)
 {
     table.addNew();
     for (const QLatin1StringView field : {"line_no"_L1, "itemno"_L1, "lab_grp"_L1, "paint_grp"_L1, "category"_L1,
@@ -89,11 +89,11 @@ void AddUnchanged(db::Recordset& table, const ComparisonHeader& header)
     table.set(u"action"_s, u"N"_s);
     table.set(u"qty"_s, 1);
     table.set(u"gst"_s, 0);
-    SetHeader(table, header);
+    setHeader(table, header);
 }
 
 /// Null where one of them is.
-QVariant Sum(const db::Recordset& row, std::initializer_list<QLatin1StringView> columns)
+QVariant sum(const db::Recordset& row, std::initializer_list<QLatin1StringView> columns)
 {
     double sum = 0;
     for (const QLatin1StringView column : columns) {
@@ -104,18 +104,18 @@ QVariant Sum(const db::Recordset& row, std::initializer_list<QLatin1StringView> 
     return sum;
 }
 
-db::Recordset BuildAuthorised(const xml::Document& document, const QString& number, db::Recordset& quote, bool Reprint)
+db::Recordset buildAuthorised(const xml::Document& document, const QString& number, db::Recordset& quote, bool Reprint)
 {
-    db::Recordset lines = OpenLines(quote);
-    const ComparisonHeader header = AuthorisedHeader(document, number);
-    db::Recordset table = OpenComparison(ComparisonOf::AuthorisedQuote);
-    AddChangedLines(table, header, document, quote, lines, ComparisonOf::AuthorisedQuote, Reprint);
+    db::Recordset lines = openLines(quote);
+    const ComparisonHeader header = authorisedHeader(document, number);
+    db::Recordset table = openComparison(ComparisonOf::AuthorisedQuote);
+    addChangedLines(table, header, document, quote, lines, ComparisonOf::AuthorisedQuote, Reprint);
     if (lines.recordCount() > 0)
         lines.moveFirst();  // a search that found nothing has left them at their end, where they count nothing
     CalcAuthorisedTotals(quote, lines);
     if (table.recordCount() == 0)
-        AddUnchanged(table, header);
-    FinishAuthReport(table, quote, lines);
+        addUnchanged(table, header);
+    finishAuthReport(table, quote, lines);
     return table;
 }
 
@@ -126,25 +126,25 @@ std::optional<db::Recordset> BuildAuthReport(const xml::Document& document, QStr
 {
     try {
         if (quoteNumber.isEmpty())
-            std::tie(quoteNumber, subquote) = QuoteOf(document);
+            std::tie(quoteNumber, subquote) = quoteOf(document);
         db::Recordset quote =
-            OpenQuote(document, quoteNumber, subquote,
+            openQuote(document, quoteNumber, subquote,
                       u"Matching quote was not found in database, Please contact MarlinDesk Support."_s);
         if (!quote.isOpen())
             return {};
-        return BuildAuthorised(document, quoteNumber, quote, Reprint);
+        return buildAuthorised(document, quoteNumber, quote, Reprint);
     } catch (const RuntimeError&) {
         desktop::msgBox(u"error"_s);
         return {};
     }
 }
 
-void FinishAuthReport(db::Recordset& table, const db::Recordset& quote, db::Recordset& lines)
+void finishAuthReport(db::Recordset& table, const db::Recordset& quote, db::Recordset& lines)
 {
-    const QVariant total = Sum(quote, {"TOTAL"_L1, "PRTTOTAL"_L1, "MISTOTAL"_L1});
+    const QVariant total = sum(quote, {"TOTAL"_L1, "PRTTOTAL"_L1, "MISTOTAL"_L1});
     for (table.moveFirst(); !table.eof(); table.moveNext()) {
         table.set(u"total_md"_s, total);
-        if (!FindLine(lines, table.text(u"line_no"_s)))
+        if (!findLine(lines, table.text(u"line_no"_s)))
             continue;
         const QString itemNo = lines.text(u"itemno"_s).trimmed();
         if (!itemNo.isEmpty())
@@ -153,15 +153,15 @@ void FinishAuthReport(db::Recordset& table, const db::Recordset& quote, db::Reco
     table.moveFirst();
 }
 
-bool FillAdjustedReport(db::Recordset& table, const xml::Document& document, bool Reprint)
+bool fillAdjustedReport(db::Recordset& table, const xml::Document& document, bool Reprint)
 {
-    const auto [number, subquote] = QuoteOf(document);
+    const auto [number, subquote] = quoteOf(document);
     const db::Recordset quote =
-        OpenQuote(document, number, subquote, u"Quote not found in database. Please contact MarlinDesk Support."_s);
+        openQuote(document, number, subquote, u"Quote not found in database. Please contact MarlinDesk Support."_s);
     if (!quote.isOpen())
         return false;
-    db::Recordset lines = OpenLines(quote);
-    AddChangedLines(table, ReadHeader(document, ComparisonOf::AdjustedQuote), document, quote, lines,
+    db::Recordset lines = openLines(quote);
+    addChangedLines(table, readHeader(document, ComparisonOf::AdjustedQuote), document, quote, lines,
                     ComparisonOf::AdjustedQuote, Reprint);
     return true;
 }

@@ -21,10 +21,10 @@ std::optional<db::Recordset> BuildAuthReport(const xml::Document& document, QStr
 
 /// Puts the quote's total on all rows of the comparison, and on each the item code of its line: what is final only when
 /// the message's lines are in the quote.
-void FinishAuthReport(db::Recordset& table, const db::Recordset& quote, db::Recordset& lines);
+void finishAuthReport(db::Recordset& table, const db::Recordset& quote, db::Recordset& lines);
 
 /// Fills the comparison for an adjusted quote, which may keep no row and changes nothing in the database. False after a
 /// box where no quote matches; failures are thrown, and the rows until then stay.
-bool FillAdjustedReport(db::Recordset& table, const xml::Document& document, bool Reprint);
+bool fillAdjustedReport(db::Recordset& table, const xml::Document& document, bool Reprint);
 
 }  // namespace kest

@@ -1,20 +1,20 @@
 #include "reports/PrintXML.h"
 
+#include "base/Helpers.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 #include "messages/Envelope.h"
-#include "sublets/SubletDocuments.h"
-#include "sublets/frmSubletAuth.h"
+#include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
-#include "platform/Prompt.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
 #include "reports/BuildAuthReport.h"
 #include "reports/QuoteComparison.h"
 #include "reports/ReportTable.h"
 #include "reports/frmPrintPreview.h"
-#include "base/Helpers.h"
-#include "base/SharedVariables.h"
-#include "base/modDBAccess.h"
+#include "sublets/SubletDocuments.h"
+#include "sublets/frmSubletAuth.h"
 
 #include <QStringList>
 
@@ -65,7 +65,7 @@ constexpr Texts reasons[] = {
 };
 
 /// Null for an unknown code: the field stays unset.
-QVariant TextOf(const QString& code, std::span<const Texts> texts)
+QVariant textOf(const QString& code, std::span<const Texts> texts)
 {
     for (const auto& [known, text] : texts)
         if (code.toUpper() == known)
@@ -74,7 +74,7 @@ QVariant TextOf(const QString& code, std::span<const Texts> texts)
 }
 
 /// A step that printing goes on behind, where it finds a recordset without a current row.
-void Step(const std::function<void()>& step)
+void step(const std::function<void()>& step)
 {
     try {
         step();
@@ -84,13 +84,13 @@ void Step(const std::function<void()>& step)
     }
 }
 
-void Set(db::Recordset& row, const char* field, const QVariant& value)
+void setField(db::Recordset& row, const char* field, const QVariant& value)
 {
     if (!value.isNull())
         row.set(QString::fromLatin1(field), value);
 }
 
-QString FullName(const xml::Document& message)
+QString fullName(const xml::Document& message)
 {
     const QString customer = u"//rootns:claimCustomer/rootns:"_s;
     if (const xml::Node company = message.selectSingleNode(customer + u"companyName"_s))
@@ -101,7 +101,7 @@ QString FullName(const xml::Document& message)
     return name;
 }
 
-QString BuiltDate(const xml::Document& message)
+QString builtDate(const xml::Document& message)
 {
     const auto number = [&](const QString& element) {
         return toLong(SafeVal(message.textOf(u"//rootns:extraVehicleInformation/rootns:"_s + element), u"0"_s));
@@ -113,7 +113,7 @@ QString BuiltDate(const xml::Document& message)
     return PadZeroLeft(QString::number(month == 0 ? 1 : month), 2) + u'/' + QString::number(year);
 }
 
-QString ImageDescription(const QString& requestNumber, const QString& imageId)
+QString imageDescription(const QString& requestNumber, const QString& imageId)
 {
     const QString name = requestNumber + u'_' + PadZeroLeft(imageId, 3) + u".txt"_s;
     if (!files::isPlainName(name) || !files::exists(gsUnreadPath + name) || files::size(gsUnreadPath + name) == 0)
@@ -121,14 +121,14 @@ QString ImageDescription(const QString& requestNumber, const QString& imageId)
     return files::read(gsUnreadPath + name).trimmed();
 }
 
-void FillImage(db::Recordset& row, const QString& requestNumber, const QString& image)
+void fillImage(db::Recordset& row, const QString& requestNumber, const QString& image)
 {
     const QString imageId = QString::number(toLong(image));
-    Set(row, "image_id", imageId);
-    Set(row, "image_desc", ImageDescription(requestNumber, imageId));
+    setField(row, "image_id", imageId);
+    setField(row, "image_desc", imageDescription(requestNumber, imageId));
 }
 
-void FillRequest(db::Recordset& row, const xml::Document& message, const QString& quoteNumber)
+void fillRequest(db::Recordset& row, const xml::Document& message, const QString& quoteNumber)
 {
     const auto text = [&](const char* element) {
         return message.textOf(u"//rootns:"_s + QString::fromLatin1(element));
@@ -136,29 +136,29 @@ void FillRequest(db::Recordset& row, const xml::Document& message, const QString
     const auto extra = [&](const char* element) {
         return message.textOf(u"//rootns:extraVehicleInformation/rootns:"_s + QString::fromLatin1(element));
     };
-    Set(row, "Corp", text("corporateCustomer"));
-    Set(row, "Quote", quoteNumber);
-    Set(row, "Qrno", text("quoteRequestNumber"));
-    Set(row, "Rego", NormaliseRego(text("vehicleRegistration")));
-    Set(row, "Claim", text("claimNumber"));
-    Set(row, "Claim_desc", text("claimDescription"));
-    Set(row, "Fullname", FullName(message));
-    Set(row, "Location", text("vehicleLocation"));
-    Set(row, "Bay", text("bayNumber"));
-    Set(row, "Offsite", toBool(text("offsiteQuoting")) ? 1 : 0);
-    Set(row, "Quote_due", FormatNetworkDate(text("quoteDueTime")));
-    Set(row, "Veh_desc", text("vehicleDescription"));
-    Set(row, "Make", extra("make"));
-    Set(row, "Body", extra("bodyShape"));
-    Set(row, "Built_date", BuiltDate(message));
-    Set(row, "Colour_desc", TextOf(extra("color"), colours));
-    Set(row, "Odometer", extra("odometer"));
-    Set(row, "Damage", extra("damageDescription"));
-    Set(row, "Old_Damage", extra("oldDamageDescription"));
-    Set(row, "Instruction", text("instructions"));
+    setField(row, "Corp", text("corporateCustomer"));
+    setField(row, "Quote", quoteNumber);
+    setField(row, "Qrno", text("quoteRequestNumber"));
+    setField(row, "Rego", NormaliseRego(text("vehicleRegistration")));
+    setField(row, "Claim", text("claimNumber"));
+    setField(row, "Claim_desc", text("claimDescription"));
+    setField(row, "Fullname", fullName(message));
+    setField(row, "Location", text("vehicleLocation"));
+    setField(row, "Bay", text("bayNumber"));
+    setField(row, "Offsite", toBool(text("offsiteQuoting")) ? 1 : 0);
+    setField(row, "Quote_due", FormatNetworkDate(text("quoteDueTime")));
+    setField(row, "Veh_desc", text("vehicleDescription"));
+    setField(row, "Make", extra("make"));
+    setField(row, "Body", extra("bodyShape"));
+    setField(row, "Built_date", builtDate(message));
+    setField(row, "Colour_desc", textOf(extra("color"), colours));
+    setField(row, "Odometer", extra("odometer"));
+    setField(row, "Damage", extra("damageDescription"));
+    setField(row, "Old_Damage", extra("oldDamageDescription"));
+    setField(row, "Instruction", text("instructions"));
 }
 
-bool PrintRequest(const xml::Document& message)
+bool printRequest(const xml::Document& message)
 {
     const QString requestNumber = message.textOf(u"//rootns:quoteRequestNumber"_s);
     db::Recordset quote(gConn);
@@ -171,18 +171,18 @@ bool PrintRequest(const xml::Document& message)
     }
     quote.moveLast();  // the oldest
     const QList<xml::Node> images = message.documentElement().selectNodes(u"rootns:quoteRequestImageIds/*"_s);
-    db::Recordset table = OpenReportTable(requestFields);
+    db::Recordset table = openReportTable(requestFields);
     for (qsizetype i = 0; i < qMax(images.size(), 1); ++i) {
         table.addNew();
-        Step([&] { FillRequest(table, message, quote.text(u"QTNNO"_s)); });
+        step([&] { fillRequest(table, message, quote.text(u"QTNNO"_s)); });
         if (!images.isEmpty())
-            Step([&] { FillImage(table, requestNumber, images[i].text()); });
+            step([&] { fillImage(table, requestNumber, images[i].text()); });
     }
     frmPrintPreview::ShowForm(QuoteRequestReport, u""_s, &table);
     return true;
 }
 
-bool PrintResult(const xml::Document& message)
+bool printResult(const xml::Document& message)
 {
     const QString requestNumber = message.textOf(u"//rootns:kestQuoteRequestNumber"_s);
     db::Recordset quote(gConn);
@@ -191,63 +191,63 @@ bool PrintResult(const xml::Document& message)
         desktop::msgBox(u"Failed Matching Quote. Please contact MarlinDesk Support"_s, desktop::Icon::Critical);
         return false;
     }
-    db::Recordset table = OpenReportTable(resultFields);
+    db::Recordset table = openReportTable(resultFields);
     table.addNew();
-    Step([&] {
-        Set(table, "KESTQuoteNo", message.textOf(u"//rootns:kestOriginalQuoteNumber"_s));
-        Set(table, "QTNNO", quote.text(u"QTNNO"_s));
-        Set(table, "subquote", quote.text(u"Subquote"_s));
-        Set(table, "KESTQRNO", requestNumber);
-        Set(table, "reason", TextOf(message.textOf(u"//rootns:reasonCode"_s), reasons));
+    step([&] {
+        setField(table, "KESTQuoteNo", message.textOf(u"//rootns:kestOriginalQuoteNumber"_s));
+        setField(table, "QTNNO", quote.text(u"QTNNO"_s));
+        setField(table, "subquote", quote.text(u"Subquote"_s));
+        setField(table, "KESTQRNO", requestNumber);
+        setField(table, "reason", textOf(message.textOf(u"//rootns:reasonCode"_s), reasons));
     });
     frmPrintPreview::ShowForm(AssessmentReport, QStringList{u""_s, u"Assessment Result"_s}, &table);
     return true;
 }
 
-bool PrintAdjusted(const xml::Document& message, bool Reprint)
+bool printAdjusted(const xml::Document& message, bool Reprint)
 {
-    db::Recordset table = OpenComparison(ComparisonOf::AdjustedQuote);
+    db::Recordset table = openComparison(ComparisonOf::AdjustedQuote);
     bool isMatched = true;
-    Step([&] { isMatched = FillAdjustedReport(table, message, Reprint); });
+    step([&] { isMatched = fillAdjustedReport(table, message, Reprint); });
     if (isMatched)
         frmPrintPreview::ShowForm(ComparisonReport, u""_s, &table);
     return isMatched;
 }
 
 /// A document's name begins with the quote number, one more character, and the subquote.
-bool HasSubletDocument(const QString& number, const QString& subquote)
+bool hasSubletDocument(const QString& number, const QString& subquote)
 {
-    const QStringList names = files::list(SubletFolder());
+    const QStringList names = files::list(subletFolder());
     return std::ranges::any_of(names, [&](const QString& name) {
         return name.startsWith(number, Qt::CaseInsensitive) && name.mid(number.size() + 1, subquote.size()) == subquote;
     });
 }
 
-bool PrintAuthorised(const xml::Document& message, bool Reprint)
+bool printAuthorised(const xml::Document& message, bool Reprint)
 {
     QString number;
     QString subquote;
     std::optional<db::Recordset> table = BuildAuthReport(message, number, subquote, Reprint);
     frmPrintPreview::ShowForm(ComparisonReport, u""_s, table ? &*table : nullptr);
     std::tie(number, subquote) = SplitQuoteRef(message.textOf(u"//rootns:quoteBody/rootns:quoteReference"_s));
-    if (HasSubletDocument(number, subquote))
+    if (hasSubletDocument(number, subquote))
         frmSubletAuth::ShowForm(number, subquote);
     return table.has_value();
 }
 
-bool Print(const QString& fileName, bool Reprint)
+bool print(const QString& fileName, bool Reprint)
 {
     QString text = files::read(gsListFolder + fileName);
-    const xml::Document message = ParsedMessage(text);
+    const xml::Document message = parsedMessage(text);
     const QString type = message.documentElement().textOrEmptyOf(u"//*[name()='messageType']"_s);
     if (type == u"QREQ"_s)
-        return PrintRequest(message);
+        return printRequest(message);
     if (type == u"ADQT"_s)
-        return PrintAdjusted(message, Reprint);
+        return printAdjusted(message, Reprint);
     if (type == u"AUQT"_s)
-        return PrintAuthorised(message, Reprint);
+        return printAuthorised(message, Reprint);
     if (type == u"ARES"_s)
-        return PrintResult(message);
+        return printResult(message);
     return true;  // the other types have no report, nor has a marker, which names no type
 }
 
@@ -259,7 +259,7 @@ bool PrintXML(const QString& fileName, bool Reprint)
         return true;
     EnsureConnection();
     try {
-        return Print(fileName, Reprint);
+        return print(fileName, Reprint);
     } catch (const RuntimeError& error) {
         desktop::msgBox(u"An error %1 has occured, Please contact MarlinDesk Support\r\n%2-%3"_s.arg(error.number())
                             .arg(error.description(), error.source()));

@@ -1,11 +1,11 @@
 #include "reports/QuoteComparison.h"
 
+#include "base/SharedVariables.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
 #include "quotedata/Vendors.h"
 #include "reports/ReportTable.h"
-#include "base/SharedVariables.h"
 
 #include <span>
 #include <vector>
@@ -109,7 +109,7 @@ constexpr std::pair<Section, const char*> sections[] = {
     {Section::Sublet, "rootns:sublets/*"},
 };
 
-bool IsBlank(const QString& text)
+bool isBlank(const QString& text)
 {
     return text.trimmed().isEmpty();
 }
@@ -131,7 +131,7 @@ struct Line {
     }
 };
 
-QVariant StartValue(const Start& start, const Line& line)
+QVariant startValue(const Start& start, const Line& line)
 {
     if (start.from == Start::Unset)
         return {};
@@ -140,13 +140,13 @@ QVariant StartValue(const Start& start, const Line& line)
     const QString text = line.text(start.text);
     if (start.from == Start::Element)
         return text;
-    if (IsBlank(text))
+    if (isBlank(text))
         return start.from == Start::NumberOrUnset ? QVariant() : QVariant(0);
     return start.from == Start::Tenth ? toDouble(text) * 0.1 : toDouble(text);
 }
 
 /// Null where one of the two is.
-QVariant Product(const db::Recordset& row, const QString& hours, const QString& rate)
+QVariant product(const db::Recordset& row, const QString& hours, const QString& rate)
 {
     if (row.isNull(hours) || row.isNull(rate))
         return {};
@@ -156,11 +156,11 @@ QVariant Product(const db::Recordset& row, const QString& hours, const QString& 
 // What a deleted line takes over from the shop's quote, where its own value says nothing.
 enum class SaysNothing { EmptyText, Zero };
 
-void TakeOver(db::Recordset& row, const QString& field, const QString& oldField, SaysNothing test)
+void takeOver(db::Recordset& row, const QString& field, const QString& oldField, SaysNothing test)
 {
     const QString own = row.text(field);
-    const bool isEmpty = IsBlank(own) || (test == SaysNothing::Zero && toDouble(own) == 0);
-    if (isEmpty && !IsBlank(row.text(oldField)))
+    const bool isEmpty = isBlank(own) || (test == SaysNothing::Zero && toDouble(own) == 0);
+    if (isEmpty && !isBlank(row.text(oldField)))
         row.set(field, row.value(oldField));
 }
 
@@ -179,7 +179,7 @@ public:
     void sublet(db::Recordset& subletTypes);
 
 private:
-    bool has(const QString& column) const { return !IsBlank(shop.text(column)); }
+    bool has(const QString& column) const { return !isBlank(shop.text(column)); }
     void takeOverWhereDeleted();
     void takeScriptWhereEmpty();
     void takeItemNo();
@@ -196,13 +196,13 @@ void Comparison::takeOverWhereDeleted()
     if (!line.isDeleted())
         return;
     const SaysNothing test = isAuthorised ? SaysNothing::Zero : SaysNothing::EmptyText;
-    TakeOver(row, u"qty"_s, u"old_qty"_s, test);
-    TakeOver(row, u"amount"_s, u"old_amount"_s, test);
+    takeOver(row, u"qty"_s, u"old_qty"_s, test);
+    takeOver(row, u"amount"_s, u"old_amount"_s, test);
 }
 
 void Comparison::takeScriptWhereEmpty()
 {
-    if (has(u"script"_s) && IsBlank(row.text(u"script"_s)))
+    if (has(u"script"_s) && isBlank(row.text(u"script"_s)))
         row.set(u"script"_s, shop.text(u"script"_s).trimmed());
 }
 
@@ -216,21 +216,21 @@ QVariant Comparison::oldLabourAmount(const QString& type) const
 {
     const QString rate = u"rr_rate2"_s;
     if (type == u"RR"_s)
-        return Product(shop, u"rrhour"_s, rate);
+        return product(shop, u"rrhour"_s, rate);
     if (type == u"REPR"_s)
-        return Product(shop, u"rahour"_s, rate);
+        return product(shop, u"rahour"_s, rate);
     if (!shop.isNull(u"unitcost"_s))
         return shop.value(u"unitcost"_s);
     for (const QString& hours : {u"rrhour"_s, u"rahour"_s, u"pthour"_s})
         if (!shop.isNull(hours))
-            return Product(shop, hours, rate);
+            return product(shop, hours, rate);
     return {};
 }
 
 void Comparison::labour()
 {
     QString type = line.text("labourType");
-    if (IsBlank(type)) {
+    if (isBlank(type)) {
         const QString category = shop.text(u"category"_s);
         type = category == u"R&R"_s ? u"RR"_s : category == u"RA"_s ? u"REPR"_s : u"OTH"_s;
         row.set(u"category"_s, type);
@@ -278,7 +278,7 @@ void Comparison::part()
 
 void Comparison::paint()
 {
-    if (IsBlank(line.text("paintWorkType")))
+    if (isBlank(line.text("paintWorkType")))
         row.set(u"category"_s, u"PAIN"_s);
     if (line.isDeleted()) {
         row.set(u"script"_s, shop.text(u"script"_s));
@@ -288,12 +288,12 @@ void Comparison::paint()
     row.set(u"old_qty"_s, has(u"qty"_s) ? shop.text(u"qty"_s).trimmed() : u"0"_s);
     if (has(u"pthour"_s))
         row.set(u"old_amount"_s,
-                has(u"rr_rate2"_s) ? Product(shop, u"pthour"_s, u"rr_rate2"_s) : shop.value(u"pthour"_s));
+                has(u"rr_rate2"_s) ? product(shop, u"pthour"_s, u"rr_rate2"_s) : shop.value(u"pthour"_s));
     else
         row.set(u"old_amount"_s, 0);
     if (line.isDeleted()) {
-        TakeOver(row, u"qty"_s, u"old_qty"_s, SaysNothing::Zero);
-        TakeOver(row, u"amount"_s, u"old_amount"_s, SaysNothing::Zero);
+        takeOver(row, u"qty"_s, u"old_qty"_s, SaysNothing::Zero);
+        takeOver(row, u"amount"_s, u"old_amount"_s, SaysNothing::Zero);
     }
     row.set(u"itemno"_s, has(u"itemno"_s) ? shop.text(u"itemno"_s) : u""_s);
     takeScriptWhereEmpty();
@@ -301,7 +301,7 @@ void Comparison::paint()
 
 void Comparison::sublet(db::Recordset& subletTypes)
 {
-    if (IsBlank(line.text("subletType")))
+    if (isBlank(line.text("subletType")))
         row.set(u"category"_s, u"MIS"_s);
     if (line.isDeleted()) {
         if (subletTypes.recordCount() > 0)
@@ -321,13 +321,13 @@ void Comparison::sublet(db::Recordset& subletTypes)
 }
 
 /// The vendor that the repairer of a sublet line is; a new one where the shop knows none of that name.
-QVariant VendorOf(const Line& line)
+QVariant vendorOf(const Line& line)
 {
-    return FindOrAddVendor(line.text("subletRepairer").left(repairerLength),
+    return findOrAddVendor(line.text("subletRepairer").left(repairerLength),
                            line.text("subletRepairerAddress").left(repairerLength), line.text("subletRepairerPhone"));
 }
 
-void StartRow(db::Recordset& table, const Line& line, Section section, ComparisonOf comparison)
+void startRow(db::Recordset& table, const Line& line, Section section, ComparisonOf comparison)
 {
     table.addNew();
     table.set(u"action"_s, line.indicator);
@@ -336,22 +336,22 @@ void StartRow(db::Recordset& table, const Line& line, Section section, Compariso
         comparison == ComparisonOf::AuthorisedQuote ? authorisedStart : adjustedStart;
     for (const StartField& field : fieldsOfLine) {
         const Start& start = field.sections[static_cast<size_t>(section)];
-        if (const QVariant value = StartValue(start, line); !value.isNull())
+        if (const QVariant value = startValue(start, line); !value.isNull())
             table.set(QString::fromLatin1(field.name), value);
     }
 }
 
 }  // namespace
 
-db::Recordset OpenComparison(ComparisonOf comparison)
+db::Recordset openComparison(ComparisonOf comparison)
 {
     std::vector<ReportField> declared(std::begin(fields), std::end(fields));
     if (comparison == ComparisonOf::AdjustedQuote)
         std::erase_if(declared, [](const ReportField& field) { return qstrcmp(field.name, "vendor") == 0; });
-    return OpenReportTable(declared);
+    return openReportTable(declared);
 }
 
-ComparisonHeader ReadHeader(const xml::Document& document, ComparisonOf comparison)
+ComparisonHeader readHeader(const xml::Document& document, ComparisonOf comparison)
 {
     ComparisonHeader header;
     for (const HeaderField& field : headerFields) {
@@ -364,22 +364,22 @@ ComparisonHeader ReadHeader(const xml::Document& document, ComparisonOf comparis
     return header;
 }
 
-void SetHeader(db::Recordset& table, const ComparisonHeader& header)
+void setHeader(db::Recordset& table, const ComparisonHeader& header)
 {
     for (const auto& [field, value] : header)
         table.set(field, value);
 }
 
-bool FindLine(db::Recordset& lines, const QString& number)
+bool findLine(db::Recordset& lines, const QString& number)
 {
-    if (IsBlank(number) || lines.recordCount() == 0)
+    if (isBlank(number) || lines.recordCount() == 0)
         return false;
     lines.moveFirst();
     lines.find(sql("SEQ_NO='{}'", number));
     return !lines.eof();
 }
 
-void AddChangedLines(db::Recordset& table, const ComparisonHeader& header, const xml::Document& document,
+void addChangedLines(db::Recordset& table, const ComparisonHeader& header, const xml::Document& document,
                      const db::Recordset& quote, db::Recordset& lines, ComparisonOf comparison, bool Reprint)
 {
     const bool isAuthorised = comparison == ComparisonOf::AuthorisedQuote;
@@ -396,11 +396,11 @@ void AddChangedLines(db::Recordset& table, const ComparisonHeader& header, const
             const Line line{node, indicator};
             if (line.isUnchanged() || (line.isDeleted() && Reprint))
                 continue;
-            StartRow(table, line, section, comparison);
-            SetHeader(table, header);
+            startRow(table, line, section, comparison);
+            setHeader(table, header);
             if (isAuthorised && section == Section::Sublet)
-                table.set(u"vendor"_s, VendorOf(line));
-            if (FindLine(lines, line.number())) {
+                table.set(u"vendor"_s, vendorOf(line));
+            if (findLine(lines, line.number())) {
                 Comparison shown(table, lines, line, comparison);
                 switch (section) {
                     case Section::Labour:

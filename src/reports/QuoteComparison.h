@@ -18,18 +18,18 @@ enum class ComparisonOf { AuthorisedQuote, AdjustedQuote };
 using ComparisonHeader = QList<std::pair<QString, QVariant>>;
 
 /// Those that need nothing but the message.
-ComparisonHeader ReadHeader(const xml::Document& document, ComparisonOf comparison);
+ComparisonHeader readHeader(const xml::Document& document, ComparisonOf comparison);
 /// Puts the header on the row that was added last.
-void SetHeader(db::Recordset& table, const ComparisonHeader& header);
+void setHeader(db::Recordset& table, const ComparisonHeader& header);
 
 /// An empty comparison table, open.
-db::Recordset OpenComparison(ComparisonOf comparison);
+db::Recordset openComparison(ComparisonOf comparison);
 /// Adds a row to the table for each line of the message that is not as the shop's line of that number. With `Reprint`
 /// the deleted ones are left out. `lines` are those of `quote`.
-void AddChangedLines(db::Recordset& table, const ComparisonHeader& header, const xml::Document& document,
+void addChangedLines(db::Recordset& table, const ComparisonHeader& header, const xml::Document& document,
                      const db::Recordset& quote, db::Recordset& lines, ComparisonOf comparison, bool Reprint);
 
 /// Stands on the shop's line of that number; false where there is none.
-bool FindLine(db::Recordset& lines, const QString& number);
+bool findLine(db::Recordset& lines, const QString& number);
 
 }  // namespace kest

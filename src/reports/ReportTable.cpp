@@ -2,7 +2,7 @@
 
 namespace kest {
 
-db::Recordset OpenReportTable(std::span<const ReportField> fields)
+db::Recordset openReportTable(std::span<const ReportField> fields)
 {
     db::Recordset table;
     for (const ReportField& field : fields)

@@ -16,6 +16,6 @@ struct ReportField {
 };
 
 /// An empty table of these fields, open.
-db::Recordset OpenReportTable(std::span<const ReportField> fields);
+db::Recordset openReportTable(std::span<const ReportField> fields);
 
 }  // namespace kest

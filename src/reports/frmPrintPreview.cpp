@@ -1,9 +1,11 @@
 #include "reports/frmPrintPreview.h"
 
+#include "base/ModRegistry.h"
+#include "base/SharedVariables.h"
+#include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
-#include "platform/Prompt.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
 #include "platform/print/OutputFolder.h"
@@ -11,8 +13,6 @@
 #include "platform/print/Preview.h"
 #include "platform/values.h"
 #include "reports/ReportTable.h"
-#include "base/ModRegistry.h"
-#include "base/SharedVariables.h"
 
 #include <QGuiApplication>
 #include <QPrintDialog>
@@ -30,7 +30,7 @@ namespace {
 constexpr int gap = 80;  // twips, around the button
 
 /// The template's path; none after a box where the number has no report.
-std::optional<QString> TemplateOf(qint32 number)
+std::optional<QString> templateOf(qint32 number)
 {
     db::Recordset definition(gConn);
     definition.open(sql("select * from ReportDefinition where ReportID = {}", number));
@@ -44,7 +44,7 @@ std::optional<QString> TemplateOf(qint32 number)
     return GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"ReportPath"_s, u"c:\\wirra32\\report\\"_s) + name;
 }
 
-void SetParameters(report::Report& report, qint32 number, const QVariant& value)
+void setParameters(report::Report& report, qint32 number, const QVariant& value)
 {
     for (qsizetype i = 0; i < report.parameters().size(); ++i) {
         const QString name = report.parameters()[i].name.toUpper();
@@ -57,7 +57,7 @@ void SetParameters(report::Report& report, qint32 number, const QVariant& value)
     }
 }
 
-QJsonValue AsJson(const std::optional<report::Table>& table)
+QJsonValue asJson(const std::optional<report::Table>& table)
 {
     if (!table)
         return QJsonValue::Null;
@@ -72,7 +72,7 @@ QJsonValue AsJson(const std::optional<report::Table>& table)
 }
 
 /// Describes the preview for an unattended run.
-void Record(qint32 number, const report::Report& report, const std::optional<report::Table>& table)
+void recordPreview(qint32 number, const report::Report& report, const std::optional<report::Table>& table)
 {
     QJsonObject parameters;
     for (const report::Parameter& parameter : report.parameters())
@@ -80,12 +80,12 @@ void Record(qint32 number, const report::Report& report, const std::optional<rep
     const QJsonObject shown{{u"name"_s, u"frmPrintPreview"_s},
                             {u"report"_s, number},
                             {u"parameters"_s, parameters},
-                            {u"table"_s, AsJson(table)}};
+                            {u"table"_s, asJson(table)}};
     desktop::recordWindow(shown);
     report::writeOutput(number, report, shown);
 }
 
-void SetDefaultPointer()
+void setDefaultPointer()
 {
     while (QGuiApplication::overrideCursor())
         QGuiApplication::restoreOverrideCursor();
@@ -109,13 +109,13 @@ frmPrintPreview::frmPrintPreview(const report::Report& report)
     crvPreview->show();
     crvPreview->setFocus();
     setMinimumSize(crvPreview->minimumSizeHint().width(), desktop::pixels(4500));
-    SetDefaultPointer();
+    setDefaultPointer();
 }
 
 void frmPrintPreview::ShowForm(qint32 peReportType, const QVariant& pvValue, db::Recordset* table)
 {
     attempt([&] {
-        const std::optional<QString> path = TemplateOf(peReportType);
+        const std::optional<QString> path = templateOf(peReportType);
         if (!path)
             return;
         report::Report report(*path);
@@ -124,12 +124,12 @@ void frmPrintPreview::ShowForm(qint32 peReportType, const QVariant& pvValue, db:
             rows = report::tableOf(*table);
             report.setTable(*rows);
         }
-        SetParameters(report, peReportType, pvValue);
-        Record(peReportType, report, rows);
+        setParameters(report, peReportType, pvValue);
+        recordPreview(peReportType, report, rows);
         frmPrintPreview form(report);
         desktop::showModal(form);
     });
-    SetDefaultPointer();
+    setDefaultPointer();
 }
 
 void frmPrintPreview::crvPreview_PrintButtonClicked()

@@ -1,17 +1,17 @@
 #include "setup/Profile.h"
 
-#include "setup/DemoShop.h"
-#include "setup/QuoteDatabase.h"
-#include "platform/RuntimeError.h"
-#include "platform/files/files.h"
-#include "platform/profile.h"
-#include "platform/settings/registry.h"
 #include "base/ModRegistry.h"
 #include "base/modDBAccess.h"
 #include "base/modLoggerEx.h"
+#include "platform/RuntimeError.h"
+#include "platform/files/Lock.h"
+#include "platform/files/files.h"
+#include "platform/profile.h"
+#include "platform/settings/registry.h"
+#include "setup/DemoShop.h"
+#include "setup/QuoteDatabase.h"
 
 #include <QDir>
-#include <QLockFile>
 
 namespace kest::app {
 
@@ -128,9 +128,11 @@ bool initProfile(const std::function<bool()>& registerClass, bool demo, const QD
         return false;
     }
     files::makeFolder(profile::root());
-    QLockFile making(profile::root() + u"/init.lock"_s);  // another init would take the unfinished database away
-    if (!making.lock())
-        throw RuntimeError(PermissionDenied, u"Nothing can be written in "_s + profile::root());
+    // another init would take the unfinished database away
+    constexpr int longestInit = 60000;  // milliseconds
+    const files::Lock making(profile::root() + u"/init.lock"_s, {}, longestInit);
+    if (!making.isHeld())
+        throw RuntimeError(PermissionDenied, u"Another \"kest2 init\" is still making "_s + profile::root());
     if (isWhole())
         return false;
     makeFolders();
@@ -149,8 +151,8 @@ bool initProfile(const std::function<bool()>& registerClass, bool demo, const QD
 QJsonObject where()
 {
     const QString messages = hostSetting(u"EcomHome"_s);
-    ReadConnectionSettings();
-    const QString embedded = db::embeddedName(ConnectionText(DriverNumber(CopyUp::No)));
+    readConnectionSettings();
+    const QString embedded = db::embeddedName(connectionText(driverNumber(CopyUp::No)));
     const QString database = embedded.isEmpty() ? gsServer + u'/' + gsDatabase : embeddedFile(embedded);
     const auto folder = [](const QString& path) { return QDir::cleanPath(files::systemPath(path)); };
     return {
@@ -163,7 +165,7 @@ QJsonObject where()
         {u"images"_s, folder(hostSetting(u"ImagesPath"_s))},
         {u"pdf"_s, folder(messages + u"PDF"_s)},
         {u"reports"_s, folder(hostSetting(u"ReportPath"_s))},
-        {u"log"_s, QDir::cleanPath(files::systemPath(ErrorLogPath()))},
+        {u"log"_s, QDir::cleanPath(files::systemPath(errorLogPath()))},
         {u"component"_s, profile::componentFolder()},
     };
 }

@@ -1,13 +1,13 @@
 #include "shell/eKEST.h"
 
-#include "platform/database/Sql.h"
-#include "platform/Prompt.h"
-#include "platform/desktop/Window.h"
 #include "base/ModRegistry.h"
 #include "base/SharedVariables.h"
-#include "shell/frmKEST.h"
 #include "base/modDBAccess.h"
 #include "base/modLoggerEx.h"
+#include "platform/Prompt.h"
+#include "platform/database/Sql.h"
+#include "platform/desktop/Window.h"
+#include "shell/frmKEST.h"
 
 namespace kest {
 
@@ -54,13 +54,13 @@ void eKEST::ShowKESTWindow(const QString& sQTNNO, const QString& sSubQuote)
 {
     desktop::guarded(u"eKEST.ShowKESTWindow"_s, [&] {
         frmKEST panel;
-        if (!OpenHostQuote(sQTNNO, sSubQuote))
+        if (!openHostQuote(sQTNNO, sSubQuote))
             return;
         desktop::showModal(panel);
     });
 }
 
-bool HasConnection()
+bool hasConnection()
 {
     gConn = GetConnection();
     if (!gConn)
@@ -69,9 +69,9 @@ bool HasConnection()
     return gConn != nullptr;
 }
 
-bool OpenHostQuote(const QString& sQTNNO, const QString& sSubQuote)
+bool openHostQuote(const QString& sQTNNO, const QString& sSubQuote)
 {
-    if (!HasConnection())
+    if (!hasConnection())
         return false;
     grsQuote = std::make_shared<db::Recordset>(gConn);
     grsQuote->open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", sQTNNO, sSubQuote));

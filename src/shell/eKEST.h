@@ -20,8 +20,8 @@ public:
 };
 
 /// True with a connection; false after a box that says there is none.
-bool HasConnection();
-/// Opens `grsQuote` on the quote that the host has open. False where HasConnection is.
-bool OpenHostQuote(const QString& sQTNNO, const QString& sSubQuote);
+bool hasConnection();
+/// Opens `grsQuote` on the quote that the host has open. False where hasConnection is.
+bool openHostQuote(const QString& sQTNNO, const QString& sSubQuote);
 
 }  // namespace kest

@@ -1,11 +1,11 @@
 #include "sublets/SubletDocuments.h"
 
+#include "base/SharedVariables.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
-#include "base/SharedVariables.h"
 
 #include <QRegularExpression>
 
@@ -13,17 +13,17 @@ using namespace Qt::StringLiterals;
 
 namespace kest {
 
-QString SubletFolder()
+QString subletFolder()
 {
     static const QRegularExpression lastName(u"[^\\\\/]*[\\\\/]*$"_s);
     return QString(gsUnreadPath).remove(lastName) + u"PDF\\"_s;
 }
 
-QStringList SubletDocumentNumbers(const QString& QTNNO, const QString& Subquote)
+QStringList subletDocumentNumbers(const QString& QTNNO, const QString& Subquote)
 {
     const QString start = QTNNO + u'.' + Subquote;
     QStringList files;
-    attempt([&] { files = files::list(SubletFolder()); });
+    attempt([&] { files = files::list(subletFolder()); });
 
     QStringList numbers;
     for (const QString& file : files) {
@@ -36,7 +36,7 @@ QStringList SubletDocumentNumbers(const QString& QTNNO, const QString& Subquote)
     return numbers;
 }
 
-QList<SubletDocument> SubletDocuments(const QString& QTNNO, const QString& Subquote, const QStringList& numbers)
+QList<SubletDocument> subletDocuments(const QString& QTNNO, const QString& Subquote, const QStringList& numbers)
 {
     db::Recordset lines(gConn);
     db::Recordset vendors(gConn);

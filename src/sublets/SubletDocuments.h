@@ -7,7 +7,7 @@
 namespace kest {
 
 /// The folder of the documents, ending in a backslash: "PDF" in the parent of the unread folder.
-QString SubletFolder();
+QString subletFolder();
 
 struct SubletDocument {
     QString file;         // its name in the folder: QTNNO.Subquote_Number.pdf
@@ -18,9 +18,9 @@ struct SubletDocument {
 
 /// The numbers in the file names that begin with the quote, each once, in the order of the names; empty where the
 /// folder can't be read. Subquote 1 finds those of subquote 10 too: which of them it has shows in its lines.
-QStringList SubletDocumentNumbers(const QString& QTNNO, const QString& Subquote);
+QStringList subletDocumentNumbers(const QString& QTNNO, const QString& Subquote);
 
 /// The documents of these numbers whose line is in the quote. What can't be read is left out.
-QList<SubletDocument> SubletDocuments(const QString& QTNNO, const QString& Subquote, const QStringList& numbers);
+QList<SubletDocument> subletDocuments(const QString& QTNNO, const QString& Subquote, const QStringList& numbers);
 
 }  // namespace kest

@@ -1,9 +1,9 @@
 #include "sublets/frmSubletAuth.h"
 
-#include "sublets/frmViewPDF.h"
 #include "platform/Prompt.h"
 #include "platform/desktop/Lists.h"
 #include "platform/desktop/Window.h"
+#include "sublets/frmViewPDF.h"
 
 #include <QHBoxLayout>
 #include <QHeaderView>
@@ -24,7 +24,7 @@ constexpr int keyRole = Qt::UserRole + 1;
 
 frmSubletAuth::frmSubletAuth(const QList<SubletDocument>& documents)
     : Form(u"frmSubletAuth"_s, u"Sublet Authority Documents"_s),
-      folder(SubletFolder()),
+      folder(subletFolder()),
       ListView1(new QTreeWidget),
       Command1(new QPushButton),
       Command2(new QPushButton)
@@ -70,10 +70,10 @@ frmSubletAuth::frmSubletAuth(const QList<SubletDocument>& documents)
 
 void frmSubletAuth::ShowForm(const QString& QTNNO, const QString& Subquote)
 {
-    const QStringList numbers = SubletDocumentNumbers(QTNNO, Subquote);
+    const QStringList numbers = subletDocumentNumbers(QTNNO, Subquote);
     if (numbers.isEmpty())
         return;
-    const QList<SubletDocument> documents = SubletDocuments(QTNNO, Subquote, numbers);
+    const QList<SubletDocument> documents = subletDocuments(QTNNO, Subquote, numbers);
     QJsonArray rows;
     for (const SubletDocument& document : documents)
         rows.append(QJsonArray{document.description, document.vendor});

@@ -1,8 +1,8 @@
 #include "utilities/FormatXML.h"
 
 #include "messages/Envelope.h"
-#include "platform/RuntimeError.h"
 #include "platform/Prompt.h"
+#include "platform/RuntimeError.h"
 #include "platform/files/files.h"
 #include "platform/xml/xml.h"
 
@@ -75,11 +75,11 @@ bool loadRepaired(xml::Document& document, QString text)
     if (document.loadXML(text))
         return true;
     if (document.parseError().errorCode == xml::SecondRoot) {
-        text = WrappedInRequest(text);
+        text = wrappedInRequest(text);
         if (document.loadXML(text))
             return true;
     }
-    return document.parseError().errorCode == xml::BareAmpersand && EscapeAmpersands(text) && document.loadXML(text);
+    return document.parseError().errorCode == xml::BareAmpersand && escapeAmpersands(text) && document.loadXML(text);
 }
 
 }  // namespace
@@ -98,7 +98,7 @@ QString FormatXML(const QString& fileName)
     return text;
 }
 
-QString WithMarkupCharacters(const QString& text)
+QString withMarkupCharacters(const QString& text)
 {
     QString written = text;
     written.replace("&gt;"_L1, ">"_L1);
@@ -107,7 +107,7 @@ QString WithMarkupCharacters(const QString& text)
     return written;
 }
 
-QString WithoutRequestWrapper(const QString& text)
+QString withoutRequestWrapper(const QString& text)
 {
     if (!text.startsWith(openingWrapper))
         return text;

@@ -14,9 +14,9 @@ QString FormatXML(const QString& fileName);
 
 /// What the viewer writes for the text that it shows: the characters themselves in place of the three markup
 /// references. It may be ill-formed for other readers; FormatXML reads it back.
-QString WithMarkupCharacters(const QString& text);
+QString withMarkupCharacters(const QString& text);
 
 /// The text without the wrapper that FormatXML put around several top-level elements; any other text as it is.
-QString WithoutRequestWrapper(const QString& text);
+QString withoutRequestWrapper(const QString& text);
 
 }  // namespace kest

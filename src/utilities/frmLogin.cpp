@@ -49,7 +49,7 @@ private:
 
 }  // namespace
 
-qint64 DayPassword(const QDate& day)
+qint64 dayPassword(const QDate& day)
 {
     return passwordBase.daysTo(day) + passwordConstant;
 }
@@ -111,7 +111,7 @@ void frmLogin::cmdOK_Click()
     const std::optional<double> typed = numberIn(txtPassword->text());
     if (!typed)
         return;
-    if (*typed == static_cast<double>(DayPassword(QDate::currentDate()))) {
+    if (*typed == static_cast<double>(dayPassword(QDate::currentDate()))) {
         passed = true;
         close();
         return;

@@ -11,7 +11,7 @@ class QPushButton;
 namespace kest {
 
 /// The password of a day: a whole number that changes at midnight.
-qint64 DayPassword(const QDate& day);
+qint64 dayPassword(const QDate& day);
 
 class frmLogin final : public desktop::Form {
     Q_OBJECT

@@ -1,9 +1,9 @@
 #include "utilities/frmViewXML.h"
 
+#include "base/SharedVariables.h"
 #include "platform/Prompt.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
-#include "base/SharedVariables.h"
 #include "utilities/ExactTextEdit.h"
 #include "utilities/FormatXML.h"
 #include "utilities/frmLogin.h"
@@ -170,11 +170,11 @@ void frmViewXML::Command2_Click()
     if (!desktop::ask(u"Are you sure you want to OVERWRITE this message?"_s, desktop::Icon::Exclamation))
         return;
     const QString shown = txtXML->exactText();
-    const QString text = WithoutRequestWrapper(shown);
+    const QString text = withoutRequestWrapper(shown);
     if (text != shown)
         txtXML->setExactText(text);
     unchanged = false;  // until the file is written
-    files::write(files::pathForWriting(gsCurFolder, sFile), WithMarkupCharacters(text));
+    files::write(files::pathForWriting(gsCurFolder, sFile), withMarkupCharacters(text));
     unchanged = true;
     txtXML->document()->setModified(false);
     close();

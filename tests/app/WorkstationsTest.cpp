@@ -101,7 +101,7 @@ TEST_F(Workstations, ASendAndALoadLoseNothingOfEachOther)
     const Snapshot before;
     int overtakenCount = 0;
     for (int statement = 1, last = 1; statement <= last; ++statement) {
-        ASSERT_TRUE(OpenHostQuote(u"500"_s, u"0"_s));
+        ASSERT_TRUE(openHostQuote(u"500"_s, u"0"_s));
         last = 0;
         db::setStatementFault([&] {
             if (++last == statement) {

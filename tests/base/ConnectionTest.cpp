@@ -17,7 +17,7 @@ void setSetting(const QString& key, const QString& value, const QString& section
     ASSERT_TRUE(RegSetValue(settings::Hive::LocalMachine, u"SOFTWARE\\"_s + section, key, value));
 }
 
-TEST(ConnectionText, NamesDriverServerAndInstance)
+TEST(connectionText, NamesDriverServerAndInstance)
 {
     gsDatabase = u"WirSql"_s;
     gsSAPwd = u"secret"_s;
@@ -31,7 +31,7 @@ TEST(ConnectionText, NamesDriverServerAndInstance)
     for (const auto& [driver, server, instance, expected] : cases) {
         gsServer = server;
         gsInstance = instance;
-        EXPECT_EQ(ConnectionText(driver), expected);
+        EXPECT_EQ(connectionText(driver), expected);
     }
 }
 

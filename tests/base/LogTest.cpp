@@ -1,7 +1,7 @@
+#include "base/modLoggerEx.h"
 #include "platform/RuntimeError.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
-#include "base/modLoggerEx.h"
 #include "support/ScriptedDesktop.h"
 #include "support/TestProfile.h"
 
@@ -31,8 +31,8 @@ TEST_F(ErrorLog, TheModeChoosesBoxAndRecord)
     for (const auto& [mode, boxes, records] : cases) {
         report(mode);
         EXPECT_EQ(desktop.boxes().size(), boxes) << mode;
-        ASSERT_EQ(files::exists(ErrorLogPath()), records > 0) << mode;
-        const QString log = records ? files::read(ErrorLogPath()) : QString();
+        ASSERT_EQ(files::exists(errorLogPath()), records > 0) << mode;
+        const QString log = records ? files::read(errorLogPath()) : QString();
         EXPECT_TRUE(
             QRegularExpression(
                 u"^(\\d\\d/\\d\\d/\\d{4} \\d\\d?:\\d\\d:\\d\\d [AP]M: Line No: 7\r\n\t\tSource: modX\\.LoadY\r\n"
@@ -47,13 +47,13 @@ TEST_F(ErrorLog, TheModeChoosesBoxAndRecord)
 
 TEST_F(ErrorLog, AFullFileStartsAnew)
 {
-    EXPECT_FALSE(LogIsFull(ErrorLogPath()));
-    files::write(ErrorLogPath(), QString(1'048'575, u'x'));
+    EXPECT_FALSE(LogIsFull(errorLogPath()));
+    files::write(errorLogPath(), QString(1'048'575, u'x'));
     report(BoxAndFile);
-    EXPECT_GT(files::size(ErrorLogPath()), 1'048'576);
-    files::write(ErrorLogPath(), QString(1'048'576, u'x'));
+    EXPECT_GT(files::size(errorLogPath()), 1'048'576);
+    files::write(errorLogPath(), QString(1'048'576, u'x'));
     report(BoxAndFile);
-    EXPECT_LT(files::size(ErrorLogPath()), 200);
+    EXPECT_LT(files::size(errorLogPath()), 200);
 }
 
 TEST_F(ErrorLog, AnUnwritableFileEndsTheCallersPathAfterTheBox)

@@ -1,11 +1,11 @@
-#include "setup/Profile.h"
+#include "base/CredentialCipher.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 #include "day/Day.h"
 #include "jobexport/JobLinkSettings.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
-#include "base/CredentialCipher.h"
-#include "base/SharedVariables.h"
-#include "base/modDBAccess.h"
+#include "setup/Profile.h"
 #include "shell/component.h"
 #include "support/Cases.h"
 #include "support/MariaDbServer.h"
@@ -47,13 +47,13 @@ void addRows(Holdings& all, db::Recordset rows)
 Holdings found(const MariaDbServer& server)
 {
     Holdings all;
-    addRows(all, Opened(u"SELECT QTNNO||'/'||Subquote AS name, Job_stage AS stage, ReadOnly AS locked, "
+    addRows(all, opened(u"SELECT QTNNO||'/'||Subquote AS name, Job_stage AS stage, ReadOnly AS locked, "
                         "KESTQRNo AS request, KESTQRVer AS version, KESTQuoteNo AS network, KESTAuthNo AS authority, "
                         "TOTAL AS labour, PRTTOTAL AS parts, MISTOTAL AS miscellaneous, excess, "
                         "contri AS contribution FROM QUOTE1 WHERE QTNNO>'1028'"_s));
-    addRows(all, Opened(u"SELECT QTNNO||'/'||Subquote||' texts' AS name, remarks FROM QUOTE3 "
+    addRows(all, opened(u"SELECT QTNNO||'/'||Subquote||' texts' AS name, remarks FROM QUOTE3 "
                         "WHERE QTNNO>'1028'"_s));
-    addRows(all, Opened(u"SELECT QTNNO||'/'||Subquote||' '||category||' '||script AS name, SEQ_NO, rrhour, rahour, "
+    addRows(all, opened(u"SELECT QTNNO||'/'||Subquote||' '||category||' '||script AS name, SEQ_NO, rrhour, rahour, "
                         "pthour, rr_rate2, qty, unitcost, itemno, tosend FROM QUOTE2 WHERE QTNNO>'1028'"_s));
     const auto jobLink = std::make_shared<db::Connection>();
     jobLink->open(server.connectionText(u"jobs"_s));
@@ -145,7 +145,7 @@ std::string played(const MariaDbServer& server, const Look& look)
     app::initProfile(registerClass, true);
     app::Day day(pictures.path());
     InitCipherKey();
-    StoreJobLinkSettings({u"127.0.0.1"_s, server.port(), u"jobs"_s, server.user(), server.password()});
+    storeJobLinkSettings({u"127.0.0.1"_s, server.port(), u"jobs"_s, server.user(), server.password()});
     for (const QString& step : app::Day::steps()) {
         const desktop::Record shown = day.play(step);
         files::waitForBackground(backgroundWait);

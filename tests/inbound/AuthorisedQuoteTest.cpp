@@ -1,6 +1,6 @@
 // The way of an authorised quote into the shop's quote: which quote it finds, what it refuses, what it writes.
-#include "inbound/modLoadXML.h"
 #include "base/modDBAccess.h"
+#include "inbound/modLoadXML.h"
 #include "support/Shop.h"
 
 #include <QFile>
@@ -24,7 +24,7 @@ protected:
 
 void putTemplate()
 {
-    const QString name = Opened(u"SELECT * FROM ReportDefinition WHERE ReportID=730"_s).text(u"ReportName"_s);
+    const QString name = opened(u"SELECT * FROM ReportDefinition WHERE ReportID=730"_s).text(u"ReportName"_s);
     files::makeFolder(u"c:\\wirra32\\report"_s);
     QFile shipped(u":/templates/730.html"_s);
     ASSERT_TRUE(shipped.open(QIODevice::ReadOnly));

@@ -20,11 +20,11 @@ QStringList variantsOf(QString text)
     wrong << QString() << QString(1'000'000, u'7');
     QStringList variants{text};
     const auto changed = [&](qsizetype leaf, auto change) {
-        xml::Document message = ParsedMessage(text);
+        xml::Document message = parsedMessage(text);
         change(message, message.selectNodes(leaves)[leaf]);
         variants += message.xml();
     };
-    const qsizetype count = ParsedMessage(text).selectNodes(leaves).size();
+    const qsizetype count = parsedMessage(text).selectNodes(leaves).size();
     for (qsizetype leaf = 0; leaf < count; ++leaf) {
         changed(leaf, [](xml::Document&, xml::Node element) { element.parentNode().removeChild(element); });
         changed(leaf, [](xml::Document& message, xml::Node element) {

@@ -1,5 +1,5 @@
-#include "inbound/modLoadXML.h"
 #include "base/modLoggerEx.h"
+#include "inbound/modLoadXML.h"
 #include "support/Shop.h"
 
 #include <QFile>
@@ -44,7 +44,7 @@ TEST_F(Dispatcher, AFailureStandsInTheLog)
 {
     EXPECT_FALSE(load(Message("", "getQRCancellationResponse")));
     EXPECT_NE(shown().find("Error Number: 91\r\n"), std::string::npos);
-    EXPECT_TRUE(files::read(ErrorLogPath()).contains(u"Source: modLoadXML.LoadXML"_s));
+    EXPECT_TRUE(files::read(errorLogPath()).contains(u"Source: modLoadXML.LoadXML"_s));
 }
 
 TEST_F(Dispatcher, ANoticeIsShownAndPutAside)

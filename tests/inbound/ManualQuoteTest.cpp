@@ -15,7 +15,7 @@ const auto lineFailure = u"\n[none] Error processing Quote Items, Please contact
 /// Number and subquote of the quote that the last load made or matched.
 std::string loadedQuote()
 {
-    const db::Recordset row = Opened(u"SELECT * FROM QUOTE1 WHERE KESTQuoteNo='KQ1'"_s);
+    const db::Recordset row = opened(u"SELECT * FROM QUOTE1 WHERE KESTQuoteNo='KQ1'"_s);
     return row.eof() ? "none" : (row.text(u"QTNNO"_s) + u'/' + row.text(u"Subquote"_s)).toStdString();
 }
 
@@ -37,7 +37,7 @@ TEST_F(ManualQuotes, EachIsMatchedByNumberThenByRequestElseNewAndTakesTheNextSub
             << elements.toStdString();
         EXPECT_EQ(loadedQuote(), quote.toStdString()) << elements.toStdString();
         EXPECT_EQ(gsMatchedQTNNO, taken ? quote.section(u'/', 0, 0) : QString()) << elements.toStdString();
-        EXPECT_EQ(Opened(u"SELECT * FROM CINFO"_s).text(u"QUOTE_VAL"_s), u"1001"_s);  // the counter stays
+        EXPECT_EQ(opened(u"SELECT * FROM CINFO"_s).text(u"QUOTE_VAL"_s), u"1001"_s);  // the counter stays
         before.restore();
     }
     EXPECT_FALSE(load(Message::told("MANQ quoteBody/quoteType=AS quoteBody/quoteReference=500/x")));

@@ -18,15 +18,15 @@ protected:
     bool apply(const Message& message, const Text& number = "500")
     {
         QString text = message.text();
-        const xml::Document document = ParsedMessage(text);
+        const xml::Document document = parsedMessage(text);
         quote(number);
-        const db::Recordset header = Opened(u"SELECT * FROM QUOTE1 WHERE QTNNO='%1' AND Subquote=0"_s.arg(number));
-        db::Recordset lines = Opened(u"SELECT * FROM QUOTE2 WHERE QTNNO='%1' AND Subquote=0"_s.arg(number));
+        const db::Recordset header = opened(u"SELECT * FROM QUOTE1 WHERE QTNNO='%1' AND Subquote=0"_s.arg(number));
+        db::Recordset lines = opened(u"SELECT * FROM QUOTE2 WHERE QTNNO='%1' AND Subquote=0"_s.arg(number));
         return LoadQuoteBody(header, lines, document);
     }
 
     static Row line(int number) { return quote("500").line(number); }
-    static QStringList documents() { return filesIn(SubletFolder()); }
+    static QStringList documents() { return filesIn(subletFolder()); }
 };
 
 Message body()
@@ -37,7 +37,7 @@ Message body()
 /// The numbers of all lines, in the order in which they were stored.
 std::string numbers(const Text& number = "500")
 {
-    db::Recordset rows = Opened(u"SELECT * FROM QUOTE2 WHERE QTNNO='%1' ORDER BY itemid"_s.arg(number));
+    db::Recordset rows = opened(u"SELECT * FROM QUOTE2 WHERE QTNNO='%1' ORDER BY itemid"_s.arg(number));
     QStringList found;
     for (; !rows.eof(); rows.moveNext())
         found += rows.text(u"SEQ_NO"_s);
@@ -153,10 +153,10 @@ TEST_F(QuoteBody, ADocumentIsStoredUnderItsLinesNumber)
 {
     EXPECT_TRUE(apply(withDocument(4, "I", "JVBE \nRi0x")));
     EXPECT_TRUE(gbSubletDocumentArrived);
-    EXPECT_EQ(files::readBytes(SubletFolder() + u"500.0_4.pdf"_s), "%PDF-1");
+    EXPECT_EQ(files::readBytes(subletFolder() + u"500.0_4.pdf"_s), "%PDF-1");
 
-    files::write(SubletFolder() + u"500.0_12.PDF"_s, u"of line 12"_s);
-    files::write(SubletFolder() + u"500.1_30.pdf"_s, u"of a supplementary quote"_s);
+    files::write(subletFolder() + u"500.0_12.PDF"_s, u"of line 12"_s);
+    files::write(subletFolder() + u"500.1_30.pdf"_s, u"of a supplementary quote"_s);
     EXPECT_TRUE(apply(withDocument(4, "N")));  // a second document of one line
     EXPECT_TRUE(apply(withDocument(5, "D")));
     EXPECT_EQ(documents().join(u' '), u"500.0_12.PDF 500.0_13.pdf 500.0_4.pdf 500.0_5.pdf 500.1_30.pdf"_s);
@@ -167,9 +167,9 @@ TEST_F(QuoteBody, ALineWithoutNumberTakesOneAboveLinesAndDocuments)
 {
     line(2);
     EXPECT_TRUE(apply(withDocument(0, "I")));
-    files::write(SubletFolder() + u"77.0_17.pdf"_s, u"any quote's; its last digit counts"_s);
-    files::write(SubletFolder() + u".9.pdf"_s, u"hidden"_s);
-    files::write(SubletFolder() + u"9.txt"_s, u"no document"_s);
+    files::write(subletFolder() + u"77.0_17.pdf"_s, u"any quote's; its last digit counts"_s);
+    files::write(subletFolder() + u".9.pdf"_s, u"hidden"_s);
+    files::write(subletFolder() + u"9.txt"_s, u"no document"_s);
     EXPECT_TRUE(apply(withDocument(0, "I")));
     EXPECT_EQ(numbers(), "2 3 8");
 
@@ -193,7 +193,7 @@ TEST_F(QuoteBody, ADocumentThatCannotBeStoredFailsTheBody)
 TEST_F(QuoteBody, ADocumentMayBeThirtyMegabytesLong)
 {
     EXPECT_TRUE(apply(withDocument(1, "I", QString(30 * 1024 * 1024, u'A'))));
-    EXPECT_EQ(files::size(SubletFolder() + u"500.0_1.pdf"_s), 30 * 1024 * 1024 / 4 * 3);
+    EXPECT_EQ(files::size(subletFolder() + u"500.0_1.pdf"_s), 30 * 1024 * 1024 / 4 * 3);
 }
 
 TEST_F(QuoteBody, LinesWithoutNumberGoOnFromTheLastOne)
@@ -220,7 +220,7 @@ TEST_F(QuoteBody, ItemNumbersComeFromThePoolOfTheCategory)
         for (int number = 1; number <= count + 2; ++number)
             quote("500").line(number, category);
         QStringList given;
-        for (db::Recordset lines = Opened(u"SELECT * FROM QUOTE2"_s); !lines.eof(); lines.moveNext()) {
+        for (db::Recordset lines = opened(u"SELECT * FROM QUOTE2"_s); !lines.eof(); lines.moveNext()) {
             const QString number = lines.text(u"SEQ_NO"_s);
             given += NextItemNo(lines);
             EXPECT_EQ(lines.text(u"SEQ_NO"_s), number);  // still on its line

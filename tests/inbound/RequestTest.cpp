@@ -152,7 +152,7 @@ TEST_F(Requests, TheQuoteNumberIsTheNextThatIsFree)
          {std::pair("", "701"), std::pair("MANQ", "701"), std::pair("8", "701"), std::pair("123456789", "701"),
           std::pair("88", "88"), std::pair("1001", "701")}) {
         db::Recordset tried(gConn);
-        const db::Recordset shop = Opened(u"SELECT * FROM CINFO"_s);
+        const db::Recordset shop = opened(u"SELECT * FROM CINFO"_s);
         EXPECT_EQ(NextQuoteNumber(QString::fromLatin1(wish), shop, tried, false), QString::fromLatin1(number)) << wish;
         EXPECT_TRUE(tried.eof());
     }

@@ -1,10 +1,10 @@
 // The export against a real server: what JobLink finds, and what is left of an export that failed.
+#include "base/CredentialCipher.h"
 #include "jobexport/JobLinkSettings.h"
 #include "jobexport/WriteQuote.h"
 #include "platform/database/FaultInjection.h"
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
-#include "base/CredentialCipher.h"
 #include "support/MariaDbServer.h"
 #include "support/Shop.h"
 
@@ -34,7 +34,7 @@ protected:
 
     static void store(const QString& password)
     {
-        StoreJobLinkSettings({u"127.0.0.1"_s, mariaDb().port(), u"jobs"_s, mariaDb().user(), password});
+        storeJobLinkSettings({u"127.0.0.1"_s, mariaDb().port(), u"jobs"_s, mariaDb().user(), password});
     }
 
     db::Recordset rows(const char* select) const
@@ -150,7 +150,7 @@ TEST_F(JobLink, WithoutASettingOrAServerThatAnswersNothingIsExportedOrSaid)
 {
     store(u"wrong"_s);
     exportQuote();
-    StoreJobLinkSettings({u"127.0.0.1"_s, 1, u"jobs"_s, mariaDb().user(), mariaDb().password()});
+    storeJobLinkSettings({u"127.0.0.1"_s, 1, u"jobs"_s, mariaDb().user(), mariaDb().password()});
     QElapsedTimer clock;
     clock.start();
     exportQuote();
@@ -189,7 +189,7 @@ TEST(Cipher, WhatIsStoredComesBack)
 {
     InitCipherKey();
     for (const QString& plain : {u""_s, u"a"_s, u"12345678"_s, u"naïve £5 – secret"_s}) {
-        const QString stored = EncryptText(plain);
+        const QString stored = encryptText(plain);
         EXPECT_EQ(DecryptText(stored), plain);
         EXPECT_EQ(DecryptText(stored.toUpper()), plain);
         EXPECT_EQ(DecryptText(stored + u"00112233445566"_s), plain);

@@ -1,5 +1,5 @@
-#include "loopback/Transport.h"
 #include "app/TransportCommand.h"
+#include "loopback/Transport.h"
 #include "outbound/SendQuote.h"
 #include "platform/profile.h"
 #include "support/Shop.h"
@@ -51,7 +51,7 @@ protected:
     static bool send()
     {
         bool sent = false;
-        if (OpenHostQuote(u"1004"_s, u"0"_s))
+        if (openHostQuote(u"1004"_s, u"0"_s))
             SendQuote(*grsQuote, &sent);
         return sent;
     }
@@ -82,6 +82,17 @@ TEST_F(Loopback, ASentQuoteIsCarriedAndAnswered)
     EXPECT_EQ(quote("1004").state(),
               "3 locked 600002 (today : Submitted KEST Quote) (01/02/2008 : Responded Quote Request)");
     EXPECT_EQ(carried(), "") << "a second carry has nothing to do";
+}
+
+TEST_F(Loopback, OneTransportWorksOnTheFoldersAndADeadOneLocksNobodyOut)
+{
+    for (const QString& leftOver : {u""_s, u"1\nkest2\nanother-machine\n"_s}) {
+        files::write(folders().own + u"KESTWeb.lock"_s, leftOver);
+        app::TransportRunner first(folders(), [](const app::Carry&) {});
+        app::TransportRunner second(folders(), [](const app::Carry&) {});
+        EXPECT_TRUE(first.claim()) << leftOver.toStdString();
+        EXPECT_FALSE(second.claim());
+    }
 }
 
 TEST_F(Loopback, EachMessageHasTheEffectThatItsTypeTells)

@@ -28,10 +28,10 @@ TEST(Envelope, ATypeCodeHasItsDisplayNameInAnyCase)
 TEST(Envelope, AmpersandsAreEscapedAsFarAsAParseGoes)
 {
     QString text = u"a & b &amp;"_s;
-    EXPECT_TRUE(EscapeAmpersands(text));
+    EXPECT_TRUE(escapeAmpersands(text));
     EXPECT_EQ(text, u"a &amp; b &amp;amp;"_s);
     QString hostile(xml::Document::maximumBytes / 5 + 1, u'&');
-    EXPECT_FALSE(EscapeAmpersands(hostile));
+    EXPECT_FALSE(escapeAmpersands(hostile));
     EXPECT_EQ(hostile.size(), xml::Document::maximumBytes / 5 + 1);
 }
 

@@ -38,7 +38,7 @@ protected:
     /// Adds the lines to the quote, sends it, and compares total and document.
     static void sends(const QuoteRow& quote, const std::string& name, double total, const QString& file)
     {
-        db::Recordset lines = Opened(u"SELECT * FROM QUOTE2 WHERE 1=0"_s);
+        db::Recordset lines = opened(u"SELECT * FROM QUOTE2 WHERE 1=0"_s);
         for (const auto& [category, script, columns] : casesIn<3>("outbound/" + name + ".txt")) {
             lines.addNew();
             for (const char* column : {"QTNNO", "Subquote"})

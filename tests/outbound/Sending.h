@@ -1,10 +1,10 @@
 // A shop that sends quotes, and what then lies in its outgoing folder.
 #pragma once
 
+#include "base/modDBAccess.h"
 #include "outbound/SendQuote.h"
 #include "platform/database/Sql.h"
 #include "platform/xml/xml.h"
-#include "base/modDBAccess.h"
 #include "support/Shop.h"
 
 namespace kest::test {
@@ -17,7 +17,7 @@ protected:
     static double send(const Text& number, int subquote = 0)
     {
         db::Recordset panel =
-            Opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", QString(number), subquote));
+            opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", QString(number), subquote));
         return SendQuote(panel);
     }
     /// A file of the outgoing folder, "" where it is missing.

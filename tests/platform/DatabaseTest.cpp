@@ -201,7 +201,7 @@ TEST_P(EmbeddedDatabase, ReadsWhatAnotherToolHasWritten)
 
 INSTANTIATE_TEST_SUITE_P(Alone, EmbeddedDatabase, ::testing::Values(On::Embedded));
 
-TEST(ConnectionText, ChoosesTheEngineThatAnswers)
+TEST(connectionText, ChoosesTheEngineThatAnswers)
 {
     const TestProfile profile;
     QDir().mkpath(profile.root() + u"/databases"_s);
@@ -218,7 +218,7 @@ TEST(ConnectionText, ChoosesTheEngineThatAnswers)
     EXPECT_FALSE(QFile::exists(profile.root() + u"/databases/NoShop.db"_s)) << "a missing database is not made";
 }
 
-TEST(ConnectionText, AServerThatRefusesOrDoesNotAnswerCostsSeconds)
+TEST(connectionText, AServerThatRefusesOrDoesNotAnswerCostsSeconds)
 {
     const int silent = socket(AF_INET, SOCK_STREAM, 0);
     sockaddr_in address{};

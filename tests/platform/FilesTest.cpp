@@ -1,4 +1,5 @@
 // Files under the host's names: where they lie, what a failure leaves behind, which names are taken.
+#include "platform/files/Lock.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
 #include "support/Cases.h"
@@ -11,6 +12,8 @@
 
 #include <sys/resource.h>
 #include <sys/stat.h>
+#include <sys/wait.h>
+#include <unistd.h>
 
 #include <atomic>
 #include <csignal>
@@ -212,4 +215,33 @@ TEST_F(Files, AFileThatIsHeldGoesInTheBackground)
     EXPECT_FALSE(files::exists(box + u"held.xml"_s));
     files::removeInBackground(box + u"never.xml"_s);
     EXPECT_TRUE(files::waitForBackground(0));
+}
+
+TEST_F(Files, ALockGoesWithItsProcessWhateverItsFileHolds)
+{
+    const QString path = box + u"x.lock"_s;
+    const auto isFree = [&](const QString& name, int wait = 0) { return files::Lock(path, name, wait).isHeld(); };
+    for (const QString& leftOver : {u""_s, u"1\nkest2\nanother-machine\n"_s}) {
+        files::write(path, leftOver);
+        EXPECT_TRUE(isFree(u"load m.xml"_s)) << leftOver.toStdString();
+    }
+    int ready[2];
+    ASSERT_EQ(::pipe(ready), 0);
+    const pid_t child = ::fork();
+    ASSERT_GE(child, 0);
+    if (child == 0) {
+        const files::Lock held(path, u"load m.xml"_s);
+        ::_exit(::write(ready[1], "x", 1) == 1 && ::pause());
+    }
+    char any = 0;
+    ASSERT_EQ(::read(ready[0], &any, 1), 1);
+    EXPECT_FALSE(isFree(u"load m.xml"_s, 20));
+    EXPECT_TRUE(isFree(u"load n.xml"_s));
+    ::kill(child, SIGKILL);
+    EXPECT_TRUE(isFree(u"load m.xml"_s, 10000));
+    ::waitpid(child, nullptr, 0);
+    for (const int end : ready)
+        ::close(end);
+    const files::Lock held(path);
+    EXPECT_FALSE(isFree({})) << "in one process too";
 }

@@ -13,8 +13,8 @@ namespace {
 
 /// Header and lines of the quote 500, as a caller hands them over.
 struct Opened {
-    db::Recordset header = kest::Opened(u"SELECT * FROM QUOTE1 WHERE QTNNO='500'"_s);
-    db::Recordset lines = kest::Opened(u"SELECT * FROM QUOTE2 WHERE QTNNO='500'"_s);
+    db::Recordset header = kest::opened(u"SELECT * FROM QUOTE1 WHERE QTNNO='500'"_s);
+    db::Recordset lines = kest::opened(u"SELECT * FROM QUOTE2 WHERE QTNNO='500'"_s);
 };
 
 void calc(void (*routine)(db::Recordset& quote, db::Recordset& lines))

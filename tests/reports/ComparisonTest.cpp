@@ -17,21 +17,21 @@ protected:
         QString text = message.text();
         QString number;
         QString subquote;
-        auto table = BuildAuthReport(ParsedMessage(text), number, subquote, reprint);
+        auto table = BuildAuthReport(parsedMessage(text), number, subquote, reprint);
         EXPECT_TRUE(table.has_value());
         return table ? std::move(*table) : db::Recordset();
     }
     static db::Recordset adjusted(const Message& message, bool reprint = false)
     {
         QString text = message.text();
-        db::Recordset table = OpenComparison(ComparisonOf::AdjustedQuote);
-        EXPECT_TRUE(FillAdjustedReport(table, ParsedMessage(text), reprint));
+        db::Recordset table = openComparison(ComparisonOf::AdjustedQuote);
+        EXPECT_TRUE(fillAdjustedReport(table, parsedMessage(text), reprint));
         return table;
     }
     static bool matches(const Message& message, QString number = {}, QString subquote = {})
     {
         QString text = message.text();
-        return BuildAuthReport(ParsedMessage(text), number, subquote, false).has_value();
+        return BuildAuthReport(parsedMessage(text), number, subquote, false).has_value();
     }
     /// The cells of the current row, one that was never set as "-".
     static std::string cells(const db::Recordset& table, const Text& fields, QChar between = u'|')
@@ -176,8 +176,8 @@ TEST_F(Comparison, TheQuoteIsThatOfTheReferenceAndTheRequest)
               "[critical] Matching quote was not found in database, Please contact MarlinDesk Support.\n[none] error");
     quote("500", 2).request("QR2");
     QString text = adjustedQuote("500/2").text();
-    db::Recordset table = OpenComparison(ComparisonOf::AdjustedQuote);
-    EXPECT_FALSE(FillAdjustedReport(table, ParsedMessage(text), false));
+    db::Recordset table = openComparison(ComparisonOf::AdjustedQuote);
+    EXPECT_FALSE(fillAdjustedReport(table, parsedMessage(text), false));
 }
 
 }  // namespace kest::test

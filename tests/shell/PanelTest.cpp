@@ -1,7 +1,7 @@
+#include "base/SharedVariables.h"
 #include "platform/database/FaultInjection.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
-#include "base/SharedVariables.h"
 #include "shell/eKEST.h"
 #include "support/Shop.h"
 #include "utilities/frmLogin.h"
@@ -42,7 +42,7 @@ TEST_F(Panel, AConnectionThatWasLostIsOpenedAgainByTheNextClick)
     test::quote("500");
     int statements = 0;
     db::setStatementFault([&] { return ++statements == 2; }, CannotOpen);  // the first one opens the panel's quote
-    const QByteArray password = QByteArray::number(DayPassword(QDate::currentDate()));
+    const QByteArray password = QByteArray::number(dayPassword(QDate::currentDate()));
     show("500", R"json({"click": "Option1(2)"}, {"click": "cmdOK"}, {"click": "Option1(3)"}, {"click": "cmdOK"},
                        {"click": "Option1(2)"}, {"click": "cmdOK"}]],
                  "frmUtilities": [[{"click": "Command2"}]],

@@ -1,9 +1,9 @@
 #include "support/Row.h"
 
+#include "base/modDBAccess.h"
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
-#include "base/modDBAccess.h"
 #include "support/Cases.h"
 
 namespace kest::test {
@@ -19,7 +19,7 @@ QString withoutDate(QString text)
 
 db::Recordset rowsOf(const QString& table, const QString& condition)
 {
-    return Opened(u"SELECT * FROM %1 WHERE %2"_s.arg(table, condition));
+    return opened(u"SELECT * FROM %1 WHERE %2"_s.arg(table, condition));
 }
 
 QString keyOf(const QString& number, int subquote)

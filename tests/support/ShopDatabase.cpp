@@ -155,7 +155,7 @@ void dropConnection()
         gConn->close();
     else
         serverShop().administrator->execute(
-            u"KILL "_s + Opened(u"SELECT %1 AS id"_s.arg(serverShop().connectionNumber)).text(u"id"_s));
+            u"KILL "_s + opened(u"SELECT %1 AS id"_s.arg(serverShop().connectionNumber)).text(u"id"_s));
 }
 
 void makeShopDatabase()

@@ -1,10 +1,10 @@
 #include "support/Snapshot.h"
 
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 #include "inbound/modLoadXML.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
-#include "base/SharedVariables.h"
-#include "base/modDBAccess.h"
 
 #include <QDir>
 #include <QDirIterator>
@@ -45,7 +45,7 @@ std::string holdings()
     for (const char* table : tables) {
         const QString name = QString::fromLatin1(table);
         QStringList ofTable;
-        for (db::Recordset rows = Opened(u"SELECT * FROM "_s + name); !rows.eof(); rows.moveNext()) {
+        for (db::Recordset rows = opened(u"SELECT * FROM "_s + name); !rows.eof(); rows.moveNext()) {
             QStringList values{name};
             for (const QString& column : rows.columns())
                 if (column != u"itemid"_s)  // a line that is stored anew has another one

@@ -15,9 +15,9 @@ using test::control;
 
 TEST(Login, OnlyTheDaysNumberPassesAndOnlyAWrongNumberIsRemarkedOn)
 {
-    EXPECT_EQ(DayPassword(QDate(2026, 11, 22)), 46348 + 4711);
+    EXPECT_EQ(dayPassword(QDate(2026, 11, 22)), 46348 + 4711);
     const test::TestProfile profile;
-    const QString password = QString::number(DayPassword(QDate::currentDate()));
+    const QString password = QString::number(dayPassword(QDate::currentDate()));
     for (const auto& [typed, answer, passes, box] : test::casesIn<4>("login.txt")) {
         const QString steps = uR"({"set": "txtPassword", "text": "%1"}, %2)"_s.arg(typed, answer);
         const QString script = uR"({"windows": {"frmLogin": [[%1]]}})"_s.arg(steps).replace(u"TODAY"_s, password);

@@ -184,7 +184,7 @@ TEST_F(Utilities, ASaveThatFailsIsReportedAndTheWindowStays)
         quote("500").quoteNumber("before").remarks("before");
         const QStringList failures = failuresOf([&](QDialog& window) {
             db::Connection workstation;
-            workstation.open(ConnectionText(DriverNumber()));
+            workstation.open(connectionText(driverNumber()));
             workstation.execute(QString::fromLatin1(meanwhile));
             control<QLineEdit>(window, "txtQuoteNo").setText(u"repaired"_s);
             control<QLineEdit>(window, "txtAuthDate").setText(date);

@@ -1,6 +1,6 @@
 // The text viewer: what a save writes, what stops it, and leaving with unsaved typing.
-#include "platform/files/files.h"
 #include "base/SharedVariables.h"
+#include "platform/files/files.h"
 #include "support/ScriptedDesktop.h"
 #include "support/TestProfile.h"
 #include "utilities/ExactTextEdit.h"
@@ -31,7 +31,7 @@ protected:
 
     /// Opens the viewer on the content and works it; the boxes that came.
     static QStringList view(const QByteArray& content, const std::string& steps, const std::string& answers = {},
-                            const std::string& password = std::to_string(DayPassword(QDate::currentDate())))
+                            const std::string& password = std::to_string(dayPassword(QDate::currentDate())))
     {
         files::writeBytes(gsCurFolder + file, content);
         ScriptedDesktop desk(("{\"boxes\": [" + answers + "], \"windows\": {\"frmViewXML\": [[" + steps +

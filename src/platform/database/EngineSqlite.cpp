@@ -2,12 +2,11 @@
 #include "platform/RuntimeError.h"
 #include "platform/database/Collation.h"
 #include "platform/database/Engine.h"
+#include "platform/files/Lock.h"
 #include "platform/values.h"
 
-#include <QCryptographicHash>
 #include <QDeadlineTimer>
 #include <QFileInfo>
-#include <QLockFile>
 #include <QSqlDriver>
 #include <QSqlQuery>
 #include <QSqlResult>
@@ -95,15 +94,16 @@ public:
 
     void rebuildIndexes() override { executeNative(u"REINDEX"_s); }
 
-    /// A file beside the database's. One whose process has ended is no lock.
     bool lock(const QString& name, int seconds) override
     {
-        const QByteArray hash = QCryptographicHash::hash(name.toUtf8(), QCryptographicHash::Sha1).toHex();
-        auto file = std::make_unique<QLockFile>(database.databaseName() + u'-' + QString::fromLatin1(hash));
-        file->setStaleLockTime(0);
-        if (!file->tryLock(seconds * 1000) && file->error() == QLockFile::LockFailedError)
-            return false;  // any other failure is one of a folder that can't be written, as the database will tell
-        locks[name] = std::move(file);
+        std::unique_ptr<files::Lock> lock;
+        if (!attempt([&] {
+                lock = std::make_unique<files::Lock>(database.databaseName() + u"-locks"_s, name, seconds * 1000);
+            }))
+            return true;  // the folder can't be written, as the next statement will tell
+        if (!lock->isHeld())
+            return false;
+        locks[name] = std::move(lock);
         return true;
     }
     void unlock(const QString& name) override { locks.erase(name); }
@@ -219,7 +219,7 @@ private:
 
     static int isLate(void* self) { return static_cast<EngineSqlite*>(self)->deadline.hasExpired(); }
 
-    std::map<QString, std::unique_ptr<QLockFile>> locks;
+    std::map<QString, std::unique_ptr<files::Lock>> locks;
     int timeout = 0;
     QDeadlineTimer deadline{QDeadlineTimer::Forever};
 };

@@ -443,7 +443,7 @@ private:
         }
     }
 
-    /// Behind the last token of the SELECT at `i`: the parenthesis that closes around it, or the end.
+    /// behind the last token of the SELECT at `i`: the parenthesis that closes around it, or the end.
     Index endOfSelect(Index i)
     {
         int depth = 0;

@@ -186,6 +186,20 @@ void SystemFile::setMode(unsigned mode)
         throwSystemError(path);
 }
 
+bool SystemFile::lockByte(qint64 at)
+{
+    struct flock range {};
+    range.l_type = F_WRLCK;
+    range.l_whence = SEEK_SET;
+    range.l_start = at;
+    range.l_len = 1;
+    if (withoutInterruption([&] { return ::fcntl(descriptor, F_OFD_SETLK, &range); }) == 0)
+        return true;
+    if (errno != EAGAIN && errno != EACCES)
+        throwSystemError(path);
+    return false;
+}
+
 void SystemFile::commit()
 {
     if (::fsync(descriptor) != 0 && errno != EINVAL && errno != EROFS)  // some file systems can't

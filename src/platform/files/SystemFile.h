@@ -22,6 +22,8 @@ public:
     void write(const QByteArray& bytes);
     void cutTo(qint64 size);
     void setMode(unsigned mode);
+    /// Locks one byte, there or not, until the file is closed. False while another open file has it locked.
+    bool lockByte(qint64 at);
     /// Waits until the bytes are on the disk and closes, so that no failure stays unseen.
     void commit();
 

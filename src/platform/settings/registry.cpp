@@ -1,18 +1,14 @@
 #include "platform/settings/registry.h"
 
 #include "platform/RuntimeError.h"
+#include "platform/files/Lock.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
 #include "platform/settings/RegistryFile.h"
 
-#include <QElapsedTimer>
 #include <QFile>
-#include <QThread>
 
-#include <fcntl.h>
-#include <sys/file.h>
 #include <sys/stat.h>
-#include <unistd.h>
 
 #include <functional>
 #include <mutex>
@@ -105,43 +101,16 @@ RegistryFile readable()
     return content;
 }
 
-/// Keeps other processes and threads from writing. The system takes the lock away from a process that has died.
-class WriteLock {
-public:
-    explicit WriteLock(const QString& path)
-        : descriptor(::open(QFile::encodeName(path).constData(), O_RDWR | O_CREAT | O_CLOEXEC, 0666))
-    {
-        constexpr int longestWait = 10000;  // milliseconds
-        QElapsedTimer waiting;
-        waiting.start();
-        while (descriptor >= 0 && !(locked = ::flock(descriptor, LOCK_EX | LOCK_NB) == 0) &&
-               waiting.elapsed() < longestWait)
-            QThread::msleep(2);
-    }
-    ~WriteLock()
-    {
-        if (descriptor >= 0)
-            ::close(descriptor);
-    }
-    WriteLock(const WriteLock&) = delete;
-    WriteLock& operator=(const WriteLock&) = delete;
-
-    bool isLocked() const { return locked; }
-
-private:
-    int descriptor;
-    bool locked = false;
-};
-
 /// Changes the file as a whole. False when `edit` refuses or when the file cannot be written.
 bool change(const std::function<bool(RegistryFile&)>& edit)
 {
+    constexpr int longestWait = 10000;  // milliseconds
     const QString path = registryPath();
-    const WriteLock lock(path + u".lock"_s);
-    if (!lock.isLocked())
-        return false;
     bool done = false;
     const bool written = attempt([&] {
+        const files::Lock lock(path + u".lock"_s, {}, longestWait);
+        if (!lock.isHeld())
+            return;
         RegistryFile content = present();
         done = edit(content);
         if (done)
