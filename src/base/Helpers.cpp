@@ -1,5 +1,6 @@
 #include "base/Helpers.h"
 
+#include "base/QuoteKey.h"
 #include "platform/values.h"
 
 #include <algorithm>
@@ -57,8 +58,7 @@ QString NormaliseRego(const QString& rego)
 
 QString NormaliseQuoteRef(const QString& reference)
 {
-    const auto [number, subquote] = SplitQuoteRef(reference);
-    return leadingNumber(subquote) > 0 ? number + u'/' + subquote : number;
+    return QuoteKey::fromReference(reference).reference();
 }
 
 std::pair<QString, QString> SplitQuoteRef(const QString& reference)

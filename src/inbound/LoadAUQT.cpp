@@ -1,5 +1,6 @@
 // The insurer accepts a quote, as it stands or with changed lines, under an authority number.
 #include "base/Helpers.h"
+#include "base/QuoteKey.h"
 #include "base/modLoggerEx.h"
 #include "inbound/modLoadXML.h"
 #include "jobexport/WriteQuote.h"
@@ -73,24 +74,24 @@ Authorisation::Authorisation(const xml::Document& message)
 
 /// The quote of that number, else the one of that request, network number and car, whose number and subquote then take
 /// the place of the given ones. Where several are so, the first, and the given ones stand.
-db::Recordset openQuote(const Authorisation& told, QString& number, QString& subquote)
+db::Recordset openQuote(const Authorisation& told, QuoteKey& key)
 {
-    db::Recordset quote = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+    db::Recordset quote =
+        opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key.number, key.subquote));
     if (!quote.eof() || told.originalNumber.trimmed().isEmpty())
         return quote;
     quote = opened(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' AND KESTQuoteNo='{}' AND REGO = '{}'", told.request,
                        told.originalNumber, told.rego));
-    if (quote.recordCount() == 1) {
-        number = quote.text(u"QTNNO"_s);
-        subquote = quote.text(u"Subquote"_s);
-    }
+    if (quote.recordCount() == 1)
+        key = QuoteKey::fromRow(quote);
     return quote;
 }
 
 /// Excess and customer's contribution, which the main quote alone carries. An amount that the quote lacks stays out.
-void takeOverMoney(const Authorisation& told, const QString& number, const QString& subquote)
+void takeOverMoney(const Authorisation& told, const QuoteKey& key)
 {
-    db::Recordset quote = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+    db::Recordset quote =
+        opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key.number, key.subquote));
     const auto has = [&](const QString& column) { return !quote.text(column).trimmed().isEmpty(); };
 
     const double excess = SafeVal(told.excess, u"0"_s);
@@ -143,14 +144,13 @@ bool refusePlainly(const QString& text)
     return false;
 }
 
-void showResults(const db::Recordset& quote, std::optional<db::Recordset>& comparison, const QString& number,
-                 const QString& subquote)
+void showResults(const db::Recordset& quote, std::optional<db::Recordset>& comparison, const QuoteKey& key)
 {
     WriteQuote(quote.text(u"QTNNO"_s), quote.text(u"Subquote"_s));
     if (comparison)
         frmPrintPreview::ShowForm(ComparisonReport, u""_s, &*comparison);
     if (gbSubletDocumentArrived) {
-        frmSubletAuth::ShowForm(number, subquote);
+        frmSubletAuth::ShowForm(key.number, key.subquote);
         gbSubletDocumentArrived = false;
     }
 }
@@ -159,17 +159,19 @@ bool authorise(QString& text)
 {
     const xml::Document message = parsedMessage(text);
     const Authorisation told(message);
-    auto [number, subquote] = SplitQuoteRef(told.reference);
+    QuoteKey key = QuoteKey::fromReference(told.reference);
 
-    db::Recordset quote = openQuote(told, number, subquote);
+    db::Recordset quote = openQuote(told, key);
     if (quote.eof())
         return refuse(u"Couldn't Locate Matching KEST Quote, Please contact MarlinDesk Support."_s);
     const QString rego = told.rego == unknownRego ? quote.text(u"REGO"_s) : told.rego;
     const QVariant rowSubquote = quote.value(u"Subquote"_s);
-    db::Recordset lines = opened(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, rowSubquote));
+    db::Recordset lines =
+        opened(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key.number, rowSubquote));
     if (lines.eof())
         return refusePlainly(u"Error: Cannot load an Authorisation onto a blank quote!"_s);
-    db::Recordset notes = opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, rowSubquote));
+    db::Recordset notes =
+        opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key.number, rowSubquote));
     db::Recordset car = opened(sql("SELECT * FROM CAR WHERE REGO='{}'", rego));
     const db::Recordset insurer =
         opened(sql("SELECT * FROM INSURER WHERE INSURER_ID={}", quote.value(u"INSURER_ID"_s)));
@@ -183,9 +185,9 @@ bool authorise(QString& text)
         notes.addNew();
 
     // before the lines change: it shows them as they are now
-    std::optional<db::Recordset> comparison = BuildAuthReport(message, number, subquote, false);
-    if (subquote == u"0"_s)
-        takeOverMoney(told, number, subquote);
+    std::optional<db::Recordset> comparison = BuildAuthReport(message, key.number, key.subquote, false);
+    if (key.isMain())
+        takeOverMoney(told, key);
     quote.requery();
     fillHeader(quote, told, rego, insurer);
     if (!GetNoteStatus(u"Quote Request"_s, notes.text(u"remarks"_s)).isEmpty())
@@ -202,7 +204,7 @@ bool authorise(QString& text)
     CalcAuthorisedTotals(quote, lines);
     if (comparison)
         finishAuthReport(*comparison, quote, lines);
-    showResults(quote, comparison, number, subquote);
+    showResults(quote, comparison, key);
     return true;
 }
 

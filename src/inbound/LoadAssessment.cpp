@@ -1,5 +1,5 @@
 // What became of a quote after it was sent: adjustments, assessment results and their back-outs, submission responses.
-#include "base/Helpers.h"
+#include "base/QuoteKey.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
 #include "platform/Prompt.h"
@@ -54,12 +54,12 @@ const Transition& backOutOf(const db::Recordset& quote, const db::Recordset& not
 bool LoadADQT(QString& text, const QString& fileName)
 {
     const xml::Document message = parsedMessage(text);
-    const auto [number, subquote] =
-        SplitQuoteRef(message.textOf(u"//rootns:getAdjustedQuoteResponse/rootns:quoteBody/rootns:quoteReference"_s));
+    const QuoteKey key = QuoteKey::fromReference(
+        message.textOf(u"//rootns:getAdjustedQuoteResponse/rootns:quoteBody/rootns:quoteReference"_s));
     const QString request = message.textOf(u"//rootns:quoteRequestNumber"_s);
 
-    db::Recordset quote = opened(
-        sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}' AND KESTQRNo='{}'", number, subquote, request));
+    db::Recordset quote = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}' AND KESTQRNo='{}'",
+                                     key.number, key.subquote, request));
     if (quote.eof() && !request.trimmed().isEmpty())
         quote = opened(sql("SELECT TOP 1 * FROM QUOTE1 WHERE KESTQRNo='{}' order by rec_id DESC", request));
     if (quote.eof())
@@ -116,8 +116,7 @@ bool LoadBACA(QString& text, const QString& fileName)
 
 void LoadSubmissionResponse(QString& text, const QString& fileName)
 {
-    const QString number = fileName.section(u'_', 1, 1);
-    const QString subquote = fileName.section(u'_', 2).left(1);
+    const auto [number, subquote] = QuoteKey::fromResponseName(fileName);
     db::Recordset quote = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
     db::Recordset notes = opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
 

@@ -1,5 +1,6 @@
 // A quote that was written outside the shop's system takes its place among the shop's quotes, with all its lines.
 #include "base/Helpers.h"
+#include "base/QuoteKey.h"
 #include "base/SharedVariables.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
@@ -12,18 +13,12 @@
 #include "reports/PrintXML.h"
 
 #include <optional>
-#include <tuple>
 
 namespace kest {
 
 using namespace Qt::StringLiterals;
 
 namespace {
-
-struct QuoteKey {
-    QString number;
-    QString subquote;
-};
 
 struct ManualQuote {
     explicit ManualQuote(const xml::Document& message);
@@ -47,7 +42,7 @@ ManualQuote::ManualQuote(const xml::Document& message)
     rego = NormaliseRego(element("vehicleRegistration"_L1));
     element("vehicleDescription"_L1);
     isSupplementary = element("quoteBody/rootns:quoteType"_L1).contains(u'S');
-    std::tie(told.number, told.subquote) = SplitQuoteRef(element("quoteBody/rootns:quoteReference"_L1));
+    told = QuoteKey::fromReference(element("quoteBody/rootns:quoteReference"_L1));
 }
 
 QString newNumber(const QString& given, const db::Recordset& cinfo)
@@ -59,11 +54,6 @@ QString newNumber(const QString& given, const db::Recordset& cinfo)
 QString behind(const db::Recordset& quote)
 {
     return QString::number(toLong(quote.value(u"Subquote"_s)) + 1);
-}
-
-QuoteKey keyOf(const db::Recordset& quote)
-{
-    return {quote.text(u"QTNNO"_s), quote.text(u"Subquote"_s)};
 }
 
 /// The next subquote of the quote that it belongs to; none after a box where the shop has no such quote.
@@ -119,18 +109,18 @@ QuoteKey matchMain(const ManualQuote& manual, const db::Recordset& cinfo)
     if (!numbered.eof()) {
         const QString typed = numbered.text(u"Rego"_s);
         if (typed.trimmed().toUpper() == rego)
-            return keyOf(numbered);
+            return QuoteKey::fromRow(numbered);
         if (isOfCar(typed)) {
-            repairRego(typed, manual.rego, keyOf(numbered));
-            return keyOf(numbered);
+            repairRego(typed, manual.rego, QuoteKey::fromRow(numbered));
+            return QuoteKey::fromRow(numbered);
         }
-        return {newNumber(manual.told.number, cinfo), u"0"_s};
+        return {newNumber(manual.told.number, cinfo)};
     }
     const db::Recordset requested =
         opened(sql("SELECT QTNNO, Subquote, Rego FROM QUOTE1 WHERE KESTQRNO='{}'", manual.request));
     if (!isUnknown(manual.request, requested) && isOfCar(requested.text(u"Rego"_s)))
-        return keyOf(requested);
-    return {newNumber(manual.told.number, cinfo), u"0"_s};
+        return QuoteKey::fromRow(requested);
+    return {newNumber(manual.told.number, cinfo)};
 }
 
 void fillHeader(db::Recordset& quote, const ManualQuote& manual, const QuoteKey& key, const db::Recordset& insurer,
@@ -223,8 +213,8 @@ bool LoadMANQ(QString& text, const QString& fileName)
         const db::Recordset standing =
             opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key->number, key->subquote));
         if (isNew && !standing.eof())
-            throw RuntimeError(
-                RowChanged, u"Another workstation has made quote %1/%2 meanwhile."_s.arg(key->number, key->subquote));
+            throw RuntimeError(RowChanged,
+                               u"Another workstation has made quote %1 meanwhile."_s.arg(key->fullReference()));
         quote.update();
     }
     if (!LoadQuoteBody(quote, lines, message))

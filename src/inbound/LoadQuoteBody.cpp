@@ -1,4 +1,5 @@
 // The lines of a message become lines of a quote: section by section, each with a word on what is to happen to it.
+#include "base/QuoteKey.h"
 #include "base/modLoggerEx.h"
 #include "inbound/modLoadXML.h"
 #include "platform/RuntimeError.h"
@@ -92,11 +93,10 @@ bool standOnRow(db::Recordset& rows, Change change, qint64 number)
 
 void fillKey(db::Recordset& row, const db::Recordset& quote, qint64 number)
 {
-    const QString qtnno = quote.text(u"QTNNO"_s);
-    const QString subquote = quote.text(u"Subquote"_s);
+    const QuoteKey key = QuoteKey::fromRow(quote);
     fillColumn(row, {{"QTNNO"_L1, quote.value(u"QTNNO"_s)},
                      {"Subquote"_L1, quote.value(u"Subquote"_s)},
-                     {"SEQ_NO"_L1, NextLineNumber(number, qtnno, subquote)}});
+                     {"SEQ_NO"_L1, NextLineNumber(number, key.number, key.subquote)}});
 }
 
 void fillWhereEmpty(db::Recordset& row, const QString& column, const QVariant& value)
@@ -263,10 +263,10 @@ void Sublet::read(const Line& line)
 
 /// The number of a line that has none but brings a document: above all lines of the quote, or above the line before it
 /// where the quote has none.
-qint64 numberForDocument(const QString& qtnno, const QString& subquote, qint64 before)
+qint64 numberForDocument(const QuoteKey& quote, qint64 before)
 {
     const db::Recordset rows =
-        opened(sql("SELECT MAX(SEQ_NO) FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", qtnno, subquote));
+        opened(sql("SELECT MAX(SEQ_NO) FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quote.number, quote.subquote));
     const QVariant highest = rows.value(rows.columns().constFirst());
     return NextDocumentLine(highest.isNull() ? before : toLong(highest));
 }
@@ -278,11 +278,10 @@ qint64 takeDocument(const db::Recordset& quote, const Line& line, qint64 before)
     const xml::Node document = line.node.selectSingleNode(u"rootns:subletAuthorityDocument"_s);
     if (!document)
         return number;
-    const QString qtnno = quote.text(u"QTNNO"_s);
-    const QString subquote = quote.text(u"Subquote"_s);
+    const QuoteKey key = QuoteKey::fromRow(quote);
     if (number == 0)
-        number = numberForDocument(qtnno, subquote, before);
-    const QString path = NextDocumentName(qtnno, subquote, number);
+        number = numberForDocument(key, before);
+    const QString path = NextDocumentName(key.number, key.subquote, number);
     files::writeBytes(path, files::fromBase64(document.text()));
     gbSubletDocumentArrived = true;
     return number;

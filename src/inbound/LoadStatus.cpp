@@ -1,5 +1,5 @@
 // The six messages that move a quote through its network life without touching its lines.
-#include "base/Helpers.h"
+#include "base/QuoteKey.h"
 #include "base/SharedVariables.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
@@ -27,7 +27,7 @@ constexpr QLatin1StringView noSuchRequest =
 
 db::Recordset openByReference(const QString& reference)
 {
-    const auto [number, subquote] = SplitQuoteRef(reference);
+    const auto [number, subquote] = QuoteKey::fromReference(reference);
     return opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
 }
 
@@ -55,8 +55,9 @@ bool agreesToDeletion()
     return desktop::ask(lines.join(u"\r\n"_s), desktop::Icon::None, {}, desktop::Answer::No);
 }
 
-void deleteQuoteRows(const QVariant& number, const QVariant& subquote)
+void deleteQuoteRows(const QuoteKey& key)
 {
+    const auto& [number, subquote] = key;
     gConn->execute(sql("DELETE FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE={}", number, subquote));
     gConn->execute(sql("DELETE FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE={}", number, subquote));
     gConn->execute(sql("DELETE FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE={}", number, subquote));
@@ -113,22 +114,21 @@ bool LoadQTDL(QString& text, const QString&)
     if (isUnknown(networkNumber, quote))
         return refuse(noSuchQuoteNumber);
 
-    const QVariant number = quote.value(u"QTNNO"_s);
-    const QVariant subquote = quote.value(u"Subquote"_s);
+    const QuoteKey key = QuoteKey::fromRow(quote);
     const QString label = quoteLabel(quote);
     const QString reason = message.textOf(u"//rootns:getQuoteDeletionResponse/rootns:reason"_s);
-    gsDeletedQTNNO = textOrEmpty(number);  // the file is named after a quote that may be gone by then
-    gsDeletedSubquote = textOrEmpty(subquote);
+    gsDeletedQTNNO = key.number;  // the file is named after a quote that may be gone by then
+    gsDeletedSubquote = key.subquote;
 
     // The notes go to the main quote, also where a supplementary quote is deleted.
-    db::Recordset notes = opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='0'", number));
+    db::Recordset notes = opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='0'", key.number));
     bool taken = true;
     if (!isSupplementary(quote)) {
         applyTransition(quoteDeleted, quote, notes, reason);
         quote.update();
         notes.update();
     } else if ((taken = agreesToDeletion())) {
-        deleteQuoteRows(number, subquote);
+        deleteQuoteRows(key);
         applyTransition(supplementaryDeleted, quote, notes, label);
         notes.update();
     }

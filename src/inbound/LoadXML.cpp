@@ -1,4 +1,5 @@
 #include "base/Helpers.h"
+#include "base/QuoteKey.h"
 #include "base/SharedVariables.h"
 #include "base/modLoggerEx.h"
 #include "inbound/modLoadXML.h"
@@ -183,8 +184,7 @@ bool isSupplementary(const db::Recordset& quote)
 
 QString quoteLabel(const db::Recordset& quote)
 {
-    const QString number = quote.text(u"QTNNO"_s);
-    return isSupplementary(quote) ? number + u'/' + quote.text(u"Subquote"_s) : number;
+    return QuoteKey::fromRow(quote).reference();
 }
 
 }  // namespace kest

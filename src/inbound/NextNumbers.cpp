@@ -1,5 +1,6 @@
 // The numbers that a loaded line takes where the message leaves them open: its own, its item code, its document's.
 #include "base/Helpers.h"
+#include "base/QuoteKey.h"
 #include "inbound/modLoadXML.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
@@ -66,8 +67,7 @@ QString freeCode(db::Recordset& rows, std::span<const CodeRange> ranges)
 
 /// The quote of the last number that was worked out, and that number.
 struct LastNumber {
-    QString qtnno;
-    QString subquote;
+    QuoteKey quote{{}, {}};
     qint64 number = 0;
 };
 LastNumber lastNumber;
@@ -80,9 +80,10 @@ qint64 NextLineNumber(qint64 number, const QString& qtnno, const QString& subquo
         return number;
     const db::Recordset rows =
         opened(sql("SELECT MAX(SEQ_NO) FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", qtnno, subquote));
-    const bool isSameQuote = lastNumber.qtnno == qtnno && lastNumber.subquote == subquote;
-    const qint64 highest = isSameQuote ? lastNumber.number : toLong(rows.value(rows.columns().constFirst()));
-    lastNumber = {qtnno, subquote, highest + 1};
+    const QuoteKey quote{qtnno, subquote};
+    const qint64 highest =
+        lastNumber.quote == quote ? lastNumber.number : toLong(rows.value(rows.columns().constFirst()));
+    lastNumber = {quote, highest + 1};
     return lastNumber.number;
 }
 
@@ -117,20 +118,19 @@ QString NextDocumentName(const QString& qtnno, const QString& subquote, qint64 n
 {
     if (qtnno.isEmpty() || subquote.isEmpty())
         return {};
+    const QuoteKey quote{qtnno, subquote};
     QSet<qint64> taken;
     qint64 highest = 0;
     for (const QString& name : files::list(subletFolder(), u"*pdf"_s)) {
-        const bool isOfQuote =
-            name.startsWith(qtnno, Qt::CaseInsensitive) && name.mid(qtnno.size() + 1, subquote.size()) == subquote;
         bool isNumber = false;
         const qint64 found = name.section(u'_', -1).section(u'.', 0, 0).toLongLong(&isNumber);
-        if (!isOfQuote || !isNumber || !name.contains(u'_'))
+        if (!quote.begins(name) || !isNumber || !name.contains(u'_'))
             continue;
         taken.insert(found);
         highest = qMax(highest, found);
     }
     const qint64 free = taken.contains(number) ? highest + 1 : number;
-    return files::pathForWriting(subletFolder(), qtnno + u'.' + subquote + u'_' + QString::number(free) + u".pdf"_s);
+    return files::pathForWriting(subletFolder(), quote.filePrefix() + QString::number(free) + u".pdf"_s);
 }
 
 }  // namespace kest

@@ -1,4 +1,5 @@
 #include "base/Helpers.h"
+#include "base/QuoteKey.h"
 #include "base/SharedVariables.h"
 #include "messagelist/Summary.h"
 #include "messages/Envelope.h"
@@ -146,9 +147,9 @@ void drawThroughKey(MessageRow& row, const xml::Document& message, const QuoteSo
 
 QString claimOfQuote(const QString& reference)
 {
-    const auto [number, subquote] = SplitQuoteRef(reference);
+    const QuoteKey key = QuoteKey::fromReference(reference);
     db::Recordset quote(gConn);
-    quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+    quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key.number, key.subquote));
     if (!suffices(quote, Rows::ExactlyOne))
         return {};
     return quote.isNull(u"Claim"_s) ? u"-"_s : quote.text(u"Claim"_s);

@@ -1,5 +1,6 @@
 #include "messagelist/TakeIn.h"
 
+#include "base/QuoteKey.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "messages/Envelope.h"
@@ -32,9 +33,8 @@ void checkResponse(const xml::Document& document, const QString& name)
     if (document.textOrEmptyOf(u"rootns:kestQuoteNumber"_s).isEmpty() ||
         document.textOrEmptyOf(u"rootns:quoteSubmissionStatus"_s).isEmpty())
         throw Refusal{u"it is no response of the network"_s};
-    if (opened(sql("SELECT QTNNO FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", name.section(u'_', 1, 1),
-                   name.section(u'_', 2).left(1)))
-            .eof())
+    const QuoteKey quote = QuoteKey::fromResponseName(name);
+    if (opened(sql("SELECT QTNNO FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quote.number, quote.subquote)).eof())
         throw Refusal{u"the quote that it answers is not there"_s};
 }
 

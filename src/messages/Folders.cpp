@@ -9,8 +9,6 @@
 #include "platform/values.h"
 
 #include <limits>
-#include <tuple>
-#include <utility>
 
 using namespace Qt::StringLiterals;
 
@@ -40,14 +38,7 @@ constexpr KeySource keySources[] = {
     {"ARES"_L1, KeyKind::NetworkNumber, "//rootns:kestOriginalQuoteNumber"_L1},
 };
 
-using QuoteNumber = std::pair<QString, QString>;  // with its subquote; empty where there is none
-
-QuoteNumber numberOf(const db::Recordset& quote)
-{
-    return {toText(quote.value(u"QTNNO"_s)), toText(quote.value(u"Subquote"_s))};
-}
-
-QuoteNumber newestOfRequest(const QString& request, const QString& version)
+QuoteKey newestOfRequest(const QString& request, const QString& version)
 {
     if (request.isEmpty())
         return {};
@@ -56,10 +47,10 @@ QuoteNumber newestOfRequest(const QString& request, const QString& version)
                    ? sql("SELECT * FROM QUOTE1 WHERE KESTQRNo='{}' ORDER BY rec_id DESC", request)
                    : sql("SELECT * FROM QUOTE1 WHERE KESTQRNo='{}' AND KESTQRVer='{}' ORDER BY rec_id DESC", request,
                          version));
-    return quote.eof() ? QuoteNumber() : numberOf(quote);
+    return quote.eof() ? QuoteKey() : QuoteKey::fromRow(quote);
 }
 
-QuoteNumber lastOfNetworkNumber(const QString& number)
+QuoteKey lastOfNetworkNumber(const QString& number)
 {
     if (number.isEmpty())
         return {};
@@ -68,10 +59,10 @@ QuoteNumber lastOfNetworkNumber(const QString& number)
     if (quote.eof())
         return {};
     quote.moveLast();
-    return numberOf(quote);
+    return QuoteKey::fromRow(quote);
 }
 
-QuoteNumber quoteNumberIn(const xml::Document& message, const KeySource& source)
+QuoteKey quoteKeyIn(const xml::Document& message, const KeySource& source)
 {
     switch (source.kind) {
         case KeyKind::RequestAndVersion:
@@ -80,7 +71,7 @@ QuoteNumber quoteNumberIn(const xml::Document& message, const KeySource& source)
         case KeyKind::Request:
             return newestOfRequest(message.textOf(source.path), {});
         case KeyKind::Reference:
-            return SplitQuoteRef(message.textOf(source.path));
+            return QuoteKey::fromReference(message.textOf(source.path));
         case KeyKind::DeletedQuote:  // the quote has left the database by now
             if (!gsDeletedQTNNO.isEmpty())
                 return {gsDeletedQTNNO, gsDeletedSubquote};
@@ -93,26 +84,23 @@ QuoteNumber quoteNumberIn(const xml::Document& message, const KeySource& source)
 
 // The largest number that a message of this quote and subquote carries in the read folder; 0 where there is none.
 // Fails on a file of theirs whose number is none.
-qint64 runningNumber(const QString& quoteNumber, const QString& subquote)
+qint64 runningNumber(const QuoteKey& quote)
 {
     constexpr qsizetype extension = 4;  // ".xml"
     qint64 largest = 0;
     for (const QString& name : files::list(gsReadPath)) {
-        const bool isOfQuote = name.left(quoteNumber.size()).compare(quoteNumber, Qt::CaseInsensitive) == 0 &&
-                               name.mid(quoteNumber.size() + 1, subquote.size()) == subquote;
-        if (isOfQuote)
-            largest = qMax(
-                largest,
-                toInteger(name.chopped(qMin(extension, name.size())).mid(quoteNumber.size() + subquote.size() + 2)));
+        if (quote.begins(name))
+            largest =
+                qMax(largest, toInteger(name.chopped(qMin(extension, name.size())).mid(quote.filePrefix().size())));
     }
     return largest;
 }
 
-QString numberedName(const QString& quoteNumber, const QString& subquote, qint64 running)
+QString numberedName(const QuoteKey& quote, qint64 running)
 {
     if (running == std::numeric_limits<qint16>::max())
-        throw RuntimeError(Overflow, u"All running numbers of quote %1 are taken"_s.arg(quoteNumber));
-    return quoteNumber + u'.' + subquote + u'_' + QString::number(running + 1) + ".xml"_L1;
+        throw RuntimeError(Overflow, u"All running numbers of quote %1 are taken"_s.arg(quote.number));
+    return quote.filePrefix() + QString::number(running + 1) + ".xml"_L1;
 }
 
 // A quote number comes out of a message: a name that leaves the folder is no name.
@@ -150,22 +138,22 @@ QString GetReadFileName(const QString& path)
     attempt([&] { key = GetMessageQuoteKey(files::read(path)); });
     gsDeletedQTNNO.clear();
     gsDeletedSubquote.clear();
-    if (key.quoteNumber.isEmpty() || key.subquote.isEmpty())
+    if (key.quote.number.isEmpty() || key.quote.subquote.isEmpty())
         return {};
 
     QString name;
     attempt([&] {
-        const qint64 running = runningNumber(key.quoteNumber, key.subquote);
-        name = plainOrNone(key.isQuoteRequest ? key.quoteNumber + ".xml"_L1
-                                              : numberedName(key.quoteNumber, key.subquote, running));
+        const qint64 running = runningNumber(key.quote);
+        name = plainOrNone(key.isQuoteRequest ? key.quote.number + ".xml"_L1 : numberedName(key.quote, running));
     });
     return name;
 }
 
 QString GetMatchedFileName(const QString& quoteNumber)
 {
+    const QuoteKey quote{quoteNumber};
     QString name;
-    attempt([&] { name = plainOrNone(numberedName(quoteNumber, u"0"_s, runningNumber(quoteNumber, u"0"_s))); });
+    attempt([&] { name = plainOrNone(numberedName(quote, runningNumber(quote))); });
     return name;
 }
 
@@ -178,7 +166,7 @@ MessageQuoteKey GetMessageQuoteKey(const QString& text)
         const QString type = message.textOf(u"messageType"_s).toUpper();
         for (const KeySource& source : keySources)
             if (type == source.type)
-                std::tie(key.quoteNumber, key.subquote) = quoteNumberIn(message, source);
+                key.quote = quoteKeyIn(message, source);
         key.isQuoteRequest = type == "QREQ"_L1;
     });
     return key;

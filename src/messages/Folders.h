@@ -1,6 +1,8 @@
 // The life of a message file: its name after a load, and the moves between folders.
 #pragma once
 
+#include "base/QuoteKey.h"
+
 #include <QString>
 
 namespace kest {
@@ -18,8 +20,7 @@ QString GetReadFileName(const QString& path);
 QString GetMatchedFileName(const QString& quoteNumber);
 
 struct MessageQuoteKey {
-    QString quoteNumber;  // empty where the message reaches no quote
-    QString subquote;
+    QuoteKey quote;  // without a number if the message reaches no quote
     bool isQuoteRequest = false;
 };
 MessageQuoteKey GetMessageQuoteKey(const QString& text);

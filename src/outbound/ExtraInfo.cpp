@@ -38,8 +38,8 @@ QString transmissionOf(const db::Recordset& car)
     return transmission == "A"_L1 || transmission == "AUTOMATIC"_L1 ? u"Automatic"_s : u"Manual"_s;
 }
 
-ExtraInfo::ExtraInfo(const QString& quoteNumber, const QString& subquote)
-    : quoteRow(opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quoteNumber, subquote)))
+ExtraInfo::ExtraInfo(const QuoteKey& key)
+    : quoteRow(opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key.number, key.subquote)))
 {
     if (quoteRow.recordCount() != 1) {
         missing = u"Couldn't locate quote in database, Please contact MarlinDesk Support"_s;
@@ -109,7 +109,7 @@ void ExtraInfo::save(const ExtraValues& values)
 
 ExtraInfoResult BuildArrayFromDB(const QString& quoteNumber, const QString& subquote)
 {
-    ExtraInfo info(quoteNumber, subquote);
+    ExtraInfo info({quoteNumber, subquote});
     if (!info.problem().isEmpty())
         return info.problem();
     const ExtraValues values = info.values();

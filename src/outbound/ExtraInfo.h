@@ -1,6 +1,7 @@
 // The extra vehicle information of a quote: read from the quote and its car, and stored there again.
 #pragma once
 
+#include "base/QuoteKey.h"
 #include "platform/database/Recordset.h"
 
 #include <QString>
@@ -34,7 +35,7 @@ using ExtraInfoResult = std::variant<ExtraValues, QString>;
 class ExtraInfo {
 public:
     /// Reads everything of one quote. Where a record is missing `problem` says so, and nothing else may be asked.
-    ExtraInfo(const QString& quoteNumber, const QString& subquote);
+    explicit ExtraInfo(const QuoteKey& key);
 
     const QString& problem() const { return missing; }
 

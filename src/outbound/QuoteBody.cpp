@@ -61,9 +61,10 @@ QString rounded(double amount)
 
 }  // namespace
 
-QuoteBody::QuoteBody(const QString& q, const QString& s, const QString& authorisedNumber)
-    : reference(QString(q + u'/' + s).trimmed()), isMainQuote(s == "0"_L1), isAuthorised(authorisedNumber.size() > 1)
+QuoteBody::QuoteBody(const QuoteKey& key, const QString& authorisedNumber)
+    : reference(key.fullReference().trimmed()), isMainQuote(key.isMain()), isAuthorised(authorisedNumber.size() > 1)
 {
+    const auto& [q, s] = key;
     removeAndReplace =
         opened(sql("SELECT ITEMID, PARTNO, SCRIPT, RRHOUR, RR_RATE2, SEQ_NO FROM QUOTE2 WHERE "
                    "CATEGORY='R&R' AND PARTNO <> 'M' AND REPORT_ON='0' AND SUBQUOTE='{}' AND QTNNO='{}'",

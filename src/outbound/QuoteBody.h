@@ -1,9 +1,10 @@
 // The body of a quote document: its labour, paint, parts, report items and sublets, their sums and the tax.
 #pragma once
 
-#include "platform/xml/Branch.h"
+#include "base/QuoteKey.h"
 #include "outbound/LineNumbers.h"
 #include "platform/database/Recordset.h"
+#include "platform/xml/Branch.h"
 
 #include <QString>
 
@@ -16,7 +17,7 @@ namespace kest {
 class QuoteBody {
 public:
     /// Opens the lines of a quote.
-    QuoteBody(const QString& quoteNumber, const QString& subquote, const QString& authorisedNumber);
+    QuoteBody(const QuoteKey& key, const QString& authorisedNumber);
 
     /// Appends `quoteBody` and gives each line its number, which is stored with the line. The quote total; the walk
     /// ends early where it is 0, since such a quote is not sent.

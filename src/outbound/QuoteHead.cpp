@@ -117,7 +117,7 @@ void addVehicle(const Branch& request, const QuoteRows& rows, const std::optiona
 InsurerReference referenceOf(const QuoteRows& rows)
 {
     InsurerReference reference;
-    if (!rows.isMainQuote()) {
+    if (!rows.key.isMain()) {
         const QString authorised = trimmed(rows.quote, "KESTAuthNo");
         reference.authorisedQuoteNumber = authorised.isEmpty() ? text(rows.mainQuote, "KESTQuoteNo") : authorised;
     } else if (text(rows.quote, "KESTQRNo").isEmpty()) {
@@ -154,7 +154,7 @@ void addHead(const Branch& request, const QuoteRows& rows, const InsurerReferenc
         {"vehicleRegistration", always, trimmed(rows.car, "REGO")},
         {"vehicleDescription", always, QString(text(rows.model, "MAKE") + u' ' + text(rows.model, "MODEL")).trimmed()},
     });
-    if (rows.isMainQuote())
+    if (rows.key.isMain())
         addVehicle(request, rows, extra);
     request.add({
         {"quoteComments", always, text(rows.notes, "P_REMARKS")},

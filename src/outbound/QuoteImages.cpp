@@ -11,9 +11,9 @@ using namespace Qt::StringLiterals;
 
 namespace kest {
 
-QList<QuoteImage> quoteImages(const QString& folder, const QString& quoteNumber, const QString& subquote)
+QList<QuoteImage> quoteImages(const QString& folder, const QuoteKey& quote)
 {
-    const QString stem = quoteNumber + u'_' + subquote;
+    const QString stem = quote.number + u'_' + quote.subquote;
     QList<QuoteImage> images;
     if (!files::folderExists(folder))
         return images;
@@ -34,13 +34,13 @@ QString imageId(const QString& file)
     return number ? numberText(std::trunc(*number)) : QString();
 }
 
-void writeImageDocuments(const QString& folder, const QString& quoteNumber, const QString& subquote)
+void writeImageDocuments(const QString& folder, const QuoteKey& quote)
 {
-    for (const QuoteImage& image : quoteImages(folder, quoteNumber, subquote)) {
+    for (const QuoteImage& image : quoteImages(folder, quote)) {
         xml::Document document;
         const Branch request(document, "request");
         request.add({
-            {"kestQuoteNumber", always, quoteNumber + u'/' + subquote},
+            {"kestQuoteNumber", always, quote.fullReference()},
             {"quoteImageId", always, image.id},
             {"imageType", always, u"JPEG"_s},
             {"imageDescription", always, {}},

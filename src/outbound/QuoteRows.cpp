@@ -13,13 +13,12 @@ namespace {
 void require(const db::Recordset& record, const QString& what, const QuoteRows& rows)
 {
     if (record.eof())
-        throw RuntimeError(NoCurrentRow, u"The %1 of quote %2/%3 is missing."_s.arg(what, rows.number, rows.subquote));
+        throw RuntimeError(NoCurrentRow, u"The %1 of quote %2 is missing."_s.arg(what, rows.key.fullReference()));
 }
 
 }  // namespace
 
-QuoteRows::QuoteRows(db::Recordset& quoteRecord)
-    : quote(quoteRecord), number(quote.text(u"QTNNO"_s)), subquote(quote.text(u"Subquote"_s))
+QuoteRows::QuoteRows(db::Recordset& quoteRecord) : quote(quoteRecord), key(QuoteKey::fromRow(quoteRecord))
 {
     car =
         opened(sql("SELECT TOP 1 REGO, BODY_ID2, MODEL_ID, CUST_ID, YEAR, COLOUR, CYLINDERS, PAINT_GP, XMISSION, "
@@ -35,10 +34,10 @@ QuoteRows::QuoteRows(db::Recordset& quoteRecord)
     body = opened(sql("SELECT body_id2, body_desc2 FROM BODY2 WHERE BODY2.body_id2='{}'", car.value(u"BODY_ID2"_s)));
     notes = opened(
         sql("SELECT QTNNO, SUBQUOTE, REMARKS, P_REMARKS, INCIDENT_NOTES FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'",
-            number, subquote));
+            key.number, key.subquote));
     require(notes, u"notes row"_s, *this);
-    if (!isMainQuote())
-        mainQuote = opened(sql("select * from quote1 where qtnno = '{}' and subquote = '0'", number));
+    if (!key.isMain())
+        mainQuote = opened(sql("select * from quote1 where qtnno = '{}' and subquote = '0'", key.number));
 }
 
 QString text(const db::Recordset& record, const char* column)

@@ -1,6 +1,7 @@
 // The records that a quote document is made of, read once at its start.
 #pragma once
 
+#include "base/QuoteKey.h"
 #include "platform/database/Recordset.h"
 
 #include <QString>
@@ -11,16 +12,13 @@ struct QuoteRows {
     explicit QuoteRows(db::Recordset& quoteRecord);
 
     db::Recordset& quote;
-    QString number;
-    QString subquote;
+    QuoteKey key;
     db::Recordset car;
     db::Recordset customer;
     db::Recordset model;
     db::Recordset body;  // may hold no row: not every car has a known body
     db::Recordset notes;
     db::Recordset mainQuote;  // open for a supplementary quote only
-
-    bool isMainQuote() const { return subquote == QLatin1String("0"); }
 };
 
 /// A column without the blanks around it; a Null, and a column of a record without a row, is empty.

@@ -1,6 +1,7 @@
 #include "outbound/SendQuote.h"
 
 #include "base/Helpers.h"
+#include "base/QuoteKey.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "outbound/modCreateXML.h"
@@ -43,8 +44,9 @@ QString mainQuoteRefusal(const db::Recordset& quote, const QString& remarks)
 }
 
 /// Why the quote may not go; empty where it may.
-QString refusalOf(const db::Recordset& quote, const QString& number, const QString& subquote)
+QString refusalOf(const db::Recordset& quote, const QuoteKey& key)
 {
+    const auto& [number, subquote] = key;
     const db::Recordset zeroQuantities = opened(
         sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}' AND CATEGORY='PRT' AND QTY=0", number, subquote));
     if (!zeroQuantities.eof())
@@ -62,7 +64,7 @@ QString refusalOf(const db::Recordset& quote, const QString& number, const QStri
         return GetNoteStatus(u"Quote Request"_s, remarks) == "Cancelled"_L1
                    ? u"This quote request has been cancelled, Quote cannot be sent."_s
                    : u"This quote has already been submitted to ORLA, you cannot send a quote twice."_s;
-    if (subquote != "0"_L1)
+    if (!key.isMain())
         return GetNoteStatus(u"KEST Quote"_s, remarks) == "Submitted"_L1
                    ? u"This additional has already been submitted to ORLA, you cannot send a quote twice."_s
                    : QString();
@@ -86,10 +88,10 @@ double SendQuote(db::Recordset& quote, bool* sent)
     quote = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' ORDER BY SUBQUOTE DESC", number));
     if (quote.eof())
         return refuse(quoteNotFound);
-    const QString subquote = quote.text(u"Subquote"_s);
-    quote = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+    const QuoteKey key{number, quote.text(u"Subquote"_s)};
+    quote = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key.number, key.subquote));
 
-    if (const QString refusal = refusalOf(quote, number, subquote); !refusal.isEmpty())
+    if (const QString refusal = refusalOf(quote, key); !refusal.isEmpty())
         return refuse(refusal);
 
     RoundQuoteLines(quote);

@@ -55,7 +55,7 @@ bool isEnter(int key)
 
 ExtraInfoResult frmExtraInfo::ShowForm(const QString& quoteNumber, const QString& subquote)
 {
-    ExtraInfo info(quoteNumber, subquote);
+    ExtraInfo info({quoteNumber, subquote});
     if (!info.problem().isEmpty())
         return info.problem();
     frmExtraInfo form(info);

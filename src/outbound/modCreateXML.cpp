@@ -32,7 +32,7 @@ double refuse(const QString& message)
 /// The name of the quote's next document, counted by those that have gone out: one that still waits is replaced.
 QString documentName(const QuoteRows& rows)
 {
-    const QString stem = rows.number + u'.' + rows.subquote + u'_';
+    const QString stem = rows.key.filePrefix();
     QSet<QString> sent;
     if (files::folderExists(gsSentPath))
         for (const QString& name : files::list(gsSentPath, stem + u"*.xml"_s))
@@ -42,10 +42,9 @@ QString documentName(const QuoteRows& rows)
         if (!sent.contains(name.toUpper()))
             return name;
     }
-    throw RuntimeError(
-        FileExists,
-        u"All %1 documents of quote %2/%3 have been sent, there is no name for another one."_s.arg(highestFileNumber)
-            .arg(rows.number, rows.subquote));
+    throw RuntimeError(FileExists, u"All %1 documents of quote %2 have been sent, there is no name for another one."_s
+                                       .arg(highestFileNumber)
+                                       .arg(rows.key.fullReference()));
 }
 
 /// The text between the root's tags: the transport puts a root of its own around it.
@@ -58,7 +57,7 @@ QString withoutRoot(const QString& text)
 void addImages(const Branch& request, const QuoteRows& rows)
 {
     const QString folder = GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"ImagesPath"_s, u"c:\\wirimg\\"_s);
-    const QList<QuoteImage> images = quoteImages(folder, rows.number, rows.subquote);
+    const QList<QuoteImage> images = quoteImages(folder, rows.key);
     request.add("imageCount", QString::number(images.size()));
     if (images.isEmpty())
         return;
@@ -69,7 +68,7 @@ void addImages(const Branch& request, const QuoteRows& rows)
 
 void markAsSent(QuoteRows& rows)
 {
-    if (rows.isMainQuote() && !text(rows.quote, "KESTQRNo").isEmpty())
+    if (rows.key.isMain() && !text(rows.quote, "KESTQRNo").isEmpty())
         applyTransition(requestAnswered, rows.quote, rows.notes);
     applyTransition(quoteSent, rows.quote, rows.notes);
     rows.quote.update();
@@ -81,18 +80,19 @@ void markAsSent(QuoteRows& rows)
 double CreateQuoteXML(db::Recordset& quote)
 {
     QuoteRows rows(quote);
-    files::pathForWriting(gsUnsentPath, rows.number + u'.' + rows.subquote);  // fails before anything is changed
-    QuoteBody body(rows.number, rows.subquote, text(quote, "KESTAuthNo"));
+    const auto& [number, subquote] = rows.key;
+    files::pathForWriting(gsUnsentPath, number + u'.' + subquote);  // fails before anything is changed
+    QuoteBody body(rows.key, text(quote, "KESTAuthNo"));
 
     if (rows.model.eof() || text(rows.model, "MAKE").toUpper().contains("UNIVERSAL"_L1))
         return refuse(u"Please Select a Make and Model for this car"_s);
     const InsurerReference reference = referenceOf(rows);
-    if (!rows.isMainQuote() && reference.authorisedQuoteNumber.trimmed().isEmpty())
+    if (!rows.key.isMain() && reference.authorisedQuoteNumber.trimmed().isEmpty())
         return refuse(u"The main quote has no ORLA quote number yet, this additional cannot be sent."_s);
 
     const bool asked = isTrue(quote.value(u"ExtraInfo"_s));
     const ExtraInfoResult answer =
-        asked ? frmExtraInfo::ShowForm(rows.number, rows.subquote) : BuildArrayFromDB(rows.number, rows.subquote);
+        asked ? frmExtraInfo::ShowForm(number, subquote) : BuildArrayFromDB(number, subquote);
     if (asked && std::holds_alternative<QString>(answer))
         return refuse(std::get<QString>(answer));
     std::optional<ExtraValues> extra;
@@ -121,7 +121,7 @@ double CreateQuoteXML(db::Recordset& quote)
 
 void CreateImageXML(const QString& imagesPath, db::Recordset& quote)
 {
-    writeImageDocuments(imagesPath, quote.text(u"QTNNO"_s), quote.text(u"Subquote"_s));
+    writeImageDocuments(imagesPath, QuoteKey::fromRow(quote));
 }
 
 }  // namespace kest

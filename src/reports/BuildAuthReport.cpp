@@ -1,6 +1,6 @@
 #include "reports/BuildAuthReport.h"
 
-#include "base/Helpers.h"
+#include "base/QuoteKey.h"
 #include "base/SharedVariables.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
@@ -10,26 +10,23 @@
 #include "quotedata/Rounding.h"
 #include "reports/QuoteComparison.h"
 
-#include <tuple>
-
 namespace kest {
 
 using namespace Qt::StringLiterals;
 
 namespace {
 
-std::pair<QString, QString> quoteOf(const xml::Document& document)
+QuoteKey quoteOf(const xml::Document& document)
 {
-    return SplitQuoteRef(document.textOf(u"//rootns:quoteBody/rootns:quoteReference"_s));
+    return QuoteKey::fromReference(document.textOf(u"//rootns:quoteBody/rootns:quoteReference"_s));
 }
 
 /// The quote of the message's request; where there is none it is closed, and a box has said so.
-db::Recordset openQuote(const xml::Document& document, const QString& number, const QString& subquote,
-                        const QString& refusal)
+db::Recordset openQuote(const xml::Document& document, const QuoteKey& key, const QString& refusal)
 {
     db::Recordset quote(gConn);
-    quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}' AND KESTQRNo='{}'", number, subquote,
-                   document.textOf(u"//rootns:quoteRequestNumber"_s)));
+    quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}' AND KESTQRNo='{}'", key.number,
+                   key.subquote, document.textOf(u"//rootns:quoteRequestNumber"_s)));
     if (quote.eof()) {
         desktop::msgBox(refusal, desktop::Icon::Critical);
         quote.close();
@@ -125,10 +122,13 @@ std::optional<db::Recordset> BuildAuthReport(const xml::Document& document, QStr
                                              bool Reprint)
 {
     try {
-        if (quoteNumber.isEmpty())
-            std::tie(quoteNumber, subquote) = quoteOf(document);
+        if (quoteNumber.isEmpty()) {
+            const QuoteKey told = quoteOf(document);
+            quoteNumber = told.number;
+            subquote = told.subquote;
+        }
         db::Recordset quote =
-            openQuote(document, quoteNumber, subquote,
+            openQuote(document, {quoteNumber, subquote},
                       u"Matching quote was not found in database, Please contact MarlinDesk Support."_s);
         if (!quote.isOpen())
             return {};
@@ -155,9 +155,8 @@ void finishAuthReport(db::Recordset& table, const db::Recordset& quote, db::Reco
 
 bool fillAdjustedReport(db::Recordset& table, const xml::Document& document, bool Reprint)
 {
-    const auto [number, subquote] = quoteOf(document);
     const db::Recordset quote =
-        openQuote(document, number, subquote, u"Quote not found in database. Please contact MarlinDesk Support."_s);
+        openQuote(document, quoteOf(document), u"Quote not found in database. Please contact MarlinDesk Support."_s);
     if (!quote.isOpen())
         return false;
     db::Recordset lines = openLines(quote);

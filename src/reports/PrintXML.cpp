@@ -1,6 +1,7 @@
 #include "reports/PrintXML.h"
 
 #include "base/Helpers.h"
+#include "base/QuoteKey.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "messages/Envelope.h"
@@ -22,7 +23,6 @@
 #include <functional>
 #include <optional>
 #include <span>
-#include <tuple>
 
 namespace kest {
 
@@ -215,12 +215,10 @@ bool printAdjusted(const xml::Document& message, bool Reprint)
 }
 
 /// A document's name begins with the quote number, one more character, and the subquote.
-bool hasSubletDocument(const QString& number, const QString& subquote)
+bool hasSubletDocument(const QuoteKey& quote)
 {
     const QStringList names = files::list(subletFolder());
-    return std::ranges::any_of(names, [&](const QString& name) {
-        return name.startsWith(number, Qt::CaseInsensitive) && name.mid(number.size() + 1, subquote.size()) == subquote;
-    });
+    return std::ranges::any_of(names, [&](const QString& name) { return quote.begins(name); });
 }
 
 bool printAuthorised(const xml::Document& message, bool Reprint)
@@ -229,9 +227,9 @@ bool printAuthorised(const xml::Document& message, bool Reprint)
     QString subquote;
     std::optional<db::Recordset> table = BuildAuthReport(message, number, subquote, Reprint);
     frmPrintPreview::ShowForm(ComparisonReport, u""_s, table ? &*table : nullptr);
-    std::tie(number, subquote) = SplitQuoteRef(message.textOf(u"//rootns:quoteBody/rootns:quoteReference"_s));
-    if (hasSubletDocument(number, subquote))
-        frmSubletAuth::ShowForm(number, subquote);
+    const QuoteKey quote = QuoteKey::fromReference(message.textOf(u"//rootns:quoteBody/rootns:quoteReference"_s));
+    if (hasSubletDocument(quote))
+        frmSubletAuth::ShowForm(quote.number, quote.subquote);
     return table.has_value();
 }
 

@@ -19,9 +19,9 @@ QString subletFolder()
     return QString(gsUnreadPath).remove(lastName) + u"PDF\\"_s;
 }
 
-QStringList subletDocumentNumbers(const QString& QTNNO, const QString& Subquote)
+QStringList subletDocumentNumbers(const QuoteKey& quote)
 {
-    const QString start = QTNNO + u'.' + Subquote;
+    const QString start = quote.number + u'.' + quote.subquote;
     QStringList files;
     attempt([&] { files = files::list(subletFolder()); });
 
@@ -36,11 +36,13 @@ QStringList subletDocumentNumbers(const QString& QTNNO, const QString& Subquote)
     return numbers;
 }
 
-QList<SubletDocument> subletDocuments(const QString& QTNNO, const QString& Subquote, const QStringList& numbers)
+QList<SubletDocument> subletDocuments(const QuoteKey& quote, const QStringList& numbers)
 {
     db::Recordset lines(gConn);
     db::Recordset vendors(gConn);
-    attempt([&] { lines.open(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", QTNNO, Subquote)); });
+    attempt([&] {
+        lines.open(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quote.number, quote.subquote));
+    });
     attempt([&] { vendors.open(u"SELECT VENDOR_ID, NAME FROM VENDOR"_s); });
 
     QList<SubletDocument> documents;
@@ -49,7 +51,7 @@ QList<SubletDocument> subletDocuments(const QString& QTNNO, const QString& Subqu
             lines.setFilter(sql("Seq_no = '{}'", number));
             if (lines.eof())
                 return;
-            const QString file = QTNNO + u'.' + Subquote + u'_' + number + u".pdf"_s;
+            const QString file = quote.filePrefix() + number + u".pdf"_s;
             documents.append({file, number, lines.text(u"script"_s), {}});
             const QVariant vendor = lines.value(u"VENDOR"_s);
             if (vendor.isNull() || toDouble(vendor) <= 0)

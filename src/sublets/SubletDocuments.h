@@ -1,6 +1,8 @@
 // The documents that authorise sublet work: PDF files beside the message folders, one for a line of a quote.
 #pragma once
 
+#include "base/QuoteKey.h"
+
 #include <QList>
 #include <QString>
 
@@ -18,9 +20,9 @@ struct SubletDocument {
 
 /// The numbers in the file names that begin with the quote, each once, in the order of the names; empty where the
 /// folder can't be read. Subquote 1 finds those of subquote 10 too: which of them it has shows in its lines.
-QStringList subletDocumentNumbers(const QString& QTNNO, const QString& Subquote);
+QStringList subletDocumentNumbers(const QuoteKey& quote);
 
 /// The documents of these numbers whose line is in the quote. What can't be read is left out.
-QList<SubletDocument> subletDocuments(const QString& QTNNO, const QString& Subquote, const QStringList& numbers);
+QList<SubletDocument> subletDocuments(const QuoteKey& quote, const QStringList& numbers);
 
 }  // namespace kest

@@ -70,10 +70,11 @@ frmSubletAuth::frmSubletAuth(const QList<SubletDocument>& documents)
 
 void frmSubletAuth::ShowForm(const QString& QTNNO, const QString& Subquote)
 {
-    const QStringList numbers = subletDocumentNumbers(QTNNO, Subquote);
+    const QuoteKey quote{QTNNO, Subquote};
+    const QStringList numbers = subletDocumentNumbers(quote);
     if (numbers.isEmpty())
         return;
-    const QList<SubletDocument> documents = subletDocuments(QTNNO, Subquote, numbers);
+    const QList<SubletDocument> documents = subletDocuments(quote, numbers);
     QJsonArray rows;
     for (const SubletDocument& document : documents)
         rows.append(QJsonArray{document.description, document.vendor});

@@ -1,13 +1,13 @@
 #include "utilities/frmUtilities.h"
 
-#include "platform/database/Sql.h"
-#include "platform/Prompt.h"
-#include "platform/desktop/Window.h"
-#include "platform/values.h"
-#include "quotedata/NoteChain.h"
 #include "base/Helpers.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
+#include "platform/Prompt.h"
+#include "platform/database/Sql.h"
+#include "platform/desktop/Window.h"
+#include "platform/values.h"
+#include "quotedata/NoteChain.h"
 #include "utilities/ExactTextEdit.h"
 #include "utilities/StatusRepair.h"
 
@@ -65,10 +65,9 @@ QString firstValueOf(const QString& select)
 
 }  // namespace
 
-frmUtilities::frmUtilities(const QString& quoteNumber, const QString& shownSubquote)
+frmUtilities::frmUtilities(const QuoteKey& key)
     : Form(u"frmUtilities"_s, u"Utilities"_s),
-      number(quoteNumber),
-      subquote(shownSubquote),
+      shown(key),
       quote(gConn),
       lines(gConn),
       remarks(gConn),
@@ -172,7 +171,7 @@ QLineEdit* frmUtilities::box(QLatin1StringView name) const
 void frmUtilities::ShowForm(const QString& sQTNNO, const QString& sSubQuote)
 {
     EnsureConnection();
-    frmUtilities form(sQTNNO, sSubQuote.isEmpty() ? u"0"_s : sSubQuote);
+    frmUtilities form({sQTNNO, sSubQuote.isEmpty() ? u"0"_s : sSubQuote});
     form.AddTabs();
     form.OpenRows();
     form.Fill();
@@ -186,13 +185,13 @@ void frmUtilities::AddTabs()
     };
     add(u"Quote"_s, u"0"_s);
     db::Recordset subquotes(gConn);
-    subquotes.open(sql("SELECT SUBQUOTE FROM QUOTE1 WHERE QTNNO='{}'", number));
+    subquotes.open(sql("SELECT SUBQUOTE FROM QUOTE1 WHERE QTNNO='{}'", shown.number));
     if (subquotes.recordCount() > 1) {
         for (subquotes.moveNext(); !subquotes.eof(); subquotes.moveNext())
             add(u"Add.-"_s + subquotes.text(u"SUBQUOTE"_s), subquotes.text(u"SUBQUOTE"_s));
     }
     for (int tab = TabStrip1->count() - 1; tab >= 0; --tab) {  // of two with one subquote the first
-        if (TabStrip1->tabData(tab).toString() == u'S' + subquote)
+        if (TabStrip1->tabData(tab).toString() == u'S' + shown.subquote)
             TabStrip1->setCurrentIndex(tab);
     }
     shownTab = TabStrip1->currentIndex();
@@ -202,9 +201,9 @@ void frmUtilities::AddTabs()
 
 void frmUtilities::OpenRows()
 {
-    quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
-    lines.open(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
-    remarks.open(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+    quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", shown.number, shown.subquote));
+    lines.open(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", shown.number, shown.subquote));
+    remarks.open(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", shown.number, shown.subquote));
 }
 
 void frmUtilities::CloseRows()
@@ -220,8 +219,7 @@ void frmUtilities::Fill()
         if (!field.column.isEmpty())
             box(field.name)->setText(quote.text(field.column));
     }
-    const bool isMainQuote = subquote == u"0"_s;
-    box("txtQTNNO"_L1)->setText(quote.text(u"QTNNO"_s) + (isMainQuote ? QString() : u'/' + subquote));
+    box("txtQTNNO"_L1)->setText(QuoteKey{quote.text(u"QTNNO"_s), shown.subquote}.reference());
     box("txtJobStage"_L1)
         ->setText(firstValueOf(sql("SELECT description FROM JOBSTAGE WHERE stage={}", quote.value(u"Job_stage"_s))));
     box("txtInsurer"_L1)
@@ -234,16 +232,18 @@ void frmUtilities::Fill()
 void frmUtilities::TabStrip1_Click()
 {
     EnsureConnection();
-    const QString wanted = TabStrip1->tabData(TabStrip1->currentIndex()).toString().mid(1);
+    QuoteKey wanted{shown.number, TabStrip1->tabData(TabStrip1->currentIndex()).toString().mid(1)};
     db::Recordset chosen(gConn);
-    chosen.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, wanted));
+    chosen.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", wanted.number, wanted.subquote));
     if (chosen.eof()) {
         const QSignalBlocker silent(TabStrip1);
         TabStrip1->setCurrentIndex(shownTab);
-        throw RuntimeError(NoCurrentRow, u"Quote %1/%2 is no longer there."_s.arg(number, wanted));
+        throw RuntimeError(NoCurrentRow, u"Quote %1 is no longer there."_s.arg(wanted.fullReference()));
     }
     shownTab = TabStrip1->currentIndex();
-    subquote = wanted.isEmpty() ? u"0"_s : wanted;
+    if (wanted.subquote.isEmpty())
+        wanted.subquote = u"0"_s;
+    shown = wanted;
     Command9_Click();
 }
 
@@ -324,7 +324,7 @@ void frmUtilities::SetStatus(const StatusRepair& repair)
     if (repair.forgetsQuoteNumber)
         box("txtQuoteNo"_L1)->clear();
     for (const StatusRepair::Note& note : repair.added) {
-        if (!note.mainQuoteOnly || subquote == u"0"_s)
+        if (!note.mainQuoteOnly || shown.isMain())
             chain = AddNote(note.subject, note.status, chain, {}, false);
     }
     txtRemarks->setExactText(chain);

@@ -1,6 +1,7 @@
 // A quote's network fields, to be put right by hand when the quote and the insurer have fallen out of step.
 #pragma once
 
+#include "base/QuoteKey.h"
 #include "platform/database/Recordset.h"
 #include "platform/desktop/Form.h"
 
@@ -22,7 +23,7 @@ public:
     static void ShowForm(const QString& sQTNNO, const QString& sSubQuote);
 
 private:
-    frmUtilities(const QString& quoteNumber, const QString& shownSubquote);
+    explicit frmUtilities(const QuoteKey& key);
     QWidget* quoteInformation();
     QWidget* setQuoteStatus();
     QWidget* closingButtons();
@@ -43,9 +44,7 @@ private:
     void Command9_Click();  // Undo
     void SetStatus(const StatusRepair& repair);
 
-    // of what is shown; the row itself may go
-    QString number;
-    QString subquote;
+    QuoteKey shown;  // the row itself may go
     int shownTab = 0;
 
     db::Recordset quote;    // of QUOTE1

@@ -42,12 +42,12 @@ TEST_F(Sublet, ADocumentBelongsToTheQuoteWithWhoseNumberItsNameBegins)
     for (const char* name : {"500.1_7.pdf", "500.1_12.PDF", "500.1_7.old.pdf", "500.10_4.pdf", "500.0_3.pdf",
                              "5001.1_3.pdf", "500.1_0.pdf", "500.1_x.pdf", "500.1_-2.pdf", "500.1.pdf"})
         document(name);
-    EXPECT_EQ(subletDocumentNumbers(u"500"_s, u"1"_s), (QStringList{u"4"_s, u"12"_s, u"7"_s}));
+    EXPECT_EQ(subletDocumentNumbers({u"500"_s, u"1"_s}), (QStringList{u"4"_s, u"12"_s, u"7"_s}));
     document("Q7.0_2.pdf");
-    EXPECT_EQ(subletDocumentNumbers(u"q7"_s, u"0"_s), QStringList(u"2"_s));
-    EXPECT_EQ(subletDocumentNumbers(u"500"_s, u"10"_s), QStringList(u"4"_s));
+    EXPECT_EQ(subletDocumentNumbers({u"q7"_s, u"0"_s}), QStringList(u"2"_s));
+    EXPECT_EQ(subletDocumentNumbers({u"500"_s, u"10"_s}), QStringList(u"4"_s));
     gsUnreadPath = u"c:\\nowhere\\AUnread\\"_s;
-    EXPECT_EQ(subletDocumentNumbers(u"500"_s, u"1"_s), QStringList());
+    EXPECT_EQ(subletDocumentNumbers({u"500"_s, u"1"_s}), QStringList());
 }
 
 TEST_F(Sublet, TheListShowsLineAndVendorAndLeavesOutWhatHasNoLine)
