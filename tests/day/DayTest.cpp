@@ -7,6 +7,7 @@
 #include "platform/values.h"
 #include "setup/Profile.h"
 #include "shell/component.h"
+#include "support/Places.h"
 #include "support/Cases.h"
 #include "support/MariaDbServer.h"
 #include "support/Snapshot.h"
@@ -162,7 +163,7 @@ TEST(Day, LeavesAfterEachStepWhatItShouldAndTheSameEachTime)
     const QMap<QString, QStringList> expected = expectedSteps();
     EXPECT_EQ(app::Day::steps(), expected.keys());
     MariaDbServer server;
-    server.createDatabase(u"jobs"_s, files::read(QStringLiteral(KEST_SOURCE_DIR "/sql/joblink.sql")));
+    server.createDatabase(u"jobs"_s, files::read(checkoutFile(u"sql/joblink.sql"_s)));
 
     Holdings before;
     const std::string first = played(server, [&](const QString& step, const desktop::Record& shown) {

@@ -5,6 +5,7 @@
 #include "platform/database/FaultInjection.h"
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
+#include "support/Places.h"
 #include "support/MariaDbServer.h"
 #include "support/Shop.h"
 
@@ -22,7 +23,7 @@ class JobLink : public Shop {
 protected:
     JobLink()
     {
-        mariaDb().createDatabase(u"jobs"_s, files::read(QStringLiteral(KEST_SOURCE_DIR "/sql/joblink.sql")));
+        mariaDb().createDatabase(u"jobs"_s, files::read(checkoutFile(u"sql/joblink.sql"_s)));
         jobs = std::make_shared<db::Connection>();
         jobs->open(mariaDb().connectionText(u"jobs"_s));
         InitCipherKey();

@@ -1,6 +1,7 @@
 #include "loopback/InsurerRules.h"
 #include "platform/RuntimeError.h"
 #include "platform/files/files.h"
+#include "support/Places.h"
 #include "support/Cases.h"
 
 #include <gtest/gtest.h>
@@ -29,7 +30,7 @@ TEST(InsurerRules, AFaultIsToldWithItsLine)
         EXPECT_EQ(faultsOf(row[0]), row[1]);
     EXPECT_TRUE(
         faultsOf(u"on quote 1\n authorize"_s).startsWith(u"line 2: \"authorize\" is no step; a step is request"_s));
-    EXPECT_EQ(faultsOf(files::read(QStringLiteral(KEST_SOURCE_DIR "/sql/demo/insurer.rules"))), QString());
+    EXPECT_EQ(faultsOf(files::read(checkoutFile(u"sql/demo/insurer.rules"_s))), QString());
     EXPECT_TRUE(faultsOf(u"on monday"_s).startsWith(u"line 1: an occasion is: on start, on quote"_s));
 }
 

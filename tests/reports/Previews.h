@@ -1,6 +1,7 @@
 // The reports that a test's desktop has shown, and the shop's templates for them.
 #pragma once
 
+#include "support/Places.h"
 #include "support/Shop.h"
 
 #include <QFile>
@@ -18,7 +19,7 @@ protected:
     {
         files::makeFolder(u"c:\\wirra32\\report"_s);
         for (const char* name : {"710.html", "720.html", "730.html"})
-            putTemplate(name, files::readBytes(QStringLiteral(KEST_SOURCE_DIR "/templates/") + QLatin1String(name)));
+            putTemplate(name, files::readBytes(checkoutFile(u"templates/"_s + QLatin1String(name))));
     }
 
     /// Puts a template under the report's name.

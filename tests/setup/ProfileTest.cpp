@@ -5,6 +5,7 @@
 #include "setup/Profile.h"
 #include "setup/QuoteDatabase.h"
 #include "shell/component.h"
+#include "support/Places.h"
 #include "support/OdbcDrivers.h"
 #include "support/Shop.h"
 
@@ -169,7 +170,7 @@ TEST(Schema, HasTheSameColumnsOnAllEngines)
 {
     const auto columns = [](const QString& name) {
         QStringList words;
-        const QStringList lines = files::read(QStringLiteral(KEST_SOURCE_DIR "/sql/") + name).split(u'\n');
+        const QStringList lines = files::read(checkoutFile(u"sql/"_s + name)).split(u'\n');
         for (const QString& line : lines)
             if (!line.startsWith(u"--"_s) && !line.startsWith(u')'))
                 words << line.simplified().section(u' ', 0, line.startsWith(u' ') ? 0 : 2) +

@@ -1,3 +1,4 @@
+#include "support/Places.h"
 #include "support/Cases.h"
 
 #include <QFile>
@@ -20,7 +21,7 @@ QString unquoted(const QString& text)
 
 QByteArray dataFile(const std::string& name)
 {
-    QFile file(QString::fromStdString(KEST_SOURCE_DIR "/tests/data/" + name));
+    QFile file(checkoutFile(u"tests/data/"_s + QString::fromStdString(name)));
     if (!file.open(QIODevice::ReadOnly))
         throw std::runtime_error("no file " + name);
     return file.readAll();

@@ -1,3 +1,4 @@
+#include "support/Places.h"
 #include "support/MariaDbServer.h"
 
 #include "platform/RuntimeError.h"
@@ -91,7 +92,7 @@ void MariaDbServer::start()
     server.setChildProcessModifier([] { prctl(PR_SET_PDEATHSIG, SIGKILL); });
     server.start(
         program(u"mariadbd"_s),
-        {QStringLiteral("--defaults-file=" KEST_SOURCE_DIR "/tests/data/mariadb.cnf"), u"--user="_s + thisUser(),
+        {u"--defaults-file="_s + checkoutFile(u"tests/data/mariadb.cnf"_s), u"--user="_s + thisUser(),
          u"--datadir="_s + folder.filePath(u"data"_s), u"--port="_s + QString::number(tcpPort),
          u"--socket="_s + folder.filePath(u"s.sock"_s), u"--pid-file="_s + folder.filePath(u"pid"_s)});
     const QDeadlineTimer deadline(startMilliseconds);

@@ -1,3 +1,4 @@
+#include "support/Places.h"
 #include "support/TdsServer.h"
 
 #include "platform/database/Connection.h"
@@ -28,7 +29,7 @@ constexpr int stopMilliseconds = 10000;
 
 TdsServer::TdsServer() : folder_(serverFolder(u"tds"_s))
 {
-    QStringList arguments{u"-B"_s,       QStringLiteral(KEST_SOURCE_DIR "/tests/support/tds/standin.py"),
+    QStringList arguments{u"-B"_s,       checkoutFile(u"tests/support/tds/standin.py"_s),
                           u"--folder"_s, folder_.path(),
                           u"--login"_s,  user() + u':'};
     if (const QString statements = qEnvironmentVariable("KEST2_TDS_STATEMENTS"); !statements.isEmpty())

@@ -9,6 +9,7 @@
 #include "platform/files/files.h"
 #include "reports/frmPrintPreview.h"
 #include "base/SharedVariables.h"
+#include "support/Places.h"
 #include "support/Hands.h"
 #include "utilities/frmLogin.h"
 #include "utilities/frmUtilities.h"
@@ -59,7 +60,7 @@ bool isControl(const QWidget& widget)
 EveryWindow::EveryWindow()
 {
     files::makeFolder(u"c:\\wirra32\\report"_s);
-    files::writeBytes(u"c:\\wirra32\\report\\710.html"_s, files::readBytes(KEST_SOURCE_DIR "/templates/710.html"_L1));
+    files::writeBytes(u"c:\\wirra32\\report\\710.html"_s, files::readBytes(checkoutFile(u"templates/710.html"_s)));
     arrive("a.xml", quoteRequest("QR1"));
     arrive("b.xml", cancellation("QR2"));
     files::write(gsReadPath + u"500.xml"_s, quoteRequest("QR1").text());
