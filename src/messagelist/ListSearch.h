@@ -1,4 +1,4 @@
-// Search as you type: the keys that go to and fro between a list and the field that narrows it.
+// Search as you type: passes keys between a list and the field that filters it.
 #pragma once
 
 #include <QObject>
@@ -8,12 +8,12 @@ class QLineEdit;
 
 namespace kest {
 
-/// What is typed in the list goes into the field. In the field the arrow and page keys move through the list, and Enter
-/// leaves for it. Escape in either empties the field, and only then goes its usual way.
+/// Text typed in the list goes into the field. In the field, the arrow and page keys move through the list and Enter
+/// gives the list the focus. Escape in either clears the field; if the field is empty, Escape works as usual.
 class ListSearch final : public QObject {
     Q_OBJECT
 public:
-    /// Lives as long as the list.
+    /// The list becomes the parent. The field must live as long as the list.
     ListSearch(QAbstractItemView& searchedList, QLineEdit& searchField);
 
 protected:

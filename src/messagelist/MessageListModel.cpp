@@ -16,12 +16,12 @@ namespace {
 constexpr std::array captions{"Filename"_L1, "Message Type"_L1, "Rego"_L1,        "Claim No"_L1,
                               "Customer"_L1, "Quote No"_L1,     "Vehicle Desc"_L1};
 
-constexpr QChar betweenCells(u'\x1f');  // so that no find reaches from one cell into the next
+constexpr QChar betweenCells(u'\x1f');  // so that no match spans two cells
 
 const QCollator& naturalOrder()
 {
     static const QCollator collator = [] {
-        QCollator natural(QLocale(QLocale::English, QLocale::Australia));  // numbers need a language's rules
+        QCollator natural(QLocale(QLocale::English, QLocale::Australia));  // numeric mode does not work in the C locale
         natural.setNumericMode(true);
         return natural;
     }();

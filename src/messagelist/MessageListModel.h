@@ -1,4 +1,4 @@
-// The rows of the message list as they are shown: in the order of a column, narrowed by a search.
+// The rows of the message list as the window shows them: sorted by a column and filtered by a search.
 #pragma once
 
 #include "messagelist/Summary.h"
@@ -7,7 +7,8 @@
 
 namespace kest {
 
-/// Rows that a search leaves out are not there for whoever looks at the model: they can be neither chosen nor loaded.
+/// A model of the listed messages. Rows that the search hides are not part of the model, so a user can neither select
+/// nor load them.
 class MessageListModel final : public QAbstractTableModel {
     Q_OBJECT
 public:
@@ -15,19 +16,21 @@ public:
 
     using QAbstractTableModel::QAbstractTableModel;
 
-    /// The rows of a fill; order and search stay.
+    /// Replaces the messages. The sort order and the search stay.
     void setMessages(QList<ListedMessage> messages);
+    /// All messages, hidden ones included, in the order of the folder.
     const QList<ListedMessage>& messages() const { return all; }
 
-    /// Leaves the rows that hold the text in one of their columns, in any case; the empty text leaves all.
+    /// Shows only the rows that contain `text` in one of their columns, in any case. An empty text shows all rows.
     void search(const QString& text);
-    /// In the natural order of a column, "123.0_9" before "123.0_10"; in the folder's own for a column below 0.
+    /// Sorts by a column in natural order, "123.0_9" before "123.0_10". A column below 0 restores the folder's order.
     void sort(int column, Qt::SortOrder order = Qt::AscendingOrder) override;
 
-    /// The file and the message type of a shown row.
+    /// Returns the file of a shown row.
     QString file(int row) const { return all[shown[row]].file; }
+    /// Returns the message type of a shown row.
     QString type(int row) const { return all[shown[row]].row[0]; }
-    /// The row that shows a file, its name taken in any case; -1 where none does.
+    /// Returns the row that shows `file`, whose case is ignored, or -1 if no row does.
     int rowOf(const QString& file) const;
 
     int rowCount(const QModelIndex& parent = {}) const override;
@@ -41,10 +44,10 @@ private:
     void narrow();
 
     QList<ListedMessage> all;  // in the folder's order
-    QStringList texts;         // of each message its cells, for the search
-    QList<qsizetype> ordered;  // places in `all`
-    QList<qsizetype> shown;    // those of `ordered` that the search leaves
-    QString wanted;            // folded
+    QStringList texts;         // the searchable text of each message
+    QList<qsizetype> ordered;  // indexes into `all`, sorted
+    QList<qsizetype> shown;    // those of `ordered` that match the search
+    QString wanted;            // the searched text, case-folded
     int sortColumn = -1;
     Qt::SortOrder sortOrder = Qt::AscendingOrder;
 };

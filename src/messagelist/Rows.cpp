@@ -17,7 +17,7 @@ enum Column { Type, Rego, Claim, Customer, Quote, Vehicle };
 
 enum class Rows { ExactlyOne, AtLeastOne };
 
-// Messages whose row is drawn from the quote tables, through a key in the message.
+// For messages that name a quote: where the key of the quote is, and the query that finds the quote's row.
 struct QuoteSource {
     QLatin1StringView code;
     QLatin1StringView key;
@@ -53,7 +53,7 @@ bool suffices(const db::Recordset& rows, Rows needed)
     return needed == Rows::ExactlyOne ? rows.recordCount() == 1 : rows.recordCount() >= 1;
 }
 
-// A value that cannot be drawn stays as it is.
+// If the value can't be read, it stays as it is.
 template <class Draw>
 void draw(QString& value, Draw&& drawn)
 {
@@ -122,7 +122,7 @@ void drawFromMessage(MessageRow& row, const xml::Document& message, const QStrin
          [&] { return customerOfCar(row[Rego], code == "MANQ"_L1 ? Rows::AtLeastOne : Rows::ExactlyOne); });
 }
 
-// From a row of QUOTE1 joined with its CAR.
+// `quote` is a row of QUOTE1 joined with its CAR.
 void drawFromQuote(MessageRow& row, const db::Recordset& quote)
 {
     draw(row[Claim], [&] { return toText(quote.value(u"Claim"_s)); });

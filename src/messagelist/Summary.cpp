@@ -15,8 +15,8 @@ using namespace Qt::StringLiterals;
 namespace kest {
 namespace {
 
-constexpr qsizetype unaskedFiles = 25;      // a folder with more of them asks for a filter
-constexpr qsizetype shortestSentText = 30;  // with its wrapping
+constexpr qsizetype unaskedFiles = 25;      // for a folder with more files the user is asked for a filter
+constexpr qsizetype shortestSentText = 30;  // characters, including the wrapping element
 
 QString pathOf(int folder)
 {
@@ -51,7 +51,7 @@ void reportUnreadable(const QString& file)
                     desktop::Icon::Critical);
 }
 
-// One fill: its document serves all files, so that the memory in use is that of one file.
+// Fills the list once. All files share one document, so that memory holds only one parsed file at a time.
 class Fill {
 public:
     Fill(int chosenFolder, const FillHooks& fillHooks) : folder(chosenFolder), hooks(fillHooks)
@@ -67,8 +67,8 @@ private:
     bool parse(const QString& path);
     const xml::Document& prepared();
 
-    QString text;  // of the file in hand, and its document
-    xml::Document document;
+    QString text;            // of the current file
+    xml::Document document;  // the parsed text
     xml::Document reparsed;
     int folder;
     const FillHooks& hooks;
@@ -110,8 +110,8 @@ bool Fill::parse(const QString& path)
     return document.loadXML(text) && text.size() >= shortestSentText;
 }
 
-// What rows are drawn from: the document with the schema-instance declaration, which some texts do not survive. The
-// second parse is spared where it would find the same.
+// Returns the document with the schema-instance declaration added, from which rows are read. The declaration can make a
+// text unreadable. Parses a second time only if the result would differ.
 const xml::Document& Fill::prepared()
 {
     if (isSameWhenPrepared(text))
@@ -128,7 +128,7 @@ QList<ListedMessage> BuildMessageList(int folder, const FillHooks& hooks)
     gsListFolder = gsCurFolder;
     gdicQuoteRequests.clear();
     if (!files::folderExists(gsCurFolder))
-        throw RuntimeError(PathNotFound, gsCurFolder + ": the folder is not there"_L1);
+        throw RuntimeError(PathNotFound, gsCurFolder + ": the folder does not exist"_L1);
     const QStringList names = files::list(gsCurFolder);
     settleFilter(folder, names.size(), hooks);
 
@@ -168,7 +168,7 @@ bool AllImagesPresent(const xml::Document& message)
 
 bool IsHeldBehindEarlier(const xml::Document& message, QList<ListedMessage>& listed, const QString& file)
 {
-    bool held = true;  // also after a failure on the way
+    bool held = true;  // and stays so if something fails
     attempt([&] {
         const xml::Node root = message.documentElement();
         xml::Node number = root.selectSingleNode(u"rootns:quoteRequestNumber"_s);

@@ -1,4 +1,4 @@
-// Turns the messages of one folder into the rows of the list.
+// Reads the messages of a folder into the rows of the list.
 #pragma once
 
 #include "platform/xml/xml.h"
@@ -14,6 +14,7 @@ namespace kest {
 /// Message type, rego, claim number, customer, quote number, vehicle description.
 using MessageRow = std::array<QString, 6>;
 
+/// A message of the list: its file's name and its row.
 struct ListedMessage {
     QString file;
     MessageRow row;
@@ -21,28 +22,34 @@ struct ListedMessage {
 
 enum MessageFolder : int { Unread = 0, Read = 1, Sent = 2 };
 
-/// What a fill leaves to others.
+/// Callbacks of a fill.
 struct FillHooks {
-    /// Takes a submission response of the network into its quote; every fill over such a file needs it.
+    /// Applies a submission response to its quote. Required if the folder contains such a file.
     std::function<void(QString& text, const QString& file)> submissionResponse;
-    /// Shows the filter that the fill has asked for.
+    /// Called with the filter that the user has just typed into the prompt.
     std::function<void(const QString& filter)> filterAsked;
+    /// Called after each file.
     std::function<void(qint64 done, qint64 total)> progress;
 };
 
-/// Fills from a folder in the order of its file names. Sets gsCurFolder, gsListFolder, gsListFilter, gbFilterAsked.
-/// A file that cannot be parsed is reported by a box and left out; every other failure is thrown, its description
-/// naming the file.
+/// Returns the messages of a folder in the order of their file names. Sets gsCurFolder, gsListFolder, gsListFilter and
+/// gbFilterAsked.
+///
+/// If a file can't be parsed, a box says so and the file is left out. Throws RuntimeError for every other failure; the
+/// description begins with the name of the file.
 QList<ListedMessage> BuildMessageList(int folder, const FillHooks& hooks);
 
-/// False while a picture that the request names has not arrived in the unread folder.
+/// Returns false if a picture that the request names is not yet in the unread folder.
 bool AllImagesPresent(const xml::Document& message);
-/// True for a message that waits behind an earlier one of its request; a manual quote takes the earlier one's place.
+/// Returns true if `listed` already has an earlier message of the same request. A manual quote is never held by that
+/// message: it replaces it in `listed`.
 bool IsHeldBehindEarlier(const xml::Document& message, QList<ListedMessage>& listed, const QString& file);
-/// The row of a network message or, with the type name "SENT", of a wrapped outbound document. Never fails.
+/// Returns the row of a network message or, if `typeName` is "SENT", of a wrapped outbound document. Never throws: a
+/// value that can't be read stays empty or becomes "-".
 MessageRow GetMessageRow(const QString& text, const QString& typeName);
+/// Returns the row of a quote deletion or another marker. Never throws.
 MessageRow GetMarkerRow(const QString& text, const QString& typeName);
-/// The same, of a prepared text that was parsed before.
+/// The same for a text that has already been prepared and parsed.
 MessageRow GetMessageRow(const xml::Document& message, const QString& typeName);
 MessageRow GetMarkerRow(const xml::Document& marker, const QString& typeName);
 

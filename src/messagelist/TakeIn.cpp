@@ -18,24 +18,24 @@ using namespace Qt::StringLiterals;
 namespace kest {
 namespace {
 
-constexpr qsizetype refusalsSaid = 10;  // the others would make a box taller than the screen
+constexpr qsizetype refusalsSaid = 10;  // more would make the box taller than the screen
 
 enum class Kind { Picture, Description, Message };
 
-// Why a file is refused.
+// Thrown if a file is refused.
 struct Refusal {
     QString why;
 };
 
-// One that is none, or whose quote is gone, would end every fill of the list.
+// A file that is not a response, or whose quote no longer exists, would make every fill of the list fail.
 void checkResponse(const xml::Document& document, const QString& name)
 {
     if (document.textOrEmptyOf(u"rootns:kestQuoteNumber"_s).isEmpty() ||
         document.textOrEmptyOf(u"rootns:quoteSubmissionStatus"_s).isEmpty())
-        throw Refusal{u"it is no response of the network"_s};
+        throw Refusal{u"it is not a response of the network"_s};
     const QuoteKey quote = QuoteKey::fromResponseName(name);
     if (opened(sql("SELECT QTNNO FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quote.number, quote.subquote)).eof())
-        throw Refusal{u"the quote that it answers is not there"_s};
+        throw Refusal{u"the quote that it answers does not exist"_s};
 }
 
 void checkMessage(const QString& path, const QString& name)
@@ -51,7 +51,7 @@ void checkMessage(const QString& path, const QString& name)
         return checkResponse(document, name);
     const bool isNetworkMessage = !name.contains("MDMSG"_L1) && GetMessageTypeName(document) != messageTypeName({});
     if (!isNetworkMessage && !isMarker(document))
-        throw Refusal{u"it is no message of the network"_s};
+        throw Refusal{u"it is not a message of the network"_s};
 }
 
 Kind kindOf(const QString& path, const QString& name)
@@ -61,25 +61,25 @@ Kind kindOf(const QString& path, const QString& name)
     if (!files::isPlainName(name) || !files::exists(path))
         throw Refusal{u"there is no such file"_s};
     if (QFileInfo(path).canonicalPath() == QFileInfo(files::systemPath(gsUnreadPath)).canonicalFilePath())
-        throw Refusal{u"it lies in the unread folder already"_s};
+        throw Refusal{u"it is already in the unread folder"_s};
     if (name.endsWith("xml"_L1)) {
         checkMessage(path, name);
         return Kind::Message;
     }
     if (name.endsWith(".xml"_L1, Qt::CaseInsensitive))
-        throw Refusal{u"the name of a message ends in small letters, \"xml\""_s};
+        throw Refusal{u"the name of a message must end in \"xml\" in lower case"_s};
     const bool isPicture = files::matches(name, u"*.jpg"_s);
     if (!isPicture && !files::matches(name, u"*.txt"_s))
-        throw Refusal{u"it is no message, picture (.jpg) or description (.txt)"_s};
+        throw Refusal{u"it is not a message, a picture (.jpg) or a description (.txt)"_s};
     if (!files::matches(name, u"?*_???*.???"_s))
-        throw Refusal{u"its name is not that of a request's picture, such as 20551_001.jpg"_s};
+        throw Refusal{u"its name must be like that of a request's picture, such as 20551_001.jpg"_s};
     return isPicture ? Kind::Picture : Kind::Description;
 }
 
 bool mayBeWritten(const QString& name)
 {
     return !files::exists(gsUnreadPath + name) ||
-           desktop::ask(name + " lies in the unread folder already. Replace it?"_L1, desktop::Icon::Question, {},
+           desktop::ask(name + " is already in the unread folder. Replace it?"_L1, desktop::Icon::Question, {},
                         desktop::Answer::No);
 }
 
@@ -133,11 +133,11 @@ TakenIn takeInFiles(const QList<QUrl>& urls, const std::function<void(qint64 don
         const QString name = QFileInfo(path).fileName();
         unlessRefused(url.isLocalFile() && !name.isEmpty() ? name : url.toDisplayString(), [&] {
             if (!url.isLocalFile())
-                throw Refusal{u"it does not lie on this computer"_s};
+                throw Refusal{u"it is not on this computer"_s};
             brought.append({path, name, kindOf(path, name)});
         });
     }
-    // a message that is listed before its pictures are there would be held back, or loaded without them
+    // pictures first: a message that is listed before its pictures arrive is held back, or loaded without them
     std::ranges::stable_sort(brought, {}, &Brought::kind);
 
     qint64 done = 0;

@@ -166,7 +166,7 @@ void frmMessageList::ListView1_ItemClick(int row)
 {
     sCurFile = messages->file(row);
     const QString type = messages->type(row);
-    if (gbTabletLocal)  // on its own database a tablet takes new work only
+    if (gbTabletLocal)  // a tablet on its own database loads new work only
         cmdProcess->setEnabled(type == "Quote Request"_L1);
     cmdPrint->setEnabled(type != "Request for Revised Quote"_L1 && type != "Quote Deletion"_L1 &&
                          type != "Quote Request Cancellation"_L1);
@@ -257,12 +257,12 @@ void frmMessageList::txtFind_Change()
     const QString chosen = selectedFile();
     messages->search(txtFind->text());
     if (messages->rowCount() == 0)
-        sCurFile.clear();  // what is not seen can't be reprinted
+        sCurFile.clear();  // a hidden message can't be reprinted
     choose(qMax(messages->rowOf(chosen), 0));
     lblStatus->setText(status());
 }
 
-// A refresh that the user asks for keeps the user's place, other than those that follow a load or a deletion.
+// Keeps the selected message, unlike the refreshes after a load or a deletion.
 void frmMessageList::Form_KeyRefresh()
 {
     const QString chosen = selectedFile();
@@ -274,9 +274,9 @@ void frmMessageList::Form_Paste()
 {
     const QMimeData* clipboard = QGuiApplication::clipboard()->mimeData();
     if (iFolder != Unread)
-        lblStatus->setText(u"Files are taken in while the unread messages are shown."_s);
+        lblStatus->setText(u"Files can be taken in only while the unread messages are shown."_s);
     else if (!clipboard || !clipboard->hasUrls())
-        lblStatus->setText(u"The clipboard holds no files."_s);
+        lblStatus->setText(u"The clipboard contains no files."_s);
     else
         takeIn(clipboard->urls());
 }
@@ -285,7 +285,7 @@ void frmMessageList::dragEnterEvent(QDragEnterEvent* event)
 {
     if (iFolder != Unread || busy || !event->mimeData()->hasUrls())
         return;
-    event->setDropAction(Qt::CopyAction);  // whoever drags must not take the files away
+    event->setDropAction(Qt::CopyAction);  // with a move, the source program would delete the files
     event->accept();
     lblStatus->setText(u"Let go to take the files in."_s);
 }
@@ -299,7 +299,7 @@ void frmMessageList::dropEvent(QDropEvent* event)
 {
     event->setDropAction(Qt::CopyAction);
     event->accept();
-    // after the drop: a box would keep the program that the files come from waiting
+    // after the drop has ended: a box would block the program that the files come from
     QTimer::singleShot(0, this, [this, brought = event->mimeData()->urls()] {
         desktop::guarded(u"frmMessageList.ListView1_OLEDragDrop"_s, [&] { takeIn(brought); });
     });
@@ -327,7 +327,7 @@ void frmMessageList::takeIn(const QList<QUrl>& brought)
 bool frmMessageList::hasSelection() const
 {
     const QModelIndex row = ListView1->currentIndex();
-    return row.isValid() && ListView1->selectionModel()->isSelected(row);  // Ctrl+click takes the choice away
+    return row.isValid() && ListView1->selectionModel()->isSelected(row);  // Ctrl+click deselects the current row
 }
 
 QString frmMessageList::selectedFile() const
@@ -335,13 +335,13 @@ QString frmMessageList::selectedFile() const
     return hasSelection() ? messages->file(ListView1->currentIndex().row()) : QString();
 }
 
-// As a click on the row; nothing where there is none.
+// Acts as a click on the row. Does nothing if there is no such row.
 void frmMessageList::choose(int row)
 {
     ListView1->setCurrentIndex(messages->index(row, 0));
 }
 
-// As a click on the file's row; false where the list does not show it.
+// Acts as a click on the file's row. Returns false if the list does not show it.
 bool frmMessageList::select(const QString& file)
 {
     const int row = messages->rowOf(file);
@@ -351,7 +351,7 @@ bool frmMessageList::select(const QString& file)
     return true;
 }
 
-// The order that is remembered from the last time is there only now.
+// The sort order of the last session is restored when the window is shown, so the first row is known only now.
 void frmMessageList::showEvent(QShowEvent* event)
 {
     Form::showEvent(event);

@@ -1,4 +1,4 @@
-// The window in which a user works through the messages of the three folders.
+// The window that lists the messages of the three folders.
 #pragma once
 
 #include "messagelist/Summary.h"
@@ -19,6 +19,7 @@ namespace kest {
 
 class MessageListModel;
 
+/// Lists the unread, read or sent messages, and loads, reprints, shows or deletes the selected one.
 class frmMessageList final : public desktop::Form {
     Q_OBJECT
 public:
@@ -27,26 +28,28 @@ public:
     /// Opens the window on the unread folder and returns when the user has closed it.
     static void ShowForm();
 
-    // What the window does, for a caller that does not show it. Boxes and prompts come as they do for a user.
+    // The actions of the window, for callers that don't show it. Boxes and prompts appear as they do for a user.
 
-    /// The unread folder, filled.
+    /// Fills the list from the unread folder.
     void open();
-    /// A click on the option of a folder.
+    /// Acts as a click on the option of a folder.
     void chooseFolder(int folder);
-    /// A text typed as the filter, and "Update".
+    /// Acts as typing the filter and clicking "Update".
     void updateFilter(const QString& filter);
-    /// "Load" on a file of the folder, listed or not, with the refreshes that follow, the delayed one included. False
-    /// when the message was not taken. For a name that leaves the folder, and for a listed one whose button is
-    /// disabled, nothing happens.
+    /// Acts as "Load" on a file of the folder, even if the list does not show it, and waits for the refreshes that
+    /// follow, the delayed one included. Returns false if the message was not loaded. Does nothing and returns false
+    /// for a name with a path, or if the list shows the file and "Load" is disabled for it.
     bool loadFile(const QString& file);
-    /// "Reprint" on a file of the folder, listed or not. False when its report was refused or failed. For a listed one
-    /// whose button is disabled nothing happens.
+    /// Acts as "Reprint" on a file of the folder, even if the list does not show it. Returns false if the report was
+    /// refused or failed. Does nothing and returns false if the list shows the file and "Reprint" is disabled for it.
     bool reprintFile(const QString& file);
 
+    /// Fills the list again from the current folder.
     void RefreshList();
 
-    /// The rows of the last fill, whatever is searched for, and what ended it before its end; empty after a whole fill.
+    /// Returns all rows of the last fill, even those that the search hides.
     const QList<ListedMessage>& rows() const;
+    /// Returns why the last fill ended early, or an empty text if it did not.
     const QString& failure() const { return fillFailure; }
 
 protected:
@@ -99,10 +102,10 @@ private:
     QPushButton* cmdExit;
     QTimer* tmrRefresh;
 
-    QString sCurFile;  // last clicked in the list
+    QString sCurFile;  // the file clicked last
     int iFolder = Unread;
     QString fillFailure;
-    int busy = 0;  // fills and loads on the way; a delayed refresh waits for their end
+    int busy = 0;  // how many fills and loads are running; a delayed refresh waits until they end
 };
 
 }  // namespace kest

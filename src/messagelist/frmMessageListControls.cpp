@@ -1,4 +1,4 @@
-// What the list window is made of: its controls, where they stand, and what their events run.
+// The list window's controls, its layout and the connections of its events.
 #include "messagelist/ListSearch.h"
 #include "messagelist/MessageListModel.h"
 #include "messagelist/frmMessageList.h"
@@ -92,7 +92,7 @@ void frmMessageList::buildControls()
     prgFill->setAccessibleName(u"Progress"_s);
     prgFill->setVisible(false);
 
-    cmdProcess = named(new QPushButton(u"&Load"_s), u"cmdProcess"_s, u"Take the message into the quotes"_s);
+    cmdProcess = named(new QPushButton(u"&Load"_s), u"cmdProcess"_s, u"Load the message into the quotes"_s);
     cmdPrint = named(new QPushButton(u"Re&print"_s), u"cmdPrint"_s, u"Show the message's report"_s);
     cmdPrint->setVisible(false);
     cmdView = named(new QPushButton(u"&View"_s), u"cmdView"_s, u"Show the message's text"_s);
@@ -129,7 +129,7 @@ void frmMessageList::arrange()
     auto* bottom = new QHBoxLayout;
     bottom->addWidget(cmdProcess);
     bottom->addWidget(cmdPrint);
-    bottom->addWidget(cmdView);  // moves to the left where neither of the two is shown
+    bottom->addWidget(cmdView);  // moves to the left if neither of the two is shown
     bottom->addStretch();
     bottom->addWidget(cmdExit);
 

@@ -273,12 +273,12 @@ TEST_F(Searched, FilesAreDroppedOrPastedWhileTheUnreadMessagesAreShown)
         EXPECT_EQ(paste(stick(u"c2.xml"_s, cancellation("QR3").text())),
                   u"Taken in: 1 message. 1 not listed yet: held back by missing pictures or an earlier message. "
                   "4 messages"_s);
-        EXPECT_EQ(paste(std::make_unique<QMimeData>()), u"The clipboard holds no files."_s);
+        EXPECT_EQ(paste(std::make_unique<QMimeData>()), u"The clipboard contains no files."_s);
         paste(stick(u"e.doc"_s, {}));
         control<QAbstractButton>(window, "Option1(1)").click();
         EXPECT_FALSE(drop(window, *stick(u"f.xml"_s, cancellation("QR5").text())));
         EXPECT_EQ(paste(stick(u"f.xml"_s, cancellation("QR5").text())),
-                  u"Files are taken in while the unread messages are shown."_s);
+                  u"Files can be taken in only while the unread messages are shown."_s);
     };
     const Hands hands({{u"frmMessageList"_s, work}});
     frmMessageList::ShowForm();

@@ -30,7 +30,7 @@ TEST_F(TakingIn, OnlyMessagesAndWhatBelongsToRequestsAreTaken)
     others.resize(12, others.last());
     EXPECT_TRUE(takeInFiles(others).refusals().startsWith(
         u"Not taken in:\n%1: it is a folder\nx.xml: there is no such file\n"
-        "https://shop.example/a.xml: it does not lie on this computer\n"_s.arg(root().section(u'/', -1))));
+        "https://shop.example/a.xml: it is not on this computer\n"_s.arg(root().section(u'/', -1))));
     EXPECT_TRUE(takeInFiles(others).refusals().endsWith("\nand 2 more"_L1));
     EXPECT_EQ(shown(), "");
 }
@@ -51,12 +51,12 @@ TEST_F(TakingIn, AFileThatLiesThereIsReplacedOnlyAfterYes)
     arrive("a.xml", "old");
     const QUrl brought = bring(u"A.xml"_s, quoteRequest("QR1").text());
     EXPECT_EQ(takeInFiles({brought}).summary(), u"Nothing was taken in."_s);
-    EXPECT_EQ(desktop->boxes(), QStringList(u"question||A.xml lies in the unread folder already. Replace it?|no"_s));
+    EXPECT_EQ(desktop->boxes(), QStringList(u"question||A.xml is already in the unread folder. Replace it?|no"_s));
     EXPECT_EQ(files::read(gsUnreadPath + u"a.xml"_s), u"old"_s);
     desktop.emplace(R"({"boxes": [{"text": "Replace", "answer": "yes"}]})");
     EXPECT_EQ(
         takeInFiles({brought, QUrl::fromLocalFile(files::systemPath(gsUnreadPath + u"a.xml"_s))}).refused.join(u' '),
-        u"a.xml: it lies in the unread folder already"_s);
+        u"a.xml: it is already in the unread folder"_s);
     EXPECT_EQ(files::read(gsUnreadPath + u"a.xml"_s), files::read(brought.toLocalFile()));
     EXPECT_EQ(filesIn(gsUnreadPath).size(), 1);
     gsUnreadPath = u"c:\\gone\\"_s;
