@@ -10,17 +10,17 @@ namespace kest {
 
 namespace {
 
-constexpr qsizetype longestLine = 4000;  // characters; a document in base64 may stand in one line of millions
+constexpr qsizetype longestLine = 4000;  // characters; a base64 document may be one line of millions
 constexpr auto usualJoint = "\r\n"_L1;
-constexpr int jointIndex = QTextFormat::UserProperty;  // into `joints`; kept by the line end's own character
+constexpr int jointIndex = QTextFormat::UserProperty;  // an index into `joints`, in the format of the line end
 
-/// The characters at which Qt starts a new line of a plain text.
+/// Returns true for the characters that QPlainTextEdit treats as line ends.
 bool endsLine(QChar c)
 {
     return c == u'\r' || c == u'\n' || c == QChar::ParagraphSeparator || c == u'\xfdd0' || c == u'\xfdd1';
 }
 
-/// One line as it is shown, and what joins it to the one before.
+/// A line as it is shown, and the characters between it and the line before.
 struct Line {
     QStringView characters;
     QStringView jointBefore;
@@ -90,7 +90,7 @@ QString ExactTextEdit::exactText(int start, int end) const
     const QTextBlock first = document()->findBlock(start);
     for (QTextBlock block = first; block.isValid() && block.position() <= end; block = block.next()) {
         if (block != first) {
-            // the indexes rise: what a person starts in an empty line inherits that line's
+            // indexes rise through the text; one that does not was inherited by a line that the user has inserted
             const QVariant index = block.charFormat().property(jointIndex);
             const bool isKept = index.isValid() && index.toInt() > indexBefore;
             text += isKept ? joints[index.toInt()] : QString(usualJoint);

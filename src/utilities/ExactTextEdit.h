@@ -1,13 +1,14 @@
-// A text box that gives back the very text that it was given, but for what a person changed.
+// A text box that preserves every character of its text except those that the user edits.
 #pragma once
 
 #include <QPlainTextEdit>
 
 namespace kest {
 
-/// Qt's own text box turns every line end into a line feed and every hard blank into a blank, and is slow on lines of
-/// millions of characters. This one keeps with each line end what it stands for: a carriage return and a line feed (as
-/// do those that a person puts in), a single one of them, or, where an overlong line is shown in pieces, nothing.
+/// QPlainTextEdit turns every line end into a line feed and every no-break space into a space, and it is slow with
+/// lines of millions of characters. This class remembers for each line end what it represents: a carriage return and a
+/// line feed, only one of them, or nothing if a long line is shown in pieces. A line end that the user types is a
+/// carriage return and a line feed.
 class ExactTextEdit final : public QPlainTextEdit {
     Q_OBJECT
     Q_PROPERTY(QString exactText READ exactText)
@@ -15,8 +16,9 @@ class ExactTextEdit final : public QPlainTextEdit {
 public:
     explicit ExactTextEdit(QWidget* parent = nullptr);
 
-    /// Puts the text there, unmodified, with nothing to undo.
+    /// Replaces the text. Clears the undo history and the modified flag.
     void setExactText(const QString& text);
+    /// Returns the text with its original line ends.
     QString exactText() const;
 
 protected:
@@ -27,7 +29,7 @@ protected:
 private:
     QString exactText(int start, int end) const;
 
-    QStringList joints;  // what the line ends stand for that are other than usual
+    QStringList joints;  // what the unusual line ends represent
 };
 
 }  // namespace kest

@@ -25,10 +25,10 @@ bool isCharacters(const xml::Node& node)
     return node.nodeType() == xml::NodeType::Text || node.nodeType() == xml::NodeType::CDataSection;
 }
 
-/// Adds one node and everything below it to `text`.
+/// Appends a node and everything below it to `text`.
 void FormatNode(QString& text, const xml::Node& node, qint16 level)
 {
-    const bool isElement = !isCharacters(node);  // comments and instructions are shown in the manner of elements
+    const bool isElement = !isCharacters(node);  // comments and processing instructions are shown like elements
     const bool isCData = node.nodeType() == xml::NodeType::CDataSection;
     const QString indent(level, u'\t');
 
@@ -61,7 +61,7 @@ void FormatNode(QString& text, const xml::Node& node, qint16 level)
     }
 }
 
-/// The text of a file: in the encoding of its byte order mark where it has one, else in the code page.
+/// Reads a file in the encoding of its byte order mark or, if it has none, in the code page.
 QString textOfFile(const QString& fileName)
 {
     const QByteArray bytes = files::readBytes(fileName);
@@ -69,7 +69,7 @@ QString textOfFile(const QString& fileName)
     return marked ? QStringDecoder(*marked).decode(bytes) : files::fromCodePage(bytes);
 }
 
-/// Parses the text, each of the two known faults repaired once.
+/// Parses the text and repairs each of the two known faults once.
 bool loadRepaired(xml::Document& document, QString text)
 {
     if (document.loadXML(text))

@@ -1,22 +1,21 @@
-// The text of a message file, rebuilt from its parsed document with one element to a line; no widgets.
+// Formats the text of a message file with one element on each line. Uses no widgets.
 #pragma once
 
 #include <QString>
 
 namespace kest {
 
-/// The indented text of a message file, whose path is in the host's form.
+/// Returns the indented text of a message file. `fileName` is a path in the host's form.
 ///
-/// Repairs two faults on the way: several top-level elements are wrapped in "request", bare ampersands are escaped.
-/// A file that cannot be read, or not be parsed after that, shows a critical box and gives the empty text; the text of
-/// a message that was read is never empty.
+/// Repairs two faults: wraps several top-level elements in "request", and escapes bare ampersands. If the file can't be
+/// read or parsed even then, shows a critical box and returns an empty text. Otherwise the text is never empty.
 QString FormatXML(const QString& fileName);
 
-/// What the viewer writes for the text that it shows: the characters themselves in place of the three markup
-/// references. It may be ill-formed for other readers; FormatXML reads it back.
+/// Returns the text as the viewer saves it, with the characters themselves in place of `&gt;`, `&lt;` and `&amp;`. The
+/// result may be ill-formed for other readers; FormatXML can read it.
 QString withMarkupCharacters(const QString& text);
 
-/// The text without the wrapper that FormatXML put around several top-level elements; any other text as it is.
+/// Removes the wrapper that FormatXML adds around several top-level elements. Returns any other text unchanged.
 QString withoutRequestWrapper(const QString& text);
 
 }  // namespace kest

@@ -1,4 +1,4 @@
-// What each button of "Set Quote Status" does to the window: one table.
+// One table of what each button of "Set Quote Status" changes in the window.
 #pragma once
 
 #include <QList>
@@ -7,7 +7,7 @@
 
 namespace kest {
 
-/// Puts a quote's tick and note chain as they would stand had its messages gone another way.
+/// Sets a quote's read-only tick and its note chain to what they would be if its messages had gone another way.
 struct StatusRepair {
     struct Note {
         QString subject;
@@ -17,14 +17,14 @@ struct StatusRepair {
 
     QString button;
     QString caption;
-    bool startsGroup = false;  // set apart from the buttons before it
-    bool locks = true;
-    bool forgetsQuoteNumber = false;
-    QStringList removed;  // subjects, in order
-    QList<Note> added;    // in order
+    bool startsGroup = false;         // leave a gap between this button and the one before it
+    bool locks = true;                // tick "read only"
+    bool forgetsQuoteNumber = false;  // clear the network's quote number
+    QStringList removed;              // subjects of notes, in the order in which they are removed
+    QList<Note> added;                // in the order in which they are added
 };
 
-/// In the order of the buttons.
+/// Returns the repairs in the order of their buttons.
 const QList<StatusRepair>& statusRepairs();
 
 }  // namespace kest

@@ -20,7 +20,7 @@ namespace {
 const QDate passwordBase(1899, 12, 30);
 constexpr qint64 passwordConstant = 4711;
 
-/// Tells by its colour whether what is typed goes into it.
+/// Shows by its colour whether it has the keyboard focus.
 class FocusColouredEdit final : public QLineEdit {
 public:
     FocusColouredEdit() { setColour(Qt::cyan); }

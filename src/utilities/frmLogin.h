@@ -1,4 +1,4 @@
-// The password question before the utilities and before a message is overwritten.
+// Asks for the password before the utilities open and before a message is overwritten.
 #pragma once
 
 #include "platform/desktop/Form.h"
@@ -10,14 +10,15 @@ class QPushButton;
 
 namespace kest {
 
-/// The password of a day: a whole number that changes at midnight.
+/// Returns the password of a day: a whole number that changes at midnight.
 qint64 dayPassword(const QDate& day);
 
+/// The password dialog.
 class frmLogin final : public desktop::Form {
     Q_OBJECT
 
 public:
-    /// Shows the question; `ok` is true on return only after the day's password was typed.
+    /// Shows the dialog and sets `ok` to true if the user types the password of the day, and to false otherwise.
     static void ShowForm(bool& ok);
 
 private:

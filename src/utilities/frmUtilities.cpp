@@ -30,7 +30,7 @@ namespace {
 struct Field {
     QLatin1StringView name;
     QLatin1StringView label;
-    QLatin1StringView column;  // of QUOTE1; empty for what is put together from elsewhere
+    QLatin1StringView column;  // of QUOTE1; empty if the value comes from somewhere else
     bool editable;
 };
 
@@ -51,11 +51,11 @@ QLabel* labelOf(QWidget* control, const QString& caption)
 {
     auto* label = new QLabel(caption);
     label->setBuddy(control);
-    label->setIndent(desktop::pixels(30));  // a J reaches out of its place to the left
+    label->setIndent(desktop::pixels(30));  // room for a "J", which is drawn a little to the left of its origin
     return label;
 }
 
-/// The one value that a query gives, or the empty text.
+/// Returns the only value of a query, or an empty text if it finds no row.
 QString firstValueOf(const QString& select)
 {
     db::Recordset row(gConn);
@@ -190,7 +190,7 @@ void frmUtilities::AddTabs()
         for (subquotes.moveNext(); !subquotes.eof(); subquotes.moveNext())
             add(u"Add.-"_s + subquotes.text(u"SUBQUOTE"_s), subquotes.text(u"SUBQUOTE"_s));
     }
-    for (int tab = TabStrip1->count() - 1; tab >= 0; --tab) {  // of two with one subquote the first
+    for (int tab = TabStrip1->count() - 1; tab >= 0; --tab) {  // backwards: if two tabs match, the first is chosen
         if (TabStrip1->tabData(tab).toString() == u'S' + shown.subquote)
             TabStrip1->setCurrentIndex(tab);
     }
@@ -238,7 +238,7 @@ void frmUtilities::TabStrip1_Click()
     if (chosen.eof()) {
         const QSignalBlocker silent(TabStrip1);
         TabStrip1->setCurrentIndex(shownTab);
-        throw RuntimeError(NoCurrentRow, u"Quote %1 is no longer there."_s.arg(wanted.fullReference()));
+        throw RuntimeError(NoCurrentRow, u"Quote %1 no longer exists."_s.arg(wanted.fullReference()));
     }
     shownTab = TabStrip1->currentIndex();
     if (wanted.subquote.isEmpty())
@@ -266,9 +266,9 @@ void frmUtilities::Command1_Click()
     quote.update();
     remarks.update();
     CloseRows();
-    close();  // what is saved stays saved, whatever becomes of the host's quote
+    close();  // first: the changes are saved even if the host's quote can't be opened
 
-    // also where another subquote was edited
+    // even if another subquote was edited
     auto hostQuote = std::make_shared<db::Recordset>(gConn);
     hostQuote->open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", gsQTNNO, gsSubQuote));
     grsQuote = hostQuote;

@@ -1,4 +1,4 @@
-// A quote's network fields, to be put right by hand when the quote and the insurer have fallen out of step.
+// Edits a quote's network fields, for a service person whose quote no longer agrees with the insurer's records.
 #pragma once
 
 #include "base/QuoteKey.h"
@@ -15,11 +15,12 @@ namespace kest {
 class ExactTextEdit;
 struct StatusRepair;
 
+/// The window "Utilities": the fields, the flags, the remarks and the status buttons of a quote.
 class frmUtilities final : public desktop::Form {
     Q_OBJECT
 
 public:
-    /// Shows the quote; an empty subquote is "0". Only "Save" writes, and it opens `grsQuote` anew.
+    /// Shows the quote; an empty subquote means "0". Only "Save" writes to the tables, and it opens `grsQuote` again.
     static void ShowForm(const QString& sQTNNO, const QString& sSubQuote);
 
 private:
@@ -44,12 +45,12 @@ private:
     void Command9_Click();  // Undo
     void SetStatus(const StatusRepair& repair);
 
-    QuoteKey shown;  // the row itself may go
+    QuoteKey shown;  // not read from `quote`, because another user may delete the row
     int shownTab = 0;
 
     db::Recordset quote;    // of QUOTE1
-    db::Recordset lines;    // of QUOTE2: opened and closed with the others
-    db::Recordset remarks;  // of QUOTE3, where the quote may have no row
+    db::Recordset lines;    // of QUOTE2; opened and closed with the others
+    db::Recordset remarks;  // of QUOTE3, which may have no row for the quote
 
     QTabBar* TabStrip1;
     QCheckBox* chkReadOnly;

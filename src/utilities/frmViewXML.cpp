@@ -27,7 +27,8 @@ namespace {
 
 constexpr int tabWidth = 4;  // characters
 
-/// Not a key that moves about or copies, nor Escape, which is on its way to the window.
+/// Returns true for keys that change the text: not for cursor keys and shortcuts, nor for Escape, which closes the
+/// window.
 bool isTyping(const QKeyEvent& key)
 {
     return !key.text().isEmpty() && !(key.modifiers() & Qt::ControlModifier) && key.key() != Qt::Key_Escape;
@@ -173,7 +174,7 @@ void frmViewXML::Command2_Click()
     const QString text = withoutRequestWrapper(shown);
     if (text != shown)
         txtXML->setExactText(text);
-    unchanged = false;  // until the file is written
+    unchanged = false;  // in case the file can't be written
     files::write(files::pathForWriting(gsCurFolder, sFile), withMarkupCharacters(text));
     unchanged = true;
     txtXML->document()->setModified(false);
@@ -202,10 +203,10 @@ void frmViewXML::showPosition()
     lblPosition->setText(u"Line %1, column %2"_s.arg(cursor.blockNumber() + 1).arg(cursor.positionInBlock() + 1));
 }
 
-// Only what is seen is coloured, so that a message of any size opens at once.
+// Colours only the visible lines, so that even a large message opens at once.
 void frmViewXML::colourVisibleTags()
 {
-    // neighbours are coloured as one: of two that touch only the first would be
+    // one match for a run of tags: Qt would colour only the first of two selections that touch
     static const QRegularExpression tag(u"(</?[^<>\\s/][^<>]*>)+"_s);
     QTextCharFormat colour;
     colour.setForeground(palette().color(QPalette::Link));

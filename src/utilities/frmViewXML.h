@@ -1,4 +1,4 @@
-// Shows a message file as indented text, and overwrites it behind the password.
+// Shows a message file as indented text, and saves the edited text after the password was given.
 #pragma once
 
 #include "platform/desktop/Form.h"
@@ -13,11 +13,12 @@ namespace kest {
 
 class ExactTextEdit;
 
+/// The text viewer of a message, with a find bar.
 class frmViewXML final : public desktop::Form {
     Q_OBJECT
 
 public:
-    /// Shows a file of `gsCurFolder`, named without the folder.
+    /// Shows a file of `gsCurFolder`. `file` is the name without the folder.
     static void ShowForm(const QString& file);
 
 protected:
@@ -37,7 +38,7 @@ private:
 
     QString sFile;
     bool unchanged = true;          // since the text was loaded or saved
-    std::array<int, 3> coloured{};  // first line, last line, revision of the text
+    std::array<int, 3> coloured{};  // first line, last line and revision of the text that is coloured
 
     ExactTextEdit* txtXML;
     QPushButton* Command1;
