@@ -27,7 +27,7 @@ QString classKey()
     return u"CLSID\\"_s + com::text(CLSID_eKEST);
 }
 
-/// Where this library was loaded from.
+/// Returns the path from which this library was loaded.
 QString libraryPath()
 {
     Dl_info info{};
@@ -36,8 +36,8 @@ QString libraryPath()
     return QString::fromLocal8Bit(info.dli_fname);
 }
 
-/// A host without Qt has no application object, and no answers but a person's. False where windows can't be shown:
-/// Qt would end the host's process.
+/// Creates the application object if the host does not use Qt, and lets a person answer the windows. Returns false if
+/// windows can't be shown, since Qt would then end the host's process.
 bool ensureApplication()
 {
     if (QCoreApplication::instance()) {
@@ -56,7 +56,7 @@ bool ensureApplication()
     return true;
 }
 
-/// What the reference count and the server's count have in common.
+/// An object with a reference count that keeps the server loaded while it lives.
 template <class Interface>
 class Counted : public Interface {
 public:
@@ -91,14 +91,14 @@ private:
     std::atomic<std::uint32_t> references = 1;
 };
 
-/// The result of a call. No exception reaches the host, and none that was kept stops the events of its next call.
+/// Runs a call and turns its exceptions into results, so that none reaches the host.
 template <class Call>
 HResult answered(Call&& call)
 {
     try {
         return call();
     } catch (const desktop::NeedsAnswer&) {
-        desktop::guarded({}, [] { throw; });  // kept on, for the command that runs without a person
+        desktop::guarded({}, [] { throw; });  // keep it for the unattended command, which throws it again
     } catch (const std::bad_alloc&) {
         return com::OutOfMemory;
     } catch (const std::exception&) {

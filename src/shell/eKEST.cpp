@@ -20,7 +20,7 @@ QString homeFolder()
     return GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"EcomHome"_s, u"c:\\wirdoc\\"_s);
 }
 
-int objects = 0;  // they share connection and folders
+int objects = 0;  // all objects share the connection and the folders; the last one closes them
 
 void reportUntrapped(const RuntimeError& error, const QString& source)
 {

@@ -1,27 +1,27 @@
-// The class that the host creates: it fixes connection and folders, and shows the panel on the host's quote.
+// The class that the host creates to show the panel for its open quote.
 #pragma once
 
 #include <QString>
 
 namespace kest {
 
-/// One for each host; the connection and the folders stay fixed for its life.
+/// The component as a host uses it. The connection and the folders stay the same while the object lives.
 class eKEST {
 public:
-    /// Opens the connection and reads the folders from the host's settings. Shows nothing: without a connection `gConn`
-    /// is null.
+    /// Opens the connection and reads the folders from the host's settings. If the connection can't be opened, `gConn`
+    /// is null and no box appears.
     eKEST();
     ~eKEST();
     eKEST(const eKEST&) = delete;
     eKEST& operator=(const eKEST&) = delete;
 
-    /// Shows the panel on a quote, "0" and "0" for none, and returns when it has been closed.
+    /// Shows the panel for a quote and returns when the user has closed it. Pass "0" and "0" if no quote is open.
     void ShowKESTWindow(const QString& sQTNNO, const QString& sSubQuote);
 };
 
-/// True with a connection; false after a box that says there is none.
+/// Returns true if there is a connection. Otherwise shows a box and returns false.
 bool hasConnection();
-/// Opens `grsQuote` on the quote that the host has open. False where hasConnection is.
+/// Opens `grsQuote` for the host's open quote. Returns false if hasConnection() does.
 bool openHostQuote(const QString& sQTNNO, const QString& sSubQuote);
 
 }  // namespace kest

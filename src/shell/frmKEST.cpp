@@ -37,7 +37,7 @@ const std::array optionCaptions{u"&Start KESTWeb"_s, u"&View Messages"_s, u"Send
 frmKEST::frmKEST() : Form(u"frmKEST"_s, u"ORLA Partner Network"_s)
 {
     auto* frame = new QFrame(this);
-    frame->setFrameShape(QFrame::StyledPanel);  // a titleless group box costs its style a third of the start
+    frame->setFrameShape(QFrame::StyledPanel);  // a group box without a title would take a third of the start-up time
     frame->setObjectName(u"Frame1"_s);
     frame->setAccessibleName(u"What to do"_s);
     auto* options = new QVBoxLayout(frame);
@@ -98,7 +98,7 @@ bool frmKEST::event(QEvent* event)
     return Form::event(event);
 }
 
-/// Enter with any shift key does nothing, on the button too, which would take it for a click.
+/// Enter with a modifier key does nothing, even on the button, which would treat it as a click.
 bool frmKEST::eventFilter(QObject* watched, QEvent* event)
 {
     if (event->type() == QEvent::KeyPress) {
@@ -167,7 +167,7 @@ void frmKEST::openUtilities()
     if (!passed)
         return;
     frmUtilities::ShowForm(grsQuote->text(u"QTNNO"_s), grsQuote->text(u"Subquote"_s));
-    EnsureConnection();  // the window may have been open for long
+    EnsureConnection();  // it may have been lost while the window was open
     grsQuote->requery();
 }
 

@@ -1,4 +1,4 @@
-// The panel "ORLA Partner Network": the four things that a user can do with the network.
+// The panel "ORLA Partner Network", which offers the four things that a user can do with the network.
 #pragma once
 
 #include "platform/desktop/Form.h"
@@ -11,6 +11,7 @@ class QRadioButton;
 
 namespace kest {
 
+/// The panel. It reads the host's quote from `grsQuote`, which must be open before the panel is shown.
 class frmKEST final : public desktop::Form {
     Q_OBJECT
 public:
