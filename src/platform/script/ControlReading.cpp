@@ -23,7 +23,7 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-/// A caption as it is seen: "&Load" is "Load", "A && B" is "A & B".
+/// Returns a caption as the user sees it: "Load" for "&Load", and "A & B" for "A && B".
 QString withoutMark(const QString& caption)
 {
     QString result;
@@ -67,7 +67,7 @@ std::optional<QString> textOf(const QWidget& control)
     if (const QTabBar* bar = tabsOf(control))
         return withoutMark(bar->tabText(bar->currentIndex()));
     if (const auto* field = qobject_cast<const QLineEdit*>(control.focusProxy()))
-        return field->text();  // a control composed around a field
+        return field->text();  // a composed control that contains a field
     return std::nullopt;
 }
 
@@ -101,7 +101,7 @@ std::optional<QJsonArray> rowsOf(const QWidget& control)
     const QTabBar* bar = tabsOf(control);
     if (!bar)
         return std::nullopt;
-    QJsonArray tabs;  // caption and key
+    QJsonArray tabs;  // each a caption and a key
     for (int tab = 0; tab < bar->count(); ++tab)
         tabs.append(QJsonArray{withoutMark(bar->tabText(tab)), bar->tabData(tab).toString()});
     return tabs;
@@ -119,7 +119,7 @@ QJsonObject reading(const QWidget& control)
     return result;
 }
 
-/// The window's own controls; what the toolkit builds into them has names of its own.
+/// Returns the names of the window's own controls, without those that Qt creates inside them.
 QStringList allNames(const QDialog& window)
 {
     QStringList names;

@@ -19,7 +19,8 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-/// The middle, but of a check box or option its mark: the rest of a wide one can't be hit.
+/// Returns the point to click: the middle of the control or, for a check box or radio button, of its indicator, because
+/// the empty part of a wide one does not react.
 QPoint target(const QWidget& control)
 {
     QStyleOptionButton option;
@@ -31,13 +32,13 @@ QPoint target(const QWidget& control)
     return control.rect().center();
 }
 
-/// The part of a control that takes the typing: the control, or the field inside it.
+/// Returns the widget that receives typed text: the control itself or the field inside it.
 QWidget& editor(QWidget& control)
 {
     const auto isEditor = [](const QWidget* widget) {
         return widget && widget->property("readOnly").isValid() && widget->metaObject()->indexOfMethod("clear()") >= 0;
     };
-    if (auto* field = control.findChild<QLineEdit*>())  // of a spin box, an editable combo box, a composed control
+    if (auto* field = control.findChild<QLineEdit*>())  // in a spin box, an editable combo box or a composed control
         return *field;
     if (isEditor(&control))
         return control;
@@ -161,7 +162,7 @@ void chooseTab(QWidget& control, const QString& key)
     const int tab = tabOf(bar, key);
     if (bar.rect().contains(bar.tabRect(tab).center()))
         return gestures::click(bar, bar.tabRect(tab).center());
-    gestures::focus(bar);  // a tab that is scrolled away is reached by key
+    gestures::focus(bar);  // the arrow keys reach a tab that is scrolled out of view
     const int start = bar.currentIndex();
     for (int moved = start; moved < tab; ++moved)
         gestures::press(*bar.window(), Qt::Key_Right);

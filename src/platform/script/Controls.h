@@ -1,4 +1,4 @@
-// The controls of a window as a script knows them: found by name, worked like a person works them, read.
+// Finds a window's controls by name, operates them as a person would, and reads them.
 #pragma once
 
 #include <QJsonObject>
@@ -11,23 +11,25 @@ class QWidget;
 
 namespace kest::desktop::controls {
 
-// Each throws a Refusal that says why it could not be done.
+// Each function throws a Refusal if a person could not do this.
 
-/// The control of that objectName, the visible one where several have it; the window itself by its own name.
+/// Returns the control with that objectName. If several have it, returns the visible one. The window's own name returns
+/// the window.
 QWidget& find(QDialog& window, const QString& name);
 
-/// A click where a person would hit the control.
+/// Clicks the control at the point where a person would.
 void click(QWidget& control);
-/// A double click on the chosen row of a list, or on the control.
+/// Double-clicks the selected row of a list, or the control.
 void doubleClick(QWidget& control);
-/// Empties a field and types the text; a list of choices takes the item of that text.
+/// Clears a field and types the text; in a combo box, chooses the item with that text.
 void set(QWidget& control, const QString& text);
-/// A click on the row with that first text, or that number from 0.
+/// Clicks a row. `item` is the text of its first cell, or its number, counted from 0.
 void select(QWidget& control, const QJsonValue& item);
-/// A click on the tab with that key or that caption.
+/// Clicks the tab with that key or caption.
 void chooseTab(QWidget& control, const QString& key);
 
-/// Of each named control its text, enabled, visible, checked and rows, as far as it has them; without names of all.
+/// Returns text, enabled, visible, checked and rows of each named control, as far as it has them. Without names, reads
+/// all controls.
 QJsonObject read(QDialog& window, const QStringList& names);
 
 }  // namespace kest::desktop::controls

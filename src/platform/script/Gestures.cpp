@@ -10,7 +10,7 @@
 #include <QThread>
 #include <QWindow>
 
-// Exported by QtGui for tools that inject events where the system's own come in.
+// Exported by QtGui for tools that inject events at the point where those of the system enter.
 QT_BEGIN_NAMESPACE
 Q_GUI_EXPORT void qt_handleMouseEvent(QWindow* window, const QPointF& local, const QPointF& global,
                                       Qt::MouseButtons state, Qt::MouseButton button, QEvent::Type type,
@@ -26,11 +26,11 @@ using namespace Qt::StringLiterals;
 namespace {
 
 // Milliseconds.
-constexpr int longestActivation = 1000;  // of a slow window manager
-constexpr int longestPress = 500;        // of a button that an access key holds down
+constexpr int longestActivation = 1000;  // for a slow window manager
+constexpr int longestPress = 500;        // how long an access key may hold a button down
 constexpr int pollInterval = 5;
 
-int eventTime = 0;  // milliseconds; two clicks of one step may make a double click, those of two steps never do
+int eventTime = 0;  // milliseconds; clicks of different steps are so far apart that they never make a double click
 
 void pressAndRelease(QWidget& window, QPoint point)
 {
@@ -50,7 +50,7 @@ void scrollTo(QWidget& control)
             area->ensureWidgetVisible(&control);
 }
 
-/// The point in the window's coordinates; what lies there must be the control or a part of it.
+/// Returns the point in the window's coordinates. Throws a Refusal if another control covers it.
 QPoint reachablePoint(QWidget& control, QPoint at)
 {
     checkUsable(control);
@@ -59,11 +59,12 @@ QPoint reachablePoint(QWidget& control, QPoint at)
     const QPoint point = control.mapTo(window, at);
     const QWidget* hit = window->childAt(point);
     if (hit != &control && !control.isAncestorOf(hit) && window != &control)
-        throw Refusal(hit ? u"the control is covered by "_s + hit->objectName() : u"the control lies out of reach"_s);
+        throw Refusal(hit ? u"the control is covered by "_s + hit->objectName() : u"the control is out of reach"_s);
     return point;
 }
 
-/// A window that was hidden and shown again may still have the system's focus, so that no event makes it active.
+/// Makes the window the active one even without an event: a window that was hidden and shown again may still have the
+/// system's focus, and then the system sends none.
 void makeActive(QWidget& window)
 {
     QT_WARNING_PUSH
@@ -72,7 +73,7 @@ void makeActive(QWidget& window)
     QT_WARNING_POP
 }
 
-/// A button acts when the access key has let it come up again, a moment after the key.
+/// Waits until no button is down: a button that was pressed by its access key is released, and acts, a moment later.
 void letButtonsComeUp(const QWidget& window)
 {
     const auto isDown = [&] {

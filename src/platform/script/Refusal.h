@@ -1,4 +1,4 @@
-// Why a step of a script could not be carried out.
+// The exception for a step of a script that can't be carried out.
 #pragma once
 
 #include <QString>
@@ -7,7 +7,7 @@
 
 namespace kest::desktop {
 
-/// Thrown by what carries a step out; the script adds window and step and ends the run.
+/// Says why a step can't be carried out. Script adds the window and the step and ends the run.
 struct Refusal {
     explicit Refusal(QString reason) : why(std::move(reason)) {}
     QString why;

@@ -1,4 +1,4 @@
-// A script that answers boxes and input boxes and drives windows, and the record of what was shown.
+// Answers boxes and drives windows from a script, and records what was shown.
 #pragma once
 
 #include "platform/Prompt.h"
@@ -13,7 +13,7 @@
 
 namespace kest::desktop {
 
-/// What an unattended command showed and was answered, in the form of the command's JSON output.
+/// What an unattended command showed and the answers it got, in the form of the command's JSON output.
 struct Record {
     QJsonArray boxes;
     QJsonArray inputs;
@@ -21,19 +21,20 @@ struct Record {
     QJsonArray reads;
 };
 
-/// Answers without a person. Boxes are printed on standard error as `[critical] title: text`; a question takes its
-/// default where the script has no entry for it; an input box without an entry gives the empty text; a window without
-/// visits, other than those that are recorded and closed, throws NeedsAnswer, and so does a step that a person could
-/// not carry out.
+/// Answers in place of a person. Prints boxes on standard error as `[critical] title: text`.
+///
+/// If the script has no entry for a question, its default button is the answer. An input box without an entry returns
+/// an empty text. Throws NeedsAnswer for a window without visits, unless such windows are recorded and closed, and for
+/// a step that a person could not carry out.
 class Script final : public Answerer, public WindowDriver {
 public:
-    /// `script` is the script's JSON object, empty for none. Throws RuntimeError for one of another form.
+    /// Throws RuntimeError if the JSON object does not have the form of a script.
     explicit Script(const QJsonObject& script = {});
 
-    /// Windows of this objectName are recorded by their own code and closed when no visit is there for them.
+    /// Closes windows with this objectName for which the script has no visit. Their own code records them.
     void recordAndClose(const QString& windowName);
 
-    /// Every input box gets this text, whatever the script says.
+    /// Answers every input box with this text, whatever the script says.
     void answerInputs(const QString& text) { inputReplies.prepend({{}, text}); }
 
     Answer box(const Box& box) override;
@@ -54,7 +55,7 @@ private:
 
     static QList<Reply> parseReplies(const QJsonObject& script, const QString& key);
     void parseWindows(const QJsonObject& windows);
-    /// The steps of this showing; the last visit serves all further ones.
+    /// Returns the steps for this showing of the window. The last visit is used for all further showings.
     const Visit& nextVisit(const QString& window);
     void carryOut(QDialog& window, const Visit& visit);
 
@@ -66,10 +67,10 @@ private:
     QSet<QString> recordedAndClosed;
 };
 
-/// Puts the script in charge of boxes, input boxes and windows; null leaves nobody in charge.
+/// Lets the script answer boxes and input boxes and drive windows. With null, nobody does.
 void useScript(std::shared_ptr<Script> script);
 
-/// The script that answers now, or null if a person does.
+/// Returns the script in use, or null if a person answers.
 Script* currentScript();
 
 }  // namespace kest::desktop

@@ -22,7 +22,7 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-/// A step's JSON object, whose wrong form is reported with the step's place.
+/// Reads the JSON object of a step. Errors name the place of the step in the script.
 class StepForm {
 public:
     StepForm(const QJsonObject& step, const QString& where) : json(step), place(where) {}
@@ -46,7 +46,7 @@ public:
         return whole;
     }
 
-    /// A text or a list of texts.
+    /// Returns the value, which may be a text or a list of texts.
     QStringList texts(const QString& key) const
     {
         if (!value(key).isArray())
@@ -168,11 +168,11 @@ Action shotStep(const StepForm& form)
 
 struct Kind {
     QLatin1StringView word;
-    QLatin1StringView argument;  // empty where the word's own value is all
+    QLatin1StringView argument;  // empty if the step has no second key
     Action (*parse)(const StepForm&);
 };
 
-// "tab" stands before "key", which is its argument.
+// "tab" comes before "key", because "key" is also its argument.
 constexpr std::array kinds{
     Kind{"click"_L1, ""_L1, clickStep},   Kind{"doubleClick"_L1, ""_L1, doubleClickStep},
     Kind{"set"_L1, "text"_L1, setStep},   Kind{"tab"_L1, "key"_L1, tabStep},

@@ -1,4 +1,4 @@
-// One step of a script's visit to a window: read from its JSON form, and carried out.
+// A single step of a script.
 #pragma once
 
 #include <QJsonObject>
@@ -14,13 +14,15 @@ class QDialog;
 
 namespace kest::desktop {
 
+/// A step of a script, such as a click or a text to type.
 struct ScriptStep {
-    QString description;  // as the script has it: `click cmdOK`
-    /// Carries the step out; throws a Refusal. What a reading step saw is its result, empty for any other.
+    QString description;  // as in the script: `click cmdOK`
+    /// Carries the step out and returns what a reading step has read, or an empty object for other steps. Throws a
+    /// Refusal if a person could not do it.
     std::function<QJsonObject(QDialog& window)> run;
 };
 
-/// Throws a RuntimeError that begins with `place` for a step of another form.
+/// Returns the step that `json` describes. Throws a RuntimeError that begins with `place` if it does not describe one.
 ScriptStep parseStep(const QJsonValue& json, const QString& place);
 
 }  // namespace kest::desktop
