@@ -14,7 +14,7 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-/// The plugin is there, with all libraries that it needs.
+/// Returns true if the plugin and all libraries that it needs are installed.
 bool loads(const QString& platform)
 {
     for (const QString& folder : QCoreApplication::libraryPaths()) {
@@ -27,7 +27,7 @@ bool loads(const QString& platform)
     return false;
 }
 
-/// The server that DISPLAY names takes the connection.
+/// Returns true if the server that DISPLAY names accepts a connection.
 bool xServerAnswers()
 {
     QLibrary xcb(u"xcb"_s, 1);
@@ -56,7 +56,7 @@ bool hasDisplay()
     QStringList platforms;
     for (const QString& named : qEnvironmentVariable("QT_QPA_PLATFORM").split(u';', Qt::SkipEmptyParts))
         platforms.append(named.section(u':', 0, 0));
-    if (platforms.isEmpty()) {  // Qt tries them in turn
+    if (platforms.isEmpty()) {  // Qt tries these in this order
         if (qEnvironmentVariableIsSet("DISPLAY"))
             platforms.append(u"xcb"_s);
         if (qEnvironmentVariableIsSet("WAYLAND_DISPLAY"))

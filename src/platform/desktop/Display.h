@@ -1,9 +1,9 @@
-// Whether there is a display to show windows on.
+// Checks for a display.
 #pragma once
 
 namespace kest::desktop {
 
-/// True where an application object can start: without a display Qt ends the whole process.
+/// Returns true if windows can be shown. Ask before creating a QApplication: without a display, Qt ends the process.
 bool hasDisplay();
 
 }  // namespace kest::desktop

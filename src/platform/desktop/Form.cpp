@@ -10,7 +10,7 @@ namespace {
 
 constexpr int pictureSize = 24;  // pixels
 
-/// Lines in the colour of the text, so that they show on light and dark desktops.
+/// Draws lines in the colour of the text, so that they are visible on light and dark desktops.
 QIcon drawn(const QPalette& palette, const QList<QPolygonF>& lines)
 {
     constexpr qreal sharpness = 2;
@@ -25,7 +25,7 @@ QIcon drawn(const QPalette& palette, const QList<QPolygonF>& lines)
     return picture;
 }
 
-/// A door with an arrow out of it.
+/// Draws a door with an arrow that leads out.
 QIcon exitPicture(const QPalette& palette)
 {
     return drawn(palette, {QPolygonF({{13, 7}, {13, 3}, {3, 3}, {3, 21}, {13, 21}, {13, 17}}),
@@ -52,7 +52,7 @@ void Form::keyPressEvent(QKeyEvent* event)
     if (event->matches(QKeySequence::Cancel))
         close();
     else if (event->key() == Qt::Key_Tab && event->modifiers() == Qt::ControlModifier)
-        focusNextChild();  // out of a text in which Tab is a character
+        focusNextChild();  // leaves a text editor, in which Tab is a character
     else
         QDialog::keyPressEvent(event);
 }

@@ -1,4 +1,4 @@
-// What all windows have in common: name, caption, one way out, no key that presses a button by itself.
+// The base class of all windows.
 #pragma once
 
 #include <QDialog>
@@ -8,11 +8,12 @@ class QPushButton;
 
 namespace kest::desktop {
 
-/// A modal window with the close box alone. Escape is the close box: every way out that is no button passes through
-/// `closeEvent`. Enter presses a button only where one was made the default.
+/// A modal window whose title bar has only the close box. Escape acts as the close box, so that both go through
+/// closeEvent(). No button is the automatic default: Enter presses a button only if it was made the default.
 class Form : public QDialog {
     Q_OBJECT
 public:
+    /// `name` becomes the objectName, by which scripts and WindowLayout know the window.
     Form(const QString& name, const QString& caption);
 
 protected:
@@ -20,10 +21,10 @@ protected:
     void showEvent(QShowEvent* event) override;
 };
 
-/// A button with a picture of the way out in place of a caption, and Alt+X for it; `tip` is shown, and read out.
+/// Creates a button with an exit picture and the shortcut Alt+X. `tip` is its tool tip and its accessible name.
 QPushButton* exitButton(QWidget* parent, const QString& name, const QString& tip = QStringLiteral("Close"));
 
-/// The picture of a list that drops down, in the colour of the text.
+/// Returns the arrow of a combo box in the colour of the text.
 QIcon dropArrow(const QPalette& palette);
 
 }  // namespace kest::desktop

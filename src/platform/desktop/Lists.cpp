@@ -14,7 +14,7 @@ namespace {
 
 constexpr int numberKeys = 9;
 
-/// As a click on the header.
+/// Acts as a click on the header of the column.
 void sortBy(QHeaderView& header, int column)
 {
     const bool isSorted = header.sortIndicatorSection() == column;

@@ -1,4 +1,4 @@
-// What all lists of the windows offer to mouse and keyboard alike.
+// The behaviour that all lists of the windows share.
 #pragma once
 
 class QString;
@@ -6,10 +6,10 @@ class QTreeView;
 
 namespace kest::desktop {
 
-/// Makes a list one of whole rows that is sorted by a click on a header, or Ctrl and the column's number; once more
-/// turns the order round. Until then it has the order of its rows. The chosen row stays chosen and in sight.
-/// Ctrl and "+" makes every column as wide as what it shows. `window` is the name of the
-/// list's window.
+/// Sets up a list of whole rows. `window` is the objectName of the list's window.
+///
+/// A click on a header, or Ctrl and the number of the column, sorts the list; a second one reverses the order. The
+/// selected row stays selected and visible. Ctrl and "+" fits all columns to their contents.
 void prepareList(QTreeView& list, const QString& window);
 
 }  // namespace kest::desktop

@@ -33,14 +33,14 @@ QString titleOrDefault(const QString& title)
     return title.isEmpty() ? defaultTitle() : title;
 }
 
-/// The window that a box belongs to; another program's window may be the active one.
+/// Returns the window that a box belongs to. The active window may be that of another program.
 QWidget* topWindow()
 {
     QWidget* modal = QApplication::activeModalWidget();
     return modal ? modal : QApplication::activeWindow();
 }
 
-/// The pointer of every day while a box is up: where a work that keeps the person waiting asks, it waits itself.
+/// Shows the normal cursor while a box is up: a long operation that asks a question is itself waiting for the user.
 class OrdinaryPointer {
 public:
     OrdinaryPointer() : wasOther(QGuiApplication::overrideCursor())
@@ -59,7 +59,7 @@ private:
     bool wasOther;
 };
 
-/// Boxes and input boxes as windows on top of the active one.
+/// Shows boxes and input boxes as windows on top of the active one.
 class PersonAnswerer final : public Answerer {
 public:
     Answer box(const Box& box) override;

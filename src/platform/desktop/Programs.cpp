@@ -19,7 +19,7 @@ void startDetached(const QString& path)
     QProcess program;
     program.setProgram(systemPath);
     QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
-    environment.insert(u"KEST2_PROFILE"_s, profile::root());  // it may have been chosen by an option
+    environment.insert(u"KEST2_PROFILE"_s, profile::root());  // an option may have chosen another profile
     program.setProcessEnvironment(environment);
     if (!program.startDetached())
         throw RuntimeError(PermissionDenied, u"This program can't be started: "_s + systemPath);

@@ -1,12 +1,12 @@
-// Starts another program and leaves it to itself.
+// Starts other programs.
 #pragma once
 
 #include <QString>
 
 namespace kest::desktop {
 
-/// Starts the program, a path in the host's form, which finds the profile by KEST2_PROFILE. Throws FileNotFound, or PermissionDenied for a file that this system
-/// cannot run.
+/// Starts a program and does not wait for it. `path` is in the host's form; the variable KEST2_PROFILE tells the
+/// program the profile. Throws FileNotFound, or PermissionDenied if this system can't run the file.
 void startDetached(const QString& path);
 
 }  // namespace kest::desktop

@@ -15,8 +15,8 @@ namespace kest::desktop {
 namespace {
 
 // Milliseconds.
-constexpr int quiet = 500;            // that a work may take before it is shown
-constexpr int longestExposure = 200;  // until the system has put a window on the screen
+constexpr int quiet = 500;            // an operation shorter than this shows no progress
+constexpr int longestExposure = 200;  // how long to wait until the window is on the screen
 constexpr int pollInterval = 10;
 
 constexpr int steps = 100;

@@ -1,4 +1,4 @@
-// Shows how far a work is that keeps a person waiting.
+// Shows the progress of a long operation.
 #pragma once
 
 #include <QElapsedTimer>
@@ -12,15 +12,17 @@ class QWidget;
 
 namespace kest::desktop {
 
-/// Seen once the work has taken half a second, with the pointer of waiting: in the bar of a window, or, where that is
-/// not to be seen, in a small window of its own, unless a script stands in for the person. Gone with the object. It
-/// paints itself, so that nothing that the user types or clicks gets in between.
+/// Shows a progress bar and the wait cursor after half a second, until the object is destroyed.
+///
+/// Uses `bar` if it is visible, and otherwise a small window of its own. With a script no window is shown. The bar is
+/// repainted without processing events, so nothing that the user types or clicks meanwhile is handled in between.
 class Progress {
 public:
     Progress(const QString& caption, const QString& what, QProgressBar* bar = nullptr);
     ~Progress();
     Q_DISABLE_COPY_MOVE(Progress)
 
+    /// Call this after each step of the operation.
     void step(qint64 done, qint64 total);
 
 private:

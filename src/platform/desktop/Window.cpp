@@ -16,19 +16,19 @@ namespace kest::desktop {
 namespace {
 
 constexpr double twipsPerInch = 1440;
-constexpr int titleBar = 450;  // twips, about: the system tells only when the window is there
+constexpr int titleBar = 450;  // twips, an estimate: the system gives the height only after the window is shown
 
 std::shared_ptr<WindowDriver> windowDriver;
 FailureReporter failureReporter;
 std::exception_ptr kept;
-QList<QDialog*> shownWindows;  // the innermost last
+QList<QDialog*> shownWindows;  // the last one is on top
 
 void keep(const std::exception_ptr& exception)
 {
     if (!kept)
         kept = exception;
     if (!shownWindows.isEmpty())
-        shownWindows.last()->hide();  // ends its event loop, whatever its close box would say
+        shownWindows.last()->hide();  // ends its event loop even if closeEvent() would refuse
 }
 
 class Shown {
@@ -37,9 +37,9 @@ public:
         : caller(shownWindows.isEmpty() ? QApplication::activeWindow() : shownWindows.last())
     {
         shownWindows.append(&window);
-        window.winId();  // makes the system's window
+        window.winId();  // creates the system's window
         if (caller && caller->windowHandle())
-            window.windowHandle()->setTransientParent(caller->windowHandle());  // stays on top of its caller
+            window.windowHandle()->setTransientParent(caller->windowHandle());  // keeps it on top of its caller
     }
     ~Shown()
     {
@@ -53,10 +53,10 @@ private:
     QPointer<QWidget> caller;
 };
 
-/// Pixels of a twip at the screen's resolution, and more of them where the font is larger than usual.
+/// Returns the pixels in a twip at the screen's resolution, scaled up if the font is larger than usual.
 double scale()
 {
-    constexpr double usualLine = 270;  // twips of a line of text up to which the font is a usual one
+    constexpr double usualLine = 270;  // twips; the line height of a usual font
     const QScreen* screen = QGuiApplication::primaryScreen();
     const double ofScreen = (screen ? screen->logicalDotsPerInch() : 96) / twipsPerInch;
     return std::max(ofScreen, QFontMetricsF(QApplication::font()).height() / usualLine);
@@ -102,7 +102,7 @@ void guarded(const QString& source, const std::function<void()>& event)
         } catch (const RuntimeError& error) {
             if (!failureReporter)
                 throw;
-            attempt([&] { failureReporter(error, source); });  // a report that failed has shown its box all the same
+            attempt([&] { failureReporter(error, source); });  // it shows its box before it can fail
         }
     } catch (...) {
         keep(std::current_exception());
@@ -135,7 +135,7 @@ void centre(QWidget& window)
     const QRect screen = window.screen()->availableGeometry();
     const QSize room = screen.size() - window.frameGeometry().size();
     window.move(screen.topLeft() +
-                QPoint(qMax(room.width(), 0), qMax(room.height(), 0)) / 2);  // its head is always seen
+                QPoint(qMax(room.width(), 0), qMax(room.height(), 0)) / 2);  // the title bar is always visible
 }
 
 }  // namespace kest::desktop

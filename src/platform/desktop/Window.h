@@ -1,4 +1,4 @@
-// Modal windows and their events: the one guard for slots, the one way to show a window.
+// Shows modal windows and guards their events against exceptions.
 #pragma once
 
 #include "platform/RuntimeError.h"
@@ -13,33 +13,37 @@
 
 namespace kest::desktop {
 
-/// Shows the window modally, centred on the screen, and returns when it has been closed. A script drives it where one
-/// answers for its objectName. Its size, and the column widths of its lists, are remembered in the profile.
+/// Shows the window modally, centred on the screen, and returns when it has been closed. If a window driver is set, it
+/// operates the window. The size of the window and the column widths of its lists are saved in the profile.
 void showModal(QDialog& window);
 
-/// Whoever drives windows in place of a person; `false` leaves the window to the person.
+/// Operates windows in place of a person.
 class WindowDriver {
 public:
     virtual ~WindowDriver() = default;
+    /// Operates the shown window. Returns false if a person should do it instead.
     virtual bool drive(QDialog& window) = 0;
 };
+/// Sets the driver of all windows; null leaves them to a person.
 void setWindowDriver(std::shared_ptr<WindowDriver> driver);
 
-/// Puts a person in charge: boxes and input boxes are real windows, and windows wait for their user.
+/// Lets a person answer: boxes and input boxes are real windows, and windows wait for their user.
 void usePerson();
 
-/// Reports a failure that nobody trapped in a slot; `source` is "window.control_event".
+/// Reports an error that no routine has caught; `source` is "window.control_event".
 using FailureReporter = std::function<void(const RuntimeError&, const QString& source)>;
+/// Sets the function that guarded() reports errors with.
 void setFailureReporter(FailureReporter reporter);
 
-/// Runs one event of a window: a RuntimeError that nobody trapped is reported and the window stays open. What ends an
-/// unattended command is kept, and thrown again by `showModal` outside of Qt's event code. While something is kept no
-/// further event runs.
+/// Runs an event of a window. If the event throws a RuntimeError, reports it and leaves the window open.
+///
+/// Keeps any other exception, which ends an unattended command, until showModal() throws it again outside of Qt's event
+/// code. Until then no further event runs.
 void guarded(const QString& source, const std::function<void()>& event);
-/// Throws what `guarded` has kept. For code that lets controls act without showing their window.
+/// Throws the exception that guarded() has kept, if any. For code that operates controls without showing their window.
 void throwKept();
 
-/// Connects a signal to an event routine through the guard.
+/// Connects a signal to an event routine, which runs through guarded().
 template <class Sender, class Signal, class Routine>
 void onEvent(Sender* sender, Signal signal, QObject* window, const QString& source, Routine routine)
 {
@@ -53,12 +57,13 @@ void onEvent(Sender* sender, Signal signal, QObject* window, const QString& sour
     });
 }
 
-/// Sizes in twips (1/1440 inch) as pixels, and back: at the screen's logical resolution, larger where the font is.
+/// Converts between twips (1/1440 inch) and pixels at the screen's logical resolution. If the font is larger than
+/// usual, a twip is larger too.
 int pixels(int twips);
 QSize pixels(int widthTwips, int heightTwips);
 int twips(int pixels);
 
-/// Moves the window's middle to the middle of its screen.
+/// Moves the window to the centre of its screen.
 void centre(QWidget& window);
 
 }  // namespace kest::desktop

@@ -21,7 +21,7 @@ QString layoutFile()
     return profile::root() + u"/windows.ini"_s;
 }
 
-/// True for a column whose width is the user's to choose.
+/// Returns true if the user can choose the width of the column.
 bool isFree(const QHeaderView& header, int column)
 {
     const bool fillsTheRest = header.stretchLastSection() && header.visualIndex(column) == header.count() - 1;
@@ -40,7 +40,7 @@ QStringList widths(const QHeaderView& header)
 void setWidths(QHeaderView& header, const QStringList& widths)
 {
     if (widths.size() != header.count())
-        return;  // the list has other columns now
+        return;  // the list had other columns then
     for (int column = 0; column < header.count(); ++column) {
         const int width = widths[column].toInt();
         if (width > 0 && isFree(header, column))
@@ -76,7 +76,7 @@ void WindowLayout::restore()
 {
     QSettings file(layoutFile(), QSettings::IniFormat);
     file.beginGroup(window.objectName());
-    const QSize size = file.value(u"size"_s).toSize();  // in twips, as the widths, so that both follow the scale
+    const QSize size = file.value(u"size"_s).toSize();  // in twips, like the widths, so that they fit any scale
     if (size.isValid())
         window.resize(pixels(size.width(), size.height())
                           .expandedTo(window.minimumSizeHint())

@@ -1,4 +1,4 @@
-// What a user made of a window, kept from one showing to the next: its size, its lists' column widths and sort order.
+// Remembers the size of a window, and the column widths and sort order of its lists.
 #pragma once
 
 #include <QMap>
@@ -10,20 +10,20 @@ class QHeaderView;
 
 namespace kest::desktop {
 
-/// The file `windows.ini` of the profile holds, under the window's and the list's objectName, what a user changed.
-/// A remembered size is cut to the screen; positions are not remembered.
+/// The layout that a user has given to a window, stored in the profile's file `windows.ini` under the objectNames of
+/// the window and its lists. A size is limited to the screen. Positions are not remembered.
 class WindowLayout {
 public:
-    /// Gives the window its remembered layout.
+    /// Applies the stored layout to the window.
     explicit WindowLayout(QDialog& window);
-    /// Writes what has changed since.
+    /// Stores what the user has changed since.
     void remember() const;
 
 private:
     struct State {
         QSize size;
-        QMap<QString, QStringList> columns;  // of each list: the widths
-        QMap<QString, QStringList> sort;     // of each sorted list: column, order
+        QMap<QString, QStringList> columns;  // the column widths of each list
+        QMap<QString, QStringList> sort;     // the column and the order of each sorted list
     };
 
     void restore();
