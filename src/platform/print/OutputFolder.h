@@ -1,4 +1,4 @@
-// A folder that each preview of an unattended run is written to.
+// Writes the previews of an unattended run to a folder.
 #pragma once
 
 #include <QJsonObject>
@@ -8,12 +8,12 @@ namespace kest::report {
 
 class Report;
 
-/// Each preview from now on writes `<n>-<number>.pdf` and `<n>-<number>.json` there, n counting from 1. Makes the
-/// folder, a path of this system; empty turns it off. Throws where it cannot be made.
+/// Sets and creates the folder, a path of this system. Each preview is written there as `<n>-<number>.pdf` and
+/// `<n>-<number>.json`, with n counting from 1. An empty path turns this off. Throws if the folder can't be created.
 void setOutputFolder(const QString& folder);
 
-/// Writes one preview there; nothing without a folder. What cannot be written is told on standard error: the preview
-/// goes on.
+/// Writes a preview to the folder. Does nothing if no folder is set. If a file can't be written, says so on standard
+/// error and returns normally.
 void writeOutput(int number, const Report& report, const QJsonObject& shown);
 
 }  // namespace kest::report

@@ -109,7 +109,7 @@ void Pages::collect(const QTextTable& table)
     for (int row = 0; row < table.rows(); ++row) {
         Piece piece{.top = tops[row], .bottom = tops[row + 1]};
         if (row < heads) {
-            piece.bottom = tops[std::min(heads + 1, table.rows())];  // a head stays with its first row
+            piece.bottom = tops[std::min(heads + 1, table.rows())];  // keep the head with the first row
         } else if (heads > 0) {
             piece.headTop = tops[0];
             piece.headBottom = tops[heads];
@@ -137,7 +137,7 @@ void Pages::slice()
     const double room = height - headerHeight - footerHeight;
     const double end = heightOf(*body);
     double top = 0;
-    qsizetype first = 0;  // the piece that the page begins with
+    qsizetype first = 0;  // the first piece of the page
     do {
         Slice page{.top = top, .bottom = end, .firstPiece = first};
         if (first < pieces.size() && pieces[first].headBottom <= top) {
@@ -157,7 +157,7 @@ void Pages::slice()
     } while (top < end);
 }
 
-/// Where a piece that is taller than a page is cut: below the last whole line.
+/// Returns where to cut a piece that is taller than a page: below the last line that fits.
 double Pages::lastLineAbove(double top, double limit) const
 {
     double cut = limit;
@@ -182,15 +182,15 @@ void Pages::draw(QPainter& painter, const QTextDocument& document, double at, do
     const QRectF shown(0, from, width, to - from);
     QAbstractTextDocumentLayout::PaintContext context;
     const double point = device.logicalDpiY() / pointsPerInch;
-    context.clip = shown.adjusted(0, point, 0, -point);  // what only touches the cut would come on both pages
+    context.clip = shown.adjusted(0, point, 0, -point);  // else text that touches the cut would appear on both pages
     context.palette.setColor(QPalette::Text, Qt::black);
     painter.setClipRect(shown);
     document.documentLayout()->draw(&painter, context);
     painter.restore();
 }
 
-/// The lines of a paragraph that began on the page before, down to the place that is returned. The layout's own drawing
-/// would put the line above the cut here too, hidden but there for whoever searches the file.
+/// Draws the lines of a paragraph that began on the page before, and returns where they end. QTextDocument would also
+/// draw the line above the cut; it would be hidden, but a search in the PDF file would find it twice.
 double Pages::drawRestOfParagraph(QPainter& painter, const Slice& slice, double at) const
 {
     if (slice.firstPiece >= pieces.size() || pieces[slice.firstPiece].line == 0)
@@ -230,7 +230,7 @@ void paint(const Report& report, QPagedPaintDevice& device, int firstPage, int l
     const Pages pages(report, device);
     const int last = lastPage > 0 ? std::min(lastPage, pages.count()) : pages.count();
     if (firstPage > last)
-        return;  // to begin would bring out an empty page
+        return;  // QPainter::begin() would print an empty page
     QPainter painter;
     if (!painter.begin(&device))
         throw RuntimeError(FileInputOutput, u"The report can't be painted."_s);

@@ -1,4 +1,4 @@
-// Lays a report out on pages and paints them: header and footer on each, no row and no line cut by a page's end.
+// Lays out and paints the pages of a report. Each has a header and a footer, and no row or line is cut at its end.
 #pragma once
 
 #include <QList>
@@ -16,18 +16,18 @@ namespace kest::report {
 
 class Report;
 
-/// The pages of a report as they come out on one device.
+/// The pages of a report on a device.
 class Pages {
 public:
-    /// `device` gives the paper, its margins and its resolution; it must outlive the pages.
+    /// `device` determines the paper, its margins and its resolution. It must outlive the pages, and so must `report`.
     Pages(const Report& report, QPagedPaintDevice& device);
 
     int count() const { return static_cast<int>(slices.size()); }
-    /// Paints a page, numbered from 0; the painter stands at the top left corner inside the margins.
+    /// Paints a page, counted from 0. The painter's origin must be the top left corner inside the margins.
     void paint(QPainter& painter, int page) const;
 
 private:
-    // Where one page cuts the body: from `top` to `bottom`, below the repeated head of a table.
+    // The part of the body that a page shows, from `top` to `bottom`, below the repeated head of a table.
     struct Slice {
         double top;
         double bottom;
@@ -35,11 +35,11 @@ private:
         double headBottom = 0;
         qsizetype firstPiece = 0;
     };
-    // What should stay in one piece: a row of a table with its head, or a paragraph's line.
+    // A part that should not be cut: a row of a table, or a line of a paragraph.
     struct Piece {
         double top;
         double bottom;
-        double headTop = 0;  // of the table that the piece is a row of
+        double headTop = 0;  // the head of the table, if the piece is a row
         double headBottom = 0;
         bool staysWithNext = false;  // a heading
         QTextBlock block = {};       // of a paragraph
@@ -67,11 +67,11 @@ private:
     QList<Slice> slices;
 };
 
-/// Paints all pages, or those that the user chose for a printer.
+/// Paints the pages from `firstPage` to `lastPage`, counted from 1. A `lastPage` of 0 means all pages.
 void paint(const Report& report, QPagedPaintDevice& device, int firstPage = 1, int lastPage = 0);
-/// Puts a device on A4 with the margins of a report.
+/// Sets the device to A4 with the margins of a report.
 void setPaper(QPagedPaintDevice& device);
-/// Writes the report as a PDF file of this system.
+/// Writes the report as a PDF file. Throws RuntimeError if the file can't be written.
 void writePdf(const Report& report, const QString& systemPath);
 
 }  // namespace kest::report

@@ -36,7 +36,7 @@ Preview::Preview(QWidget* parent, const std::function<void()>& print)
     all->setContentsMargins({});
     all->setSpacing(0);
     auto* row = new QHBoxLayout;
-    row->setSpacing(0);  // all tools side by side on a small screen too
+    row->setSpacing(0);  // so that all tools fit side by side on a small screen
     all->addLayout(row);
     all->addWidget(view, 1);
     addTools(*row, print);
@@ -113,7 +113,7 @@ bool Preview::eventFilter(QObject* watched, QEvent* event)
     if (watched != sheet || event->type() != QEvent::KeyPress)
         return QWidget::eventFilter(watched, event);
     switch (static_cast<QKeyEvent*>(event)->key()) {
-        case Qt::Key_Home:  // the other page keys scroll through all pages by themselves
+        case Qt::Key_Home:  // the view itself handles the other page keys
             goTo(1);
             return true;
         case Qt::Key_End:

@@ -1,4 +1,4 @@
-// Shows a report as it will be printed: pages, zoom, page keys, and the buttons for them.
+// Shows a report as it will be printed.
 #pragma once
 
 #include "platform/print/Report.h"
@@ -18,15 +18,16 @@ class QPrinter;
 
 namespace kest::report {
 
+/// A page view with zoom, and a row of buttons for pages, zoom, printing and saving as PDF.
 class Preview final : public QWidget {
     Q_OBJECT
 public:
-    /// `print` is what the print button does: the view prints nothing by itself.
+    /// The print button calls `print`. The view itself never prints.
     Preview(QWidget* parent, const std::function<void()>& print);
     ~Preview() override;
 
     void setReport(Report report);
-    /// The one that was set.
+    /// Returns the report that was set last.
     const Report& report() const { return shown.value(); }
 
 protected:

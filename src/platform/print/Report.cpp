@@ -22,7 +22,7 @@ namespace {
 
 [[noreturn]] void noTemplate(const QString& why)
 {
-    throw RuntimeError(TypeMismatch, u"The file is no report template: "_s + why);
+    throw RuntimeError(TypeMismatch, u"The file is not a report template: "_s + why);
 }
 
 QString between(const QString& text, const QString& start, const QString& end)
@@ -32,7 +32,7 @@ QString between(const QString& text, const QString& start, const QString& end)
     return part.match(text).captured(1);
 }
 
-/// The names of all tags, each once.
+/// Returns the names of all tags, each once.
 QStringList tagsIn(const QString& part)
 {
     static const QRegularExpression tag(u"\\{\\{[#^/&]?\\s*([^{}]+?)\\s*\\}\\}"_s);
@@ -43,7 +43,7 @@ QStringList tagsIn(const QString& part)
     return names;
 }
 
-/// "field=A|B" or "field!=A|B".
+/// A condition such as "field=A|B" or "field!=A|B".
 struct Condition {
     QString field;
     QStringList values;
@@ -60,7 +60,7 @@ struct Condition {
     bool isGiven() const { return !field.isEmpty(); }
 };
 
-/// "A=1,B=2;C=3": the conditions of one alternative joined by commas, the alternatives by semicolons.
+/// Alternatives such as "A=1,B=2;C=3": commas separate the conditions of an alternative, semicolons the alternatives.
 using Alternatives = QList<QList<Condition>>;
 
 Alternatives alternativesIn(const QString& text)
@@ -75,7 +75,7 @@ Alternatives alternativesIn(const QString& text)
     return alternatives;
 }
 
-/// One row under the names of its fields, which are found without regard to case.
+/// A row whose values are found by the names of their fields, in any case.
 class Row {
 public:
     Row(const Table& table, const QVariantList* values) : names(&table.fields), cells(values) {}
@@ -123,11 +123,11 @@ mustache::data valueOf(const QString& tag, const Row& row)
         return mustache::data(row.meets(condition));
     const QString field = tag.section(u':', 0, 0);
     const QString format = tag.section(u':', 1);
-    const QString text = row.text(field).remove(u'\r');  // lines end in a line feed here
+    const QString text = row.text(field).remove(u'\r');  // Qt's HTML uses line feeds
     return (format == u"money"_s ? asMoney(text) : format == u"date"_s ? asDate(text) : text).toStdString();
 }
 
-/// What stands before a format or a condition.
+/// Returns the part of a tag before its format or condition.
 QString fieldOf(const QString& tag)
 {
     const auto end = std::find_if(tag.begin(), tag.end(), [](QChar c) { return c == u':' || c == u'=' || c == u'!'; });

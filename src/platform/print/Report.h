@@ -1,4 +1,4 @@
-// A report: a template that a shop can change, its parameters, and the table that it shows.
+// A report: a template that a shop can change, its parameters and its table.
 #pragma once
 
 #include <QList>
@@ -18,39 +18,43 @@ struct Table {
     QList<QVariantList> rows;
 };
 
-/// All rows of a recordset, each value as text. Leaves it on its first row.
+/// Returns all rows of a recordset with each value as text. The first row is current afterwards.
 Table tableOf(db::Recordset& rows);
 
+/// A named value of a report, shown by the tag `{{name}}`.
 struct Parameter {
     QString name;
     QString value;
 };
 
-/// One template, opened. Its tags are those of mustache:
+/// A report template. Its tags are those of mustache:
 ///
-///   {{field}}              of the row, or outside of rows of the first one; {{parameter}}; {{page}} and {{pages}}
-///   {{field:money}}        with two decimals, where it is a number
-///   {{field:date}}         as dd/MM/yyyy, where it is a date
+///   {{field}}              the value of a field; outside of rows, that of the first row
+///   {{parameter}}          the value of a parameter
+///   {{page}} and {{pages}} the number of the page and of all pages
+///   {{field:money}}        with two decimals if it is a number
+///   {{field:date}}         as dd/MM/yyyy if it is a date
 ///   {{#rows}}...{{/rows}}  once for each row; {{#rows:field=A|B}} for those with one of these values,
 ///   {{#rows:field!=A}}
-///                          for those without; several conditions joined by commas, alternatives by semicolons;
-///   {{#rows:name}}         for those of a group, whose conditions stand under this name in the template
-///   {{#any:field=A|B}}     once where there is such a row
-///   {{#field=A|B}}         where the row has one of these values; {{^field=A|B}} where it has not
-///   {{>name}}              what stands in <template id="name">
+///                          for those without; commas join conditions, semicolons join alternatives;
+///   {{#rows:name}}         for those of a group, whose conditions the template defines under this name
+///   {{#any:field=A|B}}     once if there is such a row
+///   {{#field=A|B}}         if the row has one of these values; {{^field=A|B}} if it has none of them
+///   {{>name}}              the content of <template id="name">
 class Report {
 public:
-    /// Throws FileNotFound and the like for a file that cannot be read, TypeMismatch for one that is no template.
+    /// Reads a template. Throws FileNotFound or another file error if it can't be read, and TypeMismatch if the file is
+    /// not a template.
     explicit Report(const QString& path);
 
     const QString& title() const { return title_; }
     const QList<Parameter>& parameters() const { return parameters_; }
     void setParameter(qsizetype index, const QString& value) { parameters_[index].value = value; }
 
-    /// Without one the report shows the rows that are saved in the template.
+    /// Sets the rows to show. Without this call, the report shows the rows that are saved in the template.
     void setTable(Table table) { table_ = std::move(table); }
 
-    /// The parts of the report as HTML, all tags filled in.
+    /// The parts of the report as HTML, with all tags filled in.
     QString body() const;
     QString header(int page, int pages) const { return filled(header_, page, pages); }
     QString footer(int page, int pages) const { return filled(footer_, page, pages); }
