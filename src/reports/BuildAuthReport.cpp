@@ -21,7 +21,7 @@ QuoteKey quoteOf(const xml::Document& document)
     return QuoteKey::fromReference(document.textOf(u"//rootns:quoteBody/rootns:quoteReference"_s));
 }
 
-/// The quote of the message's request; where there is none it is closed, and a box has said so.
+/// Opens the quote of the message's request. If there is none, shows a box and returns a closed recordset.
 db::Recordset openQuote(const xml::Document& document, const QuoteKey& key, const QString& refusal)
 {
     db::Recordset quote(gConn);
@@ -42,7 +42,7 @@ db::Recordset openLines(const db::Recordset& quote)
     return lines;
 }
 
-/// "0" where the message tells the amount that the main quote holds, else the message's text.
+/// Returns "0" if the message's amount equals that of the main quote, otherwise the message's text.
 QString changed(const QString& told, double (*asInQuote)(double), const db::Recordset& mainQuote, const QString& column)
 {
     if (told.isEmpty())
@@ -76,7 +76,7 @@ ComparisonHeader authorisedHeader(const xml::Document& document, const QString& 
            };
 }
 
-/// So that the report of a quote that was taken as it stands prints, with its header and its total.
+/// Adds a row for a quote without changes, so that its report still shows the header and the total.
 void addUnchanged(db::Recordset& table, const ComparisonHeader& header)
 {
     table.addNew();
@@ -89,7 +89,7 @@ void addUnchanged(db::Recordset& table, const ComparisonHeader& header)
     setHeader(table, header);
 }
 
-/// Null where one of them is.
+/// Returns the sum of the columns, or Null if one of them is Null.
 QVariant sum(const db::Recordset& row, std::initializer_list<QLatin1StringView> columns)
 {
     double sum = 0;
@@ -108,7 +108,7 @@ db::Recordset buildAuthorised(const xml::Document& document, const QString& numb
     db::Recordset table = openComparison(ComparisonOf::AuthorisedQuote);
     addChangedLines(table, header, document, quote, lines, ComparisonOf::AuthorisedQuote, Reprint);
     if (lines.recordCount() > 0)
-        lines.moveFirst();  // a search that found nothing has left them at their end, where they count nothing
+        lines.moveFirst();  // a search without a match has left them at their end, and the totals would be 0
     CalcAuthorisedTotals(quote, lines);
     if (table.recordCount() == 0)
         addUnchanged(table, header);

@@ -64,7 +64,7 @@ constexpr Texts reasons[] = {
     {"METH"_L1, "Method of Repair"_L1},
 };
 
-/// Null for an unknown code: the field stays unset.
+/// Returns the text of a code, or Null for an unknown code, so that the field stays unset.
 QVariant textOf(const QString& code, std::span<const Texts> texts)
 {
     for (const auto& [known, text] : texts)
@@ -73,7 +73,7 @@ QVariant textOf(const QString& code, std::span<const Texts> texts)
     return {};
 }
 
-/// A step that printing goes on behind, where it finds a recordset without a current row.
+/// Runs a step and ignores NoCurrentRow.
 void step(const std::function<void()>& step)
 {
     try {
@@ -214,7 +214,7 @@ bool printAdjusted(const xml::Document& message, bool Reprint)
     return isMatched;
 }
 
-/// A document's name begins with the quote number, one more character, and the subquote.
+/// Returns true if the quote has a sublet document.
 bool hasSubletDocument(const QuoteKey& quote)
 {
     const QStringList names = files::list(subletFolder());
@@ -246,7 +246,7 @@ bool print(const QString& fileName, bool Reprint)
         return printAuthorised(message, Reprint);
     if (type == u"ARES"_s)
         return printResult(message);
-    return true;  // the other types have no report, nor has a marker, which names no type
+    return true;  // the other types have no report, and neither do markers, which have no type
 }
 
 }  // namespace

@@ -28,7 +28,7 @@ constexpr ReportField fields[] = {
     {"quote_total", 20}, {"sub_repairer", 30}, {"total_md", 20},
 };
 
-// A path is read from the message, anything else stands as it is; null is worked out elsewhere.
+// A path is read from the message, any other text is the value itself, and null is set elsewhere.
 struct HeaderField {
     const char* name;
     const char* authorised;
@@ -55,7 +55,7 @@ constexpr HeaderField headerFields[] = {
 
 enum class Section { Labour, Part, Paint, Sublet };
 
-// With which value a field of a line starts.
+// The value that a field of a line has at first.
 struct Start {
     enum From { Unset, Literal, Element, Number, NumberOrUnset, Tenth } from = Unset;
     const char* text = "";
@@ -64,9 +64,9 @@ struct Start {
 constexpr Start unset{};
 constexpr Start is(const char* text)            { return {Start::Literal, text}; }
 constexpr Start of(const char* element)         { return {Start::Element, element}; }
-constexpr Start number(const char* element)     { return {Start::Number, element}; }         // 0 where it is empty
+constexpr Start number(const char* element)     { return {Start::Number, element}; }         // 0 if empty
 constexpr Start numberIfAny(const char* element) { return {Start::NumberOrUnset, element}; }
-constexpr Start tenthOf(const char* element)    { return {Start::Tenth, element}; }          // 0 where it is empty
+constexpr Start tenthOf(const char* element)    { return {Start::Tenth, element}; }          // 0 if empty
 
 struct StartField {
     const char* name;
@@ -114,7 +114,7 @@ bool isBlank(const QString& text)
     return text.trimmed().isEmpty();
 }
 
-/// One line of the message. A deleted one has its number and nothing else.
+/// A line of the message. A deleted one has only its number.
 struct Line {
     xml::Node node;
     QString indicator;
@@ -145,7 +145,7 @@ QVariant startValue(const Start& start, const Line& line)
     return start.from == Start::Tenth ? toDouble(text) * 0.1 : toDouble(text);
 }
 
-/// Null where one of the two is.
+/// Returns hours times rate, or Null if one of them is Null.
 QVariant product(const db::Recordset& row, const QString& hours, const QString& rate)
 {
     if (row.isNull(hours) || row.isNull(rate))
@@ -153,7 +153,7 @@ QVariant product(const db::Recordset& row, const QString& hours, const QString& 
     return toDouble(row.value(hours)) * toDouble(row.value(rate));
 }
 
-// What a deleted line takes over from the shop's quote, where its own value says nothing.
+// A deleted line takes a value from the shop's quote if its own value is empty or 0, whichever this says.
 enum class SaysNothing { EmptyText, Zero };
 
 void takeOver(db::Recordset& row, const QString& field, const QString& oldField, SaysNothing test)
@@ -164,7 +164,7 @@ void takeOver(db::Recordset& row, const QString& field, const QString& oldField,
         row.set(field, row.value(oldField));
 }
 
-/// Puts the shop's values beside those of the message: the row added last in the table, and the shop's line.
+/// Adds the shop's values to those of the message, in the table's last row.
 class Comparison {
 public:
     Comparison(db::Recordset& reportRow, const db::Recordset& shopLine, const Line& messageLine,
@@ -320,7 +320,7 @@ void Comparison::sublet(db::Recordset& subletTypes)
     takeScriptWhereEmpty();
 }
 
-/// The vendor that the repairer of a sublet line is; a new one where the shop knows none of that name.
+/// Returns the vendor of a sublet line's repairer, and adds one if the shop has none of that name.
 QVariant vendorOf(const Line& line)
 {
     return findOrAddVendor(line.text("subletRepairer").left(repairerLength),
@@ -389,7 +389,7 @@ void addChangedLines(db::Recordset& table, const ComparisonHeader& header, const
     const QVariant total = quote.value(u"TOTAL"_s);
 
     for (const auto& [section, path] : sections) {
-        QString indicator;  // a line without one has that of the line before it, as when it is loaded
+        QString indicator;  // a line without one has that of the line before, as in the load
         for (const xml::Node& node : body.selectNodes(QString::fromLatin1(path))) {
             if (const xml::Node own = node.selectSingleNode(u"rootns:quoteLineChangeIndicator"_s))
                 indicator = own.text();

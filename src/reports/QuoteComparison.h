@@ -1,4 +1,4 @@
-// The lines of a quote that the insurer changed, beside the shop's own: one walk for the two kinds of message.
+// Compares the lines of an authorised or adjusted quote with the shop's own.
 #pragma once
 
 #include "platform/database/Recordset.h"
@@ -14,22 +14,22 @@ namespace kest {
 
 enum class ComparisonOf { AuthorisedQuote, AdjustedQuote };
 
-/// The fields that are the same on every row of a report.
+/// Names and values of the fields that are the same on every row of a report.
 using ComparisonHeader = QList<std::pair<QString, QVariant>>;
 
-/// Those that need nothing but the message.
+/// Returns those header fields that depend only on the message.
 ComparisonHeader readHeader(const xml::Document& document, ComparisonOf comparison);
-/// Puts the header on the row that was added last.
+/// Sets the header fields in the current row.
 void setHeader(db::Recordset& table, const ComparisonHeader& header);
 
-/// An empty comparison table, open.
+/// Opens an empty comparison table.
 db::Recordset openComparison(ComparisonOf comparison);
-/// Adds a row to the table for each line of the message that is not as the shop's line of that number. With `Reprint`
-/// the deleted ones are left out. `lines` are those of `quote`.
+/// Adds a row for each line of the message that differs from the shop's line of the same number. `lines` are those of
+/// `quote`. If `Reprint` is true, deleted lines are left out.
 void addChangedLines(db::Recordset& table, const ComparisonHeader& header, const xml::Document& document,
                      const db::Recordset& quote, db::Recordset& lines, ComparisonOf comparison, bool Reprint);
 
-/// Stands on the shop's line of that number; false where there is none.
+/// Makes the shop's line of that number the current row. Returns false if there is none.
 bool findLine(db::Recordset& lines, const QString& number);
 
 }  // namespace kest

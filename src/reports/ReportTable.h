@@ -1,4 +1,4 @@
-// The tables that reports are fed with: declared fields of fixed sizes, whose names are the templates' contract.
+// The in-memory tables of the reports. The templates rely on the names of their fields.
 #pragma once
 
 #include "platform/database/Recordset.h"
@@ -9,13 +9,14 @@ namespace kest {
 
 enum ReportNumber : qint32 { QuoteRequestReport = 710, AssessmentReport = 720, ComparisonReport = 730 };
 
+/// A field of a report table.
 struct ReportField {
     const char* name;
-    int size;  // characters; what is longer is cut
+    int size;  // characters; a longer value is cut
     db::Kind kind = db::Kind::Text;
 };
 
-/// An empty table of these fields, open.
+/// Opens an empty table with these fields.
 db::Recordset openReportTable(std::span<const ReportField> fields);
 
 }  // namespace kest

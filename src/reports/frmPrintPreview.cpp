@@ -29,7 +29,7 @@ namespace {
 
 constexpr int gap = 80;  // twips, around the button
 
-/// The template's path; none after a box where the number has no report.
+/// Returns the path of the template. If the report does not exist, shows a box and returns nothing.
 std::optional<QString> templateOf(qint32 number)
 {
     db::Recordset definition(gConn);
@@ -71,7 +71,7 @@ QJsonValue asJson(const std::optional<report::Table>& table)
     return QJsonObject{{u"fields"_s, QJsonArray::fromStringList(table->fields)}, {u"rows"_s, rows}};
 }
 
-/// Describes the preview for an unattended run.
+/// Records the preview for an unattended run.
 void recordPreview(qint32 number, const report::Report& report, const std::optional<report::Table>& table)
 {
     QJsonObject parameters;

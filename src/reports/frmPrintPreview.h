@@ -1,4 +1,4 @@
-// The one way in which a report reaches the screen or the printer.
+// The window that shows and prints reports.
 #pragma once
 
 #include "platform/desktop/Form.h"
@@ -18,12 +18,13 @@ class Preview;
 
 namespace kest {
 
+/// The report preview. Every report is shown and printed through this window.
 class frmPrintPreview final : public desktop::Form {
     Q_OBJECT
 public:
-    /// Shows a report and returns when the user has closed it. `pvValue` is the value of all its parameters; for 720 a
-    /// list of two: the shop and the title. Without a table the report shows what is saved in its template.
-    /// A number without a report gives a box; any failure ends it in silence.
+    /// Shows a report and returns when the user has closed it. `pvValue` is the value of all its parameters; for report
+    /// 720 it is a list of the shop and the title. Without a table, the report shows the rows saved in its template.
+    /// Shows a box if there is no report with that number. Ignores every other error.
     static void ShowForm(qint32 peReportType, const QVariant& pvValue, db::Recordset* table);
 
 protected:
