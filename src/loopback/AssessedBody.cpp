@@ -65,7 +65,7 @@ void setPart(Parameters& part, double price)
     part[u"partMarkUpAmount"_s] = money(parts * amount(part, u"partMarkUpPercentage"_s) / 100);
 }
 
-/// The insurer pays a little less.
+/// Reduces the amount of a line a little.
 void lower(int section, Parameters& values)
 {
     if (section == Labours)
@@ -116,7 +116,7 @@ void authorise(BodyLine& sublet, const QString& reference)
     sublet.values[u"subletAuthorityDocument"_s] = QString::fromLatin1(document.toBase64());
 }
 
-/// All lines but the sublets, whose amounts are not the insurer's to change, in an order of the dice.
+/// Returns all lines in random order, without the sublets, whose amounts an insurer does not change.
 QList<std::pair<int, BodyLine*>> changeable(QuoteBody& body, Dice& dice)
 {
     QList<std::pair<int, BodyLine*>> lines;

@@ -1,4 +1,4 @@
-// The lines of a quote as the insurer sends them back: kept, changed, added, deleted, totalled.
+// The lines of a quote as the insurer returns them: some changed, added or deleted, with new totals.
 #pragma once
 
 #include "loopback/Dice.h"
@@ -7,29 +7,32 @@
 
 namespace kest::app {
 
+/// The body of a quote document from the insurer.
 struct QuoteBody {
     QString reference;
     QString type;
     QList<BodyLine> lines[SectionCount];
 
-    /// As `quoteTotal` says it, tax included; deleted lines count nothing.
+    /// The value of `quoteTotal`, including tax and without deleted lines.
     double total() const;
+    /// Adds the elements of the quote body to `body`.
     void writeTo(const Branch& body) const;
 };
 
-/// How many lines the insurer changes; of each as many as there are.
+/// How many lines the insurer changes, at most all that there are.
 struct Changes {
     int change = 0;
     int add = 0;
     int remove = 0;
-    int sublets = 0;  // added, each with the document that authorises it
+    int sublets = 0;  // sublets to add, each with an authority document
 };
 
-/// The shop's lines, each with its indicator. Added ones have numbers above all of the shop's.
+/// Returns the shop's lines after the changes, each with its indicator. The numbers of added lines are higher than all
+/// of the shop's.
 QuoteBody assessedBody(const QuoteDocument& quote, const Changes& changes, Dice& dice);
-/// The shop's lines as they are, without indicators.
+/// Returns the shop's lines unchanged and without indicators.
 QuoteBody sameBody(const QuoteDocument& quote);
-/// A quote that was written at the insurer's.
+/// Returns a quote that the insurer wrote. `counts` is the number of lines in each section.
 QuoteBody manualBody(const QString& reference, const QString& type, const int (&counts)[SectionCount], Dice& dice);
 
 }  // namespace kest::app

@@ -1,4 +1,4 @@
-// The PDF that authorises a sublet.
+// Writes the PDF documents that authorise sublets.
 #pragma once
 
 #include <QByteArray>
@@ -6,7 +6,7 @@
 
 namespace kest::app {
 
-/// One page with these lines, the same bytes for the same lines.
+/// Returns a PDF file with these lines on one page. The same lines always give the same bytes.
 QByteArray authorityDocument(const QStringList& lines);
 
 }  // namespace kest::app

@@ -1,21 +1,23 @@
-// Choices that look free and are the same for the same seed.
+// Random choices that are the same for the same seed.
 #pragma once
 
 #include <QRandomGenerator>
 
 namespace kest::app {
 
+/// A random generator for the content of one message.
 class Dice {
 public:
-    /// `turn` keeps the choices of one message apart from those of the next.
+    /// `turn` gives each message other choices than the one before.
     Dice(quint32 seed, quint32 turn)
     {
         const quint32 words[] = {seed, turn};
         generator = QRandomGenerator(words);
     }
 
-    /// From 0 to below `count`.
+    /// Returns a number from 0 to `count` - 1.
     int below(qsizetype count) { return int(generator.bounded(quint32(count))); }
+    /// Returns one of the elements.
     template <class List>
     const auto& of(const List& list)
     {

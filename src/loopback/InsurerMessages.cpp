@@ -38,14 +38,15 @@ const Kind& kindOf(Act act)
     return kinds.at(act);
 }
 
-/// What a step is told, or what the insurer makes up.
+/// Returns the values of a step's parameters, or random ones if the step does not have them.
 class Told {
 public:
     Told(const Step& step, Dice& dice) : parameters(step.parameters), chance(dice) {}
 
     QString operator()(const QString& name, const QStringList& otherwise) const
     {
-        const QString& madeUp = otherwise[chance.below(otherwise.size())];  // rolled even where it is not used
+        // even if unused, so that later choices stay the same
+        const QString& madeUp = otherwise[chance.below(otherwise.size())];
         return parameters.value(name, madeUp);
     }
 
@@ -63,7 +64,7 @@ Parameters requestCustomer(const Step& step, const Told& told)
 {
     if (step.parameters.contains(u"company"_s))
         return {{u"companyName"_s, step.parameters[u"company"_s]}};
-    Parameters names;  // one by one: each may be made up by a roll
+    Parameters names;  // in separate statements: the order of random choices must be fixed
     names[u"title"_s] = told(u"title"_s, {u"Ms"_s, u"Mr"_s});
     names[u"firstName"_s] = told(u"firstname"_s, {u"Rowan"_s, u"Casey"_s, u"Alex"_s, u"Jordan"_s});
     names[u"surname"_s] = told(u"surname"_s, {u"Kestle"_s, u"Marchbank"_s, u"Tarrant"_s, u"Yelland"_s});
@@ -80,7 +81,7 @@ void writeCustomer(const Branch& customer, const Parameters& names)
         customer.add(name, names.value(QLatin1StringView(name)));
 }
 
-/// What a list shows for the customer: an insurer fills it for everyone.
+/// Returns the customer's name for the list, an element that an insurer fills for persons too.
 QString corporateCustomer(const Parameters& names)
 {
     const QStringList words{names.value(u"companyName"_s), names.value(u"title"_s), names.value(u"firstName"_s),
@@ -167,11 +168,11 @@ void writeAdjusted(const Branch& quote, const Step& step, const Matter& matter, 
     assessedBody(matter.document, changesOf(step), dice).writeTo(quote.add("quoteBody"));
 }
 
-/// A quote that comes back with its request and its vehicle.
+/// Writes a quote that returns to the shop, with its request and its vehicle.
 void writeQuote(const Branch& quote, const Matter& matter, const QuoteBody& body)
 {
     quote.add({{"kestQuoteNumber", always, matter.network},
-               filled("quoteRequestNumber", matter.request),  // an empty one would hold others back in the list
+               filled("quoteRequestNumber", matter.request),  // an empty number would hold back other messages
                {"claimNumber", always, matter.claim},
                {"vehicleRegistration", always, matter.rego},
                {"vehicleDescription", always, matter.vehicle}});
@@ -183,7 +184,7 @@ QuoteBody manualBodyOf(const Step& step, const Matter& matter, Dice& dice)
     const int counts[] = {step.number(u"labour"_s, 2), step.number(u"paint"_s, 1), step.number(u"parts"_s, 1),
                           step.number(u"sublet"_s)};
     const QString reference =
-        matter.quote.isEmpty() ? u"MANQ"_s : matter.quote + u'/' + matter.subquote;  // a word that is no number
+        matter.quote.isEmpty() ? u"MANQ"_s : matter.quote + u'/' + matter.subquote;  // any word that is not a number
     return manualBody(reference, step.parameters.value(u"type"_s, u"R"_s), counts, dice);
 }
 

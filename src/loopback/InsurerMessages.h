@@ -1,4 +1,4 @@
-// Writes what the insurer sends: network messages, answers to a sent quote, markers.
+// Writes the texts that the insurer sends: network messages, answers to a sent quote, and markers.
 #pragma once
 
 #include "loopback/AssessedBody.h"
@@ -11,7 +11,7 @@
 
 namespace kest::app {
 
-/// What a message is about, as far as the insurer knows it.
+/// What the insurer knows about the quote or request of a message.
 struct Matter {
     QString quote;
     QString subquote;
@@ -21,16 +21,16 @@ struct Matter {
     QString rego;
     QString vehicle;
     QString network;     // the network's number of the sent quote
-    QString authorised;  // that of the quote once authorised or adjusted
+    QString authorised;  // the network's number of the authorised or adjusted quote
     QuoteDocument document;
 
     QString reference() const { return subquote == u"0" ? quote : quote + u'/' + subquote; }
 };
 
-/// The code of a step's message: "AUQT", "MDMSG"; empty for an answer to a sent quote.
+/// Returns the code of a step's message, such as "AUQT" or "MDMSG", or an empty text for an answer to a sent quote.
 QString messageCode(Act act);
 
-/// The message of a step. Dates count from `today`.
+/// Returns the text of a step's message. Its dates are relative to `today`.
 QString messageText(const Step& step, const Matter& matter, Dice& dice, const QDate& today);
 
 }  // namespace kest::app

@@ -42,14 +42,14 @@ constexpr ActWord actWords[] = {
 
 constexpr std::array wholeNumbers{"wait"_L1,   "version"_L1, "pictures"_L1, "change"_L1, "add"_L1,
                                   "delete"_L1, "sublet"_L1,  "labour"_L1,   "parts"_L1,  "paint"_L1};
-constexpr int largestNumber = 999;  // of lines, pictures and carries
+constexpr int largestNumber = 999;  // limits the numbers of lines, pictures and carries
 
 [[noreturn]] void fail(const QString& why)
 {
     throw RuntimeError(TypeMismatch, why);
 }
 
-/// The words of a line; blanks inside double quotes belong to the word, and a "#" begins a comment.
+/// Splits a line into words. Blanks in double quotes belong to the word, and "#" begins a comment.
 QStringList wordsOf(const QString& line)
 {
     QStringList words;
@@ -73,13 +73,13 @@ QStringList wordsOf(const QString& line)
         }
     }
     if (quoted)
-        fail(u"a double quote has no second one"_s);
+        fail(u"a double quote is not closed"_s);
     if (inWord)
         words.append(word);
     return words;
 }
 
-/// The line without its comment and the blanks at its ends.
+/// Returns the line without its comment and the blanks at its ends.
 QString bare(const QString& line)
 {
     bool quoted = false;
@@ -140,7 +140,7 @@ const ActWord& actNamed(const QString& word)
             return act;
         known.append(act.word);
     }
-    fail(u"\"%1\" is no step; a step is %2"_s.arg(word, known.join(u", "_s)));
+    fail(u"\"%1\" is not a step; a step is %2"_s.arg(word, known.join(u", "_s)));
 }
 
 const ActWord& wordOf(Act act)
@@ -148,7 +148,7 @@ const ActWord& wordOf(Act act)
     return *std::find_if(std::begin(actWords), std::end(actWords), [act](const ActWord& w) { return w.act == act; });
 }
 
-/// `words` behind "on".
+/// Reads an occasion from the words after "on".
 Rule occasionIn(QStringList words)
 {
     Rule rule;
@@ -172,7 +172,7 @@ Rule occasionIn(QStringList words)
     return rule;
 }
 
-/// On a start no quote and no request is at hand until a step has told one.
+/// Checks that a step of "on start" names its quote or request: there is none until a step has named it.
 void checkTarget(const Rule& rule, const Step& step)
 {
     if (rule.occasion != Occasion::Start)
@@ -184,9 +184,9 @@ void checkTarget(const Rule& rule, const Step& step)
         std::any_of(rule.steps.begin(), rule.steps.end(), [](const Step& s) { return s.act == Act::Request; });
     const ActWord& word = wordOf(step.act);
     if (word.needs == Needs::Quote && !told(u"quote"_s))
-        fail(u"%1 at the start has to say which quote: quote=NUMBER"_s.arg(word.word));
+        fail(u"%1 at the start must say which quote: quote=NUMBER"_s.arg(word.word));
     if (word.needs == Needs::Request && !told(u"request"_s) && !told(u"quote"_s) && !afterRequest)
-        fail(u"%1 at the start has to say which request: request=NUMBER"_s.arg(word.word));
+        fail(u"%1 at the start must say which request: request=NUMBER"_s.arg(word.word));
 }
 
 class Parser {
@@ -228,7 +228,7 @@ private:
 
     void takeOccasion(const QStringList& words)
     {
-        result.rules.append(Rule{});  // even where it is wrong, so that its steps are not told as strays
+        result.rules.append(Rule{});  // even if it is wrong, so that its steps are not reported as misplaced
         result.rules.last().line = number;
         Rule rule = occasionIn(words);
         rule.line = number;
@@ -240,7 +240,7 @@ private:
         Step step = parsedStep(line);
         step.line = number;
         if (result.rules.isEmpty())
-            fail(u"a step stands below its occasion: on start, on quote NUMBER, ..."_s);
+            fail(u"a step must be below an occasion: on start, on quote NUMBER, ..."_s);
         checkTarget(result.rules.last(), step);
         result.rules.last().steps.append(step);
     }

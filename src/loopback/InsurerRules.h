@@ -1,4 +1,4 @@
-// What the insurer of the loopback transport does: a line-oriented text that a person writes, as rules.
+// The rules of the loopback transport's insurer, read from a text that a person writes, one step on each line.
 #pragma once
 
 #include <QList>
@@ -13,6 +13,7 @@ namespace kest::app {
 /// The `name=value` words of a line.
 using Parameters = QMap<QString, QString>;
 
+/// What a step does.
 enum class Act {
     Request,
     Respond,
@@ -30,45 +31,49 @@ enum class Act {
     Marker
 };
 
-/// One message that the insurer sends.
+/// A message that the insurer sends.
 struct Step {
     Act act = Act::Respond;
     Parameters parameters;
-    int line = 0;  // of the rules, from 1; 0 for a step that no rule wrote
-    QString text;  // the line without its comment: `parsedStep` makes the same step of it
+    int line = 0;  // in the rules, from 1; 0 for a step that is not from the rules
+    QString text;  // the line without its comment; parsedStep() returns the same step for it
 
+    /// Returns a parameter as a number, or `otherwise` if the step does not have it.
     int number(const QString& name, int otherwise = 0) const;
 };
 
 enum class Occasion { Start, Quote, Request };
 
-/// What happens on an occasion: steps, each taken once the shop has dealt with the message of the one before.
+/// What happens on an occasion. Each step is taken after the shop has dealt with the message of the step before.
 struct Rule {
     Occasion occasion = Occasion::Start;
     QString number;         // of the quote or request; "*" for any quote
     QString subquote;       // "*" for any supplementary quote
-    Parameters parameters;  // hold for all steps
+    Parameters parameters;  // apply to all steps
     QList<Step> steps;
     int line = 0;
 
-    /// The steps in words: tells a rule that is done from one that was changed since.
+    /// Returns the steps as text. If the text differs, the rule has been changed since it was done.
     QString text() const;
 };
 
+/// All rules of an insurer.
 struct InsurerRules {
     quint32 seed = 1;
     QList<Rule> rules;
 
-    /// The rule for a quote's document: one for that quote, else one for its request, else one for any quote. Where
-    /// several stand for the same, the n-th is for the n-th document, and the last for all further ones. Null for none.
+    /// Returns the rule for a quote's document: one for that quote, or else for its request, or else for any quote. If
+    /// several rules are for the same, the n-th applies to the n-th document (`time`, from 0) and the last one to all
+    /// further documents. Returns null if there is none.
     const Rule* ruleFor(const QString& quote, const QString& subquote, const QString& request, int time) const;
 };
 
-/// Throws TypeMismatch with every fault of the text on a line of its own, each with its line's number.
+/// Returns the rules in a text. Throws TypeMismatch with all errors of the text, one on each line with its line number.
 InsurerRules parsedRules(const QString& text);
+/// Returns the step in a line. Throws TypeMismatch if it is not a step.
 Step parsedStep(const QString& text);
 
-/// A quote's number and subquote out of "1004" or "1004/1"; nothing where the subquote is not one digit.
+/// Returns the number and subquote of "1004" or "1004/1", or nothing if the subquote is not a single digit.
 std::optional<std::pair<QString, QString>> quoteNamed(const QString& reference);
 
 }  // namespace kest::app

@@ -12,23 +12,25 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-constexpr int mostLines = 32767;  // of a document
+constexpr int mostLines = 32767;  // in a document
 
 xml::Document parsed(const QString& text)
 {
     xml::Document document;
     if (!document.loadXML(wrappedInRequest(text)))
-        throw RuntimeError(TypeMismatch, u"it is no XML: "_s + document.parseError().reason.simplified());
+        throw RuntimeError(TypeMismatch, u"it is not XML: "_s + document.parseError().reason.simplified());
     return document;
 }
 
-/// An answer is a file with the number in its name, between two underlines.
+/// Throws TypeMismatch if the number can't be part of a file name: an answer has it in its name, between two
+/// underscores.
 void checkNumber(const QString& number)
 {
     const bool nameable = std::all_of(number.begin(), number.end(),
                                       [](QChar c) { return c.isLetterOrNumber() || c == u'-' || c == u' '; });
     if (number.isEmpty() || !nameable)
-        throw RuntimeError(TypeMismatch, u"\"%1\" is no quote number that an answer can carry"_s.arg(number.left(40)));
+        throw RuntimeError(TypeMismatch,
+                           u"\"%1\" is not a quote number that an answer can name"_s.arg(number.left(40)));
 }
 
 QList<BodyLine> linesOf(const xml::Document& document, const BodySection& section)

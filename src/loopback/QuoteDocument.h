@@ -1,4 +1,4 @@
-// A quote document as the shop leaves it in the outgoing folder, read as the insurer reads it.
+// Reads the quote documents that the shop puts into the outgoing folder.
 #pragma once
 
 #include "loopback/InsurerRules.h"
@@ -8,27 +8,29 @@
 
 namespace kest::app {
 
-/// A section of a quote body and what its lines hold.
+/// A section of a quote body and the elements of its lines.
 struct BodySection {
     const char* name;             // "labours"
     const char* line;             // "labour"
-    const char* total;            // the body's element behind the section
-    QList<const char*> elements;  // of a line, behind indicator and number
+    const char* total;            // the element of the body that follows the section
+    QList<const char*> elements;  // of a line, after its indicator and number
 };
-/// Labours, paints, parts, sublets: the order of a document.
+/// Returns the sections in the order of a document: labours, paints, parts, sublets.
 const QList<BodySection>& bodySections();
 enum SectionIndex : int { Labours, Paints, Parts, Sublets, SectionCount };
 
+/// A line of a quote body.
 struct BodyLine {
     QString indicator;  // empty, or "N", "C", "I", "D"
     int number = 0;
     Parameters values;
 };
 
+/// What the insurer reads from a quote document.
 struct QuoteDocument {
     QString quote;
     QString subquote;
-    QString request;  // empty where the quote answers none
+    QString request;  // empty if the quote does not answer a request
     QString version;
     QString claim;
     QString rego;
@@ -38,11 +40,12 @@ struct QuoteDocument {
     QList<BodyLine> lines[SectionCount];
 
     QString reference() const { return quote + u'/' + subquote; }
-    /// The highest line number, those of report items included.
+    /// The highest line number, including those of report items.
     int highestLine = 0;
 };
 
-/// Throws TypeMismatch, with the reason in words, for a text that is no quote document or that no answer could name.
+/// Reads a quote document. Throws TypeMismatch with the reason if it is not one, or if its number can't be part of an
+/// answer's file name.
 QuoteDocument quoteDocument(const QString& text);
 
 }  // namespace kest::app

@@ -26,7 +26,7 @@ Dealing dealingOf(const Rule& rule)
     return dealing;
 }
 
-/// "insurer.rules, line 7, quote 1004, waive": where the next step comes from.
+/// Returns where the next step comes from, such as "insurer.rules, line 7, quote 1004, waive".
 QString nameOf(const Dealing& dealing)
 {
     QStringList parts(dealing.origin);
@@ -61,7 +61,7 @@ Carry Transport::carry(const QDate& date)
     return result;
 }
 
-/// Changes whenever the file does.
+/// Returns a text that changes when the file does.
 QString Transport::stampOf(const QString& path)
 {
     const QFileInfo file(files::systemPath(path));
@@ -90,7 +90,7 @@ void Transport::readRules()
     rules = files::exists(file) ? parsedRules(QString::fromUtf8(files::readBytes(file))) : InsurerRules();
 }
 
-/// A file that was taken away is a wish to begin anew.
+/// Reads the state when it is not yet known. Deleting the state file resets the transport.
 void Transport::readState()
 {
     const QString file = folders.own + stateName;
@@ -111,7 +111,7 @@ void Transport::save()
 
 void Transport::beginStarts()
 {
-    QStringList stated;  // a rule that stands there twice is done twice
+    QStringList stated;  // a list, because a rule that is written twice is done twice
     for (const Rule& rule : rules.rules) {
         if (rule.occasion != Occasion::Start)
             continue;
@@ -138,12 +138,12 @@ void Transport::takeQuote(const QString& name)
 {
     const QuoteDocument quote = quoteDocument(files::read(folders.unsent + name));
     if (files::exists(folders.sent + name))
-        throw RuntimeError(FileExists, u"a document of this name was sent already"_s);
+        throw RuntimeError(FileExists, u"a document of this name has already been sent"_s);
     const bool begun = std::any_of(known->dealings.begin(), known->dealings.end(),
                                    [&](const Dealing& dealing) { return dealing.document == name; });
     if (!begun) {
         begin(quote, name);
-        save();  // before the document goes: a stop in between must not lose the answer
+        save();  // before the document moves: if the program stops in between, the answer must not be lost
     }
     files::move(folders.unsent + name, folders.sent + name);
     result.carried.append({Carried::Out, name, u"Quote "_s + NormaliseQuoteRef(quote.reference())});
@@ -151,7 +151,7 @@ void Transport::takeQuote(const QString& name)
 
 void Transport::begin(const QuoteDocument& quote, const QString& name)
 {
-    // what was still to come for the quote's earlier document is over
+    // the new document replaces the steps that remain for an earlier one of the quote
     known->dealings.removeIf([&](const Dealing& dealing) {
         return dealing.document.isEmpty() && dealing.facts.value(u"quote"_s) == quote.reference();
     });
@@ -170,11 +170,11 @@ void Transport::begin(const QuoteDocument& quote, const QString& name)
     dealing.facts[u"quote"_s] = quote.reference();
     dealing.document = name;
     if (dealing.steps.isEmpty() || parsedStep(dealing.steps.first()).act != Act::Respond)
-        dealing.steps.prepend(u"respond wait=0"_s);  // whatever the rule has to wait for
+        dealing.steps.prepend(u"respond wait=0"_s);  // the answer does not wait, even if the rule does
     known->dealings.append(dealing);
 }
 
-/// A picture and its document go together; one without the other waits.
+/// Moves a picture and its document together. If one of them is missing, the other waits.
 void Transport::takeImage(const QString& name)
 {
     const QString stem = name.chopped(3);
@@ -186,7 +186,7 @@ void Transport::takeImage(const QString& name)
         return;
     xml::Document document;
     if (!document.loadXML(files::read(folders.unsent + name)))
-        throw RuntimeError(TypeMismatch, u"it is no XML: "_s + document.parseError().reason.simplified());
+        throw RuntimeError(TypeMismatch, u"it is not XML: "_s + document.parseError().reason.simplified());
     known->moving = {*picture, name};
     save();
     finishMoving();

@@ -1,4 +1,4 @@
-// The loopback transport: carries files between the message folders and an insurer that follows a file of rules.
+// The loopback transport, which carries files between the message folders and an insurer that follows rules.
 #pragma once
 
 #include "loopback/InsurerMessages.h"
@@ -15,29 +15,32 @@
 
 namespace kest::app {
 
-/// Folders of this system or in the host's form, with a separator at the end.
+/// The folders of a transport. Paths of this system or in the host's form, with a separator at the end.
 struct TransportFolders {
     QString unread;  // where messages arrive
-    QString unsent;  // where the shop leaves its documents
-    QString sent;
-    QString own;  // the rules and the state
+    QString unsent;  // where the shop puts its documents
+    QString sent;    // where documents go after they have been sent
+    QString own;     // the rules and the state
 };
 
-/// One file that went its way.
+/// A file that was sent or received.
 struct Carried {
     enum Direction { Out, In } direction;
     QString file;
     QString what;  // "Authorised Quote 1004"
 };
 
+/// The result of one run of the transport.
 struct Carry {
     QList<Carried> carried;
-    QStringList faults;  // each in words; the same fault is told once, until its file changes
+    QStringList faults;  // error messages; the same error is reported once until its file changes
 };
 
-/// Shares nothing with the component but the folders, and knows a quote from its document alone. Whatever it writes
-/// appears whole, and a request's pictures before the request. It goes on where it stood after a restart, and does
-/// again what a fault has stopped.
+/// Carries files between the shop and the insurer.
+///
+/// It shares only the folders with the component, and knows a quote only from its document. No reader sees part of a
+/// file that it writes, and the pictures of a request arrive before the request. After a restart it continues where it
+/// stopped, and it retries what has failed.
 class Transport {
 public:
     static constexpr QLatin1StringView rulesName{"insurer.rules"};
@@ -45,8 +48,8 @@ public:
 
     explicit Transport(TransportFolders folders);
 
-    /// Takes what lies in the outgoing folder, answers each quote, and sends the next message of every rule that has
-    /// begun and whose last message the shop has dealt with. With rules that hold a fault nothing is carried.
+    /// Takes the files in the outgoing folder, answers each quote, and sends the next message of every rule that has
+    /// begun and whose last message the shop has dealt with. If the rules contain an error, nothing is carried.
     Carry carry(const QDate& today = QDate::currentDate());
 
 private:
@@ -57,7 +60,7 @@ private:
     void save();
     QString draw();
 
-    // what the shop sends
+    // from the shop
     void takeDocuments();
     void takeQuote(const QString& name);
     void takeImage(const QString& name);
@@ -65,7 +68,7 @@ private:
     void begin(const QuoteDocument& quote, const QString& name);
     void beginStarts();
 
-    // what the insurer sends
+    // from the insurer
     void rememberAnswers();
     void advance(qsizetype index);
     void perform(const Step& step, Dealing& dealing);
@@ -85,8 +88,8 @@ private:
     TransportFolders folders;
     InsurerRules rules;
     std::optional<TransportState> known;  // read by the first carry
-    QByteArray stored;                    // the state as its file holds it; empty before it was written or read
-    QHash<QString, QString> said;         // the faults that were told, by subject
+    QByteArray stored;                    // the content of the state file; empty before the first read or write
+    QHash<QString, QString> said;         // the errors that were reported, by subject
     Carry result;
     QDate today;
 };

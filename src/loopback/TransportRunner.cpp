@@ -17,8 +17,8 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-constexpr int settleTime = 300;  // milliseconds: the shop writes a quote and its images one after the other
-constexpr int slowTime = 5000;   // milliseconds: what is due, and folders that nobody watches
+constexpr int settleTime = 300;  // milliseconds, because the shop writes a quote and its images one after the other
+constexpr int slowTime = 5000;   // milliseconds, for steps that are due and for folders that can't be watched
 
 int signalPipe[2] = {-1, -1};
 
@@ -26,7 +26,7 @@ void noteSignal(int)
 {
     const char any = 0;
     const auto written = ::write(signalPipe[1], &any, 1);
-    static_cast<void>(written);  // a full pipe holds a signal already
+    static_cast<void>(written);  // if the pipe is full, a signal is already waiting in it
 }
 
 }  // namespace
@@ -46,7 +46,7 @@ TransportRunner::TransportRunner(const TransportFolders& all, Heard listener)
     interval.setInterval(slowTime);
     connect(&watcher, &QFileSystemWatcher::directoryChanged, &settled, qOverload<>(&QTimer::start));
     connect(&settled, &QTimer::timeout, this, [this] {
-        if (!files::list(folders.unsent).isEmpty())  // what it took away itself is no reason
+        if (!files::list(folders.unsent).isEmpty())  // else the transport itself has emptied it
             carryNow();
     });
     connect(&interval, &QTimer::timeout, this, [this] { carryNow(); });

@@ -1,4 +1,4 @@
-// Keeps the transport at work: at once when the shop leaves something, and at intervals.
+// Runs the transport whenever the shop puts a file into the outgoing folder, and at intervals.
 #pragma once
 
 #include "loopback/Transport.h"
@@ -13,19 +13,22 @@
 
 namespace kest::app {
 
-/// Where the transport of this profile works.
+/// Returns the transport's folders in this profile.
 TransportFolders transportFolders();
 
+/// Runs a transport until it is destroyed.
 class TransportRunner : public QObject {
 public:
-    /// Hears of every carry, those included that found nothing.
+    /// Called after every run, even if nothing was carried.
     using Heard = std::function<void(const Carry&)>;
 
     TransportRunner(const TransportFolders& folders, Heard heard);
 
-    /// False while another transport works on these folders. Throws if nothing can be written there.
+    /// Returns false if another transport is running on these folders. Throws RuntimeError if they can't be written.
     bool claim();
+    /// Runs the transport now and from then on. Call claim() first.
     void start();
+    /// Runs the transport once.
     void carryNow();
 
 private:
@@ -40,7 +43,7 @@ private:
     QTimer interval;
 };
 
-/// Ends something on SIGINT and SIGTERM, in the event loop, as long as it lives.
+/// Calls a function from the event loop on SIGINT and SIGTERM, as long as the object lives.
 class OnTermination {
 public:
     explicit OnTermination(std::function<void()> end);

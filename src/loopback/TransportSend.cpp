@@ -1,4 +1,4 @@
-// The insurer's side of the transport: what is known about a quote, and the messages about it.
+// The insurer's side of the transport: what it knows about a quote, and the messages that it sends.
 #include "base/Helpers.h"
 #include "loopback/Transport.h"
 #include "messages/Envelope.h"
@@ -15,7 +15,7 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-constexpr qint64 firstNumber = 600'000;  // six digits, as the network's own
+constexpr qint64 firstNumber = 600'000;  // six digits, like the network's own numbers
 constexpr quint32 numberSpread = 300'000;
 
 [[noreturn]] void fail(const QString& why)
@@ -28,14 +28,14 @@ QString keyOf(const QString& quote, const QString& subquote)
     return quote + u'/' + subquote;
 }
 
-/// The quote and subquote that an answer is for, as the component reads them out of its name.
+/// Returns the quote and subquote that an answer is for, which the component takes from the file's name.
 std::pair<QString, QString> answered(const QString& file)
 {
     const qsizetype end = file.indexOf(u'_', 2);
     return end < 0 ? std::pair(QString(), QString()) : std::pair(file.sliced(2, end - 2), file.mid(end + 1, 1));
 }
 
-/// What may stand in a file's name; the number came out of a document or a rule.
+/// Returns the characters of a number that a file name may contain. Numbers come from documents and rules.
 QString nameable(const QString& text)
 {
     QString result;
@@ -44,8 +44,8 @@ QString nameable(const QString& text)
     return result;
 }
 
-/// A quote that goes back to the shop, or that is answered anew, loses its old answer first: the component applies
-/// every answer that lies there at every fill, and would lock the quote again.
+/// Returns true if the old answer to the quote must be removed first, because the step returns the quote to the shop or
+/// answers it again. At every fill, the component applies all answers in the folder and would lock the quote again.
 bool takesAnswersAway(const Step& step, const Matter& matter)
 {
     switch (step.act) {
@@ -56,7 +56,7 @@ bool takesAnswersAway(const Step& step, const Matter& matter)
         case Act::BackOut:
             return true;
         case Act::Reject:
-            return matter.subquote != "0"_L1;  // a rejected main quote is closed
+            return matter.subquote != "0"_L1;  // after a rejection, a main quote is closed
         default:
             return false;
     }
@@ -76,7 +76,7 @@ enum Fact : unsigned {
     AuthorityFact = 32
 };
 
-/// What a message cannot go without, and the numbers that the insurer gives where there is none.
+/// The facts that a message requires, and those that the insurer makes up if they are unknown.
 struct Completion {
     unsigned needed;
     unsigned given;
@@ -137,7 +137,7 @@ void Transport::advance(qsizetype index)
 {
     Dealing dealing = known->dealings[index];
     if (!dealing.document.isEmpty() && !files::exists(folders.sent + dealing.document))
-        return;  // it could not be carried yet
+        return;  // it has not been sent yet
     if (!dealing.message.isEmpty() && files::exists(folders.unread + dealing.message))
         return;  // the shop has not dealt with it
     dealing.document.clear();
@@ -157,7 +157,7 @@ void Transport::advance(qsizetype index)
         known->dealings[index] = dealing;
         save();
     } catch (const RuntimeError&) {
-        *known = before;  // the same numbers are drawn when it is done again
+        *known = before;  // so that the next attempt uses the same numbers
         throw;
     }
 }
@@ -203,7 +203,7 @@ Matter Transport::matterOf(const Step& step) const
     return matter;
 }
 
-/// What nobody told: the insurer gives a number, or cannot go on.
+/// Fills in the unknown facts of a message. Throws RuntimeError if one is missing that the insurer can't make up.
 void Transport::complete(const Step& step, Matter& matter)
 {
     if (step.act == Act::Request) {
@@ -215,14 +215,14 @@ void Transport::complete(const Step& step, Matter& matter)
         matter.rego = step.parameters.value(u"rego"_s, u"KST%1"_s.arg(100 + chance.below(900)));
         matter.vehicle = step.parameters.value(u"vehicle"_s, u"Corella Meridian"_s);
     } else if (step.act == Act::Respond) {
-        matter.network = step.parameters.value(u"network"_s);  // a new one for each send
+        matter.network = step.parameters.value(u"network"_s);  // each send gets a new number
     } else if (step.act == Act::Revise && !step.parameters.contains(u"version"_s)) {
         matter.version = QString::number(matter.version.toInt() + 1);
     }
 
     const auto [needed, given] = completionOf(step.act);
     if (needed & DocumentFact && matter.document.quote.isEmpty())
-        fail(u"no document of quote %1 lies in the folder of sent quotes"_s.arg(matter.reference()));
+        fail(u"the folder of sent quotes has no document of quote %1"_s.arg(matter.reference()));
     const std::tuple<unsigned, QString&, QString, QString> facts[] = {
         {RequestFact, matter.request, u"the request"_s, u"request"_s},
         {NetworkFact, matter.network, u"the network's number of the quote"_s, u"network"_s},
@@ -232,7 +232,7 @@ void Transport::complete(const Step& step, Matter& matter)
     };
     for (const auto& [fact, value, what, parameter] : facts) {
         if (value.isEmpty() && needed & fact)
-            fail(u"%1 is not known; say it with %2="_s.arg(what, parameter));
+            fail(u"%1 is not known; give it with %2="_s.arg(what, parameter));
         if (value.isEmpty() && given & fact)
             value = draw();
     }
@@ -255,7 +255,7 @@ void Transport::remember(const Step& step, const Matter& matter, Dealing& dealin
     if (step.act == Act::Revise)
         known->requests[matter.request][u"version"_s] = matter.version;
     if (step.act == Act::Revise || step.act == Act::Delete)
-        known->quotes[quote].remove(u"network"_s);  // the shop sends the quote again and gets another
+        known->quotes[quote].remove(u"network"_s);  // the shop sends the quote again and gets another number
 }
 
 void Transport::put(const QString& name, const QByteArray& bytes, const QString& what)
@@ -275,7 +275,8 @@ void Transport::putPictures(const Step& step, const Matter& matter)
     }
 }
 
-/// The name of the message where the shop deals with it; empty for an answer, which stays.
+/// Sends the message of a step. Returns its file name, or an empty text for an answer, which the shop leaves in the
+/// folder.
 QString Transport::sendMessage(const Step& step, const Matter& matter)
 {
     Dice chance = dice();
@@ -290,7 +291,7 @@ QString Transport::sendMessage(const Step& step, const Matter& matter)
     const QString type = step.act == Act::Marker ? u"Marker"_s : messageTypeName(code);
     QString name;
     do {
-        // listed in the order of sending, behind what is named by its type
+        // the list shows them in the order of sending, after messages whose names begin with a type
         name = u"WEB_%1_%2_%3.xml"_s.arg(++known->messages, 6, 10, QChar(u'0'))
                    .arg(code, nameable(about.section(u' ', 1)));
     } while (files::exists(folders.unread + name) && files::readBytes(folders.unread + name) != bytes);
@@ -298,7 +299,7 @@ QString Transport::sendMessage(const Step& step, const Matter& matter)
     return name;
 }
 
-/// Answers that another one has sent, such as those that a demo begins with.
+/// Remembers the network's numbers in answers that this transport has not sent, such as those of a new demo shop.
 void Transport::rememberAnswers()
 {
     for (const QString& file : files::list(folders.unread, u"R_*.xml"_s)) {

@@ -73,7 +73,7 @@ TransportState TransportState::parsed(const QByteArray& text)
 {
     const QJsonDocument document = QJsonDocument::fromJson(text);
     if (!document.isObject())
-        throw RuntimeError(TypeMismatch, u"it cannot be read; take it away to begin anew"_s);
+        throw RuntimeError(TypeMismatch, u"it can't be read; delete it to start again"_s);
     TransportState state;
     state.numbers = document[u"numbers"].toInteger();
     state.messages = document[u"messages"].toInteger();

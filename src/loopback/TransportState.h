@@ -1,4 +1,4 @@
-// What the insurer remembers from one carry to the next, in one file.
+// What the insurer remembers between two runs of the transport, stored in a file.
 #pragma once
 
 #include "loopback/InsurerRules.h"
@@ -10,27 +10,29 @@
 
 namespace kest::app {
 
-/// Steps that are still to come about one quote or request.
+/// The remaining steps for a quote or request.
 struct Dealing {
-    Parameters facts;   // what the steps go by: those of the rule, and what they have told since
-    QStringList steps;  // as they stood in the rules when it began
-    QString origin;     // "insurer.rules, line 7", for faults
-    int waited = 0;     // carries, for the first step
-    QString document;   // whose carrying has begun; nothing happens before it is done
-    QString message;    // of the incoming folder, which the shop has to deal with first
+    Parameters facts;   // the parameters of the rule and of the steps so far
+    QStringList steps;  // as the rules had them when the first step began
+    QString origin;     // "insurer.rules, line 7", for error messages
+    int waited = 0;     // for how many runs the first step has waited
+    QString document;   // the document that is being sent; the steps wait for it
+    QString message;    // the message in the incoming folder that the shop must deal with first
 };
 
+/// The state of a transport.
 struct TransportState {
-    qint64 numbers = 0;                  // given to quotes, authorities, requests and claims
-    qint64 messages = 0;                 // sent
-    QStringList moving;                  // files of one carry, until all are carried
-    QStringList started;                 // the rules for the start that are done, as texts
+    qint64 numbers = 0;                  // how many numbers were given to quotes, authorities, requests and claims
+    qint64 messages = 0;                 // how many messages were sent
+    QStringList moving;                  // files that are being sent together
+    QStringList started;                 // the texts of the "on start" rules that have begun
     QMap<QString, Parameters> quotes;    // by "1004/0": documents, network, authorised, request, claim
     QMap<QString, Parameters> requests;  // by number: claim, rego, vehicle, version
     QList<Dealing> dealings;
 
-    /// Throws TypeMismatch for a text that is none.
+    /// Reads the content of a state file. Throws TypeMismatch if it is not one.
     static TransportState parsed(const QByteArray& text);
+    /// Returns the content of the state file.
     QByteArray text() const;
 };
 

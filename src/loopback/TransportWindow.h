@@ -1,4 +1,4 @@
-// The transport's window: what was carried, as it is carried.
+// The window of the loopback transport.
 #pragma once
 
 #include "loopback/TransportRunner.h"
@@ -10,14 +10,15 @@ class QTreeWidget;
 
 namespace kest::app {
 
+/// Runs a transport and lists the files that it carries.
 class TransportWindow final : public desktop::Form {
     Q_OBJECT
 public:
     explicit TransportWindow(const TransportFolders& folders);
 
-    /// False where another transport works on these folders.
+    /// Returns false if another transport is running on these folders.
     bool claim() { return runner.claim(); }
-    /// Shows the window until it is closed, or the program is told to end.
+    /// Shows the window until the user closes it or the program receives SIGINT or SIGTERM.
     void run();
 
 private:

@@ -29,7 +29,7 @@ TEST(InsurerRules, AFaultIsToldWithItsLine)
     for (const QStringList& row : rowsIn("loopback/rule-faults.txt"))
         EXPECT_EQ(faultsOf(row[0]), row[1]);
     EXPECT_TRUE(
-        faultsOf(u"on quote 1\n authorize"_s).startsWith(u"line 2: \"authorize\" is no step; a step is request"_s));
+        faultsOf(u"on quote 1\n authorize"_s).startsWith(u"line 2: \"authorize\" is not a step; a step is request"_s));
     EXPECT_EQ(faultsOf(files::read(checkoutFile(u"sql/demo/insurer.rules"_s))), QString());
     EXPECT_TRUE(faultsOf(u"on monday"_s).startsWith(u"line 1: an occasion is: on start, on quote"_s));
 }

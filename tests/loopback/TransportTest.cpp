@@ -171,7 +171,7 @@ TEST_F(Loopback, WhatCannotBeSentStaysAndIsToldOnceForEachChange)
 
     ASSERT_TRUE(send());
     files::write(gsSentPath + u"1004.0_1.xml"_s, u"another"_s);
-    EXPECT_EQ(faults(), "1004.0_1.xml: a document of this name was sent already");
+    EXPECT_EQ(faults(), "1004.0_1.xml: a document of this name has already been sent");
     EXPECT_EQ(files::read(gsSentPath + u"1004.0_1.xml"_s), u"another"_s);
     EXPECT_EQ(in(gsUnreadPath), "");
 }
@@ -202,7 +202,7 @@ TEST_F(Loopback, RulesWithAFaultStopEverythingUntilTheyAreMended)
     EXPECT_EQ(in(gsUnsentPath), "1004.0_1.xml");
     rules(u"on quote 1004\n  authorise\n  waive\n"_s);
     carried();
-    EXPECT_EQ(faults(), "insurer.rules, line 1, quote 1004, authorise: the claim is not known; say it with claim=");
+    EXPECT_EQ(faults(), "insurer.rules, line 1, quote 1004, authorise: the claim is not known; give it with claim=");
     EXPECT_EQ(faults(), "");
 }
 
