@@ -37,7 +37,7 @@ QString textOf(const QString& step)
     return QString::fromUtf8(file.readAll());
 }
 
-/// The host application, at whose database the component has no part.
+/// Executes statements as the host application would, on a connection of its own.
 void writeInHost(const QString& statements)
 {
     const db::ConnectionPtr host = openEmbedded(u"WirSql"_s);
@@ -49,7 +49,7 @@ QImage firstPageOf(const QString& pdf)
 {
     QPdfDocument document;
     if (document.load(pdf) != QPdfDocument::Error::None)
-        throw RuntimeError(FileInputOutput, pdf + u" is no PDF"_s);
+        throw RuntimeError(FileInputOutput, pdf + u" is not a PDF file"_s);
     const QSizeF size = document.pagePointSize(0);
     QImage page(pictureWidth, qRound(pictureWidth * size.height() / size.width()), QImage::Format_RGB32);
     page.fill(Qt::white);
@@ -97,7 +97,7 @@ void Day::beginWith(const QString& rules)
     driven(u"{\"windows\": {\"KESTWeb\": [[{\"shot\": \"@pictures@/00-transport.png\"}]]}}"_s, [] {
         TransportWindow window(transportFolders());
         if (!window.claim())
-            throw RuntimeError(PermissionDenied, u"Another transport works for this shop."_s);
+            throw RuntimeError(PermissionDenied, u"Another transport is running for this shop."_s);
         window.run();
     });
 }
@@ -122,7 +122,7 @@ desktop::Record Day::driven(const QString& text, const std::function<void()>& wi
     return script->record();
 }
 
-/// The first page of each report that the step has shown, as "05-report-1-730.png".
+/// Saves a picture of the first page of each report that the step has shown, such as "05-report-1-730.png".
 void Day::takePictures(const QString& step)
 {
     const QDir reports(pictures + u"/reports"_s);

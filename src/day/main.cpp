@@ -1,4 +1,4 @@
-// The command kest2-day: plays the working day on a fresh demo shop, up to and with the step whose name is given.
+// The command kest2-day plays the working day on a new demo shop, to its end or until the given step has been played.
 #include "day/Day.h"
 #include "platform/RuntimeError.h"
 #include "platform/Prompt.h"
