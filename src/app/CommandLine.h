@@ -1,4 +1,4 @@
-// The words after `kest2`: options, command and its arguments.
+// Parses the command line of `kest2`.
 #pragma once
 
 #include <QString>
@@ -8,6 +8,7 @@ namespace kest::app {
 
 enum ExitCode : int { Done = 0, Refused = 1, Usage = 2, NoConnection = 3, NeedsAPerson = 4 };
 
+/// The options, the command and its arguments.
 struct CommandLine {
     QString profile;  // empty: the default place
     QString script;   // a file; empty for none
@@ -15,13 +16,14 @@ struct CommandLine {
     bool json = false;
     QString command;
     QStringList arguments;
-    QString error;  // why the words are no command; empty when they are
+    QString error;  // why the words are not a command; empty if they are
 };
 
-/// Options stand before the command; `--json`, `--profile`, `--script` and `--reports` are taken behind it too, except
-/// behind `setting`, whose value may be any text.
+/// Parses the words after `kest2`. Options come before the command. `--json`, `--profile`, `--script` and `--reports`
+/// are also accepted after it, except after `setting`, whose value may be any text.
 CommandLine parsed(const QStringList& words);
 
+/// Returns the text of `kest2 --help`.
 QString usage();
 
 }  // namespace kest::app

@@ -40,18 +40,18 @@ enum class Needs { Nothing, Profile, Connection };
 
 struct Command {
     Needs needs;
-    int fewest;  // arguments
+    int fewest;  // the smallest number of arguments
     int most;
     std::function<Outcome(const CommandLine& line)> run;
 };
 
-/// For the commands that look at their arguments alone.
+/// Wraps a command that needs only its arguments.
 std::function<Outcome(const CommandLine&)> with(Outcome (*run)(const QStringList& arguments))
 {
     return [run](const CommandLine& line) { return run(line.arguments); };
 }
 
-/// An embedded database whose file is gone; a server's is no path of this system.
+/// Returns true if `database` is the file of an embedded database and does not exist. Servers have no such path.
 bool isMissing(const QString& database)
 {
     return QDir::isAbsolutePath(database) && !QFile::exists(database);
@@ -64,8 +64,8 @@ Outcome init(const QStringList& arguments)
         return refused(u"init takes --demo and nothing else"_s, Usage);
     if (!initProfile(registerClass, demo)) {
         if (const QString database = where()[u"database"_s].toString(); isMissing(database))
-            return refused(u"the profile is there already, but not its database: "_s + database, Refused);
-        return {.text = u"The profile is there already: "_s + profile::root() + u'\n'};
+            return refused(u"the profile exists, but its database does not: "_s + database, Refused);
+        return {.text = u"The profile already exists: "_s + profile::root() + u'\n'};
     }
     if (demo)
         installTransport(QCoreApplication::applicationFilePath());
@@ -83,7 +83,7 @@ Outcome open(const QStringList& arguments)
 {
     void* object = nullptr;
     if (DllGetClassObject(CLSID_eKEST, com::IID_IClassFactory, &object) != com::Ok)
-        return refused(u"the class object is not to be had"_s, Refused);
+        return refused(u"the class object could not be created"_s, Refused);
     auto* factory = static_cast<com::IClassFactory*>(object);
     const com::HResult created = factory->CreateInstance(nullptr, IID_IeKEST, &object);
     factory->Release();
@@ -146,8 +146,8 @@ Outcome setting(const QStringList& arguments)
     return refused(u"setting takes list, get APP SECTION KEY or set APP SECTION KEY VALUE"_s, Usage);
 }
 
-/// `joblink set --server S --port N --database D --user U`, the password on standard input: it must not stand in a list
-/// of processes or in a shell's history.
+/// `joblink set --server S --port N --database D --user U`. Reads the password from standard input, so that it appears
+/// neither in the list of processes nor in a shell's history.
 Outcome jobLink(const QStringList& arguments)
 {
     const auto wrong = [] { return refused(u"joblink set takes --server S --port N --database D --user U"_s, Usage); };
@@ -167,14 +167,14 @@ Outcome jobLink(const QStringList& arguments)
 
     QFile input;
     if (!input.open(stdin, QIODevice::ReadOnly))
-        return refused(u"the password cannot be read from standard input"_s, Refused);
+        return refused(u"the password can't be read from standard input"_s, Refused);
     settings.password = QString::fromLocal8Bit(input.readLine());
     while (settings.password.endsWith(u'\n') || settings.password.endsWith(u'\r'))
         settings.password.chop(1);
     if (settings.password.contains(u';') || settings.password.trimmed() != settings.password ||
         files::fromCodePage(files::toCodePage(settings.password)) != settings.password)
         return refused(
-            u"the password may hold no \";\", no blank at its ends and only characters of the code page 1252"_s,
+            u"the password must not contain \";\", blanks at its ends or characters outside of code page 1252"_s,
             Refused);
     storeJobLinkSettings(settings);
     return {.text = u"JobLink's settings are stored.\n"_s};
@@ -204,7 +204,7 @@ Outcome transport(const CommandLine& line)
         faulty = !carry.faults.isEmpty();
     });
     if (!ran)
-        return refused(u"another transport works for this profile already"_s, Refused);
+        return refused(u"another transport is already running for this profile"_s, Refused);
     return {.exitCode = faulty && mode->second == TransportMode::Once ? Refused : Done,
             .fields = {{u"carried"_s, carried}}};
 }
@@ -233,7 +233,7 @@ Outcome runConnected(const Command& command, const CommandLine& line)
     const eKEST component;
     if (!hasConnection())
         return {.exitCode = NoConnection};
-    InitCipherKey();  // as the panel does: a load may export to JobLink
+    InitCipherKey();  // as the panel does, because a load may export to JobLink
     return command.run(line);
 }
 
@@ -246,9 +246,9 @@ Outcome runChecked(const CommandLine& line)
     if (line.arguments.size() < command.fewest || line.arguments.size() > command.most)
         return refused(u"wrong number of arguments for "_s + line.command, Usage);
     if (command.needs != Needs::Nothing && !profileExists()) {
-        const QString why = u"no profile at "_s + profile::root() + u"; make one with: kest2 init"_s;
+        const QString why = u"no profile at "_s + profile::root() + u"; create one with: kest2 init"_s;
         if (isInteractive(line))
-            desktop::msgBox(why, desktop::Icon::Critical);  // started from the menu, nobody sees standard error
+            desktop::msgBox(why, desktop::Icon::Critical);  // a program started from the menu has no visible output
         return refused(why, NoConnection);
     }
     if (command.needs == Needs::Connection)
@@ -273,11 +273,11 @@ QJsonObject scriptIn(const QString& file)
         return {};
     QFile script(file);
     if (!script.open(QIODevice::ReadOnly))
-        throw RuntimeError(FileNotFound, u"the script "_s + file + u" cannot be read: "_s + script.errorString());
+        throw RuntimeError(FileNotFound, u"the script "_s + file + u" can't be read: "_s + script.errorString());
     QJsonParseError problem;
     const QJsonDocument document = QJsonDocument::fromJson(script.readAll(), &problem);
     if (!document.isObject())
-        throw RuntimeError(TypeMismatch, u"the script "_s + file + u" is no JSON object"_s +
+        throw RuntimeError(TypeMismatch, u"the script "_s + file + u" is not a JSON object"_s +
                                              (problem.error ? u": "_s + problem.errorString() : QString()));
     return document.object();
 }

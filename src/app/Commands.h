@@ -1,20 +1,20 @@
-// Runs one command of `kest2` and says what it did.
+// Runs the commands of `kest2`.
 #pragma once
 
 #include "app/CommandLine.h"
 
 namespace kest::app {
 
-/// Runs the command of a line that was parsed without an error, prints its answer on standard output and its boxes on
-/// standard error, and gives the exit code. An application object must exist.
+/// Runs a command and returns its exit code. Prints the answer on standard output and the boxes on standard error.
+/// `line` must have no error, and an application object must exist.
 int run(const CommandLine& line);
 
-/// Says on standard error why a command is not run, and gives the exit code; the JSON answer comes all the same.
+/// Prints on standard error why a command is not run, and the JSON answer if the line asks for it. Returns `exitCode`.
 int refuse(const CommandLine& line, const QString& why, int exitCode);
 
-/// True for the commands that open a window for a person.
+/// Returns true if the command opens a window for a person.
 bool isInteractive(const CommandLine& line);
-/// Takes the window off a command that does its work without one too; false for any other.
+/// If the command can also do its work without a window, changes `line` to that form and returns true.
 bool withoutWindow(CommandLine& line);
 
 }  // namespace kest::app

@@ -60,7 +60,7 @@ QJsonArray boxesShown()
     return desktop::currentScript()->record().boxes;
 }
 
-/// True where a box has come since then other than those that each fill of the list shows again.
+/// Returns true if a box has been shown since then, not counting boxes that every fill of the list shows again.
 bool hasTold(const QJsonArray& before)
 {
     const QJsonArray boxes = boxesShown();
@@ -68,7 +68,7 @@ bool hasTold(const QJsonArray& before)
                        [&](const QJsonValue& box) { return !before.contains(box); });
 }
 
-/// A click on a file's row that was refused or failed. Where no box has told why, a line does.
+/// Returns the exit code after a click that was refused or failed. If no box has said why, prints a line that does.
 int notDone(const frmMessageList& window, const QString& buttonName, const QString& file, const QJsonArray& boxesBefore)
 {
     if (hasTold(boxesBefore))
@@ -76,7 +76,7 @@ int notDone(const frmMessageList& window, const QString& buttonName, const QStri
     const auto* button = window.findChild<QPushButton*>(buttonName);
     const QString caption = u'"' + button->text().remove(u'&') + u'"';
     if (!isBareName(file))
-        return refused(file + u" is no name of a file of the folder"_s, Refused).exitCode;
+        return refused(file + u" is not the name of a file in the folder"_s, Refused).exitCode;
     if (!button->isEnabled())
         return refused(caption + u" is disabled for "_s + file, Refused).exitCode;
     return refused(caption + u" does nothing with "_s + file, Refused).exitCode;
@@ -138,7 +138,7 @@ Outcome view(const QStringList& arguments)
     if (!folder)
         return refused(u"view takes unread, read or sent, and a file"_s, Usage);
     if (!isBareName(arguments[1]))
-        return refused(arguments[1] + u" is no name of a file of the folder"_s, Refused);
+        return refused(arguments[1] + u" is not the name of a file in the folder"_s, Refused);
     const QJsonArray boxes = boxesShown();
     const QString text = FormatXML(folderPath(*folder) + arguments[1]);
     if (text.isEmpty() && !hasTold(boxes))

@@ -1,4 +1,4 @@
-// The commands that do from a terminal what the message list and "Send Quote" do.
+// The commands that correspond to the message list and to "Send Quote".
 #pragma once
 
 #include "app/Outcome.h"
@@ -7,7 +7,7 @@
 
 namespace kest::app {
 
-// A connection must be open, and a script must answer the desktop.
+// Before any of these commands, a connection must be open and a script must be in use.
 Outcome list(const QStringList& arguments);
 Outcome load(const QStringList& arguments);
 Outcome reprint(const QStringList& arguments);

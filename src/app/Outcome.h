@@ -1,4 +1,4 @@
-// What a command of `kest2` answers, and how it speaks.
+// The results of the commands of `kest2`.
 #pragma once
 
 #include "app/CommandLine.h"
@@ -10,18 +10,18 @@
 
 namespace kest::app {
 
-/// What a command adds to the answer that all commands give.
+/// What a command adds to the answer that all commands have in common.
 struct Outcome {
     int exitCode = Done;
     QJsonObject fields{};  // of the JSON object
-    QString text{};        // on standard output without --json
+    QString text{};        // printed on standard output without --json
     bool isWhole = false;  // `fields` is the whole JSON object
 };
 
-/// On standard output, or on another stream, at once.
+/// Prints a text and flushes the stream.
 void say(const QString& text, std::FILE* stream = stdout);
 
-/// Says on standard error why a command does nothing.
+/// Prints on standard error why a command does nothing, and returns an outcome with this exit code.
 Outcome refused(const QString& why, int exitCode);
 
 }  // namespace kest::app

@@ -58,7 +58,7 @@ void installTransport(const QString& command)
                           quoted + " --profile \"${KEST2_PROFILE:-$(dirname -- \"$0\")/..}\" transport --window\n");
     if (!QFile::setPermissions(program, QFile::permissions(program) | QFile::ExeOwner | QFile::ExeUser |
                                             QFile::ExeGroup | QFile::ExeOther))
-        throw RuntimeError(PermissionDenied, u"%1 cannot be made a program."_s.arg(program));
+        throw RuntimeError(PermissionDenied, u"%1 can't be made executable."_s.arg(program));
 }
 
 }  // namespace kest::app

@@ -1,4 +1,4 @@
-// The command `transport`, and its place in a demo.
+// The command `transport`, and its installation in a demo shop.
 #pragma once
 
 #include "loopback/TransportRunner.h"
@@ -9,13 +9,13 @@ namespace kest::app {
 
 enum class TransportMode { Once, Watching, Window };
 
-/// Carries once, or until the program is told to end or its window is closed. `heard` hears of every carry but those of
-/// the window, which shows them. False, with a box in place of the window, where another transport works for this
-/// profile already.
+/// Runs the transport once, or until the program receives SIGINT or SIGTERM or its window is closed. Calls `heard`
+/// after each run, except in the mode Window, in which the window shows it. Returns false if another transport is
+/// already running for this profile; in the mode Window a box says so.
 bool runTransport(TransportMode mode, const TransportRunner::Heard& heard);
 
-/// Puts a program of the name that the panel starts into the component's folder: `command`, told to open the window.
-/// It is a text of its own and no link: who replaces it must not hit the command.
+/// Writes a program to the component's folder that the panel can start as KESTWeb: a shell script that runs `command`
+/// and opens the transport's window. It is not a link, so that replacing it can't overwrite the command.
 void installTransport(const QString& command);
 
 }  // namespace kest::app

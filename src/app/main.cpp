@@ -1,4 +1,4 @@
-// The command kest2: what the windows do, from a terminal.
+// The command kest2, which does from a terminal what the windows do.
 #include "app/CommandLine.h"
 #include "app/Commands.h"
 #include "platform/desktop/Display.h"
