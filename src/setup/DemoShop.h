@@ -1,4 +1,4 @@
-// The demo shop's files: messages in all folders, the photographs that belong to them, the rules of its insurer.
+// Creates the files of the demo shop: messages in all folders, their photographs, and the rules of its insurer.
 #pragma once
 
 #include <QColor>
@@ -8,17 +8,19 @@
 
 namespace kest::app {
 
-/// Writes them into the message folders under `home`, the images folder and the component's folder; dates count back
-/// from `today`.
+/// Writes the files to the message folders under `home`, to the images folder and to the component's folder. Their
+/// dates are before `today`.
 void putDemoFiles(const QString& home, const QString& images, const QDate& today);
 
-/// What a photograph of the demo shop shows: the side of a car with its damage marked, and a caption.
+/// A photograph of the demo shop: the side of a car with a marked dent, and a caption.
 struct Photograph {
     QString caption;
     QColor paint;
-    double dent;  // how far along the car, from 0 at the front to 1 at the rear
+    double dent;  // its position, from 0 at the front to 1 at the rear
 };
+/// Draws a photograph.
 QImage drawn(const Photograph& photograph);
+/// Returns a photograph as a JPEG file.
 QByteArray jpegOf(const Photograph& photograph);
 
 }  // namespace kest::app

@@ -54,10 +54,10 @@ void writeSettings()
         if (RegGetValue(Hive::LocalMachine, key, name).isEmpty() &&
             (!settings::createKey(Hive::LocalMachine, key) ||
              !settings::setValue(Hive::LocalMachine, key, name, {settings::Type::Text, value})))
-            throw RuntimeError(FileInputOutput, u"The setting %1 cannot be written."_s.arg(name));
+            throw RuntimeError(FileInputOutput, u"The setting %1 can't be written."_s.arg(name));
 }
 
-/// The host's setting, or what a new profile has.
+/// Returns a setting of the host or, if it is missing, the value of a new profile.
 QString hostSetting(const QString& name)
 {
     QString ofNewProfile;
@@ -67,7 +67,8 @@ QString hostSetting(const QString& name)
     return GetRegSetting(u"wirra32"_s, u"frmsplash"_s, name, ofNewProfile, CopyUp::No);
 }
 
-/// A host that starts without a profile leaves settings of its own; only what is made here knows the system's version.
+/// Returns true if initProfile() has finished before. A host that starts without a profile also writes settings, but
+/// only initProfile() writes the version of the system.
 bool isWhole()
 {
     return !RegGetValue(Hive::LocalMachine, systemKey, u"CurrentVersion"_s).isEmpty();
@@ -84,12 +85,12 @@ void makeFolders()
 
 void makeDatabase(bool demo, const QDate& today)
 {
-    // under another name until it is whole: a database of this name is one that a shop works with
+    // under another name until it is complete, so that no one opens an unfinished database
     const QString unfinished = u"unfinished"_s;
     for (const QString& leftOver : files::list(profile::root() + u"/databases"_s, unfinished + u".db*"_s))
         files::remove(profile::root() + u"/databases/"_s + leftOver);
     const db::ConnectionPtr database = openEmbedded(unfinished);
-    database->execute(u"BEGIN"_s);  // nothing is there to keep: one write to the disk instead of hundreds
+    database->execute(u"BEGIN"_s);  // one write to the disk instead of hundreds
     createTables(*database, Dialect::Embedded);
     fillNewShop(*database);
     if (demo)
@@ -103,7 +104,7 @@ void rebuildIndexes()
 {
     const QString folder = profile::root() + u"/databases"_s;
     for (const QString& file : files::list(folder, u"*.db"_s))
-        attempt([&] { openEmbedded(file.chopped(3))->rebuildIndexes(); });  // a file may be no database
+        attempt([&] { openEmbedded(file.chopped(3))->rebuildIndexes(); });  // a file may not be a database
 }
 
 void installTemplates()
@@ -114,7 +115,7 @@ void installTemplates()
         QFile file(templates.filePath(name));
         file.open(QIODevice::ReadOnly);
         const QString place = hostSetting(u"ReportPath"_s) + name;
-        if (!files::exists(place))  // one that is there may be the shop's own
+        if (!files::exists(place))  // an existing one may have been changed by the shop
             files::writeBytes(place, file.readAll());
     }
 }
@@ -128,11 +129,11 @@ bool initProfile(const std::function<bool()>& registerClass, bool demo, const QD
         return false;
     }
     files::makeFolder(profile::root());
-    // another init would take the unfinished database away
+    // a second init at the same time would delete the unfinished database
     constexpr int longestInit = 60000;  // milliseconds
     const files::Lock making(profile::root() + u"/init.lock"_s, {}, longestInit);
     if (!making.isHeld())
-        throw RuntimeError(PermissionDenied, u"Another \"kest2 init\" is still making "_s + profile::root());
+        throw RuntimeError(PermissionDenied, u"Another \"kest2 init\" is still creating "_s + profile::root());
     if (isWhole())
         return false;
     makeFolders();
@@ -143,8 +144,8 @@ bool initProfile(const std::function<bool()>& registerClass, bool demo, const QD
     if (demo)
         putDemoFiles(hostSetting(u"EcomHome"_s), hostSetting(u"ImagesPath"_s), today);
     if (!registerClass())
-        throw RuntimeError(FileInputOutput, u"The class cannot be entered into the settings."_s);
-    writeSettings();  // last: they tell that the profile is whole
+        throw RuntimeError(FileInputOutput, u"The class can't be registered in the settings."_s);
+    writeSettings();  // last, because they mark the profile as complete
     return true;
 }
 

@@ -1,4 +1,4 @@
-// Makes a workstation's profile, and tells where everything of it lies.
+// Creates the profile of a workstation, and lists its files and folders.
 #pragma once
 
 #include <QDate>
@@ -8,14 +8,16 @@
 
 namespace kest::app {
 
-/// Makes the profile: folders, quote database, settings and, through `registerClass` (true if it succeeded), the class registration, with `demo` a shop with quotes,
-/// messages and photographs too. What a host that started before has left is kept, and what is missing is made. On a
-/// profile that was made here nothing changes but that the indexes of its databases are
-/// rebuilt, which another tool may have left in another order. True when the profile was made.
+/// Creates the profile: folders, quote database, settings and the class registration. `registerClass` registers the
+/// class and returns false if it fails. If `demo` is true, adds a shop with quotes, messages and photographs.
+///
+/// Keeps what a host has stored before and adds what is missing. If the profile is complete, only rebuilds the indexes
+/// of its databases, because another tool may have left them in another order. Returns true if the profile was created.
+/// Throws RuntimeError if a file can't be written.
 bool initProfile(const std::function<bool()>& registerClass, bool demo, const QDate& today = QDate::currentDate());
 
-/// The absolute paths of this system: `profile`, `database`, `unread`, `read`, `unsent`, `sent`, `images`, `pdf`,
-/// `reports`, `log`, `component`. Reads the settings without copying any.
+/// Returns absolute paths of this system: `profile`, `database`, `unread`, `read`, `unsent`, `sent`, `images`, `pdf`,
+/// `reports`, `log`, `component`. Reads the settings without copying them to the machine-wide place.
 QJsonObject where();
 
 }  // namespace kest::app

@@ -8,7 +8,7 @@
 #include <QFile>
 #include <QRegularExpression>
 
-static void registerFiles()  // outside the namespaces, as the macro wants it
+static void registerFiles()  // outside the namespaces, as the macro requires
 {
     Q_INIT_RESOURCE(sql);
     Q_INIT_RESOURCE(templates);
@@ -69,7 +69,7 @@ db::ConnectionPtr openEmbedded(const QString& name)
         files::makeFolder(profile::root() + u"/databases"_s);
         files::writeBytes(file, {});
     }
-    // a driver that no machine registers with ODBC, so that the embedded engine answers
+    // no machine registers this driver with ODBC, so the connection uses the embedded engine
     auto database = std::make_shared<db::Connection>();
     database->open(u"Driver={embedded};Server=(local)\\;Database=%1;"_s.arg(name));
     return database;
@@ -77,7 +77,7 @@ db::ConnectionPtr openEmbedded(const QString& name)
 
 QStringList statementsIn(const QString& script)
 {
-    // one token: a literal, a comment, or a single character
+    // a literal, a comment or a single character
     static const QRegularExpression token(u"'(?:[^']|'')*'|--[^\\n]*|."_s,
                                           QRegularExpression::DotMatchesEverythingOption);
     QStringList statements;

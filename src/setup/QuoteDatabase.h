@@ -1,4 +1,4 @@
-// Makes the host's quote database where the host has not made it: the schema, and the rows of a new shop.
+// Creates a quote database for a shop without a host: the schema, and the rows of a new shop.
 #pragma once
 
 #include "platform/database/Connection.h"
@@ -11,24 +11,26 @@ namespace kest::app {
 
 enum class Dialect { Embedded, MariaDb };
 
-/// All tables, on an empty database.
+/// Creates all tables in an empty database.
 void createTables(db::Connection& database, Dialect dialect);
-/// What the host puts there before the first quote: settings, stages, colours, the network's insurer.
+/// Adds what a host stores before the first quote: settings, stages, colours and the network's insurer.
 void fillNewShop(db::Connection& database);
-/// Quotes in every state of their network life, with cars, customers and vendors; dates count back from `today`.
+/// Adds quotes in every state of their network life, with cars, customers and vendors. Their dates are relative to
+/// `today`.
 void fillDemoShop(db::Connection& database, const QDate& today);
 
-/// An embedded database file `databases/<name>.db` of the profile, made empty where it is missing, and opened.
+/// Opens the embedded database `databases/<name>.db` of the profile. Creates an empty one if it does not exist.
 db::ConnectionPtr openEmbedded(const QString& name);
+/// Returns the path of that file, a path of this system.
 QString embeddedFile(const QString& name);
 
-/// Makes the files under ":/sql" readable: those of a static library do not register themselves.
+/// Makes the files under ":/sql" readable. Call it first: the resources of a static library don't register themselves.
 void registerResources();
 
-/// The statements of an SQL text, without its comments.
+/// Returns the statements of an SQL script, without comments.
 QStringList statementsIn(const QString& script);
-/// Days around `today` filled in: "@date-3@" is three days before as yyyy-MM-dd, "@short+10@" ten days after as
-/// dd/MM/yyyy.
+/// Replaces the dates in a text: "@date-3@" by the date three days before `today` as yyyy-MM-dd, "@short+10@" by the
+/// date ten days after it as dd/MM/yyyy.
 QString withDates(QString text, const QDate& today);
 
 }  // namespace kest::app
