@@ -17,7 +17,7 @@ namespace {
 
 constexpr int blockSize = BLOWFISH_BLOCK_SIZE;
 
-// The key is these codes' hexadecimal forms, joined. Every stored password depends on them.
+// The key consists of the hexadecimal forms of these codes. Every stored password depends on them.
 constexpr std::array<int, 36> keyCodes{211, 74,  158, 39,  226, 93,  180, 61,  147, 202, 118, 55,
                                        239, 86,  163, 28,  194, 107, 133, 248, 69,  175, 50,  220,
                                        101, 186, 45,  152, 231, 78,  169, 34,  207, 125, 142, 253};
@@ -28,7 +28,7 @@ quint8 byteOf(QStringView digits)
 {
     const auto isHexDigit = [](QChar digit) { return digit.unicode() < 128 && std::isxdigit(digit.unicode()); };
     if (!std::all_of(digits.begin(), digits.end(), isHexDigit))
-        throw RuntimeError(TypeMismatch, u"The stored text holds a pair that is not hexadecimal."_s);
+        throw RuntimeError(TypeMismatch, u"The stored text contains a pair that is not hexadecimal."_s);
     return static_cast<quint8>(digits.toUInt(nullptr, 16));
 }
 

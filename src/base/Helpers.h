@@ -1,4 +1,4 @@
-// The small text, number and date routines by whose exact rules messages are read.
+// Small routines for texts, numbers and dates. Messages are read by their exact rules.
 #pragma once
 
 #include <QDateTime>
@@ -8,26 +8,27 @@
 
 namespace kest {
 
-/// Every occurrence of `search` replaced, from left to right, without regard to case; what was put in is not searched.
+/// Replaces every occurrence of `search`, in any case, from left to right. The replacement itself is not searched.
 QString ReplaceText(const QString& text, const QString& replacement, const QString& search);
-/// "0" put in front up to the length; a text at or above it comes back unchanged.
+/// Adds zeros on the left up to the length. A text that is long enough stays as it is.
 QString PadZeroLeft(const QString& text, int length);
-/// The number in a text that may hold anything else: the text as a number, else the number that its digits and points
-/// make, else the fallback's. Never fails.
+/// Returns the text as a number or, if it is not one, the number that its digits and points form, or else the fallback.
+/// Never throws.
 double SafeVal(const QString& text, const QString& fallback);
-/// "UNIVERSAL" for "TBA", "UNIVERSAL", "ADVISE" and an empty registration; any other comes back as it is.
+/// Returns "UNIVERSAL" for "TBA", "UNIVERSAL", "ADVISE" and an empty text. Any other registration stays as it is.
 QString NormaliseRego(const QString& rego);
-/// "123/0" and "123" are "123"; "123/2" stays.
+/// Removes a subquote of 0: "123/0" becomes "123"; "123" and "123/2" stay.
 QString NormaliseQuoteRef(const QString& reference);
 /// Quote number and subquote; without a "/" the subquote is "0".
 std::pair<QString, QString> SplitQuoteRef(const QString& reference);
-/// The text's letters and digits.
+/// Returns the letters and digits of a text.
 QString AlphaNumericOnly(const QString& text);
-/// The part behind the last dot, trimmed, in upper case; empty without a dot.
+/// Returns the part after the last dot, trimmed and in upper case, or an empty text if there is no dot.
 QString GetExtensionUpper(const QString& fileName);
-/// A message's date and time in universal time as local "d/M/yyyy H:mm AM/PM" on a 12-hour clock; empty for an empty
-/// text. Throws TypeMismatch for a text that is no date.
+/// Converts a message's date and time from universal to local time, in the form "d/M/yyyy H:mm AM/PM" with a 12-hour
+/// clock. An empty text stays empty. Throws TypeMismatch if the text is not a date.
 QString FormatNetworkDate(const QString& text);
+/// Converts universal time to the local time of this machine.
 QDateTime UtcToLocal(const QDateTime& universal);
 
 }  // namespace kest

@@ -14,8 +14,8 @@ using settings::Type;
 
 namespace {
 
-constexpr qsizetype bufferSize = 1024;        // bytes, the closing zero byte among them
-constexpr double largestNumber = 0xFFFFFFFF;  // of four bytes
+constexpr qsizetype bufferSize = 1024;        // bytes, including the final zero byte
+constexpr double largestNumber = 0xFFFFFFFF;  // that fits into four bytes
 
 QString machineKey(const QString& app, const QString& section)
 {
@@ -49,7 +49,7 @@ QString RegGetValue(Hive hive, const QString& subKey, const QString& valueName)
     const std::optional<settings::Value> value = settings::query(hive, subKey, valueName);
     if (!value)
         return {};
-    if (value->type == Type::Number) {  // hexadecimal where someone has edited the file
+    if (value->type == Type::Number) {  // may be hexadecimal if someone has edited the file
         bool isNumber = false;
         const bool isHex = value->data.trimmed().startsWith(u"0x"_s, Qt::CaseInsensitive);
         const uint number = value->data.toUInt(&isNumber, isHex ? 16 : 10);

@@ -1,4 +1,4 @@
-// The host's settings: the machine-wide section of the registry, with the per-user area behind it.
+// Reads the host's settings: the machine-wide section of the registry first, then the per-user area.
 #pragma once
 
 #include "platform/settings/registry.h"
@@ -9,16 +9,20 @@ namespace kest {
 
 enum class CopyUp { Yes, No };
 
-/// The machine-wide value, else the per-user one, else the default. What came from behind is copied up to the
-/// machine-wide place unless told not to, so that from then on the default given in code no longer matters.
+/// Returns the machine-wide value, or else the per-user value, or else `fallback`.
+///
+/// With CopyUp::Yes a value that is not machine-wide is copied to the machine-wide place, even the fallback, so later
+/// calls no longer use their fallback.
 QString GetRegSetting(const QString& app, const QString& section, const QString& key, const QString& fallback,
                       CopyUp copyUp = CopyUp::Yes);
 
-/// One value as text; empty when anything fails, cut to a buffer of 1024 bytes.
+/// Returns a value as text, at most 1023 characters of it, or an empty text if anything fails.
 QString RegGetValue(settings::Hive hive, const QString& subKey, const QString& valueName);
-/// Writes to an existing key, keeping the value's type; false when that fails.
+/// Writes a value to an existing key and keeps the type of the value. Returns false if that fails.
 bool RegSetValue(settings::Hive hive, const QString& subKey, const QString& valueName, const QString& value);
+/// Creates a key. Ignores errors.
 void RegCreateSubKey(settings::Hive hive, const QString& subKey);
+/// Deletes a key. Ignores errors.
 void RegRemoveKey(settings::Hive hive, const QString& subKey);
 
 }  // namespace kest

@@ -26,7 +26,7 @@ struct Failure {
     int number = 0;
     QString description;
 };
-Failure lastFailure;  // of the last attempt to open the connection
+Failure lastFailure;  // from the last attempt to open the connection
 
 QString splashSetting(const QString& key, const QString& fallback = {})
 {
@@ -56,7 +56,7 @@ int driverNumber(CopyUp copyUp)
         GetRegSetting(u"Microsoft"_s, u"Windows NT\\CurrentVersion"_s, u"CurrentVersion"_s, QString(), copyUp);
     if (system >= u"6.0"_s)
         return 1;
-    int number = 0;  // also for a text that is no number
+    int number = 0;  // stays 0 if the text is not a number
     attempt([&] { number = static_cast<int>(toInteger(type)); });
     return number;
 }
@@ -87,7 +87,7 @@ bool EnsureConnection()
 void OpenDatabase()
 {
     if (!gcnDB)
-        gcnDB = std::make_shared<db::Connection>();  // else the same one: recordsets on it, the panel's too, go on
+        gcnDB = std::make_shared<db::Connection>();  // keep an existing one: recordsets, such as the panel's, use it
     lastFailure = {};
     attempt([] { readConnectionSettings(); });
     attempt([] {

@@ -1,4 +1,4 @@
-// The one connection to the host's database.
+// The connection to the host's database.
 #pragma once
 
 #include "base/ModRegistry.h"
@@ -10,30 +10,31 @@
 
 namespace kest {
 
-extern db::ConnectionPtr gcnDB;  // owned here; gConn refers to the same object
+extern db::ConnectionPtr gcnDB;  // the owner; gConn refers to the same object
 extern QString gsSAPwd;
 extern QString gsDatabase;
 extern QString gsServer;
 extern QString gsInstance;
 
-/// The open connection, opened where needed, or null when there is none.
+/// Returns the connection, which it opens if necessary, or null if that fails.
 db::ConnectionPtr GetConnection();
-/// True when the connection is open, opened where needed, again too where the server has dropped it. Whatever a user
-/// starts that needs the database asks for this first.
+/// Opens the connection if it is closed or if the server has dropped it, and returns whether it is open. Every action
+/// of a user that needs the database calls this first.
 bool EnsureConnection();
-/// Reads the settings and opens the connection; a failure shows only as a closed connection.
+/// Reads the settings and opens the connection. If that fails, the connection is closed afterwards.
 void OpenDatabase();
-/// Takes server, instance, database and password from the settings, which stay where they are.
+/// Reads server, instance, database and password from the settings. Copies no setting to the machine-wide place.
 void readConnectionSettings();
-/// The text that the connection is opened with, from the variables above; empty for a driver number that names none.
+/// Returns the connection text for a driver, made from the variables above, or an empty text if there is no such
+/// driver.
 QString connectionText(int driverNumber);
-/// The number of the driver, by the settings.
+/// Returns the number of the driver that the settings choose.
 int driverNumber(CopyUp copyUp = CopyUp::Yes);
-/// A query on a fresh recordset, or none after a critical message when there is no connection.
+/// Opens a query on a new recordset. If there is no connection, shows a critical box and returns nothing.
 std::optional<db::Recordset> OpenRecordset(const QString& select, bool disconnect = false, bool reconnect = false);
-/// A query on the shared connection `gConn`, open. Failures are thrown.
+/// Opens a query on the shared connection `gConn`. Throws RuntimeError if it fails.
 db::Recordset opened(const QString& select);
-/// This machine's name; empty on failure.
+/// Returns the name of this machine, or an empty text if that fails.
 QString GetComputerName();
 
 }  // namespace kest

@@ -1,4 +1,4 @@
-// Reports an unexpected failure: a box, and a record in kest2error.log beside the component.
+// Reports unexpected errors with a box and a record in kest2error.log, which is in the component's folder.
 #pragma once
 
 #include "platform/RuntimeError.h"
@@ -9,18 +9,19 @@ namespace kest {
 
 enum LogMode : int { BoxOnly = 0, BoxAndFile = 1 };
 
-/// `line` is 0 where no statement number is known. Throws when the file cannot be written, the box having been shown.
+/// Shows a box and, with the mode BoxAndFile, adds a record to the file. Pass 0 as `line` if it is unknown. Throws
+/// RuntimeError after the box if the file can't be written.
 void LogError(int line, const QString& source, const QString& number, const QString& description, const QString& title,
               int mode);
-/// The same for a failure in hand, with its box and its record.
+/// Reports an exception with a box and a record.
 void LogError(const RuntimeError& error, const QString& source, const QString& title);
 
-/// True when the file exists and is at least 1,048,576 bytes long.
+/// Returns true if the file exists and has at least 1,048,576 bytes.
 bool LogIsFull(const QString& path);
-/// Where records go.
+/// Returns the path of the error log.
 QString errorLogPath();
 
-/// Blanks trimmed at both ends, every double quote turned into a single one.
+/// Removes blanks at both ends and replaces double quotes by single ones.
 QString QuoteClean(const QString& text);
 
 }  // namespace kest
