@@ -1,4 +1,4 @@
-// Which quote: its number and its subquote.
+// Identifies a quote by its number and subquote.
 #pragma once
 
 #include <QString>
@@ -14,21 +14,21 @@ struct QuoteKey {
     QString number;
     QString subquote = QStringLiteral("0");
 
-    /// From "1007" or "1007/2".
+    /// Reads "1007" or "1007/2".
     static QuoteKey fromReference(const QString& reference);
-    /// From the current row of a query that gives `QTNNO` and `Subquote`; a Null is empty.
+    /// Reads the columns `QTNNO` and `Subquote` of the current row. A Null becomes an empty text.
     static QuoteKey fromRow(const db::Recordset& row);
-    /// From the name of a submission response, "R_1007_2" and anything after that.
+    /// Reads the name of a submission response, which begins like "R_1007_2".
     static QuoteKey fromResponseName(const QString& fileName);
 
     bool isMain() const { return subquote == QLatin1StringView("0"); }
-    /// "1007", or "1007/2" for a supplementary quote.
+    /// Returns "1007", or "1007/2" for a supplementary quote.
     QString reference() const;
-    /// "1007/0", "1007/2".
+    /// Returns "1007/0" or "1007/2".
     QString fullReference() const { return number + u'/' + subquote; }
-    /// "1007.2_": what the names of the quote's documents begin with.
+    /// Returns "1007.2_", with which the names of the quote's documents begin.
     QString filePrefix() const { return number + u'.' + subquote + u'_'; }
-    /// True if a file's name is the number, in any case, one more character, and the subquote.
+    /// Returns true if a file's name begins with the number, in any case, one more character, and the subquote.
     bool begins(const QString& fileName) const;
 
     bool operator==(const QuoteKey&) const = default;

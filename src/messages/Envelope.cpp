@@ -10,7 +10,7 @@ using namespace Qt::StringLiterals;
 namespace kest {
 namespace {
 
-constexpr QLatin1StringView networkDomain = "orla.example"_L1;  // of every network namespace, behind its labels
+constexpr QLatin1StringView networkDomain = "orla.example"_L1;  // every namespace of the network ends in this
 constexpr QLatin1StringView schemaInstance = "xmlns:xsi=\"http://www.w3.org/2001/XMLSchema-instance\" "_L1;
 constexpr int repairsAllowed = 3;
 constexpr QLatin1StringView unknownMessage = "UNKNOWN - INVALID MESSAGE"_L1;
@@ -63,7 +63,7 @@ bool isSameWhenPrepared(const QString& text)
     if (first < 0 || text.contains(schemaInstance, Qt::CaseInsensitive))
         return true;
     if (text.contains("xmlns:xsi"_L1))
-        return false;  // perhaps on the very element that is going to get the declaration
+        return false;  // the element that gets the declaration may already have one
     const QStringView before = QStringView(text).first(first);
     const QStringView tag = before.sliced(qMax(before.lastIndexOf(u'<'), 0));
     const bool isAttribute = tag.startsWith(u'<') && tag.back().isSpace() && !tag.contains(u'>') &&

@@ -1,4 +1,4 @@
-// What a message file is: its text made ready for the parser, its type codes and their display names.
+// Prepares and parses the texts of message files, and names their types.
 #pragma once
 
 #include "platform/xml/xml.h"
@@ -8,40 +8,40 @@
 
 namespace kest {
 
-/// The namespace of every element path, and of the outgoing quote document.
+/// Returns the namespace of the elements of messages and of the outgoing quote document.
 QString GetNamespaceURI();
-/// Prepares a document for the paths of this system, whose prefix is "rootns".
+/// Registers the namespace prefix that our XPath expressions use.
 void SetupDocument(xml::Document& document);
-/// The text with the schema-instance declaration before its first "xmlns"; unchanged where there is none, or where it
-/// is declared in the very wording of the insert.
+/// Inserts the schema-instance declaration before the first "xmlns" of the text. Returns the text unchanged if it has
+/// no "xmlns", or if it already has the declaration in exactly this wording.
 QString AddXsiDeclaration(const QString& text);
-/// True where a document parsed from the bare text and one parsed from the prepared text hold the same, so that a
-/// parse can be spared. In doubt false.
+/// Returns true if the text gives the same document before and after AddXsiDeclaration(), so that it needs no second
+/// parse. Returns false in doubt.
 bool isSameWhenPrepared(const QString& text);
 
-/// The display name of a type code in upper case, or "UNKNOWN - INVALID MESSAGE".
+/// Returns the display name of a type code in upper case, or "UNKNOWN - INVALID MESSAGE".
 QString messageTypeName(const QString& code);
-/// The display name of a network message. Changes `text` to the prepared one; never fails.
+/// Returns the display name of a network message. Adds the schema-instance declaration to `text`. Never throws.
 QString GetMessageTypeName(QString& text);
-/// The same, of a message that was parsed before.
+/// Returns the display name of a message that has already been parsed.
 QString GetMessageTypeName(const xml::Document& message);
-/// The display name of a marker message. Changes `text` to the prepared one; never fails.
+/// Returns the display name of a marker message. Adds the schema-instance declaration to `text`. Never throws.
 QString GetMarkerTypeName(QString& text);
+/// Returns the display name of a marker message that has already been parsed.
 QString GetMarkerTypeName(const xml::Document& marker);
-/// True for a marker message, whatever its file's name.
+/// Returns true if the message is a marker, by its content and not by its file name.
 bool isMarker(const xml::Document& message);
 
-/// Every "&" becomes "&amp;", those of entities included. False, and nothing changes, where the outcome would be longer
-/// than a parse takes: it can be five times as long.
+/// Replaces every "&" with "&amp;", even those of entities. The text can become five times as long; if it would be too
+/// long to parse, returns false and leaves it unchanged.
 bool escapeAmpersands(QString& text);
-/// The text between "<request>" and "</request>".
+/// Returns the text between "<request>" and "</request>".
 QString wrappedInRequest(const QString& text);
 
-/// Parses a text into the document, at need after the two repairs, which change `text`. False where it stays
-/// unreadable.
+/// Parses a text into the document. If necessary, makes one or both of the two repairs in `text`. Returns false if the
+/// text is still unreadable.
 bool parseWithRepairs(xml::Document& document, QString& text);
-/// A prepared text parsed for the message code's paths: SetupDocument, AddXsiDeclaration, loadXML. `text` comes back
-/// prepared. The caller asks `parseError`.
+/// Adds the schema-instance declaration to `text` and parses it. The caller must check `parseError` of the result.
 xml::Document parsedMessage(QString& text);
 
 }  // namespace kest

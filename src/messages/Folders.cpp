@@ -15,7 +15,7 @@ using namespace Qt::StringLiterals;
 namespace kest {
 namespace {
 
-// What a message tells of its quote.
+// How a message identifies its quote.
 enum class KeyKind { RequestAndVersion, Request, Reference, NetworkNumber, DeletedQuote };
 
 struct KeySource {
@@ -72,7 +72,7 @@ QuoteKey quoteKeyIn(const xml::Document& message, const KeySource& source)
             return newestOfRequest(message.textOf(source.path), {});
         case KeyKind::Reference:
             return QuoteKey::fromReference(message.textOf(source.path));
-        case KeyKind::DeletedQuote:  // the quote has left the database by now
+        case KeyKind::DeletedQuote:  // the quote is no longer in the database
             if (!gsDeletedQTNNO.isEmpty())
                 return {gsDeletedQTNNO, gsDeletedSubquote};
             break;
@@ -82,8 +82,8 @@ QuoteKey quoteKeyIn(const xml::Document& message, const KeySource& source)
     return lastOfNetworkNumber(message.textOf(source.path));
 }
 
-// The largest number that a message of this quote and subquote carries in the read folder; 0 where there is none.
-// Fails on a file of theirs whose number is none.
+// Returns the highest number that a message of this quote has in the read folder, or 0 if there is none. Throws if the
+// name of such a file has no valid number.
 qint64 runningNumber(const QuoteKey& quote)
 {
     constexpr qsizetype extension = 4;  // ".xml"
@@ -103,7 +103,7 @@ QString numberedName(const QuoteKey& quote, qint64 running)
     return quote.filePrefix() + QString::number(running + 1) + ".xml"_L1;
 }
 
-// A quote number comes out of a message: a name that leaves the folder is no name.
+// Returns an empty text for a name that leads out of the folder: the quote number comes from a message.
 QString plainOrNone(const QString& name)
 {
     return files::isPlainName(name) ? name : QString();

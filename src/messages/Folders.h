@@ -1,4 +1,4 @@
-// The life of a message file: its name after a load, and the moves between folders.
+// Names message files after a load and moves them to the read folder.
 #pragma once
 
 #include "base/QuoteKey.h"
@@ -7,25 +7,29 @@
 
 namespace kest {
 
-/// True for the name of a file without a folder. A name that the transport chose may hold what a path would split.
+/// Returns true if `file` is the name of a file without a folder. The transport chooses the name, so it may contain a
+/// path separator.
 bool isBareName(const QString& file);
 
-/// Moves a file of the unread folder to the read folder under its new name; any action but "read" moves nothing.
-/// Never fails: a copy that failed leaves the message in place. Forgets `gsMatchedQTNNO`.
+/// Moves a file of the unread folder to the read folder under its new name, if `action` is "read". Clears
+/// `gsMatchedQTNNO`. Never throws: if the copy fails, the message stays in the unread folder.
 void MoveMessage(const QString& file, const QString& action);
 
-/// The name that a loaded message takes in the read folder; empty when no name can be made. Forgets the deleted quote.
+/// Returns the name of a loaded message in the read folder, or an empty text if it can't be determined. Clears
+/// `gsDeletedQTNNO` and `gsDeletedSubquote`.
 QString GetReadFileName(const QString& path);
-/// The same for a quote number known beforehand, subquote 0.
+/// Returns that name for a known quote number with the subquote 0.
 QString GetMatchedFileName(const QString& quoteNumber);
 
+/// The quote that a message is about.
 struct MessageQuoteKey {
-    QuoteKey quote;  // without a number if the message reaches no quote
+    QuoteKey quote;  // has no number if the message names no quote
     bool isQuoteRequest = false;
 };
+/// Returns the quote that a message is about.
 MessageQuoteKey GetMessageQuoteKey(const QString& text);
 
-/// Deletes a file that may still be held open by the process that wrote it, again and again in the background.
+/// Deletes a file that another process may still have open: retries in the background.
 void DeleteFileByBatch(const QString& path);
 
 }  // namespace kest
