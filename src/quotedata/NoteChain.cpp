@@ -10,7 +10,7 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-// A date has ten characters, so that the status or the subject of "(21/03/2008 : ..." begins here; counted from 0.
+// Where the status or the subject of "(21/03/2008 : ..." begins, counted from 0; a date has ten characters.
 constexpr int bodyOfNote = 13;
 
 QString body(const QString& subject, const QString& status, const QString& detail)
@@ -40,7 +40,8 @@ bool mentions(const QString& remarks, const QString& subject)
     return remarks.contains(subject, Qt::CaseInsensitive);
 }
 
-/// A note ends at its first ")"; the one character behind it is the separator and is dropped, whatever it is.
+/// Splits a chain into its notes. A note ends at its first ")". The character after that separates it from the next
+/// note and is dropped, even if it is not a blank.
 QStringList split(const QString& remarks)
 {
     QStringList notes;
@@ -83,7 +84,7 @@ QString GetNoteStatus(const QString& subject, const QString& remarks)
     const qsizetype at = remarks.indexOf(subject);
     if (at <= 0)
         return {};
-    // Between ": " and the blank before the subject; a subject directly behind ": " has no status.
+    // The status is between ": " and the blank before the subject. A subject directly after ": " has no status.
     const qsizetype colon = remarks.lastIndexOf(u':', at - 1);
     const qsizetype length = at - colon - 3;
     return length > 0 ? remarks.sliced(colon + 2, length) : QString();
@@ -95,8 +96,8 @@ QString RemoveNote(const QString& subject, const QString& remarks)
         return remarks;
     QStringList kept;
     for (const QString& note : split(remarks)) {
-        // The window in which the subject counts, from ten characters and a blank before the colon to behind the first
-        // ")" that follows the status; positions count from 1.
+        // The subject counts only in this part of the note: from eleven characters before the colon to just after the
+        // first ")" that follows the status. Positions are counted from 1.
         const qsizetype from = note.indexOf(u':') + 1 - 12;
         const qsizetype length = note.indexOf(u')', from + 15 - 1) + 1 + 2;
         if (!note.mid(qMax(from, 1) - 1, length).contains(subject))

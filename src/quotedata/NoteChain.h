@@ -1,4 +1,4 @@
-// The note chain of a quote: the text that carries the quote's life on the network.
+// Reads and changes the note chain of a quote, a text that records the quote's life on the network.
 #pragma once
 
 #include <QString>
@@ -7,19 +7,19 @@ namespace kest {
 
 // A chain is a text of notes separated by single blanks, newest first. A note is
 //   "(" date " : " [status " "] subject [" - " detail] ")"
-// with the day on which it was first made. The status of a quote is read back from the chain by a note's subject.
+// with the day on which it was first added.
 
-/// Changes every note of the subject in place, each keeping its date; where the chain has none, or with `alwaysNew`,
-/// puts a new note of today in front. The new chain is the result, and stands in `remarks` too.
+/// Changes the status and detail of every note of the subject; the notes keep their dates. If there is no such note, or
+/// if `alwaysNew` is true, adds a new note with today's date at the front. Returns the new chain, also in `remarks`.
 QString AddNote(const QString& subject, const QString& status, QString& remarks, const QString& detail, bool alwaysNew);
 
-/// Puts a new note in front, whatever the chain holds.
+/// Adds a new note at the front. Returns the new chain, also in `remarks`.
 QString AddNewNote(const QString& subject, const QString& status, QString& remarks, const QString& detail);
 
-/// The status of the first note of the subject; empty where no note has it.
+/// Returns the status of the first note of the subject, or an empty text if there is none.
 QString GetNoteStatus(const QString& subject, const QString& remarks);
 
-/// The chain without the notes in which the subject occurs.
+/// Returns the chain without the notes that contain the subject.
 QString RemoveNote(const QString& subject, const QString& remarks);
 
 }  // namespace kest

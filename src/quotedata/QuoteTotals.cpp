@@ -21,13 +21,13 @@ struct SectionTotals {
     double otherPaint = 0;
     double parts = 0;
     double miscellaneous = 0;
-    double inOrder = 0;  // all labour and paint, added line by line
+    double inOrder = 0;  // all labour and paint, added in the order of the lines
 
     double labour() const { return removeAndReplace + repair + paint + otherPaint; }
 };
 
-/// True when no other line points at this one as its deleted counterpart and it is not deleted itself. Leaves `lines`
-/// where it was.
+/// Returns true if the line is not deleted and no other line names it as the line that it replaces. `lines` keeps its
+/// position.
 bool counts(db::Recordset& lines)
 {
     const qint64 id = toLong(lines.value(u"itemid"_s));
@@ -50,7 +50,7 @@ bool isReportItem(const db::Recordset& line)
     return isTrue(line.value(u"Report_on"_s));
 }
 
-/// The rounded product; 0 where one of the factors is 0, whatever the other one holds.
+/// Returns the rounded product. If one factor is 0, the other may be Null.
 double amount(const db::Recordset& line, const QVariant& factor, const QVariant& hours)
 {
     if (isZero(hours) || isZero(factor) || isReportItem(line))
@@ -70,7 +70,7 @@ void addLine(SectionTotals& totals, const db::Recordset& line, EmptyHours emptyH
     };
     const QString category = line.text(u"category"_s);
     if (category == "PRT"_L1)
-        totals.parts += amount(line, line.value(u"qty"_s), hours(u"rrhour"_s));  // rrhour: selling price of one unit
+        totals.parts += amount(line, line.value(u"qty"_s), hours(u"rrhour"_s));  // for a part, rrhour is the unit price
     else if (category == "R&R"_L1)
         addLabour(totals.removeAndReplace, amount(line, line.value(u"rr_rate2"_s), hours(u"rrhour"_s)));
     else if (category == "RA"_L1)
@@ -83,7 +83,7 @@ void addLine(SectionTotals& totals, const db::Recordset& line, EmptyHours emptyH
         totals.miscellaneous += toDouble(line.value(u"unitcost"_s));
 }
 
-/// From the current line on.
+/// Adds up the lines from the current one to the last.
 SectionTotals totalsOf(db::Recordset& lines, EmptyHours emptyHours)
 {
     SectionTotals totals;

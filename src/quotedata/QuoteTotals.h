@@ -1,21 +1,22 @@
-// The section totals of a quote header, worked out from its lines.
+// Calculates the section totals of a quote header from the lines.
 #pragma once
 
 #include "platform/database/Recordset.h"
 
 namespace kest {
 
-/// Writes the six totals and the change mark of a quote from all its lines, and updates the quote. Lines that are
-/// deleted, replaced by another line or report items count nothing. `lines` is left at its end.
-/// A failure, as a Null quantity or rate, ends it in silence and the quote keeps the totals that it had.
+/// Stores the six totals and the change mark of a quote, calculated from all its lines. Deleted lines, lines that
+/// another line replaces, and report items do not count. `lines` is at its end afterwards. If anything fails, such as a
+/// Null quantity or rate, the quote keeps its totals and no error is reported.
 void CalcQuoteTotals(db::Recordset& quote, db::Recordset& lines);
 
-/// The same for a quote whose lines carry authorised amounts: all labour goes into `TOTAL`, the totals of the single
-/// labour sections stay as they are, and a Null in the hours is a failure too. `lines` that stand at their end count
-/// nothing: the caller hands them over on a line.
+/// Does the same for a quote whose lines have authorised amounts: adds all labour to `TOTAL`, leaves the totals of the
+/// single labour sections alone, and also fails if the hours are Null. Counts the lines from the current one on, so the
+/// caller must move `lines` to the first.
 void CalcAuthorisedTotals(db::Recordset& quote, db::Recordset& lines);
 
-/// Rounds the stored money and hours of all lines of a quote, then runs `CalcQuoteTotals`. Failures are thrown.
+/// Rounds the money and hours of all lines of a quote, then calls CalcQuoteTotals(). Throws RuntimeError if rounding
+/// fails.
 void RoundQuoteLines(db::Recordset& quote);
 
 }  // namespace kest

@@ -33,7 +33,7 @@ double RoundDown(const double& value)
 {
     try {
         const QString text = numberText(value);
-        if (text.contains(u'E'))  // too large or too small for a plain text: all of it is whole, or nothing
+        if (text.contains(u'E'))  // so large that it has no fraction, or so small that it has only a fraction
             return std::abs(value) < 1 ? 0 : value;
         const qsizetype point = text.indexOf(u'.');
         return point < 0 ? value : toDouble(text.left(point + 1));

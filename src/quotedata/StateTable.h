@@ -1,4 +1,4 @@
-// What each event of the network does to a quote: one table, which the loaders and the send read.
+// One table of what each event of the network changes in a quote. The loaders and the send use it.
 #pragma once
 
 #include "platform/database/Recordset.h"
@@ -9,15 +9,15 @@
 
 namespace kest {
 
-/// A note that an event adds. "{}" stands for what the event tells: a reason, or which quote it was.
+/// A note that an event adds. "{}" is replaced by a text from the event, such as a reason or a quote.
 struct NoteOfEvent {
     const char* subject = "";  // empty: no note
     const char* status = "";
     const char* detail = "";
-    bool alwaysNew = false;  // a note of its own each time, instead of a change of the one that is there
+    bool alwaysNew = false;  // adds a note each time instead of changing an existing one
 };
 
-/// The part of an event that is the same whatever the message says. What is left open stays as it was.
+/// The part of an event that does not depend on the message. A member without a value changes nothing.
 struct Transition {
     std::optional<int> stage = {};
     std::optional<bool> locked = {};
@@ -25,14 +25,14 @@ struct Transition {
     const char* cleared[2] = {};  // columns of the quote
 };
 
-/// Sets stage and lock on the quote's row, clears its columns, and adds the notes, in their order, to the remarks of
-/// its note row. Neither row is updated yet.
+/// Sets the stage and the lock in the quote's row, clears its columns, and adds the notes in order to the remarks of
+/// its note row. `told` replaces "{}" in the notes. The caller must update both rows.
 void applyTransition(const Transition& transition, db::Recordset& quote, db::Recordset& notes,
                      const QString& told = {});
 
 // Job_stage: 1 open for quoting, 3 with the insurer, 4 authorised, 9 request cancelled, 10 tender failed. The lock is
-// ReadOnly. Notes: subject, status, detail, whether always new; the one added last stands first in the chain.
-// behind the notes: the columns that become Null.
+// ReadOnly. Notes: subject, status, detail, whether always new; the last one added is the first in the chain. After the
+// notes: the columns that become Null.
 
 // clang-format off
 inline constexpr Transition quoteRequested          { 1,  {},    {{"Quote Request", "Active"}} };
@@ -50,7 +50,7 @@ inline constexpr Transition requestCancelled        { 9,  true,  {{"Quote Reques
 inline constexpr Transition requestReinstated       { 1,  false, {{"Quote Request", "Active"}, {"QR Reinstated"}} };
 inline constexpr Transition excessWaived            { {}, {},    {{"Excess", "ORLA Waived"}} };
 
-inline constexpr Transition requestWon              { {}, {},    {{"Quote Request", "Won"}} };  // only where the request has a status
+inline constexpr Transition requestWon              { {}, {},    {{"Quote Request", "Won"}} };  // only if the request has a status
 inline constexpr Transition quoteAuthorised         { 4,  {},    {{"Authorised Quote"}} };
 inline constexpr Transition adjustmentSuggested     { {}, {},    {{"Adjustment Suggested", "", "", true}} };
 inline constexpr Transition totalLoss               { 10, true,  {{"Quote Request", "Total Loss"}, {"Tender Failed \"Reason : {}\""}} };

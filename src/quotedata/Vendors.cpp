@@ -20,7 +20,7 @@ QVariant findOrAddVendor(const QString& name, const QString& street, const QStri
     db::Recordset vendor = opened(sql("SELECT * FROM VENDOR WHERE NAME LIKE '%{}%'", name));
     if (vendor.eof()) {
         vendor.addNew();
-        // cut to what the column holds: a long address must not keep a whole authorisation out
+        // cut to the size of the column: a long address must not make an authorisation fail
         const std::pair<QString, QString> texts[] = {{u"Name"_s, name}, {u"street"_s, street}, {u"phone"_s, phone}};
         for (const auto& [column, text] : texts) {
             const int size = vendor.size(column);

@@ -1,4 +1,4 @@
-// The vendors of the shop, as far as messages name them.
+// Finds and adds the vendors that messages name.
 #pragma once
 
 #include <QString>
@@ -6,7 +6,7 @@
 
 namespace kest {
 
-/// The number of the vendor whose name holds `name`; of a new one where the shop knows none.
+/// Returns the number of the vendor whose name contains `name`. If the shop has none, adds one.
 QVariant findOrAddVendor(const QString& name, const QString& street, const QString& phone);
 
 }  // namespace kest
