@@ -1,4 +1,4 @@
-// The documents that authorise sublet work: PDF files beside the message folders, one for a line of a quote.
+// Finds the documents that authorise sublet work: PDF files next to the message folders, one for each quote line.
 #pragma once
 
 #include "base/QuoteKey.h"
@@ -8,21 +8,22 @@
 
 namespace kest {
 
-/// The folder of the documents, ending in a backslash: "PDF" in the parent of the unread folder.
+/// Returns the folder of the documents, which ends in a backslash: "PDF" in the parent of the unread folder.
 QString subletFolder();
 
+/// A document and the quote line that it belongs to.
 struct SubletDocument {
     QString file;         // its name in the folder: QTNNO.Subquote_Number.pdf
-    QString lineNumber;   // of the quote line that it belongs to
-    QString description;  // of that line
-    QString vendor;       // empty where the line has none
+    QString lineNumber;   // of the quote line
+    QString description;  // of the quote line
+    QString vendor;       // empty if the line has none
 };
 
-/// The numbers in the file names that begin with the quote, each once, in the order of the names; empty where the
-/// folder can't be read. Subquote 1 finds those of subquote 10 too: which of them it has shows in its lines.
+/// Returns the numbers in the file names that begin with the quote, each once, in the order of the names. Returns none
+/// if the folder can't be read. For subquote 1, also returns those of subquote 10; subletDocuments() drops them.
 QStringList subletDocumentNumbers(const QuoteKey& quote);
 
-/// The documents of these numbers whose line is in the quote. What can't be read is left out.
+/// Returns the documents with these numbers whose line is in the quote. Leaves out lines that can't be read.
 QList<SubletDocument> subletDocuments(const QuoteKey& quote, const QStringList& numbers);
 
 }  // namespace kest

@@ -17,7 +17,7 @@ namespace kest {
 
 namespace {
 
-constexpr int fileRole = Qt::UserRole;  // the tag: the document's file name
+constexpr int fileRole = Qt::UserRole;  // the file name of the row's document
 constexpr int keyRole = Qt::UserRole + 1;
 
 }  // namespace

@@ -1,4 +1,4 @@
-// Lists the documents that authorise the sublet work of one quote, and opens them.
+// Lists and opens the documents that authorise the sublet work of a quote.
 #pragma once
 
 #include "sublets/SubletDocuments.h"
@@ -9,11 +9,12 @@ class QTreeWidget;
 
 namespace kest {
 
+/// The window "Sublet Authority Documents".
 class frmSubletAuth final : public desktop::Form {
     Q_OBJECT
 
 public:
-    /// Shows the quote's documents; without any there is no window. Never fails.
+    /// Shows the documents of the quote. If there are none, no window appears. Never throws.
     static void ShowForm(const QString& QTNNO, const QString& Subquote);
 
 private:

@@ -36,9 +36,9 @@ QString whyNotOpened(QPdfDocument::Error error)
 {
     switch (error) {
         case QPdfDocument::Error::FileNotFound:
-            return u"the file is not there"_s;
+            return u"the file does not exist"_s;
         case QPdfDocument::Error::InvalidFileFormat:
-            return u"the file is no PDF document"_s;
+            return u"the file is not a PDF document"_s;
         case QPdfDocument::Error::IncorrectPassword:
         case QPdfDocument::Error::UnsupportedSecurityScheme:
             return u"the document is protected"_s;
@@ -67,7 +67,7 @@ frmViewPDF::frmViewPDF(QPdfDocument& document, const QString& caption)
     AcroPDF1->setFocus();
     lblPage->setObjectName("lblPage"_L1);
     toolStrip->layout()->addWidget(lblPage);
-    showPage(pdf.pageCount());  // the widest
+    showPage(pdf.pageCount());  // the longest text determines the minimum width
     setMinimumSize(toolStrip->sizeHint().width() + desktop::pixels(rightMargin), desktop::pixels(4500));
     showPage(1);
     desktop::onEvent(AcroPDF1->pageNavigator(), &QPdfPageNavigator::currentPageChanged, this,
@@ -160,7 +160,7 @@ void frmViewPDF::zoom(double factor)
     const double middle = bar->value() + bar->pageStep() / 2.0;
     AcroPDF1->setZoomMode(QPdfView::ZoomMode::Custom);
     AcroPDF1->setZoomFactor(next);
-    bar->setValue(qRound(middle * next / now - bar->pageStep() / 2.0));  // what stood in the middle stays there
+    bar->setValue(qRound(middle * next / now - bar->pageStep() / 2.0));  // keep the middle of the view in place
 }
 
 void frmViewPDF::print()

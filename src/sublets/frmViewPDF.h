@@ -1,4 +1,4 @@
-// Shows one PDF document: pages, zoom, print.
+// Shows and prints a PDF document.
 #pragma once
 
 #include "platform/desktop/Form.h"
@@ -9,11 +9,13 @@ class QPdfView;
 
 namespace kest {
 
+/// A window with the pages of a PDF document, and buttons for pages, zoom and printing.
 class frmViewPDF final : public desktop::Form {
     Q_OBJECT
 
 public:
-    /// Shows the document at a whole path in the host's form. A file that is gone or is no PDF gives a message instead.
+    /// Shows the document and returns when the user has closed it. `fileName` is a full path in the host's form. If the
+    /// file does not exist or is not a PDF, shows a box instead.
     static void ShowForm(const QString& fileName);
 
 protected:

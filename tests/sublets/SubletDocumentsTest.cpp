@@ -79,13 +79,13 @@ TEST_F(Sublet, OpenShowsTheChosenDocument)
         "frmViewPDF": [[ {"key": "AcroPDF1", "keys": ["Ctrl+=", "Ctrl+0", "End"]}, {"read": true} ]]}})");
     frmSubletAuth::ShowForm(u"500"_s, u"0"_s);
     EXPECT_EQ(shown(),
-              "[critical] The document c:\\wirdoc\\PDF\\500.0_1.pdf can't be shown: the file is no PDF document.");
+              "[critical] The document c:\\wirdoc\\PDF\\500.0_1.pdf can't be shown: the file is not a PDF document.");
     ASSERT_EQ(windows().size(), 2);
     EXPECT_EQ(windows()[1][u"file"_s], u"c:\\wirdoc\\PDF\\500.0_2.pdf"_s);
     EXPECT_EQ(desktop->read(u"lblPage"_s), u"Page 2 of 2"_s);
 
     frmViewPDF::ShowForm(u"c:\\wirdoc\\PDF\\gone.pdf"_s);
-    EXPECT_EQ(shown(), "[critical] The document c:\\wirdoc\\PDF\\gone.pdf can't be shown: the file is not there.");
+    EXPECT_EQ(shown(), "[critical] The document c:\\wirdoc\\PDF\\gone.pdf can't be shown: the file does not exist.");
 }
 
 TEST_F(Sublet, APrintTakesThePagesThatWereChosen)
