@@ -19,7 +19,7 @@ QString digitsOf(const QString& text)
     return digits;
 }
 
-/// Month and year of a car's build date: "03/1998", or a year alone, which stands for its first month.
+/// Returns the month and year of a build date such as "03/1998". A year alone means January of that year.
 std::pair<QString, QString> buildDate(const QString& year)
 {
     const qsizetype slash = year.indexOf(u'/');

@@ -1,4 +1,4 @@
-// The extra vehicle information of a quote: read from the quote and its car, and stored there again.
+// Reads and stores the extra vehicle information of a quote, which is part of the quote's and the car's records.
 #pragma once
 
 #include "base/QuoteKey.h"
@@ -11,6 +11,7 @@
 
 namespace kest {
 
+/// Indexes into ExtraValues.
 enum ExtraValue : size_t {
     Transmission,  // "Automatic" or "Manual"
     VIN,
@@ -25,31 +26,31 @@ enum ExtraValue : size_t {
 };
 using ExtraValues = std::array<QString, 10>;
 
-/// "Automatic" or "Manual", from the letter or the word that the car has.
+/// Returns "Automatic" or "Manual" for the letter or word in the car's record.
 QString transmissionOf(const db::Recordset& car);
 
-/// The values, or the message that says which record is missing.
+/// The values, or a message that says which record is missing.
 using ExtraInfoResult = std::variant<ExtraValues, QString>;
 
-/// The records behind the values, held open from the reading to the saving.
+/// The records of the values. They stay open until the values are saved.
 class ExtraInfo {
 public:
-    /// Reads everything of one quote. Where a record is missing `problem` says so, and nothing else may be asked.
+    /// Reads the records of a quote. If one is missing, problem() says which, and no other function may be called.
     explicit ExtraInfo(const QuoteKey& key);
 
     const QString& problem() const { return missing; }
 
-    /// What identifies the quote to a person.
+    // What the dialog shows to identify the quote.
     QString quoteNumber() const;
     QString customer() const;
     QString rego() const;
     QString model() const;
 
-    /// Fuel and damage are asked anew each time and start empty.
+    /// Returns the stored values. Fuel and damage are empty, because they are asked for each time.
     ExtraValues values() const;
 
-    /// Stores the values in the car and the quote. The car's transmission, build date and colour always take their
-    /// normal form; an empty VIN, odometer or cylinder number changes nothing.
+    /// Stores the values in the car and the quote. Always writes transmission, build date and colour, in their normal
+    /// forms. An empty VIN, odometer or number of cylinders changes nothing.
     void save(const ExtraValues& values);
 
 private:
@@ -60,7 +61,7 @@ private:
     QString missing;
 };
 
-/// The values as the tables hold them, saved in their normal forms, without asking anyone.
+/// Returns the stored values without showing the dialog, after saving them in their normal forms.
 ExtraInfoResult BuildArrayFromDB(const QString& quoteNumber, const QString& subquote);
 
 }  // namespace kest

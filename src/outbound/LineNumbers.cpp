@@ -29,11 +29,11 @@ int LineNumbers::NextDocumentLine(const QString& seq)
     auto number = static_cast<size_t>(wanted > 0 ? wanted : 1);
     while (freeFrom[number] != static_cast<int>(number)) {
         const int next = freeFrom[static_cast<size_t>(freeFrom[number])];
-        freeFrom[number] = next;  // later searches take the shorter way: a quote without numbers stays linear
+        freeFrom[number] = next;  // shortens later searches, so that a quote without numbers takes linear time
         number = static_cast<size_t>(next);
     }
     if (number > highestNumber)
-        throw RuntimeError(Overflow, u"A quote document holds no more than %1 lines."_s.arg(highestNumber));
+        throw RuntimeError(Overflow, u"A quote document can't have more than %1 lines."_s.arg(highestNumber));
     freeFrom[number] = static_cast<int>(number) + 1;
     return static_cast<int>(number);
 }

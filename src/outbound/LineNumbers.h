@@ -1,4 +1,4 @@
-// Gives the lines of a quote document their numbers.
+// Numbers the lines of a quote document.
 #pragma once
 
 #include <QString>
@@ -7,17 +7,17 @@
 
 namespace kest {
 
-/// The line numbers of one document: 16-bit, unique over all its sections.
+/// The line numbers of a document: 16-bit numbers, unique in all its sections.
 class LineNumbers {
 public:
     LineNumbers();
 
-    /// The number that the line already has, or 1 where it has none; the next free one above where that is taken.
-    /// Throws Overflow past 32767.
+    /// Returns the number that the line already has, or 1 if it has none. If that number is taken, returns the next
+    /// free one above it. Throws Overflow above 32767.
     int NextDocumentLine(const QString& seq);
 
 private:
-    std::vector<int> freeFrom;  // a number, or where the search for a free one goes on
+    std::vector<int> freeFrom;  // for each number itself if it is free, otherwise where to continue the search
 };
 
 }  // namespace kest

@@ -35,7 +35,7 @@ QString description(const db::Recordset& line, const QString& suffix = {})
     return QuoteClean(line.text(u"SCRIPT"_s) + suffix);
 }
 
-/// A number that the line cannot do without.
+/// Returns a number of the line. Throws RuntimeError if it is Null.
 double number(const db::Recordset& line, const QString& column)
 {
     if (line.isNull(column))
@@ -126,7 +126,7 @@ double QuoteBody::addTo(const Branch& request)
     if (total == 0)
         return 0;
 
-    // an authorised quote's report items and sublets are numbered too, but not sent
+    // the report items and sublets of an authorised quote get numbers, but are not sent
     if (isAuthorised) {
         addReportItems(nullptr);
         addSublets(nullptr);
@@ -188,7 +188,7 @@ void QuoteBody::addLabours(const Branch& labours)
         miscellaneous, &labours, "labour",
         [&](const Line& line) { return unrounded("OTH", line, SafeVal(line.text(u"UNITCOST"_s).trimmed(), u"0"_s)); },
         [&](const Line& line) {
-            // with a vendor it is a sublet, which a main quote carries among the sublets only
+            // a line with a vendor is a sublet; a main quote sends it only with the sublets
             return isMainQuote ? isAboveZero(line, u"VENDOR"_s) : isZero(line, u"UNITCOST"_s);
         });
     walk(mechanical, &labours, "labour",
@@ -222,7 +222,7 @@ void QuoteBody::addParts(const Branch& parts)
 Leaves QuoteBody::part(const Line& line)
 {
     const double quantity = number(line, u"QTY"_s);
-    const double sign = quantity < 0 ? -1 : 1;  // a returned part: its price is negative and not its quantity
+    const double sign = quantity < 0 ? -1 : 1;  // for a returned part the price is negative, not the quantity
     const double count = std::abs(quantity);
     QString price = u"0"_s;
     QString amount = u"0"_s;
@@ -239,7 +239,7 @@ Leaves QuoteBody::part(const Line& line)
     partSum = RoundAmount(toDouble(amount) + partSum, 2);
     markUpSum = RoundAmount(toDouble(markUpAmount) + markUpSum, 2);
 
-    const QString mark = line.text(u"MARK"_s);  // a blank, which a load writes, is a mark of its own
+    const QString mark = line.text(u"MARK"_s);  // not trimmed: a load writes a single blank, which is a mark too
     return {
         filled("partNumber", mark.isEmpty() ? line.text(u"PARTNO"_s) : QString()),
         {"partType", always, partType(mark)},
@@ -268,7 +268,7 @@ void QuoteBody::addSublets(const Branch* sublets)
         types.find(sql("Type='{}'", partNumber));
         return types.eof() ? u"OTH"_s : types.text(u"Type"_s);
     };
-    sublet.requery();  // a supplementary quote's were numbered among the labour lines
+    sublet.requery();  // in a supplementary quote they have got their numbers with the labour lines
     walk(sublet, sublets, "sublet", [&](const Line& line) {
         return Leaves{
             {"subletType", always, subletType(line.text(u"PARTNO"_s))},

@@ -1,4 +1,4 @@
-// The body of a quote document: its labour, paint, parts, report items and sublets, their sums and the tax.
+// Writes the body of a quote document: labour, paint, parts, report items and sublets, their sums and the tax.
 #pragma once
 
 #include "base/QuoteKey.h"
@@ -12,15 +12,17 @@
 
 namespace kest {
 
-/// The amounts are worked out from the lines and not taken from the totals of the quote header: the rules differ, for a
-/// line marked as deleted counts here, and each section rounds in its own way.
+/// The body of a quote document.
+///
+/// The amounts are calculated from the lines and differ from the totals of the quote header, which have other rules:
+/// here a line marked as deleted counts, and each section rounds in its own way.
 class QuoteBody {
 public:
-    /// Opens the lines of a quote.
+    /// Reads the lines of a quote.
     QuoteBody(const QuoteKey& key, const QString& authorisedNumber);
 
-    /// Appends `quoteBody` and gives each line its number, which is stored with the line. The quote total; the walk
-    /// ends early where it is 0, since such a quote is not sent.
+    /// Appends `quoteBody`, and numbers the lines and stores the numbers with them. Returns the quote total. If it is
+    /// 0, the body is incomplete, because such a quote is not sent.
     double addTo(const Branch& request);
 
 private:

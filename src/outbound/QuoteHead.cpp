@@ -32,7 +32,7 @@ QString lookedUp(const std::pair<QLatin1StringView, QLatin1StringView> (&table)[
     return otherwise;
 }
 
-/// Year and month of a car whose build date could not be taken from the extra values.
+/// Returns the year and month of a car's build date, for use without the extra values.
 std::pair<QString, QString> buildDate(const QString& date)
 {
     if (date.size() == 7)
@@ -47,7 +47,7 @@ QString phoneNumber(const db::Recordset& customer, const char* column)
 
 void addCustomer(const Branch& request, const db::Recordset& customer)
 {
-    const auto isEmptyText = [&](const QString& column) {  // a Null is not: it may be a person's
+    const auto isEmptyText = [&](const QString& column) {  // not Null, which a private customer may have
         return !customer.isNull(column) && customer.text(column).isEmpty();
     };
     const bool company = isEmptyText(u"SALUTATION"_s) && isEmptyText(u"FIRSTNAME"_s);
@@ -65,7 +65,7 @@ void addCustomer(const Branch& request, const db::Recordset& customer)
         });
 }
 
-/// The extra values that the insurer did not ask for come from the car and the quote.
+/// Returns the vehicle's values. If the insurer did not ask for extra values, they come from the car and the quote.
 ExtraValues vehicleValues(const QuoteRows& rows, const std::optional<ExtraValues>& extra)
 {
     const db::Recordset& car = rows.car;
@@ -75,7 +75,7 @@ ExtraValues vehicleValues(const QuoteRows& rows, const std::optional<ExtraValues
     else
         std::tie(values[BuildYear], values[BuildMonth]) = buildDate(text(car, "YEAR"));
     const QVariant asked = rows.quote.value(u"ExtraInfo"_s);
-    if (asked.isNull() || isTrue(asked))  // a quote of which nobody has said counts as answered
+    if (asked.isNull() || isTrue(asked))  // Null is treated like true
         return values;
 
     values[Transmission] = transmissionOf(car);

@@ -1,4 +1,4 @@
-// Everything of a quote document that stands before its body: whom it concerns, and the vehicle.
+// Writes the part of a quote document before its body: the customer, the references and the vehicle.
 #pragma once
 
 #include "outbound/ExtraInfo.h"
@@ -11,16 +11,17 @@
 
 namespace kest {
 
-/// How the document points at the insurer's records: in exactly one of three ways.
+/// How the document refers to the insurer's records: in exactly one of three ways.
 struct InsurerReference {
-    QString authorisedQuoteNumber;  // a supplementary quote's
-    QString claimNumber;            // of a main quote without a request
-    QString requestNumber;
+    QString authorisedQuoteNumber;  // for a supplementary quote
+    QString claimNumber;            // for a main quote without a request
+    QString requestNumber;          // for a main quote with a request, as is the version
     QString requestVersion;
 };
+/// Returns the reference of the quote.
 InsurerReference referenceOf(const QuoteRows& rows);
 
-/// Whole days from the car's coming in to its completion; none where one of the two dates is open.
+/// Returns the whole days from the arrival of the car to its completion, or nothing if one of the dates is missing.
 std::optional<qint64> repairDays(const db::Recordset& quote);
 
 /// Appends the elements before the body, in the document's order.

@@ -19,7 +19,7 @@ QList<QuoteImage> quoteImages(const QString& folder, const QuoteKey& quote)
         return images;
     for (const QString& file : files::list(folder, stem + u"*.jpg"_s)) {
         const QString id = imageId(file);
-        if (file.startsWith(stem, Qt::CaseInsensitive) && !id.isEmpty())  // a quote number may hold a "*"
+        if (file.startsWith(stem, Qt::CaseInsensitive) && !id.isEmpty())  // not a pattern: a number may contain "*"
             images.append({file, id});
     }
     return images;
@@ -29,7 +29,8 @@ QString imageId(const QString& file)
 {
     const QString name = file.trimmed();
     const qsizetype behindUnderscore = name.indexOf(u'_') + 1;
-    const qsizetype length = name.size() - name.indexOf(u'.');  // of the extension, which makes four digits and a point
+    // as many characters as the extension has: "0012", or "0012." with ".jpeg"
+    const qsizetype length = name.size() - name.indexOf(u'.');
     const std::optional<double> number = numberIn(name.mid(behindUnderscore, length));
     return number ? numberText(std::trunc(*number)) : QString();
 }

@@ -1,4 +1,4 @@
-// The photographs of a quote: which files they are, their ids, and their documents in the outgoing folder.
+// Finds the photographs of a quote and writes their documents to the outgoing folder.
 #pragma once
 
 #include "base/QuoteKey.h"
@@ -8,19 +8,21 @@
 
 namespace kest {
 
+/// A photograph: the name of its file and the id in it.
 struct QuoteImage {
     QString file;
     QString id;
 };
 
-/// The images of a quote in a folder, in the order of their names. A name from which no id can be read is no image of
-/// the quote, in the quote document and in the image documents alike.
+/// Returns the images of a quote in the order of their names. A file without a readable id is not an image of the
+/// quote, neither for the quote document nor for the image documents.
 QList<QuoteImage> quoteImages(const QString& folder, const QuoteKey& quote);
 
-/// The number behind a name's first underscore, without leading zeros: 123_0012.jpg gives 12. Empty where none stands.
+/// Returns the number after the first underscore of a name without leading zeros, such as "12" for 123_0012.jpg, or an
+/// empty text if there is none.
 QString imageId(const QString& file);
 
-/// Puts a document and a copy of each image into the outgoing folder.
+/// Writes a document and a copy of each image to the outgoing folder.
 void writeImageDocuments(const QString& folder, const QuoteKey& quote);
 
 }  // namespace kest

@@ -1,4 +1,4 @@
-// The records that a quote document is made of, read once at its start.
+// Reads the records that a quote document needs.
 #pragma once
 
 #include "base/QuoteKey.h"
@@ -8,6 +8,7 @@
 
 namespace kest {
 
+/// The records of a quote, read once.
 struct QuoteRows {
     explicit QuoteRows(db::Recordset& quoteRecord);
 
@@ -16,14 +17,14 @@ struct QuoteRows {
     db::Recordset car;
     db::Recordset customer;
     db::Recordset model;
-    db::Recordset body;  // may hold no row: not every car has a known body
+    db::Recordset body;  // may be empty: not every car has a known body
     db::Recordset notes;
-    db::Recordset mainQuote;  // open for a supplementary quote only
+    db::Recordset mainQuote;  // open only for a supplementary quote
 };
 
-/// A column without the blanks around it; a Null, and a column of a record without a row, is empty.
+/// Returns a column without the blanks around it, or an empty text if it is Null or there is no current row.
 QString trimmed(const db::Recordset& record, const char* column);
-/// A column as it stands; a Null is empty.
+/// Returns a column unchanged, or an empty text if it is Null.
 QString text(const db::Recordset& record, const char* column);
 
 }  // namespace kest

@@ -19,7 +19,7 @@ namespace {
 
 const QString quoteNotFound = u"Quote not found in database, Please contact MarlinDesk Support."_s;
 
-/// Why a main quote may not go; empty where it may.
+/// Returns why a main quote can't be sent, or an empty text if it can.
 QString mainQuoteRefusal(const db::Recordset& quote, const QString& remarks)
 {
     const db::Recordset insurer =
@@ -43,7 +43,7 @@ QString mainQuoteRefusal(const db::Recordset& quote, const QString& remarks)
     return {};
 }
 
-/// Why the quote may not go; empty where it may.
+/// Returns why the quote can't be sent, or an empty text if it can.
 QString refusalOf(const db::Recordset& quote, const QuoteKey& key)
 {
     const auto& [number, subquote] = key;

@@ -1,15 +1,15 @@
-// The send of the open quote: whether it may go to the insurer, and everything that happens when it does.
+// Checks and sends the open quote.
 #pragma once
 
 #include "platform/database/Recordset.h"
 
 namespace kest {
 
-/// Sends the newest subquote of the quote in hand, or refuses it with one message. `quote` is the panel's record; it is
-/// opened again, and stands afterwards on the row that was considered.
-/// The quote total that was sent, 0 when the quote was not sent. Failures are thrown; a quote is locked only when its
-/// document stands complete in the outgoing folder.
-/// `sent` becomes true once the quote counts as sent, whatever fails behind it.
+/// Sends the newest subquote of the open quote, or shows a box that says why it can't be sent. `quote` is the panel's
+/// recordset, which is opened again and is then on the row of that subquote.
+///
+/// Returns the quote total, or 0 if the quote was not sent. Throws RuntimeError if something fails. The quote is locked
+/// only after its document is complete in the outgoing folder; then `sent` becomes true, even if a later step fails.
 double SendQuote(db::Recordset& quote, bool* sent = nullptr);
 
 }  // namespace kest

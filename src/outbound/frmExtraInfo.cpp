@@ -29,7 +29,7 @@ namespace kest {
 
 namespace {
 
-constexpr int lastYearOfCentury = 29;  // a year of two digits up to here belongs to this century
+constexpr int lastYearOfCentury = 29;  // years of two digits up to this belong to the 21st century
 
 QLabel* addDisplay(QFormLayout* layout, const char* name, const QString& label, const QString& text)
 {
@@ -183,7 +183,7 @@ ExtraValues frmExtraInfo::values() const
 
 void frmExtraInfo::closeEvent(QCloseEvent* event)
 {
-    event->ignore();  // "Done" is the only way out: half the values would go to the insurer
+    event->ignore();  // only "Done" closes the window, so that the insurer never gets incomplete values
 }
 
 std::pair<QWidget*, QString> frmExtraInfo::complaint() const
@@ -322,7 +322,7 @@ void frmExtraInfo::txtColour_Change()
     const auto typed = static_cast<int>(txtColour->text().size());
     const QString colour = item->text(0);
     txtColour->setText(colour);
-    // from the end, so that the cursor stands where typing goes on
+    // select from the end, so that the cursor is where the user continues to type
     txtColour->setSelection(static_cast<int>(colour.size()), typed - static_cast<int>(colour.size()));
     acceptedColour = colour.left(typed);
     selectColour(item);

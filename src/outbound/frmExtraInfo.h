@@ -1,4 +1,4 @@
-// The dialog that asks for the vehicle information which the insurer wants beyond the quote.
+// Asks for the vehicle information that the insurer wants in addition to the quote.
 #pragma once
 
 #include "outbound/ExtraInfo.h"
@@ -16,11 +16,13 @@ class QTreeWidgetItem;
 
 namespace kest {
 
+/// The window "Extra Information Requested".
 class frmExtraInfo final : public desktop::Form {
     Q_OBJECT
 
 public:
-    /// Asks, and stores the answers with the car and the quote. Where a record is missing nothing is shown.
+    /// Shows the dialog, stores the values in the car and the quote, and returns them. If a record is missing, shows
+    /// nothing and returns the message that says which.
     static ExtraInfoResult ShowForm(const QString& quoteNumber, const QString& subquote);
 
 protected:
@@ -35,7 +37,7 @@ private:
     void fillColours();
     void fill(const ExtraInfo& info);
     ExtraValues values() const;
-    /// The first check that fails: the field to go to, and what is wrong. No field where all is well.
+    /// Returns the first wrong field and what is wrong with it, or no field if all values are valid.
     std::pair<QWidget*, QString> complaint() const;
 
     void Command1_Click();
@@ -47,7 +49,7 @@ private:
     void txtColour_KeyUp(int key);
     void lvColour_ItemClick();
 
-    /// The first colour that begins with the field's text, or null.
+    /// Returns the first colour that begins with the field's text, or null.
     QTreeWidgetItem* colourBeginningWithText() const;
     void selectColour(QTreeWidgetItem* item);
     void takeColour();
@@ -66,7 +68,7 @@ private:
     QTreeWidget* lvColour;
     QPushButton* Command1;
     QList<QWidget*> enterChain;
-    QString acceptedColour;  // what the type-ahead goes back to
+    QString acceptedColour;  // restored if the typed text matches no colour
 };
 
 }  // namespace kest

@@ -29,7 +29,8 @@ double refuse(const QString& message)
     return 0;
 }
 
-/// The name of the quote's next document, counted by those that have gone out: one that still waits is replaced.
+/// Returns the name of the quote's next document. Counts only the documents that the transport has sent, so a document
+/// that is still waiting is replaced.
 QString documentName(const QuoteRows& rows)
 {
     const QString stem = rows.key.filePrefix();
@@ -47,7 +48,7 @@ QString documentName(const QuoteRows& rows)
                                        .arg(rows.key.fullReference()));
 }
 
-/// The text between the root's tags: the transport puts a root of its own around it.
+/// Returns the text between the tags of the root element. The transport adds a root of its own.
 QString withoutRoot(const QString& text)
 {
     const qsizetype behindRoot = text.indexOf(u'>') + 1;
@@ -112,7 +113,7 @@ double CreateQuoteXML(db::Recordset& quote)
             u"Error: Cannot send $0 variations to ORLA. Please call your assessor to discuss the variation."_s);
     addImages(request, rows);
 
-    // the document stands whole in the folder before the quote is locked: a full disk must not lock it
+    // write the document before the quote is locked: a full disk must not lock it
     files::write(files::pathForWriting(gsUnsentPath, documentName(rows)), withoutRoot(request.xml()));
     markAsSent(rows);
     desktop::msgBox(u"Quote Sent."_s, desktop::Icon::Information);

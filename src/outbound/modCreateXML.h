@@ -1,4 +1,4 @@
-// Writes the documents of a quote into the outgoing folder, from where the transport program takes them.
+// Writes the documents of a quote to the outgoing folder, from which the transport program takes them.
 #pragma once
 
 #include "platform/database/Recordset.h"
@@ -7,11 +7,12 @@
 
 namespace kest {
 
-/// Builds the quote document, writes it, and marks the quote as sent. Asks for the extra vehicle values where the
-/// insurer wanted them. `quote` stays on its row. The quote total; 0 after a refusal, whose message has been shown.
+/// Writes the quote document and marks the quote as sent. Asks for the extra vehicle values if the insurer wants them.
+/// `quote` keeps its current row. Returns the quote total, or 0 if the quote is refused, for which a box has been
+/// shown.
 double CreateQuoteXML(db::Recordset& quote);
 
-/// Puts a document and a copy of each photograph of the quote into the outgoing folder.
+/// Writes a document and a copy of each photograph of the quote to the outgoing folder.
 void CreateImageXML(const QString& imagesPath, db::Recordset& quote);
 
 }  // namespace kest
