@@ -1,4 +1,4 @@
-// How JobLink wants an address and a build date.
+// Converts addresses and build dates to the forms that JobLink expects.
 #pragma once
 
 #include <QString>
@@ -6,16 +6,17 @@
 
 namespace kest::joblink {
 
-/// Street and suburb on one line, without the postcode that may end the suburb.
+/// Returns street and suburb on one line, without the postcode at the end of the suburb.
 QString composedAddress(const QString& street, const QString& suburb);
-/// The number that ends a suburb of several words; empty where there is none.
+/// Returns the number at the end of a suburb of several words, or an empty text if there is none.
 QString postcode(const QString& suburb);
 
+/// The month and year in which a car was built.
 struct BuildDate {
-    QVariant month;  // Null where the text holds none
+    QVariant month;  // Null if it is unknown
     QVariant year;
 };
-/// Reads "MM/YYYY" or "YYYY"; a Null or empty text gives two Nulls.
+/// Reads "MM/YYYY" or "YYYY". Both values are Null if the text is Null or empty.
 BuildDate buildDate(const QVariant& year);
 
 }  // namespace kest::joblink

@@ -1,19 +1,20 @@
-// Where JobLink's database is: the one settings row of an outside system.
+// Stores the connection settings of JobLink's database.
 #pragma once
 
 #include <QString>
 
 namespace kest {
 
+/// How to connect to JobLink's database.
 struct JobLinkSettings {
     QString server;
     int port = 3306;
     QString database;
     QString user;
-    QString password;  // in clear; stored enciphered only
+    QString password;  // plain text; storeJobLinkSettings() encrypts it
 };
 
-/// Writes the row, in place of one that is there. The cipher's key must be set. Throws RuntimeError.
+/// Writes the settings row and replaces an existing one. Call InitCipherKey() first. Throws RuntimeError if it fails.
 void storeJobLinkSettings(const JobLinkSettings& settings);
 
 }  // namespace kest

@@ -20,7 +20,7 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-/// All that one export reads and writes; a recordset that could not be opened stays closed.
+/// The records that an export reads and writes. A recordset that could not be opened stays closed.
 struct Export {
     db::ConnectionPtr jobLink = std::make_shared<db::Connection>();
     qint64 jobId = 0;
@@ -50,11 +50,11 @@ constexpr Annotation annotations[] = {
     {"anno_opg"_L1, "OPG"_L1, 903}, {"anno_part"_L1, "PRT"_L1, 904}, {"anno_misc"_L1, "MIS"_L1, 905},
 };
 
-/// What a line of each category sells for: the product of these columns.
+/// The selling price of a line of a category: the product of two columns.
 struct Price {
     QLatin1StringView category;
     QLatin1StringView amount;
-    QLatin1StringView factor;  // empty: the amount alone
+    QLatin1StringView factor;  // if empty, the price is the amount
 };
 constexpr Price prices[] = {
     {"R&R"_L1, "rrhour"_L1, "rr_rate2"_L1},   {"RA"_L1, "rahour"_L1, "rr_rate2"_L1},
@@ -77,7 +77,7 @@ QString connectionText(const db::Recordset& settings)
            settings.text(u"UserName"_s) + u";Password="_s + DecryptText(settings.text(u"passWord"_s)) + u";Option=3;"_s;
 }
 
-/// False when the server cannot be reached; every other failure is passed over and shows in the steps behind it.
+/// Returns false if the server can't be reached. Ignores all other errors, which the following steps will meet again.
 bool openJobLink(Export& job, const db::Recordset& settings)
 {
     bool reached = true;
@@ -119,7 +119,7 @@ void openTarget(Export& job)
     });
 }
 
-/// Opens a related row by a key that may be Null, in which case the query is left out.
+/// Opens a related row, unless its key is Null.
 void openRelated(db::Recordset& rows, const char* statement, const db::Recordset& owner, const QString& key)
 {
     attempt([&] {
@@ -218,7 +218,7 @@ void writeHeader(Export& job)
     job.header.update();
 }
 
-/// A row of markers whose DELETEDITEM names this line: the line was replaced.
+/// Returns true if another line has replaced this one: then a row of `markers` has the line's id as its DELETEDITEM.
 bool isReplaced(db::Recordset& markers, const QVariant& itemId)
 {
     if (markers.recordCount() == 0)
@@ -319,7 +319,7 @@ void writeAnnotations(Export& job)
 void finish(Export& job)
 {
     db::Recordset status(job.jobLink);
-    // JobLink's key is read as a number of 16 bits: a job beyond 32767 stays unfinished
+    // the key is a 16-bit number here, so a job above 32767 stays unfinished
     status.open(sql("SELECT nJobID_PK, status FROM newJob WHERE nJobID_PK={}", toInteger(job.jobId)));
     status.set(u"Status"_s, 1);
     status.update();

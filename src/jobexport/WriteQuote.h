@@ -1,13 +1,13 @@
-// Hands an authorised quote to the shop's job-tracking system, JobLink, as a job in its MySQL database.
+// Exports authorised quotes to the shop's job-tracking system, JobLink, as jobs in its MySQL database.
 #pragma once
 
 #include <QString>
 
 namespace kest {
 
-/// Writes one job with its header, lines and annotations; without a settings row for JobLink nothing happens. A job is
-/// finished when its `Status` is 1; an export that fails leaves it at 0. Never fails towards the caller: what went
-/// wrong is told by a box, except a server that cannot be reached, which is silent.
+/// Writes a job with its header, lines and notes. Does nothing if JobLink has no settings row. The `Status` of a
+/// complete job is 1, and that of a failed export stays 0. Never throws: a box says that the export failed, or nothing
+/// does if the server can't be reached.
 void WriteQuote(const QString& quoteNumber, const QString& subquote);
 
 }  // namespace kest
