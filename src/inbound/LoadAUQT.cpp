@@ -1,4 +1,4 @@
-// The insurer accepts a quote, as it stands or with changed lines, under an authority number.
+// Loads an authorised quote: the insurer accepts a quote, unchanged or with changed lines, under an authority number.
 #include "base/Helpers.h"
 #include "base/QuoteKey.h"
 #include "base/modLoggerEx.h"
@@ -28,8 +28,8 @@ namespace {
 
 constexpr QLatin1StringView unknownRego = "UNIVERSAL"_L1;
 
-/// What the message tells and the load stores. Reading it fails for every element that is missing, those that only the
-/// report shows included: before anything is written.
+/// The values of the message. The constructor throws if an element is missing, even one that only the report shows, so
+/// that an incomplete message fails before anything is stored.
 struct Authorisation {
     explicit Authorisation(const xml::Document& message);
 
@@ -72,8 +72,8 @@ Authorisation::Authorisation(const xml::Document& message)
     reference = element("quoteBody/rootns:quoteReference"_L1);
 }
 
-/// The quote of that number, else the one of that request, network number and car, whose number and subquote then take
-/// the place of the given ones. Where several are so, the first, and the given ones stand.
+/// Opens the quote with that key. If there is none, opens the quote with the message's request, network number and
+/// registration, and sets `key` to its key. If several match, the first is current and `key` stays as it is.
 db::Recordset openQuote(const Authorisation& told, QuoteKey& key)
 {
     db::Recordset quote =
@@ -87,7 +87,8 @@ db::Recordset openQuote(const Authorisation& told, QuoteKey& key)
     return quote;
 }
 
-/// Excess and customer's contribution, which the main quote alone carries. An amount that the quote lacks stays out.
+/// Stores the excess and the customer's contribution, which only a main quote has. An amount that is empty in the quote
+/// stays empty.
 void takeOverMoney(const Authorisation& told, const QuoteKey& key)
 {
     db::Recordset quote =
@@ -107,7 +108,7 @@ void takeOverMoney(const Authorisation& told, const QuoteKey& key)
     }
 }
 
-/// "Whitby, Morgan Lee" of "Morgan Lee Whitby".
+/// Returns "Whitby, Morgan Lee" for "Morgan Lee Whitby".
 QString surnameFirst(const QString& name)
 {
     constexpr qsizetype surnameLength = 15;  // characters
@@ -184,7 +185,7 @@ bool authorise(QString& text)
     if (notes.eof())
         notes.addNew();
 
-    // before the lines change: it shows them as they are now
+    // before the lines change, because it compares with the lines as they are now
     std::optional<db::Recordset> comparison = BuildAuthReport(message, key.number, key.subquote, false);
     if (key.isMain())
         takeOverMoney(told, key);
@@ -200,7 +201,7 @@ bool authorise(QString& text)
     fillColumn(notes, {{"QTNNO"_L1, quote.value(u"QTNNO"_s)}, {"Subquote"_L1, quote.value(u"Subquote"_s)}});
     notes.update();
     if (lines.recordCount() > 0)
-        lines.moveFirst();  // a last line that was not found leaves the lines at their end, where nothing counts
+        lines.moveFirst();  // a search without a match has left them at their end, and the totals would be 0
     CalcAuthorisedTotals(quote, lines);
     if (comparison)
         finishAuthReport(*comparison, quote, lines);

@@ -1,4 +1,4 @@
-// What became of a quote after it was sent: adjustments, assessment results and their back-outs, submission responses.
+// Loads the answers to a sent quote: submission responses, adjustments, assessment results and their back-outs.
 #include "base/QuoteKey.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
@@ -36,15 +36,15 @@ bool refuseRequestNumber()
     return refuse(u"Couldn't Locate Matching KEST Quote Request Number, Please contact MarlinDesk Support."_s);
 }
 
-/// The state that a quote goes back to. An authorisation is told from a failed tender by its number, a rejected
-/// supplementary quote by its note.
+/// Returns the state that a quote goes back to. Only an authorised quote has an authority number, and only a rejected
+/// supplementary quote has a note that says so.
 const Transition& backOutOf(const db::Recordset& quote, const db::Recordset& notes)
 {
     if (!isSupplementary(quote))
         return quote.text(u"KESTAuthNo"_s).isEmpty() ? failedTenderBackedOut : authorisationBackedOut;
     const QString remarks = notes.text(u"remarks"_s);
     bool rejected = !GetNoteStatus(u"Rejected"_s, remarks).isEmpty();
-    if (!rejected && remarks.contains(u"Rejected"_s))  // hidden behind the note of an earlier back-out
+    if (!rejected && remarks.contains(u"Rejected"_s))  // the first such note may be that of an earlier back-out
         rejected = quote.isNull(u"AuthDate"_s);
     return rejected ? rejectionBackedOut : supplementaryBackedOut;
 }

@@ -1,4 +1,4 @@
-// A quote that was written outside the shop's system takes its place among the shop's quotes, with all its lines.
+// Loads a manual quote: a quote that was written outside the shop's system becomes one of its quotes, with all lines.
 #include "base/Helpers.h"
 #include "base/QuoteKey.h"
 #include "base/SharedVariables.h"
@@ -56,7 +56,8 @@ QString behind(const db::Recordset& quote)
     return QString::number(toLong(quote.value(u"Subquote"_s)) + 1);
 }
 
-/// The next subquote of the quote that it belongs to; none after a box where the shop has no such quote.
+/// Returns the next subquote of the quote that it belongs to. If the shop has no such quote, shows a box and returns
+/// nothing.
 std::optional<QuoteKey> matchSupplementary(const ManualQuote& manual, const db::Recordset& cinfo)
 {
     const qint64 subquote = toLong(manual.told.subquote);
@@ -77,7 +78,7 @@ std::optional<QuoteKey> matchSupplementary(const ManualQuote& manual, const db::
     return {};
 }
 
-/// A registration that no car has: the given one, or with dots behind it.
+/// Returns a registration that no car has: the given one, if necessary with dots after it.
 QString freeRego(const QString& rego)
 {
     db::Recordset cars = opened(sql("SELECT REGO FROM CAR WHERE REGO LIKE '{}%' ORDER BY REGO", rego));
@@ -87,8 +88,8 @@ QString freeRego(const QString& rego)
     return free;
 }
 
-/// The shop typed the registration with blanks or dashes: its car and its quote take the network's spelling, and a car
-/// that already bears it moves out of the way.
+/// Changes a registration that the shop typed with blanks or dashes to the network's spelling, in the car and in the
+/// quote. If another car already has this registration, that car gets a new one.
 void repairRego(const QString& typed, const QString& rego, const QuoteKey& quote)
 {
     const QString free = freeRego(rego);
@@ -98,7 +99,7 @@ void repairRego(const QString& typed, const QString& rego, const QuoteKey& quote
         sql("UPDATE QUOTE1 SET REGO='{}' WHERE QTNNO='{}' AND Subquote='{}'", rego, quote.number, quote.subquote));
 }
 
-/// The quote of that number or of that request, where it is of the same car; else a new number.
+/// Returns the quote with that number or that request if it is for the same car, or else a new number.
 QuoteKey matchMain(const ManualQuote& manual, const db::Recordset& cinfo)
 {
     const QString rego = manual.rego.trimmed().toUpper();
@@ -202,7 +203,7 @@ bool LoadMANQ(QString& text, const QString& fileName)
     respellColour(car, colours);
     car.set(u"REGO"_s, manual.rego);
 
-    // From here on a failure leaves the quote without its lines until the message is loaded again.
+    // After this, a failure leaves the quote without lines until the message is loaded again.
     if (!checkQuoteBody(message))
         return refuseLines();
     while (!lines.eof())
@@ -214,7 +215,7 @@ bool LoadMANQ(QString& text, const QString& fileName)
             opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key->number, key->subquote));
         if (isNew && !standing.eof())
             throw RuntimeError(RowChanged,
-                               u"Another workstation has made quote %1 meanwhile."_s.arg(key->fullReference()));
+                               u"Another workstation has meanwhile created quote %1."_s.arg(key->fullReference()));
         quote.update();
     }
     if (!LoadQuoteBody(quote, lines, message))

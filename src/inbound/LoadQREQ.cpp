@@ -1,4 +1,4 @@
-// A quote request becomes a new, empty quote of the shop, with car, customer, note and photographs.
+// Loads a quote request, which becomes a new quote without lines, with its car, customer, note and photographs.
 #include "base/Helpers.h"
 #include "base/SharedVariables.h"
 #include "inbound/modLoadXML.h"
@@ -42,10 +42,10 @@ QString transmission(const QString& code)
     return code == u"M"_s ? u"Manual"_s : code;
 }
 
-/// What the message tells and the load stores. Reading it fails for every element that is missing or malformed, those
-/// that only the report shows included: before anything is written.
+/// The values of the message. Reading them throws if an element is missing or malformed, even one that only the report
+/// shows, so that such a message fails before anything is stored.
 struct Request {
-    /// Enough to tell whether the request is known.
+    /// Reads what is needed to find out if the request is known.
     void readKey(const xml::Document& message);
     void readRest(const xml::Document& message);
 
@@ -110,7 +110,7 @@ void Request::readRest(const xml::Document& message)
     odometer = extra("odometer"_L1);
 }
 
-/// Stands on the insurer that requests are made out to; false where there is none.
+/// Makes the insurer of quote requests the current row. Returns false if there is none.
 bool chooseInsurer(db::Recordset& insurer)
 {
     if (insurer.eof())
@@ -122,7 +122,7 @@ bool chooseInsurer(db::Recordset& insurer)
     return true;
 }
 
-/// The car's customer, or the one of that name; a new row where there is none.
+/// Opens the customer of the car or, if it has none, the one of that name. If there is neither, adds a new row.
 db::Recordset openCustomer(const db::Recordset& car, const Request& request)
 {
     db::Recordset customer(gConn);
@@ -232,8 +232,8 @@ void fillQuote(db::Recordset& quote, const QString& quoteNumber, const Request& 
         quote.set(u"kms"_s, request.odometer);
 }
 
-/// A name that no image has. Three digits are all that the search for the next number reads, so behind 999 it finds
-/// names that are taken.
+/// Returns a path that no image has. NextImageNumber() reads only three digits, so above 999 it returns numbers that
+/// are taken.
 QString newImagePath(const QString& quoteNumber)
 {
     for (int number = NextImageNumber(quoteNumber);; ++number) {
@@ -244,7 +244,7 @@ QString newImagePath(const QString& quoteNumber)
     }
 }
 
-/// Takes the request's pictures that have arrived into the host's images of the quote.
+/// Moves the pictures of the request that have arrived to the host's images of the quote.
 void takePhotographs(const xml::Node& root, const QString& requestNumber, const QString& quoteNumber)
 {
     for (const xml::Node& imageId : root.selectNodes(u"rootns:quoteRequestImageIds/*"_s)) {
@@ -269,7 +269,7 @@ bool LoadQREQ(QString& text, const QString& fileName)
         return refuse(u"Error locating a valid insurer, Please contact MarlinDesk Support."_s);
 
     std::unique_ptr<db::Lock> newQuotes = lockNewQuotes();
-    cinfo.requery();  // as it stands now that no other workstation counts
+    cinfo.requery();  // another workstation may have changed the counter before this one got the lock
     const QVariant counter = cinfo.value(u"QUOTE_VAL"_s);
     db::Recordset quote(gConn);
     const QString quoteNumber = NextQuoteNumber({}, cinfo, quote, false);
@@ -283,7 +283,7 @@ bool LoadQREQ(QString& text, const QString& fileName)
     const db::Recordset known = opened(sql("SELECT * FROM QUOTE1 WHERE SUBQUOTE=0 AND KESTQRNO='{}' AND KESTQRVER='{}'",
                                            request.number, request.version));
     if (!known.eof()) {
-        newQuotes.reset();  // a box may stand for hours
+        newQuotes.reset();  // a box may stay open for hours
         return refuse(u"Quote Request already exists as quote number "_s + known.text(u"QTNNO"_s) + u'!');
     }
     request.readRest(message);
@@ -315,7 +315,7 @@ bool LoadQREQ(QString& text, const QString& fileName)
     quote.set(u"paint_rate"_s, insurer.value(car.text(u"PAINT_GP"_s) + u"_RATE"_s));
 
     customer.update();
-    car.set(u"CUST_ID"_s, customer.value(u"CUST_ID"_s));  // a new customer has its number only now
+    car.set(u"CUST_ID"_s, customer.value(u"CUST_ID"_s));  // a new customer gets its number from the update
     car.update();
     quote.update();
     newQuotes.reset();
@@ -327,10 +327,10 @@ bool LoadQREQ(QString& text, const QString& fileName)
     newQuotes = lockNewQuotes();
     cinfo.requery();
     if (cinfo.value(u"QUOTE_VAL"_s) != counter)
-        return true;  // another workstation has counted on while the report was open
+        return true;  // another workstation has changed the counter while the report was open
     db::Recordset tried(gConn);
     const QString next = NextQuoteNumber(quoteNumber, cinfo, tried, true);
-    // with a prefix of letters the counter stays, and the search skips what is taken
+    // with a prefix of letters the counter stays as it is, and the search skips numbers that are taken
     const bool isCount = std::ranges::all_of(next, [](QChar c) { return c.isDigit(); });
     if (isCount) {
         cinfo.set(u"QUOTE_VAL"_s, next);
@@ -362,7 +362,7 @@ int NextImageNumber(const QString& quoteNumber)
 {
     int highest = 0;
     for (const QString& name : files::list(gsImagesPath, quoteNumber + u"_*"_s)) {
-        // behind the number, "_" and the subquote's digit. Without regard to case, as the folder finds names.
+        // the digits follow the quote number, "_" and the digit of the subquote; names match in any case
         if (!name.startsWith(quoteNumber + u'_', Qt::CaseInsensitive))
             continue;
         bool isNumber = false;

@@ -1,4 +1,4 @@
-// The lines of a message become lines of a quote: section by section, each with a word on what is to happen to it.
+// Applies the lines of a message to a quote, section by section. Each line says how it changes the quote.
 #include "base/QuoteKey.h"
 #include "base/modLoggerEx.h"
 #include "inbound/modLoadXML.h"
@@ -25,7 +25,7 @@ constexpr int partNumberLength = 21;
 constexpr int repairerLength = 49;
 constexpr int tickOfNewLine = 7;
 
-// Insert comes with a word of its own; a line of which no line of its section said anything is added too.
+// A line is added if its indicator is that of Insert, or if neither it nor a line before it in its section has one.
 enum class Change { Add, Insert, Alter, Keep, Delete };
 
 constexpr std::pair<QLatin1StringView, Change> changes[] = {
@@ -42,7 +42,7 @@ Change changeOf(const QString& indicator)
     throw RuntimeError(TypeMismatch, u"The change indicator \"%1\" is not known."_s.arg(indicator));
 }
 
-/// One line of the message. A deleted one has its number and nothing else.
+/// A line of the message. A deleted one has only its number.
 struct Line {
     xml::Node node;
     Change change;
@@ -54,7 +54,7 @@ struct Line {
     }
 };
 
-/// The lines of a section. One that does not say what is to happen does as the one before it.
+/// Returns the lines of a section. A line without a change indicator has that of the line before it.
 QList<Line> linesOf(const xml::Node& body, QLatin1StringView section)
 {
     QList<Line> lines;
@@ -67,7 +67,8 @@ QList<Line> linesOf(const xml::Node& body, QLatin1StringView section)
     return lines;
 }
 
-/// Stands on the row that a line is to fill, a new one where it is added. False where there is nothing to fill.
+/// Makes the row that a line fills the current row, a new row if the line is added. Deletes the row of a deleted line.
+/// Returns false if there is no row to fill.
 bool standOnRow(db::Recordset& rows, Change change, qint64 number)
 {
     if (rows.recordCount() > 0)
@@ -105,7 +106,8 @@ void fillWhereEmpty(db::Recordset& row, const QString& column, const QVariant& v
         row.set(column, value);
 }
 
-/// Stores the line before a code is looked for: the look goes through the rows and passes over what fails on its way.
+/// Updates the row and gives it an item code. Updates it first: the search for a code moves through the rows and
+/// ignores errors, so a failed update would go unnoticed.
 void storeWithItemNo(db::Recordset& row)
 {
     row.update();
@@ -114,7 +116,7 @@ void storeWithItemNo(db::Recordset& row)
     row.update();
 }
 
-// The rate of a loaded line is 1, so that its amount of money stands in the hours.
+// The rate of a loaded line is 1, so that the hours are its amount of money.
 
 void fillLabourAmount(db::Recordset& row, const QString& type, const QString& script, const QString& amount)
 {
@@ -166,7 +168,7 @@ void fillMark(db::Recordset& row, const QString& partType)
         row.set(u"MARK"_s, u"X"_s);
 }
 
-/// The side of the car where the description begins with it; a side that a person set stays.
+/// Sets the side of the car if the description begins with it. A side that a person has set stays.
 void fillSide(db::Recordset& row, const QString& description)
 {
     fillWhereEmpty(row, u"SIDE"_s, u"O"_s);
@@ -210,7 +212,7 @@ void takePart(const db::Recordset& quote, db::Recordset& row, const Line& line)
     storeWithItemNo(row);
 }
 
-/// Without the marker of blended paint at its end.
+/// Removes the marker of blended paint from the end.
 QString withoutBlend(const QString& description)
 {
     constexpr qsizetype marker = 6;  // characters: the word and the blank before it
@@ -229,7 +231,7 @@ void takePaint(const db::Recordset& quote, db::Recordset& row, const Line& line)
         return;
 
     fillKey(row, quote, number);
-    fillWhereEmpty(row, u"category"_s, u"PAINT"_s);  // other paint work that was changed stays what it is
+    fillWhereEmpty(row, u"category"_s, u"PAINT"_s);  // other paint work keeps its category when it is changed
     fillColumn(row, {{"script"_L1, script}, {"pthour"_L1, toDouble(amount)}});
     fillWhereEmpty(row, u"blend"_s, 0);
     fillColumn(row, {{"Tag"_L1, 1}, {"delitem"_L1, false}, {"tosend"_L1, u"A"_s}, {"rr_rate2"_L1, 1}});
@@ -238,7 +240,7 @@ void takePaint(const db::Recordset& quote, db::Recordset& row, const Line& line)
     storeWithItemNo(row);
 }
 
-/// What the lines of the section have told so far: an element that a line lacks keeps what the line before it told.
+/// The elements of a sublet line. An element that a line lacks has the value of the line before it.
 struct Sublet {
     qint64 number = 0;
     QString description;
@@ -261,8 +263,8 @@ void Sublet::read(const Line& line)
     take(u"rootns:subletRepairerPhone"_s, phone);
 }
 
-/// The number of a line that has none but brings a document: above all lines of the quote, or above the line before it
-/// where the quote has none.
+/// Returns a number for a line that has none but comes with a document: above all lines of the quote or, if the quote
+/// has no lines, above the line before it.
 qint64 numberForDocument(const QuoteKey& quote, qint64 before)
 {
     const db::Recordset rows =
@@ -271,7 +273,7 @@ qint64 numberForDocument(const QuoteKey& quote, qint64 before)
     return NextDocumentLine(highest.isNull() ? before : toLong(highest));
 }
 
-/// Stores the document that a line brings; the line's number, which may have to be worked out for it.
+/// Stores the document of a line, if it has one. Returns the number of the line, a new one if the document needs it.
 qint64 takeDocument(const db::Recordset& quote, const Line& line, qint64 before)
 {
     qint64 number = line.number();

@@ -1,4 +1,4 @@
-// The six messages that move a quote through its network life without touching its lines.
+// Loads the six messages that change the state of a quote but not its lines.
 #include "base/QuoteKey.h"
 #include "base/SharedVariables.h"
 #include "inbound/modLoadXML.h"
@@ -36,7 +36,7 @@ void tell(const QStringList& lines)
     desktop::msgBox(lines.join(u"\r\n"_s), desktop::Icon::Information);
 }
 
-/// As a rule the main quote; `eof` where the request has none.
+/// Opens the oldest quote of the request, which is usually the main quote. If there is none, `eof` is true.
 db::Recordset openOldestOfRequest(const QString& request)
 {
     db::Recordset quote = opened(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request));
@@ -117,10 +117,10 @@ bool LoadQTDL(QString& text, const QString&)
     const QuoteKey key = QuoteKey::fromRow(quote);
     const QString label = quoteLabel(quote);
     const QString reason = message.textOf(u"//rootns:getQuoteDeletionResponse/rootns:reason"_s);
-    gsDeletedQTNNO = key.number;  // the file is named after a quote that may be gone by then
+    gsDeletedQTNNO = key.number;  // the file's new name needs it after the quote may have been deleted
     gsDeletedSubquote = key.subquote;
 
-    // The notes go to the main quote, also where a supplementary quote is deleted.
+    // The notes go to the main quote, even if a supplementary quote is deleted.
     db::Recordset notes = opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='0'", key.number));
     bool taken = true;
     if (!isSupplementary(quote)) {

@@ -48,7 +48,7 @@ bool isNotice(const xml::Node& root)
     return first.nodeName() == u"mailtype"_s && first.text() == u"MDMSG"_s;
 }
 
-/// A notice of the estimating product is shown and put aside; it is never a message that was taken.
+/// Shows a notice of the estimating product and moves its file. A notice never counts as loaded.
 void takeNotice(const xml::Node& root, const QString& fileName)
 {
     desktop::msgBox(root.textOf(u"body"_s), desktop::Icon::Exclamation);
@@ -74,7 +74,7 @@ void withdrawIfRequest(const QString& path, const QString& requestNumber)
         files::remove(path, files::Force::Yes);
 }
 
-/// A quote request that a manual quote answers may still wait unread; it must not make a second quote.
+/// Deletes unread quote requests that a manual quote has answered, so that they don't become a second quote.
 void withdrawWaitingRequests(const QString& requestNumber)
 {
     for (const QString& name : files::list(gsUnreadPath)) {
@@ -83,7 +83,7 @@ void withdrawWaitingRequests(const QString& requestNumber)
         try {
             withdrawIfRequest(gsUnreadPath + name, requestNumber);
         } catch (const RuntimeError& error) {
-            if (error.number() != FileNotFound)  // taken by the transport since the folder was listed
+            if (error.number() != FileNotFound)  // the transport may have removed it since the folder was listed
                 throw;
         }
     }
@@ -130,10 +130,10 @@ bool LoadXML(QString& text, const QString& fileName)
 
 std::unique_ptr<db::Lock> lockNewQuotes()
 {
-    constexpr int patience = 20;  // seconds; it takes a fraction of one
+    constexpr int patience = 20;  // seconds; a load holds the lock for less than one
     auto lock = std::make_unique<db::Lock>(gConn, u"new quote"_s, patience);
     if (!lock->isHeld())
-        throw RuntimeError(StatementFailed, u"Another workstation is making a quote."_s);
+        throw RuntimeError(StatementFailed, u"Another workstation is creating a quote."_s);
     return lock;
 }
 

@@ -1,4 +1,4 @@
-// The numbers that a loaded line takes where the message leaves them open: its own, its item code, its document's.
+// Finds the numbers that a message leaves open: those of lines and of their documents, and item codes.
 #include "base/Helpers.h"
 #include "base/QuoteKey.h"
 #include "inbound/modLoadXML.h"
@@ -53,7 +53,7 @@ bool isTaken(db::Recordset& rows, const QString& code)
     return !rows.eof();
 }
 
-/// The first code of the ranges that no row has; empty where all are taken.
+/// Returns the first code in the ranges that no row has, or an empty text if all are taken.
 QString freeCode(db::Recordset& rows, std::span<const CodeRange> ranges)
 {
     for (const auto& [first, last] : ranges) {
@@ -65,7 +65,7 @@ QString freeCode(db::Recordset& rows, std::span<const CodeRange> ranges)
     return {};
 }
 
-/// The quote of the last number that was worked out, and that number.
+/// The last number that NextLineNumber() returned, and its quote.
 struct LastNumber {
     QuoteKey quote{{}, {}};
     qint64 number = 0;
@@ -96,7 +96,7 @@ QString NextItemNo(db::Recordset& rsLines)
         if (!code.isEmpty())
             chosen = code;
     });
-    attempt([&] {  // also after a failure: the code belongs to the line that asked
+    attempt([&] {  // even after a failure, because the caller sets the code in this row
         rsLines.moveFirst();
         rsLines.setAbsolutePosition(position);
     });

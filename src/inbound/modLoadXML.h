@@ -1,4 +1,4 @@
-// The road of a message into the quote tables: the one door, the loaders behind it, and what the loaders share.
+// Loads messages into the quote tables: the dispatcher, the loaders, and what they share.
 #pragma once
 
 #include "base/modDBAccess.h"
@@ -12,19 +12,20 @@
 
 namespace kest {
 
-/// Takes one message into the quote tables.
+/// Loads a message into the quote tables.
 ///
-/// `text` may come back changed: the schema-instance declaration put in, bare ampersands escaped.
-/// True when the message was taken. False after a refusal, whose box has been shown, or after a failure, which stands
-/// in the error log; the file stays unread, and the load can be tried again.
+/// Adds the schema-instance declaration to `text` and may escape bare ampersands in it. Returns true if the message was
+/// loaded. Returns false after a refusal, for which a box has been shown, or after a failure, which is in the error
+/// log. The file then stays unread, and the load can be repeated.
 bool LoadXML(QString& text, const QString& fileName);
 
-/// Takes in that the network has received a quote, named by the file as "R_" number "_" subquote. Each fill of the list
-/// applies it again. A failure rises to the fill.
+/// Marks a quote as received by the network. The file's name, "R_" number "_" subquote, names the quote. Every fill of
+/// the list applies the response again. Throws RuntimeError if it fails.
 void LoadSubmissionResponse(QString& text, const QString& fileName);
 
-// The loaders, one for each type of message, called by LoadXML alone. False after a refusal, whose box has been shown;
-// failures rise. No load runs in a transaction: what was updated before a failure stays.
+// The loaders, one for each type of message. Only LoadXML() calls them. They return false after a refusal, for which a
+// box has been shown, and throw RuntimeError if they fail. No load runs in a transaction: updates before a failure
+// stay.
 
 bool LoadQREQ(QString& text, const QString& fileName);
 bool LoadQMQR(QString& text, const QString& fileName);
@@ -37,64 +38,66 @@ bool LoadBCQR(QString& text, const QString& fileName);
 bool LoadADQT(QString& text, const QString& fileName);
 bool LoadARES(QString& text, const QString& fileName);
 bool LoadBACA(QString& text, const QString& fileName);
-bool LoadAUQT(QString& text, const QString& fileName);  // traps its own failures
+bool LoadAUQT(QString& text, const QString& fileName);  // reports its failures itself and returns false
 
-// The lines of a quote that comes back, for the loaders of authorised and of manual quotes.
+// The lines of authorised and manual quotes.
 
-/// Applies the lines of the message to those of the quote: `rsQuote` stands on the quote's row, `rsLines` holds all its
-/// lines. False after a failure, which is in the error log; what was applied before it stays. A line that says to do
-/// something unknown fails the body before any line is touched.
+/// Applies the lines of the message to the quote. The quote's row must be current in `rsQuote`, and `rsLines` must
+/// contain all its lines. Returns false after a failure, which is in the error log; lines that were applied before it
+/// stay. An unknown change indicator fails before any line is changed.
 bool LoadQuoteBody(const db::Recordset& rsQuote, db::Recordset& rsLines, const xml::Document& message);
-/// False, with the error log written, where `LoadQuoteBody` would touch no line.
+/// Returns false, and writes to the error log, if LoadQuoteBody() would fail before it changes a line.
 bool checkQuoteBody(const xml::Document& message);
-/// A line brought a document that authorises sublet work. Whoever shows the documents takes the mark away.
+/// True after a line came with a document that authorises sublet work. Set it to false when you show the documents.
 extern bool gbSubletDocumentArrived;
 
-/// The SEQ_NO of a line: `number` where it is above 0, else the next one of the quote. It goes on from the number that
-/// it gave the same quote last, since a line that was numbered may not be stored yet.
+/// Returns the SEQ_NO of a line: `number` if it is above 0, otherwise the next one of the quote. Continues from the
+/// last number that it returned for the same quote, because that line may not be stored yet.
 qint64 NextLineNumber(qint64 number, const QString& qtnno, const QString& subquote);
-/// An item code of the current line's category that no line has; "999" where none is left. Never fails, and leaves
-/// `rsLines` where it was.
+/// Returns an item code of the current line's category that no line has, or "999" if all are taken. Never throws.
+/// `rsLines` keeps its position.
 QString NextItemNo(db::Recordset& rsLines);
-/// The number of the documents' folder that a document of a line without number gives it: one above `highest` and above
-/// the last digit of every document's name.
+/// Returns a number for a line that has none, for the name of its document: one more than `highest` and than the last
+/// digit of any document's name.
 qint64 NextDocumentLine(qint64 highest);
-/// Where a line's document is to lie: under the line's number, or above the quote's highest where that is taken. Empty
-/// without number or subquote of the quote.
+/// Returns the path for the document of a line. If the line's number is taken, uses one above the highest of the quote.
+/// Returns an empty text if the quote's number or subquote is empty.
 QString NextDocumentName(const QString& qtnno, const QString& subquote, qint64 number);
 
 // What the loaders share.
 
-/// A quote number that no quote has: `given` where it has 2 to 8 characters and is free, else one of the shop's
-/// counter. With `valueOnly` the number comes without the shop's prefix and suffix, which the search still adds.
-/// `quote` is left open on the last number tried, empty.
+/// Returns a quote number that no quote has: `given` if it has 2 to 8 characters and is free, otherwise one from the
+/// shop's counter. If `valueOnly` is true, the number has no prefix and suffix, but the search still adds them. `quote`
+/// is open afterwards, on an empty result.
 QString NextQuoteNumber(const QString& given, const db::Recordset& cinfo, db::Recordset& quote, bool valueOnly);
-/// One more than the highest number among the quote's files in the images folder.
+/// Returns one more than the highest number of the quote's files in the images folder.
 int NextImageNumber(const QString& quoteNumber);
 
-/// Held from the search for a free number until the quote stands: two workstations that load at once find no number
-/// free together. Fails where another one does not let go.
+/// Locks out other workstations while this one searches for a free quote number and stores the quote. Throws
+/// RuntimeError if another one holds the lock for too long.
 std::unique_ptr<db::Lock> lockNewQuotes();
 
+/// The name of a column and a value for it.
 struct Column {
     QLatin1StringView name;
     QVariant value;
 };
-/// Sets columns of the current row, in their order.
+/// Sets columns of the current row in this order.
 void fillColumn(db::Recordset& row, std::initializer_list<Column> columns);
-/// Takes the totals and the host's overrides off a header that a load builds; the host has to look at the quote again.
+/// Sets the totals and the host's overrides to 0, and marks the quote as changed for the host.
 void fillWithoutTotals(db::Recordset& quote);
-/// Puts a car's colour in the spelling of the colour table, and empties one that is not in it.
+/// Changes a car's colour to the spelling of the colour table, or clears it if the table does not have the colour.
 void respellColour(db::Recordset& car, db::Recordset& colours);
-/// The row of the long texts that belongs to the quote.
+/// Opens the quote's row of long texts, which contains the notes.
 db::Recordset openNotes(const db::Recordset& quote);
-/// True where a message's number leads to no quote. An empty one never does: quotes of the host's own may hold it.
+/// Returns true if a number in a message leads to no quote. An empty number is always unknown, because quotes of the
+/// host may have an empty number too.
 bool isUnknown(const QString& number, const db::Recordset& quote);
-/// Says with a critical box why a message is not taken; false.
+/// Shows a critical box that says why a message is refused. Returns false.
 bool refuse(const QString& text);
-/// True for a subquote above 0.
+/// Returns true if the subquote is above 0.
 bool isSupplementary(const db::Recordset& quote);
-/// "123", or "123/2" for a supplementary quote.
+/// Returns "123", or "123/2" for a supplementary quote.
 QString quoteLabel(const db::Recordset& quote);
 
 }  // namespace kest
