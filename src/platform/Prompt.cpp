@@ -8,7 +8,7 @@ namespace {
 
 std::shared_ptr<Answerer> current;
 
-/// A copy, so that an answerer stays alive while it answers.
+/// Returns a copy of the pointer, so that the answerer stays alive while it answers.
 std::shared_ptr<Answerer> whoeverAnswers(const QString& question)
 {
     if (!current)

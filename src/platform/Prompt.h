@@ -1,4 +1,4 @@
-// Message boxes and input boxes through one seam, which windows, scripts and tests answer.
+// Shows message boxes and input boxes. A person, a script or a test can answer them.
 #pragma once
 
 #include <QJsonObject>
@@ -14,56 +14,61 @@ enum class Icon { None, Information, Question, Exclamation, Critical };
 enum class Buttons { Ok, YesNo };
 enum class Answer { Ok, Yes, No };
 
+/// A message box or a question.
 struct Box {
     QString text;
     Icon icon = Icon::None;
-    QString title;  // empty: the default title stands
+    QString title;  // if empty, the default title is shown
     Buttons buttons = Buttons::Ok;
     Answer defaultAnswer = Answer::Ok;
 };
 
+/// An input box.
 struct Input {
     QString prompt;
     QString title;
 };
 
-/// The title of boxes and input boxes that were given none.
+/// Returns the title of boxes that have none of their own.
 QString defaultTitle();
 
-/// Whoever answers: real windows, or a script.
+/// Answers boxes, either by showing them to a person or in place of one.
 class Answerer {
 public:
     virtual ~Answerer() = default;
+    /// Shows a box and returns the button that was chosen.
     virtual Answer box(const Box& box) = 0;
-    /// A cancelled input box is the empty text.
+    /// Shows an input box and returns the text, which is empty if the box was cancelled.
     virtual QString input(const Input& input) = 0;
-    /// Starts the program, a path in the host's form, without waiting for it; throws FileNotFound.
+    /// Starts a program and does not wait for it. `path` is in the host's form. Throws FileNotFound.
     virtual void start(const QString& path) = 0;
-    /// False if no person sees the windows.
+    /// Returns false if no person sees the windows.
     virtual bool isPerson() const { return true; }
-    /// Keeps a description of a window that is about to be shown, if the answerer keeps a record.
+    /// Records the description of a window that is about to be shown, if this answerer keeps a record.
     virtual void recordWindow(const QJsonObject& /*window*/) {}
 };
 
-/// Puts an answerer in place until another one comes; null takes it away. Without one the seam throws NeedsAnswer.
+/// Sets the answerer. While it is null, the functions below throw NeedsAnswer.
 void setAnswerer(std::shared_ptr<Answerer> answerer);
+/// Returns the answerer, or null if there is none.
 std::shared_ptr<Answerer> answerer();
 
-/// A box with one button.
+/// Shows a box with one button.
 void msgBox(const QString& text, Icon icon = Icon::None, const QString& title = {});
-/// A question with Yes and No; true for Yes. Closing the box answers No.
+/// Shows a question with Yes and No, and returns true for Yes. Closing the box means No.
 bool ask(const QString& text, Icon icon = Icon::Question, const QString& title = {},
          Answer defaultAnswer = Answer::Yes);
+/// Shows an input box and returns the text, which is empty if the box was cancelled.
 QString inputBox(const QString& prompt, const QString& title);
-/// Starts the program as a normal window with focus, without waiting for it; a path in the host's form.
+/// Starts a program and does not wait for it. `path` is in the host's form. Throws FileNotFound.
 void startProgram(const QString& path);
-/// True if a person sees the windows; false with a script, and without an answerer.
+/// Returns true if a person sees the windows, and false if a script answers or if there is no answerer.
 bool isPersonPresent();
-/// Describes a window for the record of an unattended run.
+/// Adds the description of a window to the record of an unattended run.
 void recordWindow(const QJsonObject& window);
 
-/// What ends an unattended command: something asks for a person and nothing answers. Not a RuntimeError, so that it
-/// passes through every routine that goes on past failures.
+/// Ends an unattended command that needs the answer of a person. It is not a RuntimeError, so that no routine that
+/// ignores errors can catch it.
 class NeedsAnswer : public std::exception {
 public:
     explicit NeedsAnswer(QString what);

@@ -1,4 +1,4 @@
-// The one exception type for failures, and the one word for a step whose failure is passed over.
+// The exception for failures, and attempt(), which runs a step and ignores its failure.
 #pragma once
 
 #include <QString>
@@ -8,7 +8,7 @@
 
 namespace kest {
 
-/// Failure numbers keep their usual meaning, so that a log record can be looked up.
+/// Error numbers. They have their usual meanings, so that a record of the log can be looked up.
 enum ErrorNumber : int {
     Overflow = 6,
     TypeMismatch = 13,
@@ -17,17 +17,18 @@ enum ErrorNumber : int {
     FileExists = 58,
     PermissionDenied = 70,
     PathNotFound = 76,
-    NoObject = 91,  // an object, an element or a connection that is not there
+    NoObject = 91,  // an object, an element or a connection is missing
     NullValue = 94,
     NoCurrentRow = 3021,
     NoSuchColumn = 3265,
     ObjectClosed = 3704,
-    ValueTooLong = -2147217887,     // a text longer than its column
+    ValueTooLong = -2147217887,     // a text is longer than its column
     RowChanged = -2147217864,       // someone else has changed or removed the row
-    StatementFailed = -2147217900,  // the engine refused the statement
-    CannotOpen = -2147467259,       // the database cannot be opened, or has gone
+    StatementFailed = -2147217900,  // the engine has refused the statement
+    CannotOpen = -2147467259,       // the database can't be opened, or the connection is lost
 };
 
+/// A failure, with a number that code can test and a description for people.
 class RuntimeError : public std::exception {
 public:
     RuntimeError(int errorNumber, QString errorDescription, QString errorSource = {});
@@ -36,7 +37,7 @@ public:
     const QString& description() const { return description_; }
     const QString& source() const { return source_; }
 
-    /// The engine's own code and SQLSTATE of a database failure; empty for any other.
+    /// The engine's own error code and SQLSTATE. Empty if it is not a database error.
     const QString& nativeCode() const { return nativeCode_; }
     const QString& sqlState() const { return sqlState_; }
     RuntimeError& withDatabaseCodes(QString native, QString state);
@@ -52,7 +53,7 @@ private:
     QByteArray utf8_;
 };
 
-/// Runs a step whose failure is passed over; true when it did not fail.
+/// Runs a step, ignores its RuntimeError, and returns true if there was none.
 template <class Step>
 bool attempt(Step&& step)
 {

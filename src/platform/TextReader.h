@@ -1,4 +1,4 @@
-// Reads a text form from left to right, for the conversions of values.h.
+// Parses numbers and dates for the conversions of values.h.
 #pragma once
 
 #include <QString>
@@ -27,7 +27,7 @@ inline bool isDigit(QChar c)
     return c >= u'0' && c <= u'9';
 }
 
-/// Reads a text from left to right; a step that does not fit changes nothing.
+/// Reads a text from left to right. A step that does not match leaves the position unchanged.
 class TextReader {
 public:
     explicit TextReader(QStringView source) : text(source) {}
@@ -56,7 +56,7 @@ public:
             ++position;
     }
 
-    /// The digits from here on, at most so many.
+    /// Reads all digits at this position, at most `most`.
     QStringView digits(qsizetype most = std::numeric_limits<qsizetype>::max())
     {
         const qsizetype start = position;
@@ -65,7 +65,7 @@ public:
         return text.sliced(start, position - start);
     }
 
-    /// A whole number of `least` to `most` digits, or none.
+    /// Reads a whole number of `least` to `most` digits.
     std::optional<int> number(int least, int most)
     {
         const QStringView found = digits(most);

@@ -7,7 +7,7 @@ namespace kest {
 
 namespace {
 
-/// The rest of a text behind its date: a 24-hour clock with a fraction and a zone mark.
+/// Reads the rest of a text after its date: a 24-hour time, with a fraction and a zone mark if they are there.
 std::optional<QTime> readIsoTime(TextReader& reader)
 {
     const auto hour = reader.number(2, 2);
@@ -42,7 +42,7 @@ std::optional<QTime> readIsoTime(TextReader& reader)
     return reader.atEnd() && time.isValid() ? std::optional(time) : std::nullopt;
 }
 
-/// The rest of a text behind its date: a clock of 24 hours, or of 12 with its marker.
+/// Reads the rest of a text after its date: a 24-hour time, or a 12-hour time with AM or PM.
 std::optional<QTime> readClock(TextReader& reader)
 {
     auto hour = reader.number(1, 2);

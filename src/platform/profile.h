@@ -1,16 +1,18 @@
-// The profile: the folder of everything that belongs to one workstation.
+// The profile: the folder with everything that belongs to a workstation.
 #pragma once
 
 #include <QString>
 
 namespace kest::profile {
 
-/// The folder chosen with `setRoot`, else by the variable KEST2_PROFILE, else `kest2` in the user's data directory.
-/// An absolute path of this system without a trailing separator; the folder need not exist.
+/// Returns the folder that was set with setRoot(), or else that of the variable KEST2_PROFILE, or else `kest2` in the
+/// user's data directory. The path is an absolute path of this system without a separator at the end. The folder may
+/// not exist.
 QString root();
+/// Chooses another profile for this process.
 void setRoot(const QString& folder);
 
-/// The component's own folder: KEST2_COMPONENT_DIR, else `component/` of the profile.
+/// Returns the component's own folder: that of KEST2_COMPONENT_DIR, or else `component/` in the profile.
 QString componentFolder();
 
 }  // namespace kest::profile

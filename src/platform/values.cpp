@@ -20,7 +20,7 @@ namespace {
 
 enum class Reading { Number, TooLarge, NoNumber };
 
-/// Of a number outside the type's range: true when it is above the range, false when it is too near to 0.
+/// Returns true if a number outside of the type's range is too large, and false if it is too near to 0.
 bool isAboveRange(std::string_view plain)
 {
     const size_t mark = std::min(plain.find('e'), plain.size());
@@ -36,7 +36,7 @@ bool isAboveRange(std::string_view plain)
     return exponent + static_cast<qint64>(point) - static_cast<qint64>(firstDigit) > 0;
 }
 
-/// Forms a number from plain digits; what is too near to 0 is 0.
+/// Converts plain digits to a number. A number that is too near to 0 becomes 0.
 Reading fromPlainDigits(const QVarLengthArray<char, 64>& plain, double& result)
 {
     const auto [end, error] = std::from_chars(plain.cbegin(), plain.cend(), result);
@@ -131,7 +131,7 @@ bool isWholeNumberType(int type)
 
 qint64 wholeNumber(const QVariant& value, qint64 least, qint64 most)
 {
-    const double rounded = std::nearbyint(toDouble(value));  // halves to the even one
+    const double rounded = std::nearbyint(toDouble(value));  // rounds a half to the even number
     if (!(rounded >= static_cast<double>(least) && rounded <= static_cast<double>(most)))
         failAsTooLarge();
     return static_cast<qint64>(rounded);
@@ -239,7 +239,7 @@ bool isNumeric(const QVariant& value)
 double leadingNumber(const QString& text)
 {
     QVarLengthArray<char, 64> plain;
-    qsizetype usable = 0;  // of `plain`: up to the last place where it was a whole number
+    qsizetype usable = 0;  // the length of `plain` up to which it is a complete number
     bool pointSeen = false;
     bool exponentSeen = false;
     for (const QChar c : text) {

@@ -1,4 +1,4 @@
-// Turns column values and message texts into numbers, flags, dates and texts: the one place that converts.
+// Converts column values and message texts to numbers, flags, dates and texts. All conversions are made here.
 #pragma once
 
 #include <QDateTime>
@@ -9,47 +9,49 @@
 
 namespace kest {
 
-// The readers below take these forms, blanks around them allowed, and no others:
+// These functions accept the following forms, with or without blanks around them, and no others:
 //   number   sign, digits, commas between groups of three, one point, an exponent: "1,234.50", "-.5", "1e3"
 //   Boolean  "true" or "false" in any case, or a number
 //   date     yyyy-MM-dd, the same with "T" or a blank and HH:m[:ss[.f]] and a zone mark, d/M/yyyy, the same with a
 //            time of a 12- or 24-hour clock
-// A zone mark is passed over: date and time stand as they are written.
-// A Null throws NullValue, any other text TypeMismatch, a number too large for the result Overflow.
+// A zone mark is ignored: date and time stay as they are written.
+// They throw NullValue for a Null, TypeMismatch for any other text, and Overflow for a number that is too large.
 
 double toDouble(const QVariant& value);
-/// A whole number of 32 bits; a fraction is rounded to the nearest, halves to the even one.
+/// Returns a 32-bit whole number. A fraction is rounded to the nearest number, a half to the even one.
 qint64 toLong(const QVariant& value);
-/// A whole number of 16 bits, with Overflow outside -32768 to 32767.
+/// Returns a 16-bit whole number, rounded like toLong(). Throws Overflow outside of -32768 to 32767.
 qint64 toInteger(const QVariant& value);
 bool toBool(const QVariant& value);
-/// The flag of a column: a Null counts as false.
+/// Returns the flag of a column, or false for a Null.
 inline bool isTrue(const QVariant& flag)
 {
     return !flag.isNull() && toBool(flag);
 }
 QDateTime toDate(const QVariant& value);
-/// A date as columns hold it: in no time zone, so that the hour which a clock change leaves out is an hour like others.
+/// Returns a date as columns store it. It has no time zone, so the hour that a clock change skips is a normal hour.
 QDateTime columnDate(const QDate& date, const QTime& time);
 
-/// The number in a text, or none where the text is no number.
+/// Returns the number in a text, or nothing if the text is not a number.
 std::optional<double> numberIn(const QString& text);
+/// Returns the date in a text, or nothing if the text is not a date.
 std::optional<QDateTime> dateIn(const QString& text);
+/// Returns true if the value is a number or a text that is one.
 bool isNumeric(const QVariant& value);
 
-/// The number at the start of a text: blanks are skipped wherever they stand, the rest behind it is passed over, 0
-/// where there is none.
+/// Returns the number at the start of a text, or 0 if there is none. Skips blanks, even between digits, and ignores the
+/// rest.
 double leadingNumber(const QString& text);
 
-/// Any value as text: short date, with the time ("2:05:00 PM") when it is not midnight; "True" and "False"; general
-/// number text. Throws NullValue for a Null.
+/// Returns a value as text: a short date, followed by the time ("2:05:00 PM") if it is not midnight; "True" or "False";
+/// or a number as numberText() writes it. Throws NullValue for a Null.
 QString toText(const QVariant& value);
-/// The value followed by an empty text: a Null is the empty text.
+/// Returns the value as text, or an empty text for a Null.
 QString textOrEmpty(const QVariant& value);
 
-/// General number text: up to 15 significant digits, no exponent from 1e-10 to below 1e16, never "-0".
+/// Returns a number with up to 15 significant digits, without exponent from 1e-10 to below 1e16, and never "-0".
 QString numberText(double value);
-/// dd/MM/yyyy, always ten characters.
+/// Returns a date as dd/MM/yyyy, always ten characters.
 QString shortDate(const QDate& date);
 
 }  // namespace kest
