@@ -1,9 +1,9 @@
-# Every target links kest_options: the standard, the warnings and the Qt rules in one place.
+# Every target links kest_options, which sets the language standard, the warnings and the rules for Qt.
 add_library(kest_options INTERFACE)
 target_compile_features(kest_options INTERFACE cxx_std_20)
 target_compile_options(kest_options INTERFACE -Wall -Wextra -Wpedantic -Wshadow -Wnon-virtual-dtor -Woverloaded-virtual
                                               -Werror)
-# GCC 12 sees joined std::strings overlap and overrun where they don't, once it optimises.
+# With optimisation, GCC 12 wrongly warns that joined std::strings overlap and overrun.
 target_compile_options(kest_options INTERFACE $<$<CXX_COMPILER_ID:GNU>:-Wno-restrict> $<$<CXX_COMPILER_ID:GNU>:-Wno-array-bounds>)
 target_compile_definitions(
     kest_options

@@ -1,11 +1,12 @@
-# A room is one folder of src/, one build target and one set of headers.
+# A room is a folder of src/ and also one build target. The compiler of a room finds only the headers of this room, of
+# the rooms that it uses, and of the rooms that those use. An include of any other room does not compile.
 #
-#   kest_room(inbound reports messages)          objects in src/inbound, may include reports, messages and what is below
-#   kest_room(platform/xml values STATIC ...)    a static library instead, for what is not in the component
+#   kest_room(inbound USES reports messages)         an object library with the sources in src/inbound
+#   kest_room(setup STATIC USES base ...)            a static library, for rooms that are not part of the component
+#   kest_room(platform NAME values LINKS Qt6::Core)  a target name of its own, and libraries to link
 #
-# The target of the folder platform/xml is kest_xml. Its compiler sees the headers of its own folder, of the rooms
-# named, and of what those are built on; an include of any other room does not compile. For that the build tree holds a
-# folder of links for each room, and no target has all of src/ on its include path.
+# The target of src/platform/xml is kest_xml. To limit the headers, the build tree has a folder of links for each room,
+# and no target has the whole of src/ on its include path.
 function(kest_room folder)
     cmake_parse_arguments(room "STATIC" "NAME" "USES;LINKS" ${ARGN})
     if(NOT room_NAME)
@@ -45,7 +46,7 @@ function(kest_room folder)
     kest_precompile(${target})
 endfunction()
 
-# A folder with subfolders that are rooms of their own gets a link for each header; any other gets one link.
+# Links the headers of a room into the build tree.
 function(kest_link_headers name folder)
     set(links ${PROJECT_BINARY_DIR}/rooms/${name}/${folder})
     file(GLOB headers CONFIGURE_DEPENDS ${CMAKE_CURRENT_SOURCE_DIR}/*.h)
@@ -56,7 +57,7 @@ function(kest_link_headers name folder)
     endforeach()
 endfunction()
 
-# Two precompiled headers serve all rooms: one for those without windows, one for those with.
+# All rooms share two precompiled headers: one for rooms without windows and one for rooms with windows.
 function(kest_precompile target)
     if(NOT KEST_PCH)
         return()
