@@ -1,5 +1,5 @@
--- A shop to try things on: quotes in every state of their network life. All names are invented.
--- @date-3@ stands for the day three days before the shop is made, @short-3@ for the same as a note writes it.
+-- A demo shop with quotes in every state of their network life. All names are invented.
+-- @date-3@ is the date three days before the shop is created, and @short-3@ is the same date as a note writes it.
 
 UPDATE CINFO SET QUOTE_VAL=1029;
 

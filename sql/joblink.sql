@@ -1,5 +1,5 @@
--- The three tables of JobLink's database that KEST2 writes. For whoever sets JobLink's side up.
--- A job is finished when its newJob row has Status 1; rows with Status 0 are being written, or were given up.
+-- The three tables of JobLink's database that KEST2 writes, for setting up JobLink.
+-- The newJob row of a complete job has Status 1. A row with Status 0 is being written, or its export has failed.
 
 CREATE TABLE newJob (
     nJobID_PK INT UNSIGNED NOT NULL AUTO_INCREMENT,

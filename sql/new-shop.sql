@@ -1,11 +1,11 @@
--- What a shop's quote database holds before its first quote: what the host puts there when it is installed.
+-- The content of a quote database before the first quote, which the host stores when it is installed.
 
 INSERT INTO CINFO (QUOTE_PRE, QUOTE_VAL, QUOTE_SUF, second_mu, recore_mu, after_mu) VALUES ('', 1001, '', 15, 15, 20);
 
 INSERT INTO INSURER (NAME, KEST, RR_RATE, RA_RATE, S1_RATE, S2_RATE, S3_RATE, M1_RATE, M2_RATE, M3_RATE, new_mu, excess_gst, street, suburb, contact, phone, Fax, email) VALUES
     ('KEST Universal Insurer', 1, 38, 42, 40, 42, 44, 46, 48, 52, 25, 1, '', '', '', '', '', '');
 
--- the unknown model of a car that a quote request brings
+-- the unknown model, for cars from quote requests
 INSERT INTO MODEL (MODEL_ID, MODEL_ID1, MAKE, MODEL) VALUES ('Z000', 'Z000', 'UNIVERSAL', 'MODEL');
 INSERT INTO ALLMODEL (MODEL_ID, MAKE, MODEL, SCHEDULE) VALUES ('Z000', 'UNIVERSAL', 'MODEL', '');
 

@@ -1,5 +1,5 @@
--- The quote database on the embedded engine: every table and column that this component reads or writes.
--- Texts compare without regard to case: each text column says so itself.
+-- The quote database on the embedded engine: all tables and columns that this component reads or writes.
+-- The collation of each text column ignores case.
 
 -- QUOTE1: quote headers; subquote 0 is the main quote
 CREATE TABLE QUOTE1 (
@@ -84,7 +84,7 @@ CREATE TABLE QUOTE2 (
 );
 CREATE INDEX QUOTE2_QUOTE ON QUOTE2 (QTNNO, Subquote);
 
--- QUOTE3: the long texts of a quote, the note chain among them
+-- QUOTE3: the long texts of a quote, such as the note chain
 CREATE TABLE QUOTE3 (
     QTNNO          VARCHAR(20) COLLATE NOCASE,
     Subquote       INTEGER,

@@ -1,5 +1,5 @@
--- The quote database on MariaDB and MySQL: every table and column that this component reads or writes.
--- The collation compares texts without regard to case and to trailing blanks, but tells accents apart.
+-- The quote database on MariaDB and MySQL: all tables and columns that this component reads or writes.
+-- The collation ignores case and trailing blanks, but distinguishes accents.
 
 -- QUOTE1: quote headers; subquote 0 is the main quote
 CREATE TABLE QUOTE1 (
@@ -84,7 +84,7 @@ CREATE TABLE QUOTE2 (
 ) DEFAULT CHARACTER SET utf8mb4 COLLATE utf8mb4_uca1400_as_ci;
 CREATE INDEX QUOTE2_QUOTE ON QUOTE2 (QTNNO, Subquote);
 
--- QUOTE3: the long texts of a quote, the note chain among them
+-- QUOTE3: the long texts of a quote, such as the note chain
 CREATE TABLE QUOTE3 (
     QTNNO          VARCHAR(20),
     Subquote       INTEGER,
