@@ -1,4 +1,4 @@
-// What an export to JobLink costs beside the bare inserts on the same server.
+// Measures an export to JobLink against plain INSERT statements on the same server.
 #include "base/CredentialCipher.h"
 #include "base/SharedVariables.h"
 #include "jobexport/JobLinkSettings.h"
@@ -22,7 +22,7 @@ using namespace kest;
 
 namespace {
 
-/// A shop with one quote of `lines` lines, and a JobLink server.
+/// A shop with a quote of `lines` lines, and a JobLink server.
 class Shop {
 public:
     Shop()
@@ -49,7 +49,7 @@ public:
                 lines));
     }
 
-    /// The rows that the last export wrote, written again by statements made beforehand.
+    /// Writes the rows of the last export again, with statements that were prepared before.
     void writeBare(int lines)
     {
         db::Connection target;

@@ -1,4 +1,4 @@
-// The loads of authorised and manual quotes by their number of lines, against the bare statements of the same load.
+// Measures loads of authorised and manual quotes with many lines against the plain statements of the same load.
 #include "setup/QuoteDatabase.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
@@ -23,7 +23,7 @@ using namespace Qt::StringLiterals;
 namespace kest {
 namespace {
 
-/// All values of the first column.
+/// Executes a query and returns all values of its first column.
 QList<qint64> run(const QString& statement)
 {
     QSqlQuery query(QSqlDatabase::database(QSqlDatabase::connectionNames().constFirst(), false));
@@ -43,7 +43,7 @@ QList<qint64> run(const QString& statement)
 constexpr const char* categories[] = {"R&R", "RA", "MIS"};
 constexpr const char* labourTypes[] = {"RR", "REPR", "OTH"};
 
-/// A new shop with the quotes 1 and 2 of so many labour lines: one to load into, one for the bare statements.
+/// A new shop with the quotes 1 and 2, each with `lines` labour lines: one for the load, one for the plain statements.
 class BenchShop {
 public:
     explicit BenchShop(int64_t lines)
@@ -92,7 +92,7 @@ QString element(const char* name, const QString& text)
     return u'<' + tag + u'>' + text + u"</"_s + tag + u'>';
 }
 
-/// The lines of a message; the amounts are other ones in each round, so that every line is written.
+/// Returns the lines of a message. The amounts differ in each round, so that every line is written.
 QString body(int64_t lines, const char* indicator, int round)
 {
     QString labours;
@@ -172,7 +172,7 @@ void statementsOfAuthorised(int64_t, int round)
 {
     for (const char* select : selectsOfQuote)
         run(QString::fromLatin1(select));
-    const QList<qint64> lines = run(QString::fromLatin1(selectsOfQuote[1]));  // the comparison reads them too
+    const QList<qint64> lines = run(QString::fromLatin1(selectsOfQuote[1]));  // because the comparison reads them too
     run(QString::fromLatin1(selectsOfQuote[0]));
     updateTotals(-round);
     updateHeader(round);
@@ -210,7 +210,7 @@ void statementsOfManual(int64_t lines, int round)
     run(sql("UPDATE QUOTE3 SET remarks='({} : Manual Quote Loaded)' WHERE QTNNO='2' AND Subquote=0", round));
 }
 
-/// Runs both in turns, and tells how many times as long the loads take as their statements.
+/// Runs loads and statements in turn and reports the ratio of their times.
 void compare(benchmark::State& state, QString (*message)(int64_t, int), void (*statements)(int64_t, int))
 {
     const BenchShop shop(state.range(0));
@@ -231,7 +231,7 @@ void compare(benchmark::State& state, QString (*message)(int64_t, int), void (*s
         loading += elapsed;
         state.SetIterationTime(static_cast<double>(elapsed) / 1e9);
         if (!taken)
-            state.SkipWithError("the message was not taken");
+            state.SkipWithError("the message was not loaded");
     }
     const auto loaded = static_cast<double>(state.iterations() * state.range(0));
     state.counters["microseconds_a_line"] = static_cast<double>(loading) / 1e3 / loaded;

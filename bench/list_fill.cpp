@@ -1,4 +1,4 @@
-// The fill of the message list against its floor: each file read and parsed once.
+// Measures a fill of the message list against reading and parsing each file once.
 #include "messages/Envelope.h"
 #include "messagelist/Summary.h"
 #include "platform/files/files.h"
@@ -18,7 +18,7 @@ using namespace Qt::StringLiterals;
 namespace kest {
 namespace {
 
-/// A message of the size that requests and quotes have: some ten kilobytes, mostly lines of the quote.
+/// Returns a message of the usual size: about ten kilobytes, mostly quote lines.
 QString message(int number)
 {
     constexpr const char* types[] = {"QREQ", "QREQ", "QREQ", "QMQR", "MANQ"};
@@ -46,12 +46,12 @@ void readAndParseEach(const QString& folder, const QStringList& names)
     for (const QString& name : names) {
         QFile file(folder + u'/' + name);
         if (!file.open(QIODevice::ReadOnly))
-            qFatal("%s cannot be read", qPrintable(name));
+            qFatal("%s can't be read", qPrintable(name));
         const QByteArray bytes = file.readAll();
         xmlDocPtr document =
             xmlReadMemory(bytes.constData(), static_cast<int>(bytes.size()), nullptr, "UTF-8", XML_PARSE_NONET);
         if (!document)
-            qFatal("%s does not parse", qPrintable(name));
+            qFatal("%s can't be parsed", qPrintable(name));
         xmlFreeDoc(document);
     }
 }
@@ -69,7 +69,7 @@ void fillList(benchmark::State& state)
         files::write(gsUnreadPath + names.last(), message(i));
     }
 
-    qint64 floor = 0;  // nanoseconds, of a pass right before each fill
+    qint64 floor = 0;  // nanoseconds; measured right before each fill
     qint64 filling = 0;
     for (auto _ : state) {
         QElapsedTimer timer;

@@ -1,4 +1,4 @@
-// Search as you type in the message list: the time of one key over all rows, what the list then shows painted.
+// Measures search as you type in the message list: the time for a key press, including painting the list.
 #include "setup/QuoteDatabase.h"
 #include "messages/Envelope.h"
 #include "messagelist/frmMessageList.h"
@@ -32,7 +32,7 @@ QString request(int number)
                .arg(number);
 }
 
-/// One key of a text that is typed in the list, or taken back, over and over: so few and many rows are met alike.
+/// Measures a key press. Types a text and deletes it again, over and over, so that few and many rows match in turn.
 void searchKey(benchmark::State& state)
 {
     const QTemporaryDir folder;

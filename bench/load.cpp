@@ -1,4 +1,5 @@
-// The load of a message against its floor: the bare statements that it needs, on the same database; and the note chain.
+// Measures the load of a message against the plain statements that it needs, on the same database. Also measures the
+// note chain.
 #include "setup/QuoteDatabase.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
@@ -22,7 +23,7 @@ using namespace Qt::StringLiterals;
 namespace kest {
 namespace {
 
-/// A new shop, and the way to run a bare statement on its connection.
+/// A new shop that can execute plain statements.
 class BenchShop {
 public:
     BenchShop()
@@ -112,7 +113,7 @@ QStringList statementsOfRequest(int number)
     return statements;
 }
 
-/// Runs both in turns, and tells how many times as long the loads take as their statements.
+/// Runs loads and statements in turn and reports the ratio of their times.
 template <class Load, class Statements>
 void compare(benchmark::State& state, Load load, Statements statements)
 {
@@ -131,7 +132,7 @@ void compare(benchmark::State& state, Load load, Statements statements)
         loading += elapsed;
         state.SetIterationTime(static_cast<double>(elapsed) / 1e9);
         if (!taken)
-            state.SkipWithError("the message was not taken");
+            state.SkipWithError("the message was not loaded");
     }
     state.counters["ratio_to_floor"] = static_cast<double>(loading) / static_cast<double>(floor);
 }
@@ -141,7 +142,7 @@ constexpr int requests = 500;
 void loadRequest(benchmark::State& state)
 {
     BenchShop shop;
-    gsListFolder = gsUnreadPath;  // a load prints its message from there; without a template no page is made
+    gsListFolder = gsUnreadPath;  // a load prints its message from this folder; without a template there is no page
     for (int number = 1; number <= requests; ++number)
         files::write(gsUnreadPath + u"%1.xml"_s.arg(number), request(number));
     compare(

@@ -1,4 +1,4 @@
-// What a search in a fetched quote costs, and what fetching one costs beside the bare driver.
+// Measures a search in a fetched quote, and fetching a quote against the driver alone.
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
 #include "platform/profile.h"
@@ -21,7 +21,7 @@ constexpr int mostRows = 10000;
 
 const QString select = u"SELECT * FROM QUOTE2 WHERE itemid<=%1"_s;
 
-/// An embedded database with the lines of one large quote.
+/// An embedded database with the lines of a large quote.
 class Lines {
 public:
     Lines()
@@ -79,7 +79,7 @@ void open(benchmark::State& state)
     state.SetItemsProcessed(state.iterations() * state.range(0));
 }
 
-/// The floor: the same rows through the bare driver, each value taken once.
+/// Measures the floor: reads each value of the same rows once through the driver.
 void openBare(benchmark::State& state)
 {
     lines();

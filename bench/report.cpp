@@ -1,4 +1,4 @@
-// Report 730: the table's cost for each line of the quote, and the PDF against the bare painting of the same document.
+// Measures report 730: the table for each line of the quote, and the PDF against painting the same document.
 #include "platform/print/Report.h"
 
 #include "base/SharedVariables.h"
@@ -26,7 +26,7 @@ using namespace Qt::StringLiterals;
 namespace kest {
 namespace {
 
-/// A shop with one quote, and the message that changes each of its lines.
+/// A shop with a quote, and a message that changes all its lines.
 class ChangedQuote {
 public:
     explicit ChangedQuote(int lines)
@@ -90,7 +90,7 @@ private:
     xml::Document message;
 };
 
-/// Time for each line must not grow with their number.
+/// Measures the table. The time for each line must not grow with the number of lines.
 void buildTable(benchmark::State& state)
 {
     const auto lines = static_cast<int>(state.range(0));
@@ -124,7 +124,7 @@ void paintBare(const QString& html, const QString& path)
     }
 }
 
-/// The whole way from the table to the file, in turns with the bare painting of the same document.
+/// Measures the way from the table to the file, in turn with painting the same document.
 void writePdf(benchmark::State& state)
 {
     const ChangedQuote quote(static_cast<int>(state.range(0)));

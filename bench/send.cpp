@@ -1,4 +1,5 @@
-// A send against its floor, the bare statements that it needs and the serialisation of the same tree; and the totals.
+// Measures a send against the plain statements that it needs and the serialisation of the same tree. Also measures the
+// totals.
 #include "setup/QuoteDatabase.h"
 #include "outbound/SendQuote.h"
 #include "platform/database/Sql.h"
@@ -43,7 +44,7 @@ void run(const QString& statement)
             benchmark::DoNotOptimize(query.value(column));
 }
 
-/// A new shop with the quote 1, of so many lines of every kind.
+/// A new shop with the quote 1, which has `lines` lines of every kind.
 class BenchShop {
 public:
     explicit BenchShop(int64_t lines)
@@ -88,7 +89,7 @@ private:
     QTemporaryDir folder;
 };
 
-/// As before the first send: no line has a number.
+/// Restores the state before the first send: no line has a number.
 void takeBack()
 {
     run(u"UPDATE QUOTE1 SET ReadOnly=0, Job_stage=1, quotechanged=0 WHERE QTNNO='1'"_s);
@@ -106,7 +107,7 @@ void bareStatements(int64_t lines)
         run(u"SELECT * FROM CAR WHERE REGO='ABC123'"_s);
         run(u"SELECT * FROM ALLMODEL WHERE MODEL_ID='C120'"_s);
         run(u"SELECT * FROM QUOTE3"_s + ofQuote);
-        run(u"SELECT * FROM QUOTE2"_s + ofQuote);  // once to round, once to total
+        run(u"SELECT * FROM QUOTE2"_s + ofQuote);  // once for rounding, once for the totals
     }
     run(u"SELECT NAME, KEST FROM INSURER WHERE INSURER_ID=1"_s);
     run(u"SELECT * FROM QUOTE2 WHERE QTNNO='1' AND SUBQUOTE=0 AND CATEGORY='PRT' AND QTY=0"_s);

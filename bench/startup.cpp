@@ -1,4 +1,4 @@
-// Process start to the shown panel, against a program that shows one empty window.
+// Measures the time from process start to the visible panel against a program that shows one empty window.
 #include "setup/Profile.h"
 #include "platform/profile.h"
 
@@ -21,7 +21,7 @@ const QTemporaryDir& folder()
     return made;
 }
 
-/// Milliseconds that a program takes from its start to its end; it shows its window and closes it.
+/// Returns the milliseconds that a program needs to start, show its window, close it and end.
 double runOnce(const QString& program, const QStringList& arguments)
 {
     QElapsedTimer clock;
