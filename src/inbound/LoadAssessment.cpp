@@ -4,6 +4,7 @@
 #include "messages/Envelope.h"
 #include "platform/Prompt.h"
 #include "platform/database/Sql.h"
+#include "quotedata/NetworkCodes.h"
 #include "quotedata/NoteChain.h"
 #include "quotedata/StateTable.h"
 #include "reports/PrintXML.h"
@@ -15,21 +16,6 @@ namespace kest {
 using namespace Qt::StringLiterals;
 
 namespace {
-
-constexpr std::pair<QLatin1StringView, QLatin1StringView> reasonTexts[] = {
-    {"UNSP"_L1, "Unspecified Reason"_L1}, {"INCO"_L1, "Quote Incomplete"_L1}, {"LABR"_L1, "Labour Price"_L1},
-    {"PART"_L1, "Part Price"_L1},         {"PAIN"_L1, "Paint Price"_L1},      {"RECY"_L1, "Recycled Parts"_L1},
-    {"METH"_L1, "Method of Repair"_L1},   {"TLSS"_L1, "Total Loss"_L1},       {"NOTP"_L1, "Repair not Proceeding"_L1},
-};
-
-QString reasonText(const QString& code)
-{
-    for (const auto& [known, text] : reasonTexts) {
-        if (known == code)
-            return text;
-    }
-    return u"Unknown Reason Code - "_s + code;
-}
 
 bool refuseRequestNumber()
 {
@@ -92,7 +78,8 @@ bool LoadARES(QString& text, const QString&)
 
     const QString code = message.textOf(u"//rootns:getAssmntResultResponse/rootns:reasonCode"_s).toUpper();
     const Transition& lost = code == u"TLSS"_s ? totalLoss : tenderFailed;
-    applyTransition(isSupplementary(quote) ? supplementaryRejected : lost, quote, notes, reasonText(code));
+    applyTransition(isSupplementary(quote) ? supplementaryRejected : lost, quote, notes,
+                    reasonOfCode(code).value_or(u"Unknown Reason Code - "_s + code));
     quote.update();
     notes.update();
     return true;

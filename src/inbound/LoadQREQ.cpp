@@ -6,6 +6,7 @@
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
+#include "quotedata/NetworkCodes.h"
 #include "quotedata/StateTable.h"
 #include "reports/PrintXML.h"
 
@@ -21,26 +22,6 @@ using namespace Qt::StringLiterals;
 namespace {
 
 constexpr QLatin1StringView universalInsurer = "KEST Universal Insurer"_L1;
-
-constexpr std::pair<QLatin1StringView, QLatin1StringView> paintGroups[] = {
-    {"SOLD"_L1, "S1"_L1}, {"CLER"_L1, "S2"_L1}, {"META"_L1, "M1"_L1}, {"PEAR"_L1, "M2"_L1}, {"HARL"_L1, "M3"_L1},
-};
-
-QString paintGroup(const QString& paintType)
-{
-    for (const auto& [type, group] : paintGroups) {
-        if (type == paintType)
-            return group;
-    }
-    return u"S3"_s;
-}
-
-QString transmission(const QString& code)
-{
-    if (code == u"A"_s)
-        return u"Automatic"_s;
-    return code == u"M"_s ? u"Manual"_s : code;
-}
 
 /// The values of the message. Reading them throws if an element is missing or malformed, even one that only the report
 /// shows, so that such a message fails before anything is stored.
@@ -156,14 +137,6 @@ void fillCustomer(db::Recordset& customer, const Request& request)
                          });
 }
 
-QString buildDate(const Request& request)
-{
-    if (request.builtYear <= 0)
-        return u""_s;
-    const qint64 month = request.builtMonth > 0 ? request.builtMonth : 1;
-    return PadZeroLeft(QString::number(month), 2) + u'/' + QString::number(request.builtYear);
-}
-
 QString colourOf(const QString& code, db::Recordset& colours)
 {
     if (code.isEmpty())
@@ -176,7 +149,7 @@ void fillNewCar(db::Recordset& car, const Request& request, const db::Recordset&
 {
     const QString none = u""_s;
     fillColumn(car, {
-                        {"PAINT_GP"_L1, paintGroup(request.paintType)},
+                        {"PAINT_GP"_L1, paintGroupOfCode(request.paintType)},
                         {"REGO"_L1, request.rego},
                         {"KEST"_L1, 1},
                         {"MODEL_ID"_L1, model.value(u"MODEL_ID"_s)},
@@ -191,10 +164,10 @@ void fillNewCar(db::Recordset& car, const Request& request, const db::Recordset&
                         {"TRIM_CODE"_L1, none},
                         {"OPT_CODE"_L1, none},
                         {"MODEL_NO"_L1, none},
-                        {"Year"_L1, buildDate(request)},
+                        {"Year"_L1, buildDate(request.builtYear, qMax<qint64>(request.builtMonth, 0))},
                         {"COLOUR"_L1, colourOf(request.colourCode, colours)},
                         {"VIN"_L1, request.vin},
-                        {"XMission"_L1, transmission(request.transmission)},
+                        {"XMission"_L1, transmissionOfCode(request.transmission)},
                     });
     if (!request.cylinders.isEmpty())
         car.set(u"CYLINDERS"_s, SafeVal(request.cylinders, u"0"_s));

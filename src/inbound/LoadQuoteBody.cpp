@@ -6,6 +6,7 @@
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
+#include "quotedata/NetworkCodes.h"
 #include "quotedata/Vendors.h"
 
 #include <QList>
@@ -118,22 +119,15 @@ void storeWithItemNo(db::Recordset& row)
 
 // The rate of a loaded line is 1, so that the hours are its amount of money.
 
-void fillLabourAmount(db::Recordset& row, const QString& type, const QString& script, const QString& amount)
+void fillLabourAmount(db::Recordset& row, const LabourType& type, const QString& script, const QString& amount)
 {
-    if (type == u"RR"_s)
-        fillColumn(
-            row,
-            {{"category"_L1, u"R&R"_s}, {"script"_L1, script}, {"rrhour"_L1, toDouble(amount)}, {"rr_rate2"_L1, 1}});
-    else if (type == u"REPR"_s)
-        fillColumn(
-            row,
-            {{"category"_L1, u"RA"_s}, {"script"_L1, script}, {"rahour"_L1, toDouble(amount)}, {"rr_rate2"_L1, 1}});
-    else if (type == u"OTH"_s)
-        fillColumn(row, {{"category"_L1, u"MIS"_s},
-                         {"script"_L1, script},
-                         {"unitcost"_L1, toDouble(amount)},
-                         {"rr_rate2"_L1, 0},
-                         {"directbill"_L1, u"R"_s}});
+    const bool isOther = type.code == labour::other.code;
+    fillColumn(row, {{"category"_L1, QString(type.category)},
+                     {"script"_L1, script},
+                     {type.amountColumn, toDouble(amount)},
+                     {"rr_rate2"_L1, isOther ? 0 : 1}});
+    if (isOther)
+        row.set(u"directbill"_s, u"R"_s);
 }
 
 void takeLabour(const db::Recordset& quote, db::Recordset& row, const Line& line)
@@ -146,7 +140,8 @@ void takeLabour(const db::Recordset& quote, db::Recordset& row, const Line& line
         return;
 
     fillKey(row, quote, number);
-    fillLabourAmount(row, type, script, amount);
+    if (const LabourType* known = labourTypeOfCode(type))
+        fillLabourAmount(row, *known, script, amount);
     fillWhereEmpty(row, u"allow_tick"_s, tickOfNewLine);
     fillColumn(row, {{"opg_rate"_L1, 0},
                      {"Tag"_L1, 1},
@@ -156,16 +151,6 @@ void takeLabour(const db::Recordset& quote, db::Recordset& row, const Line& line
                      {"PartNo"_L1, u""_s},
                      {"blend"_L1, 0}});
     storeWithItemNo(row);
-}
-
-void fillMark(db::Recordset& row, const QString& partType)
-{
-    if (partType == u"NEW"_s)
-        row.set(u"MARK"_s, u" "_s);
-    else if (partType == u"RECY"_s)
-        row.set(u"MARK"_s, u"U"_s);
-    else if (partType == u"EXCH"_s)
-        row.set(u"MARK"_s, u"X"_s);
 }
 
 /// Sets the side of the car if the description begins with it. A side that a person has set stays.
@@ -199,7 +184,8 @@ void takePart(const db::Recordset& quote, db::Recordset& row, const Line& line)
     fillColumn(
         row,
         {{"category"_L1, u"PRT"_s}, {"script"_L1, description.left(descriptionLength)}, {"PartNo"_L1, partNumber}});
-    fillMark(row, type);
+    if (const auto mark = markOfPartType(type))
+        row.set(u"MARK"_s, *mark);
     const double quantity = toDouble(quantityText);
     if (quantity == 0)
         row.set(u"Report"_s, true);

@@ -3,6 +3,7 @@
 #include "base/modDBAccess.h"
 #include "outbound/QuoteRows.h"
 #include "platform/database/Sql.h"
+#include "quotedata/NetworkCodes.h"
 
 using namespace Qt::StringLiterals;
 
@@ -19,24 +20,7 @@ QString digitsOf(const QString& text)
     return digits;
 }
 
-/// Returns the month and year of a build date such as "03/1998". A year alone means January of that year.
-std::pair<QString, QString> buildDate(const QString& year)
-{
-    const qsizetype slash = year.indexOf(u'/');
-    if (slash >= 0)
-        return {year.left(slash), year.mid(slash + 1)};
-    if (year.size() > 3)
-        return {u"01"_s, year};
-    return {};
-}
-
 }  // namespace
-
-QString transmissionOf(const db::Recordset& car)
-{
-    const QString transmission = trimmed(car, "XMISSION").toUpper();
-    return transmission == "A"_L1 || transmission == "AUTOMATIC"_L1 ? u"Automatic"_s : u"Manual"_s;
-}
 
 ExtraInfo::ExtraInfo(const QuoteKey& key)
     : quoteRow(opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key.number, key.subquote)))
@@ -79,10 +63,10 @@ QString ExtraInfo::model() const
 
 ExtraValues ExtraInfo::values() const
 {
-    const auto [month, year] = buildDate(carRow.text(u"Year"_s));
+    const auto [month, year] = monthAndYearTyped(carRow.text(u"Year"_s));
 
     ExtraValues values;
-    values[Transmission] = transmissionOf(carRow);
+    values[Transmission] = transmissionToSend(carRow.text(u"XMISSION"_s));
     values[VIN] = trimmed(carRow, "VIN");
     values[Odometer] = trimmed(quoteRow, "kms");
     values[Cylinders] = trimmed(carRow, "CYLINDERS");

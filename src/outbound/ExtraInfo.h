@@ -26,9 +26,6 @@ enum ExtraValue : size_t {
 };
 using ExtraValues = std::array<QString, 10>;
 
-/// Returns "Automatic" or "Manual" for the letter or word in the car's record.
-QString transmissionOf(const db::Recordset& car);
-
 /// The values, or a message that says which record is missing.
 using ExtraInfoResult = std::variant<ExtraValues, QString>;
 

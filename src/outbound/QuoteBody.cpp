@@ -6,6 +6,7 @@
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
+#include "quotedata/NetworkCodes.h"
 #include "quotedata/Rounding.h"
 
 #include <cmath>
@@ -17,18 +18,6 @@ namespace kest {
 namespace {
 
 constexpr double taxRate = 0.1;
-
-constexpr std::pair<QLatin1StringView, QLatin1StringView> partTypes[] = {
-    {"A"_L1, "RECY"_L1}, {"U"_L1, "RECY"_L1}, {"X"_L1, "EXCH"_L1}, {"C"_L1, "RECY"_L1}, {"R"_L1, "RECY"_L1},
-};
-
-QString partType(const QString& mark)
-{
-    for (const auto& [letter, type] : partTypes)
-        if (mark == letter)
-            return type;
-    return u"NEW"_s;
-}
 
 QString description(const db::Recordset& line, const QString& suffix = {})
 {
@@ -159,40 +148,42 @@ void QuoteBody::walk(db::Recordset& lines, const Branch* section, const char* el
 
 void QuoteBody::addLabours(const Branch& labours)
 {
-    const auto labour = [](const char* type, const Line& line, const QString& amount) {
+    const auto labourLine = [](const LabourType& type, const Line& line, const QString& amount) {
         return Leaves{
-            {"labourType", always, QString::fromLatin1(type)},
+            {"labourType", always, type.code},
             {"labourDescription", always, description(line)},
             {"labourAmount", always, amount},
         };
     };
-    const auto unrounded = [&](const char* type, const Line& line, double amount) {
+    const auto unrounded = [&](const LabourType& type, const Line& line, double amount) {
         labourSum += amount;
-        return labour(type, line, numberText(amount));
+        return labourLine(type, line, numberText(amount));
     };
     const auto hoursAtRate = [](const Line& line, const QString& hours) {
         return number(line, hours) * number(line, u"RR_RATE2"_s);
     };
 
     walk(removeAndReplace, &labours, "labour",
-         [&](const Line& line) { return unrounded("RR", line, hoursAtRate(line, u"RRHOUR"_s)); });
+         [&](const Line& line) { return unrounded(labour::removeAndReplace, line, hoursAtRate(line, u"RRHOUR"_s)); });
     walk(
         repair, &labours, "labour",
         [&](const Line& line) {
             const double amount = hoursAtRate(line, u"RAHOUR"_s);
             labourSum = RoundAmount(labourSum + amount, 2);
-            return labour("REPR", line, rounded(amount));
+            return labourLine(labour::repair, line, rounded(amount));
         },
         [](const Line& line) { return line.text(u"PARTNO"_s) == "M"_L1; });
     walk(
         miscellaneous, &labours, "labour",
-        [&](const Line& line) { return unrounded("OTH", line, SafeVal(line.text(u"UNITCOST"_s).trimmed(), u"0"_s)); },
+        [&](const Line& line) {
+            return unrounded(labour::other, line, SafeVal(line.text(u"UNITCOST"_s).trimmed(), u"0"_s));
+        },
         [&](const Line& line) {
             // a line with a vendor is a sublet; a main quote sends it only with the sublets
             return isMainQuote ? isAboveZero(line, u"VENDOR"_s) : isZero(line, u"UNITCOST"_s);
         });
     walk(mechanical, &labours, "labour",
-         [&](const Line& line) { return unrounded("OTH", line, hoursAtRate(line, u"RRHOUR"_s)); });
+         [&](const Line& line) { return unrounded(labour::other, line, hoursAtRate(line, u"RRHOUR"_s)); });
 }
 
 void QuoteBody::addPaints(const Branch& paints)
@@ -242,7 +233,7 @@ Leaves QuoteBody::part(const Line& line)
     const QString mark = line.text(u"MARK"_s);  // not trimmed: a load writes a single blank, which is a mark too
     return {
         filled("partNumber", mark.isEmpty() ? line.text(u"PARTNO"_s) : QString()),
-        {"partType", always, partType(mark)},
+        {"partType", always, partTypeOfMark(mark)},
         {"partDescription", always, description(line)},
         {"partQuantity", always, numberText(count)},
         {"partUnitPrice", always, price},

@@ -2,43 +2,13 @@
 
 #include "base/Helpers.h"
 #include "platform/values.h"
+#include "quotedata/NetworkCodes.h"
 
 using namespace Qt::StringLiterals;
 
 namespace kest {
 
 namespace {
-
-constexpr std::pair<QLatin1StringView, QLatin1StringView> colourCodes[] = {
-    {"aqua"_L1, "AQUA"_L1},   {"beige"_L1, "BEIG"_L1},     {"black"_L1, "BLAK"_L1},  {"blue"_L1, "BLUE"_L1},
-    {"brown"_L1, "BROW"_L1},  {"champagne"_L1, "CHAM"_L1}, {"gold"_L1, "GOLD"_L1},   {"green"_L1, "GREN"_L1},
-    {"grey"_L1, "GREY"_L1},   {"maroon"_L1, "MARN"_L1},    {"orange"_L1, "ORAG"_L1}, {"pink"_L1, "PINK"_L1},
-    {"purple"_L1, "PURP"_L1}, {"red"_L1, "RED"_L1},        {"silver"_L1, "SILV"_L1}, {"white"_L1, "WHIT"_L1},
-    {"yellow"_L1, "YELW"_L1},
-};
-
-constexpr std::pair<QLatin1StringView, QLatin1StringView> paintCodes[] = {
-    {"S1"_L1, "SOLD"_L1}, {"S2"_L1, "CLER"_L1}, {"S3"_L1, "CLER"_L1},
-    {"M1"_L1, "META"_L1}, {"M2"_L1, "PEAR"_L1}, {"M3"_L1, "HARL"_L1},
-};
-
-template <size_t N>
-QString lookedUp(const std::pair<QLatin1StringView, QLatin1StringView> (&table)[N], const QString& key,
-                 const QString& otherwise)
-{
-    for (const auto& [name, code] : table)
-        if (key == name)
-            return code;
-    return otherwise;
-}
-
-/// Returns the year and month of a car's build date, for use without the extra values.
-std::pair<QString, QString> buildDate(const QString& date)
-{
-    if (date.size() == 7)
-        return {date.right(4).trimmed(), date.left(2).trimmed()};
-    return {date.size() == 4 ? date : QString(), QString()};
-}
 
 QString phoneNumber(const db::Recordset& customer, const char* column)
 {
@@ -73,12 +43,12 @@ ExtraValues vehicleValues(const QuoteRows& rows, const std::optional<ExtraValues
     if (extra)
         values = *extra;
     else
-        std::tie(values[BuildYear], values[BuildMonth]) = buildDate(text(car, "YEAR"));
+        std::tie(values[BuildMonth], values[BuildYear]) = monthAndYearWritten(text(car, "YEAR"));
     const QVariant asked = rows.quote.value(u"ExtraInfo"_s);
     if (asked.isNull() || isTrue(asked))  // Null is treated like true
         return values;
 
-    values[Transmission] = transmissionOf(car);
+    values[Transmission] = transmissionToSend(text(car, "XMISSION"));
     values[Cylinders] = QString(text(car, "ENG_SIZE") + u' ' + text(car, "CYLINDERS")).trimmed();
     values[VIN] = trimmed(car, "VIN");
     values[Odometer] = trimmed(rows.quote, "kms");
@@ -91,7 +61,6 @@ void addVehicle(const Branch& request, const QuoteRows& rows, const std::optiona
     const ExtraValues values = vehicleValues(rows, extra);
     const bool asked = isTrue(rows.quote.value(u"ExtraInfo"_s));
     const QString oldDamage = asked && values[OldDamageDesc].isEmpty() ? u"None"_s : values[OldDamageDesc];
-    const QString colour = values[Colour].trimmed().toLower();
 
     const Leaves leaves = {
         filled("make", trimmed(rows.model, "MAKE")),
@@ -101,8 +70,8 @@ void addVehicle(const Branch& request, const QuoteRows& rows, const std::optiona
         filled("transmissionType", values[Transmission]),
         filled("numberOfCylinders", values[Cylinders]),
         filled("vinChassis", values[VIN]),
-        filled("color", lookedUp(colourCodes, colour, colour)),
-        filled("paintType", lookedUp(paintCodes, text(rows.car, "PAINT_GP").toUpper(), {})),
+        filled("color", codeOfColour(values[Colour])),
+        filled("paintType", codeOfPaintGroup(text(rows.car, "PAINT_GP"))),
         filled("odometer", values[Odometer]),
         filled("fuelLevel", values[Fuel]),
         filled("damageDescription", values[DamageDesc]),

@@ -10,6 +10,7 @@
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
+#include "quotedata/NetworkCodes.h"
 #include "reports/BuildAuthReport.h"
 #include "reports/QuoteComparison.h"
 #include "reports/ReportTable.h"
@@ -22,15 +23,12 @@
 #include <algorithm>
 #include <functional>
 #include <optional>
-#include <span>
 
 namespace kest {
 
 using namespace Qt::StringLiterals;
 
 namespace {
-
-using Texts = std::pair<QLatin1StringView, QLatin1StringView>;
 
 constexpr ReportField requestFields[] = {
     {"Corp", 20},         {"Quote", 8},
@@ -50,29 +48,6 @@ constexpr ReportField resultFields[] = {
     {"KESTQuoteNo", 12}, {"QTNNO", 8}, {"subquote", 1}, {"KESTQRNO", 10}, {"reason", 3000},
 };
 
-constexpr Texts colours[] = {
-    {"AQUA"_L1, "Aqua"_L1},   {"BEIG"_L1, "Beige"_L1},     {"BLAK"_L1, "Black"_L1},  {"BLUE"_L1, "Blue"_L1},
-    {"BROW"_L1, "Brown"_L1},  {"CHAM"_L1, "Champagne"_L1}, {"GOLD"_L1, "Gold"_L1},   {"GREN"_L1, "Green"_L1},
-    {"GREY"_L1, "Grey"_L1},   {"MARN"_L1, "Maroon"_L1},    {"ORAG"_L1, "Orange"_L1}, {"PINK"_L1, "Pink"_L1},
-    {"PURP"_L1, "Purple"_L1}, {"RED"_L1, "Red"_L1},        {"SILV"_L1, "Silver"_L1}, {"WHIT"_L1, "White"_L1},
-    {"YELW"_L1, "Yellow"_L1},
-};
-
-constexpr Texts reasons[] = {
-    {"UNSP"_L1, "Unspecified Reason"_L1}, {"INCO"_L1, "Quote Incomplete"_L1}, {"LABR"_L1, "Labour Price"_L1},
-    {"PART"_L1, "Part Price"_L1},         {"PAIN"_L1, "Paint Price"_L1},      {"RECY"_L1, "Recycled Parts"_L1},
-    {"METH"_L1, "Method of Repair"_L1},
-};
-
-/// Returns the text of a code, or Null for an unknown code, so that the field stays unset.
-QVariant textOf(const QString& code, std::span<const Texts> texts)
-{
-    for (const auto& [known, text] : texts)
-        if (code.toUpper() == known)
-            return QString(text);
-    return {};
-}
-
 /// Runs a step and ignores NoCurrentRow.
 void step(const std::function<void()>& step)
 {
@@ -86,8 +61,7 @@ void step(const std::function<void()>& step)
 
 void setField(db::Recordset& row, const char* field, const QVariant& value)
 {
-    if (!value.isNull())
-        row.set(QString::fromLatin1(field), value);
+    row.set(QString::fromLatin1(field), value);
 }
 
 QString fullName(const xml::Document& message)
@@ -106,11 +80,7 @@ QString builtDate(const xml::Document& message)
     const auto number = [&](const QString& element) {
         return toLong(SafeVal(message.textOf(u"//rootns:extraVehicleInformation/rootns:"_s + element), u"0"_s));
     };
-    const qint64 year = number(u"yearOfManufacture"_s);
-    const qint64 month = number(u"monthOfManufacture"_s);
-    if (year <= 0)
-        return u""_s;
-    return PadZeroLeft(QString::number(month == 0 ? 1 : month), 2) + u'/' + QString::number(year);
+    return buildDate(number(u"yearOfManufacture"_s), number(u"monthOfManufacture"_s));
 }
 
 QString imageDescription(const QString& requestNumber, const QString& imageId)
@@ -151,7 +121,8 @@ void fillRequest(db::Recordset& row, const xml::Document& message, const QString
     setField(row, "Make", extra("make"));
     setField(row, "Body", extra("bodyShape"));
     setField(row, "Built_date", builtDate(message));
-    setField(row, "Colour_desc", textOf(extra("color"), colours));
+    if (const auto colour = colourOfCode(extra("color")))
+        setField(row, "Colour_desc", *colour);
     setField(row, "Odometer", extra("odometer"));
     setField(row, "Damage", extra("damageDescription"));
     setField(row, "Old_Damage", extra("oldDamageDescription"));
@@ -198,7 +169,8 @@ bool printResult(const xml::Document& message)
         setField(table, "QTNNO", quote.text(u"QTNNO"_s));
         setField(table, "subquote", quote.text(u"Subquote"_s));
         setField(table, "KESTQRNO", requestNumber);
-        setField(table, "reason", textOf(message.textOf(u"//rootns:reasonCode"_s), reasons));
+        if (const auto reason = reportedReasonOfCode(message.textOf(u"//rootns:reasonCode"_s)))
+            setField(table, "reason", *reason);
     });
     frmPrintPreview::ShowForm(AssessmentReport, QStringList{u""_s, u"Assessment Result"_s}, &table);
     return true;

@@ -4,6 +4,7 @@
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
+#include "quotedata/NetworkCodes.h"
 #include "quotedata/Vendors.h"
 #include "reports/ReportTable.h"
 
@@ -215,10 +216,9 @@ void Comparison::takeItemNo()
 QVariant Comparison::oldLabourAmount(const QString& type) const
 {
     const QString rate = u"rr_rate2"_s;
-    if (type == u"RR"_s)
-        return product(shop, u"rrhour"_s, rate);
-    if (type == u"REPR"_s)
-        return product(shop, u"rahour"_s, rate);
+    for (const LabourType& ofHours : {labour::removeAndReplace, labour::repair})
+        if (type == ofHours.code)
+            return product(shop, ofHours.amountColumn, rate);
     if (!shop.isNull(u"unitcost"_s))
         return shop.value(u"unitcost"_s);
     for (const QString& hours : {u"rrhour"_s, u"rahour"_s, u"pthour"_s})
@@ -231,8 +231,7 @@ void Comparison::labour()
 {
     QString type = line.text("labourType");
     if (isBlank(type)) {
-        const QString category = shop.text(u"category"_s);
-        type = category == u"R&R"_s ? u"RR"_s : category == u"RA"_s ? u"REPR"_s : u"OTH"_s;
+        type = labourTypeOfCategory(shop.text(u"category"_s)).code;
         row.set(u"category"_s, type);
     }
     if (line.isDeleted()) {
