@@ -25,7 +25,7 @@ struct Ended {
     QJsonObject json;
 };
 
-/// The command as a service person runs it, on a demo shop of its own.
+/// Runs the command as a service person would, in a demo shop.
 class Command : public ::testing::Test {
 protected:
     Command() { app::initProfile(registerClass, true); }

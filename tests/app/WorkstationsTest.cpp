@@ -1,4 +1,4 @@
-// Two workstations on one database and one set of message folders, the second one being the command `kest2`.
+// Tests two workstations with the same database and message folders. The second one is the command `kest2`.
 #include "base/modDBAccess.h"
 #include "messagelist/frmMessageList.h"
 #include "outbound/SendQuote.h"
@@ -21,7 +21,7 @@ namespace {
 
 class Workstations : public Shop {
 protected:
-    /// The second profile leads to the first one's database and to its drive C:.
+    /// Creates a second profile that uses the database and drive C: of the first.
     Workstations()
     {
         QDir().mkpath(second_);
@@ -34,7 +34,7 @@ protected:
     }
     ~Workstations() override { db::setStatementFault({}); }
 
-    /// The exit codes of loads that start together, each on a workstation of its own.
+    /// Returns the exit codes of loads that start at the same time, each on its own workstation.
     std::vector<int> loadTogether(const QStringList& messages) const
     {
         const QString profiles[] = {root(), second_};
@@ -93,7 +93,7 @@ TEST_F(Workstations, TwoRequestsTakeTwoNumbers)
     }
 }
 
-/// The other workstation loads a message before each statement of a send in turn.
+/// Lets the other workstation load a message before the first statement of a send, then before the second, and so on.
 TEST_F(Workstations, ASendAndALoadLoseNothingOfEachOther)
 {
     quote("500").request("QR1").note("Active Quote Request").line(1).set("rrhour", 2).set("rr_rate2", 50);

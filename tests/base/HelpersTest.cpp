@@ -1,4 +1,4 @@
-// The small routines by whose exact rules messages are read.
+// Tests the small routines that read messages.
 #include "base/Helpers.h"
 #include "support/Cases.h"
 #include "support/Failure.h"

@@ -30,10 +30,10 @@ namespace {
 
 constexpr int backgroundWait = 5000;  // milliseconds
 
-/// What a clerk would look at, by what it is: quotes with their notes and lines, files, the jobs in JobLink.
+/// What a clerk would look at: quotes with their notes and lines, files, and the jobs in JobLink.
 using Holdings = QMap<QString, QString>;
 
-/// The columns of each row by its first one.
+/// Adds the columns of each row under the value of its first column.
 void addRows(Holdings& all, db::Recordset rows)
 {
     for (; !rows.eof(); rows.moveNext()) {
@@ -87,7 +87,7 @@ QStringList changes(const Holdings& before, const Holdings& after)
     return lines;
 }
 
-/// The boxes with their exact texts, the reports and documents, and the rows of each list that was read.
+/// Returns the boxes with their exact texts, the reports and documents, and the rows of each list that was read.
 QStringList told(const desktop::Record& record)
 {
     QStringList lines;
@@ -107,7 +107,7 @@ QStringList told(const desktop::Record& record)
     return lines;
 }
 
-/// The expected lines of each step, from a text in which "== step" heads those of a step.
+/// Reads the expected lines of each step. In the file they follow a line "== step".
 QMap<QString, QStringList> expectedSteps()
 {
     QMap<QString, QStringList> steps;
@@ -120,7 +120,7 @@ QMap<QString, QStringList> expectedSteps()
     return steps;
 }
 
-/// Every window and every report has a picture with something on it.
+/// Checks that every window and every report has a picture that is not empty.
 void checkPictures(const QDir& pictures)
 {
     const QStringList windows{u"comparison"_s, u"extra-information"_s, u"login"_s,        u"messages"_s,
@@ -138,7 +138,7 @@ void checkPictures(const QDir& pictures)
 
 using Look = std::function<void(const QString& step, const desktop::Record& shown)>;
 
-/// Plays the day in a shop of its own, looks after each step, and tells what the shop holds at the end.
+/// Plays the day in a new shop, calls `look` after each step, and returns what the shop contains at the end.
 std::string played(const MariaDbServer& server, const Look& look)
 {
     const TestProfile profile;

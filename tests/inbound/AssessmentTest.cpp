@@ -31,7 +31,7 @@ TEST_F(Assessments, EachAdjustmentAddsANoteToAQuoteWithLines)
 {
     quote("500").request("QR1").stage(3).locked(true).note("Responded Quote Request").line(1);
     EXPECT_TRUE(load(adjustedQuote("500")));
-    EXPECT_TRUE(load(adjustedQuote("999")));  // a wrong reference: the newest quote of the request
+    EXPECT_TRUE(load(adjustedQuote("999")));  // with a wrong reference, the newest quote of the request is used
     EXPECT_EQ(shown(), "[critical] Quote not found in database. Please contact MarlinDesk Support.") << "no report";
     EXPECT_EQ(quote("500").state(),
               "3 locked - (today : Adjustment Suggested) (today : Adjustment Suggested) "
@@ -47,15 +47,15 @@ TEST_F(Assessments, ASubmissionResponseGivesTheQuoteItsNumber)
 {
     quote("500", 2).note("Sending KEST Quote").note("Sending KEST Quote", "02/02/2008");
     takeResponse("R_500_2_0001.xml", "KQ5");
-    takeResponse("R_500_2_0001.xml", "KQ5");  // each fill applies it again
+    takeResponse("R_500_2_0001.xml", "KQ5");  // as each fill does
     EXPECT_EQ(quote("500", 2).state(),
               "1 locked KQ5 (02/02/2008 : Submitted KEST Quote) (01/02/2008 : Submitted KEST Quote)");
 
     quote("501").note("Sending KEST Quote");
-    takeResponse("R_501_0.xml", "KQ6", "submitted");  // another status
+    takeResponse("R_501_0.xml", "KQ6", "submitted");  // a different status
     EXPECT_EQ(quote("501").state(), "1 open KQ6 (01/02/2008 : Sending KEST Quote)");
 
-    // without its quote, or without a subquote in its name: the fill says so
+    // if its quote does not exist, or if its name has no subquote, the fill reports it
     EXPECT_THROW(takeResponse("R_502_0.xml", "KQ7"), RuntimeError);
     EXPECT_THROW(takeResponse("R_501.xml", "KQ7"), RuntimeError);
     EXPECT_EQ(quote("501").text("KESTQuoteNo"), "KQ6");

@@ -1,4 +1,4 @@
-// The way of an authorised quote into the shop's quote: which quote it finds, what it refuses, what it writes.
+// Tests the load of authorised quotes: which quote they find, what is refused, and what is stored.
 #include "base/modDBAccess.h"
 #include "inbound/modLoadXML.h"
 #include "support/Shop.h"
@@ -65,7 +65,7 @@ TEST_F(AuthorisedQuotes, TheQuoteIsFoundByNumberOrByTheNetworksNumbers)
         gConn->execute(u"UPDATE QUOTE1 SET KESTAuthNo=NULL"_s);
     }
 
-    // two such quotes count as found, but nothing says which lines are meant
+    // two such quotes count as a match, but it is unclear whose lines are meant
     anotherQuote("601").request("QR6").quoteNumber("KQ6").rego("XYZ789");
     EXPECT_FALSE(load(byNumbers));
     EXPECT_EQ(shown(), "[none] Error: Cannot load an Authorisation onto a blank quote!");
@@ -84,7 +84,7 @@ TEST_F(AuthorisedQuotes, ARefusalSaysWhyInThisOrder)
     EXPECT_EQ(refusal(), "[none] Could not locate Car listed on Authorisation. Please Contact MarlinDesk Support.");
     car("GONE");
     EXPECT_EQ(refusal(), "[critical] Error locating a valid insurer, Please contact MarlinDesk Support.");
-    EXPECT_EQ(car("GONE").number("KEST"), 1);  // written before the insurer is looked at
+    EXPECT_EQ(car("GONE").number("KEST"), 1);  // stored before the insurer is checked
 }
 
 TEST_F(AuthorisedQuotes, AssessorRegistrationAndExcessComeOverToTheMainQuote)
@@ -114,7 +114,7 @@ TEST_F(AuthorisedQuotes, LinesMergeAndTotalsFollow)
     EXPECT_EQ(quote("500").lines(), 4);
     EXPECT_TRUE(quote("500").shows("TOTAL=226 PRTTOTAL=750 MISTOTAL=12.5"));
     const QByteArray report = QJsonDocument(desktop->record().windows).toJson();
-    for (const char* onlyNow : {"\"988.5\"", "\"990\"", "\"137\""})  // the total, and the codes of the new lines
+    for (const char* onlyNow : {"\"988.5\"", "\"990\"", "\"137\""})  // the total and the codes of new lines
         EXPECT_TRUE(report.contains(onlyNow)) << onlyNow;
 }
 
@@ -147,20 +147,20 @@ TEST_F(AuthorisedQuotes, AFailureLeavesWhatWasWrittenBeforeIt)
         expectFailure(authorisedQuote("500").without(missing), "modLoadXML.LoadAUQT");
         EXPECT_EQ(car("ABC123").number("KEST"), 0) << missing;
     }
-    // a date that is none: car and money, but nothing of the header
+    // with an invalid date, the car and the money are stored, but nothing of the header
     quote("500").set("excess", 500);
     expectFailure(authorisedQuote("500").set("excess", "300").set("repairCompletionDate", "soon"), "Error Number: 13");
     EXPECT_EQ(car("ABC123").number("KEST"), 1);
     EXPECT_EQ(quote("500").number("excess"), 300);
     EXPECT_EQ(quote("500").state(), "3 locked - " + untouched);
-    // a line that can't be read: the header with its totals of 0, and the lines before it
+    // with an unreadable line, the header is stored with totals of 0, and so are the lines before it
     quote("500").line(1).set("rrhour", 2).set("rr_rate2", 38);
     expectFailure(authorisedQuote("500").part(2, "I").paint(3, "I", {{"paintAmount", "x"}}),
                   "\n[none] Error processing Quote Items, Please contact MarlinDesk Support.");
     EXPECT_TRUE(quote("500").shows("KESTAuthNo=KA1 TOTAL=0"));
     EXPECT_EQ(quote("500").lines(), 2);
     EXPECT_EQ(quote("500").notes(), untouched);
-    // and a second load goes on from there
+    // a second load continues from this state
     EXPECT_TRUE(load(authorisedQuote("500").part(2, "C")));
     EXPECT_EQ(quote("500").number("TOTAL"), 76);
     EXPECT_EQ(quote("500").notes(), "(today : Authorised Quote) (01/02/2008 : Won Quote Request)");

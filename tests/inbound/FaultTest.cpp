@@ -1,5 +1,5 @@
-// Every load with every statement and file operation failing, and then again: the shop ends as if nothing had happened,
-// or the test says why not.
+// Lets each statement and each file operation of each load fail once, and then repeats the load. In the end the shop
+// must be as if nothing had failed, unless the test says why not.
 #include "inbound/modLoadXML.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/FaultInjection.h"
@@ -15,8 +15,8 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-/// Why a second load does not end as if the first had never been disturbed, and a pattern that such cases meet: in
-/// "first load: taken", its boxes, "second load: not taken", its boxes, and all that the shop holds in the end.
+/// A reason why a second load may end differently, and a pattern for such cases. The pattern is searched in "first
+/// load: taken", its boxes, "second load: not taken", its boxes, and all data of the shop.
 using KnownDifference = std::pair<const char*, const char*>;
 
 bool meets(const std::string& account, const char* pattern)
@@ -37,9 +37,9 @@ const KnownDifference hasNoComparison{
 
 class DisturbedLoads : public Shop {
 protected:
-    /// Loads a message from the shop as it stands with each of its statements and file operations failing, and again
-    /// without the fault. Fails for each step whose fault ends otherwise and in none of the known differences, and for
-    /// each of those that never comes up.
+    /// Loads a message while one of its statements or file operations fails, and again without the failure, once for
+    /// each of them. Fails for each result that differs and is not a known difference, and for each known difference
+    /// that never occurs.
     void disturb(const Message& message, const std::vector<KnownDifference>& known = {}, const char* script = "{}",
                  const QString& file = u"m.xml"_s,
                  const std::function<bool(const QString& file)>& load = loadAsTheWindow);
@@ -123,7 +123,7 @@ TEST_F(DisturbedLoads, ARequest)
     car("ABC123").set("COLOUR", "bLUE");
     disturb(quoteRequest("QR1").rego("ABC123"), known);
 
-    // Without a first name and a company name the new customer is not found by name, so a second one is made.
+    // A new customer without a first name and a company name is not found by name, so a second one is added.
     known.push_back({"the customer stands without a car", "second load: taken"});
     disturb(quoteRequest("QR1").set("claimCustomer/firstName", ""), known);
 }
@@ -134,7 +134,7 @@ TEST_F(DisturbedLoads, StatusMessagesChangeTheirNotesInPlace)
     for (const Message& message : {quoteMatch("500"), revisionRequest("QR1"), cancellation("QR1"),
                                    cancellationBackout("QR1"), assessmentResult("KQ1"), assessmentBackout("QR1")})
         disturb(message, {keepsItsName, isFiledTwice});
-    disturb(excessWaiver("500"));  // keeps its name at all times
+    disturb(excessWaiver("500"));  // because the file of this message keeps its name
 }
 
 TEST_F(DisturbedLoads, ADeletion)

@@ -1,4 +1,4 @@
-// Messages from outside with each element missing, doubled or holding what nobody expects.
+// Loads messages in which each element in turn is missing, doubled or has an unexpected value.
 #include "messages/Envelope.h"
 #include "support/Shop.h"
 #include "support/Snapshot.h"
@@ -13,7 +13,7 @@ namespace {
 
 const QString leaves = u"//*[not(*)]"_s;
 
-/// The message, and every one that differs from it in a single element.
+/// Returns the message, and all variants that differ from it in a single element.
 QStringList variantsOf(QString text)
 {
     QStringList wrong = linesOf("inbound/hostile-values.txt");
@@ -38,7 +38,7 @@ QStringList variantsOf(QString text)
     return variants;
 }
 
-/// Without the mark of a car that a message has touched: the one thing that is written before a refusal.
+/// Removes the mark of a car that a message has changed, which is the only thing that is stored before a refusal.
 std::string withoutCarMark(const std::string& held)
 {
     static const QRegularExpression mark(u"^(CAR REGO=.*) KEST=\\S+"_s, QRegularExpression::MultilineOption);
@@ -78,10 +78,10 @@ TEST_P(Hostile, AMessageChangesItsOwnQuoteOrNothing)
         const std::string now = holdings();
         const std::string told = message.left(3000).toStdString();
         if (!taken) {
-            if (!isMerged) {  // what was merged before a failure stays
+            if (!isMerged) {  // lines that were applied before a failure stay
                 EXPECT_EQ(difference(withoutCarMark(held), withoutCarMark(now)), "\n") << told;
             }
-            EXPECT_TRUE(wasTold || typeOf(message) != ownType) << told;  // an unknown type is passed over in silence
+            EXPECT_TRUE(wasTold || typeOf(message) != ownType) << told;  // an unknown type is ignored without a box
         }
         EXPECT_EQ(linesAbout("BYSTANDER", held), linesAbout("BYSTANDER", now)) << told;
         EXPECT_EQ(linesAbout("^/", now), linesAbout("^/wir(doc/A|img/)", now)) << told;

@@ -16,7 +16,7 @@ TEST_F(Dispatcher, ABareAmpersandIsRepairedOnce)
     QString text =
         cancellation("QR1").reason("sold & gone &amp").text().replace(u"sold &amp; gone"_s, u"sold & gone"_s);
     EXPECT_TRUE(LoadXML(text, u"m.xml"_s));
-    // what was escaped before is escaped twice
+    // text that is already escaped is escaped twice
     EXPECT_EQ(quote("500").notes(), "(today : QR Cancelled - sold & gone &amp;amp) (today : Cancelled Quote Request)");
     EXPECT_TRUE(text.contains(u"sold &amp; gone"_s));
 }
@@ -74,13 +74,13 @@ TEST_F(Dispatcher, AManualQuoteWithdrawsTheRequestThatItAnswers)
         arrive("QR1_001.jpg", "\xff\xd8");
         arrive("R_500_0.xml", submissionResponse("KQ1"));
         QFile::setPermissions(files::systemPath(gsUnreadPath + u"a.xml"_s), QFile::ReadOwner);
-        QFile(files::systemPath(gsUnreadPath) + u"/e\\f.xml"_s).open(QIODevice::WriteOnly);  // would read as a path
+        QFile(files::systemPath(gsUnreadPath) + u"/e\\f.xml"_s).open(QIODevice::WriteOnly);  // looks like a path
     };
     arriveAll();
-    load(manualQuote("MANQ"));  // the quote itself is not what matters here
+    load(manualQuote("MANQ"));  // this test is not about the quote itself
     EXPECT_EQ(filesIn(gsUnreadPath).join(u' '), u"b.xml c.xml d.xml e\\f.xml message.xml QR1_001.jpg R_500_0.xml"_s);
 
-    // the clean-up wants the type in its exact spelling
+    // the clean-up compares the type in its exact case
     arriveAll();
     load(manualQuote("MANQ").text().replace(u">MANQ</messageType>"_s, u">manq</messageType>"_s));
     EXPECT_TRUE(filesIn(gsUnreadPath).contains(u"a.xml"_s));

@@ -1,4 +1,4 @@
-// The way of a manual quote among the shop's quotes: which quote it becomes, and what replaces what was there.
+// Tests the load of manual quotes: which quote they become, and what they replace.
 #include "base/modDBAccess.h"
 #include "support/Shop.h"
 #include "support/Snapshot.h"
@@ -12,7 +12,7 @@ namespace {
 
 const auto lineFailure = u"\n[none] Error processing Quote Items, Please contact MarlinDesk Support."_s;
 
-/// Number and subquote of the quote that the last load made or matched.
+/// Returns the number and subquote of the quote that the last load created or found.
 std::string loadedQuote()
 {
     const db::Recordset row = opened(u"SELECT * FROM QUOTE1 WHERE KESTQuoteNo='KQ1'"_s);
@@ -37,7 +37,7 @@ TEST_F(ManualQuotes, EachIsMatchedByNumberThenByRequestElseNewAndTakesTheNextSub
             << elements.toStdString();
         EXPECT_EQ(loadedQuote(), quote.toStdString()) << elements.toStdString();
         EXPECT_EQ(gsMatchedQTNNO, taken ? quote.section(u'/', 0, 0) : QString()) << elements.toStdString();
-        EXPECT_EQ(opened(u"SELECT * FROM CINFO"_s).text(u"QUOTE_VAL"_s), u"1001"_s);  // the counter stays
+        EXPECT_EQ(opened(u"SELECT * FROM CINFO"_s).text(u"QUOTE_VAL"_s), u"1001"_s);  // the counter does not change
         before.restore();
     }
     EXPECT_FALSE(load(Message::told("MANQ quoteBody/quoteType=AS quoteBody/quoteReference=500/x")));
@@ -112,7 +112,7 @@ TEST_F(ManualQuotes, AFailureInALineLeavesTheQuoteToTheNextLoad)
     quote("500").line(7);
     EXPECT_FALSE(load(manualQuote("500").labour(1, "I").paint(2, "I", {{"paintAmount", "x"}})));
     EXPECT_TRUE(QString::fromStdString(shown()).endsWith(lineFailure));
-    EXPECT_EQ(rowCount("QUOTE2"), 1);  // the old line is gone, the first new one is there
+    EXPECT_EQ(rowCount("QUOTE2"), 1);  // the old line has been deleted, and the first new one is stored
     EXPECT_TRUE(gsMatchedQTNNO.isEmpty());
     EXPECT_TRUE(load(manualQuote("500").labour(1, "I").paint(2, "I")));
     EXPECT_EQ(quote("500").lines(), 2);

@@ -1,4 +1,4 @@
-// What the lines of a message do to the lines of a quote: by section, by change indicator, and with bad values.
+// Tests what the lines of a message change in a quote, by section, by change indicator, and with bad values.
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
 #include "sublets/SubletDocuments.h"
@@ -14,7 +14,7 @@ class QuoteBody : public Shop {
 protected:
     QuoteBody() { gbSubletDocumentArrived = false; }
 
-    /// Applies the lines of a message to the quote 500, or another one; shown boxes are taken away.
+    /// Applies the lines of a message to the quote 500 or another one. Forgets the boxes.
     bool apply(const Message& message, const Text& number = "500")
     {
         QString text = message.text();
@@ -34,7 +34,7 @@ Message body()
     return authorisedQuote("500");
 }
 
-/// The numbers of all lines, in the order in which they were stored.
+/// Returns the numbers of all lines in the order in which they were stored.
 std::string numbers(const Text& number = "500")
 {
     db::Recordset rows = opened(u"SELECT * FROM QUOTE2 WHERE QTNNO='%1' ORDER BY itemid"_s.arg(number));
@@ -89,7 +89,7 @@ TEST_F(QuoteBody, ALineWithoutIndicatorDoesAsTheOneBeforeItInItsSection)
         body().labour(1, "C", change).labour(2, "", change).labour(3, "N", change).labour(4, "", change).part(1, "")));
     EXPECT_EQ(line(2).text("script"), "changed");
     EXPECT_EQ(line(4).text("script"), "Front bumper bar");
-    EXPECT_EQ(numbers(), "1 2 3 4 1");  // the first part has nothing before it, so it is added
+    EXPECT_EQ(numbers(), "1 2 3 4 1");  // there is no line before the first part, so it is added
 }
 
 TEST_F(QuoteBody, AnUnknownIndicatorFailsTheBodyBeforeAnyLineIsTouched)
@@ -131,7 +131,7 @@ TEST_F(QuoteBody, TheRepairerOfANewSubletLineIsFoundOrAdded)
     EXPECT_EQ(line(2).text("VENDOR"), added.text("VENDOR_ID"));
     EXPECT_TRUE(added.shows(
         "STREET=8 Foundry Lane PHONE=03 5550 1010 contact= SUBURB= Fax= accno= email= vendor_abn= Account=293"));
-    // the line before it said "I", and an address is cut to what the column holds
+    // the line before it has "I", and the address is cut to the size of the column
     EXPECT_EQ(Row("VENDOR", "NAME='kept'").text("STREET"), std::string(100, 's'));
 
     EXPECT_TRUE(apply(body().sublet(1, "", {{"subletRepairer", "Nobody"}}), "501"));
@@ -157,7 +157,7 @@ TEST_F(QuoteBody, ADocumentIsStoredUnderItsLinesNumber)
 
     files::write(subletFolder() + u"500.0_12.PDF"_s, u"of line 12"_s);
     files::write(subletFolder() + u"500.1_30.pdf"_s, u"of a supplementary quote"_s);
-    EXPECT_TRUE(apply(withDocument(4, "N")));  // a second document of one line
+    EXPECT_TRUE(apply(withDocument(4, "N")));  // a second document for the same line
     EXPECT_TRUE(apply(withDocument(5, "D")));
     EXPECT_EQ(documents().join(u' '), u"500.0_12.PDF 500.0_13.pdf 500.0_4.pdf 500.0_5.pdf 500.1_30.pdf"_s);
     EXPECT_EQ(numbers(), "4");
@@ -173,7 +173,7 @@ TEST_F(QuoteBody, ALineWithoutNumberTakesOneAboveLinesAndDocuments)
     EXPECT_TRUE(apply(withDocument(0, "I")));
     EXPECT_EQ(numbers(), "2 3 8");
 
-    // a quote without lines goes on from the line before
+    // in a quote without lines, the number follows that of the line before
     EXPECT_TRUE(apply(body().sublet(40, "N").sublet(0, "N", {{"subletAuthorityDocument", pdf}}), "501"));
     EXPECT_TRUE(documents().contains(u"501.0_41.pdf"_s));
 }
@@ -207,7 +207,7 @@ TEST_F(QuoteBody, LinesWithoutNumberGoOnFromTheLastOne)
     EXPECT_FALSE(shown().empty());
     quote("n2").line(4);
     EXPECT_TRUE(apply(body().labour(0, "I"), "n2"));
-    EXPECT_TRUE(apply(body().labour(0, "I"), "n1"));  // another quote came between
+    EXPECT_TRUE(apply(body().labour(0, "I"), "n1"));  // after a load into another quote
     EXPECT_EQ(numbers("n2"), "4 5");
     EXPECT_EQ(numbers("n1"), "7 8 9 90 10 91");
 }
@@ -223,7 +223,7 @@ TEST_F(QuoteBody, ItemNumbersComeFromThePoolOfTheCategory)
         for (db::Recordset lines = opened(u"SELECT * FROM QUOTE2"_s); !lines.eof(); lines.moveNext()) {
             const QString number = lines.text(u"SEQ_NO"_s);
             given += NextItemNo(lines);
-            EXPECT_EQ(lines.text(u"SEQ_NO"_s), number);  // still on its line
+            EXPECT_EQ(lines.text(u"SEQ_NO"_s), number);  // the current line has not changed
             lines.set(u"itemno"_s, given.last());
         }
         EXPECT_EQ(given.first() + given[qMax(0, count - 1)], first + last) << category.toStdString();
@@ -263,7 +263,7 @@ TEST_F(QuoteBody, TenThousandLines)
     Message message = body();
     for (int line = 1; line <= 10'000; ++line)
         message.labour(line, "I");
-    gConn->execute(u"BEGIN"_s);  // 20,000 commits that nobody needs on the disk
+    gConn->execute(u"BEGIN"_s);  // instead of 20,000 commits
     EXPECT_TRUE(apply(message));
     EXPECT_EQ(quote("500").lines(), 10'000);
     EXPECT_EQ(quote("500").line(10'000).text("itemno"), "999");

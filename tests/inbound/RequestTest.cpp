@@ -96,7 +96,7 @@ TEST_F(Requests, TheCustomerIsFoundByNameOrMade)
             EXPECT_TRUE(car(key).shows("CUST_ID=" + customer(found).text("CUST_ID"))) << elements.toStdString();
         }
     }
-    // texts are cut to what the host's columns take
+    // texts are cut to the size of the host's columns
     EXPECT_TRUE(load(quoteRequest("QR9").rego("CAR9").set("claimCustomer/surname", std::string(1000000, 's'))));
     EXPECT_EQ(Row("CUSTOMER", "NAME LIKE 'sss%'").text("NAME"), std::string(35, 's'));
 }
@@ -111,11 +111,11 @@ TEST_F(Requests, AKnownCarKeepsEverythingButItsColoursSpelling)
     }
     EXPECT_EQ(rowCount("CUSTOMER"), 1);
 
-    // requests without a known registration share one car, and with it its customer
+    // requests without a known registration share one car and its customer
     car("UNIVERSAL").set("CUST_ID", customer("Nobody").id());
     EXPECT_TRUE(load(quoteRequest("QR8").rego(" advise")));
     EXPECT_EQ(Row("QUOTE1", "KESTQRNo='QR8'").text("REGO"), "UNIVERSAL");
-    // a car whose customer has gone gets a new one
+    // a car whose customer does not exist gets a new one
     car("GONE01").set("CUST_ID", 9999);
     EXPECT_TRUE(load(quoteRequest("QR9").rego("GONE01")));
     EXPECT_EQ(car("GONE01").number("CUST_ID"), customer("Tarrant").id());

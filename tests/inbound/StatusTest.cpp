@@ -70,7 +70,7 @@ TEST_F(StatusMessages, ASupplementaryQuoteIsDeletedOnlyWhenTheUserAgrees)
 
 TEST_F(StatusMessages, AMessageWhoseQuoteIsUnknownIsRefused)
 {
-    quote("500").request("").quoteNumber("").stage(7).line(1);  // an empty number leads to no quote either
+    quote("500").request("").quoteNumber("").stage(7).line(1);  // an empty number does not match an empty number
     for (const QString& unknown : {u"QR2"_s, u""_s}) {
         for (auto [message, box] : casesIn<2>("inbound/unknown-quotes.txt")) {
             EXPECT_FALSE(load(Message::told(message.replace(u'?', unknown))));

@@ -1,4 +1,4 @@
-// The export against a real server: what JobLink finds, and what is left of an export that failed.
+// Tests the export with a real server: what JobLink gets, and what remains of a failed export.
 #include "base/CredentialCipher.h"
 #include "jobexport/JobLinkSettings.h"
 #include "jobexport/WriteQuote.h"
@@ -48,7 +48,7 @@ protected:
     {
         return rows("SELECT * FROM newJobHdr ORDER BY nJobHdr_PK DESC").text(column).toStdString();
     }
-    /// These columns of all detail rows in the order of their writing; "null" for Null.
+    /// Returns these columns of all detail rows in the order in which they were written, with "null" for Null.
     std::string details(const char* columns) const
     {
         QStringList texts;

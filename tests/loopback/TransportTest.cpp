@@ -14,7 +14,7 @@ namespace {
 
 const QDate today(2008, 3, 21);
 
-/// A shop with a quote that can be sent, and the transport beside it.
+/// A shop with a quote that can be sent, and a transport.
 class Loopback : public Shop {
 protected:
     Loopback()
@@ -36,7 +36,7 @@ protected:
     }
     void rules(const QString& text) { files::write(folders().own + app::Transport::rulesName, text); }
 
-    /// What was carried, as "out file" and "in file"; faults fail the test.
+    /// Runs the transport and returns what it carried, as "out file" and "in file". Errors fail the test.
     std::string carried()
     {
         const app::Carry carry = transport->carry(today);
@@ -55,7 +55,7 @@ protected:
             SendQuote(*grsQuote, &sent);
         return sent;
     }
-    /// Loads the one message that is listed, and gives its type.
+    /// Loads the only listed message and returns its type.
     static std::string loadOne()
     {
         const QStringList files = listed();
@@ -107,7 +107,7 @@ TEST_F(Loopback, EachMessageHasTheEffectThatItsTypeTells)
         rules(u"on start quote=1004 claim=7701004\n  "_s + step);
         carried();
         EXPECT_EQ(loadOne(), type.toStdString());
-        listed();  // an old answer would lock the quote again
+        listed();  // because an old answer would lock the quote again
         const QString state = QString::fromStdString(quote("1004").state());
         EXPECT_TRUE(state.startsWith(stage + u' ') && state.contains(u" : %1)"_s.arg(note))) << state.toStdString();
     }

@@ -18,7 +18,7 @@ namespace {
 
 class MessageListWindow : public Shop {
 protected:
-    /// Opens the window, carries out the steps, and closes it.
+    /// Opens the window, does the steps and closes it.
     void visit(const QStringList& steps, const QString& answers = u"\"boxes\": []"_s)
     {
         desktop.emplace(
@@ -28,7 +28,7 @@ protected:
         frmMessageList::ShowForm();
     }
 
-    /// What the numbered reading step saw of a control.
+    /// Returns what the reading step with that number has read of a control.
     QJsonValue seen(int reading, const QString& control, const QString& what) const
     {
         return desktop->record().reads.at(reading)[u"values"_s][control][what];
@@ -39,7 +39,7 @@ protected:
         return seen(reading, control, u"text"_s).toString().toStdString();
     }
 
-    /// The rows of the list and the line under it.
+    /// Returns the rows of the list and the line under it.
     std::string listed(int reading = 0) const
     {
         QStringList names;
@@ -49,7 +49,7 @@ protected:
     }
 };
 
-// Steps of a visit.
+// Steps of visits.
 const QString readAll = uR"({"read": ["ListView1", "cmdProcess", "cmdPrint", "Frame2", "txtFilter", "lblStatus"]})"_s;
 
 QString click(const char* control)
@@ -183,7 +183,7 @@ TEST_F(MessageListWindow, TheLineUnderTheListNamesTheFileThatEndedTheFill)
     EXPECT_EQ(desktop->boxes(), QStringList());
 }
 
-// Three messages of which the search tells one from the others in every way.
+// Three messages that the search distinguishes by every column.
 struct Searched : MessageListWindow {
     Searched()
     {
@@ -226,7 +226,7 @@ TEST_F(Searched, OrderWidthsAndPlaceOutliveARefreshAndOrderAndWidthsTheWindow)
         auto& list = control<QTreeView>(window, "ListView1");
         list.header()->resizeSection(2, 177);
         desktop::gestures::press(list, Qt::Key_Down);
-        for (const int order : {0, 1, 0, 0, 1}) {  // to, fro, none, to, fro
+        for (const int order : {0, 1, 0, 0, 1}) {  // ascending, descending, none, ascending, descending
             desktop::gestures::press(window, Qt::CTRL | Qt::Key_1);
             EXPECT_EQ(list.model()->index(0, 0).data(), order == 0 ? u"a.xml"_s : u"c.xml"_s);
             desktop::gestures::press(window, Qt::Key_F5);
@@ -245,7 +245,7 @@ TEST_F(Searched, OrderWidthsAndPlaceOutliveARefreshAndOrderAndWidthsTheWindow)
 
 TEST_F(Searched, FilesAreDroppedOrPastedWhileTheUnreadMessagesAreShown)
 {
-    /// A file as a mouse or the clipboard brings it.
+    /// Creates a file as it comes from the mouse or the clipboard.
     const auto stick = [this](const QString& name, const QString& content) {
         auto data = std::make_unique<QMimeData>();
         data->setUrls({bring(name, content)});

@@ -9,7 +9,7 @@ namespace {
 
 class MessageList : public Shop {
 protected:
-    /// The fill's rows, a line each: "file: type|rego|claim|customer|quote|vehicle".
+    /// Returns the rows of a fill, one on each line: "file: type|rego|claim|customer|quote|vehicle".
     std::string filled(int folder = Unread)
     {
         QStringList lines;
@@ -18,7 +18,7 @@ protected:
         return lines.join(u'\n').toStdString();
     }
 
-    /// The row of one unread message.
+    /// Returns the row of a single unread message.
     std::string row(const Text& message, const Text& name = "in.xml")
     {
         arrive(name, message);
@@ -38,7 +38,7 @@ TEST_F(MessageList, AMessageShowsWhatItSaysAndTheCustomerOfItsCar)
     }
     EXPECT_EQ(row(Message("QREQ", "getQuoteRequestResponse")), "Quote Request|-||-|-|-");
     EXPECT_EQ(row(Message("qreq", "getQuoteRequestResponse")), "ERROR|||||");
-    // declared in other words, the schema instance's second declaration is one too many
+    // if the schema instance is declared in a different wording, a second declaration is an error
     EXPECT_EQ(row(QString(quoteRequest("QR1").text()).replace(u" xmlns:p754"_s, u" xmlns:xsi = \"u\" xmlns:p754"_s)),
               "ERROR|||||");
     customer("Holloway").set("SALUTATION", nullptr);

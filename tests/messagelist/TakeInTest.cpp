@@ -1,4 +1,4 @@
-// Files that a person brings: which are taken, in which order, and what becomes of one whose name is taken.
+// Tests files that a person brings: which ones are copied, in which order, and what happens if a name is taken.
 #include "messagelist/TakeIn.h"
 #include "support/Shop.h"
 

@@ -12,7 +12,7 @@ const QString xsi = u"xmlns:xsi=\"http://www.w3.org/2001/XMLSchema-instance\" "_
 
 TEST(Envelope, ATypeCodeHasItsDisplayNameInAnyCase)
 {
-    for (const auto& [code, name] : {std::pair("qreq", "Quote Request"),  // the others have theirs in the list's tests
+    for (const auto& [code, name] : {std::pair("qreq", "Quote Request"),  // the tests of the list check the others
                                      {"EWAP", "Excess Waived/Already Paid"},
                                      {"QREQ ", "UNKNOWN - INVALID MESSAGE"}}) {
         QString text = Message(code, "getAnyResponse").text();

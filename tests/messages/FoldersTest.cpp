@@ -8,7 +8,7 @@ namespace {
 
 class MessageFolders : public Shop {
 protected:
-    /// The name that the message has in the read folder after its move.
+    /// Moves a message and returns its name in the read folder.
     std::string moved(const Text& message, const Text& arrivedAs = "in.xml")
     {
         arrive(arrivedAs, message);

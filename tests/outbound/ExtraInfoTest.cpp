@@ -7,7 +7,7 @@ namespace kest::test {
 
 class ExtraInformation : public Sending {
 protected:
-    /// The dialog is shown for the quote 500 and worked with these steps, JSON with single quotes for double ones.
+    /// Shows the dialog for the quote 500 and does these steps, which are JSON with single instead of double quotes.
     void show(const QString& steps)
     {
         quote("500");
@@ -21,7 +21,7 @@ QString typed(const QString& field, const QString& text)
     return u"{'set': '%1', 'text': '%2'}, "_s.arg(field, text);
 }
 
-// Fills every field with what passes the checks; the damage description last.
+// Fills all fields with valid values, the damage description last.
 const QString complete = typed(u"txtVIN"_s, u"V1"_s) + typed(u"txtCylinders"_s, u"6 cyl"_s) +
                          typed(u"txtColour"_s, u"Red"_s) + typed(u"txtBuildMonth"_s, u"12"_s) +
                          typed(u"txtBuildYear"_s, u"2024"_s) + typed(u"txtDamageDesc"_s, u"dent"_s);

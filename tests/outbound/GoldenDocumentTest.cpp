@@ -1,4 +1,4 @@
-// Whole quote documents, each made from the lines in one file of tests/data/outbound and compared with another.
+// Compares complete quote documents with files. The quote lines come from a file of tests/data/outbound, too.
 #include "Sending.h"
 
 #include <QXmlStreamReader>
@@ -9,8 +9,8 @@ namespace {
 
 const QString quoteNamespace = u"http://quote3.webservice.orla.example"_s;
 
-/// A quote document as another party's parser sees it: one line for each element, its depth, name and text. The
-/// software's version is left out, since it changes with each release.
+/// Reads a quote document with another parser. Returns a line for each element with its depth, name and text. Leaves
+/// out the version of the software, which changes with each release.
 QStringList readAsXml(const QString& document)
 {
     QXmlStreamReader reader(document);
@@ -35,7 +35,7 @@ QStringList readAsXml(const QString& document)
 
 class GoldenDocument : public Sending {
 protected:
-    /// Adds the lines to the quote, sends it, and compares total and document.
+    /// Adds the lines to the quote, sends it, and compares the total and the document.
     static void sends(const QuoteRow& quote, const std::string& name, double total, const QString& file)
     {
         db::Recordset lines = opened(u"SELECT * FROM QUOTE2 WHERE 1=0"_s);
@@ -87,7 +87,7 @@ TEST_F(GoldenDocument, ASupplementaryQuoteThatWasAuthorised)
     quote("1201").quoteNumber("KQ55");
     QuoteRow row = quote("1201", 1).authorised(" AU900 ").request("QR88123").set("CAR_IN", QDate(2024, 3, 4));
     sends(row, "supplementary-authorised", 413.49, u"1201.1_1.xml"_s);
-    // what is not sent is numbered all the same: the report item, and the trim again among the sublets
+    // the report item and the second trim, a sublet, get numbers but are not sent
     std::string numbers;
     for (const char* script : {"Mirror", "Sill", "Seen on the hoist", "Seat trim", "Without charge"})
         numbers += Row("QUOTE2", u"script='%1'"_s.arg(QLatin1StringView(script))).text("SEQ_NO") + ' ';

@@ -139,7 +139,7 @@ TEST_F(Sending, ImagesAreListedAndGoOutWithTheirDocuments)
 {
     for (const char* name : {"500_0012.jpg", "500_0003.JPG", "500_0x.jpg", "500_1001.jpg", "5001_0001.jpg"})
         files::write(gsImagesPath + QLatin1StringView(name), QLatin1StringView(name));
-    gsImagesPath.chop(1);  // a shop may set the folder without its last backslash
+    gsImagesPath.chop(1);  // a shop may set the folder without a backslash at the end
     sendable();
     send("500");
 

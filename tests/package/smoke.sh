@@ -1,5 +1,5 @@
 #!/usr/bin/env bash
-# Builds the Debian package of a build tree, installs it into an empty folder, uses it and removes it again.
+# Builds the Debian package of a build tree, installs it in an empty folder, uses it and removes it again.
 # smoke.sh BUILD-FOLDER HOST-PROGRAM
 set -Eeuo pipefail
 
@@ -34,7 +34,7 @@ for package in libqt6sql6-sqlite libqt6widgets6 libxml2 libnettle8; do
     [[ $depends == *"$package"* ]] || fail "the package does not depend on $package: $depends"
 done
 
-# the installation into an empty folder; what the package depends on is looked for on this machine
+# the installation in an empty folder; the dependencies are those of this machine
 root=$tmp/root
 mkdir -p "$root"/var/lib/dpkg/{info,updates} "$tmp/bin"
 cp /var/lib/dpkg/status "$root/var/lib/dpkg"

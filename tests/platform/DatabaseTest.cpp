@@ -1,4 +1,4 @@
-// Connections and statements: which engine answers, what a comparison means on each, what fails and how.
+// Tests connections and statements: which engine is used, how each compares values, and which errors occur.
 #include "platform/Databases.h"
 #include "platform/database/FaultInjection.h"
 #include "platform/files/files.h"
@@ -187,7 +187,7 @@ TEST_P(EmbeddedDatabase, ReadsWhatAnotherToolHasWritten)
     EXPECT_EQ(lines.value(u"day"_s), QVariant(columnDate(QDate(2026, 2, 28), QTime(0, 0))));
     for (const QString& column : {u"flag"_s, u"day"_s, u"SEQ"_s}) {
         lines.set(column, QVariant());
-        lines.update();  // finds the row by the value as it stands in the file
+        lines.update();  // finds the row by the value in the file
         EXPECT_TRUE(lines.isNull(column));
     }
     lines.moveNext();

@@ -1,4 +1,4 @@
-// The same small database on each engine, so that one test states a rule for all of them.
+// Provides the same small database on each engine, so that a test states a rule for all of them.
 #pragma once
 
 #include "platform/RuntimeError.h"
@@ -16,7 +16,7 @@ namespace kest::test {
 
 enum class On { Embedded, MySql, Odbc, Tds };
 
-/// The error that a step throws; number 0 where it throws none.
+/// Returns the error that a step throws, with the number 0 if it does not throw.
 template <class Step>
 RuntimeError failure(Step&& step)
 {
@@ -28,8 +28,8 @@ RuntimeError failure(Step&& step)
     return RuntimeError(0, QString());
 }
 
-/// LINE (id, the identity; CODE, SEQ, amount, flag, day, notes), CAR (REGO, the key; owner) and Tints (Code, Script; no
-/// key). Comparison and defaults as in the quote database.
+/// The tables are LINE (id, the identity; CODE, SEQ, amount, flag, day, notes), CAR (REGO, the key; owner) and Tints
+/// (Code, Script; no key). They compare values and have defaults as in the quote database.
 class Databases : public ::testing::TestWithParam<On> {
 protected:
     Databases();

@@ -1,4 +1,4 @@
-// The seam of boxes, input boxes and programs; the guard of window events; what is remembered of a window.
+// Tests boxes, input boxes, starting programs, the guard of window events, and the remembered window layout.
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
 #include "platform/desktop/Form.h"
@@ -70,7 +70,7 @@ TEST(Seam, AProgramIsStartedUnderItsHostName)
 
 namespace {
 
-/// Waits for a window of this kind to come up and acts on it.
+/// Waits until a window of this kind appears and calls `act` with it.
 template <class Window, class Act>
 void whenShown(const Act& act)
 {

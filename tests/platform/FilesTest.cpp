@@ -1,4 +1,4 @@
-// Files under the host's names: where they lie, what a failure leaves behind, which names are taken.
+// Tests files with the host's names: where they are, what remains after an error, and which names are valid.
 #include "platform/files/Lock.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
@@ -34,7 +34,7 @@ protected:
 
     QString onDisk(const QString& name) const { return profile.driveC() + u"/box/"_s + name; }
     QStringList allNames() const { return QDir(onDisk({})).entryList(QDir::Files | QDir::Hidden); }
-    /// Empty files, written by another program.
+    /// Creates empty files, as another program would.
     void touch(std::initializer_list<const char*> names) const
     {
         for (const char* name : names)
@@ -48,7 +48,7 @@ protected:
     test::TestProfile profile;
 };
 
-/// Lets no file of this process grow past a size, as a full disk does.
+/// Limits the size of all files that this process writes, as a full disk would.
 class FullDisk {
 public:
     explicit FullDisk(rlim_t bytes) : handler(std::signal(SIGXFSZ, SIG_IGN))

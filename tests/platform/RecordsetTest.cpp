@@ -1,4 +1,4 @@
-// The recordset: what it reads, writes, refuses and finds, on each engine alike.
+// Tests the recordset: what it reads, writes, refuses and finds on each engine.
 #include "platform/Databases.h"
 #include "platform/database/FaultInjection.h"
 #include "platform/values.h"
@@ -26,17 +26,17 @@ protected:
         lines.update();
     }
 
-    /// Another user's statement.
+    /// Executes a statement as another user.
     void elsewhere(const QString& statement) const { connect()->execute(statement); }
 
-    /// Sets a column of the current row and writes it.
+    /// Sets a column of the current row and updates the row.
     void write(const QString& column, const QVariant& value)
     {
         lines.set(column, value);
         lines.update();
     }
 
-    /// Where the first row that meets the criterion stands.
+    /// Returns the position of the first row that meets the criterion.
     int found(const QString& criterion)
     {
         lines.moveFirst();
@@ -104,10 +104,10 @@ TEST_P(RecordsetOn, ANewRowHoldsItsIdentityAndTheDefaultsAtOnce)
     EXPECT_EQ(lines.value(u"amount"_s), QVariant(0.0));
     EXPECT_EQ(lines.value(u"flag"_s), QVariant(false));
     EXPECT_TRUE(lines.isNull(u"SEQ"_s));
-    write(u"SEQ"_s, 2);  // the row can be changed on, by its new identity
+    write(u"SEQ"_s, 2);  // the row can be changed again, by its new identity
     EXPECT_EQ(count(u"CODE='B' AND SEQ=2"_s), 1);
 
-    lines.addNew();  // nothing set: all defaults
+    lines.addNew();  // no column set, so all have their defaults
     lines.update();
     EXPECT_EQ(lines.value(u"id"_s), QVariant(qint64(3)));
 }
@@ -116,7 +116,7 @@ TEST_P(RecordsetOn, AnUpdateWritesOnlyWhatDiffers)
 {
     add(u"A"_s, 1);
     elsewhere(u"UPDATE LINE SET SEQ=7"_s);
-    lines.set(u"SEQ"_s, 1);  // as it was read: not written
+    lines.set(u"SEQ"_s, 1);  // the same value, so it is not written
     write(u"CODE"_s, u"B"_s);
     EXPECT_EQ(count(u"CODE='B' AND SEQ=7"_s), 1);
     EXPECT_EQ(statements([&] { write(u"CODE"_s, u"B"_s); }), 0);
@@ -143,10 +143,10 @@ TEST_P(RecordsetOn, ARowThatSomeoneElseHasChangedIsNotOverwritten)
 
 TEST_P(RecordsetOn, AnHourThatTheClocksLeaveOutIsADateLikeOthers)
 {
-    const TimeZone zone("AEST-10AEDT,M10.1.0,M4.1.0/3");  // 02:00 to 03:00 is left out on 4 October 2026
+    const TimeZone zone("AEST-10AEDT,M10.1.0,M4.1.0/3");  // on 4 October 2026 there is no time from 02:00 to 03:00
     const QString gap = u"4/10/2026 2:30:00 AM"_s;
     elsewhere(u"INSERT INTO LINE (day) VALUES ('2026-10-04 02:30:00')"_s);
-    for (const QString& date : {u"2026-10-05 12:00:00"_s, gap, u"5/10/2026"_s}) {  // from the gap, into it, out of it
+    for (const QString& date : {u"2026-10-05 12:00:00"_s, gap, u"5/10/2026"_s}) {  // before, in and after the gap
         lines.requery();
         EXPECT_EQ(lines.recordCount(), count(u"day='%1'"_s.arg(lines.text(u"day"_s))));
         write(u"day"_s, date);
@@ -164,7 +164,7 @@ TEST_P(RecordsetOn, AJoinIsUpdatedInTheTablesThatItsColumnsComeFrom)
     elsewhere(u"INSERT INTO CAR (REGO, owner, CODE) VALUES ('L', 'Ann', 'C')"_s);
     Recordset join = query(u"SELECT * FROM line, car WHERE line.CODE=CAR.rego"_s);
     ASSERT_EQ(join.recordCount(), 1);
-    EXPECT_EQ(join.text(u"CODE"_s), u"L"_s);  // the first of two columns of the name
+    EXPECT_EQ(join.text(u"CODE"_s), u"L"_s);  // the first of two columns with the same name
     join.set(u"code"_s, u"L2"_s);
     join.set(u"owner"_s, u"Bob"_s);
     join.update();
@@ -223,12 +223,12 @@ TEST_P(RecordsetOn, ASearchSeesEveryChangeMadeThroughTheRecordset)
 {
     for (int i = 1; i <= 3; ++i)
         add(u"c"_s, i);
-    EXPECT_EQ(found(u"SEQ=3"_s), 3);  // the index exists from here on
+    EXPECT_EQ(found(u"SEQ=3"_s), 3);  // this creates the index
     lines.set(u"SEQ"_s, 30);
     EXPECT_EQ(found(u"SEQ=3"_s), -1);
     add(u"c"_s, 3);
     lines.addNew();
-    lines.set(u"SEQ"_s, 40);  // pending: a search updates it first
+    lines.set(u"SEQ"_s, 40);  // a pending change, which the search stores first
     lines.find(u"SEQ=40"_s);
     EXPECT_EQ(lines.absolutePosition(), 5);
     EXPECT_EQ(count(u"SEQ=40"_s), 1);

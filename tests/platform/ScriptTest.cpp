@@ -1,4 +1,4 @@
-// A script's steps work a window as a person does, and a step that a person could not take ends the run.
+// Tests that the steps of a script act like a person, and that a step that a person could not do ends the run.
 #include "platform/RuntimeError.h"
 #include "platform/desktop/Form.h"
 #include "support/Cases.h"
@@ -30,7 +30,7 @@ using test::ScriptedDesktop;
 
 namespace {
 
-/// One control of each kind, each of whose events is noted.
+/// A window with a control of each kind. It records all their events.
 class SampleWindow : public desktop::Form {
 public:
     SampleWindow() : Form(u"frmSample"_s, u"Sample"_s)
@@ -77,7 +77,7 @@ public:
     std::function<void()> whenOk = [this] { notes.append(u"ok"_s); };
 
 protected:
-    /// Option1(0) keeps it open.
+    /// The window stays open while Option1(0) is selected.
     void closeEvent(QCloseEvent* event) override
     {
         findChild<QRadioButton*>()->isChecked() ? event->ignore() : Form::closeEvent(event);
@@ -98,7 +98,7 @@ struct Steps : testing::Test {
     std::optional<SampleWindow> window;
     std::optional<ScriptedDesktop> desk;
 
-    /// Shows the window with these steps; what it noted, or the reason why they could not be taken.
+    /// Shows the window and does these steps. Returns the recorded events, or why a step could not be done.
     QString run(const QString& steps)
     {
         window.emplace();

@@ -1,4 +1,4 @@
-// The registry: names, types, any text, two writers at once, a profile that is not there.
+// Tests the registry: names, types, any text, two writers at once, and a missing profile.
 #include "platform/files/files.h"
 #include "platform/profile.h"
 #include "platform/settings/registry.h"

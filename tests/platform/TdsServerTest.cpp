@@ -1,4 +1,4 @@
-// The stand-in for SQL Server answers the real driver as the server does wherever a test relies on it.
+// Tests that the simulated SQL Server answers the real driver as the server does, as far as other tests rely on it.
 #include "support/TdsServer.h"
 
 #include <QElapsedTimer>
@@ -18,7 +18,7 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-/// A client that is only Qt's plugin, the driver manager and the driver.
+/// A client that uses only Qt's plugin, the driver manager and the driver.
 class Client {
 public:
     explicit Client(const QString& name, const QString& connectionText = tdsServer().connectionText(u"plain"_s))

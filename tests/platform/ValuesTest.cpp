@@ -1,4 +1,4 @@
-// Numbers, flags, dates and texts: what is read, what is refused, what is written.
+// Tests which numbers, flags, dates and texts are read, refused and written.
 #include "platform/values.h"
 #include "support/Cases.h"
 #include "support/Failure.h"

@@ -1,4 +1,4 @@
-// Documents: what is refused and by which code, what a node answers, how a document is written.
+// Tests documents: which texts are refused with which code, what nodes return, and how documents are written.
 #include "platform/xml/xml.h"
 #include "support/Cases.h"
 #include "support/Failure.h"
@@ -155,7 +155,7 @@ TEST(XmlBuilding, TheNamespaceIsDeclaredOnceAtTheRoot)
     };
     const Node root = element(u"request"_s, space);
     const Node body = element(u"quoteBody"_s, space);
-    body.appendChild(element(u"n"_s, space));  // the leaves first, the root last
+    body.appendChild(element(u"n"_s, space));  // the leaves before the root
     root.appendChild(body);
     document.appendChild(root);
     const Node plain = body.appendChild(element(u"plain"_s, {}));

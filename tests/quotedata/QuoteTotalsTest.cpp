@@ -11,7 +11,7 @@ using Totals = Shop;
 
 namespace {
 
-/// Header and lines of the quote 500, as a caller hands them over.
+/// The header and the lines of the quote 500, as a caller passes them.
 struct Opened {
     db::Recordset header = kest::opened(u"SELECT * FROM QUOTE1 WHERE QTNNO='500'"_s);
     db::Recordset lines = kest::opened(u"SELECT * FROM QUOTE2 WHERE QTNNO='500'"_s);
@@ -63,7 +63,7 @@ TEST_F(Totals, EachSectionSumsItsRoundedLines)
     int number = 0;
     for (const auto& [category, columns] : casesIn<2>("quotedata/sections.txt"))
         fill(quote("500").line(++number, category), columns);
-    // Authorised labour is one sum, and the sections stay.
+    // Authorised labour is one sum, and the totals of the sections stay.
     quote("500").set("RR_TOTAL", 1).set("RA_TOTAL", 2).set("PAINT_TOTAL", 3);
     calc(CalcAuthorisedTotals);
     EXPECT_EQ(totals(), "202.28 1 2 3 30.33 10.456");

@@ -1,4 +1,4 @@
-// What the insurer changed beside what the shop had quoted, cell by cell.
+// Tests the comparison of the insurer's values with the shop's, cell by cell.
 #include "messages/Envelope.h"
 #include "reports/BuildAuthReport.h"
 #include "reports/QuoteComparison.h"
@@ -33,7 +33,7 @@ protected:
         QString text = message.text();
         return BuildAuthReport(parsedMessage(text), number, subquote, false).has_value();
     }
-    /// The cells of the current row, one that was never set as "-".
+    /// Returns the cells of the current row, with "-" for a field that was never set.
     static std::string cells(const db::Recordset& table, const Text& fields, QChar between = u'|')
     {
         QStringList texts;
@@ -41,7 +41,7 @@ protected:
             texts.append(table.isNull(field) ? u"-"_s : table.text(field));
         return texts.join(between).toStdString();
     }
-    /// A field of all rows.
+    /// Returns a field of all rows.
     template <class Recordset>
     static std::string column(Recordset&& table, const Text& field)
     {
@@ -98,7 +98,7 @@ TEST_F(Comparison, TheHeaderIsOnEveryRow)
 TEST_F(Comparison, ExcessAndContributionStandOnlyWhereTheyDiffer)
 {
     quote("500").request("QR1").set("excess", 400.0).set("contri", 100.0).line(1);
-    quote("500", 1).request("QR1").set("excess", 1.0).set("contri", 1.0);  // those of the main quote count
+    quote("500", 1).request("QR1").set("excess", 1.0).set("contri", 1.0);  // only those of the main quote count
     for (const char* reference : {"500", "500/1"}) {
         for (const auto& [excess, contribution, expected] : casesIn<3>("reports/excess.txt"))
             EXPECT_EQ(
@@ -123,7 +123,7 @@ TEST_F(Comparison, UnchangedLinesHaveNoRowAndDeletedOnesNoneOnAReprint)
     const auto lines = [](Message message) {
         return message.labour(1, "N").labour(3, "I").part(2, "D").part(4, "").paint(5, "I").paint(6, "");
     };
-    // a line without an indicator has that of the line before it in its section, as when it is loaded
+    // a line without an indicator has that of the line before it in its section, as in the load
     EXPECT_EQ(column(authorised(lines(authorisedQuote("500"))), "line_no"), "3, 2, 4, 5, 6");
     EXPECT_EQ(column(authorised(lines(authorisedQuote("500"))), "action"), "I, D, D, I, I");
     EXPECT_EQ(column(authorised(lines(authorisedQuote("500")), true), "line_no"), "3, 5, 6");
@@ -142,7 +142,7 @@ TEST_F(Comparison, AnAuthorisedQuoteWithoutChangesStillHasARow)
                     "action qty gst total_md line_no itemno lab_grp paint_grp category script amount vendor "
                     "old_amount old_qty quote_type"),
               "N|1|0|95.5|||||||||||AUTR");
-    EXPECT_EQ(quote("500").number("TOTAL"), 60);  // the totals are worked out, whoever asks
+    EXPECT_EQ(quote("500").number("TOTAL"), 60);  // the totals are calculated in every case
     EXPECT_EQ(adjusted(adjustedQuote("500").labour(1, "N")).recordCount(), 0);
 }
 

@@ -1,4 +1,4 @@
-// The preview: which template it opens, what it puts in, its window, and the pages as a reader gets them.
+// Tests the preview: which template it opens, which values it fills in, its window, and the pages.
 #include "platform/database/Recordset.h"
 #include "platform/script/Gestures.h"
 #include "platform/print/OutputFolder.h"
@@ -29,7 +29,7 @@ protected:
             number == 720 ? QVariant(QStringList{u""_s, u"Assessment Result"_s}) : QVariant(u""_s);
         frmPrintPreview::ShowForm(number, parameters, table);
     }
-    /// A table of one row.
+    /// Returns a table with one row.
     static db::Recordset table(const QString& cells)
     {
         db::Recordset row;
@@ -71,7 +71,7 @@ TEST_F(Preview, ATemplateIsFilledByFieldConditionAndRow)
 TEST_F(Preview, WhatCannotBeShownEndsInSilenceButAnUnknownNumber)
 {
     db::Recordset closed;
-    show(710, &closed);  // no usable table
+    show(710, &closed);  // a table that can't be used
     putTemplate("710.html", "no template");
     putTemplate("730.html", "<body>{{#rows}}</body>");
     gConn->execute(u"UPDATE ReportDefinition SET ReportName='..\\report\\720.html' WHERE ReportID=720"_s);
@@ -86,7 +86,7 @@ TEST_F(Preview, WhatCannotBeShownEndsInSilenceButAnUnknownNumber)
     show(720);
     EXPECT_EQ(shownReports(), "frmPrintPreview720");
     ASSERT_TRUE(settings::setValue(settings::Hive::LocalMachine, u"SOFTWARE\\wirra32\\frmsplash"_s, u"ReportPath"_s,
-                                   {settings::Type::Text, u"c:\\wirra32\\report"_s}));  // without its last backslash
+                                   {settings::Type::Text, u"c:\\wirra32\\report"_s}));  // without the last backslash
     show(720);
     EXPECT_EQ(shownReports() + shown(), "");
 }
@@ -105,7 +105,7 @@ TEST_F(Preview, EachPreviewIsKeptInTheFolderOfReports)
     EXPECT_EQ(QJsonDocument::fromJson(files::readBytes(folder + u"/1-720.json"_s)).object(), windows()[0]);
     EXPECT_TRUE(QJsonDocument::fromJson(files::readBytes(folder + u"/2-720.json"_s))[u"table"].isNull());
 
-    files::makeFolder(folder + u"/3-720.pdf"_s);  // in the way
+    files::makeFolder(folder + u"/3-720.pdf"_s);  // a folder with the name of the file
     ::testing::internal::CaptureStderr();
     show(720);
     EXPECT_NE(::testing::internal::GetCapturedStderr().find("3-720 can't be written"), std::string::npos);
@@ -119,7 +119,7 @@ TEST_F(Preview, EveryLineStandsOnceOnAPageAndPagesAreCounted)
         report::writePdf(comparisonOf(lines, u"Café & line <%1> end"_s), pdf);
         const QString text = pdfText(pdf);
         QStringList pages = text.split(u'\f');
-        pages.removeLast();  // behind the last form feed
+        pages.removeLast();  // the empty text after the last form feed
         for (int i = 1; i <= lines; ++i)
             EXPECT_EQ(text.count(u"Café & line <%1> end"_s.arg(i)), 1) << i << " of " << lines;
         for (qsizetype i = 0; i < pages.size(); ++i) {

@@ -1,4 +1,4 @@
-// Which report a message gives, with which values, and what is said where it gives none.
+// Tests which report a message gets, with which values, and which box appears if it gets none.
 #include "messagelist/frmMessageList.h"
 #include "platform/print/OutputFolder.h"
 #include "reports/Previews.h"
@@ -31,7 +31,7 @@ protected:
 TEST_F(Printing, ARequestShowsOneRowForEachImage)
 {
     quote("500").request("QR1", "1");
-    quote("501").request("QR1", "1");  // the oldest counts
+    quote("501").request("QR1", "1");  // the oldest one is used
     files::write(gsUnreadPath + u"QR1_001.txt"_s, u"  Bumper & grille, L/H  \r\n"_s);
     files::write(gsUnreadPath + u"QR1_002.txt"_s, u""_s);
     Message request = quoteRequest("QR1").images({"1", "002", "3"});

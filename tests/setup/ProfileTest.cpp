@@ -24,7 +24,7 @@ namespace {
 
 const QDate today(2008, 3, 21);
 
-/// The first column of each row, joined by blanks.
+/// Returns the first column of all rows, separated by blanks.
 std::string column(const QString& select)
 {
     QStringList texts;
@@ -60,7 +60,7 @@ TEST_F(Profile, IsMadeWhole)
         EXPECT_TRUE(key == u"log"_s || QFileInfo::exists(where[key].toString())) << key.toStdString();
     EXPECT_EQ(where[u"unread"_s].toString(), profile.driveC() + u"/wirdoc/AUnread"_s);
 
-    // what a first quote request needs
+    // what the first quote request needs
     EXPECT_EQ(column(u"SELECT NAME FROM INSURER WHERE KEST=1"_s), "KEST Universal Insurer");
     EXPECT_EQ(column(u"SELECT MODEL_ID1 FROM MODEL WHERE MODEL_ID1='Z000'"_s), "Z000");
     EXPECT_NE(column(u"SELECT QUOTE_VAL FROM CINFO"_s), "");
@@ -85,7 +85,7 @@ TEST_F(Profile, IsCompletedAfterAnInterruptedStart)
 {
     files::makeFolder(profile.root() + u"/databases"_s);
     files::writeBytes(app::embeddedFile(u"unfinished"_s), "half a file");
-    // and a host's first start, which copies the settings up that it reads
+    // the first start of a host, which copies the settings that it reads
     GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"EcomHome"_s, u"d:\\mail\\"_s);
     EXPECT_TRUE(app::initProfile(registerClass, false));
     EXPECT_NE(column(u"SELECT QUOTE_VAL FROM CINFO"_s), "");
@@ -108,7 +108,7 @@ TEST_F(Profile, IsToldWhereTheComponentLooks)
     EXPECT_FALSE(settings::keyExists(settings::Hive::LocalMachine, u"SOFTWARE"_s)) << "nothing is copied up";
 }
 
-// Other tools compare only the letters of ASCII without regard to case, and leave the others in another order.
+// Other tools ignore the case only of ASCII letters, so they leave other letters in another order.
 TEST_F(Profile, FindsWhatAnotherToolWroteOnceInitHasRebuiltTheIndexes)
 {
     ASSERT_TRUE(app::initProfile(registerClass, false));
@@ -132,7 +132,7 @@ TEST_F(Profile, FindsWhatAnotherToolWroteOnceInitHasRebuiltTheIndexes)
     EXPECT_EQ(found(), 40);
 }
 
-// A line that a load adds counts in totals and documents; what was never filled in stays told apart from 0.
+// A line that a load adds counts in totals and documents. A value that was never set is not 0.
 TEST_F(Profile, ItsTablesTakeWhatAHostWrites)
 {
     ASSERT_TRUE(app::initProfile(registerClass, false));

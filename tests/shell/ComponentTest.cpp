@@ -16,7 +16,7 @@ using settings::Hive;
 
 class Component : public test::Shop {
 protected:
-    /// What a host program prints on this shop's profile.
+    /// Runs a host program with the profile of this shop and returns what it prints.
     QString host(const QStringList& arguments, const QString& platform = u"offscreen"_s, const QString& display = {})
     {
         QProcess process;

@@ -15,7 +15,7 @@ using namespace Qt::StringLiterals;
 
 class Panel : public test::Shop {
 protected:
-    /// Shows the panel on a quote, driven by steps; the boxes that came.
+    /// Shows the panel for a quote, does the steps and returns the boxes.
     QStringList show(const char* quote, const QByteArray& steps)
     {
         desktop.emplace(R"json({"windows": {"frmKEST": [[)json" + steps + "]]}}");
@@ -31,7 +31,7 @@ TEST_F(Panel, OkAndEnterRunTheChosenOption)
         {R"json({"click": "Option1(3)"}, {"click": "cmdOK"})json", noQuote},
         {R"json({"click": "Option1(3)"}, {"key": "Option1(3)", "keys": "Return"})json", noQuote},
         {R"json({"click": "Option1(3)"}, {"key": "Option1(3)", "keys": "Shift+Return"})json", {}},
-        // a transport program that is missing is passed over
+        // nothing happens if there is no transport program
         {R"json({"click": "Option1(0)"}, {"click": "cmdOK"}, {"click": "cmdOK"}, {"click": "cmdExit"})json", {}}};
     for (const auto& [steps, boxes] : cases)
         EXPECT_EQ(show("0", steps), boxes) << steps;

@@ -1,4 +1,4 @@
-// The documents that authorise sublet work: which belong to a quote, how they are listed, and one that is no PDF.
+// Tests sublet documents: which belong to a quote, how they are listed, and a file that is not a PDF.
 #include "sublets/SubletDocuments.h"
 #include "sublets/frmSubletAuth.h"
 #include "sublets/frmViewPDF.h"
@@ -23,7 +23,7 @@ protected:
     {
         files::writeBytes(u"c:\\wirdoc\\PDF\\"_s + QString::fromLatin1(name), content);
     }
-    /// A PDF document of two pages.
+    /// Creates a PDF document with two pages.
     static void realDocument(const QString& name)
     {
         QPdfWriter writer(files::systemPath(u"c:\\wirdoc\\PDF\\"_s + name));

@@ -1,4 +1,4 @@
-// Cases of one rule as a table in a text file of tests/data.
+// Reads tables of test cases from the text files in tests/data.
 #pragma once
 
 #include "support/Text.h"
@@ -15,23 +15,24 @@
 
 namespace kest::test {
 
-/// A file of tests/data.
+/// Reads a file of tests/data.
 QByteArray dataFile(const std::string& name);
 
-/// The lines of a file of tests/data, without its comments: those that begin with "#".
+/// Returns the lines of a file of tests/data without its comments, which begin with "#".
 QStringList linesOf(const std::string& name);
 
-/// The cells of a line, with "|" and blanks between them. Blanks around a cell don't count, unless it stands in double
+/// Returns the cells of a line, which are separated by "|". Blanks around a cell are ignored unless it is in double
 /// quotes.
 QStringList cellsOf(const QString& line);
 
-/// The rows of a table, whose cells write characters as JSON does: "\n", "\\", "\u20ac".
+/// Returns the rows of a table. Cells can contain characters in the form of JSON: "\n", "\\", "\u20ac".
 QList<QStringList> rowsIn(const std::string& name);
 
-/// What stands in a cell as "column=value path/to=value"; a value that begins or ends with a blank stands in quotes.
+/// Returns the pairs in a cell such as "column=value path/to=value". A value that begins or ends with a blank is in
+/// quotes.
 std::vector<std::pair<QString, QString>> pairsIn(const QString& cell);
 
-/// Sets the columns of a row that a cell names as `pairsIn` reads it; "-" is Null.
+/// Sets the columns of a row to the pairs in a cell. "-" is Null.
 template <class Row>
 Row& fill(Row&& row, const Text& columns)
 {
@@ -40,7 +41,7 @@ Row& fill(Row&& row, const Text& columns)
     return row;
 }
 
-/// The rows of a table, each of `Columns` cells.
+/// Returns the rows of a table with `Columns` cells each.
 template <std::size_t Columns>
 std::vector<std::array<QString, Columns>> casesIn(const std::string& name)
 {

@@ -1,11 +1,11 @@
-// The failure that a step ends in, where its number is all that matters.
+// Returns the error number of a step that fails.
 #pragma once
 
 #include "platform/RuntimeError.h"
 
 namespace kest::test {
 
-/// 0 where there is none.
+/// Returns 0 if the step does not fail.
 template <class Step>
 int failureOf(Step&& step)
 {
@@ -17,7 +17,7 @@ int failureOf(Step&& step)
     }
 }
 
-/// What a step gives; "error 13" where it ends in that failure.
+/// Returns the result of a step, or for example "error 13" if it fails.
 template <class Step>
 QString outcomeOf(Step&& step)
 {

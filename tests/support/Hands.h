@@ -1,4 +1,4 @@
-// Works windows in code, for what a script can't do between two of its steps.
+// Operates windows from code, for actions that a script does not have.
 #pragma once
 
 #include "platform/desktop/Window.h"
@@ -11,7 +11,7 @@
 
 namespace kest::test {
 
-/// What is done to each window while it is shown, by the window's name; it is closed afterwards.
+/// Runs a function for each window that is shown, chosen by the window's name, and then closes the window.
 class Hands {
 public:
     using Work = std::function<void(QDialog&)>;
@@ -38,14 +38,14 @@ public:
     Q_DISABLE_COPY_MOVE(Hands)
 };
 
-/// A control of the window by its name.
+/// Returns a control of the window by its name.
 template <class Control>
 Control& control(QDialog& window, const char* name)
 {
     return *window.findChild<Control*>(QString::fromLatin1(name));
 }
 
-/// Clicks "Print" in a window and answers the printer's dialog: into that file, all pages or one alone.
+/// Clicks "Print" in a window and answers the printer dialog: prints to that file, all pages or only one.
 inline std::map<QString, Hands::Work> printing(const QString& name, const QString& file, int onlyPage)
 {
     const auto choose = [=](QDialog& dialog) {

@@ -66,7 +66,7 @@ MariaDbServer::~MariaDbServer()
 
 void MariaDbServer::prepareData()
 {
-    // a server that starts takes the temporary tables away that it finds, those of others too
+    // its own folder: at its start, a server deletes all temporary tables that it finds
     QDir(folder.path()).mkdir(u"tmp"_s);
     QProcessEnvironment environment = QProcessEnvironment::systemEnvironment();
     environment.insert(u"TMPDIR"_s, folder.filePath(u"tmp"_s));
@@ -103,7 +103,7 @@ void MariaDbServer::start()
         QThread::msleep(20);
         server.waitForReadyRead(1);
     }
-    // "sa" is who the component always is, and the setting for its password is empty by default
+    // the component always logs in as "sa", and its password is empty by default
     for (const auto& [name, secret] : {std::pair(user(), password()), std::pair(u"sa"_s, QString())})
         connection.execute(sql("GRANT ALL ON *.* TO '{}'@'127.0.0.1' IDENTIFIED BY '{}'", name, secret));
 }

@@ -1,4 +1,4 @@
-// A MariaDB server for tests, on a free loopback port, with its data in a temporary folder.
+// Runs a MariaDB server for tests on a free loopback port, with its data in a temporary folder.
 #pragma once
 
 #include <QProcess>
@@ -9,20 +9,22 @@ namespace kest::test {
 
 class MariaDbServer {
 public:
-    /// Started and ready; throws std::runtime_error with the server's own words where it does not come up.
+    /// Starts the server and waits until it is ready. Throws std::runtime_error with the server's output if it does not
+    /// start.
     MariaDbServer();
-    /// Stopped. It ends with the test program too, however that ends.
+    /// Stops the server. It also stops if the test program crashes.
     ~MariaDbServer();
 
     int port() const { return tcpPort; }
     QString user() const { return QStringLiteral("kest"); }
     QString password() const { return QStringLiteral("s3cret"); }
 
-    /// Makes an empty database, in place of one of that name, and runs the statements of a script in it.
+    /// Creates an empty database, after dropping one of the same name, and runs a script in it.
     void createDatabase(const QString& name, const QString& script = {});
-    /// A connection text that names the database on this server, for "MySQL" or for a driver registered with ODBC.
+    /// Returns the connection text for a database on this server, with the driver "MySQL" or one that is registered
+    /// with ODBC.
     QString connectionText(const QString& database, const QString& driver = QStringLiteral("MySQL")) const;
-    /// Ends the server as a power cut would.
+    /// Stops the server as a power cut would.
     void kill();
 
 private:
@@ -34,9 +36,9 @@ private:
     int tcpPort = 0;
 };
 
-/// The one server of a test program, started when it is first asked for.
+/// Returns the server of this test program. The first call starts it.
 MariaDbServer& mariaDb();
-/// Before the program ends.
+/// Call this before the program ends.
 void stopMariaDb();
 
 }  // namespace kest::test

@@ -1,4 +1,4 @@
-// Builders for messages of every type, complete and loadable, so that a test states only what matters to it.
+// Builds complete, loadable messages of all types, so that a test sets only what matters to it.
 #pragma once
 
 #include "platform/xml/xml.h"
@@ -14,27 +14,27 @@ namespace kest::test {
 
 using Fields = std::vector<std::pair<Text, Text>>;
 
-/// The elements of a line as `pairsIn` reads them.
+/// Returns the elements of a line from a cell, as pairsIn() reads it.
 Fields fieldsIn(const QString& cell);
 
 class Message {
 public:
-    /// The message in the file of that name in tests/data/messages.
+    /// Reads the message from the file of that name in tests/data/messages.
     static Message sample(const Text& name);
-    /// A sample and what is otherwise in it: "AUQT excess=400 quoteBody/quoteReference=500/2".
+    /// Returns a sample with changed elements, such as "AUQT excess=400 quoteBody/quoteReference=500/2".
     static Message told(const Text& text);
-    /// One with these elements alone; an empty code leaves `messageType` out.
+    /// Creates a message without other elements. An empty code leaves `messageType` out.
     Message(const Text& code, const Text& root);
     Message(const Message& other) : Message(other.text()) {}
     Message(Message&&) = default;
 
-    /// An element by its path below the root, such as "claimCustomer/surname"; made where it is missing.
+    /// Sets an element by its path below the root, such as "claimCustomer/surname". Adds it if it is missing.
     Message& set(const Text& path, const Text& text);
     Message& without(const Text& path);
-    /// Sets elements as "claimCustomer/surname=Tarrant excess=-"; "-" leaves one out.
+    /// Sets elements such as "claimCustomer/surname=Tarrant excess=-". "-" removes the element.
     Message& with(const Text& elements);
 
-    // the element that carries this value in the message's own type
+    // the element for this value in a message of this type
     Message& request(const Text& number) { return setFirst({"quoteRequestNumber", "kestQuoteRequestNumber"}, number); }
     Message& version(const Text& number) { return set("quoteRequestVersionNumber", number); }
     Message& quoteNumber(const Text& number)
@@ -49,7 +49,7 @@ public:
     }
     Message& images(std::initializer_list<Text> ids);
 
-    // A line of the quote body; an empty indicator leaves the element out, and "D" carries the number alone.
+    // Adds a line to the quote body. An empty indicator leaves the element out. A line with "D" has only its number.
     Message& labour(int number, const Text& change, Fields set = {}) { return line("labour", number, change, set); }
     Message& part(int number, const Text& change, Fields set = {}) { return line("part", number, change, set); }
     Message& paint(int number, const Text& change, Fields set = {}) { return line("paint", number, change, set); }
@@ -69,7 +69,7 @@ private:
     xml::Document document;
 };
 
-/// A complete message of a type, which a test calls with the value of the element that says what it is about.
+/// Returns complete messages of a type. The argument is the value of the element that identifies the quote or request.
 struct Sample {
     const char* name;
     const char* path;
@@ -90,9 +90,9 @@ inline constexpr Sample assessmentBackout{"BACA", "kestQuoteRequestNumber"};
 inline constexpr Sample excessWaiver{"EWAP", "quoteBody/quoteReference"};
 inline constexpr Sample submissionResponse{"response", "kestQuoteNumber"};
 
-/// A marker message, such as the one for a quote that was sent twice.
+/// Returns a marker message, such as that for a quote that was sent twice.
 QString marker(const Text& quoteNumber, const Text& subquote = "0", const Text& action = "DELDUPE");
-/// A quote document as it lies in the sent folder: several top-level elements.
+/// Returns a quote document as in the sent folder, with several top-level elements.
 QString sentDocument(const Text& reference);
 
 }  // namespace kest::test

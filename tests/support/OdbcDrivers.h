@@ -1,4 +1,4 @@
-// The ODBC drivers that a test program and its children see, whatever this machine has.
+// Replaces the ODBC drivers of this machine for a test program and its child processes.
 #pragma once
 
 #include <QByteArray>
@@ -11,10 +11,10 @@ constexpr auto odbcTds = "TDS Server";
 
 class OdbcDrivers {
 public:
-    /// `WithSqlServer` also registers the driver for the stand-in under the name that shops know.
+    /// `WithSqlServer` also registers the driver for the simulated server under the name that shops use.
     enum Names { Own, WithSqlServer };
     explicit OdbcDrivers(Names names);
-    /// Those that were registered before.
+    /// Restores the drivers of the machine.
     ~OdbcDrivers();
     Q_DISABLE_COPY_MOVE(OdbcDrivers)
 

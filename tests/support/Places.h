@@ -1,11 +1,11 @@
-// Where the files of the checkout are.
+// Finds the files of the checkout.
 #pragma once
 
 #include <QString>
 
 namespace kest::test {
 
-/// The absolute path of a file of the checkout, such as "sql/joblink.sql".
+/// Returns the absolute path of a file of the checkout, such as "sql/joblink.sql".
 QString checkoutFile(const QString& path);
 
 }  // namespace kest::test

@@ -1,4 +1,4 @@
-// A desktop without a person: a script answers boxes and drives windows as long as the test lasts.
+// Lets a script answer boxes and operate windows during a test.
 #pragma once
 
 #include "platform/script/Script.h"
@@ -12,21 +12,21 @@ namespace kest::test {
 
 class ScriptedDesktop {
 public:
-    /// `script` is the JSON of a script file. frmPrintPreview, frmSubletAuth and frmViewPDF close by themselves where
-    /// it has no visit for them, as in the command.
+    /// `script` is the JSON text of a script file. If it has no visit for frmPrintPreview, frmSubletAuth or frmViewPDF,
+    /// the window is closed, as in the command.
     explicit ScriptedDesktop(const QByteArray& script = "{}");
-    /// A failure that was kept in a window's event and never thrown fails the test.
+    /// Fails the test if an exception was kept in an event of a window and never thrown.
     ~ScriptedDesktop();
     Q_DISABLE_COPY_MOVE(ScriptedDesktop)
 
     const desktop::Record& record() const { return script->record(); }
-    /// The texts of the boxes shown so far.
+    /// Returns the texts of the boxes that have been shown.
     QStringList boxTexts() const;
-    /// The same as "icon|title|text|answer".
+    /// Returns the boxes as "icon|title|text|answer".
     QStringList boxes() const;
-    /// The prompts of the input boxes.
+    /// Returns the prompts of the input boxes.
     QStringList prompts() const;
-    /// What the last reading of a control saw: `read("txtFilter", "text")`; null where it was never read.
+    /// Returns what the last reading step read of a control, such as `read("txtFilter", "text")`, or null if none did.
     QJsonValue read(const QString& control, const QString& what = QStringLiteral("text")) const;
 
 private:

@@ -1,4 +1,4 @@
-// Where a server of tests keeps its data.
+// Chooses the folder for the data of a test server.
 #pragma once
 
 #include <QDir>
@@ -7,8 +7,8 @@
 
 namespace kest::test {
 
-/// A template for QTemporaryDir, in memory if there is such a place: a server waits for the disk at each change of a
-/// table, whatever its options.
+/// Returns a template for QTemporaryDir, in memory if possible: even with all options against it, a server waits for
+/// the disk at each change of a table.
 inline QString serverFolder(const QString& server)
 {
     const QFileInfo memory(QStringLiteral("/dev/shm"));

@@ -97,7 +97,7 @@ Row vendor(const Text& name)
 bool load(const Text& message, const Text& fileName)
 {
     files::write(gsUnreadPath + fileName, message);
-    gsListFolder = gsUnreadPath;  // as after a fill: a load prints from there
+    gsListFolder = gsUnreadPath;  // as after a fill; a load prints from this folder
     QString text = message;
     return LoadXML(text, fileName);
 }
@@ -157,7 +157,7 @@ QUrl Shop::bring(const QString& name, const QString& content)
 std::string Shop::shown()
 {
     const QJsonArray& boxes = desktop->record().boxes;
-    boxesSeen_ = std::min(boxesSeen_, boxes.size());  // another script has begun a new record
+    boxesSeen_ = std::min(boxesSeen_, boxes.size());  // another script starts a new record
     QStringList texts;
     for (; boxesSeen_ < boxes.size(); ++boxesSeen_) {
         const QJsonValue box = boxes[boxesSeen_];

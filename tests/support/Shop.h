@@ -1,5 +1,5 @@
-// A repair shop of its own for one test: profile, folders, quote database, connection and shared variables; with what
-// every such test reads them by.
+// A repair shop for a single test: profile, folders, quote database, connection and shared variables, with functions
+// that read and change them.
 #pragma once
 
 #include "messagelist/Summary.h"
@@ -21,26 +21,26 @@
 
 namespace kest::test {
 
-// Each finds its row, or makes it with what every quote, car, customer or vendor of a shop has.
+// Each of these functions returns its row. If there is none, it adds one with the usual values.
 
-/// The car ABC123 with its customer, no network number, no line.
+/// A new quote is for the car ABC123 with its customer, and has no network number and no lines.
 QuoteRow quote(const Text& number, int subquote = 0);
-/// A second row with the same number and subquote.
+/// Adds a second row with the same number and subquote.
 QuoteRow anotherQuote(const Text& number, int subquote = 0);
 bool quoteExists(const Text& number, int subquote = 0);
-/// Silver, of a known model, of the customer "Holloway".
+/// A new car is silver, has a known model and belongs to the customer "Holloway".
 Row car(const Text& rego);
 Row customer(const Text& name);
 Row vendor(const Text& name);
 
-/// The message arrives in the unread folder under that name, and goes through LoadXML.
+/// Puts the message into the unread folder under that name and loads it with LoadXML().
 bool load(const Text& message, const Text& fileName = "message.xml");
 
-/// Loads a message as the list window does after a click on "Load", the move to the read folder included; false where a
-/// failure reaches the window.
+/// Loads a message as the list window does, including the move to the read folder. Returns false if an error reaches
+/// the window.
 bool loadAsTheWindow(const QString& fileName);
 
-/// The files that the list window's fill lists; answers to quotes that were sent are applied.
+/// Returns the files that a fill lists. The fill also applies answers to sent quotes.
 QStringList listed(int folder = Unread);
 
 class Shop : public ::testing::Test {
@@ -52,15 +52,14 @@ protected:
 
     /// Puts a file into the unread folder, as the transport does.
     void arrive(const Text& name, const Text& content);
-    /// Puts a file onto a stick that a person brings.
+    /// Creates a file outside of the folders, as on a stick that a person brings.
     QUrl bring(const QString& name, const QString& content);
-    /// Names of the files of a folder such as `gsReadPath`.
+    /// Returns the names of the files in a folder such as `gsReadPath`.
     static QStringList filesIn(const QString& folder);
-    /// The boxes shown since the last call, each as "[critical] text" or "[critical] title: text", joined by line
-    /// feeds.
+    /// Returns the boxes shown since the last call, one on each line, as "[critical] text" or "[critical] title: text".
     std::string shown();
 
-    /// Answers boxes with their default; `desktop.emplace(script)` where a test wants other answers.
+    /// Answers boxes with their defaults. Use `desktop.emplace(script)` for other answers.
     std::optional<ScriptedDesktop> desktop;
 
 private:

@@ -20,7 +20,7 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-const auto shopName = u"WirSql"_s;  // by default, on every engine
+const auto shopName = u"WirSql"_s;  // the default on every engine
 
 void fillShop(db::Connection& database)
 {
@@ -37,7 +37,8 @@ void fill(db::Connection& database, app::Dialect dialect)
     fillShop(database);
 }
 
-/// Built once, in the profile of the first test, since making tables costs commits.
+/// Returns the file of a new shop. It is created only once, in the profile of the first test, because creating tables
+/// is slow.
 const QByteArray& newShopFile()
 {
     static const QByteArray file = [] {
@@ -57,7 +58,7 @@ Engine engine()
     return name == u"mariadb"_s ? Engine::MariaDb : name == u"tds"_s ? Engine::Tds : Engine::Embedded;
 }
 
-/// The tables as a host has them on SQL Server; only tests make them.
+/// Returns the script for the tables that a host has on SQL Server.
 QString tdsSchema()
 {
     app::registerResources();
@@ -75,8 +76,7 @@ QString tdsSchema()
     return script.remove(QRegularExpression(u" DEFAULT CHARACTER SET [^;]*"_s));
 }
 
-/// The shop's database on a server, and copies of it beside it: making tables anew would cost a test more than all
-/// else.
+/// The shop's database on a server. Keeps copies of it, because creating tables would be the slowest part of a test.
 class ServerShop {
 public:
     ServerShop(QString name, QString ownNumber) : serverName(std::move(name)), connectionNumber(std::move(ownNumber)) {}
@@ -84,7 +84,7 @@ public:
     virtual void copy(const QString& from, const QString& to) = 0;
 
     const QString serverName;        // as a setting
-    const QString connectionNumber;  // what gives the number by which the server knows a connection
+    const QString connectionNumber;  // a query for the server's number of a connection
     const db::ConnectionPtr administrator = std::make_shared<db::Connection>();
 
     const QString shop = shopName;
@@ -113,14 +113,14 @@ public:
     void copy(const QString& from, const QString& to) override
     {
         for (auto table = tables_.begin(); table != tables_.end(); ++table) {
-            const QString clear = table.value() ? u"TRUNCATE TABLE "_s : u"DELETE FROM "_s;  // which keeps the counter
+            const QString clear = table.value() ? u"TRUNCATE TABLE "_s : u"DELETE FROM "_s;  // DELETE keeps the counter
             administrator->execute(clear + to + u'.' + table.key());
             administrator->execute(u"INSERT INTO %1.%3 SELECT * FROM %2.%3"_s.arg(to, from, table.key()));
         }
     }
 
 private:
-    QMap<QString, bool> tables_;  // true for one that numbers its rows
+    QMap<QString, bool> tables_;  // true if the table numbers its rows
 };
 
 class TdsShop final : public ServerShop {
@@ -178,7 +178,7 @@ SavedShopDatabase::SavedShopDatabase()
         serverShop().copy(serverShop().shop, serverShop().saved);
         return;
     }
-    gConn->close();  // so that all of it is in the one file
+    gConn->close();  // so that the file contains all changes
     file_ = files::readBytes(app::embeddedFile(shopName));
     EnsureConnection();
 }

@@ -1,22 +1,22 @@
-// The quote database of a test's shop: embedded, or on a server that KEST2_TEST_ENGINE names, "mariadb" or "tds".
+// The quote database of a test's shop: embedded, or on the server in KEST2_TEST_ENGINE, "mariadb" or "tds".
 #pragma once
 
 #include <QByteArray>
 
 namespace kest::test {
 
-/// The component's connection to it goes, as when a server is started anew.
+/// Drops the component's connection, as a restart of the server would.
 void dropConnection();
 
-/// Puts a new shop with one model that cars can have where the settings of the profile then lead: on a server
-/// `ServerName` is set, and nothing else.
+/// Creates the database of a new shop, with one model for cars, where the settings of the profile expect it. For a
+/// server, only sets `ServerName`.
 void makeShopDatabase();
 
-/// The rows as they stand; one at a time.
+/// Saves all rows. Only one object may exist at a time.
 class SavedShopDatabase {
 public:
     SavedShopDatabase();
-    /// The connection may be a new one.
+    /// Restores the rows. The connection may be a new one.
     void restore() const;
 
 private:

@@ -48,7 +48,7 @@ std::string holdings()
         for (db::Recordset rows = opened(u"SELECT * FROM "_s + name); !rows.eof(); rows.moveNext()) {
             QStringList values{name};
             for (const QString& column : rows.columns())
-                if (column != u"itemid"_s)  // a line that is stored anew has another one
+                if (column != u"itemid"_s)  // a line that is stored again gets another one
                     values += column + u'=' + (rows.isNull(column) ? u"Null"_s : rows.text(column));
             ofTable += values.join(u' ');
         }

@@ -1,4 +1,4 @@
-// What a shop holds, as text to compare and as a state to go back to.
+// Describes all data of a shop as text, and saves and restores it.
 #pragma once
 
 #include "support/ShopDatabase.h"
@@ -11,16 +11,16 @@
 
 namespace kest::test {
 
-/// All rows of all tables, and all files of the drive.
+/// Returns all rows of all tables and all files of the drive as text.
 std::string holdings();
-/// The lines that only one of two such texts has.
+/// Returns the lines that only one of two such texts has.
 std::string difference(const std::string& expected, const std::string& found);
 
-/// One at a time.
+/// Saves the state of a shop. Only one object may exist at a time.
 class Snapshot {
 public:
     Snapshot();
-    /// Files, rows and what a load hands to the file move.
+    /// Restores the files, the rows and the variables that a load passes to the file move.
     void restore() const;
 
 private:

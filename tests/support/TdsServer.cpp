@@ -36,7 +36,7 @@ TdsServer::TdsServer() : folder_(serverFolder(u"tds"_s))
         arguments << u"--statements"_s << statements;
     server_.setProcessChannelMode(QProcess::MergedChannels);
     server_.setChildProcessModifier([] { prctl(PR_SET_PDEATHSIG, SIGKILL); });
-    server_.start(u"/usr/bin/python3"_s, arguments);  // Debian's, which finds Debian's packages
+    server_.start(u"/usr/bin/python3"_s, arguments);  // not another Python, which would not find Debian's packages
     const QDeadlineTimer deadline(startMilliseconds);
     while (!server_.canReadLine()) {
         if (deadline.hasExpired() || server_.state() == QProcess::NotRunning)

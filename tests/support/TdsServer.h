@@ -1,4 +1,4 @@
-// A stand-in for SQL Server for tests, spoken to through FreeTDS; tds/standin.py says what it is and what it is not.
+// Runs a simulated SQL Server for tests, which clients reach through FreeTDS. tds/standin.py describes its limits.
 #pragma once
 
 #include <QProcess>
@@ -9,19 +9,19 @@ namespace kest::test {
 
 class TdsServer {
 public:
-    /// Started and ready; throws std::runtime_error with its own words if it does not come up.
+    /// Starts the server and waits until it is ready. Throws std::runtime_error with its output if it does not start.
     TdsServer();
-    /// Stopped. It ends with the test program too, however that ends.
+    /// Stops the server. It also stops if the test program crashes.
     ~TdsServer();
 
-    /// An address of this machine that nobody else has. The port is SQL Server's usual one, so the address is all that
-    /// a client needs to know.
+    /// Returns an address of this machine that nothing else uses. The port is SQL Server's usual one, so a client needs
+    /// only the address.
     QString address() const { return address_; }
-    /// The instance that the browser service on that address knows.
+    /// Returns the instance that the browser service at that address knows.
     static QString instance() { return QStringLiteral("SHOP"); }
     static QString user() { return QStringLiteral("sa"); }
 
-    /// Makes an empty database, in place of one of that name, and runs the statements of a script in it.
+    /// Creates an empty database, after dropping one of the same name, and runs a script in it.
     void createDatabase(const QString& name, const QString& script = {});
     QString connectionText(const QString& database) const;
 
@@ -31,9 +31,9 @@ private:
     QString address_;
 };
 
-/// The one stand-in of a test program, started when it is first asked for.
+/// Returns the simulated server of this test program. The first call starts it.
 TdsServer& tdsServer();
-/// Before the program ends.
+/// Call this before the program ends.
 void stopTdsServer();
 
 }  // namespace kest::test

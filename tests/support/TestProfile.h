@@ -1,4 +1,4 @@
-// A profile of its own for one test, in a temporary folder that goes with it.
+// A profile for a single test, in a temporary folder that is deleted afterwards.
 #pragma once
 
 #include "platform/profile.h"
@@ -11,7 +11,7 @@
 
 #include <iosfwd>
 
-/// Found by argument-dependent look-up, so that a failed expectation shows the text.
+/// GoogleTest finds this by argument-dependent lookup, so that a failed expectation shows the text.
 void PrintTo(const QString& text, std::ostream* out);
 
 namespace kest::test {
@@ -28,7 +28,7 @@ public:
     Q_DISABLE_COPY_MOVE(TestProfile)
 
     QString root() const { return folder.path(); }
-    /// Where drive C: lies on this system.
+    /// Returns the folder of drive C: on this system.
     QString driveC() const { return folder.path() + QStringLiteral("/drive_c"); }
 
 private:

@@ -1,4 +1,4 @@
-// What a test's builders take: plain literals where the code under test has QString and QVariant.
+// The parameter types of the builders. They accept plain literals for QString and QVariant.
 #pragma once
 
 #include <QDate>
@@ -20,7 +20,7 @@ private:
     QString text;
 };
 
-/// A value of a column; `nullptr` is Null.
+/// A value of a column. `nullptr` is Null.
 class Value {
 public:
     Value(const char* text) : value(QString::fromUtf8(text)) {}

@@ -1,4 +1,4 @@
-// This process's time zone, for the time of one test.
+// Sets the time zone of this process during a test.
 #pragma once
 
 #include <QByteArray>

@@ -1,4 +1,4 @@
-// Runs a test program: no display, nothing of this workstation's own drivers, servers of its own stopped at its end.
+// Runs a test program without a display and without the drivers of this machine, and stops its servers at the end.
 #include "support/MariaDbServer.h"
 #include "support/OdbcDrivers.h"
 #include "support/TdsServer.h"
@@ -18,7 +18,7 @@ int main(int argc, char** argv)
 {
     if (!qEnvironmentVariableIsSet("QT_QPA_PLATFORM"))
         qputenv("QT_QPA_PLATFORM", "offscreen");
-    using kest::test::OdbcDrivers;  // made first, since ODBC reads its list of drivers once
+    using kest::test::OdbcDrivers;  // first, because ODBC reads the list of drivers only once
     const OdbcDrivers drivers(qgetenv("KEST2_TEST_ENGINE") == "tds" ? OdbcDrivers::WithSqlServer : OdbcDrivers::Own);
     QApplication application(argc, argv);
     ::testing::InitGoogleTest(&argc, argv);

@@ -1,4 +1,4 @@
-// The text of the viewer: each kind of node, the two repairs, and what is no message.
+// Tests the text of the viewer: each kind of node, the two repairs, and files that are not messages.
 #include "platform/files/files.h"
 #include "support/Cases.h"
 #include "support/ScriptedDesktop.h"

@@ -1,4 +1,4 @@
-// The password question: what is let in, what is said, and how its controls tell where one stands.
+// Tests the password dialog: what it accepts, what it says, and the colours of its field.
 #include "support/Cases.h"
 #include "support/Hands.h"
 #include "support/ScriptedDesktop.h"

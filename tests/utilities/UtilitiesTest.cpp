@@ -1,4 +1,4 @@
-// The window on a quote's network fields: what it shows, what its buttons change, what a save stores.
+// Tests the utilities window: what it shows, what its buttons change, and what a save stores.
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "support/Cases.h"
@@ -22,13 +22,13 @@ namespace {
 
 class Utilities : public Shop {
 protected:
-    /// Shows the window on quote 500 and works it.
+    /// Shows the window for the quote 500 and does the steps.
     void work(const std::string& steps, const QString& subquote = u"0"_s)
     {
         desktop.emplace(("{\"windows\": {\"frmUtilities\": [[" + steps + "]]}}").c_str());
         frmUtilities::ShowForm(u"500"_s, subquote);
     }
-    /// Shows the window on quote 500 to hands; the failures that were reported, each with its source.
+    /// Shows the window for the quote 500 and operates it from code. Returns the reported errors with their sources.
     static QStringList failuresOf(const test::Hands::Work& work)
     {
         QStringList failures;
@@ -40,7 +40,7 @@ protected:
         desktop::setFailureReporter(nullptr);
         return failures;
     }
-    /// The texts of the controls as they were last read.
+    /// Returns the texts that were last read from the controls.
     std::string texts() const
     {
         QStringList result;

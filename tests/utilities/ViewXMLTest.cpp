@@ -1,4 +1,4 @@
-// The text viewer: what a save writes, what stops it, and leaving with unsaved typing.
+// Tests the text viewer: what a save writes, what prevents it, and closing with unsaved changes.
 #include "base/SharedVariables.h"
 #include "platform/files/files.h"
 #include "support/ScriptedDesktop.h"
@@ -29,7 +29,7 @@ protected:
     }
     ~Viewer() override { gsCurFolder.clear(); }
 
-    /// Opens the viewer on the content and works it; the boxes that came.
+    /// Opens the viewer with the content, does the steps and returns the boxes.
     static QStringList view(const QByteArray& content, const std::string& steps, const std::string& answers = {},
                             const std::string& password = std::to_string(dayPassword(QDate::currentDate())))
     {
@@ -58,7 +58,7 @@ const QString leave = u"Are you sure you want to exit without saving this messag
 
 TEST_F(Viewer, ASaveWritesTheTextWithoutTheWrapperAndWithTheCharactersThemselves)
 {
-    const QByteArray longValue(3'000'000, 'Q');  // a document in base64
+    const QByteArray longValue(3'000'000, 'Q');  // a base64 document
     struct {
         QByteArray content, written;
         std::string typed = {};
@@ -123,10 +123,10 @@ TEST(ExactText, ComesBackAsItWasGivenAndAsItWasEdited)
         EXPECT_TRUE(edit.exactText() == text) << text.left(40).toStdString();
     }
 
-    // what stands between two places gives way to a text, in the editor as in the text itself
+    // replaces the text between two positions, in the editor and in the text itself
     const QString text = u"a\nb\r\n"_s + longLine;  // shown in pieces from 5, 4005 and 8005
     const std::tuple<int, int, QString, QString> edits[] = {
-        // start and length in the text as it is shown
+        // start and length in the shown text
         {1, 0, u"\n"_s, u"a\r\n\nb\r\n"_s + longLine},
         {0, 2, u"1\n2"_s, u"1\r\n2b\r\n"_s + longLine},
         {4, 4001, {}, u"a\nb\r\n"_s + longLine.mid(4000)},

@@ -70,7 +70,7 @@ EveryWindow::EveryWindow()
     makeDocument();
 }
 
-// Boxes are shown by the system that a person uses: no driver gets between.
+// Shows real boxes, without a script.
 void EveryWindow::showBox(const std::function<void()>& show, const Check& check)
 {
     desktop::usePerson();

@@ -1,4 +1,4 @@
-// Every window of the component, opened on a shop that has something to show in each.
+// Opens every window of the component in a shop with data for each of them.
 #pragma once
 
 #include "support/Shop.h"
@@ -15,8 +15,8 @@ protected:
 
     EveryWindow();
 
-    /// Opens each window, the message list once with the unread and once with the read folder, hands it over while it
-    /// is shown, and closes it. A failed expectation says which window it was.
+    /// Opens each window, calls `check` while it is shown, and closes it. The message list is opened with the unread
+    /// and with the read folder. A failed expectation names the window.
     void each(const Check& check);
 
 private:
@@ -29,10 +29,9 @@ bool isA(const QWidget& widget)
     return (qobject_cast<const Kinds*>(&widget) || ...);
 }
 
-/// The controls that a person works, as far as they are shown and enabled: without the parts that the toolkit builds
-/// into them, which go by their owner's keys and name.
+/// Returns the visible and enabled controls that a person can use, without the parts that Qt creates inside of them.
 QList<QWidget*> controlsOf(const QDialog& window);
-/// The name of a control for a failure's text.
+/// Returns the name of a control for error messages.
 std::string nameOf(const QWidget& control);
 
 }  // namespace kest::test

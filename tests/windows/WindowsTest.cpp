@@ -1,5 +1,5 @@
-// What a person may expect of every window: a key for everything, texts that can be read at any size, names for those
-// who hear what others see.
+// Tests what a person can expect of every window: a key for everything, readable texts at any size, and names for
+// screen readers.
 #include "platform/script/Gestures.h"
 #include "windows/EveryWindow.h"
 
@@ -38,7 +38,7 @@ QKeySequence accessKeyOf(const QWidget& widget)
     return {};
 }
 
-/// All that the Tab key comes by on its way round, from what has the focus when the window opens.
+/// Returns all controls that Tab reaches, starting with the control that has the focus when the window opens.
 QSet<const QWidget*> tabRound(QDialog& window)
 {
     QSet<const QWidget*> met;
@@ -54,7 +54,8 @@ QSet<const QWidget*> tabRound(QDialog& window)
     return met;
 }
 
-/// Of a group of options Tab meets the chosen one alone; the arrow keys lead to its fellows.
+/// Returns true if Tab reaches the control. In a group of options, Tab reaches only the selected one, and the arrow
+/// keys the others.
 bool isMet(const QWidget& control, const QSet<const QWidget*>& met)
 {
     const auto isFellow = [&](const QWidget* other) {
@@ -118,7 +119,8 @@ TEST_F(EveryWindow, IsLeftByEscapeAsByItsCloseBoxAndTakesEnterWhereItHasADefault
 
 // --- Sizes ---
 
-/// A caption or an item must be seen whole; of a value that can be scrolled its height, and the hint in its place.
+/// Returns true for widgets whose whole text must be visible: captions and items. Values can be scrolled, so only their
+/// height and their placeholder matter.
 bool hasText(const QWidget& widget)
 {
     const bool hasCaption = isA<QAbstractButton, QLabel>(widget) && !widget.property("text").toString().isEmpty();
@@ -128,7 +130,7 @@ bool hasText(const QWidget& widget)
 void expectToFit(const QWidget& widget)
 {
     QSize needed = widget.minimumSizeHint();
-    if (isA<QPushButton>(widget))  // whose style asks for more than its caption does
+    if (isA<QPushButton>(widget))  // its style requests more space than the caption needs
         needed = widget.fontMetrics().size(Qt::TextShowMnemonic, widget.property("text").toString());
     if (hasText(widget) || isA<QLineEdit>(widget)) {
         EXPECT_GE(widget.height(), needed.height()) << nameOf(widget);
