@@ -11,7 +11,7 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-/// What the network calls it, and what the shop calls it. Of several with one code the first is read for the code.
+/// The network's code and the shop's word. If several pairs have the same code, the first one is used for the code.
 struct Pair {
     QLatin1StringView code;
     QLatin1StringView ours;

@@ -1,4 +1,4 @@
-// The codes of the network and what the shop writes for them: one table each, read in both directions.
+// Converts between the codes of the network and the words of the shop. Each table is read in both directions.
 #pragma once
 
 #include <QString>
@@ -8,53 +8,56 @@
 
 namespace kest {
 
-/// "White" for "WHIT", in any case.
+/// Returns "White" for "WHIT", in any case, or nothing for an unknown code.
 std::optional<QString> colourOfCode(const QString& code);
-/// "WHIT" for " white". A colour without a code is sent as it is, in lower case.
+/// Returns "WHIT" for " white". A colour without a code is returned in lower case, as it is sent.
 QString codeOfColour(const QString& colour);
 
-/// The paint group of a car for a network's paint type; "S3" for an unknown one.
+/// Returns the paint group for the network's paint type, or "S3" for an unknown one.
 QString paintGroupOfCode(const QString& code);
-/// The paint type of a group in any case; empty for an unknown one. "S3" is sent as "CLER", which comes back as "S2".
+/// Returns the paint type of a group, in any case, or an empty text for an unknown one. "S3" is sent as "CLER", which
+/// is read as "S2".
 QString codeOfPaintGroup(const QString& group);
 
-/// The mark of a part line for a network's part type: a blank for a new part.
+/// Returns the mark of a part line for the network's part type. A new part has a blank.
 std::optional<QString> markOfPartType(const QString& type);
-/// The part type of a mark; "NEW" for an unknown one.
+/// Returns the part type of a mark, or "NEW" for an unknown one.
 QString partTypeOfMark(const QString& mark);
 
+/// A kind of labour.
 struct LabourType {
     QLatin1StringView code;
     QLatin1StringView category;
-    QLatin1StringView amountColumn;  // of a line that the network has sent; its rate is then 1
+    QLatin1StringView amountColumn;  // contains the amount of a line from the network, whose rate is 1
 };
 namespace labour {
 using Qt::Literals::StringLiterals::operator""_L1;
 inline constexpr LabourType removeAndReplace{"RR"_L1, "R&R"_L1, "rrhour"_L1};
 inline constexpr LabourType repair{"REPR"_L1, "RA"_L1, "rahour"_L1};
-inline constexpr LabourType other{"OTH"_L1, "MIS"_L1, "unitcost"_L1};  // also what mechanical work is sent as
+inline constexpr LabourType other{"OTH"_L1, "MIS"_L1, "unitcost"_L1};  // mechanical work is sent as this, too
 }  // namespace labour
-/// Null for an unknown code.
+/// Returns the labour type of a code, or null for an unknown code.
 const LabourType* labourTypeOfCode(const QString& code);
-/// `labour::other` for every category that has no type of its own.
+/// Returns the labour type of a category, or `labour::other` if it has none of its own.
 const LabourType& labourTypeOfCategory(const QString& category);
 
-/// "Automatic" for the network's "A", "Manual" for "M"; any other text as it is.
+/// Returns "Automatic" for the network's "A" and "Manual" for "M". Any other text stays as it is.
 QString transmissionOfCode(const QString& code);
-/// "Automatic" or "Manual", the words that are sent, for what a car has: the letter or the word in any case. What is
-/// neither counts as manual.
+/// Returns "Automatic" or "Manual", the words that are sent, for the letter or word of a car in any case. Any other
+/// text counts as manual.
 QString transmissionToSend(const QString& transmission);
 
-/// Why the insurer has rejected a quote: the text for a code in any case.
+/// Returns why the insurer has rejected a quote. The code may be in any case.
 std::optional<QString> reasonOfCode(const QString& code);
-/// The same for the report of an assessment result, which leaves the two reasons open that end a repair.
+/// Returns the reason for the report of an assessment result, which does not show the two reasons that end a repair.
 std::optional<QString> reportedReasonOfCode(const QString& code);
 
-/// A car's build date: "03/1998", with a month of 0 "01/1998"; empty for a year of 0 or less.
+/// Returns a car's build date such as "03/1998". A month of 0 becomes "01"; for a year of 0 or less the text is empty.
 QString buildDate(qint64 year, qint64 month);
-/// Month and year of a build date as a person may have typed it: around its "/", or "01" and a year alone.
+/// Returns the month and year of a build date that a person has typed: the parts around the "/", or "01" and the year.
 std::pair<QString, QString> monthAndYearTyped(const QString& date);
-/// Month and year of a build date in the form that the host writes, "03/1998" or "1998"; empty for any other.
+/// Returns the month and year of a build date in the form of the host, "03/1998" or "1998". Both are empty for any
+/// other text.
 std::pair<QString, QString> monthAndYearWritten(const QString& date);
 
 }  // namespace kest
