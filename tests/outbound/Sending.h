@@ -1,4 +1,4 @@
-// A shop that sends quotes, and what then lies in its outgoing folder.
+// A shop that sends quotes, with functions that read its outgoing folder.
 #pragma once
 
 #include "base/modDBAccess.h"
@@ -13,19 +13,19 @@ using namespace Qt::StringLiterals;
 
 class Sending : public Shop {
 protected:
-    /// The panel is open on the quote and "Send Quote" is chosen; the total that was sent.
+    /// Sends the quote as "Send Quote" on the panel does. Returns the total that was sent.
     static double send(const Text& number, int subquote = 0)
     {
         db::Recordset panel =
             opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", QString(number), subquote));
         return SendQuote(panel);
     }
-    /// A file of the outgoing folder, "" where it is missing.
+    /// Returns a file of the outgoing folder, or "" if it is missing.
     static QString outgoing(const QString& file)
     {
         return files::exists(gsUnsentPath + file) ? files::read(gsUnsentPath + file) : QString();
     }
-    /// The text of an element of an outgoing document by its path below the root, "(none)" where it is missing.
+    /// Returns the text of an element of an outgoing document by its path below the root, or "(none)" if it is missing.
     static std::string sent(const QString& path, const QString& file = u"500.0_1.xml"_s)
     {
         xml::Document document;
@@ -33,7 +33,7 @@ protected:
         const xml::Node node = document.selectSingleNode(u"/request/"_s + path);
         return node ? node.text().toStdString() : "(none)";
     }
-    /// A main quote with one labour line of 100, which passes all checks.
+    /// Returns a quote with one labour line of 100, which passes all checks.
     static QuoteRow sendable(const Text& number = "500", int subquote = 0)
     {
         QuoteRow row = quote(number, subquote);

@@ -1,4 +1,4 @@
-// The reports that a test's desktop has shown, and the shop's templates for them.
+// Sets the report templates of a test's shop, and reads the reports that were shown.
 #pragma once
 
 #include "support/Places.h"
@@ -22,12 +22,12 @@ protected:
             putTemplate(name, files::readBytes(checkoutFile(u"templates/"_s + QLatin1String(name))));
     }
 
-    /// Puts a template under the report's name.
+    /// Writes the template of a report.
     static void putTemplate(const char* name, const QByteArray& content)
     {
         files::writeBytes(u"c:\\wirra32\\report\\"_s + QString::fromLatin1(name), content);
     }
-    /// The windows shown since the last call.
+    /// Returns the windows that were shown since the last call.
     QList<QJsonObject> windows()
     {
         QList<QJsonObject> shown;
@@ -35,7 +35,7 @@ protected:
             shown.append(desktop->record().windows[seen].toObject());
         return shown;
     }
-    /// Their names and report numbers, joined by blanks.
+    /// Returns their names and report numbers, separated by blanks.
     std::string shownReports()
     {
         QStringList names;
@@ -43,7 +43,7 @@ protected:
             names.append(window[u"name"].toString() + window[u"report"].toVariant().toString());
         return names.join(u' ').toStdString();
     }
-    /// Of a table of the record: one row's cells in these fields, one that was never set as "-".
+    /// Returns the cells of a row in the table of a recorded window, with "-" for a field that was never set.
     static std::string cells(const QJsonObject& window, int row, const Text& fields)
     {
         const QVariantList names = window[u"table"][u"fields"].toArray().toVariantList();
@@ -60,7 +60,7 @@ private:
     qsizetype seen = 0;
 };
 
-/// The text of a PDF file as a reader sees it, pages divided by form feeds.
+/// Returns the text of a PDF file, with form feeds between the pages.
 inline QString pdfText(const QString& file)
 {
     QProcess reader;

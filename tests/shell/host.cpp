@@ -1,7 +1,7 @@
-// A host program: it loads the component by dlopen and knows nothing of it but its binary interfaces.
-// kest_host LIBRARY create           creates and releases one object, in a process without Qt's application
-// kest_host LIBRARY refused [core]   meets a refusal, with a core application where the word is given
-// kest_host LIBRARY show QTNNO SUB   shows the panel and closes it like a person, printing what it saw
+// A host program that loads the component with dlopen and uses only its binary interfaces.
+// kest_host LIBRARY create           creates and releases an object in a process without a Qt application
+// kest_host LIBRARY refused [core]   expects a refusal, with a core application if "core" is given
+// kest_host LIBRARY show QTNNO SUB   shows the panel, prints what it sees, and closes the panel like a person
 #include "shell/component.h"
 
 #include <QApplication>
