@@ -1,5 +1,6 @@
-#include "platform/TextReader.h"
 #include "platform/values.h"
+
+#include <QRegularExpression>
 
 using namespace Qt::StringLiterals;
 
@@ -7,105 +8,34 @@ namespace kest {
 
 namespace {
 
-/// Reads the rest of a text after its date: a 24-hour time, with a fraction and a zone mark if they are there.
-std::optional<QTime> readIsoTime(TextReader& reader)
+/// yyyy-MM-dd, alone or with a 24-hour clock, a fraction and a zone mark.
+const QRegularExpression& isoForm()
 {
-    const auto hour = reader.number(2, 2);
-    if (!hour || !reader.take(u':'))
-        return {};
-    const auto minute = reader.number(1, 2);
-    if (!minute)
-        return {};
-    int second = 0;
-    int millisecond = 0;
-    if (reader.take(u':')) {
-        const auto seconds = reader.number(1, 2);
-        if (!seconds)
-            return {};
-        second = *seconds;
-        if (reader.take(u'.')) {
-            const QStringView fraction = reader.digits();
-            if (fraction.isEmpty())
-                return {};
-            millisecond = (fraction.toString() + u"00"_s).left(3).toInt();
-        }
-    }
-    if (!reader.takeAnyOf(u"Zz") && reader.takeAnyOf(u"+-")) {
-        if (!reader.number(2, 2))
-            return {};
-        const bool colon = reader.take(u':');
-        const qsizetype digits = reader.digits(2).size();
-        if (digits == 1 || (colon && digits == 0))
-            return {};
-    }
-    const QTime time(*hour, *minute, second, millisecond);
-    return reader.atEnd() && time.isValid() ? std::optional(time) : std::nullopt;
+    static const QRegularExpression form(QRegularExpression::anchoredPattern(
+        uR"([ \t\r\n]*(?<year>\d{4})-(?<month>\d\d)-(?<day>\d\d))"
+        uR"((?:[T ](?<hour>\d\d):(?<minute>\d\d?)(?::(?<second>\d\d?)(?:\.(?<fraction>\d+))?)?)"
+        uR"((?:[Zz]|[-+]\d\d(?::?\d\d)?)?)?[ \t\r\n]*)"_s));
+    return form;
 }
 
-/// Reads the rest of a text after its date: a 24-hour time, or a 12-hour time with AM or PM.
-std::optional<QTime> readClock(TextReader& reader)
+/// d/M/yyyy, alone or with a clock of 24 hours, or of 12 with its marker.
+const QRegularExpression& shortForm()
 {
-    auto hour = reader.number(1, 2);
-    if (!hour || !reader.take(u':'))
-        return {};
-    const auto minute = reader.number(2, 2);
-    if (!minute)
-        return {};
-    const auto second = reader.take(u':') ? reader.number(2, 2) : std::optional(0);
-    if (!second)
-        return {};
-    reader.skipBlanks();
-    if (!reader.atEnd()) {
-        const bool afternoon = reader.takeAnyOf(u"pP");
-        if ((!afternoon && !reader.takeAnyOf(u"aA")) || !reader.takeAnyOf(u"mM") || *hour < 1 || *hour > 12)
-            return {};
-        *hour = *hour % 12 + (afternoon ? 12 : 0);
-    }
-    const QTime time(*hour, *minute, *second);
-    return reader.atEnd() && time.isValid() ? std::optional(time) : std::nullopt;
+    static const QRegularExpression form(QRegularExpression::anchoredPattern(
+        uR"([ \t\r\n]*(?<day>\d\d?)/(?<month>\d\d?)/(?<year>\d{4}))"
+        uR"((?: [ \t\r\n]*(?<hour>\d\d?):(?<minute>\d\d)(?::(?<second>\d\d))?)"
+        uR"([ \t\r\n]*(?<marker>[AaPp][Mm])?)?[ \t\r\n]*)"_s));
+    return form;
 }
 
-std::optional<QDateTime> joined(const QDate& date, const std::optional<QTime>& time)
+/// The hour of a 24-hour clock; -1 if the marker does not fit it.
+int hourOf(int hour, const QString& marker)
 {
-    if (!date.isValid() || !time)
-        return {};
-    return columnDate(date, *time);
-}
-
-std::optional<QDateTime> readDate(QStringView text)
-{
-    const QStringView trimmed = withoutBlanks(text);
-    TextReader reader(trimmed);
-    if (trimmed.size() > 4 && trimmed[4] == u'-') {
-        const auto year = reader.number(4, 4);
-        reader.take(u'-');
-        const auto month = reader.number(2, 2);
-        if (!year || !month || !reader.take(u'-'))
-            return {};
-        const auto day = reader.number(2, 2);
-        if (!day)
-            return {};
-        const QDate date(*year, *month, *day);
-        if (reader.atEnd())
-            return joined(date, QTime(0, 0));
-        return reader.takeAnyOf(u"T ") ? joined(date, readIsoTime(reader)) : std::nullopt;
-    }
-    const auto day = reader.number(1, 2);
-    if (!day || !reader.take(u'/'))
-        return {};
-    const auto month = reader.number(1, 2);
-    if (!month || !reader.take(u'/'))
-        return {};
-    const auto year = reader.number(4, 4);
-    if (!year)
-        return {};
-    const QDate date(*year, *month, *day);
-    if (reader.atEnd())
-        return joined(date, QTime(0, 0));
-    if (!reader.take(u' '))
-        return {};
-    reader.skipBlanks();
-    return joined(date, readClock(reader));
+    if (marker.isEmpty())
+        return hour;
+    if (hour < 1 || hour > 12)
+        return -1;
+    return hour % 12 + (marker.startsWith(u'p', Qt::CaseInsensitive) ? 12 : 0);
 }
 
 }  // namespace
@@ -117,14 +47,24 @@ QDateTime columnDate(const QDate& date, const QTime& time)
 
 std::optional<QDateTime> dateIn(const QString& text)
 {
-    return readDate(text);
+    QRegularExpressionMatch found = isoForm().match(text);
+    if (!found.hasMatch())
+        found = shortForm().match(text);
+    if (!found.hasMatch())
+        return {};
+    const auto number = [&](const QString& part) { return found.captured(part).toInt(); };
+    const QDate date(number(u"year"_s), number(u"month"_s), number(u"day"_s));
+    const int milliseconds = found.captured(u"fraction"_s).leftJustified(3, u'0', true).toInt();
+    const QTime time(hourOf(number(u"hour"_s), found.captured(u"marker"_s)), number(u"minute"_s), number(u"second"_s),
+                     milliseconds);
+    if (!date.isValid() || !time.isValid())
+        return {};
+    return columnDate(date, time);
 }
 
 QString shortDate(const QDate& date)
 {
-    if (!date.isValid())
-        return {};
-    return QString::asprintf("%02d/%02d/%04d", date.day(), date.month(), date.year());
+    return date.toString(u"dd/MM/yyyy");
 }
 
 }  // namespace kest
