@@ -1,7 +1,10 @@
 // Loads an authorised quote: the insurer accepts a quote, unchanged or with changed lines, under an authority number.
 #include "base/Helpers.h"
 #include "base/QuoteKey.h"
+#include "base/modDBAccess.h"
 #include "base/modLoggerEx.h"
+#include "inbound/LoadQuoteBody.h"
+#include "inbound/Loading.h"
 #include "inbound/modLoadXML.h"
 #include "jobexport/WriteQuote.h"
 #include "messages/Envelope.h"
@@ -120,7 +123,7 @@ QString surnameFirst(const QString& name)
 
 void fillHeader(db::Recordset& quote, const Authorisation& told, const QString& rego, const db::Recordset& insurer)
 {
-    fillColumn(quote, {
+    setColumns(quote, {
                           {"KESTQRNo"_L1, told.request},
                           {"KESTQuoteNo"_L1, told.originalNumber},
                           {"KESTAuthNo"_L1, told.authorisedNumber},
@@ -198,7 +201,7 @@ bool authorise(QString& text)
 
     if (!LoadQuoteBody(quote, lines, message))
         return refusePlainly(u"Error processing Quote Items, Please contact MarlinDesk Support."_s);
-    fillColumn(notes, {{"QTNNO"_L1, quote.value(u"QTNNO"_s)}, {"Subquote"_L1, quote.value(u"Subquote"_s)}});
+    setColumns(notes, {{"QTNNO"_L1, quote.value(u"QTNNO"_s)}, {"Subquote"_L1, quote.value(u"Subquote"_s)}});
     notes.update();
     if (lines.recordCount() > 0)
         lines.moveFirst();  // a search without a match has left them at their end, and the totals would be 0

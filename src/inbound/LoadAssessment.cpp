@@ -1,5 +1,7 @@
 // Loads the answers to a sent quote: submission responses, adjustments, assessment results and their back-outs.
 #include "base/QuoteKey.h"
+#include "base/modDBAccess.h"
+#include "inbound/Loading.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
 #include "platform/Prompt.h"

@@ -2,6 +2,10 @@
 #include "base/Helpers.h"
 #include "base/QuoteKey.h"
 #include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
+#include "inbound/LoadQuoteBody.h"
+#include "inbound/Loading.h"
+#include "inbound/NextNumbers.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
 #include "platform/Prompt.h"
@@ -127,7 +131,7 @@ QuoteKey matchMain(const ManualQuote& manual, const db::Recordset& cinfo)
 void fillHeader(db::Recordset& quote, const ManualQuote& manual, const QuoteKey& key, const db::Recordset& insurer,
                 const db::Recordset& cinfo)
 {
-    fillColumn(quote, {
+    setColumns(quote, {
                           {"KESTQRNo"_L1, manual.request},
                           {"KESTQuoteNo"_L1, manual.networkNumber},
                           {"Claim"_L1, manual.claim},
@@ -223,7 +227,7 @@ bool LoadMANQ(QString& text, const QString& fileName)
     CalcQuoteTotals(quote, lines);
     quote.update();
 
-    fillColumn(notes, {{"QTNNO"_L1, quote.value(u"QTNNO"_s)}, {"Subquote"_L1, quote.value(u"Subquote"_s)}});
+    setColumns(notes, {{"QTNNO"_L1, quote.value(u"QTNNO"_s)}, {"Subquote"_L1, quote.value(u"Subquote"_s)}});
     notes.update();
     PrintXML(fileName, false);
     gsMatchedQTNNO = quote.text(u"QTNNO"_s);

@@ -1,6 +1,9 @@
 // Loads a quote request, which becomes a new quote without lines, with its car, customer, note and photographs.
 #include "base/Helpers.h"
 #include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
+#include "inbound/Loading.h"
+#include "inbound/NextNumbers.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
 #include "platform/database/Sql.h"
@@ -122,7 +125,7 @@ db::Recordset openCustomer(const db::Recordset& car, const Request& request)
 void fillCustomer(db::Recordset& customer, const Request& request)
 {
     const QString none = u""_s;
-    fillColumn(customer, {
+    setColumns(customer, {
                              {"NAME"_L1, request.companyName.isEmpty() ? request.surname : request.companyName},
                              {"FIRSTNAME"_L1, request.firstName},
                              {"SALUTATION"_L1, request.title},
@@ -148,7 +151,7 @@ QString colourOf(const QString& code, db::Recordset& colours)
 void fillNewCar(db::Recordset& car, const Request& request, const db::Recordset& model, db::Recordset& colours)
 {
     const QString none = u""_s;
-    fillColumn(car, {
+    setColumns(car, {
                         {"PAINT_GP"_L1, paintGroupOfCode(request.paintType)},
                         {"REGO"_L1, request.rego},
                         {"KEST"_L1, 1},
@@ -176,7 +179,7 @@ void fillNewCar(db::Recordset& car, const Request& request, const db::Recordset&
 void fillQuote(db::Recordset& quote, const QString& quoteNumber, const Request& request, const db::Recordset& insurer,
                const db::Recordset& cinfo)
 {
-    fillColumn(quote, {
+    setColumns(quote, {
                           {"QUOTER"_L1, u""_s},
                           {"QTNNO"_L1, quoteNumber},
                           {"Subquote"_L1, 0},
@@ -277,7 +280,7 @@ bool LoadQREQ(QString& text, const QString& fileName)
         notes.addNew();
 
     fillQuote(quote, quoteNumber, request, insurer, cinfo);
-    fillColumn(notes, {{"QTNNO"_L1, quoteNumber}, {"Subquote"_L1, 0}});
+    setColumns(notes, {{"QTNNO"_L1, quoteNumber}, {"Subquote"_L1, 0}});
     applyTransition(quoteRequested, quote, notes);
     if (!customerFound)
         fillCustomer(customer, request);
@@ -310,40 +313,6 @@ bool LoadQREQ(QString& text, const QString& fileName)
         cinfo.update();
     }
     return true;
-}
-
-QString NextQuoteNumber(const QString& given, const db::Recordset& cinfo, db::Recordset& quote, bool valueOnly)
-{
-    const QString prefix = cinfo.text(u"QUOTE_PRE"_s);
-    const QString suffix = cinfo.text(u"QUOTE_SUF"_s);
-    const auto isTaken = [&](const QString& number) {
-        if (quote.isOpen())
-            quote.close();
-        quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}'", valueOnly ? prefix + number + suffix : number));
-        return !quote.eof();
-    };
-    const auto counted = [&](const QString& value) { return valueOnly ? value : prefix + value + suffix; };
-
-    const bool usable = given != u"MANQ"_s && given.size() >= 2 && given.size() <= 8;
-    QString number = usable ? given : counted(toText(cinfo.value(u"QUOTE_VAL"_s)));
-    for (qint64 counter = 1; isTaken(number); ++counter)
-        number = counted(QString::number(toLong(cinfo.value(u"QUOTE_VAL"_s)) + counter));
-    return number;
-}
-
-int NextImageNumber(const QString& quoteNumber)
-{
-    int highest = 0;
-    for (const QString& name : files::list(gsImagesPath, quoteNumber + u"_*"_s)) {
-        // the digits follow the quote number, "_" and the digit of the subquote; names match in any case
-        if (!name.startsWith(quoteNumber + u'_', Qt::CaseInsensitive))
-            continue;
-        bool isNumber = false;
-        const int number = name.sliced(quoteNumber.size()).mid(2, 3).toInt(&isNumber);
-        if (isNumber)
-            highest = qMax(highest, number);
-    }
-    return highest + 1;
 }
 
 }  // namespace kest

@@ -1,7 +1,10 @@
-// Applies the lines of a message to a quote, section by section. Each line says how it changes the quote.
+#include "inbound/LoadQuoteBody.h"
+
 #include "base/QuoteKey.h"
+#include "base/modDBAccess.h"
 #include "base/modLoggerEx.h"
-#include "inbound/modLoadXML.h"
+#include "inbound/Loading.h"
+#include "inbound/NextNumbers.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
@@ -96,7 +99,7 @@ bool standOnRow(db::Recordset& rows, Change change, qint64 number)
 void fillKey(db::Recordset& row, const db::Recordset& quote, qint64 number)
 {
     const QuoteKey key = QuoteKey::fromRow(quote);
-    fillColumn(row, {{"QTNNO"_L1, quote.value(u"QTNNO"_s)},
+    setColumns(row, {{"QTNNO"_L1, quote.value(u"QTNNO"_s)},
                      {"Subquote"_L1, quote.value(u"Subquote"_s)},
                      {"SEQ_NO"_L1, NextLineNumber(number, key.number, key.subquote)}});
 }
@@ -122,7 +125,7 @@ void storeWithItemNo(db::Recordset& row)
 void fillLabourAmount(db::Recordset& row, const LabourType& type, const QString& script, const QString& amount)
 {
     const bool isOther = type.code == labour::other.code;
-    fillColumn(row, {{"category"_L1, QString(type.category)},
+    setColumns(row, {{"category"_L1, QString(type.category)},
                      {"script"_L1, script},
                      {type.amountColumn, toDouble(amount)},
                      {"rr_rate2"_L1, isOther ? 0 : 1}});
@@ -143,7 +146,7 @@ void takeLabour(const db::Recordset& quote, db::Recordset& row, const Line& line
     if (const LabourType* known = labourTypeOfCode(type))
         fillLabourAmount(row, *known, script, amount);
     fillWhereEmpty(row, u"allow_tick"_s, tickOfNewLine);
-    fillColumn(row, {{"opg_rate"_L1, 0},
+    setColumns(row, {{"opg_rate"_L1, 0},
                      {"Tag"_L1, 1},
                      {"delitem"_L1, false},
                      {"VENDOR"_L1, 0},
@@ -181,7 +184,7 @@ void takePart(const db::Recordset& quote, db::Recordset& row, const Line& line)
         return;
 
     fillKey(row, quote, number);
-    fillColumn(
+    setColumns(
         row,
         {{"category"_L1, u"PRT"_s}, {"script"_L1, description.left(descriptionLength)}, {"PartNo"_L1, partNumber}});
     if (const auto mark = markOfPartType(type))
@@ -192,9 +195,9 @@ void takePart(const db::Recordset& quote, db::Recordset& row, const Line& line)
     else
         row.set(u"qty"_s, quantity);
     const double price = toDouble(priceText);
-    fillColumn(row, {{"unitcost"_L1, price}, {"rrhour"_L1, price + price * toDouble(percentageText) / 100}});
+    setColumns(row, {{"unitcost"_L1, price}, {"rrhour"_L1, price + price * toDouble(percentageText) / 100}});
     fillSide(row, description);
-    fillColumn(row, {{"VENDOR"_L1, 0}, {"blend"_L1, 0}, {"Tag"_L1, 1}, {"delitem"_L1, false}, {"tosend"_L1, u"A"_s}});
+    setColumns(row, {{"VENDOR"_L1, 0}, {"blend"_L1, 0}, {"Tag"_L1, 1}, {"delitem"_L1, false}, {"tosend"_L1, u"A"_s}});
     storeWithItemNo(row);
 }
 
@@ -218,9 +221,9 @@ void takePaint(const db::Recordset& quote, db::Recordset& row, const Line& line)
 
     fillKey(row, quote, number);
     fillWhereEmpty(row, u"category"_s, u"PAINT"_s);  // other paint work keeps its category when it is changed
-    fillColumn(row, {{"script"_L1, script}, {"pthour"_L1, toDouble(amount)}});
+    setColumns(row, {{"script"_L1, script}, {"pthour"_L1, toDouble(amount)}});
     fillWhereEmpty(row, u"blend"_s, 0);
-    fillColumn(row, {{"Tag"_L1, 1}, {"delitem"_L1, false}, {"tosend"_L1, u"A"_s}, {"rr_rate2"_L1, 1}});
+    setColumns(row, {{"Tag"_L1, 1}, {"delitem"_L1, false}, {"tosend"_L1, u"A"_s}, {"rr_rate2"_L1, 1}});
     fillWhereEmpty(row, u"allow_tick"_s, tickOfNewLine);
     row.set(u"opg_rate"_s, 1);
     storeWithItemNo(row);
@@ -283,10 +286,10 @@ void takeSublet(const db::Recordset& quote, db::Recordset& row, const Line& line
         return;
 
     fillKey(row, quote, told.number);
-    fillColumn(row,
+    setColumns(row,
                {{"category"_L1, u"MIS"_s}, {"script"_L1, told.description.left(descriptionLength)}, {"blend"_L1, 0}});
     if (line.change == Change::Insert) {
-        fillColumn(row, {{"Report_on"_L1, 0},
+        setColumns(row, {{"Report_on"_L1, 0},
                          {"delitem"_L1, false},
                          {"tosend"_L1, u"A"_s},
                          {"unitcost"_L1, 0},

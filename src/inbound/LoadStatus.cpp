@@ -1,6 +1,8 @@
 // Loads the six messages that change the state of a quote but not its lines.
 #include "base/QuoteKey.h"
 #include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
+#include "inbound/Loading.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
 #include "platform/Prompt.h"

@@ -1,7 +1,9 @@
-// Finds the numbers that a message leaves open: those of lines and of their documents, and item codes.
+#include "inbound/NextNumbers.h"
+
 #include "base/Helpers.h"
 #include "base/QuoteKey.h"
-#include "inbound/modLoadXML.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
@@ -73,6 +75,49 @@ struct LastNumber {
 LastNumber lastNumber;
 
 }  // namespace
+
+std::unique_ptr<db::Lock> lockNewQuotes()
+{
+    constexpr int patience = 20;  // seconds; a load holds the lock for less than one
+    auto lock = std::make_unique<db::Lock>(gConn, u"new quote"_s, patience);
+    if (!lock->isHeld())
+        throw RuntimeError(StatementFailed, u"Another workstation is creating a quote."_s);
+    return lock;
+}
+
+QString NextQuoteNumber(const QString& given, const db::Recordset& cinfo, db::Recordset& quote, bool valueOnly)
+{
+    const QString prefix = cinfo.text(u"QUOTE_PRE"_s);
+    const QString suffix = cinfo.text(u"QUOTE_SUF"_s);
+    const auto isTaken = [&](const QString& number) {
+        if (quote.isOpen())
+            quote.close();
+        quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}'", valueOnly ? prefix + number + suffix : number));
+        return !quote.eof();
+    };
+    const auto counted = [&](const QString& value) { return valueOnly ? value : prefix + value + suffix; };
+
+    const bool usable = given != u"MANQ"_s && given.size() >= 2 && given.size() <= 8;
+    QString number = usable ? given : counted(toText(cinfo.value(u"QUOTE_VAL"_s)));
+    for (qint64 counter = 1; isTaken(number); ++counter)
+        number = counted(QString::number(toLong(cinfo.value(u"QUOTE_VAL"_s)) + counter));
+    return number;
+}
+
+int NextImageNumber(const QString& quoteNumber)
+{
+    int highest = 0;
+    for (const QString& name : files::list(gsImagesPath, quoteNumber + u"_*"_s)) {
+        // the digits follow the quote number, "_" and the digit of the subquote; names match in any case
+        if (!name.startsWith(quoteNumber + u'_', Qt::CaseInsensitive))
+            continue;
+        bool isNumber = false;
+        const int number = name.sliced(quoteNumber.size()).mid(2, 3).toInt(&isNumber);
+        if (isNumber)
+            highest = qMax(highest, number);
+    }
+    return highest + 1;
+}
 
 qint64 NextLineNumber(qint64 number, const QString& qtnno, const QString& subquote)
 {

@@ -1,6 +1,6 @@
 // Tests the load of authorised quotes: which quote they find, what is refused, and what is stored.
 #include "base/modDBAccess.h"
-#include "inbound/modLoadXML.h"
+#include "inbound/LoadQuoteBody.h"
 #include "support/Shop.h"
 
 #include <QFile>

@@ -1,5 +1,7 @@
 // Tests what the lines of a message change in a quote, by section, by change indicator, and with bad values.
-#include "inbound/modLoadXML.h"
+#include "base/modDBAccess.h"
+#include "inbound/LoadQuoteBody.h"
+#include "inbound/NextNumbers.h"
 #include "messages/Envelope.h"
 #include "sublets/SubletDocuments.h"
 #include "support/Shop.h"

@@ -1,4 +1,5 @@
-#include "inbound/modLoadXML.h"
+#include "base/modDBAccess.h"
+#include "inbound/NextNumbers.h"
 #include "support/Shop.h"
 
 namespace kest::test {

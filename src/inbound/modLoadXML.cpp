@@ -1,15 +1,13 @@
+#include "inbound/modLoadXML.h"
+
 #include "base/Helpers.h"
-#include "base/QuoteKey.h"
 #include "base/SharedVariables.h"
 #include "base/modLoggerEx.h"
-#include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
 #include "messages/Folders.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
-#include "platform/database/Sql.h"
 #include "platform/files/files.h"
-#include "platform/values.h"
 
 #include <QStringList>
 
@@ -89,7 +87,7 @@ void withdrawWaitingRequests(const QString& requestNumber)
     }
 }
 
-bool Load(QString& text, const QString& fileName)
+bool load(QString& text, const QString& fileName)
 {
     xml::Document message = parsedMessage(text);
     if (message.parseError().errorCode == xml::BareAmpersand && escapeAmpersands(text))
@@ -121,70 +119,11 @@ bool Load(QString& text, const QString& fileName)
 bool LoadXML(QString& text, const QString& fileName)
 {
     try {
-        return Load(text, fileName);
+        return load(text, fileName);
     } catch (const RuntimeError& error) {
         LogError(error, u"modLoadXML.LoadXML"_s, u"LoadXML"_s);
         return false;
     }
-}
-
-std::unique_ptr<db::Lock> lockNewQuotes()
-{
-    constexpr int patience = 20;  // seconds; a load holds the lock for less than one
-    auto lock = std::make_unique<db::Lock>(gConn, u"new quote"_s, patience);
-    if (!lock->isHeld())
-        throw RuntimeError(StatementFailed, u"Another workstation is creating a quote."_s);
-    return lock;
-}
-
-void fillColumn(db::Recordset& row, std::initializer_list<Column> columns)
-{
-    for (const Column& column : columns)
-        row.set(column.name, column.value);
-}
-
-void fillWithoutTotals(db::Recordset& quote)
-{
-    for (const char16_t* column : {u"RR_TOTAL", u"RA_TOTAL", u"PAINT_TOTAL", u"TOTAL", u"PRTTOTAL", u"MISTOTAL",
-                                   u"override", u"rr_override", u"ra_override", u"paint_override", u"CONTACTID"})
-        quote.set(QString::fromUtf16(column), 0);
-    fillColumn(quote, {{"quotechanged"_L1, true}, {"invoiced"_L1, false}});
-}
-
-void respellColour(db::Recordset& car, db::Recordset& colours)
-{
-    const QString colour = car.text(u"COLOUR"_s);
-    if (colour.isEmpty())
-        return;
-    colours.find(sql("Script='{}'", colour));
-    car.set(u"COLOUR"_s, colours.eof() ? u""_s : colours.text(u"Script"_s).trimmed());
-}
-
-db::Recordset openNotes(const db::Recordset& quote)
-{
-    return opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quote.value(u"QTNNO"_s),
-                      quote.value(u"Subquote"_s)));
-}
-
-bool isUnknown(const QString& number, const db::Recordset& quote)
-{
-    return number.trimmed().isEmpty() || quote.eof();
-}
-
-bool refuse(const QString& text)
-{
-    desktop::msgBox(text, desktop::Icon::Critical);
-    return false;
-}
-
-bool isSupplementary(const db::Recordset& quote)
-{
-    return toLong(quote.value(u"Subquote"_s)) > 0;
-}
-
-QString quoteLabel(const db::Recordset& quote)
-{
-    return QuoteKey::fromRow(quote).reference();
 }
 
 }  // namespace kest

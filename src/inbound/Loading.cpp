@@ -1,0 +1,63 @@
+#include "inbound/Loading.h"
+
+#include "base/QuoteKey.h"
+#include "base/modDBAccess.h"
+#include "platform/Prompt.h"
+#include "platform/database/Sql.h"
+#include "platform/values.h"
+
+namespace kest {
+
+using namespace Qt::StringLiterals;
+
+void setColumns(db::Recordset& row, std::initializer_list<ColumnValue> columns)
+{
+    for (const ColumnValue& column : columns)
+        row.set(column.name, column.value);
+}
+
+void fillWithoutTotals(db::Recordset& quote)
+{
+    for (const char16_t* column : {u"RR_TOTAL", u"RA_TOTAL", u"PAINT_TOTAL", u"TOTAL", u"PRTTOTAL", u"MISTOTAL",
+                                   u"override", u"rr_override", u"ra_override", u"paint_override", u"CONTACTID"})
+        quote.set(QString::fromUtf16(column), 0);
+    setColumns(quote, {{"quotechanged"_L1, true}, {"invoiced"_L1, false}});
+}
+
+void respellColour(db::Recordset& car, db::Recordset& colours)
+{
+    const QString colour = car.text(u"COLOUR"_s);
+    if (colour.isEmpty())
+        return;
+    colours.find(sql("Script='{}'", colour));
+    car.set(u"COLOUR"_s, colours.eof() ? u""_s : colours.text(u"Script"_s).trimmed());
+}
+
+db::Recordset openNotes(const db::Recordset& quote)
+{
+    return opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quote.value(u"QTNNO"_s),
+                      quote.value(u"Subquote"_s)));
+}
+
+bool isUnknown(const QString& number, const db::Recordset& quote)
+{
+    return number.trimmed().isEmpty() || quote.eof();
+}
+
+bool refuse(const QString& text)
+{
+    desktop::msgBox(text, desktop::Icon::Critical);
+    return false;
+}
+
+bool isSupplementary(const db::Recordset& quote)
+{
+    return toLong(quote.value(u"Subquote"_s)) > 0;
+}
+
+QString quoteLabel(const db::Recordset& quote)
+{
+    return QuoteKey::fromRow(quote).reference();
+}
+
+}  // namespace kest

@@ -1,0 +1,36 @@
+// What the loaders share: how they fill rows and how they refuse.
+#pragma once
+
+#include "platform/database/Recordset.h"
+
+#include <QString>
+#include <QVariant>
+
+#include <initializer_list>
+
+namespace kest {
+
+/// The name of a column and a value for it.
+struct ColumnValue {
+    QLatin1StringView name;
+    QVariant value;
+};
+/// Sets columns of the current row in this order.
+void setColumns(db::Recordset& row, std::initializer_list<ColumnValue> columns);
+/// Sets the totals and the host's overrides to 0, and marks the quote as changed for the host.
+void fillWithoutTotals(db::Recordset& quote);
+/// Changes a car's colour to the spelling of the colour table, or clears it if the table does not have the colour.
+void respellColour(db::Recordset& car, db::Recordset& colours);
+/// Opens the quote's row of long texts, which contains the notes.
+db::Recordset openNotes(const db::Recordset& quote);
+/// Returns true if a number in a message leads to no quote. An empty number is always unknown, because quotes of the
+/// host may have an empty number too.
+bool isUnknown(const QString& number, const db::Recordset& quote);
+/// Shows a critical box that says why a message is refused. Returns false.
+bool refuse(const QString& text);
+/// Returns true if the subquote is above 0.
+bool isSupplementary(const db::Recordset& quote);
+/// Returns "123", or "123/2" for a supplementary quote.
+QString quoteLabel(const db::Recordset& quote);
+
+}  // namespace kest
