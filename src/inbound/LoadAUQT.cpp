@@ -1,6 +1,5 @@
 // Loads an authorised quote: the insurer accepts a quote, unchanged or with changed lines, under an authority number.
 #include "base/Helpers.h"
-#include "base/QuoteKey.h"
 #include "base/modDBAccess.h"
 #include "base/modLoggerEx.h"
 #include "inbound/LoadQuoteBody.h"
@@ -12,6 +11,7 @@
 #include "platform/database/Sql.h"
 #include "platform/values.h"
 #include "quotedata/NoteChain.h"
+#include "quotedata/Quote.h"
 #include "quotedata/QuoteTotals.h"
 #include "quotedata/Rounding.h"
 #include "quotedata/StateTable.h"
@@ -75,27 +75,26 @@ Authorisation::Authorisation(const xml::Document& message)
     reference = element("quoteBody/rootns:quoteReference"_L1);
 }
 
-/// Opens the quote with that key. If there is none, opens the quote with the message's request, network number and
+/// Returns the quote with that key. If there is none, returns the quote with the message's request, network number and
 /// registration, and sets `key` to its key. If several match, the first is current and `key` stays as it is.
-db::Recordset openQuote(const Authorisation& told, QuoteKey& key)
+Quote findQuote(const Authorisation& told, QuoteKey& key)
 {
-    db::Recordset quote =
-        opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key.number, key.subquote));
-    if (!quote.eof() || told.originalNumber.trimmed().isEmpty())
-        return quote;
-    quote = opened(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' AND KESTQuoteNo='{}' AND REGO = '{}'", told.request,
-                       told.originalNumber, told.rego));
-    if (quote.recordCount() == 1)
-        key = QuoteKey::fromRow(quote);
-    return quote;
+    Quote named(key);
+    if (named.exists() || told.originalNumber.trimmed().isEmpty())
+        return named;
+    db::Recordset header = opened(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' AND KESTQuoteNo='{}' AND REGO = '{}'",
+                                      told.request, told.originalNumber, told.rego));
+    if (header.recordCount() == 1)
+        key = QuoteKey::fromRow(header);
+    const QString subquote = header.eof() ? QString() : header.text(u"Subquote"_s);
+    return Quote({key.number, subquote}, std::move(header));
 }
 
 /// Stores the excess and the customer's contribution, which only a main quote has. An amount that is empty in the quote
 /// stays empty.
 void takeOverMoney(const Authorisation& told, const QuoteKey& key)
 {
-    db::Recordset quote =
-        opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key.number, key.subquote));
+    db::Recordset quote = Quote::openHeader(key);
     const auto has = [&](const QString& column) { return !quote.text(column).trimmed().isEmpty(); };
 
     const double excess = SafeVal(told.excess, u"0"_s);
@@ -165,17 +164,15 @@ bool authorise(QString& text)
     const Authorisation told(message);
     QuoteKey key = QuoteKey::fromReference(told.reference);
 
-    db::Recordset quote = openQuote(told, key);
+    Quote found = findQuote(told, key);
+    db::Recordset& quote = found.header();
     if (quote.eof())
         return refuse(u"Couldn't Locate Matching KEST Quote, Please contact MarlinDesk Support."_s);
     const QString rego = told.rego == unknownRego ? quote.text(u"REGO"_s) : told.rego;
-    const QVariant rowSubquote = quote.value(u"Subquote"_s);
-    db::Recordset lines =
-        opened(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key.number, rowSubquote));
+    db::Recordset& lines = found.lines();
     if (lines.eof())
         return refusePlainly(u"Error: Cannot load an Authorisation onto a blank quote!"_s);
-    db::Recordset notes =
-        opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key.number, rowSubquote));
+    db::Recordset& notes = found.notes();
     db::Recordset car = opened(sql("SELECT * FROM CAR WHERE REGO='{}'", rego));
     const db::Recordset insurer =
         opened(sql("SELECT * FROM INSURER WHERE INSURER_ID={}", quote.value(u"INSURER_ID"_s)));

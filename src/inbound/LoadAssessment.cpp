@@ -1,5 +1,4 @@
 // Loads the answers to a sent quote: submission responses, adjustments, assessment results and their back-outs.
-#include "base/QuoteKey.h"
 #include "base/modDBAccess.h"
 #include "inbound/Loading.h"
 #include "inbound/modLoadXML.h"
@@ -8,6 +7,7 @@
 #include "platform/database/Sql.h"
 #include "quotedata/NetworkCodes.h"
 #include "quotedata/NoteChain.h"
+#include "quotedata/Quote.h"
 #include "quotedata/StateTable.h"
 #include "reports/PrintXML.h"
 
@@ -26,14 +26,14 @@ bool refuseRequestNumber()
 
 /// Returns the state that a quote goes back to. Only an authorised quote has an authority number, and only a rejected
 /// supplementary quote has a note that says so.
-const Transition& backOutOf(const db::Recordset& quote, const db::Recordset& notes)
+const Transition& backOutOf(Quote& quote)
 {
-    if (!isSupplementary(quote))
-        return quote.text(u"KESTAuthNo"_s).isEmpty() ? failedTenderBackedOut : authorisationBackedOut;
-    const QString remarks = notes.text(u"remarks"_s);
+    if (!quote.isSupplementary())
+        return quote.header().text(u"KESTAuthNo"_s).isEmpty() ? failedTenderBackedOut : authorisationBackedOut;
+    const QString remarks = quote.notes().text(u"remarks"_s);
     bool rejected = !GetNoteStatus(u"Rejected"_s, remarks).isEmpty();
     if (!rejected && remarks.contains(u"Rejected"_s))  // the first such note may be that of an earlier back-out
-        rejected = quote.isNull(u"AuthDate"_s);
+        rejected = quote.header().isNull(u"AuthDate"_s);
     return rejected ? rejectionBackedOut : supplementaryBackedOut;
 }
 
@@ -46,24 +46,21 @@ bool LoadADQT(QString& text, const QString& fileName)
         message.textOf(u"//rootns:getAdjustedQuoteResponse/rootns:quoteBody/rootns:quoteReference"_s));
     const QString request = message.textOf(u"//rootns:quoteRequestNumber"_s);
 
-    db::Recordset quote = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}' AND KESTQRNo='{}'",
-                                     key.number, key.subquote, request));
-    if (quote.eof() && !request.trimmed().isEmpty())
-        quote = opened(sql("SELECT TOP 1 * FROM QUOTE1 WHERE KESTQRNo='{}' order by rec_id DESC", request));
-    if (quote.eof())
+    db::Recordset header = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}' AND KESTQRNo='{}'",
+                                      key.number, key.subquote, request));
+    if (header.eof() && !request.trimmed().isEmpty())
+        header = opened(sql("SELECT TOP 1 * FROM QUOTE1 WHERE KESTQRNo='{}' order by rec_id DESC", request));
+    if (header.eof())
         return refuse(u"Error locating Quote in Database, Please contact Marlindesk Support."_s);
-
-    const db::Recordset lines = opened(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'",
-                                           quote.value(u"QTNNO"_s), quote.value(u"Subquote"_s)));
-    db::Recordset notes = openNotes(quote);
-    if (lines.eof()) {
+    Quote quote(std::move(header));
+    if (quote.lines().eof()) {
         desktop::msgBox(u"Error: Cannot load an Adjustment onto a blank quote!"_s);
         return false;
     }
 
-    applyTransition(adjustmentSuggested, quote, notes);
-    quote.update();
-    notes.update();
+    applyTransition(adjustmentSuggested, quote);
+    quote.header().update();
+    quote.notes().update();
     PrintXML(fileName, false);
     return true;
 }
@@ -72,18 +69,18 @@ bool LoadARES(QString& text, const QString&)
 {
     const xml::Document message = parsedMessage(text);
     const QString number = message.textOf(u"//rootns:getAssmntResultResponse/rootns:kestOriginalQuoteNumber"_s);
-    db::Recordset quote = opened(sql("SELECT * FROM QUOTE1 WHERE KESTQuoteNo='{}' ORDER BY rec_id DESC", number));
-    if (isUnknown(number, quote))
+    db::Recordset header = opened(sql("SELECT * FROM QUOTE1 WHERE KESTQuoteNo='{}' ORDER BY rec_id DESC", number));
+    if (isUnknown(number, header))
         return refuseRequestNumber();
-    quote.moveLast();  // the oldest quote with that number
-    db::Recordset notes = openNotes(quote);
+    header.moveLast();  // the oldest quote with that number
+    Quote quote(std::move(header));
 
     const QString code = message.textOf(u"//rootns:getAssmntResultResponse/rootns:reasonCode"_s).toUpper();
     const Transition& lost = code == u"TLSS"_s ? totalLoss : tenderFailed;
-    applyTransition(isSupplementary(quote) ? supplementaryRejected : lost, quote, notes,
+    applyTransition(quote.isSupplementary() ? supplementaryRejected : lost, quote,
                     reasonOfCode(code).value_or(u"Unknown Reason Code - "_s + code));
-    quote.update();
-    notes.update();
+    quote.header().update();
+    quote.notes().update();
     return true;
 }
 
@@ -91,31 +88,28 @@ bool LoadBACA(QString& text, const QString& fileName)
 {
     const xml::Document message = parsedMessage(text);
     const QString request = message.textOf(u"//rootns:getBackoutAssmntResponse/rootns:kestQuoteRequestNumber"_s);
-    db::Recordset quote = opened(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request));
-    if (isUnknown(request, quote))
+    // the first is the newest quote of the request
+    Quote quote(opened(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request)));
+    if (isUnknown(request, quote.header()))
         return refuseRequestNumber();
-    db::Recordset notes = openNotes(quote);  // of the newest quote of the request
 
-    applyTransition(backOutOf(quote, notes), quote, notes);
-    quote.update();
-    notes.update();
+    applyTransition(backOutOf(quote), quote);
+    quote.header().update();
+    quote.notes().update();
     PrintXML(fileName, false);
     return true;
 }
 
 void LoadSubmissionResponse(QString& text, const QString& fileName)
 {
-    const auto [number, subquote] = QuoteKey::fromResponseName(fileName);
-    db::Recordset quote = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
-    db::Recordset notes = opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
-
+    Quote quote(QuoteKey::fromResponseName(fileName));
     const xml::Document message = parsedMessage(text);
     const xml::Node root = message.documentElement();
-    quote.set(u"KESTQuoteNo"_s, root.textOf(u"rootns:kestQuoteNumber"_s));
+    quote.header().set(u"KESTQuoteNo"_s, root.textOf(u"rootns:kestQuoteNumber"_s));
     if (root.textOf(u"rootns:quoteSubmissionStatus"_s) == u"Submitted"_s)
-        applyTransition(quoteSubmitted, quote, notes);
-    quote.update();
-    notes.update();
+        applyTransition(quoteSubmitted, quote);
+    quote.header().update();
+    quote.notes().update();
 }
 
 }  // namespace kest

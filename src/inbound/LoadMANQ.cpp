@@ -1,6 +1,5 @@
 // Loads a manual quote: a quote that was written outside the shop's system becomes one of its quotes, with all lines.
 #include "base/Helpers.h"
-#include "base/QuoteKey.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "inbound/LoadQuoteBody.h"
@@ -12,6 +11,7 @@
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
+#include "quotedata/Quote.h"
 #include "quotedata/QuoteTotals.h"
 #include "quotedata/StateTable.h"
 #include "reports/PrintXML.h"
@@ -181,12 +181,11 @@ bool LoadMANQ(QString& text, const QString& fileName)
     if (!key)
         return false;
 
-    db::Recordset quote = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}' ORDER BY rec_id DESC",
-                                     key->number, key->subquote));
-    db::Recordset lines =
-        opened(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key->number, key->subquote));
-    db::Recordset notes =
-        opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key->number, key->subquote));
+    Quote found(*key, opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}' ORDER BY rec_id DESC",
+                                 key->number, key->subquote)));
+    db::Recordset& quote = found.header();
+    db::Recordset& lines = found.lines();
+    db::Recordset& notes = found.notes();
     db::Recordset car = opened(sql("SELECT * FROM CAR WHERE REGO='{}'", manual.rego));
     if (car.eof()) {
         desktop::msgBox(u"Could not find a car with registration number "_s + manual.rego +
@@ -215,9 +214,7 @@ bool LoadMANQ(QString& text, const QString& fileName)
     car.update();
     {
         const std::unique_ptr<db::Lock> newQuotes = lockNewQuotes();
-        const db::Recordset standing =
-            opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key->number, key->subquote));
-        if (isNew && !standing.eof())
+        if (isNew && Quote(*key).exists())
             throw RuntimeError(RowChanged,
                                u"Another workstation has meanwhile created quote %1."_s.arg(key->fullReference()));
         quote.update();

@@ -1,7 +1,5 @@
 #include "inbound/Loading.h"
 
-#include "base/QuoteKey.h"
-#include "base/modDBAccess.h"
 #include "platform/Prompt.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
@@ -33,12 +31,6 @@ void respellColour(db::Recordset& car, db::Recordset& colours)
     car.set(u"COLOUR"_s, colours.eof() ? u""_s : colours.text(u"Script"_s).trimmed());
 }
 
-db::Recordset openNotes(const db::Recordset& quote)
-{
-    return opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quote.value(u"QTNNO"_s),
-                      quote.value(u"Subquote"_s)));
-}
-
 bool isUnknown(const QString& number, const db::Recordset& quote)
 {
     return number.trimmed().isEmpty() || quote.eof();
@@ -48,16 +40,6 @@ bool refuse(const QString& text)
 {
     desktop::msgBox(text, desktop::Icon::Critical);
     return false;
-}
-
-bool isSupplementary(const db::Recordset& quote)
-{
-    return toLong(quote.value(u"Subquote"_s)) > 0;
-}
-
-QString quoteLabel(const db::Recordset& quote)
-{
-    return QuoteKey::fromRow(quote).reference();
 }
 
 }  // namespace kest

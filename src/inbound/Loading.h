@@ -21,16 +21,10 @@ void setColumns(db::Recordset& row, std::initializer_list<ColumnValue> columns);
 void fillWithoutTotals(db::Recordset& quote);
 /// Changes a car's colour to the spelling of the colour table, or clears it if the table does not have the colour.
 void respellColour(db::Recordset& car, db::Recordset& colours);
-/// Opens the quote's row of long texts, which contains the notes.
-db::Recordset openNotes(const db::Recordset& quote);
 /// Returns true if a number in a message leads to no quote. An empty number is always unknown, because quotes of the
 /// host may have an empty number too.
 bool isUnknown(const QString& number, const db::Recordset& quote);
 /// Shows a critical box that says why a message is refused. Returns false.
 bool refuse(const QString& text);
-/// Returns true if the subquote is above 0.
-bool isSupplementary(const db::Recordset& quote);
-/// Returns "123", or "123/2" for a supplementary quote.
-QString quoteLabel(const db::Recordset& quote);
 
 }  // namespace kest

@@ -1,7 +1,7 @@
 #include "jobexport/Address.h"
 
-#include "platform/values.h"
 #include "base/Helpers.h"
+#include "platform/values.h"
 
 namespace kest::joblink {
 

@@ -1,15 +1,15 @@
 #include "jobexport/WriteQuote.h"
 
-#include "jobexport/Address.h"
-#include "platform/RuntimeError.h"
-#include "platform/database/Recordset.h"
-#include "platform/database/Sql.h"
-#include "platform/Prompt.h"
-#include "platform/values.h"
-#include "quotedata/Rounding.h"
 #include "base/CredentialCipher.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
+#include "jobexport/Address.h"
+#include "platform/Prompt.h"
+#include "platform/RuntimeError.h"
+#include "platform/database/Recordset.h"
+#include "platform/database/Sql.h"
+#include "platform/values.h"
+#include "quotedata/Rounding.h"
 
 #include <array>
 #include <utility>

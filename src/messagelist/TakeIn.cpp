@@ -1,13 +1,11 @@
 #include "messagelist/TakeIn.h"
 
-#include "base/QuoteKey.h"
 #include "base/SharedVariables.h"
-#include "base/modDBAccess.h"
 #include "messages/Envelope.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
-#include "platform/database/Sql.h"
 #include "platform/files/files.h"
+#include "quotedata/Quote.h"
 
 #include <QFileInfo>
 
@@ -33,8 +31,7 @@ void checkResponse(const xml::Document& document, const QString& name)
     if (document.textOrEmptyOf(u"rootns:kestQuoteNumber"_s).isEmpty() ||
         document.textOrEmptyOf(u"rootns:quoteSubmissionStatus"_s).isEmpty())
         throw Refusal{u"it is not a response of the network"_s};
-    const QuoteKey quote = QuoteKey::fromResponseName(name);
-    if (opened(sql("SELECT QTNNO FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quote.number, quote.subquote)).eof())
+    if (Quote::openHeader(QuoteKey::fromResponseName(name)).eof())
         throw Refusal{u"the quote that it answers does not exist"_s};
 }
 

@@ -4,6 +4,7 @@
 #include "outbound/QuoteRows.h"
 #include "platform/database/Sql.h"
 #include "quotedata/NetworkCodes.h"
+#include "quotedata/Quote.h"
 
 using namespace Qt::StringLiterals;
 
@@ -22,8 +23,7 @@ QString digitsOf(const QString& text)
 
 }  // namespace
 
-ExtraInfo::ExtraInfo(const QuoteKey& key)
-    : quoteRow(opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key.number, key.subquote)))
+ExtraInfo::ExtraInfo(const QuoteKey& key) : quoteRow(Quote::openHeader(key))
 {
     if (quoteRow.recordCount() != 1) {
         missing = u"Couldn't locate quote in database, Please contact MarlinDesk Support"_s;

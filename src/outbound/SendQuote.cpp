@@ -1,7 +1,6 @@
 #include "outbound/SendQuote.h"
 
 #include "base/Helpers.h"
-#include "base/QuoteKey.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "outbound/modCreateXML.h"
@@ -9,6 +8,7 @@
 #include "platform/database/Sql.h"
 #include "platform/values.h"
 #include "quotedata/NoteChain.h"
+#include "quotedata/Quote.h"
 #include "quotedata/QuoteTotals.h"
 
 using namespace Qt::StringLiterals;
@@ -46,14 +46,13 @@ QString mainQuoteRefusal(const db::Recordset& quote, const QString& remarks)
 /// Returns why the quote can't be sent, or an empty text if it can.
 QString refusalOf(const db::Recordset& quote, const QuoteKey& key)
 {
-    const auto& [number, subquote] = key;
-    const db::Recordset zeroQuantities = opened(
-        sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}' AND CATEGORY='PRT' AND QTY=0", number, subquote));
+    const db::Recordset zeroQuantities =
+        opened(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}' AND CATEGORY='PRT' AND QTY=0", key.number,
+                   key.subquote));
     if (!zeroQuantities.eof())
         return u"Items with a Quantity of 0 cannot be sent to ORLA. Please check the quote details and try again."_s;
 
-    const db::Recordset notes =
-        opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", number, subquote));
+    const db::Recordset notes = Quote::openNotes(key);
     const QString remarks = notes.eof() ? QString() : notes.text(u"remarks"_s);
     if (quote.recordCount() == 0)
         return quoteNotFound;
@@ -89,7 +88,7 @@ double SendQuote(db::Recordset& quote, bool* sent)
     if (quote.eof())
         return refuse(quoteNotFound);
     const QuoteKey key{number, quote.text(u"Subquote"_s)};
-    quote = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key.number, key.subquote));
+    quote = Quote::openHeader(key);
 
     if (const QString refusal = refusalOf(quote, key); !refusal.isEmpty())
         return refuse(refusal);

@@ -1,9 +1,9 @@
 #include "quotedata/QuoteTotals.h"
 
-#include "base/modDBAccess.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
+#include "quotedata/Quote.h"
 #include "quotedata/Rounding.h"
 
 using namespace Qt::StringLiterals;
@@ -140,8 +140,7 @@ void CalcAuthorisedTotals(db::Recordset& quote, db::Recordset& lines)
 
 void RoundQuoteLines(db::Recordset& quote)
 {
-    db::Recordset lines = opened(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quote.value(u"QTNNO"_s),
-                                     quote.value(u"Subquote"_s)));
+    db::Recordset lines = Quote::openLines(QuoteKey::fromRow(quote));
     for (; !lines.eof(); lines.moveNext()) {
         for (const auto& column : {u"unitcost"_s, u"rrhour"_s, u"rahour"_s, u"pthour"_s})
             if (!lines.text(column).isEmpty())

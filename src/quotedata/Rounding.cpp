@@ -1,7 +1,7 @@
 #include "quotedata/Rounding.h"
 
-#include "platform/RuntimeError.h"
 #include "platform/Prompt.h"
+#include "platform/RuntimeError.h"
 #include "platform/values.h"
 
 #include <cmath>

@@ -27,4 +27,9 @@ void applyTransition(const Transition& transition, db::Recordset& quote, db::Rec
     notes.set(u"remarks"_s, remarks);
 }
 
+void applyTransition(const Transition& transition, Quote& quote, const QString& told)
+{
+    applyTransition(transition, quote.header(), quote.notes(), told);
+}
+
 }  // namespace kest

@@ -1,7 +1,7 @@
 // One table of what each event of the network changes in a quote. The loaders and the send use it.
 #pragma once
 
-#include "platform/database/Recordset.h"
+#include "quotedata/Quote.h"
 
 #include <QString>
 
@@ -29,6 +29,7 @@ struct Transition {
 /// its note row. `told` replaces "{}" in the notes. The caller must update both rows.
 void applyTransition(const Transition& transition, db::Recordset& quote, db::Recordset& notes,
                      const QString& told = {});
+void applyTransition(const Transition& transition, Quote& quote, const QString& told = {});
 
 // Job_stage: 1 open for quoting, 3 with the insurer, 4 authorised, 9 request cancelled, 10 tender failed. The lock is
 // ReadOnly. Notes: subject, status, detail, whether always new; the last one added is the first in the chain. After the

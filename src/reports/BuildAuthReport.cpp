@@ -1,11 +1,11 @@
 #include "reports/BuildAuthReport.h"
 
-#include "base/QuoteKey.h"
 #include "base/SharedVariables.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
+#include "quotedata/Quote.h"
 #include "quotedata/QuoteTotals.h"
 #include "quotedata/Rounding.h"
 #include "reports/QuoteComparison.h"
@@ -32,14 +32,6 @@ db::Recordset openQuote(const xml::Document& document, const QuoteKey& key, cons
         quote.close();
     }
     return quote;
-}
-
-db::Recordset openLines(const db::Recordset& quote)
-{
-    db::Recordset lines(gConn);
-    lines.open(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quote.value(u"QTNNO"_s),
-                   quote.value(u"Subquote"_s)));
-    return lines;
 }
 
 /// Returns "0" if the message's amount equals that of the main quote, otherwise the message's text.
@@ -103,7 +95,7 @@ QVariant sum(const db::Recordset& row, std::initializer_list<QLatin1StringView> 
 
 db::Recordset buildAuthorised(const xml::Document& document, const QString& number, db::Recordset& quote, bool Reprint)
 {
-    db::Recordset lines = openLines(quote);
+    db::Recordset lines = Quote::openLines(QuoteKey::fromRow(quote));
     const ComparisonHeader header = authorisedHeader(document, number);
     db::Recordset table = openComparison(ComparisonOf::AuthorisedQuote);
     addChangedLines(table, header, document, quote, lines, ComparisonOf::AuthorisedQuote, Reprint);
@@ -159,7 +151,7 @@ bool fillAdjustedReport(db::Recordset& table, const xml::Document& document, boo
         openQuote(document, quoteOf(document), u"Quote not found in database. Please contact MarlinDesk Support."_s);
     if (!quote.isOpen())
         return false;
-    db::Recordset lines = openLines(quote);
+    db::Recordset lines = Quote::openLines(QuoteKey::fromRow(quote));
     addChangedLines(table, readHeader(document, ComparisonOf::AdjustedQuote), document, quote, lines,
                     ComparisonOf::AdjustedQuote, Reprint);
     return true;

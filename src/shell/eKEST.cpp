@@ -5,8 +5,8 @@
 #include "base/modDBAccess.h"
 #include "base/modLoggerEx.h"
 #include "platform/Prompt.h"
-#include "platform/database/Sql.h"
 #include "platform/desktop/Window.h"
+#include "quotedata/Quote.h"
 #include "shell/frmKEST.h"
 
 namespace kest {
@@ -73,8 +73,7 @@ bool openHostQuote(const QString& sQTNNO, const QString& sSubQuote)
 {
     if (!hasConnection())
         return false;
-    grsQuote = std::make_shared<db::Recordset>(gConn);
-    grsQuote->open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", sQTNNO, sSubQuote));
+    grsQuote = std::make_shared<db::Recordset>(Quote::openHeader({sQTNNO, sSubQuote}));
     gsQTNNO = sQTNNO;
     gsSubQuote = sSubQuote;
     return true;

@@ -1,8 +1,8 @@
 // Lists and opens the documents that authorise the sublet work of a quote.
 #pragma once
 
-#include "sublets/SubletDocuments.h"
 #include "platform/desktop/Form.h"
+#include "sublets/SubletDocuments.h"
 
 class QPushButton;
 class QTreeWidget;

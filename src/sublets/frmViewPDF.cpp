@@ -1,7 +1,7 @@
 #include "sublets/frmViewPDF.h"
 
-#include "platform/desktop/Progress.h"
 #include "platform/Prompt.h"
+#include "platform/desktop/Progress.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
 

@@ -8,6 +8,7 @@
 #include "platform/desktop/Window.h"
 #include "platform/values.h"
 #include "quotedata/NoteChain.h"
+#include "quotedata/Quote.h"
 #include "utilities/ExactTextEdit.h"
 #include "utilities/StatusRepair.h"
 
@@ -201,9 +202,9 @@ void frmUtilities::AddTabs()
 
 void frmUtilities::OpenRows()
 {
-    quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", shown.number, shown.subquote));
-    lines.open(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", shown.number, shown.subquote));
-    remarks.open(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'", shown.number, shown.subquote));
+    quote = Quote::openHeader(shown);
+    lines = Quote::openLines(shown);
+    remarks = Quote::openNotes(shown);
 }
 
 void frmUtilities::CloseRows()
@@ -233,9 +234,7 @@ void frmUtilities::TabStrip1_Click()
 {
     EnsureConnection();
     QuoteKey wanted{shown.number, TabStrip1->tabData(TabStrip1->currentIndex()).toString().mid(1)};
-    db::Recordset chosen(gConn);
-    chosen.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", wanted.number, wanted.subquote));
-    if (chosen.eof()) {
+    if (Quote::openHeader(wanted).eof()) {
         const QSignalBlocker silent(TabStrip1);
         TabStrip1->setCurrentIndex(shownTab);
         throw RuntimeError(NoCurrentRow, u"Quote %1 no longer exists."_s.arg(wanted.fullReference()));
@@ -269,9 +268,7 @@ void frmUtilities::Command1_Click()
     close();  // first: the changes are saved even if the host's quote can't be opened
 
     // even if another subquote was edited
-    auto hostQuote = std::make_shared<db::Recordset>(gConn);
-    hostQuote->open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", gsQTNNO, gsSubQuote));
-    grsQuote = hostQuote;
+    grsQuote = std::make_shared<db::Recordset>(Quote::openHeader({gsQTNNO, gsSubQuote}));
 }
 
 void frmUtilities::WriteField(QLatin1StringView name, const QString& column)

@@ -1,0 +1,42 @@
+// A quote's records: the one place that opens header, lines and notes by their key.
+#pragma once
+
+#include "base/QuoteKey.h"
+#include "platform/database/Recordset.h"
+
+#include <optional>
+
+namespace kest {
+
+/// A quote in the host's tables. Opens each of its recordsets on `gConn` when it is first asked for. They can be changed
+/// and updated. Throws RuntimeError if one can't be opened.
+class Quote {
+public:
+    /// The quote with this key.
+    explicit Quote(QuoteKey key);
+    /// A quote that another statement has found. `header` is on its row, or at `eof` if there is none.
+    explicit Quote(db::Recordset header);
+    /// The same, but with the lines and notes of `key`.
+    Quote(QuoteKey key, db::Recordset header);
+
+    const QuoteKey& key() const { return quoteKey; }
+    bool exists() { return !header().eof(); }
+    /// Returns true if the subquote is above 0.
+    bool isSupplementary();
+
+    db::Recordset& header();  // QUOTE1
+    db::Recordset& lines();   // QUOTE2
+    db::Recordset& notes();   // QUOTE3
+
+    static db::Recordset openHeader(const QuoteKey& key);
+    static db::Recordset openLines(const QuoteKey& key);
+    static db::Recordset openNotes(const QuoteKey& key);
+
+private:
+    QuoteKey quoteKey;
+    std::optional<db::Recordset> headerRow;
+    std::optional<db::Recordset> lineRows;
+    std::optional<db::Recordset> noteRow;
+};
+
+}  // namespace kest
