@@ -8,7 +8,7 @@ namespace kest {
 
 namespace {
 
-/// yyyy-MM-dd, alone or with a 24-hour clock, a fraction and a zone mark.
+/// Reads yyyy-MM-dd, alone or with a 24-hour time, a fraction and a zone mark.
 const QRegularExpression& isoForm()
 {
     static const QRegularExpression form(QRegularExpression::anchoredPattern(
@@ -18,7 +18,7 @@ const QRegularExpression& isoForm()
     return form;
 }
 
-/// d/M/yyyy, alone or with a clock of 24 hours, or of 12 with its marker.
+/// Reads d/M/yyyy, alone or with a 24-hour time, or with a 12-hour time and AM or PM.
 const QRegularExpression& shortForm()
 {
     static const QRegularExpression form(QRegularExpression::anchoredPattern(
@@ -28,7 +28,7 @@ const QRegularExpression& shortForm()
     return form;
 }
 
-/// The hour of a 24-hour clock; -1 if the marker does not fit it.
+/// Returns the hour of a 24-hour clock, or -1 if the hour does not fit the marker.
 int hourOf(int hour, const QString& marker)
 {
     if (marker.isEmpty())

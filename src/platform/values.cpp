@@ -14,7 +14,7 @@ namespace kest {
 
 namespace {
 
-/// The forms of a number are in values.h; the blanks around it are not part of what is captured.
+/// The forms of a number are described in values.h. The captured text does not include the blanks around it.
 const QRegularExpression& numberForm()
 {
     static const QRegularExpression form(QRegularExpression::anchoredPattern(
@@ -22,11 +22,12 @@ const QRegularExpression& numberForm()
     return form;
 }
 
-/// The number in a text: infinite if it is too large for the type, 0 if it is too near to 0.
+/// Returns the number in a text: infinity if it is too large for the type, and 0 if it is too near to 0.
 std::optional<double> readNumber(const QString& text)
 {
     bool read = false;
-    const double plain = text.toDouble(&read);  // most texts; it knows no groups, and two words that are no numbers
+    // reads most texts, but not digits in groups; also accepts "inf" and "nan", which are not numbers
+    const double plain = text.toDouble(&read);
     if (read && std::isfinite(plain))
         return plain;
     const QRegularExpressionMatch number = numberForm().match(text);
@@ -58,7 +59,7 @@ qint64 wholeNumber(const QVariant& value, qint64 least, qint64 most)
     return static_cast<qint64>(rounded);
 }
 
-/// A number that was read, which may be too large.
+/// Checks that a number is not too large.
 double finite(double number)
 {
     if (!std::isfinite(number))
@@ -196,7 +197,7 @@ QString numberText(double value)
     constexpr double tooLargeForPlain = 1e16;
     constexpr double tooSmallForPlain = 1e-10;
     if (value == 0)
-        return u"0"_s;  // "-0" is no number's text
+        return u"0"_s;  // never "-0"
     const QString general = QString::number(finite(value), 'g', digitsKept);
     if (!general.contains(u'e'))
         return general;

@@ -56,7 +56,7 @@ library=$root/usr/lib/libkest2.so.2
 readelf -d "$kest2" "$library" >"$tmp/dynamic"
 ! grep -E 'RPATH|RUNPATH' "$tmp/dynamic" || fail "a search path of the build is left"
 export LD_LIBRARY_PATH=${library%/*} XDG_RUNTIME_DIR=$tmp QT_QPA_PLATFORM=offscreen
-ldd "$kest2" >"$tmp/libraries"  # not piped: a grep that ends early would fail its writer
+ldd "$kest2" >"$tmp/libraries"  # no pipe: a grep that ends early would make ldd fail
 grep -q "libkest2.so.2 => $library " "$tmp/libraries" || fail "the command does not use the installed library"
 desktop-file-validate "$root/usr/share/applications/kest2.desktop"
 for picture in "$root"/usr/share/icons/hicolor/*/apps/kest2.png; do
