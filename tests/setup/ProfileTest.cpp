@@ -5,7 +5,6 @@
 #include "setup/Profile.h"
 #include "setup/QuoteDatabase.h"
 #include "shell/component.h"
-#include "support/Places.h"
 #include "support/OdbcDrivers.h"
 #include "support/Shop.h"
 
@@ -164,20 +163,6 @@ TEST_F(DemoShop, HoldsTogetherAndItsMessagesAreListedAndLoad)
     for (const QString& file : names)
         EXPECT_EQ(loadAsTheWindow(file), file != u"MDMSG_1009.xml"_s) << file.toStdString();
     EXPECT_EQ(listed(), QStringList(u"QREQ_20551_2.xml"_s)) << "it waited behind the first of its request";
-}
-
-TEST(Schema, HasTheSameColumnsOnAllEngines)
-{
-    const auto columns = [](const QString& name) {
-        QStringList words;
-        const QStringList lines = files::read(checkoutFile(u"sql/"_s + name)).split(u'\n');
-        for (const QString& line : lines)
-            if (!line.startsWith(u"--"_s) && !line.startsWith(u')'))
-                words << line.simplified().section(u' ', 0, line.startsWith(u' ') ? 0 : 2) +
-                             (line.contains(u"DEFAULT 0"_s) ? u" 0"_s : QString());
-        return words;
-    };
-    EXPECT_EQ(columns(u"quote-embedded.sql"_s), columns(u"quote-mariadb.sql"_s));
 }
 
 }  // namespace kest::test
