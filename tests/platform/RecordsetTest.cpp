@@ -177,6 +177,16 @@ TEST_P(RecordsetOn, AJoinIsUpdatedInTheTablesThatItsColumnsComeFrom)
     EXPECT_NE(failure([&] { named.set(u"CODE"_s, u"x"_s); }).number(), 0) << "a worked out value";
 }
 
+TEST_P(RecordsetOn, AColumnThatTheHostAddsMeanwhileCanBeChanged)
+{
+    add(u"A"_s, 1);
+    elsewhere(u"ALTER TABLE LINE ADD colour VARCHAR(10)"_s);
+    lines.requery();
+    write(u"colour"_s, u"Red"_s);
+    EXPECT_EQ(count(u"colour='Red' AND CODE='A'"_s), 1);
+    EXPECT_EQ(lines.size(u"colour"_s), 10);
+}
+
 TEST_P(RecordsetOn, WithoutAKeyAllSelectedColumnsTellTheRow)
 {
     elsewhere(u"INSERT INTO TINTS (Code, Script) VALUES ('R', 'Red')"_s);

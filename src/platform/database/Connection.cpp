@@ -1,7 +1,7 @@
 #include "platform/database/Connection.h"
 
 #include "platform/RuntimeError.h"
-#include "platform/database/Engine.h"
+#include "platform/database/Session.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
 
@@ -125,24 +125,24 @@ Connection::~Connection() = default;
 void Connection::open(const QString& connectionText)
 {
     close();
-    engine_ = openEngine(connectionText);
-    engine_->setTimeout(commandTimeout_);
+    session_ = std::make_unique<Session>(openEngine(connectionText));
+    session_->engine().setTimeout(commandTimeout_);
 }
 
 void Connection::close()
 {
-    engine_.reset();
+    session_.reset();
 }
 
 int Connection::state() const
 {
-    return engine_ && engine_->isOpen() ? 1 : 0;
+    return session_ && session_->engine().isOpen() ? 1 : 0;
 }
 
 bool Connection::answers() const
 {
     if (state() == 1)
-        attempt([&] { engine_->ping(); });
+        attempt([&] { session_->engine().ping(); });
     return state() == 1;
 }
 
@@ -150,37 +150,37 @@ void Connection::setCommandTimeout(int seconds)
 {
     commandTimeout_ = seconds;
     if (state() == 1)
-        engine_->setTimeout(seconds);
+        session_->engine().setTimeout(seconds);
 }
 
 qint64 Connection::execute(const QString& statement)
 {
-    return engine().execute(statement);
+    return session().execute(statement);
 }
 
 void Connection::rebuildIndexes()
 {
-    engine().rebuildIndexes();
+    session().engine().rebuildIndexes();
 }
 
 Lock::Lock(ConnectionPtr connection, const QString& name, int seconds) : connection_(std::move(connection)), name_(name)
 {
     if (!connection_)
         throw RuntimeError(CannotOpen, u"There is no connection to the database."_s);
-    held_ = connection_->engine().lock(name_, seconds);
+    held_ = connection_->session().engine().lock(name_, seconds);
 }
 
 Lock::~Lock()
 {
     if (held_ && connection_->state() == 1)  // with the connection the lock has gone
-        attempt([&] { connection_->engine().unlock(name_); });
+        attempt([&] { connection_->session().engine().unlock(name_); });
 }
 
-Engine& Connection::engine() const
+Session& Connection::session() const
 {
     if (state() != 1)
         throw RuntimeError(CannotOpen, u"The connection to the database is closed."_s);
-    return *engine_;
+    return *session_;
 }
 
 }  // namespace kest::db

@@ -8,7 +8,7 @@
 
 namespace kest::db {
 
-class Engine;
+class Session;
 
 /// One open database. Statements are written in the dialect of SQL Server; the engine that answers translates them.
 /// One statement a call: a second one behind a ";" is refused with StatementFailed.
@@ -40,10 +40,10 @@ public:
     void rebuildIndexes();
 
     /// For the recordset.
-    Engine& engine() const;
+    Session& session() const;
 
 private:
-    std::unique_ptr<Engine> engine_;
+    std::unique_ptr<Session> session_;
     int commandTimeout_ = 0;
 };
 

@@ -1,9 +1,12 @@
 // Whatever a registered ODBC driver reaches, through QODBC: SQL Server, and others by the name that they answer with.
-#include "platform/RuntimeError.h"
-#include "platform/database/Engine.h"
+#include "platform/database/MySqlServer.h"
+#include "platform/database/QtSqlEngine.h"
 
+#include <QHash>
 #include <QSqlDriver>
-#include <QSqlQuery>
+#include <QSqlError>
+
+#include <optional>
 
 namespace kest::db {
 
@@ -13,106 +16,88 @@ namespace {
 
 constexpr int connectSeconds = 5;
 
-class EngineOdbc final : public Engine {
+class EngineOdbc final : public QtSqlEngine {
 public:
-    explicit EngineOdbc(QString connectionText) : Engine(u"QODBC"_s)
+    explicit EngineOdbc(QString connectionText) : QtSqlEngine(u"QODBC"_s)
     {
         while (connectionText.endsWith(u';'))  // the driver manager takes a last one for an empty field, and fails
             connectionText.chop(1);
         database.setConnectOptions(u"SQL_ATTR_LOGIN_TIMEOUT=%1"_s.arg(connectSeconds));
         openNamed(connectionText);
-        const QString version = ask(u"SELECT @@version"_s).values.front().toString();
-        isMariaDb = version.contains(u"MariaDB"_s, Qt::CaseInsensitive);
-        isMySql = isMariaDb || database.driver()->dbmsType() == QSqlDriver::MySqlServer;
-        if (!isMySql)
+        const QString version = run(u"SELECT @@version"_s).values.front().toString();
+        if (!version.contains(u"MariaDB"_s, Qt::CaseInsensitive) &&
+            database.driver()->dbmsType() != QSqlDriver::MySqlServer)
             return;
         // only with this option does an update to the value already there count as a row that was hit
         if (!connectionText.contains(u"option="_s, Qt::CaseInsensitive)) {
             database.close();
             openNamed(connectionText + u";OPTION=2"_s);
         }
-        tell(u"SET SESSION sql_mode=CONCAT(@@sql_mode, ',PIPES_AS_CONCAT')"_s);
+        mySql.emplace(*this);
+        run(u"SET SESSION sql_mode=CONCAT(@@sql_mode, ',PIPES_AS_CONCAT')"_s);
+    }
+
+    const Dialect& dialect() const override { return mySql ? mySqlOverOdbcDialect() : sqlServerDialect(); }
+
+    QVariant insert(const QString& statement) override
+    {
+        run(statement);
+        return run(u"SELECT @@IDENTITY"_s).values.front();
     }
 
     void setTimeout(int seconds) override
     {
-        if (isMariaDb)
-            tell(u"SET SESSION max_statement_time="_s + QString::number(seconds));
-        else if (isMySql)
-            tell(u"SET SESSION max_execution_time="_s + QString::number(qint64(seconds) * 1000));
-        else
-            tell(u"SET LOCK_TIMEOUT "_s + QString::number(seconds > 0 ? qint64(seconds) * 1000 : -1));
+        run(mySql ? mySql->timeoutStatement(seconds)
+                  : u"SET LOCK_TIMEOUT "_s + QString::number(seconds > 0 ? qint64(seconds) * 1000 : -1));
     }
 
-    bool lock(const QString& name, int seconds) override { return !isMySql || lockOnServer(name, seconds); }
+    QStringList tableNames() override { return tableNamesOf(*this, informationSchema()); }
+    std::unique_ptr<TableInfo> readTable(const QString& name) override
+    {
+        return tableOf(*this, informationSchema(), name);
+    }
+
+    bool lock(const QString& name, int seconds) override { return !mySql || mySql->lock(name, seconds); }
     void unlock(const QString& name) override
     {
-        if (isMySql)
-            unlockOnServer(name);
+        if (mySql)
+            mySql->unlock(name);
     }
 
 protected:
-    Dialect dialect() const override
-    {
-        Dialect dialect;
-        dialect.top = dialect.plusJoinsTexts = dialect.patternSets = dialect.isoDates = !isMySql;
-        dialect.caseOfTables = dialect.backslashEscapes = isMySql;
-        dialect.openQuote = isMySql ? u'`' : u'[';
-        dialect.closeQuote = isMySql ? u'`' : u']';
-        return dialect;
-    }
-
-    QStringList tableNames() override
-    {
-        QStringList names;
-        for (const QVariant& name :
-             ask(u"SELECT TABLE_NAME FROM INFORMATION_SCHEMA.TABLES WHERE "_s + ofDatabase()).values)
-            names.append(name.toString());
-        return names;
-    }
-
-    std::unique_ptr<TableInfo> readTable(const QString& name) override
-    {
-        if (isMySql)
-            return fromInformationSchema(
-                name, {ofDatabase(), u"CASE WHEN COLUMN_TYPE='tinyint(1)' THEN 'boolean' ELSE DATA_TYPE END"_s,
-                       u"CASE WHEN EXTRA LIKE '%auto_increment%' THEN 1 ELSE 0 END"_s});
-        return fromInformationSchema(
-            name, {ofDatabase(),
-                   u"CASE WHEN CHARACTER_MAXIMUM_LENGTH=-1 OR DATA_TYPE IN ('text', 'ntext') THEN 'longtext' "
-                   "ELSE DATA_TYPE END"_s,
-                   u"COLUMNPROPERTY(OBJECT_ID(TABLE_SCHEMA + '.' + TABLE_NAME), COLUMN_NAME, 'IsIdentity')"_s});
-    }
-
-    /// The driver's name of the base table is followed by a NUL and whatever stood behind it.
-    QString baseTable(const QSqlQuery&, int, const QString& reported) const override
-    {
-        const qsizetype end = reported.indexOf(QChar(u'\0'));
-        return end < 0 ? reported : reported.left(end);
-    }
-
-    QVariant lastIdentity(QSqlQuery&) override { return ask(u"SELECT @@IDENTITY"_s).values.front(); }
-
-    QString defaultsOnly() const override { return isMySql ? u"() VALUES ()"_s : u"DEFAULT VALUES"_s; }
-
     bool meansConnectionLost(const QSqlError& error) const override
     {
-        static const QStringList lost{u"2002"_s, u"2003"_s, u"2006"_s, u"2013"_s, u"1927"_s, u"1053"_s, u"4031"_s};
         return error.databaseText().contains(u"08S01"_s) || error.databaseText().contains(u"08003"_s) ||
-               lost.contains(error.nativeErrorCode().section(u';', 0, 0));
+               MySqlServer::meansConnectionLost(codeOf(error));
+    }
+    QString sqlState(const QSqlError& error) const override
+    {
+        static const QHash<QString, QString> states{
+            {u"102"_s, u"42000"_s},  {u"207"_s, u"42S22"_s},  {u"208"_s, u"42S02"_s},  {u"1205"_s, u"40001"_s},
+            {u"2601"_s, u"23000"_s}, {u"2627"_s, u"23000"_s}, {u"4060"_s, u"42000"_s}, {u"18456"_s, u"28000"_s}};
+        return mySql ? MySqlServer::sqlState(codeOf(error)) : states.value(codeOf(error), u"HY000"_s);
     }
 
 private:
+    static QString codeOf(const QSqlError& error) { return error.nativeErrorCode().section(u';', 0, 0); }
+
     void openNamed(const QString& connectionText)
     {
         database.setDatabaseName(connectionText);
         openDatabase();
     }
 
-    QString ofDatabase() const { return isMySql ? u"TABLE_SCHEMA=DATABASE()"_s : u"TABLE_CATALOG=DB_NAME()"_s; }
+    const InformationSchemaTerms& informationSchema() const
+    {
+        static const InformationSchemaTerms ofSqlServer{
+            u"TABLE_CATALOG=DB_NAME()"_s,
+            u"CASE WHEN CHARACTER_MAXIMUM_LENGTH=-1 OR DATA_TYPE IN ('text', 'ntext') THEN 'longtext' "
+            "ELSE DATA_TYPE END"_s,
+            u"COLUMNPROPERTY(OBJECT_ID(TABLE_SCHEMA + '.' + TABLE_NAME), COLUMN_NAME, 'IsIdentity')"_s};
+        return mySql ? MySqlServer::informationSchema() : ofSqlServer;
+    }
 
-    bool isMySql = false;
-    bool isMariaDb = false;
+    std::optional<MySqlServer> mySql;
 };
 
 }  // namespace

@@ -1,15 +1,14 @@
 // The embedded engine: one file of the profile, opened by QSQLITE and told how texts compare.
 #include "platform/RuntimeError.h"
 #include "platform/database/Collation.h"
-#include "platform/database/Engine.h"
+#include "platform/database/QtSqlEngine.h"
 #include "platform/files/Lock.h"
 #include "platform/values.h"
 
 #include <QDeadlineTimer>
 #include <QFileInfo>
 #include <QSqlDriver>
-#include <QSqlQuery>
-#include <QSqlResult>
+#include <QSqlError>
 
 #include <sqlite3.h>
 
@@ -69,9 +68,9 @@ void likeFunction(sqlite3_context* context, int, sqlite3_value** arguments)
     sqlite3_result_int(context, isLike(textOfValue(arguments[1]), pattern));
 }
 
-class EngineSqlite final : public Engine {
+class EngineSqlite final : public QtSqlEngine {
 public:
-    explicit EngineSqlite(const QString& file) : Engine(u"QSQLITE"_s)
+    explicit EngineSqlite(const QString& file) : QtSqlEngine(u"QSQLITE"_s)
     {
         if (!QFileInfo(file).isFile())
             throw RuntimeError(CannotOpen, u"There is no database "_s + file)
@@ -81,18 +80,20 @@ public:
         openDatabase();
         teachComparison();
         try {
-            tell(u"PRAGMA journal_mode=WAL"_s);
-            tell(u"PRAGMA synchronous=FULL"_s);
-            tell(u"PRAGMA foreign_keys=OFF"_s);
+            run(u"PRAGMA journal_mode=WAL"_s);
+            run(u"PRAGMA synchronous=FULL"_s);
+            run(u"PRAGMA foreign_keys=OFF"_s);
         } catch (const RuntimeError& error) {
             throw RuntimeError(CannotOpen, error.description()).withDatabaseCodes(error.nativeCode(), error.sqlState());
         }
         sqlite3_progress_handler(handle(), instructionsBetweenLooks, &isLate, this);
+        sqlite3_prepare_v2(handle(), "SELECT 1 FROM sqlite_master LIMIT 0", -1, &schemaReader, nullptr);
     }
+    ~EngineSqlite() override { sqlite3_finalize(schemaReader); }
 
     void setTimeout(int seconds) override { timeout = seconds; }
 
-    void rebuildIndexes() override { executeNative(u"REINDEX"_s); }
+    void rebuildIndexes() override { run(u"REINDEX"_s); }
 
     bool lock(const QString& name, int seconds) override
     {
@@ -108,18 +109,12 @@ public:
     }
     void unlock(const QString& name) override { locks.erase(name); }
 
-protected:
-    Dialect dialect() const override
-    {
-        Dialect dialect;
-        dialect.patternSets = true;
-        return dialect;
-    }
+    const Dialect& dialect() const override { return embeddedDialect(); }
 
     QStringList tableNames() override
     {
         QStringList names;
-        for (const QVariant& name : ask(u"SELECT name FROM sqlite_master WHERE type IN ('table', 'view')"_s).values)
+        for (const QVariant& name : run(u"SELECT name FROM sqlite_master WHERE type IN ('table', 'view')"_s).values)
             names.append(name.toString());
         return names;
     }
@@ -128,7 +123,8 @@ protected:
     {
         auto info = std::make_unique<TableInfo>();
         info->name = name;
-        const Rows rows = ask(u"SELECT name, type, dflt_value, pk FROM pragma_table_info("_s + literal(name) + u')');
+        const Answer rows =
+            run(u"SELECT name, type, dflt_value, pk FROM pragma_table_info("_s + dialect().literal(name) + u')');
         QMap<int, QString> key;
         QString keyType;
         for (size_t i = 0; i < rows.values.size(); i += 4) {
@@ -155,34 +151,14 @@ protected:
         return info;
     }
 
-    /// A column under another name is read only: the base table has no column of that name, or another one.
-    QString baseTable(const QSqlQuery& query, int column, const QString& reported) const override
-    {
-        const QVariant held = query.result()->handle();
-        sqlite3_stmt* statement = *static_cast<sqlite3_stmt* const*>(held.constData());
-        const char* origin = sqlite3_column_origin_name(statement, column);
-        const char* name = sqlite3_column_name(statement, column);
-        return origin && name && sqlite3_stricmp(origin, name) == 0 ? reported : QString();
-    }
-
-    /// Another tool may have written the day alone, or the time behind a "T".
-    QString sameDate(const QString& column, const QString& dateLiteral) const override
-    {
-        return u"datetime("_s + column + u")=datetime("_s + dateLiteral + u')';
-    }
-
-    QString sameLongText(const QString& column, const QString& literal) const override
-    {
-        return column + u'=' + literal + u" COLLATE BINARY"_s;
-    }
-
+protected:
     bool meansConnectionLost(const QSqlError& error) const override
     {
         const int code = error.nativeErrorCode().toInt() & 0xff;
         return code == SQLITE_CANTOPEN || code == SQLITE_NOTADB;
     }
 
-    QString sqlState(const QSqlError& error) override
+    QString sqlState(const QSqlError& error) const override
     {
         switch (error.nativeErrorCode().toInt() & 0xff) {
             case SQLITE_ERROR:
@@ -198,8 +174,12 @@ protected:
         }
     }
 
+    /// The library prepares a statement by the schema that it remembers, and again once it reads a newer one; the
+    /// driver does not expect columns to become more in between.
     void beforeStatement() override
     {
+        sqlite3_step(schemaReader);
+        sqlite3_reset(schemaReader);
         deadline = timeout > 0 ? QDeadlineTimer(qint64(timeout) * 1000) : QDeadlineTimer(QDeadlineTimer::Forever);
     }
 
@@ -220,6 +200,7 @@ private:
     static int isLate(void* self) { return static_cast<EngineSqlite*>(self)->deadline.hasExpired(); }
 
     std::map<QString, std::unique_ptr<files::Lock>> locks;
+    sqlite3_stmt* schemaReader = nullptr;
     int timeout = 0;
     QDeadlineTimer deadline{QDeadlineTimer::Forever};
 };

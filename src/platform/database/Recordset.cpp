@@ -64,7 +64,7 @@ void Recordset::Data::numberColumns()
 
 void Recordset::Data::fetch()
 {
-    Rows result = engine().select(select);
+    Rows result = session().select(select);
     const int count = result.count();
     columns = result.columns;
     values = std::move(result.values);

@@ -3,8 +3,8 @@
 
 #include "platform/RuntimeError.h"
 #include "platform/database/Criterion.h"
-#include "platform/database/Engine.h"
 #include "platform/database/Recordset.h"
+#include "platform/database/Session.h"
 
 #include <QHash>
 
@@ -70,15 +70,17 @@ struct Recordset::Data {
         return *found;
     }
 
-    Engine& engine() const
+    Session& session() const
     {
         if (disconnected)
             throw RuntimeError(ObjectClosed,
                                QStringLiteral("The rows live without a connection and can't be updated."));
         if (!connection)
             throw RuntimeError(NoObject, QStringLiteral("Object variable or With block variable not set"));
-        return connection->engine();
+        return connection->session();
     }
+
+    const Dialect& dialect() const { return session().dialect(); }
 
     void numberColumns();
     void fetch();

@@ -92,12 +92,12 @@ QString Recordset::Data::keyCondition(const TableInfo& table)
             conditions.clear();
             break;
         }
-        conditions.append(engine().holds(columns[column].name, columns[column].kind, before(column)));
+        conditions.append(dialect().holds(columns[column].name, columns[column].kind, before(column)));
     }
     if (conditions.isEmpty()) {
         for (int column = 0; column < columns.size(); ++column) {
             if (columns[column].table == table.name && isExact(columns[column].kind))
-                conditions.append(engine().holds(columns[column].name, columns[column].kind, before(column)));
+                conditions.append(dialect().holds(columns[column].name, columns[column].kind, before(column)));
         }
     }
     if (conditions.isEmpty())
@@ -109,18 +109,21 @@ QString Recordset::Data::keyCondition(const TableInfo& table)
 void Recordset::Data::checkLongTexts(const TableInfo& table, const QString& key)
 {
     QList<int> longTexts;
+    QList<ResultColumn> described;
     QStringList names;
     for (int column = 0; column < columns.size(); ++column) {
         if (columns[column].table == table.name && columns[column].kind == Kind::LongText && isChanged(column) &&
-            engine().holds(columns[column].name, Kind::LongText, original[size_t(column)]).isEmpty()) {
+            dialect().holds(columns[column].name, Kind::LongText, original[size_t(column)]).isEmpty()) {
             longTexts.append(column);
-            names.append(engine().quoted(columns[column].name));
+            described.append(columns[column]);
+            names.append(dialect().quoted(columns[column].name));
         }
     }
     if (longTexts.isEmpty())
         return;
-    const Rows now = engine().selectNative(u"SELECT "_s + names.join(u", "_s) + u" FROM "_s +
-                                           engine().quoted(table.name) + u" WHERE "_s + key);
+    const Rows now = session().selectNative(
+        u"SELECT "_s + names.join(u", "_s) + u" FROM "_s + dialect().quoted(table.name) + u" WHERE "_s + key,
+        described);
     if (now.count() == 0)
         failRowChanged();
     for (qsizetype i = 0; i < longTexts.size(); ++i) {
@@ -133,7 +136,7 @@ void Recordset::Data::checkLongTexts(const TableInfo& table, const QString& key)
 
 void Recordset::Data::writeChange(const QString& tableName)
 {
-    const TableInfo* table = engine().table(tableName);
+    const TableInfo* table = session().table(tableName);
     if (!table)
         throw RuntimeError(StatementFailed, u"There is no table "_s + tableName);
     const QString key = keyCondition(*table);
@@ -145,16 +148,16 @@ void Recordset::Data::writeChange(const QString& tableName)
             continue;
         const QString& name = columns[column].name;
         const QVariant& before = original[size_t(column)];
-        assignments.append(engine().quoted(name) + u'=' + engine().literal(at(row(), column)));
+        assignments.append(dialect().quoted(name) + u'=' + dialect().literal(at(row(), column)));
         const Kind kind = columns[column].kind;
-        const QString held = kind == Kind::Number ? QString() : engine().holds(name, kind, before);
+        const QString held = kind == Kind::Number ? QString() : dialect().holds(name, kind, before);
         if (!held.isEmpty())
             condition += u" AND "_s + held;
         written.append(column);
     }
     checkLongTexts(*table, key);
-    const qint64 hit = engine().executeNative(u"UPDATE "_s + engine().quoted(tableName) + u" SET "_s +
-                                              assignments.join(u", "_s) + u" WHERE "_s + condition);
+    const qint64 hit = session().executeNative(u"UPDATE "_s + dialect().quoted(tableName) + u" SET "_s +
+                                               assignments.join(u", "_s) + u" WHERE "_s + condition);
     if (hit == 0)
         failRowChanged();
     for (const int column : written)
@@ -163,7 +166,7 @@ void Recordset::Data::writeChange(const QString& tableName)
 
 void Recordset::Data::writeInsert(const QString& tableName)
 {
-    const TableInfo* table = engine().table(tableName);
+    const TableInfo* table = session().table(tableName);
     if (!table)
         throw RuntimeError(StatementFailed, u"There is no table "_s + tableName);
     QStringList names;
@@ -171,16 +174,17 @@ void Recordset::Data::writeInsert(const QString& tableName)
     for (int column = 0; column < columns.size(); ++column) {
         if (columns[column].table != tableName || !isChanged(column))
             continue;
-        names.append(engine().quoted(columns[column].name));
-        literals.append(engine().literal(at(row(), column)));
+        names.append(dialect().quoted(columns[column].name));
+        literals.append(dialect().literal(at(row(), column)));
     }
-    readBack(*table, engine().insert(*table, names, literals));
+    readBack(*table, session().insert(*table, names, literals));
 }
 
 /// What the database itself put into the new row: its identity and the defaults of the columns that were not set.
 void Recordset::Data::readBack(const TableInfo& table, const QVariant& identity)
 {
     QList<int> wanted;
+    QList<ResultColumn> described;
     QStringList names;
     for (int column = 0; column < columns.size(); ++column) {
         const TableColumn* base = columns[column].table == table.name ? table.column(columns[column].name) : nullptr;
@@ -190,15 +194,17 @@ void Recordset::Data::readBack(const TableInfo& table, const QVariant& identity)
             store(row(), column, identity);
         } else if (base->hasDefault) {
             wanted.append(column);
-            names.append(engine().quoted(base->name));
+            described.append(columns[column]);
+            names.append(dialect().quoted(base->name));
         }
     }
     if (wanted.isEmpty())
         return;
     const QString condition =
-        identity.isNull() ? insertedRow(table) : engine().holds(table.identity()->name, Kind::WholeNumber, identity);
-    const Rows stored = engine().selectNative(u"SELECT "_s + names.join(u", "_s) + u" FROM "_s +
-                                              engine().quoted(table.name) + u" WHERE "_s + condition);
+        identity.isNull() ? insertedRow(table) : dialect().holds(table.identity()->name, Kind::WholeNumber, identity);
+    const Rows stored = session().selectNative(
+        u"SELECT "_s + names.join(u", "_s) + u" FROM "_s + dialect().quoted(table.name) + u" WHERE "_s + condition,
+        described);
     for (qsizetype i = 0; stored.count() > 0 && i < wanted.size(); ++i)
         store(row(), wanted[i], stored.values[size_t(i)]);
 }
@@ -209,7 +215,7 @@ QString Recordset::Data::insertedRow(const TableInfo& table)
     QStringList conditions{u"1=1"_s};
     for (int column = 0; column < columns.size(); ++column) {
         if (columns[column].table == table.name && assigned[size_t(column)] && isExact(columns[column].kind))
-            conditions.append(engine().holds(columns[column].name, columns[column].kind, at(row(), column)));
+            conditions.append(dialect().holds(columns[column].name, columns[column].kind, at(row(), column)));
     }
     return conditions.join(u" AND "_s);
 }
@@ -263,12 +269,12 @@ void Recordset::remove()
     if (data->pending == Data::Pending::Insert)
         return cancelUpdate();
     if (!data->declared) {
-        const TableInfo* table = data->columns.isEmpty() ? nullptr : data->engine().table(data->columns.first().table);
+        const TableInfo* table = data->columns.isEmpty() ? nullptr : data->session().table(data->columns.first().table);
         if (!table)
             throw RuntimeError(StatementFailed, u"The query has no base table to delete from."_s);
         const QString condition = data->keyCondition(*table);
-        if (data->engine().executeNative(u"DELETE FROM "_s + data->engine().quoted(table->name) + u" WHERE "_s +
-                                         condition) == 0)
+        if (data->session().executeNative(u"DELETE FROM "_s + data->dialect().quoted(table->name) + u" WHERE "_s +
+                                          condition) == 0)
             failRowChanged();
     }
     Q_UNUSED(row);

@@ -1,123 +1,33 @@
 #include "platform/database/Statement.h"
 
 #include "platform/RuntimeError.h"
+#include "platform/database/Tokens.h"
 #include "platform/values.h"
 
-#include <QHash>
 #include <QRegularExpression>
 
 #include <algorithm>
-#include <vector>
 
 namespace kest::db {
 
 using namespace Qt::StringLiterals;
 
-const TableColumn* TableInfo::column(const QString& columnName) const
-{
-    const auto found = std::find_if(columns.begin(), columns.end(), [&](const TableColumn& column) {
-        return column.name.compare(columnName, Qt::CaseInsensitive) == 0;
-    });
-    return found == columns.end() ? nullptr : &*found;
-}
-
-const TableColumn* TableInfo::identity() const
-{
-    const auto found =
-        std::find_if(columns.begin(), columns.end(), [](const TableColumn& column) { return column.identity; });
-    return found == columns.end() ? nullptr : &*found;
-}
-
 namespace {
-
-enum class Part { Blank, Word, Name, Literal, Number, Symbol };  // Name: an identifier in brackets or quotes
-
-struct Token {
-    Part part;
-    QString text;
-
-    bool is(QStringView word) const { return part != Part::Literal && text.compare(word, Qt::CaseInsensitive) == 0; }
-    bool isIdentifier() const { return part == Part::Word || part == Part::Name; }
-    /// The identifier without its brackets or quotes.
-    QString name() const { return part == Part::Name ? text.sliced(1, text.size() - 2) : text; }
-    /// What a literal says.
-    QString value() const { return text.sliced(1, text.size() - 2).replace(u"''"_s, u"'"_s); }
-};
-
-using Tokens = std::vector<Token>;
-
-bool startsWord(QChar c)
-{
-    return c.isLetter() || c == u'_' || c == u'@' || c == u'#' || c == u'$';
-}
-
-/// Where the text in quotes ends, behind the closing one; a doubled closing quote stands for itself.
-qsizetype endOfQuoted(const QString& statement, qsizetype start, QChar close)
-{
-    for (qsizetype i = start + 1; i < statement.size(); ++i) {
-        if (statement[i] != close)
-            continue;
-        if (i + 1 < statement.size() && statement[i + 1] == close)
-            ++i;
-        else
-            return i + 1;
-    }
-    throw RuntimeError(StatementFailed, u"A quotation mark is not closed in the statement."_s);
-}
-
-template <class Belongs>
-qsizetype endOfRun(const QString& statement, qsizetype start, Belongs&& belongs)
-{
-    qsizetype end = start + 1;
-    while (end < statement.size() && belongs(statement[end]))
-        ++end;
-    return end;
-}
-
-Tokens tokensOf(const QString& statement)
-{
-    static const QStringList pairs{u"<>"_s, u"<="_s, u">="_s, u"!="_s, u"||"_s};
-    Tokens tokens;
-    for (qsizetype i = 0; i < statement.size();) {
-        const QChar c = statement[i];
-        Part part = Part::Symbol;
-        qsizetype end = i + 1;
-        if (c.isSpace()) {
-            part = Part::Blank;
-            end = endOfRun(statement, i, [](QChar next) { return next.isSpace(); });
-        } else if (c == u'\'') {
-            part = Part::Literal;
-            end = endOfQuoted(statement, i, c);
-        } else if (c == u'"' || c == u'`' || c == u'[') {
-            part = Part::Name;
-            end = endOfQuoted(statement, i, c == u'[' ? u']' : c);
-        } else if (startsWord(c)) {
-            part = Part::Word;
-            end = endOfRun(statement, i, [](QChar next) { return startsWord(next) || next.isDigit(); });
-        } else if (c.isDigit()) {
-            part = Part::Number;
-            end = endOfRun(statement, i, [](QChar next) { return next.isLetterOrNumber() || next == u'.'; });
-        } else if (pairs.contains(statement.sliced(i, std::min<qsizetype>(2, statement.size() - i)))) {
-            end = i + 2;
-        }
-        tokens.push_back({part, statement.sliced(i, end - i)});
-        i = end;
-    }
-    return tokens;
-}
 
 /// One statement on its way from one dialect to the other. Each step below changes tokens in place.
 class Translation {
 public:
     Translation(const QString& statement, const Dialect& wanted, Schema& known)
-        : tokens(tokensOf(statement)), dialect(wanted), schema(known)
+        : tokens(statement), dialect(wanted), schema(known)
     {
     }
 
-    QString run()
+    Translated run()
     {
         refuseSecondStatement();
         findTables();
+        Translated result;
+        result.columns = selectedColumns(tokens, schema);
         spellNames();
         writeFlags();
         writeComparedLiterals();
@@ -129,76 +39,36 @@ public:
             writeLimit();
         if (dialect.backslashEscapes)
             doubleBackslashes();
-        QString result;
-        for (const Token& token : tokens)
-            result += token.text;
+        result.text = tokens.text();
         return result;
     }
 
 private:
-    using Index = qsizetype;
-    static constexpr Index none = -1;
+    using Index = Tokens::Index;
+    static constexpr Index none = Tokens::none;
 
-    Token& at(Index i) { return tokens[size_t(i)]; }
-    Index count() const { return Index(tokens.size()); }
-
-    Index next(Index i) const
-    {
-        for (++i; i < count(); ++i) {
-            if (tokens[size_t(i)].part != Part::Blank)
-                return i;
-        }
-        return none;
-    }
-
-    Index previous(Index i) const
-    {
-        for (--i; i >= 0; --i) {
-            if (tokens[size_t(i)].part != Part::Blank)
-                return i;
-        }
-        return none;
-    }
-
-    bool isAt(Index i, QStringView word) { return i != none && at(i).is(word); }
+    Token& at(Index i) { return tokens.at(i); }
+    Index count() const { return tokens.count(); }
+    Index next(Index i) const { return tokens.next(i); }
+    Index previous(Index i) const { return tokens.previous(i); }
+    bool isAt(Index i, QStringView word) const { return tokens.isAt(i, word); }
 
     void refuseSecondStatement()
     {
-        while (!tokens.empty() && (tokens.back().part == Part::Blank || tokens.back().is(u";")))
-            tokens.pop_back();
+        Index end = count();
+        while (end > 0 && (at(end - 1).part == Part::Blank || at(end - 1).is(u";")))
+            --end;
+        tokens.erase(end, count());
         if (std::any_of(tokens.begin(), tokens.end(), [](const Token& token) { return token.is(u";"); }))
             throw RuntimeError(StatementFailed, u"A second statement stands behind a semicolon."_s);
     }
 
     void findTables()
     {
-        static const QStringList before{u"FROM"_s, u"JOIN"_s, u"INTO"_s, u"UPDATE"_s};
         for (Index i = 0; i < count(); ++i) {
-            if (at(i).part != Part::Word || !before.contains(at(i).text, Qt::CaseInsensitive))
-                continue;
-            for (Index name = next(i); name != none && at(name).isIdentifier();) {
-                const Index behind = takeTable(name);
-                name = isAt(behind, u",") ? next(behind) : none;
-            }
+            if (namesTables(at(i)))
+                tables += tablesAfter(tokens, i);
         }
-    }
-
-    /// Notes a table of the statement with its alias; the place behind it.
-    Index takeTable(Index name)
-    {
-        const QString table = at(name).name();
-        scope.append({table, table});
-        Index behind = next(name);
-        if (isAt(behind, u"AS"))
-            behind = next(behind);
-        static const QStringList keywords{u"WHERE"_s, u"ORDER"_s,  u"GROUP"_s,   u"INNER"_s,  u"LEFT"_s,  u"RIGHT"_s,
-                                          u"JOIN"_s,  u"ON"_s,     u"SET"_s,     u"VALUES"_s, u"CROSS"_s, u"UNION"_s,
-                                          u"LIMIT"_s, u"SELECT"_s, u"DEFAULT"_s, u"HAVING"_s};
-        if (behind != none && at(behind).isIdentifier() && !keywords.contains(at(behind).text, Qt::CaseInsensitive)) {
-            scope.append({at(behind).name(), table});
-            behind = next(behind);
-        }
-        return behind;
     }
 
     void spellNames()
@@ -250,10 +120,10 @@ private:
         if (first)
             *first = start;
         const QString qualifier = qualified ? at(start).name() : QString();
-        for (const auto& [alias, table] : std::as_const(scope)) {
-            if (qualified && alias.compare(qualifier, Qt::CaseInsensitive) != 0)
+        for (const NamedTable& table : std::as_const(tables)) {
+            if (qualified && !table.answersTo(qualifier))
                 continue;
-            if (const TableColumn* found = columnIn(table, column))
+            if (const TableColumn* found = columnIn(table.table, column))
                 return found;
         }
         return nullptr;
@@ -437,9 +307,9 @@ private:
             const QString limit = u" LIMIT "_s + at(number).text;
             const Index behind = next(number);
             const Index end = endOfSelect(i);
-            tokens.insert(tokens.begin() + end, {Part::Symbol, limit});
+            tokens.insert(end, {Part::Symbol, limit});
             if (behind != none)
-                tokens.erase(tokens.begin() + top, tokens.begin() + behind);
+                tokens.erase(top, behind);
         }
     }
 
@@ -467,12 +337,12 @@ private:
     Tokens tokens;
     const Dialect& dialect;
     Schema& schema;
-    QList<std::pair<QString, QString>> scope;  // alias or name, and the table
+    QList<NamedTable> tables;
 };
 
 }  // namespace
 
-QString translated(const QString& statement, const Dialect& dialect, Schema& schema)
+Translated translated(const QString& statement, const Dialect& dialect, Schema& schema)
 {
     return Translation(statement, dialect, schema).run();
 }

@@ -1,0 +1,112 @@
+#include "platform/database/Dialect.h"
+
+#include "platform/RuntimeError.h"
+
+#include <QDateTime>
+#include <QLocale>
+
+#include <cmath>
+
+namespace kest::db {
+
+using namespace Qt::StringLiterals;
+
+QString Dialect::quoted(const QString& identifier) const
+{
+    QString inner = identifier;
+    inner.replace(closeQuote, QString(2, closeQuote));
+    return openQuote + inner + closeQuote;
+}
+
+QString Dialect::literal(const QVariant& value) const
+{
+    if (value.isNull())
+        return u"NULL"_s;
+    switch (value.typeId()) {
+        case QMetaType::Bool:
+            return value.toBool() ? u"1"_s : u"0"_s;
+        case QMetaType::LongLong:
+            return QString::number(value.toLongLong());
+        case QMetaType::Double:
+            if (!std::isfinite(value.toDouble()))
+                throw RuntimeError(Overflow, u"Overflow"_s);
+            return QString::number(value.toDouble(), 'g', QLocale::FloatingPointShortest);
+        case QMetaType::QDateTime: {
+            const QDateTime date = value.toDateTime();
+            const QString separator = isoDates ? u"T"_s : u" "_s;
+            const QString fraction = date.time().msec() == 0 ? QString() : u".zzz"_s;
+            return u'\'' + date.toString(u"yyyy-MM-dd"_s) + separator + date.toString(u"HH:mm:ss"_s + fraction) + u'\'';
+        }
+        default: {
+            QString text = value.toString();
+            text.replace(u'\'', u"''"_s);
+            if (backslashEscapes)
+                text.replace(u'\\', u"\\\\"_s);
+            return u'\'' + text + u'\'';
+        }
+    }
+}
+
+QString Dialect::holds(const QString& column, Kind kind, const QVariant& value) const
+{
+    const QString name = quoted(column);
+    if (value.isNull())
+        return name + u" IS NULL"_s;
+    if (kind == Kind::Flag && value.typeId() == QMetaType::Bool)
+        return name + (value.toBool() ? u"<>0"_s : u"=0"_s);
+    if (kind == Kind::Date && value.typeId() == QMetaType::QDateTime)
+        return sameDate.arg(name, literal(value));
+    if (kind == Kind::LongText)
+        return sameLongText.isEmpty() ? QString() : sameLongText.arg(name, literal(value));
+    return name + u'=' + literal(value);
+}
+
+const Dialect& embeddedDialect()
+{
+    static const Dialect dialect{
+        .patternSets = true,
+        // another tool may have written the day alone, or the time after a "T"
+        .sameDate = u"datetime(%1)=datetime(%2)"_s,
+        .sameLongText = u"%1=%2 COLLATE BINARY"_s,
+    };
+    return dialect;
+}
+
+const Dialect& mySqlDialect()
+{
+    static const Dialect dialect{
+        .caseOfTables = true,
+        .openQuote = u'`',
+        .closeQuote = u'`',
+        .defaultsOnly = u"() VALUES ()"_s,
+        .sameLongText = u"CONVERT(%1 USING utf8mb4)=%2 COLLATE utf8mb4_bin"_s,
+    };
+    return dialect;
+}
+
+const Dialect& mySqlOverOdbcDialect()
+{
+    static const Dialect dialect{
+        .caseOfTables = true,
+        .backslashEscapes = true,
+        .openQuote = u'`',
+        .closeQuote = u'`',
+        .defaultsOnly = u"() VALUES ()"_s,
+    };
+    return dialect;
+}
+
+const Dialect& sqlServerDialect()
+{
+    static const Dialect dialect{
+        .top = true,
+        .plusJoinsTexts = true,
+        .patternSets = true,
+        .isoDates = true,
+        .openQuote = u'[',
+        .closeQuote = u']',
+    };
+    return dialect;
+}
+
+}  // namespace kest::db

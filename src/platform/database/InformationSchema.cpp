@@ -1,0 +1,59 @@
+#include "platform/database/InformationSchema.h"
+
+#include "platform/database/ColumnValues.h"
+
+namespace kest::db {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+constexpr int longestText = 65535;  // a longer one has no size that would have to be checked
+
+QString textOf(const QVariant& value)
+{
+    return normalised(value, Kind::Text).toString();
+}
+
+TableColumn columnOf(const QVariant* row)
+{
+    TableColumn column;
+    column.name = textOf(row[0]);
+    column.kind = kindOfType(textOf(row[1]));
+    column.size = column.kind == Kind::Text && row[2].toLongLong() <= longestText ? row[2].toInt() : 0;
+    column.hasDefault = !row[3].isNull() && textOf(row[3]) != u"NULL"_s;
+    column.identity = row[4].toInt() == 1;
+    return column;
+}
+
+}  // namespace
+
+QStringList tableNamesOf(Engine& engine, const InformationSchemaTerms& terms)
+{
+    QStringList names;
+    for (const QVariant& name :
+         engine.run(u"SELECT TABLE_NAME FROM INFORMATION_SCHEMA.TABLES WHERE "_s + terms.ofDatabase).values)
+        names.append(textOf(name));
+    return names;
+}
+
+std::unique_ptr<TableInfo> tableOf(Engine& engine, const InformationSchemaTerms& terms, const QString& name)
+{
+    auto info = std::make_unique<TableInfo>();
+    info->name = name;
+    const QString ofTable = u"TABLE_NAME="_s + engine.dialect().literal(name) + u" AND "_s + terms.ofDatabase;
+    const Answer columns = engine.run(
+        u"SELECT COLUMN_NAME, "_s + terms.type + u", CHARACTER_MAXIMUM_LENGTH, COLUMN_DEFAULT, "_s + terms.identity +
+        u" FROM INFORMATION_SCHEMA.COLUMNS WHERE "_s + ofTable + u" ORDER BY ORDINAL_POSITION"_s);
+    for (size_t i = 0; i < columns.values.size(); i += size_t(columns.names.size()))
+        info->columns.append(columnOf(&columns.values[i]));
+    const Answer key = engine.run(
+        u"SELECT COLUMN_NAME FROM INFORMATION_SCHEMA.KEY_COLUMN_USAGE WHERE "_s + ofTable +
+        u" AND CONSTRAINT_NAME IN (SELECT CONSTRAINT_NAME FROM INFORMATION_SCHEMA.TABLE_CONSTRAINTS WHERE "_s +
+        ofTable + u" AND CONSTRAINT_TYPE='PRIMARY KEY') ORDER BY ORDINAL_POSITION"_s);
+    for (const QVariant& column : key.values)
+        info->key.append(textOf(column));
+    return info;
+}
+
+}  // namespace kest::db

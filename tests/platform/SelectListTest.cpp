@@ -1,0 +1,55 @@
+// Where the columns of a query come from, by its own words.
+#include "platform/database/SelectList.h"
+#include "support/Cases.h"
+
+#include <gtest/gtest.h>
+
+namespace kest::test {
+
+using namespace Qt::StringLiterals;
+using db::Kind;
+
+namespace {
+
+class FixedSchema final : public db::Schema {
+public:
+    const db::TableInfo* table(const QString& name) override
+    {
+        for (const db::TableInfo* info : {&line, &car}) {
+            if (info->name.compare(name, Qt::CaseInsensitive) == 0)
+                return info;
+        }
+        return nullptr;
+    }
+    QString tableSpelling(const QString& name) override { return table(name) ? table(name)->name : QString(); }
+
+private:
+    db::TableInfo line{u"LINE"_s, {{u"id"_s, Kind::WholeNumber}, {u"CODE"_s}, {u"day"_s, Kind::Date}}, {u"id"_s}};
+    db::TableInfo car{u"Car"_s, {{u"REGO"_s}, {u"CODE"_s}}, {u"REGO"_s}};
+};
+
+QString told(const std::optional<QList<db::SelectedColumn>>& columns)
+{
+    if (!columns)
+        return u"?"_s;
+    QStringList words;
+    for (const db::SelectedColumn& column : *columns) {
+        words.append(column.table.isEmpty() ? u"-"_s : column.table + u'.' + column.name);
+        if (column.base)
+            words.last() += column.base->kind == Kind::Text   ? u":t"_s
+                            : column.base->kind == Kind::Date ? u":d"_s
+                                                              : u":n"_s;
+    }
+    return words.join(u' ');
+}
+
+}  // namespace
+
+TEST(SelectList, TellsWhereEachColumnCanBeChanged)
+{
+    FixedSchema schema;
+    for (const auto& [statement, columns] : casesIn<2>("select-lists.txt"))
+        EXPECT_EQ(told(db::selectedColumns(db::Tokens(statement), schema)), columns) << statement.toStdString();
+}
+
+}  // namespace kest::test
