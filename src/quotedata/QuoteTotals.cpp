@@ -27,15 +27,15 @@ struct SectionTotals {
 };
 
 /// Returns true if the line is not deleted and no other line names it as the line that it replaces. `lines` keeps its
-/// position.
+/// position, even if another line has the same key: the loop over the lines must move on.
 bool counts(db::Recordset& lines)
 {
     const qint64 id = toLong(lines.value(u"itemid"_s));
+    const int position = lines.absolutePosition();
     lines.moveFirst();
     lines.find(sql("deleteditem = {}", id));
     const bool replaced = !lines.eof();
-    lines.moveFirst();
-    lines.find(sql("itemid = {}", id));
+    lines.setAbsolutePosition(position);
     const QVariant deleted = lines.value(u"delitem"_s);
     return !replaced && !deleted.isNull() && !toBool(deleted);
 }

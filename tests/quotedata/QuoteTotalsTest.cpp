@@ -1,7 +1,7 @@
+#include "base/modDBAccess.h"
 #include "platform/RuntimeError.h"
 #include "quotedata/QuoteTotals.h"
 #include "quotedata/Rounding.h"
-#include "base/modDBAccess.h"
 #include "support/Shop.h"
 
 namespace kest::test {
@@ -86,6 +86,28 @@ TEST_F(Totals, OnlyLinesThatStandForWorkCount)
     quote("500").line(9, "PRT").set("DELETEDITEM", qint64(replaced.number("itemid"))).set("delitem", true);
     calc(CalcQuoteTotals);
     EXPECT_EQ(totals(), "0 0 0 0 0 0");
+}
+
+TEST_F(Totals, LinesOfOneKeyAreEachCountedOnce)
+{
+    quote("500").line(1, "MIS").set("unitcost", 5);
+    Opened opened;
+    db::Recordset damaged;
+    for (const QString& column : opened.lines.columns())
+        damaged.declare(column, opened.lines.kind(column));
+    damaged.openDeclared();
+    for (int line = 1; line <= 3; ++line) {
+        damaged.addNew();
+        for (const QString& column : opened.lines.columns())
+            damaged.set(column, opened.lines.value(column));
+    }
+    for (const auto& routine : {&CalcQuoteTotals, &CalcAuthorisedTotals}) {
+        quote("500").set("MISTOTAL", 0);
+        opened.header.requery();
+        damaged.moveFirst();
+        routine(opened.header, damaged);
+        EXPECT_EQ(quote("500").number("MISTOTAL"), 15);
+    }
 }
 
 TEST_F(Totals, ANullThatMattersLeavesTheQuoteAsItWas)
