@@ -42,7 +42,7 @@ void DocumentData::release()
     for (xmlNsPtr made : namespaces)
         xmlFreeNs(made);
     namespaces.clear();
-    attributeOrders.clear();
+    startTags.clear();
 }
 
 void DocumentData::clear()
@@ -52,11 +52,11 @@ void DocumentData::clear()
     Q_CHECK_PTR(document);
 }
 
-void DocumentData::take(xmlDocPtr parsed, QHash<const xmlNode*, QStringList> orders)
+void DocumentData::take(xmlDocPtr parsed, QHash<const xmlNode*, QByteArray> tags)
 {
     release();
     document = parsed;
-    attributeOrders = std::move(orders);
+    startTags = std::move(tags);
 }
 
 xmlNsPtr DocumentData::namespaceFor(const QString& prefix, const QString& uri)

@@ -9,6 +9,7 @@
 #include <libxml/tree.h>
 #include <libxml/xpath.h>
 
+#include <string_view>
 #include <vector>
 
 namespace kest::xml {
@@ -22,7 +23,7 @@ struct DocumentData {
     /// Frees everything and starts an empty document.
     void clear();
     /// Takes a parsed document over.
-    void take(xmlDocPtr parsed, QHash<const xmlNode*, QStringList> orders);
+    void take(xmlDocPtr parsed, QHash<const xmlNode*, QByteArray> tags);
 
     Node wrap(xmlNodePtr node) { return node ? Node(node, this) : Node(); }
     /// A namespace for nodes that were made here; it is declared when the document is written.
@@ -38,8 +39,8 @@ struct DocumentData {
     xmlDocPtr document = nullptr;
     ParseError error;
     QMap<QString, QString> prefixes;
-    /// Of elements that hold both declarations and attributes: their names in document order.
-    QHash<const xmlNode*, QStringList> attributeOrders;
+    /// Of elements with a declaration after an attribute: the text that tells their order.
+    QHash<const xmlNode*, QByteArray> startTags;
 
 private:
     xmlXPathContextPtr selectionContext();
@@ -69,6 +70,9 @@ bool isBlankText(const xmlNode* node);
 QString textOfNode(const xmlNode* node);
 QString qualifiedName(const xmlNode* node);
 QList<Attribute> attributesOf(const DocumentData& data, const xmlNode* element);
+
+/// The names of a start tag's attributes, declarations among them, in the order of its text.
+std::vector<std::string_view> namesInStartTag(std::string_view tag);
 
 /// Parses into `data`; false leaves it empty with its error filled.
 bool parse(DocumentData& data, const QString& text);

@@ -103,11 +103,12 @@ QList<Attribute> attributesOf(const DocumentData& data, const xmlNode* element)
         const auto* node = reinterpret_cast<const xmlNode*>(attribute);
         attributes.append({qualifiedName(node), textOfNode(node)});
     }
-    const auto order = data.attributeOrders.constFind(element);
-    if (order != data.attributeOrders.cend()) {
+    if (const auto tag = data.startTags.constFind(element); tag != data.startTags.cend()) {
+        QHash<QString, qsizetype> places;
+        for (const std::string_view name : namesInStartTag({tag->constData(), static_cast<size_t>(tag->size())}))
+            places.insert(QString::fromUtf8(name.data(), static_cast<qsizetype>(name.size())), places.size());
         const auto place = [&](const Attribute& attribute) {
-            const qsizetype index = order->indexOf(attribute.name);
-            return index < 0 ? order->size() : index;  // what came later stands behind
+            return places.value(attribute.name, places.size());  // what was added later comes last
         };
         std::stable_sort(attributes.begin(), attributes.end(),
                          [&](const Attribute& a, const Attribute& b) { return place(a) < place(b); });

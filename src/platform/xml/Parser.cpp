@@ -4,6 +4,7 @@
 #include <libxml/parser.h>
 #include <libxml/parserInternals.h>
 
+#include <algorithm>
 #include <cstring>
 #include <memory>
 #include <optional>
@@ -19,18 +20,26 @@ namespace {
 constexpr quint32 TooLarge = 0xC00CEF01;
 constexpr quint32 TooDeep = 0xC00CEF02;
 constexpr quint32 TooManyAttributes = 0xC00CEF03;
+constexpr quint32 TooManyNodes = 0xC00CEF06;
 constexpr quint32 DtdRefused = 0xC00CEF04;
 constexpr quint32 NulCharacter = 0xC00CEF05;
 constexpr quint32 libraryErrors = 0xC00CE800;
 
-constexpr int mostAttributes = 5000;        // of one element: the library compares each with each
+// The library compares each attribute of an element with each, and each name with each namespace in force.
+constexpr int mostAttributes = 500;
+constexpr int mostNamespaces = 500;
+constexpr auto tooManyAttributes = "An element has too many attributes."_L1;
 constexpr qsizetype longestSource = 10000;  // characters of a line that are shown
 
 /// What one parse has met so far; the first failure decides.
 struct Progress {
-    std::optional<ParseError> failure;
+    const QString& text;
+    xmlParserCtxtPtr parser = nullptr;
+    qsizetype fed = 0;  // characters that the library has been given
+    int nodes = 0;
+    std::optional<ParseError> failure = {};
     int firstCode = 0;
-    QHash<const xmlNode*, QStringList> attributeOrders;
+    QHash<const xmlNode*, QByteArray> startTags = {};
 };
 
 Progress& progressOf(xmlParserCtxtPtr parser)
@@ -100,9 +109,9 @@ void takeError(void* userData, xmlErrorPtr error)
     Progress& progress = progressOf(parser);
     if (error->code == XML_ERR_DOCUMENT_END && parser->input &&
         (!progress.failure || progress.firstCode == XML_ERR_RESERVED_XML_NAME)) {
-        const auto* at = reinterpret_cast<const char*>(parser->input->cur);
-        const auto* end = reinterpret_cast<const char*>(parser->input->end);
-        if (at && isElementNext({at, static_cast<size_t>(end - at)})) {
+        const QByteArray rest = QByteArray(reinterpret_cast<const char*>(parser->input->cur)) +
+                                QStringView(progress.text).sliced(progress.fed).toUtf8();
+        if (isElementNext({rest.constData(), static_cast<size_t>(rest.size())})) {
             progress.failure.reset();
             fail(progress, parser, SecondRoot, u"There is more than one top-level element."_s);
         }
@@ -117,80 +126,102 @@ void takeError(void* userData, xmlErrorPtr error)
              QString::fromUtf8(error->message).trimmed());
 }
 
-void refuseDtd(void* userData, const xmlChar*, const xmlChar*, const xmlChar*)
+/// Ends the parse at a limit of our own.
+void refuse(xmlParserCtxtPtr parser, quint32 code, const QString& reason)
 {
-    const auto parser = static_cast<xmlParserCtxtPtr>(userData);
-    fail(progressOf(parser), parser, DtdRefused, u"A document type declaration is not accepted."_s);
+    fail(progressOf(parser), parser, code, reason);
     xmlStopParser(parser);
 }
 
-/// The names of a start tag's attributes, declarations among them, as they stand in the text before `end`.
-QStringList namesInStartTag(const char* begin, const char* end)
+void refuseDtd(void* userData, const xmlChar*, const xmlChar*, const xmlChar*)
 {
-    const char* at = end;
+    refuse(static_cast<xmlParserCtxtPtr>(userData), DtdRefused, u"A document type declaration is not accepted."_s);
+}
+
+/// Gives the library the next piece of the text; nothing more once the parse has failed, or while it reads a start tag
+/// that is beyond the limits: the library would go through the whole flood before it calls `startElement`.
+int feed(void* userData, char* buffer, int length)
+{
+    constexpr int longestCharacter = 3;  // bytes of one UTF-16 unit in UTF-8
+    Progress& progress = *static_cast<Progress*>(userData);
+    const xmlParserCtxtPtr parser = progress.parser;
+    // Each attribute takes five places, and the library doubles the places when they are used up.
+    if (parser->maxatts > 2 * 5 * (mostAttributes + 2) || parser->nsNr > 2 * mostNamespaces)
+        fail(progress, parser, TooManyAttributes, tooManyAttributes);
+    if (progress.failure && progress.firstCode != XML_ERR_RESERVED_XML_NAME)
+        return 0;
+    qsizetype count = qMin<qsizetype>(length / longestCharacter, progress.text.size() - progress.fed);
+    if (count > 1 && progress.text[progress.fed + count - 1].isHighSurrogate())
+        --count;
+    const QByteArray bytes = QStringView(progress.text).sliced(progress.fed, count).toUtf8();
+    std::memcpy(buffer, bytes.constData(), static_cast<size_t>(bytes.size()));
+    progress.fed += count;
+    return static_cast<int>(bytes.size());
+}
+
+void countNodes(xmlParserCtxtPtr parser, int count)
+{
+    progressOf(parser).nodes += count;
+    if (progressOf(parser).nodes > Document::maximumNodes)
+        refuse(parser, TooManyNodes, u"There are too many elements."_s);
+}
+
+void addText(void* userData, const xmlChar* text, int length)
+{
+    const auto parser = static_cast<xmlParserCtxtPtr>(userData);
+    const xmlNode* const before = parser->node ? parser->node->last : nullptr;
+    xmlSAX2Characters(userData, text, length);
+    if (parser->node && parser->node->last != before)
+        countNodes(parser, 1);
+}
+
+void addCData(void* userData, const xmlChar* text, int length)
+{
+    const auto parser = static_cast<xmlParserCtxtPtr>(userData);
+    xmlSAX2CDataBlock(userData, text, length);
+    countNodes(parser, 1);
+}
+
+void addComment(void* userData, const xmlChar* text)
+{
+    xmlSAX2Comment(userData, text);
+    countNodes(static_cast<xmlParserCtxtPtr>(userData), 1);
+}
+
+void addInstruction(void* userData, const xmlChar* target, const xmlChar* data)
+{
+    xmlSAX2ProcessingInstruction(userData, target, data);
+    countNodes(static_cast<xmlParserCtxtPtr>(userData), 1);
+}
+
+/// Keeps the start tag of an element whose declarations don't all come first.
+void keepAttributeOrder(xmlParserCtxtPtr parser)
+{
+    const auto* const begin = reinterpret_cast<const char*>(parser->input->base);
+    const auto* const end = reinterpret_cast<const char*>(parser->input->cur);
+    const auto* at = end;
     while (at > begin && *at != '<')  // no "<" can stand inside a tag, not even in a value
         --at;
-    QStringList names;
-    const auto skipName = [&] {
-        while (at < end && !isBlank(*at) && *at != '=' && *at != '/' && *at != '>')
-            ++at;
-    };
-    skipName();
-    while (at < end) {
-        while (at < end && isBlank(*at))
-            ++at;
-        const char* const name = at;
-        skipName();
-        names.append(QString::fromUtf8(name, at - name));
-        while (at < end && *at != '"' && *at != '\'')
-            ++at;
-        const char quote = at < end ? *at++ : '"';
-        while (at < end && *at != quote)
-            ++at;
-        ++at;
-    }
-    return names;
+    const std::string_view tag(at, static_cast<size_t>(end - at));
+    const std::vector<std::string_view> names = namesInStartTag(tag);
+    const auto isDeclaration = [](std::string_view name) { return name == "xmlns" || name.starts_with("xmlns:"); };
+    if (!std::is_partitioned(names.begin(), names.end(), isDeclaration))
+        progressOf(parser).startTags.insert(parser->node, QByteArray(tag.data(), static_cast<qsizetype>(tag.size())));
 }
 
 void startElement(void* userData, const xmlChar* name, const xmlChar* prefix, const xmlChar* uri, int namespaceCount,
                   const xmlChar** namespaces, int attributeCount, int defaulted, const xmlChar** attributes)
 {
     const auto parser = static_cast<xmlParserCtxtPtr>(userData);
-    Progress& progress = progressOf(parser);
-    if (parser->nodeNr >= Document::maximumDepth) {
-        fail(progress, parser, TooDeep, u"The elements are nested too deeply."_s);
-        xmlStopParser(parser);
-        return;
-    }
+    if (parser->nodeNr >= Document::maximumDepth)
+        return refuse(parser, TooDeep, u"The elements are nested too deeply."_s);
+    if (attributeCount > mostAttributes || parser->nsNr > 2 * mostNamespaces)
+        return refuse(parser, TooManyAttributes, tooManyAttributes);
     xmlSAX2StartElementNs(userData, name, prefix, uri, namespaceCount, namespaces, attributeCount, defaulted,
                           attributes);
-    if (namespaceCount > 0 && attributeCount > 0 && parser->node && parser->input)
-        progress.attributeOrders.insert(parser->node,
-                                        namesInStartTag(reinterpret_cast<const char*>(parser->input->base),
-                                                        reinterpret_cast<const char*>(parser->input->cur)));
-}
-
-/// True when some tag has so many attributes that comparing each with each would take minutes.
-bool hasTooManyAttributes(std::string_view text)
-{
-    size_t at = 0;
-    while ((at = text.find('<', at)) != text.npos) {
-        const std::string_view rest = text.substr(at);
-        if (rest.starts_with("<!--") || rest.starts_with("<![CDATA[")) {
-            at = text.find(rest[2] == '-' ? "-->" : "]]>", at);
-            if (at == text.npos)
-                return false;
-            continue;
-        }
-        int count = 0;
-        for (++at; at < text.size() && text[at] != '>' && text[at] != '<'; ++at) {
-            if (text[at] == '=' && ++count > mostAttributes)
-                return true;
-            if (text[at] == '"' || text[at] == '\'')
-                at = std::min(text.find(text[at], at + 1), text.size() - 1);
-        }
-    }
-    return false;
+    if (namespaceCount > 0 && attributeCount > 0)
+        keepAttributeOrder(parser);
+    countNodes(parser, 1 + namespaceCount + 2 * attributeCount);  // an attribute's value is a node too
 }
 
 void removeBlankTexts(xmlDocPtr document)
@@ -241,34 +272,55 @@ ParseError limitError(quint32 code, const QString& reason)
 
 }  // namespace
 
+std::vector<std::string_view> namesInStartTag(std::string_view tag)
+{
+    std::vector<std::string_view> names;
+    size_t at = 0;
+    const auto skipName = [&] {
+        while (at < tag.size() && !isBlank(tag[at]) && tag[at] != '=' && tag[at] != '/' && tag[at] != '>')
+            ++at;
+    };
+    skipName();
+    while (at < tag.size()) {
+        while (at < tag.size() && isBlank(tag[at]))
+            ++at;
+        const size_t name = at;
+        skipName();
+        if (at == name)
+            break;
+        names.push_back(tag.substr(name, at - name));
+        at = std::min(tag.find_first_of("\"'", at), tag.size() - 1);
+        at = std::min(tag.find(tag[at], at + 1), tag.size() - 1) + 1;
+    }
+    return names;
+}
+
 bool parse(DocumentData& data, const QString& text)
 {
     data.clear();
     data.error = {};
-    const QByteArray bytes = text.size() > Document::maximumBytes ? QByteArray() : text.toUtf8();
-    if (text.size() > Document::maximumBytes || bytes.size() > Document::maximumBytes) {
+    if (text.size() > Document::maximumBytes) {
         data.error = limitError(TooLarge, u"The text is too large."_s);
         return false;
     }
-    if (hasTooManyAttributes({bytes.constData(), static_cast<size_t>(bytes.size())})) {
-        data.error = limitError(TooManyAttributes, u"An element has too many attributes."_s);
-        return false;
-    }
-
     if (text.contains(QChar(u'\0'))) {  // the library would take it for the end of the text
         data.error = limitError(NulCharacter, u"There is a character of the code 0."_s);
         return false;
     }
 
-    Progress progress;
     const std::unique_ptr<xmlParserCtxt, decltype(&xmlFreeParserCtxt)> parser(xmlNewParserCtxt(), &xmlFreeParserCtxt);
     Q_CHECK_PTR(parser.get());
+    Progress progress{text, parser.get()};
     parser->_private = &progress;
     parser->sax->serror = takeError;
     parser->sax->internalSubset = refuseDtd;
     parser->sax->startElementNs = startElement;
-    const xmlDocPtr document = xmlCtxtReadMemory(parser.get(), bytes.constData(), static_cast<int>(bytes.size()),
-                                                 nullptr, "UTF-8", XML_PARSE_HUGE | XML_PARSE_NONET);
+    parser->sax->characters = parser->sax->ignorableWhitespace = addText;
+    parser->sax->cdataBlock = addCData;
+    parser->sax->comment = addComment;
+    parser->sax->processingInstruction = addInstruction;
+    const xmlDocPtr document = xmlCtxtReadIO(parser.get(), feed, nullptr, &progress, nullptr, nullptr,
+                                             XML_PARSE_HUGE | XML_PARSE_NONET | XML_PARSE_IGNORE_ENC);
     if (!progress.failure && (!document || !xmlDocGetRootElement(document)))
         fail(progress, parser.get(), libraryErrors + XML_ERR_DOCUMENT_EMPTY, u"There is no root element."_s);
     if (progress.failure) {
@@ -278,7 +330,7 @@ bool parse(DocumentData& data, const QString& text)
         return false;
     }
     removeBlankTexts(document);
-    data.take(document, std::move(progress.attributeOrders));
+    data.take(document, std::move(progress.startTags));
     return true;
 }
 

@@ -84,12 +84,13 @@ private:
     DocumentData* document = nullptr;
 };
 
-/// One XML document. No DTD is accepted, nothing outside the document is ever fetched; the size of a text is bounded by
-/// `maximumBytes`, the depth by `maximumDepth`, beyond which the parse fails like any other.
+/// One XML document. No DTD is accepted, and nothing outside the document is ever fetched. The limits bound what a
+/// hostile text costs: beyond them the parse fails like any other.
 class Document {
 public:
-    static constexpr qint64 maximumBytes = 256LL * 1024 * 1024;
-    static constexpr int maximumDepth = 1000;
+    static constexpr qint64 maximumBytes = 256LL * 1024 * 1024;  // of the text, a byte for each character
+    static constexpr int maximumDepth = 250;
+    static constexpr int maximumNodes = 1'500'000;  // elements, attributes and their values, texts and others
 
     Document();
     ~Document();
