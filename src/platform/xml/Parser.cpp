@@ -175,10 +175,11 @@ void addText(void* userData, const xmlChar* text, int length)
         countNodes(parser, 1);
 }
 
+/// Neighbouring sections stay apart; the library would join them.
 void addCData(void* userData, const xmlChar* text, int length)
 {
     const auto parser = static_cast<xmlParserCtxtPtr>(userData);
-    xmlSAX2CDataBlock(userData, text, length);
+    xmlAddChild(parser->node, xmlNewCDataBlock(parser->myDoc, text, length));
     countNodes(parser, 1);
 }
 
