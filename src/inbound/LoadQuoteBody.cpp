@@ -273,7 +273,7 @@ qint64 takeDocument(const db::Recordset& quote, const Line& line, qint64 before)
     if (number == 0)
         number = numberForDocument(key, before);
     const QString path = NextDocumentName(key.number, key.subquote, number);
-    files::writeBytes(path, files::fromBase64(document.text()));
+    files::writeBytes(path, files::fromBase64(document.utf8()));
     gbSubletDocumentArrived = true;
     return number;
 }

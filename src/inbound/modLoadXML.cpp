@@ -11,6 +11,8 @@
 
 #include <QStringList>
 
+#include <optional>
+
 namespace kest {
 
 using namespace Qt::StringLiterals;
@@ -87,28 +89,35 @@ void withdrawWaitingRequests(const QString& requestNumber)
     }
 }
 
-bool load(QString& text, const QString& fileName)
+/// Returns the type of a message that goes to a loader, in upper case; none after a report, or for a notice.
+std::optional<QString> typeToLoad(QString& text, const QString& fileName)
 {
     xml::Document message = parsedMessage(text);
     if (message.parseError().errorCode == xml::BareAmpersand && escapeAmpersands(text))
         message.loadXML(text);
     if (message.parseError().errorCode != 0) {
         reportParseError(message.parseError(), fileName);
-        return false;
+        return {};
     }
 
     const xml::Node root = message.documentElement();
     if (isNotice(root)) {
         takeNotice(root, fileName);
-        return false;
+        return {};
     }
 
     const QString messageType = root.textOf(u"messageType"_s);
     if (messageType == u"MANQ"_s)
         withdrawWaitingRequests(root.textOf(u"//rootns:getQuoteResponse/rootns:quoteRequestNumber"_s));
+    return messageType.toUpper();
+}
 
+bool load(QString& text, const QString& fileName)
+{
+    const std::optional<QString> type =
+        typeToLoad(text, fileName);  // its document is gone when the loader parses the text again
     for (const Loader& loader : loaders) {
-        if (loader.messageType == messageType.toUpper())
+        if (type == QString(loader.messageType))
             return loader.load(text, fileName);
     }
     return false;

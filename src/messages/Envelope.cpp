@@ -49,12 +49,13 @@ void SetupDocument(xml::Document& document)
     document.setSelectionNamespaces(prefixes);
 }
 
-QString AddXsiDeclaration(const QString& text)
+QString AddXsiDeclaration(QString text)
 {
     const qsizetype first = text.indexOf("xmlns"_L1);
     if (first < 0 || text.contains(schemaInstance, Qt::CaseInsensitive))
         return text;
-    return text.first(first) + schemaInstance + text.sliced(first);
+    text.insert(first, schemaInstance);
+    return text;
 }
 
 bool isSameWhenPrepared(const QString& text)
@@ -144,7 +145,7 @@ xml::Document parsedMessage(QString& text)
 {
     xml::Document document;
     SetupDocument(document);
-    text = AddXsiDeclaration(text);
+    text = AddXsiDeclaration(std::move(text));
     document.loadXML(text);
     return document;
 }

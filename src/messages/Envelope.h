@@ -14,7 +14,7 @@ QString GetNamespaceURI();
 void SetupDocument(xml::Document& document);
 /// Inserts the schema-instance declaration before the first "xmlns" of the text. Returns the text unchanged if it has
 /// no "xmlns", or if it already has the declaration in exactly this wording.
-QString AddXsiDeclaration(const QString& text);
+QString AddXsiDeclaration(QString text);
 /// Returns true if the text gives the same document before and after AddXsiDeclaration(), so that it needs no second
 /// parse. Returns false in doubt.
 bool isSameWhenPrepared(const QString& text);

@@ -157,12 +157,11 @@ QString GetMatchedFileName(const QString& quoteNumber)
     return name;
 }
 
-MessageQuoteKey GetMessageQuoteKey(const QString& text)
+MessageQuoteKey GetMessageQuoteKey(QString text)
 {
     MessageQuoteKey key;
     attempt([&] {
-        QString prepared = text;
-        const xml::Document message = parsedMessage(prepared);
+        const xml::Document message = parsedMessage(text);
         const QString type = message.textOf(u"messageType"_s).toUpper();
         for (const KeySource& source : keySources)
             if (type == source.type)

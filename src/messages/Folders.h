@@ -27,7 +27,7 @@ struct MessageQuoteKey {
     bool isQuoteRequest = false;
 };
 /// Returns the quote that a message is about.
-MessageQuoteKey GetMessageQuoteKey(const QString& text);
+MessageQuoteKey GetMessageQuoteKey(QString text);
 
 /// Deletes a file that another process may still have open: retries in the background.
 void DeleteFileByBatch(const QString& path);

@@ -79,7 +79,7 @@ TEST_F(Files, PathsNamesPatternsAndBase64AreTakenAsTheTableSays)
         if (question == u"for writing"_s)
             return files::pathForWriting(box, text).remove(box);
         if (question == u"base64"_s)
-            return QString::fromLatin1(files::fromBase64(text));
+            return QString::fromLatin1(files::fromBase64(text.toUtf8()));
         return toText(files::matches(text, question.mid(5)));
     };
     for (const QStringList& row : test::rowsIn("files.txt"))

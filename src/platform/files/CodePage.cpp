@@ -25,9 +25,9 @@ char byteOf(char16_t c)
     return place == std::end(upperControls) ? '?' : static_cast<char>(0x80 + (place - std::begin(upperControls)));
 }
 
-bool isWhiteSpace(QChar c)
+bool isWhiteSpace(char c)
 {
-    return c == u' ' || c == u'\t' || c == u'\r' || c == u'\n' || c == u'\f' || c == u'\v';
+    return c == ' ' || c == '\t' || c == '\r' || c == '\n' || c == '\f' || c == '\v';
 }
 
 bool isBase64Letter(char c)
@@ -61,18 +61,15 @@ QString fromCodePage(const QByteArray& bytes)
     return text;
 }
 
-QByteArray fromBase64(const QString& text)
+QByteArray fromBase64(QByteArrayView text)
 {
     QByteArray letters;
     letters.reserve(text.size());
-    for (const QChar c : text) {
-        if (!isWhiteSpace(c))
-            letters.append(c.unicode() < 0x80 ? static_cast<char>(c.unicode()) : '?');
-    }
+    std::copy_if(text.begin(), text.end(), std::back_inserter(letters), [](char c) { return !isWhiteSpace(c); });
     const qsizetype padding = letters.endsWith("==") ? 2 : letters.endsWith('=') ? 1 : 0;
     if (letters.size() % 4 != 0 || !std::all_of(letters.begin(), letters.end() - padding, isBase64Letter))
         throw RuntimeError(TypeMismatch, u"The text is not base64"_s);
-    return QByteArray::fromBase64(letters);
+    return QByteArray::fromBase64Encoding(std::move(letters)).decoded;
 }
 
 }  // namespace kest::files

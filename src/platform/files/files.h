@@ -63,6 +63,6 @@ bool waitForBackground(int milliseconds);
 QByteArray toCodePage(const QString& text);
 QString fromCodePage(const QByteArray& bytes);
 /// Strict base64 once white space is taken out; throws TypeMismatch for anything else.
-QByteArray fromBase64(const QString& text);
+QByteArray fromBase64(QByteArrayView text);
 
 }  // namespace kest::files

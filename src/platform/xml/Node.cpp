@@ -159,6 +159,15 @@ QString Node::text() const
     return textOfNode(required());
 }
 
+QByteArray Node::utf8() const
+{
+    const xmlNode* const only = required()->children;
+    const bool isOneText = only && !only->next && !isBlankText(only) &&
+                           (only->type == XML_TEXT_NODE || only->type == XML_CDATA_SECTION_NODE);
+    return isOneText ? QByteArray::fromRawData(reinterpret_cast<const char*>(only->content), xmlStrlen(only->content))
+                     : text().toUtf8();
+}
+
 void Node::setText(const QString& text)
 {
     const QByteArray allowed = allowedText(text).toUtf8();

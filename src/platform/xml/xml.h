@@ -49,6 +49,8 @@ public:
     QString namespaceURI() const;
     /// The text of all descendants, joined; a text node of white space only counts for nothing.
     QString text() const;
+    /// The same as UTF-8; of an element with one text it refers to the document's own memory, and lives as long.
+    QByteArray utf8() const;
     void setText(const QString& text);
     /// Without declaration and added white space.
     QString xml() const;
