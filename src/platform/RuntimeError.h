@@ -15,6 +15,7 @@ enum ErrorNumber : int {
     FileNotFound = 53,
     FileInputOutput = 57,
     FileExists = 58,
+    DiskFull = 61,
     PermissionDenied = 70,
     PathNotFound = 76,
     NoObject = 91,  // an object, an element or a connection is missing

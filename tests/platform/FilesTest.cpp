@@ -4,13 +4,14 @@
 #include "platform/values.h"
 #include "support/Cases.h"
 #include "support/Failure.h"
+#include "support/FullDisk.h"
 #include "support/TestProfile.h"
 
 #include <QDir>
 #include <QElapsedTimer>
 #include <QFile>
 
-#include <sys/resource.h>
+#include <fcntl.h>
 #include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
@@ -46,27 +47,6 @@ protected:
     }
 
     test::TestProfile profile;
-};
-
-/// Limits the size of all files that this process writes, as a full disk would.
-class FullDisk {
-public:
-    explicit FullDisk(rlim_t bytes) : handler(std::signal(SIGXFSZ, SIG_IGN))
-    {
-        ::getrlimit(RLIMIT_FSIZE, &before);
-        const rlimit small{bytes, before.rlim_max};
-        ::setrlimit(RLIMIT_FSIZE, &small);
-    }
-    ~FullDisk()
-    {
-        ::setrlimit(RLIMIT_FSIZE, &before);
-        std::signal(SIGXFSZ, handler);
-    }
-    Q_DISABLE_COPY_MOVE(FullDisk)
-
-private:
-    rlimit before{};
-    void (*handler)(int);
 };
 
 }  // namespace
@@ -152,10 +132,10 @@ TEST_F(Files, AFullDiskLeavesTheOldFileAndNoHalfOne)
     files::write(box + u"a.xml"_s, u"old"_s);
     files::write(box + u"big.jpg"_s, QString(5000, u'x'));
     {
-        const FullDisk full(1000);
-        EXPECT_EQ(failureOf([&] { files::write(box + u"a.xml"_s, QString(5000, u'y')); }), FileInputOutput);
-        EXPECT_EQ(failureOf([&] { files::append(box + u"a.xml"_s, QString(5000, u'y')); }), FileInputOutput);
-        EXPECT_EQ(failureOf([&] { files::copy(box + u"big.jpg"_s, box + u"copy.jpg"_s); }), FileInputOutput);
+        const test::FullDisk full(1000);
+        EXPECT_EQ(failureOf([&] { files::write(box + u"a.xml"_s, QString(5000, u'y')); }), DiskFull);
+        EXPECT_EQ(failureOf([&] { files::append(box + u"a.xml"_s, QString(5000, u'y')); }), DiskFull);
+        EXPECT_EQ(failureOf([&] { files::copy(box + u"big.jpg"_s, box + u"copy.jpg"_s); }), DiskFull);
     }
     EXPECT_EQ(files::read(box + u"a.xml"_s), u"old"_s);
     EXPECT_EQ(allNames(), (QStringList{u"a.xml"_s, u"big.jpg"_s}));

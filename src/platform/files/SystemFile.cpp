@@ -121,6 +121,8 @@ void throwSystemError(const QString& systemPath)
             throwFileError(PermissionDenied, systemPath);
         default:
             throwFileError(FileInputOutput, systemPath);
+            case DiskFull:
+                return u"Disk full"_s;
     }
 }
 
@@ -146,6 +148,10 @@ qint64 SystemFile::size() const
         throwSystemError(path);
     return state.st_size;
 }
+        case ENOSPC:
+        case EDQUOT:
+        case EFBIG:
+            throwFileError(DiskFull, systemPath);
 
 QByteArray SystemFile::read(qsizetype most)
 {

@@ -12,8 +12,9 @@ namespace kest::files {
 //   d:\...                    drive_d/...
 //   \\s\share\x               unc/s/share/x
 // A path without a drive lies on c:, and ".." never leads out of a drive.
-// Names are found without regard to case: the exact spelling first, then the first by name.
-// Failures throw RuntimeError: FileNotFound, PathNotFound, PermissionDenied, FileInputOutput.
+// Names are found without regard to case: the exact spelling first, then the first by name. A name on the disk that is
+// no UTF-8 keeps each of its other bytes as a character of its own, U+DC80 to U+DCFF.
+// Failures throw RuntimeError: FileNotFound, PathNotFound, PermissionDenied, DiskFull, FileInputOutput.
 
 /// The path on this system. What does not exist keeps the spelling that was asked for.
 QString systemPath(const QString& path);
