@@ -123,8 +123,7 @@ void MoveMessage(const QString& file, const QString& action)
             gsMatchedQTNNO.isEmpty() ? GetReadFileName(gsUnreadPath + file) : GetMatchedFileName(gsMatchedQTNNO);
         if (name.isEmpty())
             name = file;
-        if (files::exists(gsReadPath + name))
-            attempt([&] { files::remove(gsReadPath + name); });
+        // an older message of that name goes only when its successor is there: the disk may be full
         const bool copied = attempt([&] { files::copy(gsUnreadPath + file, gsReadPath + name); });
         if (copied && files::exists(gsReadPath + name))
             attempt([&] { files::remove(gsUnreadPath + file); });

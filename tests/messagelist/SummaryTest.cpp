@@ -131,10 +131,14 @@ TEST_F(MessageList, WhatCannotBeReadIsReportedAndTheRestIsListed)
     QFile huge(files::systemPath(gsUnreadPath) + u"/huge.xml"_s);
     ASSERT_TRUE(huge.open(QIODevice::WriteOnly) && huge.resize(xml::Document::maximumBytes + 1));
     arrive("last.xml", quoteRequest("QR1"));
+    arrive("y.xml", quoteRequest("QR4"));
     files::write(gsUnreadPath + u"Schrägstück \u20ac.xml"_s, quoteRequest("QR2").text());
     files::write(gsUnreadPath + u"\u043f\u0438\u0441\u044c\u043c\u043e.xml"_s, quoteRequest("QR3").text());
 
-    EXPECT_EQ(listedFiles(), "last.xml Schrägstück \u20ac.xml \u043f\u0438\u0441\u044c\u043c\u043e.xml");
+    const QByteArray latin1 = files::systemPath(gsUnreadPath).toUtf8() + "/z\xe9.xml";
+    ASSERT_EQ(::rename((files::systemPath(gsUnreadPath).toUtf8() + "/y.xml").constData(), latin1.constData()), 0);
+
+    EXPECT_EQ(listedFiles(), "last.xml Schrägstück \u20ac.xml z?.xml \u043f\u0438\u0441\u044c\u043c\u043e.xml");
     QStringList expected;
     for (const char* name :
          {"deep.xml", "doctype.xml", "dxml", "empty.xml", "g..xml", "garbage.xml", "half.xml", "huge.xml"})

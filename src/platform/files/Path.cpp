@@ -3,8 +3,6 @@
 #include "platform/files/files.h"
 #include "platform/profile.h"
 
-#include <QFile>
-
 #include <dirent.h>
 #include <strings.h>
 #include <sys/stat.h>
@@ -79,13 +77,13 @@ QString variantIn(const QString& folder, const QString& name)
     if (!open)
         return {};
     const bool plain = isAscii(name);
-    const QByteArray wanted = QFile::encodeName(name);
+    const QByteArray wanted = encodedPath(name);
     QString found;
     while (const dirent* entry = ::readdir(open.get())) {
         if (plain ? ::strcasecmp(entry->d_name, wanted.constData()) != 0
-                  : QFile::decodeName(entry->d_name).compare(name, Qt::CaseInsensitive) != 0)
+                  : decodedName(entry->d_name).compare(name, Qt::CaseInsensitive) != 0)
             continue;
-        const QString candidate = QFile::decodeName(entry->d_name);
+        const QString candidate = decodedName(entry->d_name);
         if (found.isEmpty() || candidate < found)
             found = candidate;
     }
@@ -199,7 +197,7 @@ QStringList list(const QString& folder, const QString& pattern)
     while (const dirent* entry = ::readdir(open.get())) {
         if (entry->d_type == DT_DIR)
             continue;
-        const QString name = QFile::decodeName(entry->d_name);
+        const QString name = decodedName(entry->d_name);
         if (isTemporaryName(name) || !matches(name, pattern))
             continue;
         if (entry->d_type == DT_REG || isFile(place + u'/' + name))
@@ -212,6 +210,20 @@ QStringList list(const QString& folder, const QString& pattern)
     for (Found& file : files)
         names.append(std::move(file.name));
     return names;
+}
+
+void removeLeftOvers(const QString& folder)
+{
+    constexpr qint64 day = 24 * 60 * 60;  // seconds
+    const QString place = systemPath(folder);
+    const Folder open = openFolder(place);
+    if (!open)
+        return;
+    while (const dirent* entry = ::readdir(open.get())) {
+        const QString name = decodedName(entry->d_name);
+        if (isTemporaryName(name) && ageOf(place + u'/' + name) > day)
+            attempt([&] { removeFile(place + u'/' + name); });
+    }
 }
 
 }  // namespace kest::files

@@ -3,7 +3,6 @@
 #include "platform/RuntimeError.h"
 #include "platform/files/FaultInjection.h"
 
-#include <QFile>
 #include <QRandomGenerator>
 
 #include <fcntl.h>
@@ -24,6 +23,11 @@ namespace {
 
 constexpr mode_t anyoneMayRead = S_IRUSR | S_IRGRP | S_IROTH;
 constexpr mode_t anyoneMayWrite = S_IWUSR | S_IWGRP | S_IWOTH;
+
+// Bytes of a name that is no UTF-8, as characters that no text has.
+constexpr char16_t byteOffset = 0xDC00;
+constexpr char16_t firstByte = 0xDC80;
+constexpr char16_t lastByte = 0xDCFF;
 
 std::mutex faultMutex;
 std::function<bool()> currentFault;
@@ -81,7 +85,30 @@ QByteArray encodedPath(const QString& systemPath)
 {
     if (systemPath.contains(QChar(u'\0')))
         throwFileError(PathNotFound, systemPath);
-    return QFile::encodeName(systemPath);
+    QByteArray path;
+    qsizetype from = 0;  // where the text begins that is not yet in `path`
+    for (qsizetype i = 0; i < systemPath.size(); ++i) {
+        const char16_t c = systemPath[i].unicode();
+        const bool isByte = c >= firstByte && c <= lastByte && !(i > 0 && systemPath[i - 1].isHighSurrogate());
+        if (!isByte)
+            continue;
+        path += QStringView(systemPath).sliced(from, i - from).toUtf8() + static_cast<char>(c - byteOffset);
+        from = i + 1;
+    }
+    return path + QStringView(systemPath).sliced(from).toUtf8();
+}
+
+QString decodedName(const char* name)
+{
+    const QByteArrayView bytes(name);
+    if (bytes.isValidUtf8())
+        return QString::fromUtf8(bytes);
+    QString text;
+    for (const char c : bytes) {
+        const auto byte = static_cast<unsigned char>(c);
+        text += QChar(byte < 0x80 ? byte : byteOffset + byte);
+    }
+    return text;
 }
 
 void throwFileError(int number, const QString& systemPath)
@@ -126,9 +153,9 @@ void throwSystemError(const QString& systemPath)
     }
 }
 
-SystemFile::SystemFile(const QString& systemPath, int flags)
-    : path(systemPath), descriptor(withoutInterruption([name = encodedPath(systemPath), flags] {
-          return ::open(name.constData(), flags | O_CLOEXEC | O_NONBLOCK, 0666);
+SystemFile::SystemFile(const QString& systemPath, int flags, unsigned mode)
+    : path(systemPath), descriptor(withoutInterruption([name = encodedPath(systemPath), flags, mode] {
+          return ::open(name.constData(), flags | O_CLOEXEC | O_NONBLOCK, mode);
       }))
 {
     if (descriptor < 0)

@@ -36,6 +36,8 @@ private:
 QByteArray encodedPath(const QString& systemPath);
 
 /// Throws what the last call's `errno` means for this path.
+/// A name as a folder of this system gives it; `encodedPath` makes the same bytes of it.
+QString decodedName(const char* name);
 [[noreturn]] void throwSystemError(const QString& systemPath);
 [[noreturn]] void throwFileError(int number, const QString& systemPath);
 
