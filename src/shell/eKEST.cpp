@@ -6,6 +6,8 @@
 #include "base/modLoggerEx.h"
 #include "platform/Prompt.h"
 #include "platform/desktop/Window.h"
+#include "platform/files/files.h"
+#include "platform/profile.h"
 #include "quotedata/Quote.h"
 #include "shell/frmKEST.h"
 
@@ -41,6 +43,9 @@ eKEST::eKEST()
     gsImagesPath = GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"ImagesPath"_s, u"c:\\wirimg\\"_s);
 }
 
+    for (const QString& folder : {gsUnreadPath, gsReadPath, gsUnsentPath, gsSentPath, homeFolder() + u"PDF\\"_s,
+                                  gsImagesPath, profile::root(), profile::componentFolder()})
+        files::removeLeftOvers(folder);
 eKEST::~eKEST()
 {
     if (--objects > 0)

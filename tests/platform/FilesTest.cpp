@@ -197,6 +197,36 @@ TEST_F(Files, AFileThatIsHeldGoesInTheBackground)
     EXPECT_TRUE(files::waitForBackground(0));
 }
 
+TEST_F(Files, ANameThatIsNoUtf8IsOneLikeAnyOther)
+{
+    const QString emoji = u"\U0001F480.xml"_s;  // half of its character looks like a byte
+    files::write(box + emoji, u"1"_s);
+    for (const char* name : {"caf\xe9.xml", "\xff\xfe", "Gr\xc3\xbc\xdf.xml"}) {
+        const int made = ::creat((onDisk({}).toUtf8() + name).constData(), 0644);
+        ASSERT_GE(made, 0);
+        ::close(made);
+        files::remove(box + emoji);
+        const QStringList names = files::list(box);
+        ASSERT_EQ(names.size(), 1);
+        EXPECT_EQ(files::read(box + QString(names[0]).replace(u"xml"_s, u"XML"_s)), QString());
+        EXPECT_TRUE(files::isPlainName(names[0]));
+        files::move(box + names[0], box + emoji);
+        EXPECT_EQ(files::list(box), QStringList{emoji});
+    }
+}
+
+TEST_F(Files, LeftOversOfKilledWritersGoAfterADay)
+{
+    touch({".kest-old.tmp", ".kest-new.tmp", "old.xml", ".kest-old.xml"});
+    const timespec twoDaysAgo[] = {{::time(nullptr) - 2 * 86400, 0}, {::time(nullptr) - 2 * 86400, 0}};
+    for (const char* old : {".kest-old.tmp", "old.xml", ".kest-old.xml"})
+        ASSERT_EQ(::utimensat(AT_FDCWD, QFile::encodeName(onDisk(QLatin1StringView(old))).constData(), twoDaysAgo, 0),
+                  0);
+    files::removeLeftOvers(box);
+    EXPECT_EQ(allNames().join(u' '), u".kest-new.tmp .kest-old.xml old.xml"_s);
+    files::removeLeftOvers(u"c:\\nowhere"_s);
+}
+
 TEST_F(Files, ALockGoesWithItsProcessWhateverItsFileHolds)
 {
     const QString path = box + u"x.lock"_s;

@@ -324,6 +324,12 @@ void removeFile(const QString& systemPath)
 }
 
 bool isTemporaryName(const QString& name)
+qint64 ageOf(const QString& systemPath)
+{
+    const auto state = stateOf(systemPath);
+    return state ? ::time(nullptr) - state->st_mtime : 0;
+}
+
 {
     return name.startsWith(".kest-"_L1) && name.endsWith(".tmp"_L1);
 }

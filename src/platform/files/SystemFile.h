@@ -60,6 +60,9 @@ void removeFile(const QString& systemPath);
 bool isTemporaryName(const QString& name);
 
 /// The path on this system with the last element as it was asked for, even where a variant in another case exists.
+/// Seconds since the last write; 0 for a file that is not there.
+qint64 ageOf(const QString& systemPath);
+
 QString spelledPath(const QString& path);
 
 /// Throws when a test wants this operation to fail.

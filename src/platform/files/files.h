@@ -53,6 +53,10 @@ bool matches(const QString& name, const QString& pattern);
 /// True for a name that stays in its folder: not empty, no separator, no "..", no drive, no control character.
 /// Names out of a message or a table pass through here: for reading a bad one is a file that does not exist.
 bool isPlainName(const QString& name);
+/// Removes the temporary files of `write` that are older than a day: those of processes that were killed. What can't be
+/// removed stays.
+void removeLeftOvers(const QString& folder);
+
 /// `folder` + `name`; throws PathNotFound for a name that is not plain. For names that are about to be written.
 QString pathForWriting(const QString& folder, const QString& name);
 
