@@ -1,16 +1,19 @@
 // Tests the preview: which template it opens, which values it fills in, its window, and the pages.
 #include "platform/database/Recordset.h"
-#include "platform/script/Gestures.h"
 #include "platform/print/OutputFolder.h"
 #include "platform/print/Pages.h"
+#include "platform/script/Gestures.h"
 #include "platform/settings/registry.h"
 #include "reports/BuildAuthReport.h"
 #include "reports/Previews.h"
 #include "reports/frmPrintPreview.h"
+#include "support/Failure.h"
+#include "support/FullDisk.h"
 #include "support/Hands.h"
 
 #include <QJsonDocument>
 #include <QLabel>
+#include <QPdfWriter>
 #include <QPushButton>
 #include <QRegularExpression>
 #include <QToolButton>
@@ -149,6 +152,55 @@ TEST_F(Preview, ARowOfSeveralLinesIsNeverDividedAndALongTextIsWhole)
         for (int i = 0; i < 900; ++i)
             EXPECT_EQ(read.count(QRegularExpression(u"\\bword%1\\b"_s.arg(i))), 1) << i;
     }
+}
+
+TEST_F(Preview, ALayoutWithoutRoomIsAFailureThatIsTold)
+{
+    const QString pdf = root() + u"/out.pdf"_s;
+    const QByteArray tall = QByteArray("<p>text</p>").repeated(100);
+    for (const QByteArray& body : {"<header>" + tall + "</header><p>x</p>", "<p>x</p><footer>" + tall + "</footer>",
+                                   "<table><thead><tr><th>" + tall + "</th></tr></thead>" +
+                                       QByteArray("<tr><td>x</td></tr>").repeated(200) + "</table>"}) {
+        putTemplate("test.html", "<body>" + body + "</body>");
+        const report::Report report(u"c:\\wirra32\\report\\test.html"_s);
+        EXPECT_EQ(failureOf([&] { report::writePdf(report, pdf); }), Overflow) << body.left(20).toStdString();
+        EXPECT_FALSE(files::exists(pdf));
+    }
+    QPdfWriter label(pdf);
+    label.setPageSize(QPageSize(QSizeF(62, 29), QPageSize::Millimeter));
+    label.setPageMargins(QMarginsF(3, 3, 3, 3), QPageLayout::Millimeter);
+    EXPECT_EQ(failureOf([&] { report::paint(comparisonOf(3, u"line %1"_s), label); }), Overflow);
+
+    putTemplate("720.html", "<title>T</title><body><header>" + tall + "</header><p>x</p></body>");
+    show(720);
+    EXPECT_NE(shown().find("The report \"T\" does not fit on this paper"), std::string::npos);
+}
+
+TEST_F(Preview, ADamagedTemplateShowsWhatIsLeftOfItOrNothing)
+{
+    const QByteArray whole = files::readBytes(u"c:\\wirra32\\report\\720.html"_s);
+    const QByteArray pieces[] = {QByteArray(1, '\0'), "{{", "}}", "<", ">", "</template>", "\xff"};
+    for (qsizetype i = 1; i < 20; ++i) {
+        const qsizetype at = whole.size() * i / 20;
+        putTemplate("720.html", whole.first(at));
+        show(720);
+        putTemplate("720.html", whole.first(at) + pieces[i % std::size(pieces)] + whole.sliced(at));
+        show(720);
+    }
+    QByteArray fragments;
+    for (int i = 0; i < 40; ++i)
+        fragments += "<template id=\"f" + QByteArray::number(i) + "\">" +
+                     ("{{>f" + QByteArray::number(i + 1) + "}}").repeated(9) + "</template>";
+    putTemplate("720.html", "<body>{{>f0}}" + fragments + "</body>");
+    show(720);
+    EXPECT_EQ(shown(), "");
+}
+
+TEST_F(Preview, APdfThatCannotBeWrittenWholeIsNotThere)
+{
+    const FullDisk full(2000);
+    EXPECT_EQ(failureOf([&] { report::writePdf(comparisonOf(30, u"line %1"_s), root() + u"/out.pdf"_s); }), DiskFull);
+    EXPECT_EQ(filesIn(root()).filter(u"pdf"_s), QStringList());
 }
 
 TEST_F(Preview, TheViewerFillsTheWindowAboveItsButton)

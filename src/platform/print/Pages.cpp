@@ -2,9 +2,11 @@
 
 #include "platform/RuntimeError.h"
 #include "platform/desktop/Progress.h"
+#include "platform/files/files.h"
 #include "platform/print/Report.h"
 
 #include <QAbstractTextDocumentLayout>
+#include <QBuffer>
 #include <QGuiApplication>
 #include <QPainter>
 #include <QPdfWriter>
@@ -25,6 +27,7 @@ constexpr double margin = 15;       // millimetres
 constexpr int pdfResolution = 600;  // dots per inch
 constexpr double gap = 6;           // points between the body and header or footer
 constexpr double pointsPerInch = 72;
+constexpr double leastRoom = 36;  // points of a page that the body needs: three lines
 
 double heightOf(const QTextDocument& document)
 {
@@ -135,6 +138,7 @@ void Pages::slice()
             pieces[i].bottom = pieces[i + 1].bottom;
 
     const double room = height - headerHeight - footerHeight;
+    const double least = leastRoom / pointsPerInch * device.logicalDpiY();
     const double end = heightOf(*body);
     double top = 0;
     qsizetype first = 0;  // the first piece of the page
@@ -145,11 +149,17 @@ void Pages::slice()
             page.headBottom = pieces[first].headBottom;
         }
         const double limit = top + room - (page.headBottom - page.headTop);
+        if (limit < top + least)
+            throw RuntimeError(Overflow,
+                               u"The report \"%1\" does not fit on this paper: its header, its footer and the "
+                               "repeated heads of its tables leave no room for a row."_s.arg(report.title()));
         qsizetype next = first;
         while (next < pieces.size() && pieces[next].bottom <= limit)
             ++next;
         if (next < pieces.size())
             page.bottom = next > first ? pieces[next].top : lastLineAbove(top, limit);
+        if (page.bottom <= top)  // pieces side by side
+            page.bottom = limit;
         slices.append(page);
         top = page.bottom;
         for (first = next; first < pieces.size() && pieces[first].bottom <= top;)
@@ -245,11 +255,15 @@ void paint(const Report& report, QPagedPaintDevice& device, int firstPage, int l
 
 void writePdf(const Report& report, const QString& systemPath)
 {
-    QPdfWriter writer(systemPath);
+    QByteArray pdf;
+    QBuffer buffer(&pdf);
+    buffer.open(QIODevice::WriteOnly);
+    QPdfWriter writer(&buffer);
     writer.setResolution(pdfResolution);
     writer.setTitle(report.title());
     setPaper(writer);
     paint(report, writer);
+    files::writeBytes(systemPath, pdf);
 }
 
 }  // namespace kest::report

@@ -20,6 +20,7 @@ class Report;
 class Pages {
 public:
     /// `device` determines the paper, its margins and its resolution. It must outlive the pages, and so must `report`.
+    /// Throws Overflow if header, footer and a repeated table head leave no room on the paper.
     Pages(const Report& report, QPagedPaintDevice& device);
 
     int count() const { return static_cast<int>(slices.size()); }
@@ -71,7 +72,7 @@ private:
 void paint(const Report& report, QPagedPaintDevice& device, int firstPage = 1, int lastPage = 0);
 /// Sets the device to A4 with the margins of a report.
 void setPaper(QPagedPaintDevice& device);
-/// Writes the report as a PDF file. Throws RuntimeError if the file can't be written.
+/// Writes the report as a PDF file, whole or not at all. Throws RuntimeError if the file can't be written.
 void writePdf(const Report& report, const QString& systemPath);
 
 }  // namespace kest::report

@@ -104,7 +104,7 @@ void Preview::addTool(QHBoxLayout& row, const QString& name, const QString& capt
 
 void Preview::goTo(int page)
 {
-    view->setCurrentPage(qBound(1, page, view->pageCount()));
+    view->setCurrentPage(qBound(1, page, qMax(1, view->pageCount())));
     showPage();
 }
 

@@ -20,6 +20,8 @@ namespace mustache = kainjow::mustache;
 
 namespace {
 
+constexpr qsizetype longestBody = 10'000'000;  // characters
+
 [[noreturn]] void noTemplate(const QString& why)
 {
     throw RuntimeError(TypeMismatch, u"The file is not a report template: "_s + why);
@@ -186,6 +188,8 @@ void Report::putInFragments()
     for (auto found = fragment.match(body_); found.hasMatch(); found = fragment.match(body_)) {
         body_.remove(found.capturedStart(), found.capturedLength());
         body_.replace(u"{{>"_s + found.captured(1) + u"}}"_s, found.captured(2).trimmed());
+        if (body_.size() > longestBody)
+            noTemplate(u"its fragments hold each other"_s);
     }
 }
 
