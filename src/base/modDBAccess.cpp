@@ -1,8 +1,10 @@
 #include "base/modDBAccess.h"
 
 #include "base/SharedVariables.h"
+#include "base/modLoggerEx.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
+#include "platform/settings/registry.h"
 #include "platform/values.h"
 
 #include <QSysInfo>
@@ -22,11 +24,7 @@ namespace {
 constexpr int commandTimeout = 120;  // seconds
 constexpr auto mysqlServer = "mysql:"_L1;
 
-struct Failure {
-    int number = 0;
-    QString description;
-};
-Failure lastFailure;  // from the last attempt to open the connection
+std::optional<RuntimeError> lastFailure;  // from the last attempt to open the connection
 
 QString splashSetting(const QString& key, const QString& fallback = {})
 {
@@ -88,17 +86,25 @@ void OpenDatabase()
 {
     if (!gcnDB)
         gcnDB = std::make_shared<db::Connection>();  // keep an existing one: recordsets, such as the panel's, use it
-    lastFailure = {};
-    attempt([] { readConnectionSettings(); });
-    attempt([] {
+    const QString failureBefore = connectionFailure();
+    lastFailure.reset();
+    attempt([&] {
         try {
+            readConnectionSettings();
+            settings::check();  // a damaged file must not lead to the database of the defaults
             gcnDB->open(connectionText(driverNumber()));
         } catch (const RuntimeError& error) {
-            lastFailure = {error.number(), error.description()};
-            throw;
+            lastFailure = error;
+            if (error.description() != failureBefore)  // each event of an open window tries again
+                logFailure(error, u"modDBAccess.OpenDatabase"_s);
         }
     });
     attempt([] { gcnDB->setCommandTimeout(commandTimeout); });
+}
+
+QString connectionFailure()
+{
+    return lastFailure ? lastFailure->description() : QString();
 }
 
 QString connectionText(int driverNumber)
@@ -126,9 +132,9 @@ std::optional<db::Recordset> OpenRecordset(const QString& select, bool disconnec
     if (reconnect)
         gcnDB.reset();
     if (!EnsureConnection()) {
-        desktop::msgBox(
-            QString::number(lastFailure.number) + u": Could not Initialize Database! - "_s + lastFailure.description,
-            desktop::Icon::Critical);
+        desktop::msgBox(QString::number(lastFailure ? lastFailure->number() : 0) +
+                            u": Could not Initialize Database! - "_s + connectionFailure(),
+                        desktop::Icon::Critical);
         return std::nullopt;
     }
     db::Recordset rows(gcnDB);

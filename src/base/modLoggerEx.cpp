@@ -7,6 +7,8 @@
 #include <QDateTime>
 #include <QLocale>
 
+#include <optional>
+
 namespace kest {
 
 using namespace Qt::StringLiterals;
@@ -25,28 +27,46 @@ QString record(int line, const QString& source, const QString& number, const QSt
            u"\t\tDescription: "_s + description + lineBreak;
 }
 
-}  // namespace
-
-void LogError(int line, const QString& source, const QString& number, const QString& description, const QString& title,
-              int mode)
+void addRecord(const QString& text)
 {
-    if (mode == BoxOnly || mode == BoxAndFile)
-        desktop::msgBox(u"Line No: "_s + QString::number(line) + lineBreak + u"Source: "_s + source + lineBreak +
-                            u"Error Number: "_s + number + lineBreak + u"Description: "_s + description,
-                        desktop::Icon::Critical, title);
-    if (mode != BoxAndFile)
-        return;
-
-    const QString text = record(line, source, number, description);
     if (LogIsFull(errorLogPath()))
         files::write(errorLogPath(), text);
     else
         files::append(errorLogPath(), text);
 }
 
+}  // namespace
+
+void LogError(int line, const QString& source, const QString& number, const QString& description, const QString& title,
+              int mode)
+{
+    QString text = u"Line No: "_s + QString::number(line) + lineBreak + u"Source: "_s + source + lineBreak +
+                   u"Error Number: "_s + number + lineBreak + u"Description: "_s + description;
+    std::optional<RuntimeError> unwritten;
+    if (mode == BoxAndFile) {
+        try {
+            addRecord(record(line, source, number, description));
+        } catch (const RuntimeError& error) {
+            unwritten = error;
+            text += lineBreak + u"The error log can't be written: "_s + error.description();
+        }
+    }
+    if (mode == BoxOnly || mode == BoxAndFile)
+        desktop::msgBox(text, desktop::Icon::Critical, title);
+    if (unwritten)
+        throw unwritten->asTold();
+}
+
 void LogError(const RuntimeError& error, const QString& source, const QString& title)
 {
+    if (error.isTold())
+        throw error;
     LogError(0, source, QString::number(error.number()), error.description(), title, BoxAndFile);
+}
+
+void logFailure(const RuntimeError& error, const QString& source)
+{
+    addRecord(record(0, source, QString::number(error.number()), error.description()));
 }
 
 bool LogIsFull(const QString& path)

@@ -9,12 +9,15 @@ namespace kest {
 
 enum LogMode : int { BoxOnly = 0, BoxAndFile = 1 };
 
-/// Shows a box and, with the mode BoxAndFile, adds a record to the file. Pass 0 as `line` if it is unknown. Throws
-/// RuntimeError after the box if the file can't be written.
+/// Shows a box and, with the mode BoxAndFile, adds a record to the file. Pass 0 as `line` if it is unknown. If the file
+/// can't be written, the box says so, and the failure is thrown as one that the user knows already (`isTold`).
 void LogError(int line, const QString& source, const QString& number, const QString& description, const QString& title,
               int mode);
-/// Reports an exception with a box and a record.
+/// Reports an exception with a box and a record. Throws one that the user knows already again.
 void LogError(const RuntimeError& error, const QString& source, const QString& title);
+
+/// Adds a record without a box. Throws RuntimeError if the file can't be written.
+void logFailure(const RuntimeError& error, const QString& source);
 
 /// Returns true if the file exists and has at least 1,048,576 bytes.
 bool LogIsFull(const QString& path);

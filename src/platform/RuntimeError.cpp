@@ -17,4 +17,10 @@ RuntimeError& RuntimeError::withDatabaseCodes(QString native, QString state)
     return *this;
 }
 
+RuntimeError& RuntimeError::asTold()
+{
+    told_ = true;
+    return *this;
+}
+
 }  // namespace kest

@@ -43,6 +43,10 @@ public:
     const QString& sqlState() const { return sqlState_; }
     RuntimeError& withDatabaseCodes(QString native, QString state);
 
+    /// A failure that the user has been told of already: it ends what it passes through, and no other box comes.
+    bool isTold() const { return told_; }
+    RuntimeError& asTold();
+
     const char* what() const noexcept override { return utf8_.constData(); }
 
 private:
@@ -52,6 +56,7 @@ private:
     QString nativeCode_;
     QString sqlState_;
     QByteArray utf8_;
+    bool told_ = false;
 };
 
 /// Runs a step, ignores its RuntimeError, and returns true if there was none.

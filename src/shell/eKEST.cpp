@@ -41,11 +41,11 @@ eKEST::eKEST()
     gsUnsentPath = homeFolder() + u"AUnsent\\"_s;
     gsSentPath = homeFolder() + u"ASent\\"_s;
     gsImagesPath = GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"ImagesPath"_s, u"c:\\wirimg\\"_s);
-}
-
     for (const QString& folder : {gsUnreadPath, gsReadPath, gsUnsentPath, gsSentPath, homeFolder() + u"PDF\\"_s,
                                   gsImagesPath, profile::root(), profile::componentFolder()})
         files::removeLeftOvers(folder);
+}
+
 eKEST::~eKEST()
 {
     if (--objects > 0)
@@ -68,9 +68,12 @@ void eKEST::ShowKESTWindow(const QString& sQTNNO, const QString& sSubQuote)
 bool hasConnection()
 {
     gConn = GetConnection();
-    if (!gConn)
-        desktop::msgBox(u"Could not connect to the quote database, Please contact MarlinDesk Support."_s,
+    if (!gConn) {
+        constexpr qsizetype longestReason = 300;  // characters; all of it is in the error log
+        desktop::msgBox(u"Could not connect to the quote database, Please contact MarlinDesk Support.\r\n\r\n"_s +
+                            connectionFailure().left(longestReason),
                         desktop::Icon::Critical);
+    }
     return gConn != nullptr;
 }
 

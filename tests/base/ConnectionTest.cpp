@@ -1,6 +1,7 @@
 #include "base/ModRegistry.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
+#include "base/modLoggerEx.h"
 #include "support/ScriptedDesktop.h"
 #include "support/Shop.h"
 
@@ -59,6 +60,28 @@ TEST_F(ShopConnection, AnUnknownDriverNumberOnAnOldSystemOpensNothing)
     EXPECT_EQ(GetConnection(), nullptr);
     setSetting(u"CurrentVersion"_s, u"6.1"_s, u"Microsoft\\Windows NT\\CurrentVersion"_s);
     EXPECT_NE(GetConnection(), nullptr);
+}
+
+TEST_F(ShopConnection, WhyItFailedStandsInTheBoxAndOnceInTheLog)
+{
+    setSetting(u"DatabaseName"_s, u"Nowhere"_s);
+    gcnDB->close();
+    EXPECT_FALSE(hasConnection());
+    EXPECT_FALSE(EnsureConnection());
+    const QString reason = connectionFailure();
+    EXPECT_TRUE(reason.contains(u"Nowhere.db"_s)) << reason.toStdString();
+    EXPECT_EQ(
+        desktop->boxTexts(),
+        QStringList{u"Could not connect to the quote database, Please contact MarlinDesk Support.\r\n\r\n"_s + reason});
+    EXPECT_EQ(files::read(errorLogPath()).count(u"Description: "_s + reason), 1);
+
+    setSetting(u"DatabaseName"_s, u"WirSql"_s);
+    EXPECT_TRUE(EnsureConnection());
+    EXPECT_EQ(connectionFailure(), QString());
+    files::write(root() + u"/registry.ini"_s, u"\n"_s);
+    gcnDB->close();
+    EXPECT_FALSE(EnsureConnection()) << "not to the database of the defaults";
+    EXPECT_TRUE(connectionFailure().contains(u"damaged"_s));
 }
 
 TEST_F(ShopConnection, AMissingDatabaseIsTold)

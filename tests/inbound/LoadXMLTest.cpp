@@ -47,6 +47,19 @@ TEST_F(Dispatcher, AFailureStandsInTheLog)
     EXPECT_TRUE(files::read(errorLogPath()).contains(u"Source: modLoadXML.LoadXML"_s));
 }
 
+TEST_F(Dispatcher, AFailingLogAddsNoBox)
+{
+    quote("500").line(1);
+    QFile::remove(files::systemPath(errorLogPath()));
+    files::makeFolder(errorLogPath());  // in the way
+    arrive("m.xml", authorisedQuote("500").labour(1, "Z"));
+    EXPECT_FALSE(loadAsTheWindow(u"m.xml"_s));
+    const std::string boxes = shown();
+    EXPECT_EQ(QString::fromStdString(boxes).count(u"Line No: "_s), 1) << boxes;
+    EXPECT_NE(boxes.find("The change indicator \"Z\" is not known."), std::string::npos) << boxes;
+    EXPECT_NE(boxes.find("The error log can't be written: Permission denied"), std::string::npos) << boxes;
+}
+
 TEST_F(Dispatcher, ANoticeIsShownAndPutAside)
 {
     EXPECT_FALSE(load(marker("500"), "MDMSG7.xml"));
