@@ -61,7 +61,7 @@ QString usage()
   reprint FILE                  print a message of the read folder again
   joblink set --server S --port N --database D --user U     the password is read from standard input
   view unread|read|sent FILE    the indented text of a message
-  setting list | get APP SECTION KEY | set APP SECTION KEY VALUE
+  setting list | get APP SECTION KEY | set APP SECTION KEY VALUE     a password is read from standard input
   transport [--once|--window]   carry files between the message folders and an insurer that follows insurer.rules
 
 exit codes: 0 done, 1 refused or not loaded, 2 usage, 3 no connection or no profile, 4 needs an answer

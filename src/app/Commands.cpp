@@ -27,6 +27,7 @@
 #include <cstdio>
 #include <functional>
 #include <map>
+#include <optional>
 
 namespace kest::app {
 
@@ -74,6 +75,7 @@ Outcome init(const QStringList& arguments)
 
 Outcome showWhere(const QStringList&)
 {
+    settings::check();
     const QJsonObject places = where();
     return {.fields = places, .text = QString::fromUtf8(QJsonDocument(places).toJson()), .isWhole = true};
 }
@@ -102,6 +104,11 @@ Outcome open(const QStringList& arguments)
     return {.exitCode = connected ? Done : NoConnection};
 }
 
+bool isPassword(const QString& setting)
+{
+    return setting.endsWith(u"Pwd"_s, Qt::CaseInsensitive);
+}
+
 QJsonArray settingsAsJson()
 {
     QJsonArray all;
@@ -112,9 +119,43 @@ QJsonArray settingsAsJson()
         all.append(QJsonObject{{u"hive"_s, hives.at(entry.hive)},
                                {u"key"_s, entry.key},
                                {u"name"_s, entry.name},
-                               {u"value"_s, entry.value.data}});
+                               {u"value"_s, isPassword(entry.name) ? u"(not shown)"_s : entry.value.data}});
     }
     return all;
+}
+
+/// Reads a password from standard input, so that it appears neither in the list of processes nor in a shell's history.
+/// Returns nothing if a connection text can't hold it.
+std::optional<QString> passwordFromInput()
+{
+    QFile input;
+    if (!input.open(stdin, QIODevice::ReadOnly))
+        return {};
+    QString password = QString::fromLocal8Bit(input.readLine());
+    while (password.endsWith(u'\n') || password.endsWith(u'\r'))
+        password.chop(1);
+    if (password.contains(u';') || password.trimmed() != password ||
+        files::fromCodePage(files::toCodePage(password)) != password)
+        return {};
+    return password;
+}
+
+Outcome badPassword()
+{
+    return refused(
+        u"the password is read from standard input, and may hold no \";\", no blank at its ends and only "
+        "characters of the code page 1252"_s,
+        Refused);
+}
+
+Outcome setSetting(const QString& key, const QString& name, const QString& value)
+{
+    RegCreateSubKey(settings::Hive::LocalMachine, key);
+    if (!RegSetValue(settings::Hive::LocalMachine, key, name, value))
+        return refused(u"the setting could not be written"_s, Refused);
+    if (isPassword(name))
+        return {};
+    return {.fields = {{u"value"_s, RegGetValue(settings::Hive::LocalMachine, key, name)}}};
 }
 
 Outcome setting(const QStringList& arguments)
@@ -128,26 +169,32 @@ Outcome setting(const QStringList& arguments)
                     u'\t' + entry[u"value"].toString() + u'\n';
         return {.fields = {{u"settings"_s, all}}, .text = text};
     }
+    const auto wrong = [] {
+        return refused(
+            u"setting takes list, get APP SECTION KEY or set APP SECTION KEY VALUE; a password has no VALUE, "
+            "it is read from standard input"_s,
+            Usage);
+    };
     if (arguments.size() < 4)
-        return refused(u"setting takes list, get APP SECTION KEY or set APP SECTION KEY VALUE"_s, Usage);
+        return wrong();
 
     const QString key = u"SOFTWARE\\"_s + arguments[1] + u'\\' + arguments[2];
+    const QString& name = arguments[3];
     if (what == u"get"_s && arguments.size() == 4) {
-        const QString value = RegGetValue(settings::Hive::LocalMachine, key, arguments[3]);
+        if (isPassword(name))
+            return refused(u"a password is not shown"_s, Refused);
+        const QString value = RegGetValue(settings::Hive::LocalMachine, key, name);
         return {.fields = {{u"value"_s, value}}, .text = value + u'\n'};
     }
-    if (what == u"set"_s && arguments.size() == 5) {
-        RegCreateSubKey(settings::Hive::LocalMachine, key);
-        if (!RegSetValue(settings::Hive::LocalMachine, key, arguments[3], arguments[4]))
-            return refused(u"the setting could not be written"_s, Refused);
-        const QString stored = RegGetValue(settings::Hive::LocalMachine, key, arguments[3]);
-        return {.fields = {{u"value"_s, stored}}};
-    }
-    return refused(u"setting takes list, get APP SECTION KEY or set APP SECTION KEY VALUE"_s, Usage);
+    if (what != u"set"_s || arguments.size() != (isPassword(name) ? 4 : 5))
+        return wrong();
+    if (!isPassword(name))
+        return setSetting(key, name, arguments[4]);
+    const std::optional<QString> password = passwordFromInput();
+    return password ? setSetting(key, name, *password) : badPassword();
 }
 
-/// `joblink set --server S --port N --database D --user U`. Reads the password from standard input, so that it appears
-/// neither in the list of processes nor in a shell's history.
+/// `joblink set --server S --port N --database D --user U`, with the password from standard input.
 Outcome jobLink(const QStringList& arguments)
 {
     const auto wrong = [] { return refused(u"joblink set takes --server S --port N --database D --user U"_s, Usage); };
@@ -165,17 +212,10 @@ Outcome jobLink(const QStringList& arguments)
     if (!isPort || settings.server.isEmpty() || settings.database.isEmpty() || settings.user.isEmpty())
         return wrong();
 
-    QFile input;
-    if (!input.open(stdin, QIODevice::ReadOnly))
-        return refused(u"the password can't be read from standard input"_s, Refused);
-    settings.password = QString::fromLocal8Bit(input.readLine());
-    while (settings.password.endsWith(u'\n') || settings.password.endsWith(u'\r'))
-        settings.password.chop(1);
-    if (settings.password.contains(u';') || settings.password.trimmed() != settings.password ||
-        files::fromCodePage(files::toCodePage(settings.password)) != settings.password)
-        return refused(
-            u"the password must not contain \";\", blanks at its ends or characters outside of code page 1252"_s,
-            Refused);
+    const std::optional<QString> password = passwordFromInput();
+    if (!password)
+        return badPassword();
+    settings.password = *password;
     storeJobLinkSettings(settings);
     return {.text = u"JobLink's settings are stored.\n"_s};
 }
@@ -223,9 +263,17 @@ bool showsTransport(const CommandLine& line)
     return line.command == u"transport"_s && line.arguments.contains(u"--window"_s);
 }
 
-bool profileExists()
+/// Why there is no profile to work on; empty if there is one.
+QString profileFault()
 {
-    return QFileInfo::exists(profile::root() + u"/registry.ini"_s);
+    if (!QFileInfo::exists(profile::root() + u"/registry.ini"_s))
+        return u"no profile at "_s + profile::root() + u"; create one with: kest2 init"_s;
+    try {
+        settings::check();
+    } catch (const RuntimeError& error) {
+        return error.description();
+    }
+    return {};
 }
 
 Outcome runConnected(const Command& command, const CommandLine& line)
@@ -245,8 +293,7 @@ Outcome runChecked(const CommandLine& line)
     const Command& command = found->second;
     if (line.arguments.size() < command.fewest || line.arguments.size() > command.most)
         return refused(u"wrong number of arguments for "_s + line.command, Usage);
-    if (command.needs != Needs::Nothing && !profileExists()) {
-        const QString why = u"no profile at "_s + profile::root() + u"; create one with: kest2 init"_s;
+    if (const QString why = command.needs == Needs::Nothing ? QString() : profileFault(); !why.isEmpty()) {
         if (isInteractive(line))
             desktop::msgBox(why, desktop::Icon::Critical);  // a program started from the menu has no visible output
         return refused(why, NoConnection);

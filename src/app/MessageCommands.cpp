@@ -105,9 +105,12 @@ Outcome list(const QStringList& arguments)
         if (filtered && gsListFilter != arguments[2])
             window.updateFilter(arguments[2]);
     }
-    if (!window.failure().isEmpty())
-        say(u"kest2: "_s + window.failure() + u'\n', stderr);
-    return {.fields = {{u"rows"_s, rowsAsJson(window.rows())}}, .text = rowsAsText(window.rows())};
+    Outcome outcome{.fields = {{u"rows"_s, rowsAsJson(window.rows())}}, .text = rowsAsText(window.rows())};
+    if (!window.failure().isEmpty()) {
+        outcome.exitCode = refused(window.failure(), Refused).exitCode;
+        outcome.fields[u"failure"_s] = window.failure();
+    }
+    return outcome;
 }
 
 Outcome load(const QStringList& arguments)

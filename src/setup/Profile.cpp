@@ -124,6 +124,7 @@ void installTemplates()
 
 bool initProfile(const std::function<bool()>& registerClass, bool demo, const QDate& today)
 {
+    settings::check();
     if (isWhole()) {
         rebuildIndexes();
         return false;

@@ -1,6 +1,7 @@
 #include "app/CommandLine.h"
-#include "setup/Profile.h"
 #include "platform/files/files.h"
+#include "platform/settings/registry.h"
+#include "setup/Profile.h"
 #include "shell/component.h"
 #include "support/Cases.h"
 #include "support/TestProfile.h"
@@ -64,8 +65,28 @@ TEST_F(Command, ExitCodeAndErrorsTellWhatBecameOfIt)
     files::remove(profile.root() + u"/databases/WirSql.db"_s);
     const Ended ended = kest2(u"list unread"_s);
     EXPECT_EQ(ended.exitCode, app::NoConnection);
-    EXPECT_EQ(ended.json[u"boxes"][0][u"text"].toString(),
-              u"Could not connect to the quote database, Please contact MarlinDesk Support."_s);
+    const QString box = ended.json[u"boxes"][0][u"text"].toString();
+    EXPECT_TRUE(box.startsWith(u"Could not connect to the quote database, Please contact MarlinDesk Support."_s));
+    EXPECT_TRUE(box.contains(u"WirSql.db"_s)) << box.toStdString();
+
+    files::write(profile.root() + u"/registry.ini"_s, {});
+    for (const QString& words : {u"list unread"_s, u"setting list"_s, u"transport --once"_s, u"init"_s, u"where"_s}) {
+        const Ended damaged = kest2(words);
+        EXPECT_NE(damaged.exitCode, app::Done) << words.toStdString();
+        EXPECT_TRUE(damaged.errors.contains(u"registry.ini is empty or damaged"_s)) << damaged.errors.toStdString();
+    }
+    EXPECT_EQ(files::size(profile.root() + u"/registry.ini"_s), 0);
+}
+
+TEST_F(Command, AFillThatEndedEarlyIsRefusedWithItsReason)
+{
+    ASSERT_TRUE(settings::setValue(settings::Hive::LocalMachine, u"SOFTWARE\\wirra32\\frmsplash"_s, u"EcomHome"_s,
+                                   {settings::Type::Text, u"c:\\gone\\"_s}));
+    const Ended ended = kest2(u"list unread"_s);
+    EXPECT_EQ(ended.exitCode, app::Refused);
+    EXPECT_EQ(ended.json[u"rows"].toArray(), QJsonArray());
+    EXPECT_EQ(ended.json[u"failure"].toString(), u"c:\\gone\\AUnread\\: the folder is not there"_s);
+    EXPECT_TRUE(ended.errors.contains(ended.json[u"failure"].toString()));
 }
 
 TEST_F(Command, AListGivesRowsAndTheBoxesThatCameUpAndAFilterAnswersThePromptOrIsTyped)
@@ -98,9 +119,19 @@ TEST_F(Command, AnOpenPanelIsDrivenByAScript)
 
 TEST_F(Command, SettingsAreReadAndWrittenAndNoPasswordInClear)
 {
-    EXPECT_EQ(kest2(u"setting get wirra32 frmsplash SAPwd"_s).json[u"value"].toString(), u""_s);
     EXPECT_EQ(kest2(u"setting set new section key --json"_s).exitCode, app::Done);
     EXPECT_EQ(kest2(u"setting get NEW section KEY"_s).json[u"value"].toString(), u"--json"_s);
+
+    EXPECT_EQ(kest2(u"setting set wirra32 frmsplash SAPwd s3cret"_s).exitCode, app::Usage);
+    EXPECT_EQ(kest2(u"setting set wirra32 frmsplash SAPwd"_s, {}, "a;b\n").exitCode, app::Refused);
+    const Ended set = kest2(u"setting set wirra32 frmsplash SAPwd"_s, {}, "s3cret\n");
+    EXPECT_EQ(set.exitCode, app::Done);
+    const Ended list = kest2(u"setting list"_s);
+    EXPECT_TRUE(QJsonDocument(list.json).toJson().contains("SAPwd"));
+    EXPECT_EQ(kest2(u"setting get wirra32 frmsplash sapwd"_s).exitCode, app::Refused);
+    for (const Ended& told : {set, list, kest2(u"setting get wirra32 frmsplash SAPwd"_s)})
+        EXPECT_FALSE(QJsonDocument(told.json).toJson().contains("s3cret") || told.errors.contains(u"s3cret"_s));
+    EXPECT_TRUE(files::readBytes(profile.root() + u"/registry.ini"_s).contains("SAPwd=text:s3cret\n")) << "as the host";
 
     const QString words = u"joblink set --server localhost --port 3306 --database jobs --user shop"_s;
     EXPECT_EQ(kest2(words, {}, "s3cret-pass\n").exitCode, app::Done);

@@ -4,6 +4,7 @@
 #include "outbound/SendQuote.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/FaultInjection.h"
+#include "platform/settings/registry.h"
 #include "support/Failure.h"
 #include "support/Shop.h"
 #include "support/ShopDatabase.h"
@@ -27,10 +28,9 @@ protected:
         QDir().mkpath(second_);
         for (const QString& shared : {u"/drive_c"_s, u"/databases"_s})
             EXPECT_TRUE(QFile::link(root() + shared, second_ + shared));
-        const QString settings = u"/registry.ini"_s;
-        if (!files::exists(root() + settings))
-            files::writeBytes(root() + settings, {});
-        files::writeBytes(second_ + settings, files::readBytes(root() + settings));
+        const QString file = u"/registry.ini"_s;
+        EXPECT_TRUE(settings::createKey(settings::Hive::LocalMachine, u"SOFTWARE"_s));
+        files::writeBytes(second_ + file, files::readBytes(root() + file));
     }
     ~Workstations() override { db::setStatementFault({}); }
 

@@ -2,6 +2,7 @@
 #include "platform/files/files.h"
 #include "platform/profile.h"
 #include "platform/settings/registry.h"
+#include "support/Failure.h"
 #include "support/TestProfile.h"
 
 #include <QDir>
@@ -89,6 +90,39 @@ TEST_F(Registry, AFileWrittenByHandIsRead)
     EXPECT_EQ(text(u"EcomHome"_s), u"d:\\doc\\"_s);
     EXPECT_EQ(text({}), u"the default"_s);
     EXPECT_EQ(entries().size(), 2);
+}
+
+TEST_F(Registry, TheFileIsItsOwnersAlone)
+{
+    const auto mode = [&] {
+        struct stat state {};
+        return ::stat(QFile::encodeName(file()).constData(), &state) == 0 ? state.st_mode & 0777U : 0;
+    };
+    EXPECT_EQ(mode(), 0600U) << "a new file";
+    ::chmod(QFile::encodeName(file()).constData(), 0644);
+    check();
+    EXPECT_EQ(mode(), 0600U);
+    ::chmod(QFile::encodeName(file()).constData(), 0664);
+    set(u"a"_s, u"1"_s);
+    EXPECT_EQ(mode(), 0600U);
+}
+
+TEST_F(Registry, AFileThatIsNoneIsToldAndKept)
+{
+    for (const QByteArray& damaged :
+         {QByteArray(), QByteArray("\n\n"), QByteArray("<html></html>"), QByteArray("a=text:b\n"),
+          "[HKEY_LOCAL_MACHINE\\SOFTWARE]\na=text:b\n" + QByteArray(4096, '\0')}) {
+        files::writeBytes(file(), damaged);
+        EXPECT_EQ(test::failureOf([] { check(); }), FileInputOutput) << damaged.left(20).toStdString();
+        EXPECT_FALSE(createKey(Hive::LocalMachine, key));
+        EXPECT_EQ(files::readBytes(file()), damaged);
+    }
+    files::remove(file());
+    check();
+    EXPECT_TRUE(createKey(Hive::LocalMachine, u"a"_s));
+    EXPECT_TRUE(removeKey(Hive::LocalMachine, u"a"_s) && removeKey(Hive::LocalMachine, {}));
+    check();
+    EXPECT_TRUE(createKey(Hive::LocalMachine, u"a"_s)) << "the last key has gone, but not the file";
 }
 
 TEST_F(Registry, WhatCannotBeReadIsEmptyAndIsNotOverwritten)

@@ -121,6 +121,8 @@ void throwFileError(int number, const QString& systemPath)
                 return u"Path not found"_s;
             case PermissionDenied:
                 return u"Permission denied"_s;
+            case DiskFull:
+                return u"Disk full"_s;
             default:
                 return u"Device I/O error"_s;
         }
@@ -146,10 +148,12 @@ void throwSystemError(const QString& systemPath)
         case EISDIR:
         case ENOTEMPTY:
             throwFileError(PermissionDenied, systemPath);
+        case ENOSPC:
+        case EDQUOT:
+        case EFBIG:
+            throwFileError(DiskFull, systemPath);
         default:
             throwFileError(FileInputOutput, systemPath);
-            case DiskFull:
-                return u"Disk full"_s;
     }
 }
 
@@ -175,10 +179,6 @@ qint64 SystemFile::size() const
         throwSystemError(path);
     return state.st_size;
 }
-        case ENOSPC:
-        case EDQUOT:
-        case EFBIG:
-            throwFileError(DiskFull, systemPath);
 
 QByteArray SystemFile::read(qsizetype most)
 {
@@ -279,15 +279,16 @@ void checkFolderWritable(const QString& systemPath)
         throwFileError(PermissionDenied, systemPath);
 }
 
-void replaceFile(const QString& target, const QString& spelled, const std::function<void(SystemFile&)>& fill)
+void replaceFile(const QString& target, const QString& spelled, const std::function<void(SystemFile&)>& fill,
+                 std::optional<unsigned> mode)
 {
     checkFolderWritable(target);
     checkWritable(target);
     const QString temporary = folderOf(target) + u'/' + temporaryName();
     try {
-        SystemFile file(temporary, O_WRONLY | O_CREAT | O_EXCL);
+        SystemFile file(temporary, O_WRONLY | O_CREAT | O_EXCL, mode.value_or(0666));
         fill(file);
-        if (const auto old = stateOf(target))
+        if (const auto old = stateOf(target); old && !mode)
             file.setMode(old->st_mode & 07777);
         file.commit();
         renameFile(temporary, target);
@@ -323,13 +324,13 @@ void removeFile(const QString& systemPath)
         throwSystemError(systemPath);
 }
 
-bool isTemporaryName(const QString& name)
 qint64 ageOf(const QString& systemPath)
 {
     const auto state = stateOf(systemPath);
     return state ? ::time(nullptr) - state->st_mtime : 0;
 }
 
+bool isTemporaryName(const QString& name)
 {
     return name.startsWith(".kest-"_L1) && name.endsWith(".tmp"_L1);
 }

@@ -8,12 +8,14 @@
 #include <fcntl.h>
 
 #include <cerrno>
+#include <optional>
 
 namespace kest::files {
 
 namespace {
+constexpr unsigned ownerAlone = 0600;
 constexpr qint64 largestFile = 512LL * 1024 * 1024;  // bytes that one read takes into memory
-}
+}  // namespace
 
 bool exists(const QString& path)
 {
@@ -49,10 +51,17 @@ QString read(const QString& path)
     return fromCodePage(readBytes(path));
 }
 
-void writeBytes(const QString& path, const QByteArray& bytes)
+void writeBytes(const QString& path, const QByteArray& bytes, Access access)
 {
     failOnRequest(path);
-    replaceFile(systemPath(path), spelledPath(path), [&](SystemFile& file) { file.write(bytes); });
+    replaceFile(
+        systemPath(path), spelledPath(path), [&](SystemFile& file) { file.write(bytes); },
+        access == Access::OwnerAlone ? std::optional(ownerAlone) : std::nullopt);
+}
+
+void restrictToOwner(const QString& path)
+{
+    SystemFile(systemPath(path), O_RDONLY).setMode(ownerAlone);
 }
 
 void write(const QString& path, const QString& text)

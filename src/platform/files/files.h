@@ -31,7 +31,10 @@ QByteArray readBytes(const QString& path);
 /// A variant of the name in another case is replaced and takes the new spelling. Characters outside the code page
 /// become "?".
 void write(const QString& path, const QString& text);
-void writeBytes(const QString& path, const QByteArray& bytes);
+enum class Access { AsBefore, OwnerAlone };
+void writeBytes(const QString& path, const QByteArray& bytes, Access access = Access::AsBefore);
+/// Takes the rights of everybody but the owner.
+void restrictToOwner(const QString& path);
 /// Adds to the end of the file; a missing file is created.
 void append(const QString& path, const QString& text);
 
@@ -50,13 +53,13 @@ void makeFolder(const QString& path);
 QStringList list(const QString& folder, const QString& pattern = QStringLiteral("*"));
 bool matches(const QString& name, const QString& pattern);
 
-/// True for a name that stays in its folder: not empty, no separator, no "..", no drive, no control character.
-/// Names out of a message or a table pass through here: for reading a bad one is a file that does not exist.
-bool isPlainName(const QString& name);
 /// Removes the temporary files of `write` that are older than a day: those of processes that were killed. What can't be
 /// removed stays.
 void removeLeftOvers(const QString& folder);
 
+/// True for a name that stays in its folder: not empty, no separator, no "..", no drive, no control character.
+/// Names out of a message or a table pass through here: for reading a bad one is a file that does not exist.
+bool isPlainName(const QString& name);
 /// `folder` + `name`; throws PathNotFound for a name that is not plain. For names that are about to be written.
 QString pathForWriting(const QString& folder, const QString& name);
 

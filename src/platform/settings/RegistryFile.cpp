@@ -8,6 +8,8 @@ namespace kest::settings {
 
 namespace {
 
+constexpr auto heading = "; Settings of KEST2\n";
+
 constexpr std::pair<Type, QLatin1StringView> typeNames[] = {
     {Type::Text, "text"_L1},
     {Type::Binary, "binary"_L1},
@@ -43,6 +45,11 @@ QString folded(const QString& path)
 
 }  // namespace
 
+bool RegistryFile::isOne(const QByteArray& bytes)
+{
+    return !bytes.contains('\0') && (bytes.startsWith(heading) || !fromBytes(bytes).keys().isEmpty());
+}
+
 RegistryFile RegistryFile::fromBytes(const QByteArray& bytes)
 {
     RegistryFile file;
@@ -70,7 +77,7 @@ RegistryFile RegistryFile::fromBytes(const QByteArray& bytes)
 
 QByteArray RegistryFile::toBytes() const
 {
-    QByteArray out;
+    QByteArray out = heading;
     for (const Key& key : allKeys) {
         out += '[' + escaped(key.path, "]") + "]\n";
         for (const Value& value : key.values) {

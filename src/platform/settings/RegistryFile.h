@@ -11,6 +11,7 @@ namespace kest::settings {
 
 /// What the file holds, in its order. Keys are paths that begin with the hive's name.
 //
+//   ; Settings of KEST2
 //   [HKEY_LOCAL_MACHINE\SOFTWARE\wirra32\frmsplash]
 //   EcomHome=text:c:\wirdoc\           a value; "@" is the key's default value
 //   Retries=number:3
@@ -27,6 +28,8 @@ public:
         QList<Value> values;
     };
 
+    /// False for an empty file, and for one that something else has written.
+    static bool isOne(const QByteArray& bytes);
     static RegistryFile fromBytes(const QByteArray& bytes);
     QByteArray toBytes() const;
 

@@ -77,7 +77,7 @@ Cache& cache()
     return instance;
 }
 
-/// What the file holds now; a missing file holds nothing. Throws where it cannot be read.
+/// What the file holds now; a missing file holds nothing. Throws if it can't be read or is no settings file.
 RegistryFile present()
 {
     const QString path = registryPath();
@@ -87,7 +87,12 @@ RegistryFile present()
     Cache& kept = cache();
     const std::lock_guard lock(kept.mutex);
     if (kept.identity != identity) {
-        kept.content = RegistryFile::fromBytes(files::readBytes(path));
+        const QByteArray bytes = files::readBytes(path);
+        if (!RegistryFile::isOne(bytes))
+            throw RuntimeError(FileInputOutput,
+                               u"The settings file %1 is empty or damaged. Put a copy of it back, or "
+                               "delete it and run \"kest2 init\"."_s.arg(path));
+        kept.content = RegistryFile::fromBytes(bytes);
         kept.identity = identity;
     }
     return kept.content;
@@ -114,12 +119,18 @@ bool change(const std::function<bool(RegistryFile&)>& edit)
         RegistryFile content = present();
         done = edit(content);
         if (done)
-            files::writeBytes(path, content.toBytes());
+            files::writeBytes(path, content.toBytes(), files::Access::OwnerAlone);
     });
     return written && done;
 }
 
 }  // namespace
+
+void check()
+{
+    present();
+    attempt([] { files::restrictToOwner(registryPath()); });  // it may be someone else's, or not there
+}
 
 bool keyExists(Hive hive, const QString& key)
 {

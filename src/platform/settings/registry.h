@@ -11,6 +11,10 @@ namespace kest::settings {
 // Keys are paths joined by backslashes; names are found without regard to case and keep the spelling they were made
 // with. Each change is one atomic replacement of the file under a lock, so that two processes can write at once.
 
+/// Throws if the file is there but can't be read or is no settings file; such a file is never written over. Takes from
+/// others the right to read it, since it holds the database's password. A missing file holds nothing.
+void check();
+
 enum class Hive { ClassesRoot, CurrentUser, LocalMachine };
 enum class Type { Text = 1, Binary = 3, Number = 4 };
 
