@@ -5,6 +5,7 @@
 #include "base/modLoggerEx.h"
 #include "messages/Envelope.h"
 #include "messages/Folders.h"
+#include "messages/MessageTypes.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
 #include "platform/files/files.h"
@@ -19,16 +20,36 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-struct Loader {
-    QLatin1StringView messageType;
-    bool (*load)(QString& text, const QString& fileName);
-};
-
-constexpr Loader loaders[] = {
-    {"QREQ"_L1, LoadQREQ}, {"QMQR"_L1, LoadQMQR}, {"MANQ"_L1, LoadMANQ}, {"AUQT"_L1, LoadAUQT},
-    {"QTDL"_L1, LoadQTDL}, {"RRQT"_L1, LoadRRQT}, {"QRCN"_L1, LoadQRCN}, {"ADQT"_L1, LoadADQT},
-    {"ARES"_L1, LoadARES}, {"BACA"_L1, LoadBACA}, {"BCQR"_L1, LoadBCQR}, {"EWAP"_L1, LoadEWAP},
-};
+bool loadAs(MessageCode type, QString& text, const QString& fileName)
+{
+    switch (type) {
+        case MessageCode::QREQ:
+            return LoadQREQ(text, fileName);
+        case MessageCode::QMQR:
+            return LoadQMQR(text, fileName);
+        case MessageCode::MANQ:
+            return LoadMANQ(text, fileName);
+        case MessageCode::QTDL:
+            return LoadQTDL(text, fileName);
+        case MessageCode::RRQT:
+            return LoadRRQT(text, fileName);
+        case MessageCode::QRCN:
+            return LoadQRCN(text, fileName);
+        case MessageCode::ADQT:
+            return LoadADQT(text, fileName);
+        case MessageCode::AUQT:
+            return LoadAUQT(text, fileName);
+        case MessageCode::ARES:
+            return LoadARES(text, fileName);
+        case MessageCode::BACA:
+            return LoadBACA(text, fileName);
+        case MessageCode::BCQR:
+            return LoadBCQR(text, fileName);
+        case MessageCode::EWAP:
+            return LoadEWAP(text, fileName);
+    }
+    return false;
+}
 
 void reportParseError(const xml::ParseError& error, const QString& fileName)
 {
@@ -114,13 +135,10 @@ std::optional<QString> typeToLoad(QString& text, const QString& fileName)
 
 bool load(QString& text, const QString& fileName)
 {
-    const std::optional<QString> type =
+    const std::optional<QString> name =
         typeToLoad(text, fileName);  // its document is gone when the loader parses the text again
-    for (const Loader& loader : loaders) {
-        if (type == QString(loader.messageType))
-            return loader.load(text, fileName);
-    }
-    return false;
+    const MessageType* type = name ? findMessageType(*name) : nullptr;
+    return type && loadAs(type->code, text, fileName);
 }
 
 }  // namespace

@@ -1,6 +1,7 @@
 #include "loopback/InsurerMessages.h"
 
 #include "messages/Envelope.h"
+#include "messages/MessageTypes.h"
 #include "platform/values.h"
 
 #include <map>
@@ -16,25 +17,25 @@ constexpr int daysToRepair = 14;
 
 struct Kind {
     QLatin1StringView code;
-    const char* root;
+    QLatin1StringView root;
 };
+
+Kind of(MessageCode code)
+{
+    const MessageType& type = messageType(code);
+    return {type.text, type.root};
+}
 
 const Kind& kindOf(Act act)
 {
-    static const std::map<Act, Kind> kinds{{Act::Request, {"QREQ"_L1, "getQuoteRequestResponse"}},
-                                           {Act::Respond, {""_L1, "submitQuoteResponse"}},
-                                           {Act::Match, {"QMQR"_L1, "getQuoteResponse"}},
-                                           {Act::Authorise, {"AUQT"_L1, "getAuthorisedQuoteResponse"}},
-                                           {Act::Adjust, {"ADQT"_L1, "getAdjustedQuoteResponse"}},
-                                           {Act::Revise, {"RRQT"_L1, "getReqForRevQteResponse"}},
-                                           {Act::Delete, {"QTDL"_L1, "getQuoteDeletionResponse"}},
-                                           {Act::Cancel, {"QRCN"_L1, "getQRCancellationResponse"}},
-                                           {Act::Reinstate, {"BCQR"_L1, "getBackoutCancelledQRResponse"}},
-                                           {Act::Reject, {"ARES"_L1, "getAssmntResultResponse"}},
-                                           {Act::BackOut, {"BACA"_L1, "getBackoutAssmntResponse"}},
-                                           {Act::Waive, {"EWAP"_L1, "getQuoteResponse"}},
-                                           {Act::Manual, {"MANQ"_L1, "getQuoteResponse"}},
-                                           {Act::Marker, {"MDMSG"_L1, "mail"}}};
+    static const std::map<Act, Kind> kinds{
+        {Act::Request, of(MessageCode::QREQ)},   {Act::Respond, {""_L1, "submitQuoteResponse"_L1}},
+        {Act::Match, of(MessageCode::QMQR)},     {Act::Authorise, of(MessageCode::AUQT)},
+        {Act::Adjust, of(MessageCode::ADQT)},    {Act::Revise, of(MessageCode::RRQT)},
+        {Act::Delete, of(MessageCode::QTDL)},    {Act::Cancel, of(MessageCode::QRCN)},
+        {Act::Reinstate, of(MessageCode::BCQR)}, {Act::Reject, of(MessageCode::ARES)},
+        {Act::BackOut, of(MessageCode::BACA)},   {Act::Waive, of(MessageCode::EWAP)},
+        {Act::Manual, of(MessageCode::MANQ)},    {Act::Marker, {"MDMSG"_L1, "mail"_L1}}};
     return kinds.at(act);
 }
 
@@ -252,7 +253,7 @@ QString messageText(const Step& step, const Matter& matter, Dice& dice, const QD
 {
     xml::Document document;
     const Kind& kind = kindOf(step.act);
-    const Branch root(document, kind.root, step.act == Act::Marker ? QString() : GetNamespaceURI());
+    const Branch root(document, kind.root.data(), step.act == Act::Marker ? QString() : GetNamespaceURI());
     if (step.act != Act::Marker && step.act != Act::Respond)
         root.addOutside("messageType", kind.code);
     write(root, step, matter, dice, today);

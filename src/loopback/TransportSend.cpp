@@ -2,6 +2,7 @@
 #include "base/Helpers.h"
 #include "loopback/Transport.h"
 #include "messages/Envelope.h"
+#include "messages/MessageTypes.h"
 #include "platform/RuntimeError.h"
 #include "platform/files/files.h"
 #include "setup/DemoShop.h"

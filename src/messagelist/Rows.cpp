@@ -3,6 +3,7 @@
 #include "base/SharedVariables.h"
 #include "messagelist/Summary.h"
 #include "messages/Envelope.h"
+#include "messages/MessageTypes.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
@@ -15,42 +16,23 @@ namespace {
 
 enum Column { Type, Rego, Claim, Customer, Quote, Vehicle };
 
-enum class Rows { ExactlyOne, AtLeastOne };
-
-// For messages that name a quote: where the key of the quote is, and the query that finds the quote's row.
-struct QuoteSource {
-    QLatin1StringView code;
-    QLatin1StringView key;
-    const char* query;
-    Rows needed;
-};
-
-constexpr const char* byNetworkNumber =
-    "SELECT * FROM QUOTE1, CAR WHERE QUOTE1.REGO=CAR.REGO AND QUOTE1.KESTQuoteNo='{}'";
-constexpr const char* byRequest =
-    "SELECT * FROM QUOTE1, CAR WHERE QUOTE1.REGO=CAR.REGO AND QUOTE1.KESTQRNO='{}' ORDER BY QUOTE1.rec_id DESC";
-constexpr const char* byBackedOutRequest =
-    "SELECT * FROM QUOTE1, CAR WHERE QUOTE1.REGO=CAR.REGO AND QUOTE1.KESTQRNo='{}' ORDER BY rec_id DESC";
-
-constexpr QuoteSource quoteSources[] = {
-    {"QTDL"_L1, "//rootns:kestQuoteNumber"_L1, byNetworkNumber, Rows::ExactlyOne},
-    {"RRQT"_L1, "//rootns:quoteRequestNumber"_L1, byRequest, Rows::AtLeastOne},
-    {"QRCN"_L1, "//rootns:quoteRequestNumber"_L1, byRequest, Rows::ExactlyOne},
-    {"ADQT"_L1, "//rootns:kestOriginalQuoteNumber"_L1, byNetworkNumber, Rows::ExactlyOne},
-    {"AUQT"_L1, "//rootns:kestOriginalQuoteNumber"_L1, byNetworkNumber, Rows::ExactlyOne},
-    {"ARES"_L1, "//rootns:kestOriginalQuoteNumber"_L1, byNetworkNumber, Rows::ExactlyOne},
-    {"BACA"_L1, "//rootns:kestQuoteRequestNumber"_L1, byBackedOutRequest, Rows::AtLeastOne},
-    {"BCQR"_L1, "//rootns:kestQuoteRequestNumber"_L1, byRequest, Rows::ExactlyOne},
-};
-
-bool isDrawnFromMessage(const QString& code)
+// The query that finds the rows of a quote by the key in the message.
+const char* queryOf(RowSource source)
 {
-    return code == "QREQ"_L1 || code == "QMQR"_L1 || code == "MANQ"_L1;
+    switch (source) {
+        case RowSource::NetworkNumber:
+            return "SELECT * FROM QUOTE1, CAR WHERE QUOTE1.REGO=CAR.REGO AND QUOTE1.KESTQuoteNo='{}'";
+        case RowSource::BackedOutRequest:
+            return "SELECT * FROM QUOTE1, CAR WHERE QUOTE1.REGO=CAR.REGO AND QUOTE1.KESTQRNo='{}' ORDER BY rec_id DESC";
+        default:
+            return "SELECT * FROM QUOTE1, CAR WHERE QUOTE1.REGO=CAR.REGO AND QUOTE1.KESTQRNO='{}' "
+                   "ORDER BY QUOTE1.rec_id DESC";
+    }
 }
 
-bool suffices(const db::Recordset& rows, Rows needed)
+bool suffices(const db::Recordset& rows, RowsNeeded needed)
 {
-    return needed == Rows::ExactlyOne ? rows.recordCount() == 1 : rows.recordCount() >= 1;
+    return needed == RowsNeeded::ExactlyOne ? rows.recordCount() == 1 : rows.recordCount() >= 1;
 }
 
 // If the value can't be read, it stays as it is.
@@ -83,7 +65,7 @@ QString customerOfRequest(const xml::Document& message)
     return personName(message.selectSingleNode(u"//rootns:claimCustomer"_s), u"rootns:"_s);
 }
 
-QString customerName(const QVariant& customer, Rows needed)
+QString customerName(const QVariant& customer, RowsNeeded needed)
 {
     db::Recordset names(gConn);
     names.open(
@@ -91,7 +73,7 @@ QString customerName(const QVariant& customer, Rows needed)
     return suffices(names, needed) ? names.text(u"Name"_s) : QString();
 }
 
-QString customerOfCar(const QString& rego, Rows needed)
+QString customerOfCar(const QString& rego, RowsNeeded needed)
 {
     db::Recordset car(gConn);
     car.open(sql("SELECT * FROM CAR WHERE REGO='{}'", rego));
@@ -102,24 +84,23 @@ QString vehicleName(const QVariant& model)
 {
     db::Recordset names(gConn);
     names.open(sql("SELECT MAKE, MODEL FROM ALLMODEL WHERE MODEL_ID='{}'", model));
-    if (!suffices(names, Rows::ExactlyOne))
+    if (!suffices(names, RowsNeeded::ExactlyOne))
         return {};
     return toText(names.value(u"MAKE"_s)) + u' ' + toText(names.value(u"MODEL"_s));
 }
 
-void drawFromMessage(MessageRow& row, const xml::Document& message, const QString& code)
+void drawFromMessage(MessageRow& row, const xml::Document& message, const MessageType& type)
 {
     draw(row[Rego], [&] { return NormaliseRego(message.textOf(u"//rootns:vehicleRegistration"_s)); });
     draw(row[Claim], [&] { return message.textOf(u"//rootns:claimNumber"_s); });
     draw(row[Vehicle], [&] { return message.textOf(u"//rootns:vehicleDescription"_s); });
-    if (code == "QREQ"_L1) {
+    if (type.code == MessageCode::QREQ) {
         row[Quote] = u"-"_s;
         draw(row[Customer], [&] { return customerOfRequest(message); });
         return;
     }
     draw(row[Quote], [&] { return NormaliseQuoteRef(message.textOf(u"//rootns:quoteBody/rootns:quoteReference"_s)); });
-    draw(row[Customer],
-         [&] { return customerOfCar(row[Rego], code == "MANQ"_L1 ? Rows::AtLeastOne : Rows::ExactlyOne); });
+    draw(row[Customer], [&] { return customerOfCar(row[Rego], type.rowsNeeded); });
 }
 
 // `quote` is a row of QUOTE1 joined with its CAR.
@@ -130,15 +111,15 @@ void drawFromQuote(MessageRow& row, const db::Recordset& quote)
         return NormaliseQuoteRef(toText(quote.value(u"QTNNO"_s)) + u'/' + toText(quote.value(u"Subquote"_s)));
     });
     draw(row[Vehicle], [&] { return vehicleName(quote.value(u"MODEL_ID"_s)); });
-    draw(row[Customer], [&] { return customerName(quote.value(u"CUST_ID"_s), Rows::ExactlyOne); });
+    draw(row[Customer], [&] { return customerName(quote.value(u"CUST_ID"_s), RowsNeeded::ExactlyOne); });
 }
 
-void drawThroughKey(MessageRow& row, const xml::Document& message, const QuoteSource& source)
+void drawThroughKey(MessageRow& row, const xml::Document& message, const MessageType& type)
 {
     attempt([&] {
         db::Recordset quote(gConn);
-        quote.open(sql(source.query, message.textOf(source.key)));
-        if (!suffices(quote, source.needed))
+        quote.open(sql(queryOf(type.rowSource), message.textOf(type.rowKey)));
+        if (!suffices(quote, type.rowsNeeded))
             return;
         draw(row[Rego], [&] { return toText(quote.value(u"REGO"_s)); });
         drawFromQuote(row, quote);
@@ -150,7 +131,7 @@ QString claimOfQuote(const QString& reference)
     const QuoteKey key = QuoteKey::fromReference(reference);
     db::Recordset quote(gConn);
     quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key.number, key.subquote));
-    if (!suffices(quote, Rows::ExactlyOne))
+    if (!suffices(quote, RowsNeeded::ExactlyOne))
         return {};
     return quote.isNull(u"Claim"_s) ? u"-"_s : quote.text(u"Claim"_s);
 }
@@ -191,21 +172,19 @@ MessageRow GetMessageRow(const xml::Document& message, const QString& typeName)
     if (typeName == "SENT"_L1)
         return sentRow(message);
 
-    QString code;
-    attempt([&] { code = message.textOf(u"messageType"_s); });
+    const MessageType* type = nullptr;
+    attempt([&] { type = findMessageType(message.textOf(u"messageType"_s)); });
+    if (!type || type->rowSource == RowSource::None)
+        return {u"ERROR"_s};
     MessageRow row{typeName};
-    if (isDrawnFromMessage(code)) {
-        drawFromMessage(row, message, code);
+    if (type->rowSource == RowSource::Message) {
+        drawFromMessage(row, message, *type);
         dashWhereEmpty(row, {Rego, Customer, Quote, Vehicle});
-        return row;
+    } else {
+        drawThroughKey(row, message, *type);
+        dashWhereEmpty(row, {Rego, Claim, Customer, Quote, Vehicle});
     }
-    for (const QuoteSource& source : quoteSources)
-        if (code == source.code) {
-            drawThroughKey(row, message, source);
-            dashWhereEmpty(row, {Rego, Claim, Customer, Quote, Vehicle});
-            return row;
-        }
-    return {u"ERROR"_s};
+    return row;
 }
 
 MessageRow GetMarkerRow(const QString& text, const QString& typeName)
@@ -227,7 +206,7 @@ MessageRow GetMarkerRow(const xml::Document& marker, const QString& typeName)
             sql("SELECT * FROM QUOTE1, CAR WHERE QUOTE1.REGO=CAR.REGO AND QUOTE1.QTNNO='{}' AND "
                 "QUOTE1.subquote='{}' ORDER BY QUOTE1.rec_id DESC",
                 row[Quote], subquote));
-        if (suffices(quote, Rows::ExactlyOne))
+        if (suffices(quote, RowsNeeded::ExactlyOne))
             drawFromQuote(row, quote);
     });
     dashWhereEmpty(row, {Rego, Claim, Customer, Quote, Vehicle});

@@ -2,6 +2,7 @@
 
 #include "base/SharedVariables.h"
 #include "messages/Envelope.h"
+#include "messages/MessageTypes.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
 #include "platform/files/files.h"
@@ -46,7 +47,7 @@ void checkMessage(const QString& path, const QString& name)
         throw Refusal{u"it can't be read as XML"_s};
     if (name.startsWith("R_"_L1))
         return checkResponse(document, name);
-    const bool isNetworkMessage = !name.contains("MDMSG"_L1) && GetMessageTypeName(document) != messageTypeName({});
+    const bool isNetworkMessage = !name.contains("MDMSG"_L1) && GetMessageTypeName(document) != unknownMessageType;
     if (!isNetworkMessage && !isMarker(document))
         throw Refusal{u"it is not a message of the network"_s};
 }

@@ -1,9 +1,7 @@
 #include "messages/Envelope.h"
 
+#include "messages/MessageTypes.h"
 #include "platform/RuntimeError.h"
-
-#include <array>
-#include <utility>
 
 using namespace Qt::StringLiterals;
 
@@ -13,22 +11,6 @@ namespace {
 constexpr QLatin1StringView networkDomain = "orla.example"_L1;  // every namespace of the network ends in this
 constexpr QLatin1StringView schemaInstance = "xmlns:xsi=\"http://www.w3.org/2001/XMLSchema-instance\" "_L1;
 constexpr int repairsAllowed = 3;
-constexpr QLatin1StringView unknownMessage = "UNKNOWN - INVALID MESSAGE"_L1;
-
-constexpr std::pair<QLatin1StringView, QLatin1StringView> displayNames[] = {
-    {"QREQ"_L1, "Quote Request"_L1},
-    {"QMQR"_L1, "Quote Matched to Quote Request"_L1},
-    {"MANQ"_L1, "Manual Quote"_L1},
-    {"QTDL"_L1, "Quote Deletion"_L1},
-    {"RRQT"_L1, "Request for Revised Quote"_L1},
-    {"QRCN"_L1, "Quote Request Cancellation"_L1},
-    {"ADQT"_L1, "Adjusted Quote"_L1},
-    {"AUQT"_L1, "Authorised Quote"_L1},
-    {"ARES"_L1, "Assessment Result"_L1},
-    {"BACA"_L1, "Backout Assessment"_L1},
-    {"BCQR"_L1, "Backout Quote Request Cancellation"_L1},
-    {"EWAP"_L1, "Excess Waived/Already Paid"_L1},
-};
 
 }  // namespace
 
@@ -72,14 +54,6 @@ bool isSameWhenPrepared(const QString& text)
     return isAttribute && !before.contains("<!"_L1) && !before.contains("<?"_L1);
 }
 
-QString messageTypeName(const QString& code)
-{
-    for (const auto& [known, name] : displayNames)
-        if (code == known)
-            return name;
-    return unknownMessage;
-}
-
 QString GetMessageTypeName(QString& text)
 {
     return GetMessageTypeName(parsedMessage(text));
@@ -105,7 +79,7 @@ QString GetMarkerTypeName(const xml::Document& marker)
     attempt([&] { action = marker.textOf(u"action"_s); });
     if (mailType != "MDMSG"_L1)
         return u"CORRUPT!"_s;
-    return action == "DELDUPE"_L1 ? u"Quote Send Error"_s : QString(unknownMessage);
+    return action == "DELDUPE"_L1 ? u"Quote Send Error"_s : QString(unknownMessageType);
 }
 
 bool isMarker(const xml::Document& message)

@@ -19,8 +19,6 @@ QString AddXsiDeclaration(QString text);
 /// parse. Returns false in doubt.
 bool isSameWhenPrepared(const QString& text);
 
-/// Returns the display name of a type code in upper case, or "UNKNOWN - INVALID MESSAGE".
-QString messageTypeName(const QString& code);
 /// Returns the display name of a network message. Adds the schema-instance declaration to `text`. Never throws.
 QString GetMessageTypeName(QString& text);
 /// Returns the display name of a message that has already been parsed.

@@ -3,6 +3,7 @@
 #include "base/Helpers.h"
 #include "base/SharedVariables.h"
 #include "messages/Envelope.h"
+#include "messages/MessageTypes.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
@@ -14,29 +15,6 @@ using namespace Qt::StringLiterals;
 
 namespace kest {
 namespace {
-
-// How a message identifies its quote.
-enum class KeyKind { RequestAndVersion, Request, Reference, NetworkNumber, DeletedQuote };
-
-struct KeySource {
-    QLatin1StringView type;
-    KeyKind kind;
-    QLatin1StringView path;
-};
-
-constexpr KeySource keySources[] = {
-    {"QREQ"_L1, KeyKind::RequestAndVersion, "//rootns:quoteRequestNumber"_L1},
-    {"RRQT"_L1, KeyKind::RequestAndVersion, "//rootns:quoteRequestNumber"_L1},
-    {"QRCN"_L1, KeyKind::Request, "//rootns:quoteRequestNumber"_L1},
-    {"BCQR"_L1, KeyKind::Request, "//rootns:kestQuoteRequestNumber"_L1},
-    {"BACA"_L1, KeyKind::Request, "//rootns:kestQuoteRequestNumber"_L1},
-    {"QMQR"_L1, KeyKind::Reference, "//rootns:quoteBody/rootns:quoteReference"_L1},
-    {"MANQ"_L1, KeyKind::Reference, "//rootns:quoteBody/rootns:quoteReference"_L1},
-    {"ADQT"_L1, KeyKind::Reference, "//rootns:quoteBody/rootns:quoteReference"_L1},
-    {"AUQT"_L1, KeyKind::Reference, "//rootns:quoteBody/rootns:quoteReference"_L1},
-    {"QTDL"_L1, KeyKind::DeletedQuote, "//rootns:kestQuoteNumber"_L1},
-    {"ARES"_L1, KeyKind::NetworkNumber, "//rootns:kestOriginalQuoteNumber"_L1},
-};
 
 QuoteKey newestOfRequest(const QString& request, const QString& version)
 {
@@ -62,24 +40,26 @@ QuoteKey lastOfNetworkNumber(const QString& number)
     return QuoteKey::fromRow(quote);
 }
 
-QuoteKey quoteKeyIn(const xml::Document& message, const KeySource& source)
+QuoteKey quoteKeyIn(const xml::Document& message, const MessageType& type)
 {
-    switch (source.kind) {
-        case KeyKind::RequestAndVersion:
-            return newestOfRequest(message.textOf(source.path),
-                                   message.textOf(u"//rootns:quoteRequestVersionNumber"_s));
-        case KeyKind::Request:
-            return newestOfRequest(message.textOf(source.path), {});
-        case KeyKind::Reference:
-            return QuoteKey::fromReference(message.textOf(source.path));
-        case KeyKind::DeletedQuote:  // the quote is no longer in the database
+    const auto key = [&] { return message.textOf(type.fileKeyPath); };
+    switch (type.fileKey) {
+        case FileKey::None:
+            return {};
+        case FileKey::RequestAndVersion:
+            return newestOfRequest(key(), message.textOf(u"//rootns:quoteRequestVersionNumber"_s));
+        case FileKey::Request:
+            return newestOfRequest(key(), {});
+        case FileKey::Reference:
+            return QuoteKey::fromReference(key());
+        case FileKey::DeletedQuote:  // the quote is no longer in the database
             if (!gsDeletedQTNNO.isEmpty())
                 return {gsDeletedQTNNO, gsDeletedSubquote};
             break;
-        case KeyKind::NetworkNumber:
+        case FileKey::NetworkNumber:
             break;
     }
-    return lastOfNetworkNumber(message.textOf(source.path));
+    return lastOfNetworkNumber(key());
 }
 
 // Returns the highest number that a message of this quote has in the read folder, or 0 if there is none. Throws if the
@@ -161,11 +141,11 @@ MessageQuoteKey GetMessageQuoteKey(QString text)
     MessageQuoteKey key;
     attempt([&] {
         const xml::Document message = parsedMessage(text);
-        const QString type = message.textOf(u"messageType"_s).toUpper();
-        for (const KeySource& source : keySources)
-            if (type == source.type)
-                key.quote = quoteKeyIn(message, source);
-        key.isQuoteRequest = type == "QREQ"_L1;
+        const MessageType* type = findMessageType(message.textOf(u"messageType"_s).toUpper());
+        if (!type)
+            return;
+        key.quote = quoteKeyIn(message, *type);
+        key.isQuoteRequest = type->code == MessageCode::QREQ;
     });
     return key;
 }

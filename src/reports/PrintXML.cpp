@@ -5,6 +5,7 @@
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "messages/Envelope.h"
+#include "messages/MessageTypes.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
@@ -209,16 +210,21 @@ bool print(const QString& fileName, bool Reprint)
 {
     QString text = files::read(gsListFolder + fileName);
     const xml::Document message = parsedMessage(text);
-    const QString type = message.documentElement().textOrEmptyOf(u"//*[name()='messageType']"_s);
-    if (type == u"QREQ"_s)
-        return printRequest(message);
-    if (type == u"ADQT"_s)
-        return printAdjusted(message, Reprint);
-    if (type == u"AUQT"_s)
-        return printAuthorised(message, Reprint);
-    if (type == u"ARES"_s)
-        return printResult(message);
-    return true;  // the other types have no report, and neither do markers, which have no type
+    const MessageType* type = findMessageType(message.documentElement().textOrEmptyOf(u"//*[name()='messageType']"_s));
+    if (!type)
+        return true;
+    switch (type->code) {
+        case MessageCode::QREQ:
+            return printRequest(message);
+        case MessageCode::ADQT:
+            return printAdjusted(message, Reprint);
+        case MessageCode::AUQT:
+            return printAuthorised(message, Reprint);
+        case MessageCode::ARES:
+            return printResult(message);
+        default:
+            return true;  // it has no report
+    }
 }
 
 }  // namespace
