@@ -5,16 +5,13 @@
 #include "base/modLoggerEx.h"
 #include "inbound/Loading.h"
 #include "inbound/NextNumbers.h"
+#include "messages/MessageLines.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
 #include "quotedata/NetworkCodes.h"
 #include "quotedata/Vendors.h"
-
-#include <QList>
-
-#include <utility>
 
 namespace kest {
 
@@ -29,71 +26,35 @@ constexpr int partNumberLength = 21;
 constexpr int repairerLength = 49;
 constexpr int tickOfNewLine = 7;
 
-// A line is added if its indicator is that of Insert, or if neither it nor a line before it in its section has one.
-enum class Change { Add, Insert, Alter, Keep, Delete };
-
-constexpr std::pair<QLatin1StringView, Change> changes[] = {
-    {""_L1, Change::Add},   {"I"_L1, Change::Insert}, {"C"_L1, Change::Alter},
-    {"N"_L1, Change::Keep}, {"D"_L1, Change::Delete},
-};
-
-Change changeOf(const QString& indicator)
+qint64 numberOf(const MessageLine& line)
 {
-    for (const auto& [known, change] : changes) {
-        if (known == indicator)
-            return change;
-    }
-    throw RuntimeError(TypeMismatch, u"The change indicator \"%1\" is not known."_s.arg(indicator));
-}
-
-/// A line of the message. A deleted one has only its number.
-struct Line {
-    xml::Node node;
-    Change change;
-
-    qint64 number() const { return toLong(node.textOf(u"rootns:quoteLineNumber"_s)); }
-    QString text(QLatin1StringView element) const
-    {
-        return change == Change::Delete ? QString() : node.textOf(u"rootns:"_s + element);
-    }
-};
-
-/// Returns the lines of a section. A line without a change indicator has that of the line before it.
-QList<Line> linesOf(const xml::Node& body, QLatin1StringView section)
-{
-    QList<Line> lines;
-    QString indicator;
-    for (const xml::Node& node : body.selectNodes(u"rootns:"_s + section + u"/*"_s)) {
-        if (const xml::Node own = node.selectSingleNode(u"rootns:quoteLineChangeIndicator"_s))
-            indicator = own.text();
-        lines.append({node, changeOf(indicator)});
-    }
-    return lines;
+    return toLong(line.requiredText("quoteLineNumber"_L1));
 }
 
 /// Makes the row that a line fills the current row, a new row if the line is added. Deletes the row of a deleted line.
 /// Returns false if there is no row to fill.
-bool standOnRow(db::Recordset& rows, Change change, qint64 number)
+bool standOnRow(db::Recordset& rows, LineChange change, qint64 number)
 {
     if (rows.recordCount() > 0)
         rows.moveFirst();
     switch (change) {
-        case Change::Add:
-        case Change::Insert:
+        case LineChange::Add:
+        case LineChange::Insert:
             rows.addNew();
             return true;
-        case Change::Keep:
+        case LineChange::Keep:
+        case LineChange::Unknown:
             return false;
-        case Change::Alter:
-        case Change::Delete:
+        case LineChange::Alter:
+        case LineChange::Delete:
             break;
     }
     rows.find(sql("SEQ_NO='{}'", number));
     if (rows.eof())
         return false;
-    if (change == Change::Delete)
+    if (change == LineChange::Delete)
         rows.remove();
-    return change == Change::Alter;
+    return change == LineChange::Alter;
 }
 
 void fillKey(db::Recordset& row, const db::Recordset& quote, qint64 number)
@@ -133,13 +94,13 @@ void fillLabourAmount(db::Recordset& row, const LabourType& type, const QString&
         row.set(u"directbill"_s, u"R"_s);
 }
 
-void takeLabour(const db::Recordset& quote, db::Recordset& row, const Line& line)
+void takeLabour(const db::Recordset& quote, db::Recordset& row, const MessageLine& line)
 {
-    const qint64 number = line.number();
-    const QString type = line.text("labourType"_L1);
-    const QString script = line.text("labourDescription"_L1).left(descriptionLength);
-    const QString amount = line.text("labourAmount"_L1);
-    if (!standOnRow(row, line.change, number))
+    const qint64 number = numberOf(line);
+    const QString type = line.requiredText("labourType"_L1);
+    const QString script = line.requiredText("labourDescription"_L1).left(descriptionLength);
+    const QString amount = line.requiredText("labourAmount"_L1);
+    if (!standOnRow(row, line.change(), number))
         return;
 
     fillKey(row, quote, number);
@@ -169,18 +130,18 @@ void fillSide(db::Recordset& row, const QString& description)
         row.set(u"SIDE"_s, u"R"_s);
 }
 
-void takePart(const db::Recordset& quote, db::Recordset& row, const Line& line)
+void takePart(const db::Recordset& quote, db::Recordset& row, const MessageLine& line)
 {
-    const qint64 number = line.number();
-    const QString partNumber = line.text("partNumber"_L1).left(partNumberLength);
-    const QString type = line.text("partType"_L1);
-    const QString description = line.text("partDescription"_L1);
-    const QString quantityText = line.text("partQuantity"_L1);
-    const QString priceText = line.text("partUnitPrice"_L1);
-    const QString percentageText = line.text("partMarkUpPercentage"_L1);
-    line.text("partAmount"_L1);
-    line.text("partMarkUpAmount"_L1);
-    if (!standOnRow(row, line.change, number))
+    const qint64 number = numberOf(line);
+    const QString partNumber = line.requiredText("partNumber"_L1).left(partNumberLength);
+    const QString type = line.requiredText("partType"_L1);
+    const QString description = line.requiredText("partDescription"_L1);
+    const QString quantityText = line.requiredText("partQuantity"_L1);
+    const QString priceText = line.requiredText("partUnitPrice"_L1);
+    const QString percentageText = line.requiredText("partMarkUpPercentage"_L1);
+    line.requiredText("partAmount"_L1);
+    line.requiredText("partMarkUpAmount"_L1);
+    if (!standOnRow(row, line.change(), number))
         return;
 
     fillKey(row, quote, number);
@@ -210,13 +171,13 @@ QString withoutBlend(const QString& description)
     return description.chopped(qMin(marker, description.size()));
 }
 
-void takePaint(const db::Recordset& quote, db::Recordset& row, const Line& line)
+void takePaint(const db::Recordset& quote, db::Recordset& row, const MessageLine& line)
 {
-    const qint64 number = line.number();
-    line.text("paintWorkType"_L1);
-    const QString script = withoutBlend(line.text("paintDescription"_L1)).left(descriptionLength);
-    const QString amount = line.text("paintAmount"_L1);
-    if (!standOnRow(row, line.change, number))
+    const qint64 number = numberOf(line);
+    line.requiredText("paintWorkType"_L1);
+    const QString script = withoutBlend(line.requiredText("paintDescription"_L1)).left(descriptionLength);
+    const QString amount = line.requiredText("paintAmount"_L1);
+    if (!standOnRow(row, line.change(), number))
         return;
 
     fillKey(row, quote, number);
@@ -237,10 +198,10 @@ struct Sublet {
     QString address;
     QString phone;
 
-    void read(const Line& line);
+    void read(const MessageLine& line);
 };
 
-void Sublet::read(const Line& line)
+void Sublet::read(const MessageLine& line)
 {
     const auto take = [&](const QString& element, QString& text) {
         if (const xml::Node told = line.node.selectSingleNode(element))
@@ -263,9 +224,9 @@ qint64 numberForDocument(const QuoteKey& quote, qint64 before)
 }
 
 /// Stores the document of a line, if it has one. Returns the number of the line, a new one if the document needs it.
-qint64 takeDocument(const db::Recordset& quote, const Line& line, qint64 before)
+qint64 takeDocument(const db::Recordset& quote, const MessageLine& line, qint64 before)
 {
-    qint64 number = line.number();
+    qint64 number = numberOf(line);
     const xml::Node document = line.node.selectSingleNode(u"rootns:subletAuthorityDocument"_s);
     if (!document)
         return number;
@@ -278,17 +239,17 @@ qint64 takeDocument(const db::Recordset& quote, const Line& line, qint64 before)
     return number;
 }
 
-void takeSublet(const db::Recordset& quote, db::Recordset& row, const Line& line, Sublet& told)
+void takeSublet(const db::Recordset& quote, db::Recordset& row, const MessageLine& line, Sublet& told)
 {
     told.read(line);
     told.number = takeDocument(quote, line, told.number);
-    if (!standOnRow(row, line.change, told.number))
+    if (!standOnRow(row, line.change(), told.number))
         return;
 
     fillKey(row, quote, told.number);
     setColumns(row,
                {{"category"_L1, u"MIS"_s}, {"script"_L1, told.description.left(descriptionLength)}, {"blend"_L1, 0}});
-    if (line.change == Change::Insert) {
+    if (line.change() == LineChange::Insert) {
         setColumns(row, {{"Report_on"_L1, 0},
                          {"delitem"_L1, false},
                          {"tosend"_L1, u"A"_s},
@@ -301,13 +262,14 @@ void takeSublet(const db::Recordset& quote, db::Recordset& row, const Line& line
     storeWithItemNo(row);
 }
 
-constexpr QLatin1StringView sections[] = {"labours"_L1, "parts"_L1, "paints"_L1, "sublets"_L1};
-
+/// Throws for a line that says to do something unknown.
 xml::Node bodyOf(const xml::Document& message)
 {
     const xml::Node body = message.selectSingleNode(u"rootns:quoteBody"_s);
-    for (const QLatin1StringView section : sections)
-        linesOf(body, section);
+    for (const LineSection section : lineSections)
+        for (const MessageLine& line : messageLines(body, section))
+            if (line.change() == LineChange::Unknown)
+                throw RuntimeError(TypeMismatch, u"The change indicator \"%1\" is not known."_s.arg(line.indicator));
     return body;
 }
 
@@ -318,15 +280,23 @@ void takeLines(const db::Recordset& quote, db::Recordset& rows, const xml::Docum
          {"labourTotal"_L1, "partTotal"_L1, "partMarkUpTotal"_L1, "gst"_L1, "paintTotal"_L1, "quoteTotal"_L1})
         body.textOf(u"rootns:"_s + total);
 
-    for (const Line& line : linesOf(body, "labours"_L1))
-        takeLabour(quote, rows, line);
-    for (const Line& line : linesOf(body, "parts"_L1))
-        takePart(quote, rows, line);
-    for (const Line& line : linesOf(body, "paints"_L1))
-        takePaint(quote, rows, line);
     Sublet told;
-    for (const Line& line : linesOf(body, "sublets"_L1))
-        takeSublet(quote, rows, line, told);
+    for (const LineSection section : lineSections)
+        for (const MessageLine& line : messageLines(body, section))
+            switch (section) {
+                case LineSection::Labour:
+                    takeLabour(quote, rows, line);
+                    break;
+                case LineSection::Part:
+                    takePart(quote, rows, line);
+                    break;
+                case LineSection::Paint:
+                    takePaint(quote, rows, line);
+                    break;
+                case LineSection::Sublet:
+                    takeSublet(quote, rows, line, told);
+                    break;
+            }
 }
 
 template <class Step>

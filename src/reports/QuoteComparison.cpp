@@ -1,6 +1,7 @@
 #include "reports/QuoteComparison.h"
 
 #include "base/SharedVariables.h"
+#include "messages/MessageLines.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
@@ -54,8 +55,6 @@ constexpr HeaderField headerFields[] = {
     {"sub_repairer",  "",                                           ""},
 };
 
-enum class Section { Labour, Part, Paint, Sublet };
-
 // The value that a field of a line has at first.
 struct Start {
     enum From { Unset, Literal, Element, Number, NumberOrUnset, Tenth } from = Unset;
@@ -103,42 +102,28 @@ constexpr StartField adjustedStart[] = {
 };
 // clang-format on
 
-constexpr std::pair<Section, const char*> sections[] = {
-    {Section::Labour, "rootns:labours/*"},
-    {Section::Part, "rootns:parts/*"},
-    {Section::Paint, "rootns:paints/*"},
-    {Section::Sublet, "rootns:sublets/*"},
-};
-
 bool isBlank(const QString& text)
 {
     return text.trimmed().isEmpty();
 }
 
-/// A line of the message. A deleted one has only its number.
-struct Line {
-    xml::Node node;
-    QString indicator;
+bool isDeleted(const MessageLine& line)
+{
+    return line.change() == LineChange::Delete;
+}
 
-    bool isChanged() const { return indicator == u"C"_s; }
-    bool isDeleted() const { return indicator == u"D"_s; }
-    bool isUnchanged() const { return indicator == u"N"_s; }
+QString numberOf(const MessageLine& line)
+{
+    return line.text("quoteLineNumber"_L1);
+}
 
-    QString number() const { return node.textOrEmptyOf(u"rootns:quoteLineNumber"_s); }
-    QString text(const char* element) const
-    {
-        const bool isTold = !isDeleted() || qstrcmp(element, "quoteLineNumber") == 0;
-        return isTold ? node.textOrEmptyOf(u"rootns:"_s + QString::fromLatin1(element)) : QString();
-    }
-};
-
-QVariant startValue(const Start& start, const Line& line)
+QVariant startValue(const Start& start, const MessageLine& line)
 {
     if (start.from == Start::Unset)
         return {};
     if (start.from == Start::Literal)
         return QString::fromLatin1(start.text);
-    const QString text = line.text(start.text);
+    const QString text = line.text(QLatin1StringView(start.text));
     if (start.from == Start::Element)
         return text;
     if (isBlank(text))
@@ -168,7 +153,7 @@ void takeOver(db::Recordset& row, const QString& field, const QString& oldField,
 /// Adds the shop's values to those of the message, in the table's last row.
 class Comparison {
 public:
-    Comparison(db::Recordset& reportRow, const db::Recordset& shopLine, const Line& messageLine,
+    Comparison(db::Recordset& reportRow, const db::Recordset& shopLine, const MessageLine& messageLine,
                ComparisonOf comparison)
         : row(reportRow), shop(shopLine), line(messageLine), isAuthorised(comparison == ComparisonOf::AuthorisedQuote)
     {
@@ -188,13 +173,13 @@ private:
 
     db::Recordset& row;
     const db::Recordset& shop;
-    const Line& line;
+    const MessageLine& line;
     bool isAuthorised;
 };
 
 void Comparison::takeOverWhereDeleted()
 {
-    if (!line.isDeleted())
+    if (!isDeleted(line))
         return;
     const SaysNothing test = isAuthorised ? SaysNothing::Zero : SaysNothing::EmptyText;
     takeOver(row, u"qty"_s, u"old_qty"_s, test);
@@ -229,17 +214,17 @@ QVariant Comparison::oldLabourAmount(const QString& type) const
 
 void Comparison::labour()
 {
-    QString type = line.text("labourType");
+    QString type = line.text("labourType"_L1);
     if (isBlank(type)) {
         type = labourTypeOfCategory(shop.text(u"category"_s)).code;
         row.set(u"category"_s, type);
     }
-    if (line.isDeleted()) {
+    if (isDeleted(line)) {
         row.set(u"script"_s, shop.text(u"script"_s));
         row.set(u"amount"_s, isAuthorised ? u"0"_s : u""_s);
         row.set(u"gst"_s, 0);
     }
-    if (!isAuthorised && line.isDeleted())
+    if (!isAuthorised && isDeleted(line))
         row.set(u"old_qty"_s, 0);
     else if (!shop.isNull(u"qty"_s))
         row.set(u"old_qty"_s, shop.value(u"qty"_s));
@@ -255,11 +240,12 @@ void Comparison::part()
 {
     const bool isQuantityKept = row.text(u"qty"_s).trimmed() == shop.text(u"qty"_s).trimmed();
     if (isAuthorised || isQuantityKept) {
-        if (line.isChanged() || line.isDeleted())
+        const bool isAltered = line.change() == LineChange::Alter;
+        if (isAltered || isDeleted(line))
             row.set(u"old_qty"_s, 0);
-        if (line.isChanged())
+        if (isAltered)
             row.set(u"qty"_s, 0);
-        if (line.isDeleted()) {
+        if (isDeleted(line)) {
             row.set(u"qty"_s, shop.value(u"qty"_s));
             row.set(u"script"_s, shop.text(u"script"_s));
             row.set(u"amount"_s, shop.value(u"rrhour"_s));
@@ -277,9 +263,9 @@ void Comparison::part()
 
 void Comparison::paint()
 {
-    if (isBlank(line.text("paintWorkType")))
+    if (isBlank(line.text("paintWorkType"_L1)))
         row.set(u"category"_s, u"PAIN"_s);
-    if (line.isDeleted()) {
+    if (isDeleted(line)) {
         row.set(u"script"_s, shop.text(u"script"_s));
         row.set(u"amount"_s, 0);
         row.set(u"gst"_s, 0);
@@ -290,7 +276,7 @@ void Comparison::paint()
                 has(u"rr_rate2"_s) ? product(shop, u"pthour"_s, u"rr_rate2"_s) : shop.value(u"pthour"_s));
     else
         row.set(u"old_amount"_s, 0);
-    if (line.isDeleted()) {
+    if (isDeleted(line)) {
         takeOver(row, u"qty"_s, u"old_qty"_s, SaysNothing::Zero);
         takeOver(row, u"amount"_s, u"old_amount"_s, SaysNothing::Zero);
     }
@@ -300,9 +286,9 @@ void Comparison::paint()
 
 void Comparison::sublet(db::Recordset& subletTypes)
 {
-    if (isBlank(line.text("subletType")))
+    if (isBlank(line.text("subletType"_L1)))
         row.set(u"category"_s, u"MIS"_s);
-    if (line.isDeleted()) {
+    if (isDeleted(line)) {
         if (subletTypes.recordCount() > 0)
             subletTypes.moveFirst();
         subletTypes.find(sql("Type='{}'", shop.value(u"PartNo"_s)));
@@ -320,17 +306,18 @@ void Comparison::sublet(db::Recordset& subletTypes)
 }
 
 /// Returns the vendor of a sublet line's repairer, and adds one if the shop has none of that name.
-QVariant vendorOf(const Line& line)
+QVariant vendorOf(const MessageLine& line)
 {
-    return findOrAddVendor(line.text("subletRepairer").left(repairerLength),
-                           line.text("subletRepairerAddress").left(repairerLength), line.text("subletRepairerPhone"));
+    return findOrAddVendor(line.text("subletRepairer"_L1).left(repairerLength),
+                           line.text("subletRepairerAddress"_L1).left(repairerLength),
+                           line.text("subletRepairerPhone"_L1));
 }
 
-void startRow(db::Recordset& table, const Line& line, Section section, ComparisonOf comparison)
+void startRow(db::Recordset& table, const MessageLine& line, LineSection section, ComparisonOf comparison)
 {
     table.addNew();
     table.set(u"action"_s, line.indicator);
-    table.set(u"line_no"_s, line.number());
+    table.set(u"line_no"_s, numberOf(line));
     const std::span<const StartField> fieldsOfLine =
         comparison == ComparisonOf::AuthorisedQuote ? authorisedStart : adjustedStart;
     for (const StartField& field : fieldsOfLine) {
@@ -387,31 +374,27 @@ void addChangedLines(db::Recordset& table, const ComparisonHeader& header, const
     subletTypes.open(u"SELECT Type, Script FROM SUBLET WHERE Sublet=1"_s);
     const QVariant total = quote.value(u"TOTAL"_s);
 
-    for (const auto& [section, path] : sections) {
-        QString indicator;  // a line without one has that of the line before, as in the load
-        for (const xml::Node& node : body.selectNodes(QString::fromLatin1(path))) {
-            if (const xml::Node own = node.selectSingleNode(u"rootns:quoteLineChangeIndicator"_s))
-                indicator = own.text();
-            const Line line{node, indicator};
-            if (line.isUnchanged() || (line.isDeleted() && Reprint))
+    for (const LineSection section : lineSections) {
+        for (const MessageLine& line : messageLines(body, section)) {
+            if (line.change() == LineChange::Keep || (isDeleted(line) && Reprint))
                 continue;
             startRow(table, line, section, comparison);
             setHeader(table, header);
-            if (isAuthorised && section == Section::Sublet)
+            if (isAuthorised && section == LineSection::Sublet)
                 table.set(u"vendor"_s, vendorOf(line));
-            if (findLine(lines, line.number())) {
+            if (findLine(lines, numberOf(line))) {
                 Comparison shown(table, lines, line, comparison);
                 switch (section) {
-                    case Section::Labour:
+                    case LineSection::Labour:
                         shown.labour();
                         break;
-                    case Section::Part:
+                    case LineSection::Part:
                         shown.part();
                         break;
-                    case Section::Paint:
+                    case LineSection::Paint:
                         shown.paint();
                         break;
-                    case Section::Sublet:
+                    case LineSection::Sublet:
                         shown.sublet(subletTypes);
                         break;
                 }
