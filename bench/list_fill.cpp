@@ -77,7 +77,7 @@ void fillList(benchmark::State& state)
         readAndParseEach(place, names);
         floor += timer.nsecsElapsed();
         timer.restart();
-        const QList<ListedMessage> listed = BuildMessageList(Unread, {});
+        const QList<ListedMessage> listed = BuildMessageList(MessageFolder::Unread, {});
         const qint64 elapsed = timer.nsecsElapsed();
         filling += elapsed;
         state.SetIterationTime(static_cast<double>(elapsed) / 1e9);

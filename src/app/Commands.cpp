@@ -232,7 +232,7 @@ Outcome transport(const CommandLine& line)
     bool faulty = false;
     const bool ran = runTransport(mode->second, [&](const Carry& carry) {
         for (const Carried& file : carry.carried) {
-            const QString direction = file.direction == Carried::Out ? u"out"_s : u"in"_s;
+            const QString direction = file.direction == Carried::Direction::Out ? u"out"_s : u"in"_s;
             if (line.json)
                 carried.append(
                     QJsonObject{{u"direction"_s, direction}, {u"file"_s, file.file}, {u"what"_s, file.what}});

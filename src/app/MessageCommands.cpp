@@ -48,11 +48,10 @@ QJsonArray rowsAsJson(const QList<ListedMessage>& rows)
     return array;
 }
 
-std::optional<int> folderNamed(const QString& name)
+std::optional<MessageFolder> folderNamed(const QString& name)
 {
-    static const std::map<QString, int> folders{{u"unread"_s, Unread}, {u"read"_s, Read}, {u"sent"_s, Sent}};
-    const auto found = folders.find(name);
-    return found == folders.end() ? std::nullopt : std::optional(found->second);
+    const auto found = std::ranges::find(messageFolders, name, wordOf);
+    return found == std::end(messageFolders) ? std::nullopt : std::optional(*found);
 }
 
 QJsonArray boxesShown()
@@ -82,23 +81,18 @@ int notDone(const frmMessageList& window, const QString& buttonName, const QStri
     return refused(caption + u" does nothing with "_s + file, Refused).exitCode;
 }
 
-QString folderPath(int folder)
-{
-    return folder == Unread ? gsUnreadPath : folder == Read ? gsReadPath : gsSentPath;
-}
-
 }  // namespace
 
 Outcome list(const QStringList& arguments)
 {
-    const std::optional<int> folder = folderNamed(arguments[0]);
+    const std::optional<MessageFolder> folder = folderNamed(arguments[0]);
     const bool filtered = arguments.size() == 3 && arguments[1] == u"--filter"_s;
     if (!folder || (arguments.size() > 1 && !filtered))
         return refused(u"list takes unread, read or sent, and --filter TEXT"_s, Usage);
 
     frmMessageList window;
     window.open();
-    if (*folder != Unread) {
+    if (*folder != MessageFolder::Unread) {
         if (filtered)
             desktop::currentScript()->answerInputs(arguments[2]);
         window.chooseFolder(*folder);
@@ -129,7 +123,7 @@ Outcome reprint(const QStringList& arguments)
 {
     frmMessageList window;
     window.open();
-    window.chooseFolder(Read);
+    window.chooseFolder(MessageFolder::Read);
     const QJsonArray boxes = boxesShown();
     const bool printed = window.reprintFile(arguments[0]);
     return {.exitCode = printed ? Done : notDone(window, u"cmdPrint"_s, arguments[0], boxes)};
@@ -137,13 +131,13 @@ Outcome reprint(const QStringList& arguments)
 
 Outcome view(const QStringList& arguments)
 {
-    const std::optional<int> folder = folderNamed(arguments[0]);
+    const std::optional<MessageFolder> folder = folderNamed(arguments[0]);
     if (!folder)
         return refused(u"view takes unread, read or sent, and a file"_s, Usage);
     if (!isBareName(arguments[1]))
         return refused(arguments[1] + u" is not the name of a file in the folder"_s, Refused);
     const QJsonArray boxes = boxesShown();
-    const QString text = FormatXML(folderPath(*folder) + arguments[1]);
+    const QString text = FormatXML(pathOf(*folder) + arguments[1]);
     if (text.isEmpty() && !hasTold(boxes))
         return refused(arguments[1] + u" can't be read"_s, Refused);
     return {.exitCode = text.isEmpty() ? Refused : Done, .fields = {{u"text"_s, text}}, .text = text};

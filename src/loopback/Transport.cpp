@@ -1,9 +1,9 @@
 #include "loopback/Transport.h"
 
+#include "base/Helpers.h"
 #include "platform/RuntimeError.h"
 #include "platform/files/files.h"
 #include "platform/xml/xml.h"
-#include "base/Helpers.h"
 
 #include <QDateTime>
 #include <QFileInfo>
@@ -146,7 +146,7 @@ void Transport::takeQuote(const QString& name)
         save();  // before the document moves: if the program stops in between, the answer must not be lost
     }
     files::move(folders.unsent + name, folders.sent + name);
-    result.carried.append({Carried::Out, name, u"Quote "_s + NormaliseQuoteRef(quote.reference())});
+    result.carried.append({Carried::Direction::Out, name, u"Quote "_s + NormaliseQuoteRef(quote.reference())});
 }
 
 void Transport::begin(const QuoteDocument& quote, const QString& name)
@@ -199,7 +199,7 @@ void Transport::finishMoving()
             if (!files::exists(folders.unsent + name))
                 return;
             files::move(folders.unsent + name, folders.sent + name);
-            result.carried.append({Carried::Out, name, u"Image"_s});
+            result.carried.append({Carried::Direction::Out, name, u"Image"_s});
         });
         if (moved)
             known->moving.removeAll(name);

@@ -25,7 +25,8 @@ struct TransportFolders {
 
 /// A file that was sent or received.
 struct Carried {
-    enum Direction { Out, In } direction;
+    enum class Direction { Out, In };
+    Direction direction;
     QString file;
     QString what;  // "Authorised Quote 1004"
 };

@@ -262,7 +262,7 @@ void Transport::remember(const Step& step, const Matter& matter, Dealing& dealin
 void Transport::put(const QString& name, const QByteArray& bytes, const QString& what)
 {
     files::writeBytes(files::pathForWriting(folders.unread, name), bytes);
-    result.carried.append({Carried::In, name, what});
+    result.carried.append({Carried::Direction::In, name, what});
 }
 
 void Transport::putPictures(const Step& step, const Matter& matter)

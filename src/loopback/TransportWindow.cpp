@@ -69,7 +69,7 @@ void TransportWindow::run()
 void TransportWindow::tell(const Carry& carry)
 {
     for (const Carried& file : carry.carried)
-        addRow({file.direction == Carried::Out ? u"To insurer"_s : u"To shop"_s, file.file, file.what});
+        addRow({file.direction == Carried::Direction::Out ? u"To insurer"_s : u"To shop"_s, file.file, file.what});
     for (const QString& fault : carry.faults)
         addRow({u"Fault"_s, {}, fault});
     files += int(carry.carried.size());

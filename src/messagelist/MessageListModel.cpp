@@ -119,7 +119,7 @@ int MessageListModel::columnCount(const QModelIndex& parent) const
 QString MessageListModel::cell(qsizetype message, int column) const
 {
     const ListedMessage& listed = all[message];
-    return column == FileColumn ? listed.file : listed.row[static_cast<size_t>(column) - 1];
+    return column == 0 ? listed.file : listed.row[static_cast<size_t>(column) - 1];
 }
 
 QVariant MessageListModel::data(const QModelIndex& index, int role) const

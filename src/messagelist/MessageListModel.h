@@ -12,8 +12,6 @@ namespace kest {
 class MessageListModel final : public QAbstractTableModel {
     Q_OBJECT
 public:
-    enum Column { FileColumn, TypeColumn };
-
     using QAbstractTableModel::QAbstractTableModel;
 
     /// Replaces the messages. The sort order and the search stay.

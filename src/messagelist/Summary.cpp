@@ -18,21 +18,9 @@ namespace {
 constexpr qsizetype unaskedFiles = 25;      // for a folder with more files the user is asked for a filter
 constexpr qsizetype shortestSentText = 30;  // characters, including the wrapping element
 
-QString pathOf(int folder)
+void settleFilter(MessageFolder folder, qsizetype fileCount, const FillHooks& hooks)
 {
-    switch (folder) {
-        case Unread:
-            return gsUnreadPath;
-        case Read:
-            return gsReadPath;
-        default:
-            return gsSentPath;
-    }
-}
-
-void settleFilter(int folder, qsizetype fileCount, const FillHooks& hooks)
-{
-    if (folder == Unread) {
+    if (folder == MessageFolder::Unread) {
         gsListFilter.clear();
         return;
     }
@@ -54,7 +42,7 @@ void reportUnreadable(const QString& file)
 // Fills the list once. All files share one document, so that memory holds only one parsed file at a time.
 class Fill {
 public:
-    Fill(int chosenFolder, const FillHooks& fillHooks) : folder(chosenFolder), hooks(fillHooks)
+    Fill(MessageFolder chosenFolder, const FillHooks& fillHooks) : folder(chosenFolder), hooks(fillHooks)
     {
         SetupDocument(document);
     }
@@ -70,7 +58,7 @@ private:
     QString text;            // of the current file
     xml::Document document;  // the parsed text
     xml::Document reparsed;
-    int folder;
+    MessageFolder folder;
     const FillHooks& hooks;
 };
 
@@ -78,7 +66,7 @@ void Fill::take(const QString& file)
 {
     if (!parse(gsCurFolder + file)) {
         reportUnreadable(file);
-    } else if (folder == Sent) {
+    } else if (folder == MessageFolder::Sent) {
         listed.append({file, GetMessageRow(prepared(), u"SENT"_s)});
     } else if (file.startsWith("R_"_L1)) {
         hooks.submissionResponse(text, file);
@@ -88,8 +76,8 @@ void Fill::take(const QString& file)
             listed.append({file, GetMarkerRow(marker, GetMarkerTypeName(marker))});
         }
     } else {
-        const bool held = (folder == Unread && !AllImagesPresent(document)) ||
-                          (IsHeldBehindEarlier(document, listed, file) && folder == Unread);
+        const bool held = (folder == MessageFolder::Unread && !AllImagesPresent(document)) ||
+                          (IsHeldBehindEarlier(document, listed, file) && folder == MessageFolder::Unread);
         if (!held) {
             const xml::Document& message = prepared();
             listed.append({file, GetMessageRow(message, GetMessageTypeName(message))});
@@ -102,7 +90,7 @@ bool Fill::parse(const QString& path)
     if (files::size(path) > xml::Document::maximumBytes)
         return false;
     text = files::read(path);
-    if (folder != Sent)
+    if (folder != MessageFolder::Sent)
         return parseWithRepairs(document, text);
     if (!escapeAmpersands(text))
         return false;
@@ -122,7 +110,7 @@ const xml::Document& Fill::prepared()
 
 }  // namespace
 
-QList<ListedMessage> BuildMessageList(int folder, const FillHooks& hooks)
+QList<ListedMessage> BuildMessageList(MessageFolder folder, const FillHooks& hooks)
 {
     gsCurFolder = pathOf(folder);
     gsListFolder = gsCurFolder;

@@ -1,6 +1,7 @@
 // Reads the messages of a folder into the rows of the list.
 #pragma once
 
+#include "messages/Folders.h"
 #include "platform/xml/xml.h"
 
 #include <QList>
@@ -20,8 +21,6 @@ struct ListedMessage {
     MessageRow row;
 };
 
-enum MessageFolder : int { Unread = 0, Read = 1, Sent = 2 };
-
 /// Callbacks of a fill.
 struct FillHooks {
     /// Applies a submission response to its quote. Required if the folder contains such a file.
@@ -37,7 +36,7 @@ struct FillHooks {
 ///
 /// If a file can't be parsed, a box says so and the file is left out. Throws RuntimeError for every other failure; the
 /// description begins with the name of the file.
-QList<ListedMessage> BuildMessageList(int folder, const FillHooks& hooks);
+QList<ListedMessage> BuildMessageList(MessageFolder folder, const FillHooks& hooks);
 
 /// Returns false if a picture that the request names is not yet in the unread folder.
 bool AllImagesPresent(const xml::Document& message);

@@ -7,6 +7,7 @@
 #include "messagelist/MessageListModel.h"
 #include "messagelist/TakeIn.h"
 #include "messages/Folders.h"
+#include "messages/MessageTypes.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
 #include "platform/desktop/Progress.h"
@@ -24,6 +25,7 @@
 #include <QMimeData>
 #include <QProgressBar>
 #include <QPushButton>
+#include <QRadioButton>
 #include <QScopedValueRollback>
 #include <QThread>
 #include <QTimer>
@@ -35,8 +37,6 @@ using namespace Qt::StringLiterals;
 
 namespace kest {
 namespace {
-
-constexpr std::array folderWords{"unread"_L1, "read"_L1, "sent"_L1};
 
 const QLocale& written()
 {
@@ -64,14 +64,14 @@ void frmMessageList::ShowForm()
 
 void frmMessageList::open()
 {
-    iFolder = Unread;
-    Option1[Unread]->setChecked(true);
+    iFolder = MessageFolder::Unread;
+    optionOf(MessageFolder::Unread)->setChecked(true);
     RefreshList();
 }
 
-void frmMessageList::chooseFolder(int folder)
+void frmMessageList::chooseFolder(MessageFolder folder)
 {
-    Option1[folder]->setChecked(true);
+    optionOf(folder)->setChecked(true);
     Option1_Click(folder);
 }
 
@@ -143,38 +143,37 @@ QString frmMessageList::status() const
     const QString matching = gsListFilter.isEmpty() ? QString() : u" with \"%1\" in their name"_s.arg(gsListFilter);
     const qsizetype all = rows().size();
     if (all == 0)
-        return "No "_L1 + folderWords[iFolder] + " messages"_L1 + matching;
+        return "No "_L1 + wordOf(iFolder) + " messages"_L1 + matching;
     const QString counted = written().toString(all) + (all == 1 ? " message"_L1 : " messages"_L1) + matching;
     return txtFind->text().isEmpty() ? counted : written().toString(messages->rowCount()) + " of "_L1 + counted;
 }
 
-void frmMessageList::Option1_Click(int index)
+void frmMessageList::Option1_Click(MessageFolder folder)
 {
     txtFind->clear();
     gsListFilter.clear();
     sCurFile.clear();
     gbFilterAsked = false;
     txtFilter->clear();
-    iFolder = index;
+    iFolder = folder;
     RefreshList();
-    cmdProcess->setVisible(index == Unread);
-    cmdPrint->setVisible(index == Read);
-    Frame2->setVisible(index != Unread);
+    cmdProcess->setVisible(folder == MessageFolder::Unread);
+    cmdPrint->setVisible(folder == MessageFolder::Read);
+    Frame2->setVisible(folder != MessageFolder::Unread);
 }
 
 void frmMessageList::ListView1_ItemClick(int row)
 {
     sCurFile = messages->file(row);
-    const QString type = messages->type(row);
+    const auto isOf = [type = messages->type(row)](MessageCode code) { return type == messageType(code).name; };
     if (gbTabletLocal)  // a tablet on its own database loads new work only
-        cmdProcess->setEnabled(type == "Quote Request"_L1);
-    cmdPrint->setEnabled(type != "Request for Revised Quote"_L1 && type != "Quote Deletion"_L1 &&
-                         type != "Quote Request Cancellation"_L1);
+        cmdProcess->setEnabled(isOf(MessageCode::QREQ));
+    cmdPrint->setEnabled(!isOf(MessageCode::RRQT) && !isOf(MessageCode::QTDL) && !isOf(MessageCode::QRCN));
 }
 
 void frmMessageList::ListView1_DblClick()
 {
-    if (iFolder == Sent)
+    if (iFolder == MessageFolder::Sent)
         cmdView_Click();
 }
 
@@ -274,7 +273,7 @@ void frmMessageList::Form_KeyRefresh()
 void frmMessageList::Form_Paste()
 {
     const QMimeData* clipboard = QGuiApplication::clipboard()->mimeData();
-    if (iFolder != Unread)
+    if (iFolder != MessageFolder::Unread)
         lblStatus->setText(u"Files can be taken in only while the unread messages are shown."_s);
     else if (!clipboard || !clipboard->hasUrls())
         lblStatus->setText(u"The clipboard contains no files."_s);
@@ -284,7 +283,7 @@ void frmMessageList::Form_Paste()
 
 void frmMessageList::dragEnterEvent(QDragEnterEvent* event)
 {
-    if (iFolder != Unread || busy || !event->mimeData()->hasUrls())
+    if (iFolder != MessageFolder::Unread || busy || !event->mimeData()->hasUrls())
         return;
     event->setDropAction(Qt::CopyAction);  // with a move, the source program would delete the files
     event->accept();

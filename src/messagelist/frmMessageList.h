@@ -33,7 +33,7 @@ public:
     /// Fills the list from the unread folder.
     void open();
     /// Acts as a click on the option of a folder.
-    void chooseFolder(int folder);
+    void chooseFolder(MessageFolder folder);
     /// Acts as typing the filter and clicking "Update".
     void updateFilter(const QString& filter);
     /// Acts as "Load" on a file of the folder, even if the list does not show it, and waits for the refreshes that
@@ -59,7 +59,7 @@ protected:
     void dropEvent(QDropEvent* event) override;
 
 private:
-    void Option1_Click(int index);
+    void Option1_Click(MessageFolder folder);
     void ListView1_ItemClick(int row);
     void ListView1_DblClick();
     void cmdProcess_Click();
@@ -72,6 +72,7 @@ private:
     void Form_KeyRefresh();
     void Form_Paste();
 
+    QRadioButton* optionOf(MessageFolder folder) const { return Option1[static_cast<size_t>(folder)]; }
     void buildControls();
     void arrange();
     void connectControls();
@@ -103,7 +104,7 @@ private:
     QTimer* tmrRefresh;
 
     QString sCurFile;  // the file clicked last
-    int iFolder = Unread;
+    MessageFolder iFolder = MessageFolder::Unread;
     QString fillFailure;
     int busy = 0;  // how many fills and loads are running; a delayed refresh waits until they end
 };

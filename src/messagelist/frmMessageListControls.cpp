@@ -33,12 +33,18 @@ constexpr int findWidth = 2700;      // twips
 
 constexpr std::array columnWidths{2328, 3969, 1587, 2293, 3969, 2117, 5292};  // twips
 
-struct Folder {
-    QString caption;
-    QString word;
-};
-
-const std::array<Folder, 3> folders{{{u"U&nread"_s, u"unread"_s}, {u"R&ead"_s, u"read"_s}, {u"&Sent"_s, u"sent"_s}}};
+QString captionOf(MessageFolder folder)
+{
+    switch (folder) {
+        case MessageFolder::Unread:
+            return u"U&nread"_s;
+        case MessageFolder::Read:
+            return u"R&ead"_s;
+        case MessageFolder::Sent:
+            break;
+    }
+    return u"&Sent"_s;
+}
 
 template <class Control>
 Control* named(Control* control, const QString& name, const QString& tip = {})
@@ -55,9 +61,9 @@ void frmMessageList::buildControls()
     Frame1 = named(new QGroupBox, u"Frame1"_s);
     Frame1->setAccessibleName(u"Folder"_s);
     for (size_t i = 0; i < Option1.size(); ++i)
-        Option1[i] = named(new QRadioButton(folders[i].caption), u"Option1(%1)"_s.arg(i),
-                           "Show the "_L1 + folders[i].word + " messages"_L1);
-    Option1[Unread]->setChecked(true);
+        Option1[i] = named(new QRadioButton(captionOf(messageFolders[i])), u"Option1(%1)"_s.arg(i),
+                           "Show the "_L1 + wordOf(messageFolders[i]) + " messages"_L1);
+    optionOf(MessageFolder::Unread)->setChecked(true);
 
     Frame2 = named(new QGroupBox, u"Frame2"_s);
     Frame2->setAccessibleName(u"Filter"_s);
@@ -141,8 +147,8 @@ void frmMessageList::arrange()
     all->addLayout(line);
     all->addLayout(bottom);
 
-    const QList<QWidget*> order{Option1[Unread], Option1[Read], Option1[Sent], txtFilter, Command1, ListView1,
-                                txtFind,         cmdProcess,    cmdPrint,      cmdView,   Command6, cmdExit};
+    const QList<QWidget*> order{Option1[0], Option1[1], Option1[2], txtFilter, Command1, ListView1,
+                                txtFind,    cmdProcess, cmdPrint,   cmdView,   Command6, cmdExit};
     for (qsizetype i = 1; i < order.size(); ++i)
         setTabOrder(order[i - 1], order[i]);
     ListView1->setFocus();
@@ -158,8 +164,8 @@ void frmMessageList::connectControls()
     const auto on = [this](auto* sender, auto signal, const QString& event, auto routine) {
         desktop::onEvent(sender, signal, this, "frmMessageList."_L1 + event, routine);
     };
-    for (size_t i = 0; i < Option1.size(); ++i)
-        on(Option1[i], &QRadioButton::clicked, u"Option1_Click"_s, [this, i] { Option1_Click(static_cast<int>(i)); });
+    for (const MessageFolder folder : messageFolders)
+        on(optionOf(folder), &QRadioButton::clicked, u"Option1_Click"_s, [this, folder] { Option1_Click(folder); });
     on(ListView1->selectionModel(), &QItemSelectionModel::currentRowChanged, u"ListView1_ItemClick"_s,
        [this](const QModelIndex& current, const QModelIndex&) {
            if (current.isValid())

@@ -91,6 +91,32 @@ QString plainOrNone(const QString& name)
 
 }  // namespace
 
+QString wordOf(MessageFolder folder)
+{
+    switch (folder) {
+        case MessageFolder::Unread:
+            return u"unread"_s;
+        case MessageFolder::Read:
+            return u"read"_s;
+        case MessageFolder::Sent:
+            break;
+    }
+    return u"sent"_s;
+}
+
+QString pathOf(MessageFolder folder)
+{
+    switch (folder) {
+        case MessageFolder::Unread:
+            return gsUnreadPath;
+        case MessageFolder::Read:
+            return gsReadPath;
+        case MessageFolder::Sent:
+            break;
+    }
+    return gsSentPath;
+}
+
 bool isBareName(const QString& file)
 {
     return !file.isEmpty() && !file.contains(u'/') && !file.contains(u'\\');

@@ -7,6 +7,14 @@
 
 namespace kest {
 
+/// The folders whose messages can be listed.
+enum class MessageFolder { Unread, Read, Sent };
+inline constexpr MessageFolder messageFolders[] = {MessageFolder::Unread, MessageFolder::Read, MessageFolder::Sent};
+
+/// Returns "unread", "read" or "sent".
+QString wordOf(MessageFolder folder);
+QString pathOf(MessageFolder folder);
+
 /// Returns true if `file` is the name of a file without a folder. The transport chooses the name, so it may contain a
 /// path separator.
 bool isBareName(const QString& file);

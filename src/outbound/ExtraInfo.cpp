@@ -66,27 +66,27 @@ ExtraValues ExtraInfo::values() const
     const auto [month, year] = monthAndYearTyped(carRow.text(u"Year"_s));
 
     ExtraValues values;
-    values[Transmission] = transmissionToSend(carRow.text(u"XMISSION"_s));
-    values[VIN] = trimmed(carRow, "VIN");
-    values[Odometer] = trimmed(quoteRow, "kms");
-    values[Cylinders] = trimmed(carRow, "CYLINDERS");
-    values[BuildMonth] = month;
-    values[BuildYear] = year;
-    values[Colour] = carRow.text(u"COLOUR"_s);
+    values.transmission = transmissionToSend(carRow.text(u"XMISSION"_s));
+    values.vin = trimmed(carRow, "VIN");
+    values.odometer = trimmed(quoteRow, "kms");
+    values.cylinders = trimmed(carRow, "CYLINDERS");
+    values.buildMonth = month;
+    values.buildYear = year;
+    values.colour = carRow.text(u"COLOUR"_s);
     return values;
 }
 
 void ExtraInfo::save(const ExtraValues& values)
 {
-    if (!values[VIN].isEmpty())
-        carRow.set(u"VIN"_s, values[VIN]);
-    if (!values[Odometer].isEmpty())
-        quoteRow.set(u"kms"_s, values[Odometer]);
-    if (const QString cylinders = digitsOf(values[Cylinders]); !cylinders.isEmpty())
+    if (!values.vin.isEmpty())
+        carRow.set(u"VIN"_s, values.vin);
+    if (!values.odometer.isEmpty())
+        quoteRow.set(u"kms"_s, values.odometer);
+    if (const QString cylinders = digitsOf(values.cylinders); !cylinders.isEmpty())
         carRow.set(u"CYLINDERS"_s, cylinders);
-    carRow.set(u"XMission"_s, values[Transmission] == "Automatic"_L1 ? u"Automatic"_s : u"Manual"_s);
-    carRow.set(u"Year"_s, QString(values[BuildMonth] + u'/' + values[BuildYear]));
-    carRow.set(u"COLOUR"_s, values[Colour]);
+    carRow.set(u"XMission"_s, values.transmission == "Automatic"_L1 ? u"Automatic"_s : u"Manual"_s);
+    carRow.set(u"Year"_s, QString(values.buildMonth + u'/' + values.buildYear));
+    carRow.set(u"COLOUR"_s, values.colour);
     carRow.update();
     quoteRow.update();
 }

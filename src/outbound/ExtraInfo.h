@@ -6,25 +6,22 @@
 
 #include <QString>
 
-#include <array>
 #include <variant>
 
 namespace kest {
 
-/// Indexes into ExtraValues.
-enum ExtraValue : size_t {
-    Transmission,  // "Automatic" or "Manual"
-    VIN,
-    Odometer,
-    Cylinders,
-    Fuel,  // percent
-    DamageDesc,
-    OldDamageDesc,
-    BuildMonth,
-    BuildYear,
-    Colour,
+struct ExtraValues {
+    QString transmission;  // "Automatic" or "Manual"
+    QString vin;
+    QString odometer;
+    QString cylinders;
+    QString fuel;  // percent
+    QString damage;
+    QString oldDamage;
+    QString buildMonth;
+    QString buildYear;
+    QString colour;
 };
-using ExtraValues = std::array<QString, 10>;
 
 /// The values, or a message that says which record is missing.
 using ExtraInfoResult = std::variant<ExtraValues, QString>;

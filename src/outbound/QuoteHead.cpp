@@ -43,16 +43,16 @@ ExtraValues vehicleValues(const QuoteRows& rows, const std::optional<ExtraValues
     if (extra)
         values = *extra;
     else
-        std::tie(values[BuildMonth], values[BuildYear]) = monthAndYearWritten(text(car, "YEAR"));
+        std::tie(values.buildMonth, values.buildYear) = monthAndYearWritten(text(car, "YEAR"));
     const QVariant asked = rows.quote.value(u"ExtraInfo"_s);
     if (asked.isNull() || isTrue(asked))  // Null is treated like true
         return values;
 
-    values[Transmission] = transmissionToSend(text(car, "XMISSION"));
-    values[Cylinders] = QString(text(car, "ENG_SIZE") + u' ' + text(car, "CYLINDERS")).trimmed();
-    values[VIN] = trimmed(car, "VIN");
-    values[Odometer] = trimmed(rows.quote, "kms");
-    values[Colour] = text(car, "COLOUR");
+    values.transmission = transmissionToSend(text(car, "XMISSION"));
+    values.cylinders = QString(text(car, "ENG_SIZE") + u' ' + text(car, "CYLINDERS")).trimmed();
+    values.vin = trimmed(car, "VIN");
+    values.odometer = trimmed(rows.quote, "kms");
+    values.colour = text(car, "COLOUR");
     return values;
 }
 
@@ -60,21 +60,21 @@ void addVehicle(const Branch& request, const QuoteRows& rows, const std::optiona
 {
     const ExtraValues values = vehicleValues(rows, extra);
     const bool asked = isTrue(rows.quote.value(u"ExtraInfo"_s));
-    const QString oldDamage = asked && values[OldDamageDesc].isEmpty() ? u"None"_s : values[OldDamageDesc];
+    const QString oldDamage = asked && values.oldDamage.isEmpty() ? u"None"_s : values.oldDamage;
 
     const Leaves leaves = {
         filled("make", trimmed(rows.model, "MAKE")),
-        filled("yearOfManufacture", values[BuildYear]),
-        filled("monthOfManufacture", values[BuildMonth]),
+        filled("yearOfManufacture", values.buildYear),
+        filled("monthOfManufacture", values.buildMonth),
         filled("bodyShape", trimmed(rows.body, "body_desc2")),
-        filled("transmissionType", values[Transmission]),
-        filled("numberOfCylinders", values[Cylinders]),
-        filled("vinChassis", values[VIN]),
-        filled("color", codeOfColour(values[Colour])),
+        filled("transmissionType", values.transmission),
+        filled("numberOfCylinders", values.cylinders),
+        filled("vinChassis", values.vin),
+        filled("color", codeOfColour(values.colour)),
         filled("paintType", codeOfPaintGroup(text(rows.car, "PAINT_GP"))),
-        filled("odometer", values[Odometer]),
-        filled("fuelLevel", values[Fuel]),
-        filled("damageDescription", values[DamageDesc]),
+        filled("odometer", values.odometer),
+        filled("fuelLevel", values.fuel),
+        filled("damageDescription", values.damage),
         filled("oldDamageDescription", oldDamage),
     };
     if (std::ranges::any_of(leaves, &Leaf::present))

@@ -157,28 +157,30 @@ void frmExtraInfo::fillColours()
 void frmExtraInfo::fill(const ExtraInfo& info)
 {
     const ExtraValues found = info.values();
-    cmbTransmission->setCurrentText(found[Transmission]);
-    txtBuildMonth->setText(found[BuildMonth]);
-    txtBuildYear->setText(found[BuildYear]);
-    txtVIN->setText(found[VIN]);
-    txtOdometer->setText(found[Odometer]);
-    txtCylinders->setText(found[Cylinders]);
-    txtColour->setText(found[Colour]);
-    acceptedColour = found[Colour];
+    cmbTransmission->setCurrentText(found.transmission);
+    txtBuildMonth->setText(found.buildMonth);
+    txtBuildYear->setText(found.buildYear);
+    txtVIN->setText(found.vin);
+    txtOdometer->setText(found.odometer);
+    txtCylinders->setText(found.cylinders);
+    txtColour->setText(found.colour);
+    acceptedColour = found.colour;
 }
 
 ExtraValues frmExtraInfo::values() const
 {
-    return {cmbTransmission->currentText(),
-            txtVIN->text(),
-            txtOdometer->text(),
-            txtCylinders->text(),
-            txtFuel->text(),
-            txtDamageDesc->text(),
-            txtOldDamageDesc->text(),
-            txtBuildMonth->text(),
-            txtBuildYear->text(),
-            txtColour->text()};
+    return {
+        .transmission = cmbTransmission->currentText(),
+        .vin = txtVIN->text(),
+        .odometer = txtOdometer->text(),
+        .cylinders = txtCylinders->text(),
+        .fuel = txtFuel->text(),
+        .damage = txtDamageDesc->text(),
+        .oldDamage = txtOldDamageDesc->text(),
+        .buildMonth = txtBuildMonth->text(),
+        .buildYear = txtBuildYear->text(),
+        .colour = txtColour->text(),
+    };
 }
 
 void frmExtraInfo::closeEvent(QCloseEvent* event)

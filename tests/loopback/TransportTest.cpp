@@ -43,7 +43,7 @@ protected:
         EXPECT_EQ(carry.faults, QStringList());
         QStringList all;
         for (const app::Carried& file : carry.carried)
-            all << (file.direction == app::Carried::Out ? u"out "_s : u"in "_s) + file.file;
+            all << (file.direction == app::Carried::Direction::Out ? u"out "_s : u"in "_s) + file.file;
         return all.join(u", "_s).toStdString();
     }
     std::string faults() { return transport->carry(today).faults.join(u'\n').toStdString(); }

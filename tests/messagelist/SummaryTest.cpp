@@ -10,7 +10,7 @@ namespace {
 class MessageList : public Shop {
 protected:
     /// Returns the rows of a fill, one on each line: "file: type|rego|claim|customer|quote|vehicle".
-    std::string filled(int folder = Unread)
+    std::string filled(MessageFolder folder = MessageFolder::Unread)
     {
         QStringList lines;
         for (const ListedMessage& message : BuildMessageList(folder, FillHooks()))
@@ -27,7 +27,10 @@ protected:
         return line.substr(std::min(line.size(), QString(name).toStdString().size() + 2));
     }
 
-    static std::string listedFiles(int folder = Unread) { return listed(folder).join(u' ').toStdString(); }
+    static std::string listedFiles(MessageFolder folder = MessageFolder::Unread)
+    {
+        return listed(folder).join(u' ').toStdString();
+    }
 };
 
 TEST_F(MessageList, AMessageShowsWhatItSaysAndTheCustomerOfItsCar)
@@ -89,7 +92,7 @@ TEST_F(MessageList, ASentQuoteShowsItsDocument)
 {
     const auto sent = [&](const Text& document) {
         files::write(gsSentPath + u"a.xml"_s, document);
-        return filled(Sent);
+        return filled(MessageFolder::Sent);
     };
     const Text document = sentDocument("500/2");
     EXPECT_EQ(sent(document), "a.xml: Sent Quote|ABC123||Ms Kim Holloway|500/2|CORELLA MERIDIAN GL");
@@ -161,7 +164,7 @@ TEST_F(MessageList, ARequestWaitsUnreadForAllItsPictures)
     EXPECT_EQ(shown(), "");
 
     files::write(gsReadPath + u"in.xml"_s, quoteRequest("QR1").images({"7"}).text());
-    EXPECT_EQ(listedFiles(Read), "in.xml");
+    EXPECT_EQ(listedFiles(MessageFolder::Read), "in.xml");
 }
 
 TEST_F(MessageList, OneMessageOfARequestIsShownAtATime)
@@ -182,7 +185,7 @@ TEST_F(MessageList, OneMessageOfARequestIsShownAtATime)
 
     for (const QString& name : filesIn(gsUnreadPath))
         files::move(gsUnreadPath + name, gsReadPath + name);
-    EXPECT_EQ(listedFiles(Read), "C.xml d.xml e.xml m.xml n.xml");
+    EXPECT_EQ(listedFiles(MessageFolder::Read), "C.xml d.xml e.xml m.xml n.xml");
 }
 
 }  // namespace

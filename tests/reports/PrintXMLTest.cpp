@@ -108,7 +108,7 @@ TEST_F(Printing, TheListWindowReprintsItsReadMessages)
     files::write(gsReadPath + u"a.xml"_s, authorisedQuote("500").part(1, "D").text());
     frmMessageList window;
     window.open();
-    window.chooseFolder(Read);
+    window.chooseFolder(MessageFolder::Read);
     EXPECT_TRUE(window.reprintFile(u"a.xml"_s));
     EXPECT_EQ(cells(onlyWindow(), 0, "action"), "N") << "the deleted line is left out";
 }

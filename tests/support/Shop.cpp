@@ -115,7 +115,7 @@ bool loadAsTheWindow(const QString& fileName)
     return taken;
 }
 
-QStringList listed(int folder)
+QStringList listed(MessageFolder folder)
 {
     QStringList names;
     for (const ListedMessage& message : BuildMessageList(folder, {LoadSubmissionResponse, {}, {}}))

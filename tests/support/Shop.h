@@ -2,9 +2,9 @@
 // that read and change them.
 #pragma once
 
+#include "base/SharedVariables.h"
 #include "messagelist/Summary.h"
 #include "platform/files/files.h"
-#include "base/SharedVariables.h"
 #include "shell/eKEST.h"
 #include "support/Cases.h"
 #include "support/Messages.h"
@@ -41,7 +41,7 @@ bool load(const Text& message, const Text& fileName = "message.xml");
 bool loadAsTheWindow(const QString& fileName);
 
 /// Returns the files that a fill lists. The fill also applies answers to sent quotes.
-QStringList listed(int folder = Unread);
+QStringList listed(MessageFolder folder = MessageFolder::Unread);
 
 class Shop : public ::testing::Test {
 protected:
