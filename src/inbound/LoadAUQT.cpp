@@ -160,8 +160,8 @@ void showResults(const db::Recordset& quote, std::optional<db::Recordset>& compa
 
 bool authorise(QString& text)
 {
-    const xml::Document message = parsedMessage(text);
-    const Authorisation told(message);
+    const SharedMessage message = sharedMessage(text);
+    const Authorisation told(*message);
     QuoteKey key = QuoteKey::fromReference(told.reference);
 
     Quote found = findQuote(told, key);
@@ -186,7 +186,7 @@ bool authorise(QString& text)
         notes.addNew();
 
     // before the lines change, because it compares with the lines as they are now
-    std::optional<db::Recordset> comparison = BuildAuthReport(message, key.number, key.subquote, false);
+    std::optional<db::Recordset> comparison = BuildAuthReport(*message, key.number, key.subquote, false);
     if (key.isMain())
         takeOverMoney(told, key);
     quote.requery();
@@ -196,7 +196,7 @@ bool authorise(QString& text)
     applyTransition(quoteAuthorised, quote, notes);
     quote.update();
 
-    if (!LoadQuoteBody(quote, lines, message))
+    if (!LoadQuoteBody(quote, lines, *message))
         return refusePlainly(u"Error processing Quote Items, Please contact MarlinDesk Support."_s);
     setColumns(notes, {{"QTNNO"_L1, quote.value(u"QTNNO"_s)}, {"Subquote"_L1, quote.value(u"Subquote"_s)}});
     notes.update();

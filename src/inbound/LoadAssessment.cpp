@@ -41,10 +41,10 @@ const Transition& backOutOf(Quote& quote)
 
 bool LoadADQT(QString& text, const QString& fileName)
 {
-    const xml::Document message = parsedMessage(text);
+    const SharedMessage message = sharedMessage(text);
     const QuoteKey key = QuoteKey::fromReference(
-        message.textOf(u"//rootns:getAdjustedQuoteResponse/rootns:quoteBody/rootns:quoteReference"_s));
-    const QString request = message.textOf(u"//rootns:quoteRequestNumber"_s);
+        message->textOf(u"//rootns:getAdjustedQuoteResponse/rootns:quoteBody/rootns:quoteReference"_s));
+    const QString request = message->textOf(u"//rootns:quoteRequestNumber"_s);
 
     db::Recordset header = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}' AND KESTQRNo='{}'",
                                       key.number, key.subquote, request));
@@ -67,15 +67,15 @@ bool LoadADQT(QString& text, const QString& fileName)
 
 bool LoadARES(QString& text, const QString&)
 {
-    const xml::Document message = parsedMessage(text);
-    const QString number = message.textOf(u"//rootns:getAssmntResultResponse/rootns:kestOriginalQuoteNumber"_s);
+    const SharedMessage message = sharedMessage(text);
+    const QString number = message->textOf(u"//rootns:getAssmntResultResponse/rootns:kestOriginalQuoteNumber"_s);
     db::Recordset header = opened(sql("SELECT * FROM QUOTE1 WHERE KESTQuoteNo='{}' ORDER BY rec_id DESC", number));
     if (isUnknown(number, header))
         return refuseRequestNumber();
     header.moveLast();  // the oldest quote with that number
     Quote quote(std::move(header));
 
-    const QString code = message.textOf(u"//rootns:getAssmntResultResponse/rootns:reasonCode"_s).toUpper();
+    const QString code = message->textOf(u"//rootns:getAssmntResultResponse/rootns:reasonCode"_s).toUpper();
     const Transition& lost = code == u"TLSS"_s ? totalLoss : tenderFailed;
     applyTransition(quote.isSupplementary() ? supplementaryRejected : lost, quote,
                     reasonOfCode(code).value_or(u"Unknown Reason Code - "_s + code));
@@ -86,8 +86,8 @@ bool LoadARES(QString& text, const QString&)
 
 bool LoadBACA(QString& text, const QString& fileName)
 {
-    const xml::Document message = parsedMessage(text);
-    const QString request = message.textOf(u"//rootns:getBackoutAssmntResponse/rootns:kestQuoteRequestNumber"_s);
+    const SharedMessage message = sharedMessage(text);
+    const QString request = message->textOf(u"//rootns:getBackoutAssmntResponse/rootns:kestQuoteRequestNumber"_s);
     // the first is the newest quote of the request
     Quote quote(opened(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request)));
     if (isUnknown(request, quote.header()))
@@ -103,8 +103,8 @@ bool LoadBACA(QString& text, const QString& fileName)
 void LoadSubmissionResponse(QString& text, const QString& fileName)
 {
     Quote quote(QuoteKey::fromResponseName(fileName));
-    const xml::Document message = parsedMessage(text);
-    const xml::Node root = message.documentElement();
+    const SharedMessage message = sharedMessage(text);
+    const xml::Node root = message->documentElement();
     quote.header().set(u"KESTQuoteNo"_s, root.textOf(u"rootns:kestQuoteNumber"_s));
     if (root.textOf(u"rootns:quoteSubmissionStatus"_s) == u"Submitted"_s)
         applyTransition(quoteSubmitted, quote);

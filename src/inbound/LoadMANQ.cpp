@@ -168,14 +168,14 @@ bool refuseLines()
 
 bool LoadMANQ(QString& text, const QString& fileName)
 {
-    const xml::Document message = parsedMessage(text);
+    const SharedMessage message = sharedMessage(text);
     const db::Recordset cinfo = opened(u"SELECT * FROM CINFO"_s);
     db::Recordset colours = opened(u"SELECT * FROM KESTColours"_s);
     const db::Recordset insurer = opened(u"SELECT * FROM INSURER WHERE KEST=1"_s);
     if (insurer.eof())
         return refuse(u"Error locating a valid insurer, Please contact MarlinDesk Support."_s);
 
-    const ManualQuote manual(message);
+    const ManualQuote manual(*message);
     const std::optional<QuoteKey> key =
         manual.isSupplementary ? matchSupplementary(manual, cinfo) : matchMain(manual, cinfo);
     if (!key)
@@ -207,7 +207,7 @@ bool LoadMANQ(QString& text, const QString& fileName)
     car.set(u"REGO"_s, manual.rego);
 
     // After this, a failure leaves the quote without lines until the message is loaded again.
-    if (!checkQuoteBody(message))
+    if (!checkQuoteBody(*message))
         return refuseLines();
     while (!lines.eof())
         lines.remove();
@@ -219,7 +219,7 @@ bool LoadMANQ(QString& text, const QString& fileName)
                                u"Another workstation has meanwhile created quote %1."_s.arg(key->fullReference()));
         quote.update();
     }
-    if (!LoadQuoteBody(quote, lines, message))
+    if (!LoadQuoteBody(quote, lines, *message))
         return refuseLines();
     CalcQuoteTotals(quote, lines);
     quote.update();

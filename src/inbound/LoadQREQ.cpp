@@ -237,7 +237,7 @@ void takePhotographs(const xml::Node& root, const QString& requestNumber, const 
 
 bool LoadQREQ(QString& text, const QString& fileName)
 {
-    const xml::Document message = parsedMessage(text);
+    const SharedMessage message = sharedMessage(text);
 
     db::Recordset cinfo = opened(u"SELECT * FROM CINFO"_s);
     db::Recordset insurer = opened(u"SELECT * FROM INSURER WHERE KEST=1 or name='KEST Universal Insurer'"_s);
@@ -251,7 +251,7 @@ bool LoadQREQ(QString& text, const QString& fileName)
     const QString quoteNumber = NextQuoteNumber({}, cinfo, quote, false);
     db::Recordset notes = opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}'", quoteNumber));
     Request request;
-    request.readKey(message);
+    request.readKey(*message);
     db::Recordset car = opened(sql("SELECT * FROM CAR WHERE REGO='{}'", request.rego));
     const db::Recordset model = opened(u"SELECT * FROM MODEL WHERE MODEL_ID1='Z000'"_s);
     db::Recordset colours = opened(u"SELECT * FROM KESTColours"_s);
@@ -262,7 +262,7 @@ bool LoadQREQ(QString& text, const QString& fileName)
         newQuotes.reset();  // a box may stay open for hours
         return refuse(u"Quote Request already exists as quote number "_s + known.text(u"QTNNO"_s) + u'!');
     }
-    request.readRest(message);
+    request.readRest(*message);
 
     const bool carFound = !car.eof();
     if (carFound) {
@@ -298,7 +298,7 @@ bool LoadQREQ(QString& text, const QString& fileName)
     notes.update();
 
     PrintXML(fileName, false);
-    takePhotographs(message.documentElement(), request.number, quoteNumber);
+    takePhotographs(message->documentElement(), request.number, quoteNumber);
 
     newQuotes = lockNewQuotes();
     cinfo.requery();

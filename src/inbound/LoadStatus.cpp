@@ -65,17 +65,17 @@ void deleteQuoteRows(const QuoteKey& key)
 
 bool LoadQMQR(QString& text, const QString& fileName)
 {
-    const xml::Document message = parsedMessage(text);
-    Quote quote(QuoteKey::fromReference(message.textOf(quoteReference)));
+    const SharedMessage message = sharedMessage(text);
+    Quote quote(QuoteKey::fromReference(message->textOf(quoteReference)));
     if (!quote.exists())
         return refuse(noSuchQuote);
 
     setColumns(quote.header(),
                {
-                   {"KESTQuoteNo"_L1, message.textOf(u"//rootns:getQuoteResponse/rootns:kestQuoteNumber"_s)},
-                   {"KESTQRNo"_L1, message.textOf(u"//rootns:getQuoteResponse/rootns:quoteRequestNumber"_s)},
+                   {"KESTQuoteNo"_L1, message->textOf(u"//rootns:getQuoteResponse/rootns:kestQuoteNumber"_s)},
+                   {"KESTQRNo"_L1, message->textOf(u"//rootns:getQuoteResponse/rootns:quoteRequestNumber"_s)},
                    {"KESTQRVer"_L1, 1},
-                   {"Claim"_L1, message.textOf(u"//rootns:getQuoteResponse/rootns:claimNumber"_s)},
+                   {"Claim"_L1, message->textOf(u"//rootns:getQuoteResponse/rootns:claimNumber"_s)},
                    {"ExtraInfo"_L1, true},
                });
     applyTransition(quoteMatched, quote);
@@ -87,8 +87,8 @@ bool LoadQMQR(QString& text, const QString& fileName)
 
 bool LoadEWAP(QString& text, const QString& fileName)
 {
-    const xml::Document message = parsedMessage(text);
-    const QString reference = message.textOf(quoteReference);
+    const SharedMessage message = sharedMessage(text);
+    const QString reference = message->textOf(quoteReference);
     Quote quote(QuoteKey::fromReference(reference));
     if (!quote.exists())
         return refuse(noSuchQuote);
@@ -107,13 +107,13 @@ bool LoadEWAP(QString& text, const QString& fileName)
 
 bool LoadQTDL(QString& text, const QString&)
 {
-    const xml::Document message = parsedMessage(text);
-    const QString networkNumber = message.textOf(u"//rootns:getQuoteDeletionResponse/rootns:kestQuoteNumber"_s);
+    const SharedMessage message = sharedMessage(text);
+    const QString networkNumber = message->textOf(u"//rootns:getQuoteDeletionResponse/rootns:kestQuoteNumber"_s);
     Quote quote(opened(sql("SELECT * FROM QUOTE1 WHERE KESTQuoteNo='{}'", networkNumber)));
     if (isUnknown(networkNumber, quote.header()))
         return refuse(noSuchQuoteNumber);
 
-    const QString reason = message.textOf(u"//rootns:getQuoteDeletionResponse/rootns:reason"_s);
+    const QString reason = message->textOf(u"//rootns:getQuoteDeletionResponse/rootns:reason"_s);
     gsDeletedQTNNO = quote.key().number;  // the file's new name needs it after the quote may have been deleted
     gsDeletedSubquote = quote.key().subquote;
 
@@ -137,15 +137,15 @@ bool LoadQTDL(QString& text, const QString&)
 
 bool LoadRRQT(QString& text, const QString&)
 {
-    const xml::Document message = parsedMessage(text);
-    const QString request = message.textOf(u"//rootns:getReqForRevQteResponse/rootns:quoteRequestNumber"_s);
+    const SharedMessage message = sharedMessage(text);
+    const QString request = message->textOf(u"//rootns:getReqForRevQteResponse/rootns:quoteRequestNumber"_s);
     Quote quote(opened(sql("SELECT TOP 1 * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request)));
     if (isUnknown(request, quote.header()))
         return refuse(noSuchRequest);
 
-    const QString comments = message.textOf(u"//rootns:getReqForRevQteResponse/rootns:comments"_s);
+    const QString comments = message->textOf(u"//rootns:getReqForRevQteResponse/rootns:comments"_s);
     quote.header().set(u"KESTQRVer"_s,
-                       message.textOf(u"//rootns:getReqForRevQteResponse/rootns:quoteRequestVersionNumber"_s));
+                       message->textOf(u"//rootns:getReqForRevQteResponse/rootns:quoteRequestVersionNumber"_s));
     applyTransition(revisionRequested, quote, comments);
     quote.header().update();
     quote.notes().update();
@@ -157,13 +157,13 @@ bool LoadRRQT(QString& text, const QString&)
 
 bool LoadQRCN(QString& text, const QString&)
 {
-    const xml::Document message = parsedMessage(text);
-    const QString request = message.textOf(u"//rootns:getQRCancellationResponse/rootns:quoteRequestNumber"_s);
+    const SharedMessage message = sharedMessage(text);
+    const QString request = message->textOf(u"//rootns:getQRCancellationResponse/rootns:quoteRequestNumber"_s);
     Quote quote = oldestOfRequest(request);
     if (isUnknown(request, quote.header()))
         return refuse(noSuchRequest);
 
-    const QString reason = message.textOf(u"//rootns:getQRCancellationResponse/rootns:qrCancellationReason"_s);
+    const QString reason = message->textOf(u"//rootns:getQRCancellationResponse/rootns:qrCancellationReason"_s);
     applyTransition(requestCancelled, quote, reason);
     quote.notes().update();
     quote.header().update();
@@ -172,8 +172,8 @@ bool LoadQRCN(QString& text, const QString&)
 
 bool LoadBCQR(QString& text, const QString&)
 {
-    const xml::Document message = parsedMessage(text);
-    const QString request = message.textOf(u"//rootns:getBackoutCancelledQRResponse/rootns:kestQuoteRequestNumber"_s);
+    const SharedMessage message = sharedMessage(text);
+    const QString request = message->textOf(u"//rootns:getBackoutCancelledQRResponse/rootns:kestQuoteRequestNumber"_s);
     Quote quote = oldestOfRequest(request);
     if (isUnknown(request, quote.header()))
         return refuse(noSuchRequest);

@@ -12,8 +12,6 @@
 
 #include <QStringList>
 
-#include <optional>
-
 namespace kest {
 
 using namespace Qt::StringLiterals;
@@ -96,10 +94,10 @@ void withdrawIfRequest(const QString& path, const QString& requestNumber)
 }
 
 /// Deletes unread quote requests that a manual quote has answered, so that they don't become a second quote.
-void withdrawWaitingRequests(const QString& requestNumber)
+void withdrawWaitingRequests(const QString& requestNumber, const QString& fileName)
 {
     for (const QString& name : files::list(gsUnreadPath)) {
-        if (!isBareName(name))
+        if (!isBareName(name) || name.compare(fileName, Qt::CaseInsensitive) == 0)
             continue;
         try {
             withdrawIfRequest(gsUnreadPath + name, requestNumber);
@@ -110,34 +108,27 @@ void withdrawWaitingRequests(const QString& requestNumber)
     }
 }
 
-/// Returns the type of a message that goes to a loader, in upper case; none after a report, or for a notice.
-std::optional<QString> typeToLoad(QString& text, const QString& fileName)
+bool load(QString& text, const QString& fileName)
 {
-    xml::Document message = parsedMessage(text);
-    if (message.parseError().errorCode == xml::BareAmpersand && escapeAmpersands(text))
-        message.loadXML(text);
-    if (message.parseError().errorCode != 0) {
-        reportParseError(message.parseError(), fileName);
-        return {};
+    SharedMessage message = sharedMessage(text);
+    if (message->parseError().errorCode == xml::BareAmpersand && escapeAmpersands(text))
+        message = sharedMessage(text);
+    if (message->parseError().errorCode != 0) {
+        reportParseError(message->parseError(), fileName);
+        return false;
     }
 
-    const xml::Node root = message.documentElement();
+    const xml::Node root = message->documentElement();
     if (isNotice(root)) {
         takeNotice(root, fileName);
-        return {};
+        return false;
     }
 
     const QString messageType = root.textOf(u"messageType"_s);
     if (messageType == u"MANQ"_s)
-        withdrawWaitingRequests(root.textOf(u"//rootns:getQuoteResponse/rootns:quoteRequestNumber"_s));
-    return messageType.toUpper();
-}
+        withdrawWaitingRequests(root.textOf(u"//rootns:getQuoteResponse/rootns:quoteRequestNumber"_s), fileName);
 
-bool load(QString& text, const QString& fileName)
-{
-    const std::optional<QString> name =
-        typeToLoad(text, fileName);  // its document is gone when the loader parses the text again
-    const MessageType* type = name ? findMessageType(*name) : nullptr;
+    const MessageType* type = findMessageType(messageType.toUpper());
     return type && loadAs(type->code, text, fileName);
 }
 
@@ -145,6 +136,7 @@ bool load(QString& text, const QString& fileName)
 
 bool LoadXML(QString& text, const QString& fileName)
 {
+    const KeptMessage kept;
     try {
         return load(text, fileName);
     } catch (const RuntimeError& error) {

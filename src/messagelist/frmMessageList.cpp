@@ -6,6 +6,7 @@
 #include "inbound/modLoadXML.h"
 #include "messagelist/MessageListModel.h"
 #include "messagelist/TakeIn.h"
+#include "messages/Envelope.h"
 #include "messages/Folders.h"
 #include "messages/MessageTypes.h"
 #include "platform/Prompt.h"
@@ -186,6 +187,7 @@ void frmMessageList::cmdProcess_Click()
 bool frmMessageList::load(const QString& file)
 {
     const QScopedValueRollback loading(busy, busy + 1);
+    const KeptMessage kept;
     try {
         EnsureConnection();
         const db::Lock alone(gConn, u"load "_s + file.toUpper());

@@ -12,6 +12,13 @@ constexpr QLatin1StringView networkDomain = "orla.example"_L1;  // every namespa
 constexpr QLatin1StringView schemaInstance = "xmlns:xsi=\"http://www.w3.org/2001/XMLSchema-instance\" "_L1;
 constexpr int repairsAllowed = 3;
 
+struct LastMessage {
+    QString text;
+    SharedMessage document;  // null before the first
+};
+LastMessage lastMessage;
+int keepers = 0;
+
 }  // namespace
 
 QString GetNamespaceURI()
@@ -122,6 +129,28 @@ xml::Document parsedMessage(QString& text)
     text = AddXsiDeclaration(std::move(text));
     document.loadXML(text);
     return document;
+}
+
+SharedMessage sharedMessage(QString& text)
+{
+    text = AddXsiDeclaration(text);
+    if (lastMessage.document && lastMessage.text == text)
+        return lastMessage.document;
+    const auto document = std::make_shared<const xml::Document>(parsedMessage(text));
+    if (keepers > 0)
+        lastMessage = {text, document};
+    return document;
+}
+
+KeptMessage::KeptMessage()
+{
+    ++keepers;
+}
+
+KeptMessage::~KeptMessage()
+{
+    if (--keepers == 0)
+        lastMessage = {};
 }
 
 }  // namespace kest

@@ -6,6 +6,8 @@
 #include <QMap>
 #include <QString>
 
+#include <memory>
+
 namespace kest {
 
 /// Returns the namespace of the elements of messages and of the outgoing quote document.
@@ -41,5 +43,19 @@ QString wrappedInRequest(const QString& text);
 bool parseWithRepairs(xml::Document& document, QString& text);
 /// Adds the schema-instance declaration to `text` and parses it. The caller must check `parseError` of the result.
 xml::Document parsedMessage(QString& text);
+
+/// A parsed message that several may read and nobody changes.
+using SharedMessage = std::shared_ptr<const xml::Document>;
+/// As parsedMessage(), but hands on the document of the last call if a KeptMessage lives and the text is the same.
+SharedMessage sharedMessage(QString& text);
+
+/// While one lives, the last document of sharedMessage() is kept: the steps of a load get the same text one after the
+/// other. It is not kept longer, because a message can hold documents of many megabytes.
+class KeptMessage {
+public:
+    KeptMessage();
+    ~KeptMessage();
+    Q_DISABLE_COPY_MOVE(KeptMessage)
+};
 
 }  // namespace kest

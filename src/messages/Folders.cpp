@@ -166,11 +166,11 @@ MessageQuoteKey GetMessageQuoteKey(QString text)
 {
     MessageQuoteKey key;
     attempt([&] {
-        const xml::Document message = parsedMessage(text);
-        const MessageType* type = findMessageType(message.textOf(u"messageType"_s).toUpper());
+        const SharedMessage message = sharedMessage(text);
+        const MessageType* type = findMessageType(message->textOf(u"messageType"_s).toUpper());
         if (!type)
             return;
-        key.quote = quoteKeyIn(message, *type);
+        key.quote = quoteKeyIn(*message, *type);
         key.isQuoteRequest = type->code == MessageCode::QREQ;
     });
     return key;

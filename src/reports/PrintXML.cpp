@@ -209,19 +209,19 @@ bool printAuthorised(const xml::Document& message, bool Reprint)
 bool print(const QString& fileName, bool Reprint)
 {
     QString text = files::read(gsListFolder + fileName);
-    const xml::Document message = parsedMessage(text);
-    const MessageType* type = findMessageType(message.documentElement().textOrEmptyOf(u"//*[name()='messageType']"_s));
+    const SharedMessage message = sharedMessage(text);
+    const MessageType* type = findMessageType(message->documentElement().textOrEmptyOf(u"//*[name()='messageType']"_s));
     if (!type)
         return true;
     switch (type->code) {
         case MessageCode::QREQ:
-            return printRequest(message);
+            return printRequest(*message);
         case MessageCode::ADQT:
-            return printAdjusted(message, Reprint);
+            return printAdjusted(*message, Reprint);
         case MessageCode::AUQT:
-            return printAuthorised(message, Reprint);
+            return printAuthorised(*message, Reprint);
         case MessageCode::ARES:
-            return printResult(message);
+            return printResult(*message);
         default:
             return true;  // it has no report
     }

@@ -1,0 +1,44 @@
+// A load parses its message once, however many of its steps ask for it.
+#include "messagelist/frmMessageList.h"
+#include "support/Shop.h"
+
+#include <dlfcn.h>
+
+namespace {
+
+int parses = 0;
+
+}  // namespace
+
+/// Stands in front of the parser's own function.
+extern "C" __attribute__((visibility("default"))) void* xmlCtxtReadMemory(void* parser, const char* text, int size,
+                                                                          const char* url, const char* encoding,
+                                                                          int options)
+{
+    using Read = void* (*)(void*, const char*, int, const char*, const char*, int);
+    static const auto read = reinterpret_cast<Read>(dlsym(RTLD_NEXT, "xmlCtxtReadMemory"));
+    ++parses;
+    return read(parser, text, size, url, encoding, options);
+}
+
+namespace kest::test {
+
+using namespace Qt::StringLiterals;
+using ParseCount = Shop;
+
+TEST_F(ParseCount, ALoadParsesItsMessageOnce)
+{
+    for (const char* told : {"QREQ quoteRequestNumber=QR9", "QMQR", "RRQT", "QRCN", "BCQR", "ADQT", "AUQT", "ARES",
+                             "BACA", "EWAP", "MANQ", "QTDL"}) {
+        quote("500").request("QR1").quoteNumber("KQ1").line(1).set("qty", 1.0);
+        arrive("m.xml", Message::told(told));
+        frmMessageList window;
+        window.open();
+        parses = 0;
+        EXPECT_TRUE(window.loadFile(u"m.xml"_s)) << told << shown();
+        EXPECT_EQ(parses, 1) << told;
+        EXPECT_EQ(filesIn(gsUnreadPath), QStringList()) << told;
+    }
+}
+
+}  // namespace kest::test
