@@ -7,9 +7,9 @@
 #include "platform/values.h"
 #include "setup/Profile.h"
 #include "shell/component.h"
-#include "support/Places.h"
 #include "support/Cases.h"
 #include "support/MariaDbServer.h"
+#include "support/Places.h"
 #include "support/Snapshot.h"
 #include "support/TestProfile.h"
 

@@ -42,7 +42,7 @@ TEST_F(AuthorisedQuotes, TheHeaderIsWritten)
         "KESTQRNo=QR7 KESTQuoteNo=KQ7 KESTAuthNo=KA1 Claim=8800 REGO=ABC123 assess=Whitby, Morgan Lee AuthDate=today "
         "targetdate=11/04/2008 INSURER_ID=1 RR_RATE=1 RA_RATE=1 paint_rate=1 QSENT=R excess_gst=1 RR_TOTAL=0 "
         "RA_TOTAL=0 PAINT_TOTAL=0 CONTACTID=0 override=0 rr_override=0 ra_override=0 paint_override=0 "
-        "quotechanged=True invoiced=False Job_stage=4 ReadOnly=True Type=OLD"));
+        "quotechanged=1 invoiced=0 Job_stage=4 ReadOnly=1 Type=OLD"));
     EXPECT_EQ(car("ABC123").number("KEST"), 1);
     EXPECT_EQ(quote("500").notes(), "(today : Authorised Quote) (01/02/2008 : Won Quote Request)");
 }

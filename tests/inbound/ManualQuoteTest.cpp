@@ -67,8 +67,8 @@ TEST_F(ManualQuotes, TheHeaderIsWrittenAndTheLinesReplaced)
         "KESTQRNo=QR9 KESTQuoteNo=KQ1 Claim=8800 REGO=ABC123 qtndate=today INSURER_ID=1 RR_RATE=1 RA_RATE=1 "
         "paint_rate=1 QSENT=R excess=0 contri=0 RR_TOTAL=100 RA_TOTAL=60 "
         "PAINT_TOTAL=150 TOTAL=310 PRTTOTAL=500 MISTOTAL=0 CONTACTID=0 NEWPC=25 SECONDPC=15 RECOREPC=16 AFTERPC=17 "
-        "assess= excess_gst=1 override=0 rr_override=0 ra_override=0 paint_override=0 quotechanged=True "
-        "invoiced=False Type=MTA ReadOnly=True ExtraInfo=True Job_stage=3 QUOTER=Pat Ferrier"));
+        "assess= excess_gst=1 override=0 rr_override=0 ra_override=0 paint_override=0 quotechanged=1 "
+        "invoiced=0 Type=MTA ReadOnly=1 ExtraInfo=1 Job_stage=3 QUOTER=Pat Ferrier"));
     EXPECT_TRUE(car("ABC123").shows("KEST=1 COLOUR=Silver"));
     EXPECT_EQ(quote("500").notes(), "(today : Manual Quote Loaded) (01/02/2008 : Responded Quote Request)");
 }

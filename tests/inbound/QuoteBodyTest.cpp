@@ -65,8 +65,7 @@ TEST_F(QuoteBody, ANewLineIsFilledAsItsSectionSays)
     EXPECT_TRUE(apply(message));
     number = 0;
     for (const auto& [kind, elements, columns] : cases)
-        EXPECT_TRUE(line(++number).shows(columns + u" blend=0 Tag=1 delitem=False tosend=A"_s))
-            << elements.toStdString();
+        EXPECT_TRUE(line(++number).shows(columns + u" blend=0 Tag=1 delitem=0 tosend=A"_s)) << elements.toStdString();
 }
 
 TEST_F(QuoteBody, TheIndicatorSaysWhatHappensToTheLine)
@@ -115,7 +114,7 @@ TEST_F(QuoteBody, AChangeKeepsWhatTheShopSet)
                   .part(2, "C", {{"partDescription", "L/H lamp"}, {"partQuantity", "0.00"}, {"partType", "AFTM"}})
                   .sublet(3, "C", {{"subletRepairer", "Nobody knows"}, {"subletDescription", "Glass"}})));
     EXPECT_TRUE(line(1).shows("category=OPG pthour=50 opg_rate=1 blend=2 allow_tick=3 itemno=153"));
-    EXPECT_TRUE(line(2).shows("script=L/H lamp SIDE=R qty=3 Report=True MARK=C"));
+    EXPECT_TRUE(line(2).shows("script=L/H lamp SIDE=R qty=3 Report=1 MARK=C"));
     EXPECT_TRUE(line(3).shows("script=Glass VENDOR=17 unitcost=44 Report_on=1"));
     EXPECT_EQ(rowCount("VENDOR", "NAME='Nobody knows'"), 0);
 }

@@ -29,8 +29,8 @@ TEST_F(Requests, ARequestBecomesANewQuoteWithCarAndCustomer)
 
     EXPECT_TRUE(quote("1001").shows(
         "Subquote=0 KESTQRVer=1 Claim=7700001 REGO=XYZ789 qtndate=today RR_RATE=38 RA_RATE=42 paint_rate=46 QSENT=R "
-        "excess=0 NEWPC=25 SECONDPC=15 RECOREPC=15 AFTERPC=20 excess_gst=1 TOTAL=0 kms=84200 quotechanged=True "
-        "invoiced=False Type=MTA ExtraInfo=True Job_stage=1 ReadOnly=- paint_override=0"));
+        "excess=0 NEWPC=25 SECONDPC=15 RECOREPC=15 AFTERPC=20 excess_gst=1 TOTAL=0 kms=84200 quotechanged=1 "
+        "invoiced=0 Type=MTA ExtraInfo=1 Job_stage=1 ReadOnly=- paint_override=0"));
     EXPECT_TRUE(car("XYZ789").shows(
         "KEST=1 MODEL_ID=Z000 BODY_ID=4 BODY_ID2=4S CYLINDERS=4 Year=07/2004 COLOUR=Blue VIN=6T1TESTVIN0000001 "
         "XMission=Automatic PAINT_GP=M1 CUST_ID=" +

@@ -22,7 +22,7 @@ TEST_F(StatusMessages, AMatchAndARevisionTakeOverWhatTheMessageSays)
 {
     quote("500").set("KESTQRVer", "7");
     EXPECT_TRUE(load(quoteMatch("500").request("QR8").claim("8800")));
-    EXPECT_TRUE(quote("500").shows("KESTQRNo=QR8 KESTQRVer=1 Claim=8800 ExtraInfo=True"));
+    EXPECT_TRUE(quote("500").shows("KESTQRNo=QR8 KESTQRVer=1 Claim=8800 ExtraInfo=1"));
     EXPECT_TRUE(load(revisionRequest("QR8").version("3")));
     EXPECT_EQ(quote("500").text("KESTQRVer"), "3");
 }

@@ -5,8 +5,8 @@
 #include "platform/database/FaultInjection.h"
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
-#include "support/Places.h"
 #include "support/MariaDbServer.h"
+#include "support/Places.h"
 #include "support/Shop.h"
 
 #include <QElapsedTimer>

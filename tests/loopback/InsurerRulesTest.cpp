@@ -1,8 +1,8 @@
 #include "loopback/InsurerRules.h"
 #include "platform/RuntimeError.h"
 #include "platform/files/files.h"
-#include "support/Places.h"
 #include "support/Cases.h"
+#include "support/Places.h"
 
 #include <gtest/gtest.h>
 

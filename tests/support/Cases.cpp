@@ -1,5 +1,6 @@
-#include "support/Places.h"
 #include "support/Cases.h"
+
+#include "support/Places.h"
 
 #include <QFile>
 #include <QJsonArray>

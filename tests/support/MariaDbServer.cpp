@@ -1,11 +1,11 @@
-#include "support/Places.h"
 #include "support/MariaDbServer.h"
 
 #include "platform/RuntimeError.h"
 #include "platform/database/Connection.h"
 #include "platform/database/Sql.h"
 #include "setup/QuoteDatabase.h"
-#include "support/ServerFolder.h"
+#include "support/MemoryFolder.h"
+#include "support/Places.h"
 
 #include <QDeadlineTimer>
 #include <QDir>
@@ -51,7 +51,7 @@ QString textFor(const QString& driver, int port, const QString& database, const 
 
 }  // namespace
 
-MariaDbServer::MariaDbServer() : folder(serverFolder(u"mariadb"_s))
+MariaDbServer::MariaDbServer() : folder(memoryFolder(u"mariadb"_s))
 {
     prepareData();
     start();
@@ -90,11 +90,10 @@ void MariaDbServer::start()
     free.close();
     server.setProcessChannelMode(QProcess::MergedChannels);
     server.setChildProcessModifier([] { prctl(PR_SET_PDEATHSIG, SIGKILL); });
-    server.start(
-        program(u"mariadbd"_s),
-        {u"--defaults-file="_s + checkoutFile(u"tests/data/mariadb.cnf"_s), u"--user="_s + thisUser(),
-         u"--datadir="_s + folder.filePath(u"data"_s), u"--port="_s + QString::number(tcpPort),
-         u"--socket="_s + folder.filePath(u"s.sock"_s), u"--pid-file="_s + folder.filePath(u"pid"_s)});
+    server.start(program(u"mariadbd"_s),
+                 {u"--defaults-file="_s + checkoutFile(u"tests/data/mariadb.cnf"_s), u"--user="_s + thisUser(),
+                  u"--datadir="_s + folder.filePath(u"data"_s), u"--port="_s + QString::number(tcpPort),
+                  u"--socket="_s + folder.filePath(u"s.sock"_s), u"--pid-file="_s + folder.filePath(u"pid"_s)});
     const QDeadlineTimer deadline(startMilliseconds);
     db::Connection connection;
     while (!attempt([&] { connection.open(textFor(u"MySQL"_s, tcpPort, u"mysql"_s, u"root"_s, {})); })) {

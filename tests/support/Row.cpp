@@ -5,6 +5,7 @@
 #include "platform/database/Sql.h"
 #include "platform/values.h"
 #include "support/Cases.h"
+#include "support/ShopDatabase.h"
 
 namespace kest::test {
 
@@ -17,9 +18,9 @@ QString withoutDate(QString text)
     return text.replace(shortDate(QDate::currentDate()), u"today"_s);
 }
 
-db::Recordset rowsOf(const QString& table, const QString& condition)
+QString selectOf(const QString& table, const QString& condition)
 {
-    return opened(u"SELECT * FROM %1 WHERE %2"_s.arg(table, condition));
+    return u"SELECT * FROM %1 WHERE %2"_s.arg(table, condition);
 }
 
 QString keyOf(const QString& number, int subquote)
@@ -29,32 +30,29 @@ QString keyOf(const QString& number, int subquote)
 
 }  // namespace
 
-bool Row::exists() const
+QSqlRecord Row::read() const
 {
-    return !rowsOf(table_, condition_).eof();
-}
-
-QVariant Row::value(const Text& column) const
-{
-    return rowsOf(table_, condition_).value(column);
+    const QList<QSqlRecord> rows = plainRows(selectOf(table_, condition_));
+    EXPECT_FALSE(rows.isEmpty()) << "no row of " << table_.toStdString() << ": " << condition_.toStdString();
+    return rows.value(0);
 }
 
 std::string Row::text(const Text& column) const
 {
-    return textOrEmpty(value(column)).toStdString();
+    return plainText(value(column)).toStdString();
 }
 
 double Row::number(const Text& column) const
 {
-    return toDouble(value(column));
+    return toDouble(plainText(value(column)));
 }
 
 ::testing::AssertionResult Row::shows(const Text& columns) const
 {
-    const db::Recordset row = rowsOf(table_, condition_);
+    const QSqlRecord row = read();
     QStringList others;
     for (const auto& [column, expected] : pairsIn(columns)) {
-        const QString found = row.isNull(column) ? u"-"_s : withoutDate(row.text(column));
+        const QString found = row.isNull(column) ? u"-"_s : withoutDate(plainText(row.value(column)));
         if (found != expected)
             others += column + u'=' + found;
     }
@@ -64,26 +62,20 @@ double Row::number(const Text& column) const
 
 Row& Row::set(const Text& column, const Value& value)
 {
-    db::Recordset row = rowsOf(table_, condition_);
+    db::Recordset row = opened(selectOf(table_, condition_));
     row.set(column, value);
     row.update();
     return *this;
 }
 
-int Row::id() const
-{
-    const db::Recordset row = rowsOf(table_, condition_);
-    return row.value(row.columns().first()).toInt();
-}
-
 int rowCount(const Text& table, const Text& condition)
 {
-    return rowsOf(table, condition).recordCount();
+    return int(plainRows(selectOf(table, condition)).size());
 }
 
 void addRow(const Text& table, std::initializer_list<std::pair<const char*, Value>> values)
 {
-    db::Recordset rows = rowsOf(table, u"1=0"_s);
+    db::Recordset rows = opened(selectOf(table, u"1=0"_s));
     rows.addNew();
     for (const auto& [column, value] : values)
         rows.set(QString::fromLatin1(column), value);
@@ -112,7 +104,7 @@ QuoteRow& QuoteRow::request(const Text& number, const Text& version)
 
 QuoteRow& QuoteRow::note(const Text& words, const Text& day)
 {
-    const QString chain = textOrEmpty(texts().value("remarks"));
+    const QString chain = plainText(texts().value("remarks"));
     return remarks(u"(%1 : %2) %3"_s.arg(QString(day), QString(words), chain).trimmed());
 }
 
@@ -122,14 +114,9 @@ QuoteRow& QuoteRow::remarks(const Text& text, const Text& column)
     return *this;
 }
 
-bool QuoteRow::locked() const
-{
-    return isTrue(value("ReadOnly"));
-}
-
 std::string QuoteRow::notes() const
 {
-    return withoutDate(textOrEmpty(texts().value("remarks"))).toStdString();
+    return withoutDate(plainText(texts().value("remarks"))).toStdString();
 }
 
 std::string QuoteRow::state() const

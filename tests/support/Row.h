@@ -1,7 +1,10 @@
-// A row of a table, for a test's builders and expectations. Reads and writes the database at once.
+// A row of a table, for a test's builders and expectations. Writes the database at once, and reads it through a plain
+// query.
 #pragma once
 
 #include "support/Text.h"
+
+#include <QSqlRecord>
 
 #include <gtest/gtest.h>
 
@@ -11,31 +14,33 @@
 
 namespace kest::test {
 
+/// Returns how many rows of `table` meet the condition.
+int rowCount(const Text& table, const Text& condition = "1=1");
+
 class Row {
 public:
     /// Refers to the first row that meets the condition. The row must exist when it is read or written.
     Row(const Text& table, const Text& condition) : table_(table), condition_(condition) {}
 
-    bool exists() const;
-    QVariant value(const Text& column) const;
-    /// Returns an empty text for Null.
+    bool exists() const { return rowCount(table_, condition_) > 0; }
+    QVariant value(const Text& column) const { return read().value(column); }
+    /// Returns the value as `plainText` does.
     std::string text(const Text& column) const;
     double number(const Text& column) const;
     bool isNull(const Text& column) const { return value(column).isNull(); }
     /// Returns the value of the first column.
-    int id() const;
+    int id() const { return read().value(0).toInt(); }
     /// Compares columns with a text such as "category=MIS script=Front bumper bar VENDOR=-". "-" is Null, and "today"
     /// is today's date.
     ::testing::AssertionResult shows(const Text& columns) const;
     Row& set(const Text& column, const Value& value);
 
 private:
+    QSqlRecord read() const;
+
     QString table_;
     QString condition_;
 };
-
-/// Returns how many rows of `table` meet the condition.
-int rowCount(const Text& table, const Text& condition = "1=1");
 
 void addRow(const Text& table, std::initializer_list<std::pair<const char*, Value>> values);
 
@@ -59,7 +64,7 @@ public:
     QuoteRow& remarks(const Text& text, const Text& column = "remarks");
 
     int stage() const { return int(number("Job_stage")); }
-    bool locked() const;
+    bool locked() const { return text("ReadOnly") == "1"; }
     /// Returns the note chain, with "today" for today's date.
     std::string notes() const;
     /// Returns stage, lock, network number and notes: "3 locked KQ1 (01/02/2008 : Responded Quote Request)".

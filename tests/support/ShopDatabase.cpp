@@ -5,14 +5,19 @@
 #include "base/modDBAccess.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
+#include "platform/values.h"
 #include "setup/QuoteDatabase.h"
 #include "support/MariaDbServer.h"
 #include "support/TdsServer.h"
 
 #include <QFile>
 #include <QRegularExpression>
+#include <QSqlDatabase>
+#include <QSqlQuery>
 
 #include <gtest/gtest.h>
+
+#include <array>
 
 namespace kest::test {
 
@@ -21,6 +26,7 @@ using namespace Qt::StringLiterals;
 namespace {
 
 const auto shopName = u"WirSql"_s;  // the default on every engine
+const auto plainName = u"plain"_s;
 
 void fillShop(db::Connection& database)
 {
@@ -82,6 +88,8 @@ public:
     ServerShop(QString name, QString ownNumber) : serverName(std::move(name)), connectionNumber(std::move(ownNumber)) {}
     virtual ~ServerShop() = default;
     virtual void copy(const QString& from, const QString& to) = 0;
+    /// Opens a connection that is not the component's.
+    virtual void open(QSqlDatabase& plain) const = 0;
 
     const QString serverName;        // as a setting
     const QString connectionNumber;  // a query for the server's number of a connection
@@ -119,6 +127,15 @@ public:
         }
     }
 
+    void open(QSqlDatabase& plain) const override
+    {
+        plain.setHostName(u"127.0.0.1"_s);
+        plain.setPort(mariaDb().port());
+        plain.setDatabaseName(shop);
+        EXPECT_TRUE(plain.open(mariaDb().user(), mariaDb().password()));
+        QSqlQuery(plain).exec(u"SET sql_mode='NO_BACKSLASH_ESCAPES'"_s);
+    }
+
 private:
     QMap<QString, bool> tables_;  // true if the table numbers its rows
 };
@@ -137,6 +154,12 @@ public:
     void copy(const QString& from, const QString& to) override
     {
         administrator->execute(u"EXEC standin_copy @from='%1', @to='%2'"_s.arg(from, to));
+    }
+
+    void open(QSqlDatabase& plain) const override
+    {
+        plain.setDatabaseName(tdsServer().connectionText(shop).chopped(1));
+        EXPECT_TRUE(plain.open());
     }
 };
 
@@ -158,6 +181,45 @@ void dropConnection()
             u"KILL "_s + opened(u"SELECT %1 AS id"_s.arg(serverShop().connectionNumber)).text(u"id"_s));
 }
 
+QList<QSqlRecord> plainRows(const QString& select)
+{
+    const bool isFile = engine() == Engine::Embedded;
+    if (!QSqlDatabase::contains(plainName))
+        QSqlDatabase::addDatabase(isFile                    ? u"QSQLITE"_s
+                                  : engine() == Engine::Tds ? u"QODBC"_s
+                                                            : u"QMYSQL"_s,
+                                  plainName);
+    QSqlDatabase database = QSqlDatabase::database(plainName, false);
+    if (isFile && database.databaseName() != app::embeddedFile(shopName)) {
+        database.close();
+        database.setDatabaseName(app::embeddedFile(shopName));
+        database.open();
+    } else if (!database.isOpen()) {
+        isFile ? void(database.open()) : serverShop().open(database);
+    }
+    QSqlQuery query(database);
+    EXPECT_TRUE(query.exec(select)) << select.toStdString();
+    QList<QSqlRecord> rows;
+    while (query.next())
+        rows.append(query.record());
+    return rows;
+}
+
+QString plainText(const QVariant& value)
+{
+    static const QRegularExpression date(u"^\\d{4}-\\d\\d-\\d\\d( \\d\\d:\\d\\d:\\d\\d(\\.\\d+)?)?$"_s);
+    if (value.isNull())
+        return {};
+    if (value.typeId() == QMetaType::Bool)
+        return QString::number(value.toInt());
+    if (value.typeId() == QMetaType::Double || value.typeId() == QMetaType::QDateTime)
+        return toText(value);
+    const QString text = value.toString();
+    if (text.size() == 1 && text[0] < u'\2')  // a flag's raw bit
+        return QString::number(text[0].unicode());
+    return date.match(text).hasMatch() ? toText(toDate(text)) : text;
+}
+
 void makeShopDatabase()
 {
     if (engine() == Engine::Embedded) {
@@ -172,13 +234,20 @@ void makeShopDatabase()
                 serverShop().serverName);
 }
 
+/// Closes the embedded database for all, so that the file contains all changes.
+static void closeFile()
+{
+    gConn->close();
+    QSqlDatabase::database(plainName, false).close();
+}
+
 SavedShopDatabase::SavedShopDatabase()
 {
     if (engine() != Engine::Embedded) {
         serverShop().copy(serverShop().shop, serverShop().saved);
         return;
     }
-    gConn->close();  // so that the file contains all changes
+    closeFile();
     file_ = files::readBytes(app::embeddedFile(shopName));
     EnsureConnection();
 }
@@ -189,7 +258,7 @@ void SavedShopDatabase::restore() const
         serverShop().copy(serverShop().saved, serverShop().shop);
         return;
     }
-    gConn->close();
+    closeFile();
     for (const char* suffix : {"-wal", "-shm"})
         QFile::remove(app::embeddedFile(shopName) + QString::fromLatin1(suffix));
     files::writeBytes(app::embeddedFile(shopName), file_);

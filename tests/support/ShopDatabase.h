@@ -2,11 +2,19 @@
 #pragma once
 
 #include <QByteArray>
+#include <QList>
+#include <QSqlRecord>
+#include <QString>
 
 namespace kest::test {
 
 /// Drops the component's connection, as a restart of the server would.
 void dropConnection();
+
+/// Runs a query on a connection that is not the component's.
+QList<QSqlRecord> plainRows(const QString& select);
+/// Returns the text of a value of such a row: a flag is 1 or 0, a date a short date, Null an empty text.
+QString plainText(const QVariant& value);
 
 /// Creates the database of a new shop, with one model for cars, where the settings of the profile expect it. For a
 /// server, only sets `ServerName`.

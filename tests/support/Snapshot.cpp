@@ -45,11 +45,11 @@ std::string holdings()
     for (const char* table : tables) {
         const QString name = QString::fromLatin1(table);
         QStringList ofTable;
-        for (db::Recordset rows = opened(u"SELECT * FROM "_s + name); !rows.eof(); rows.moveNext()) {
+        for (const QSqlRecord& row : plainRows(u"SELECT * FROM "_s + name)) {
             QStringList values{name};
-            for (const QString& column : rows.columns())
-                if (column != u"itemid"_s)  // a line that is stored again gets another one
-                    values += column + u'=' + (rows.isNull(column) ? u"Null"_s : rows.text(column));
+            for (int i = 0; i < row.count(); ++i)
+                if (row.fieldName(i) != u"itemid"_s)  // a line that is stored again gets another one
+                    values += row.fieldName(i) + u'=' + (row.isNull(i) ? u"Null"_s : plainText(row.value(i)));
             ofTable += values.join(u' ');
         }
         ofTable.sort();

@@ -1,10 +1,10 @@
-#include "support/Places.h"
 #include "support/TdsServer.h"
 
 #include "platform/database/Connection.h"
 #include "setup/QuoteDatabase.h"
+#include "support/MemoryFolder.h"
 #include "support/OdbcDrivers.h"
-#include "support/ServerFolder.h"
+#include "support/Places.h"
 
 #include <QDeadlineTimer>
 
@@ -27,7 +27,7 @@ constexpr int stopMilliseconds = 10000;
 
 }  // namespace
 
-TdsServer::TdsServer() : folder_(serverFolder(u"tds"_s))
+TdsServer::TdsServer() : folder_(memoryFolder(u"tds"_s))
 {
     QStringList arguments{u"-B"_s,       checkoutFile(u"tests/support/tds/standin.py"_s),
                           u"--folder"_s, folder_.path(),

@@ -2,8 +2,8 @@
 #pragma once
 
 #include "platform/profile.h"
+#include "support/MemoryFolder.h"
 
-#include <QDir>
 #include <QString>
 #include <QTemporaryDir>
 
@@ -32,7 +32,7 @@ public:
     QString driveC() const { return folder.path() + QStringLiteral("/drive_c"); }
 
 private:
-    QTemporaryDir folder;
+    QTemporaryDir folder{memoryFolder(QStringLiteral("profile"))};
 };
 
 }  // namespace kest::test

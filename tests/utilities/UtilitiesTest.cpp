@@ -114,8 +114,8 @@ TEST_F(Utilities, OnlySaveStoresWhatWasTypedAndItOpensTheHostsQuoteAnew)
     const std::string typed = set("txtQRNo", "QR9") + set("txtQRVer", "3") + set("txtQuoteNo", "KQ'9") +
                               set("txtAuthNo", "KA9") + set("txtAuthDate", "22/4/2009") + set("txtClaimNo", "ABC 123") +
                               R"({"click": "chkReadOnly"}, {"click": "chkExtraInfo"}, )";
-    const std::string before = "||||7700001|21/03/2008|False|False|";
-    const std::string after = "QR9|3|KQ'9|KA9|ABC 123|22/04/2009|True|True|";
+    const std::string before = "||||7700001|21/03/2008|0|0|";
+    const std::string after = "QR9|3|KQ'9|KA9|ABC 123|22/04/2009|1|1|";
     const char* const refusal = "Invalid Claim Number Entered";
     struct {
         std::string way, stored;
@@ -165,7 +165,7 @@ TEST_F(Utilities, AStatusButtonRewritesTickNumberAndNotes)
         "(Submitted KEST Quote) (Won Quote Request)"_s;
     for (const auto& [button, subquote, state, notes] : test::casesIn<4>("utilities-buttons.txt")) {
         auto row = quote("500", subquote.toInt());
-        row.quoteNumber("KQ1").authorised("KA1").stage(4).locked(state.startsWith(u"False"_s));
+        row.quoteNumber("KQ1").authorised("KA1").stage(4).locked(state.startsWith(u"0"_s));
         row.remarks(QString(whole).replace(u'(', u'(' + old));
         work("{\"click\": \"" + button.toStdString() + "\"}, " + save, subquote);
         EXPECT_EQ(QString::fromStdString(row.notes()).remove(old), notes) << button.toStdString() << subquote.toInt();

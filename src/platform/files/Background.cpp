@@ -14,7 +14,7 @@ namespace kest::files {
 
 namespace {
 
-/// Deletes files that another process may still have open. One thread serves all files.
+/// Takes files away that someone else may still hold, one thread for all of them.
 class Remover {
 public:
     void add(const QString& systemPath)
@@ -63,7 +63,7 @@ private:
     std::mutex mutex;
     std::condition_variable_any changed;
     QStringList waiting;
-    std::jthread worker;  // last member, so that it ends before the others are destroyed
+    std::jthread worker;  // last, so that it ends before what it uses
 };
 
 Remover& remover()

@@ -1,4 +1,4 @@
-// The system calls for files.h: open files, errors as RuntimeError, and atomic writes.
+// The calls of this system behind files.h: open files, their failures as RuntimeError, writes that appear whole.
 #pragma once
 
 #include <QByteArray>
@@ -9,24 +9,24 @@
 
 namespace kest::files {
 
-/// An open file. The destructor closes it.
+/// An open file that is closed with its owner.
 class SystemFile {
 public:
-    /// A new file gets this mode, reduced by the umask of the process.
+    /// A file that is made takes that mode, less what the process withholds from new files.
     SystemFile(const QString& path, int flags, unsigned mode = 0666);
     ~SystemFile();
     SystemFile(const SystemFile&) = delete;
     SystemFile& operator=(const SystemFile&) = delete;
 
     qint64 size() const;
-    /// Reads at most `most` bytes. Returns none at the end of the file.
+    /// The next bytes, at most so many; none at the end.
     QByteArray read(qsizetype most);
     void write(const QByteArray& bytes);
     void cutTo(qint64 size);
     void setMode(unsigned mode);
-    /// Locks a byte, which need not exist, until the file is closed. Returns false if another open file has locked it.
+    /// Locks one byte, there or not, until the file is closed. False while another open file has it locked.
     bool lockByte(qint64 at);
-    /// Waits until the bytes are on the disk and closes the file. Throws RuntimeError if this fails.
+    /// Waits until the bytes are on the disk and closes, so that no failure stays unseen.
     void commit();
 
 private:
@@ -34,16 +34,17 @@ private:
     int descriptor;
 };
 
-/// Returns a path for a system call. Throws PathNotFound if it contains a NUL.
+/// The bytes that a path takes in a call of this system; a path with a NUL in it is PathNotFound.
 QByteArray encodedPath(const QString& systemPath);
-/// Returns the text for a name in a folder. encodedPath() turns it back into the same bytes.
+/// A name as a folder of this system gives it; `encodedPath` makes the same bytes of it.
 QString decodedName(const char* name);
 
-/// Throws the RuntimeError for the `errno` of the last call.
+/// Throws what the last call's `errno` means for this path.
 [[noreturn]] void throwSystemError(const QString& systemPath);
 [[noreturn]] void throwFileError(int number, const QString& systemPath);
 
-/// Throw if the file may not be read, changed or replaced. The permission bits count even for root.
+/// Throws where the file may not be read, changed or replaced. The permission bits count even for a user whom this
+/// system refuses nothing.
 void checkReadable(const QString& systemPath);
 void checkWritable(const QString& systemPath);
 void checkFolderWritable(const QString& systemPath);
@@ -51,24 +52,24 @@ void checkFolderWritable(const QString& systemPath);
 bool isFile(const QString& systemPath);
 bool isFolder(const QString& systemPath);
 
-/// Lets `fill` write a temporary file and renames it to `target`. `spelled` is the path in the spelling of the caller.
-/// Without a mode, the file keeps the mode of the one that it replaces.
+/// Puts a file in place that `fill` has written under a temporary name. `spelled` is its path as it was asked for.
+/// Without a mode it keeps that of the file before.
 void replaceFile(const QString& target, const QString& spelled, const std::function<void(SystemFile&)>& fill,
                  std::optional<unsigned> mode = {});
 bool sameVolume(const QString& from, const QString& to);
 void renameFile(const QString& from, const QString& to);
 void removeFile(const QString& systemPath);
 
-/// Returns the seconds since the last write, or 0 if the file does not exist.
+/// Seconds since the last write; 0 for a file that is not there.
 qint64 ageOf(const QString& systemPath);
 
-/// Returns true for the temporary names of replaceFile().
+/// True for the temporary names of `replaceFile`.
 bool isTemporaryName(const QString& name);
 
-/// Returns the path on this system with the last name in the spelling of the caller, even if it exists in another case.
+/// The path on this system with the last element as it was asked for, even where a variant in another case exists.
 QString spelledPath(const QString& path);
 
-/// Throws if a test has requested that this operation fails.
+/// Throws when a test wants this operation to fail.
 void failOnRequest(const QString& path);
 
 }  // namespace kest::files

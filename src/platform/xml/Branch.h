@@ -1,4 +1,4 @@
-// Builds the elements of outgoing documents from lists.
+// Builds the element tree of an outgoing document: an element list is a list of elements.
 #pragma once
 
 #include "platform/xml/xml.h"
@@ -9,7 +9,7 @@
 
 namespace kest {
 
-/// An element of a list: its name, whether it is present, and its text.
+/// One row of an element list: an element, whether it is there, and its text.
 struct Leaf {
     const char* name;
     bool present;
@@ -17,30 +17,29 @@ struct Leaf {
 };
 using Leaves = std::vector<Leaf>;
 
-/// Marks elements that are present in every document, even without a text.
+/// Marks the elements that every document carries, with a text or without.
 constexpr bool always = true;
 
-/// Returns an element that is present only if its text is not empty.
+/// An element that is there only when its text is not empty.
 inline Leaf filled(const char* name, const QString& text)
 {
     return {name, !text.isEmpty(), text};
 }
 
-/// An element of a document under construction. It is part of the tree from the beginning.
+/// An element of a document that is being built. It stands in the tree as soon as it is made.
 class Branch {
 public:
-    /// Creates the root of an empty document. All elements below it have the same namespace, or none if `namespaceURI`
-    /// is empty.
+    /// The root of an empty document; everything below it lies in the same namespace, none for an empty one.
     Branch(xml::Document& document, const char* rootName, const QString& namespaceURI = {});
 
     Branch add(const char* name) const;
     void add(const char* name, const QString& text) const;
-    /// Adds those elements of the list that are present, in order.
+    /// Those of the list that are present, in its order.
     void add(const Leaves& leaves) const;
-    /// Adds an element without a namespace.
+    /// An element that lies in no namespace.
     void addOutside(const char* name, const QString& text) const;
 
-    /// Returns the element as XML text.
+    /// The serialised text of the element.
     QString xml() const { return node.xml(); }
 
 private:

@@ -1,4 +1,4 @@
-// The data of a document, and functions that the files of this folder share.
+// What a document holds behind its nodes, and the steps that the files of this folder share.
 #pragma once
 
 #include "platform/xml/xml.h"
@@ -20,18 +20,18 @@ struct DocumentData {
     DocumentData(const DocumentData&) = delete;
     DocumentData& operator=(const DocumentData&) = delete;
 
-    /// Deletes all nodes. The document is empty afterwards.
+    /// Frees everything and starts an empty document.
     void clear();
-    /// Takes ownership of a parsed document.
+    /// Takes a parsed document over.
     void take(xmlDocPtr parsed, QHash<const xmlNode*, QByteArray> tags);
 
     Node wrap(xmlNodePtr node) { return node ? Node(node, this) : Node(); }
-    /// Returns a namespace for a created node. It is declared when the document is written.
+    /// A namespace for nodes that were made here; it is declared when the document is written.
     xmlNsPtr namespaceFor(const QString& prefix, const QString& uri);
 
-    /// Adds a node to the children of `parent`, before `before` or, if that is null, at the end.
+    /// Puts a node among the children of `parent`, in front of `before` or last.
     void link(xmlNodePtr parent, xmlNodePtr child, xmlNodePtr before);
-    /// Removes a node from the tree. It lives as long as the document.
+    /// Takes a node out of the tree; it lives on as long as the document.
     void unlink(xmlNodePtr node);
 
     QList<Node> select(xmlNodePtr from, const QString& path, bool firstOnly);
@@ -39,7 +39,7 @@ struct DocumentData {
     xmlDocPtr document = nullptr;
     ParseError error;
     QMap<QString, QString> prefixes;
-    /// The start tags of elements in which a declaration comes after an attribute. They tell the order.
+    /// Of elements with a declaration after an attribute: the text that tells their order.
     QHash<const xmlNode*, QByteArray> startTags;
 
 private:
@@ -49,7 +49,7 @@ private:
 
     xmlXPathContextPtr context = nullptr;
     QMap<QString, QString> contextPrefixes;
-    bool ordered = false;  // true if libxml2 has numbered the elements; a change of the tree resets it
+    bool ordered = false;  // libxml2 knows the order of the elements, as long as the tree stays as it is
     QSet<xmlNodePtr> loose;
     std::vector<xmlNsPtr> namespaces;
 };
@@ -64,17 +64,17 @@ inline const xmlChar* toXml(const QByteArray& utf8)
     return reinterpret_cast<const xmlChar*>(utf8.constData());
 }
 
-/// Returns the text without the characters that XML forbids.
+/// Text without the characters that XML forbids.
 QString allowedText(const QString& text);
 bool isBlankText(const xmlNode* node);
 QString textOfNode(const xmlNode* node);
 QString qualifiedName(const xmlNode* node);
 QList<Attribute> attributesOf(const DocumentData& data, const xmlNode* element);
 
-/// Returns the names of the attributes and declarations in a start tag, in their order.
+/// The names of a start tag's attributes, declarations among them, in the order of its text.
 std::vector<std::string_view> namesInStartTag(std::string_view tag);
 
-/// Parses a text into `data`. If it fails, returns false and sets the error; `data` is then empty.
+/// Parses into `data`; false leaves it empty with its error filled.
 bool parse(DocumentData& data, const QString& text);
 QString serialized(const DocumentData& data, const xmlNode* node);
 

@@ -16,7 +16,7 @@ using Expression = std::unique_ptr<xmlXPathCompExpr, decltype(&xmlXPathFreeCompE
 using Context = std::unique_ptr<xmlXPathContext, decltype(&xmlXPathFreeContext)>;
 using Result = std::unique_ptr<xmlXPathObject, decltype(&xmlXPathFreeObject)>;
 
-/// Prevents libxml2 from printing to standard error.
+/// The library would print to standard error.
 void passOver(void*, xmlErrorPtr) {}
 
 [[noreturn]] void failAsExpression(const QString& path)
@@ -24,8 +24,7 @@ void passOver(void*, xmlErrorPtr) {}
     throw RuntimeError(TypeMismatch, u"The path cannot be evaluated: "_s + path);
 }
 
-/// Returns a compiled path. Each thread keeps its compiled paths, but not without limit, because paths can contain
-/// values.
+/// Each path is compiled once a thread; the limit is for paths that hold values.
 xmlXPathCompExprPtr compiled(const QString& path)
 {
     constexpr size_t mostKept = 2000;
@@ -85,7 +84,7 @@ QList<Node> DocumentData::select(xmlNodePtr from, const QString& path, bool firs
     for (int i = 0; found && i < found->nodeNr; ++i) {
         const xmlNodePtr node = found->nodeTab[i];
         if (node->type == XML_NAMESPACE_DECL || node->type == XML_DOCUMENT_NODE)
-            continue;  // this layer has no such nodes
+            continue;  // neither has a place among the nodes of this layer
         nodes.append(wrap(node));
         if (firstOnly)
             break;

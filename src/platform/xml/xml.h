@@ -1,4 +1,4 @@
-// XML documents for the message code, based on libxml2.
+// The document object of the message code, over libxml2.
 #pragma once
 
 #include <QList>
@@ -13,14 +13,14 @@ namespace kest::xml {
 
 enum class NodeType { Element = 1, Attribute = 2, Text = 3, CDataSection = 4, ProcessingInstruction = 7, Comment = 8 };
 
-/// The two errors that the message code repairs. All other errors have other codes.
+/// The two errors that the message code repairs; every other failure has another code.
 constexpr quint32 BareAmpersand = 0xC00CE513;
 constexpr quint32 SecondRoot = 0xC00CE555;
 
 struct ParseError {
-    quint32 errorCode = 0;  // 0 if the last parse succeeded
+    quint32 errorCode = 0;  // 0: the last parse succeeded
     QString reason;
-    QString srcText;  // the line with the error
+    QString srcText;  // the line that holds the error
     int line = 0;     // from 1
     int linePosition = 0;
 };
@@ -32,8 +32,8 @@ struct Attribute {
 
 struct DocumentData;
 
-/// A reference to a node. It is cheap to copy, and valid until its document is destroyed or loads another text, even if
-/// the document is moved. All functions of a null node except isNull() throw NoObject.
+/// A light reference to a node, valid until its document goes or loads another text; it outlives a move. A null node
+/// answers `isNull`; anything else asked of it throws NoObject.
 class Node {
 public:
     Node() = default;
@@ -43,19 +43,18 @@ public:
     bool operator==(const Node&) const = default;
 
     NodeType nodeType() const;
-    /// The name with its prefix, or "#text", "#cdata-section" or "#comment".
+    /// With the prefix that the file gives; "#text", "#cdata-section" and "#comment" for those.
     QString nodeName() const;
     QString localName() const;
     QString namespaceURI() const;
-    /// The joined text of all descendants. Text nodes with only white space are ignored.
+    /// The text of all descendants, joined; a text node of white space only counts for nothing.
     QString text() const;
-    /// The text as UTF-8. If an element contains a single text, the result refers to the memory of the document and is
-    /// valid as long as that.
+    /// The same as UTF-8; of an element with one text it refers to the document's own memory, and lives as long.
     QByteArray utf8() const;
     void setText(const QString& text);
-    /// The node as XML text, without a declaration and without added white space.
+    /// Without declaration and added white space.
     QString xml() const;
-    /// All attributes and namespace declarations in document order.
+    /// Namespace declarations included, in document order.
     QList<Attribute> attributes() const;
     void setAttribute(const QString& name, const QString& value);
 
@@ -63,17 +62,16 @@ public:
     Node firstChild() const;
     Node lastChild() const;
     Node nextSibling() const;
-    /// All children except texts with only white space.
+    /// Text that is white space only is no node.
     QList<Node> childNodes() const;
     Node appendChild(Node child) const;
     Node insertBefore(Node child, Node reference) const;
     void removeChild(Node child) const;
 
-    /// Returns the first match, or null. Prefixes are those of the document's selection namespaces.
+    /// Null when nothing matches. The prefixes are those of the document's selection namespaces.
     Node selectSingleNode(const QString& path) const;
     QList<Node> selectNodes(const QString& path) const;
-    /// The text of the first node at a path. If there is none, textOf() throws NoObject, and textOrEmptyOf() returns an
-    /// empty text.
+    /// The text at a path. `textOf` throws NoObject where nothing is, `textOrEmptyOf` gives the empty text.
     QString textOf(const QString& path) const;
     QString textOrEmptyOf(const QString& path) const;
 
@@ -81,53 +79,53 @@ private:
     friend class Document;
     friend struct DocumentData;
     Node(_xmlNode* n, DocumentData* d) : node(n), document(d) {}
-    /// Returns the node of libxml2. Throws NoObject for a null node.
+    /// The node behind this one; throws NoObject for a null node.
     _xmlNode* required() const;
 
     _xmlNode* node = nullptr;
     DocumentData* document = nullptr;
 };
 
-/// An XML document. It accepts no DTD and never reads anything outside of the text. A text that exceeds one of the
-/// limits can't be parsed, so that a hostile text costs little time and memory.
+/// One XML document. No DTD is accepted, and nothing outside the document is ever fetched. The limits bound what a
+/// hostile text costs: beyond them the parse fails like any other.
 class Document {
 public:
-    static constexpr qint64 maximumBytes = 256LL * 1024 * 1024;  // of the text, with one byte for each character
+    static constexpr qint64 maximumBytes = 256LL * 1024 * 1024;  // of the text, a byte for each character
     static constexpr int maximumDepth = 250;
-    static constexpr int maximumNodes = 1'500'000;  // including attributes, their values and texts
+    static constexpr int maximumNodes = 1'500'000;  // elements, attributes and their values, texts and others
 
     Document();
     ~Document();
     Document(Document&&) noexcept;
     Document& operator=(Document&&) noexcept;
 
-    /// Sets the URIs of the prefixes in paths. They stay for later parses.
+    /// Prefixes for selections, to URIs. They hold for later parses too.
     void setSelectionNamespaces(const QMap<QString, QString>& prefixes);
 
-    /// Parses a text. If it fails, returns false and sets parseError(); the document is then empty.
+    /// False leaves the document empty and `parseError` filled.
     bool loadXML(const QString& text);
     const ParseError& parseError() const;
 
-    /// Returns the root element, or null if the document is empty.
+    /// The root element, whatever stands before it; null for an empty document.
     Node documentElement() const;
-    /// The same; the message code uses this name.
+    /// The same: what the message code calls the document's first child.
     Node firstChild() const { return documentElement(); }
 
-    /// Creates a node that is not yet in the tree. `name` may have a prefix, which is declared with `namespaceURI` if
-    /// necessary. An empty URI means no namespace.
+    /// A node of this document that is not yet in the tree. `name` may carry a prefix, which is declared with
+    /// `namespaceURI` where it is not in force yet; an empty URI is no namespace.
     Node createNode(NodeType type, const QString& name, const QString& namespaceURI = {});
-    /// Adds the root to an empty document.
+    /// Puts the root of an empty document.
     Node appendChild(Node root);
 
-    /// Relative paths start at the root element.
+    /// Relative paths begin at the root element.
     Node selectSingleNode(const QString& path) const;
     QList<Node> selectNodes(const QString& path) const;
-    /// Like Node::textOf() and Node::textOrEmptyOf(), from the root element.
+    /// As Node::textOf and Node::textOrEmptyOf, from the root.
     QString textOf(const QString& path) const;
     QString textOrEmptyOf(const QString& path) const;
 
-    /// Returns the document as XML text. Only characters with a meaning in XML are written as references, and
-    /// characters that XML forbids are dropped.
+    /// Characters as themselves, not as references, except those that markup needs; characters that XML forbids are
+    /// dropped.
     QString xml() const;
 
 private:
