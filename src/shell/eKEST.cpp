@@ -17,6 +17,8 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
+constexpr int closingWait = 500;  // milliseconds
+
 QString homeFolder()
 {
     return GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"EcomHome"_s, u"c:\\wirdoc\\"_s);
@@ -44,6 +46,7 @@ eKEST::eKEST()
     for (const QString& folder : {gsUnreadPath, gsReadPath, gsUnsentPath, gsSentPath, homeFolder() + u"PDF\\"_s,
                                   gsImagesPath, profile::root(), profile::componentFolder()})
         files::removeLeftOvers(folder);
+    files::resumeRemovals();
 }
 
 eKEST::~eKEST()
@@ -63,6 +66,7 @@ void eKEST::ShowKESTWindow(const QString& sQTNNO, const QString& sSubQuote)
             return;
         desktop::showModal(panel);
     });
+    files::waitForBackground(closingWait);
 }
 
 bool hasConnection()

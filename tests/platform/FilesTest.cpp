@@ -227,6 +227,32 @@ TEST_F(Files, LeftOversOfKilledWritersGoAfterADay)
     files::removeLeftOvers(u"c:\\nowhere"_s);
 }
 
+TEST_F(Files, ADeletionOutlivesItsProcessAndSparesALaterFileOfTheName)
+{
+    const QString list = profile::root() + u"/removals.json"_s;
+    const QString path = files::systemPath(box + u"held.xml"_s);
+    const QDateTime written(QDate(2024, 5, 6), QTime(7, 8));
+    const auto make = [&](const QDateTime& time) {
+        touch({"held.xml"});
+        QFile file(path);
+        EXPECT_TRUE(file.open(QIODevice::Append) && file.setFileTime(time, QFileDevice::FileModificationTime));
+    };
+    make(written);
+    setMode({}, 0555);
+    files::removeInBackground(path);
+    const QByteArray left = files::readBytes(list);
+    setMode({}, 0755);
+    EXPECT_TRUE(files::waitForBackground(5000));
+    EXPECT_FALSE(files::exists(list));
+
+    for (const int secondsLater : {0, 1}) {
+        make(written.addSecs(secondsLater));
+        files::writeBytes(list, left);
+        files::resumeRemovals();
+        EXPECT_EQ(files::exists(path), secondsLater == 1);
+    }
+}
+
 TEST_F(Files, ALockGoesWithItsProcessWhateverItsFileHolds)
 {
     const QString path = box + u"x.lock"_s;

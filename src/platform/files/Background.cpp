@@ -1,75 +1,106 @@
 #include "platform/RuntimeError.h"
 #include "platform/files/SystemFile.h"
 #include "platform/files/files.h"
+#include "platform/profile.h"
 
-#include <QStringList>
+#include <QCoreApplication>
+#include <QDeadlineTimer>
+#include <QFileInfo>
+#include <QJsonArray>
+#include <QJsonDocument>
+#include <QPointer>
+#include <QThread>
+#include <QTimer>
 
 #include <chrono>
-#include <condition_variable>
-#include <mutex>
-#include <stop_token>
-#include <thread>
+
+using namespace Qt::StringLiterals;
 
 namespace kest::files {
 
 namespace {
 
-/// Takes files away that someone else may still hold, one thread for all of them.
-class Remover {
-public:
-    void add(const QString& systemPath)
-    {
-        const std::lock_guard lock(mutex);
-        if (!waiting.contains(systemPath))
-            waiting.append(systemPath);
-        if (!worker.joinable())
-            worker = std::jthread([this](const std::stop_token& stop) { run(stop); });
-        changed.notify_all();
-    }
+constexpr auto pause = std::chrono::milliseconds(100);
 
-    bool waitUntilDone(std::chrono::milliseconds time)
-    {
-        std::unique_lock lock(mutex);
-        return changed.wait_for(lock, time, [this] { return waiting.isEmpty(); });
-    }
+QStringList waiting;  // paths of this system
 
-private:
-    void run(const std::stop_token& stop)
-    {
-        constexpr auto pause = std::chrono::milliseconds(100);
-        std::unique_lock lock(mutex);
-        while (!stop.stop_requested()) {
-            changed.wait(lock, stop, [this] { return !waiting.isEmpty(); });
-            const QStringList files = waiting;
-            lock.unlock();
-            QStringList gone;
-            for (const QString& file : files) {
-                attempt([&] {
-                    failOnRequest(file);
-                    removeFile(file);
-                });
-                if (!isFile(file))
-                    gone.append(file);
-            }
-            lock.lock();
-            for (const QString& file : gone)
-                waiting.removeAll(file);
-            changed.notify_all();
-            if (!waiting.isEmpty())
-                changed.wait_for(lock, stop, pause, [] { return false; });
-        }
-    }
-
-    std::mutex mutex;
-    std::condition_variable_any changed;
-    QStringList waiting;
-    std::jthread worker;  // last, so that it ends before what it uses
-};
-
-Remover& remover()
+/// Identifies the file itself: a later file of the same name is another message.
+QJsonArray stateOf(const QString& file)
 {
-    static Remover instance;
-    return instance;
+    const QFileInfo info(file);
+    return {file, info.size(), info.lastModified().toMSecsSinceEpoch()};
+}
+
+QString listOfRemovals()
+{
+    return profile::root() + u"/removals.json"_s;
+}
+
+/// The files of the list that are still those which were to be deleted.
+QStringList remembered()
+{
+    QStringList files;
+    attempt([&] {
+        for (const QJsonValue& entry : QJsonDocument::fromJson(readBytes(listOfRemovals())).array())
+            if (const QString file = entry.toArray().at(0).toString(); isFile(file) && entry == stateOf(file))
+                files.append(file);
+    });
+    return files;
+}
+
+void remember()
+{
+    QStringList files = remembered() + waiting;
+    files.removeDuplicates();
+    QJsonArray list;
+    for (const QString& file : files)
+        list.append(stateOf(file));
+    attempt([&] {
+        if (!list.isEmpty())
+            writeBytes(listOfRemovals(), QJsonDocument(list).toJson());
+        else if (exists(listOfRemovals()))
+            remove(listOfRemovals());
+    });
+}
+
+void tryAll()
+{
+    waiting.removeIf([](const QString& file) {
+        attempt([&] {
+            failOnRequest(file);
+            removeFile(file);
+        });
+        return !isFile(file);
+    });
+}
+
+/// Tries again while there are events, which is while a window is open.
+void tryLater()
+{
+    static QPointer<QTimer> timer;
+    if (waiting.isEmpty() || !QCoreApplication::instance())
+        return;
+    if (!timer) {
+        timer = new QTimer(QCoreApplication::instance());
+        timer->setSingleShot(true);
+        QObject::connect(timer, &QTimer::timeout, [] {
+            tryAll();
+            if (waiting.isEmpty())
+                remember();
+            tryLater();
+        });
+    }
+    timer->start(pause);
+}
+
+void addAll(const QStringList& files)
+{
+    waiting += files;
+    waiting.removeDuplicates();
+    tryAll();
+    if (!waiting.isEmpty())
+        remember();
+    tryLater();
 }
 
 }  // namespace
@@ -78,12 +109,23 @@ void removeInBackground(const QString& path)
 {
     const QString place = systemPath(path);
     if (isFile(place))
-        remover().add(place);
+        addAll({place});
+}
+
+void resumeRemovals()
+{
+    addAll(remembered());
 }
 
 bool waitForBackground(int milliseconds)
 {
-    return remover().waitUntilDone(std::chrono::milliseconds(milliseconds));
+    if (waiting.isEmpty() && !isFile(listOfRemovals()))
+        return true;
+    const QDeadlineTimer deadline(milliseconds);
+    for (tryAll(); !waiting.isEmpty() && !deadline.hasExpired(); tryAll())
+        QThread::msleep(pause.count());
+    remember();
+    return waiting.isEmpty();
 }
 
 }  // namespace kest::files

@@ -63,10 +63,12 @@ bool isPlainName(const QString& name);
 /// `folder` + `name`; throws PathNotFound for a name that is not plain. For names that are about to be written.
 QString pathForWriting(const QString& folder, const QString& name);
 
-/// Deletes a file that another process may still hold, again and again in the background until it has gone.
+/// Deletes a file that another process may still have open: now, or else every 100 ms while windows are open.
 void removeInBackground(const QString& path);
-/// Waits for the background deletions of this process; false when some file is still there after the time.
+/// Waits for these deletions and returns true if all files are gone. What is left is remembered in the profile.
 bool waitForBackground(int milliseconds);
+/// Takes up the deletions that an earlier process left, unless a file has changed since.
+void resumeRemovals();
 
 QByteArray toCodePage(const QString& text);
 QString fromCodePage(const QByteArray& bytes);
