@@ -6,6 +6,7 @@
 
 namespace kest::app {
 
+/// The exit codes of `kest2`.
 enum ExitCode : int { Done = 0, Refused = 1, Usage = 2, NoConnection = 3, NeedsAPerson = 4 };
 
 /// The options, the command and its arguments.

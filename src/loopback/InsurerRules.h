@@ -42,6 +42,7 @@ struct Step {
     int number(const QString& name, int otherwise = 0) const;
 };
 
+/// When the steps of a rule begin.
 enum class Occasion { Start, Quote, Request };
 
 /// What happens on an occasion. Each step is taken after the shop has dealt with the message of the step before.

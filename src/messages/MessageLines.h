@@ -8,22 +8,26 @@
 
 namespace kest {
 
+/// The section of a line.
 enum class LineSection { Labour, Part, Paint, Sublet };
-/// In the order in which they are loaded and compared.
+/// The sections in the order in which they are loaded and compared.
 inline constexpr LineSection lineSections[] = {LineSection::Labour, LineSection::Part, LineSection::Paint,
                                                LineSection::Sublet};
 
-/// What is to happen to the shop's line. A line is also added if no line of its section has said anything so far.
+/// How a line changes that of the shop. A line is also added if neither it nor a line before it in its section has an
+/// indicator.
 enum class LineChange { Add, Insert, Alter, Keep, Delete, Unknown };
 
+/// A line of a message.
 struct MessageLine {
     xml::Node node;
     QString indicator;  // its own, or that of the line before it
 
+    /// Returns how the line changes that of the shop.
     LineChange change() const;
 
-    /// Returns the text of an element, or an empty text if the line has none. A line that is to be deleted has nothing
-    /// but its number, whatever the message says.
+    /// Returns the text of an element, or an empty text if the line does not have it. A deleted line has only its
+    /// number, even if the message has more.
     QString text(QLatin1StringView element) const;
     /// The same, but throws NoObject if the element is missing.
     QString requiredText(QLatin1StringView element) const;

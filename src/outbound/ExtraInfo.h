@@ -10,6 +10,7 @@
 
 namespace kest {
 
+/// The values of the dialog, as text.
 struct ExtraValues {
     QString transmission;  // "Automatic" or "Manual"
     QString vin;

@@ -43,7 +43,8 @@ public:
     const QString& sqlState() const { return sqlState_; }
     RuntimeError& withDatabaseCodes(QString native, QString state);
 
-    /// A failure that the user has been told of already: it ends what it passes through, and no other box comes.
+    /// Returns true if a box has already shown this error. It still ends all routines that don't catch it, but no other
+    /// box appears.
     bool isTold() const { return told_; }
     RuntimeError& asTold();
 

@@ -12,6 +12,7 @@
 
 namespace kest {
 
+/// The kind of quote that the insurer has sent.
 enum class ComparisonOf { AuthorisedQuote, AdjustedQuote };
 
 /// Names and values of the fields that are the same on every row of a report.

@@ -7,6 +7,7 @@
 
 namespace kest {
 
+/// The numbers of the reports.
 enum ReportNumber : qint32 { QuoteRequestReport = 710, AssessmentReport = 720, ComparisonReport = 730 };
 
 /// A field of a report table.

@@ -11,7 +11,7 @@ QStringView withoutTrailingBlanks(QStringView text)
     return text;
 }
 
-/// One character against the set between the brackets.
+/// Returns true if a character matches the set between brackets.
 bool isInSet(char16_t c, QStringView set)
 {
     const bool excludes = set.startsWith(u'^');
@@ -28,7 +28,7 @@ bool isInSet(char16_t c, QStringView set)
     return found != excludes;
 }
 
-/// The length of the pattern's first element: a set in brackets, or one character. 0 at the end of the pattern.
+/// Returns the length of the pattern's first element, which is a set in brackets or a character, or 0 at the end.
 qsizetype elementLength(QStringView pattern)
 {
     if (pattern.isEmpty())
@@ -48,7 +48,7 @@ bool elementMatches(QStringView element, QChar c)
 
 QString comparisonKey(QStringView text)
 {
-    // character by character, as compareTexts does: a text keeps its length
+    // character by character, like compareTexts(), so that the text keeps its length
     QString key = withoutTrailingBlanks(text).toString();
     for (QChar& c : key)
         c = c.toCaseFolded();
@@ -67,8 +67,8 @@ bool isLike(QStringView rawText, QStringView rawPattern)
     const QStringView text = foldedText;
     const QStringView pattern = foldedPattern;
 
-    // After a mismatch only the last "%" needs to take one character more, so the cost stays the product of the
-    // lengths.
+    // After a mismatch, it is enough to extend the match of the last "%" by a character, so the time is limited by the
+    // product of the lengths.
     qsizetype t = 0;
     qsizetype p = 0;
     qsizetype retryText = -1;

@@ -1,4 +1,4 @@
-// How texts compare in every database: without regard to case and to trailing blanks.
+// Compares texts by the rule of all our databases: case and trailing blanks are ignored.
 #pragma once
 
 #include <QString>
@@ -6,13 +6,14 @@
 
 namespace kest::db {
 
-/// Two texts are equal in a database exactly when their keys are.
+/// Returns a key for a text. Two texts are equal in a database if and only if their keys are equal.
 QString comparisonKey(QStringView text);
-/// Negative, zero or positive, as the keys compare in code order.
+/// Compares the keys of two texts in code order. The result is negative, zero or positive.
 int compareTexts(QStringView left, QStringView right);
 
-/// LIKE with "%", "_" and "[...]", without regard to case and to trailing blanks. There is no escape character; in
-/// brackets "^" in front excludes and "-" between two characters is a range.
+/// Returns true if a text matches a pattern of LIKE with "%", "_" and "[...]". Case and trailing blanks are ignored.
+/// There is no escape character. In brackets, "^" at the beginning excludes characters, and "-" between two characters
+/// is a range.
 bool isLike(QStringView text, QStringView pattern);
 
 }  // namespace kest::db

@@ -20,7 +20,7 @@ QString textOf(const QVariant& value)
     return value.typeId() == QMetaType::QString ? value.toString() : toText(value);
 }
 
-/// "yyyy-MM-dd HH:mm:ss", the form in which dates are stored, without the cost of a general parser.
+/// Reads "yyyy-MM-dd HH:mm:ss", the form in which dates are stored. This is faster than a general parser.
 QDateTime storedDate(const QString& text)
 {
     if (text.size() != 19 || text[4] != u'-' || text[7] != u'-' || text[10] != u' ' || text[13] != u':')
@@ -70,7 +70,7 @@ QVariant asFlag(const QVariant& value)
     if (kindOfValue(value) != Kind::Text)
         return value.toDouble() != 0;
     const QString text = textOf(value);
-    if (text.size() == 1 && text[0] < u' ')  // a bit that arrives as one raw byte
+    if (text.size() == 1 && text[0] < u' ')  // a bit that the driver returns as a raw byte
         return text[0] != u'\0';
     if (const std::optional<double> number = numberIn(text))
         return *number != 0;

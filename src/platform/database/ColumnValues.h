@@ -1,4 +1,4 @@
-// The values of columns in the one C++ type of their kind, whatever the driver gives.
+// Converts values from drivers to the C++ type of their kind.
 #pragma once
 
 #include "platform/database/Recordset.h"
@@ -7,13 +7,13 @@
 
 namespace kest::db {
 
-/// The kind of a value of which nothing else is known.
+/// Returns the kind of a value if nothing else is known about its column.
 Kind kindOfValue(const QVariant& value);
 
-/// A value as it came from a driver in the one C++ type of its kind. A text that is no such value stays a text, so that
-/// it can be read and shown, and fails when it is used as a number or a date.
+/// Converts a value from a driver to the C++ type of its kind. If a text can't be converted, it stays a text, so that
+/// it can be read and shown; using it as a number or a date then fails.
 QVariant normalised(const QVariant& value, Kind kind);
-/// True if the value has that type already, as most have.
+/// Returns true if the value already has that type, as most values do.
 bool isNormal(const QVariant& value, Kind kind);
 
 }  // namespace kest::db

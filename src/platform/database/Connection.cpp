@@ -16,7 +16,7 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-/// The fields of a connection text; names in lower case. A value in braces may hold a ";".
+/// Returns the fields of a connection text with their names in lower case. A value in braces may contain ";".
 QHash<QString, QString> fieldsOf(const QString& text)
 {
     QHash<QString, QString> fields;
@@ -43,7 +43,7 @@ QString fieldOf(const QHash<QString, QString>& fields, const QString& name, cons
     return fields.contains(name) ? fields.value(name) : fields.value(otherName);
 }
 
-/// True where a section of that name stands in the list of drivers for this process, this user or this machine.
+/// Returns true if the driver is in the list of drivers of this process, this user or this machine.
 bool isRegistered(const QString& driver)
 {
     const QString folder = qEnvironmentVariable("ODBCSYSINI", u"/etc"_s);
@@ -69,7 +69,7 @@ bool isMySql(const QString& driver)
     return driver.contains(u"mysql"_s, Qt::CaseInsensitive) || driver.contains(u"mariadb"_s, Qt::CaseInsensitive);
 }
 
-/// True for a server's name that means this machine.
+/// Returns true if the name of a server means this machine.
 bool isThisMachine(const QString& server)
 {
     const QString machine = QSysInfo::machineHostName();
@@ -172,7 +172,7 @@ Lock::Lock(ConnectionPtr connection, const QString& name, int seconds) : connect
 
 Lock::~Lock()
 {
-    if (held_ && connection_->state() == 1)  // with the connection the lock has gone
+    if (held_ && connection_->state() == 1)  // a closed connection has lost the lock
         attempt([&] { connection_->session().engine().unlock(name_); });
 }
 

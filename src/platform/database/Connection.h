@@ -1,4 +1,4 @@
-// A connection to the quote database, whichever engine answers.
+// A connection to the quote database, on any engine.
 #pragma once
 
 #include <QString>
@@ -10,8 +10,8 @@ namespace kest::db {
 
 class Session;
 
-/// One open database. Statements are written in the dialect of SQL Server; the engine that answers translates them.
-/// One statement a call: a second one behind a ";" is refused with StatementFailed.
+/// A connection to a database. Statements are written in the dialect of SQL Server and translated for other engines.
+/// Each call accepts one statement; a second one after a ";" fails with StatementFailed.
 class Connection {
 public:
     Connection();
@@ -19,27 +19,28 @@ public:
     Connection(const Connection&) = delete;
     Connection& operator=(const Connection&) = delete;
 
-    /// Opens what a connection text of the form "Driver={...};Server=...;Database=...;Uid=...;Pwd=...;" names: MySQL
-    /// and MariaDB, a driver registered with ODBC here, or, for a local server without such a driver, the embedded
-    /// engine. Throws CannotOpen; a server that does not answer costs seconds.
+    /// Opens the database in a connection text of the form "Driver={...};Server=...;Database=...;Uid=...;Pwd=...;". The
+    /// driver is that of MySQL and MariaDB, or one that is registered with ODBC on this machine. For a local server
+    /// without such a driver, the embedded engine is used. Throws CannotOpen; if a server does not answer, this takes
+    /// some seconds.
     void open(const QString& connectionText);
     void close();
-    /// 1 while the connection is open, 0 otherwise. A connection that the server has dropped is closed.
+    /// Returns 1 if the connection is open, otherwise 0. A connection that the server has dropped is closed.
     int state() const;
-    /// Asks the server whether it still answers on this connection; one that it has dropped is closed from then on.
+    /// Checks if the server still answers. If it has dropped the connection, the connection is closed afterwards.
     bool answers() const;
 
-    /// Seconds that a statement may take; 0 is no limit.
+    /// Sets how many seconds a statement may take. 0 means no limit.
     void setCommandTimeout(int seconds);
 
-    /// Runs a statement that gives no rows and commits it; the number of rows that it hit.
-    /// Throws StatementFailed with the engine's codes, CannotOpen when the connection has gone.
+    /// Executes and commits a statement that returns no rows. Returns the number of rows that it affects. Throws
+    /// StatementFailed with the codes of the engine, or CannotOpen if the connection is lost.
     qint64 execute(const QString& statement);
 
-    /// Puts the indexes of the embedded database in order, which another tool may have left in another one.
+    /// Rebuilds the indexes of the embedded database, which another tool may have left in another order.
     void rebuildIndexes();
 
-    /// For the recordset.
+    /// Used by Recordset.
     Session& session() const;
 
 private:
@@ -49,11 +50,10 @@ private:
 
 using ConnectionPtr = std::shared_ptr<Connection>;
 
-/// What only one of all that work on a database may do at a time, for as long as the lock lives. It keeps out those who
-/// ask for the same name, and touches no row.
+/// A named lock shared by everyone who uses the database, held while this object lives. It locks no rows.
 class Lock {
 public:
-    /// Waits that long for another one to let go.
+    /// Tries to get the lock and waits up to this time.
     Lock(ConnectionPtr connection, const QString& name, int seconds = 0);
     ~Lock();
     Lock(const Lock&) = delete;
@@ -67,7 +67,7 @@ private:
     bool held_ = false;
 };
 
-/// The name of the embedded database that a connection text leads to; empty where a server answers, or nothing.
+/// Returns the name of the embedded database that a connection text opens, or an empty text if it does not open one.
 QString embeddedName(const QString& connectionText);
 
 }  // namespace kest::db

@@ -12,14 +12,14 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-constexpr qsizetype longestShown = 200;  // characters of a criterion that a message shows
+constexpr qsizetype longestShown = 200;  // the most characters of a criterion in an error message
 
 bool isTextKind(Kind kind)
 {
     return kind == Kind::Text || kind == Kind::LongText;
 }
 
-/// The number that a value or an operand means in a number or flag column.
+/// Returns the number for a value or operand in a number or flag column.
 std::optional<double> numberOf(const QVariant& value, Kind kind)
 {
     if (value.typeId() != QMetaType::QString)
@@ -48,7 +48,7 @@ std::optional<int> order(const std::optional<T>& left, const std::optional<T>& r
     return int(*right < *left) - int(*left < *right);
 }
 
-/// Negative, zero or positive; none where the two can't be compared.
+/// Compares the two. The result is negative, zero or positive, or nothing if they can't be compared.
 std::optional<int> compared(const QVariant& value, const QString& operand, Kind kind)
 {
     if (isTextKind(kind))
@@ -143,7 +143,7 @@ std::optional<QString> equalityKey(const QVariant& value, Kind kind)
         return date ? std::optional(date->toString(Qt::ISODateWithMs)) : std::nullopt;
     }
     const std::optional<double> number = numberOf(value, kind);
-    return number ? std::optional(QString::number(*number + 0.0, 'g', 17)) : std::nullopt;  // no -0
+    return number ? std::optional(QString::number(*number + 0.0, 'g', 17)) : std::nullopt;  // never "-0"
 }
 
 }  // namespace kest::db

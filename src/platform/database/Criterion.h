@@ -1,4 +1,4 @@
-// One condition of a search or a filter over fetched rows.
+// Conditions for searching and filtering fetched rows.
 #pragma once
 
 #include "platform/database/Recordset.h"
@@ -11,22 +11,24 @@
 
 namespace kest::db {
 
+/// A condition for the value of a column.
 struct Criterion {
     enum class Comparison { Equal, Unequal, Less, LessOrEqual, Greater, GreaterOrEqual, Like };
 
     QString column;
     Comparison comparison = Comparison::Equal;
-    std::optional<QString> operand;  // none: NULL
+    std::optional<QString> operand;  // if empty, the operand is NULL
 
-    /// Whether a value of that kind meets the condition, by the rules of the databases: texts without regard to case
-    /// and to trailing blanks, numbers by their value, where "" is 0 and a text that is no number equals no number.
+    /// Returns true if a value of that kind meets the condition. Compares as the databases do: texts without case and
+    /// trailing blanks, and numbers by their value, for which "" is 0, and a text that is not a number equals no
+    /// number.
     bool matches(const QVariant& value, Kind kind) const;
 };
 
-/// Conditions joined by AND. Throws StatementFailed for anything else.
+/// Returns the conditions in a text, which must be joined by AND. Throws StatementFailed for any other text.
 QList<Criterion> criteriaIn(const QString& text);
 
-/// What equal values have in common; none for a Null and for a value that equals nothing.
+/// Returns a key that is the same for equal values, or nothing for a Null and for a value that equals no other.
 std::optional<QString> equalityKey(const QVariant& value, Kind kind);
 
 }  // namespace kest::db

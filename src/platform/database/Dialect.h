@@ -1,4 +1,4 @@
-// How a database wants its statements written.
+// The dialect of a database.
 #pragma once
 
 #include "platform/database/Recordset.h"
@@ -9,29 +9,30 @@
 
 namespace kest::db {
 
+/// How a database expects its statements.
 struct Dialect {
-    bool top = false;               // "TOP n", not "LIMIT n" at the end
-    bool plusJoinsTexts = false;    // "+", not "||"
-    bool patternSets = false;       // LIKE knows "[...]", and ignores trailing blanks
+    bool top = false;               // uses "TOP n" instead of "LIMIT n" at the end
+    bool plusJoinsTexts = false;    // uses "+" instead of "||"
+    bool patternSets = false;       // LIKE supports "[...]" and ignores trailing blanks
     bool caseOfTables = false;      // the names of tables are case-sensitive
     bool backslashEscapes = false;  // a backslash in a literal is doubled
     bool isoDates = false;          // "T" between date and time in a literal
     QChar openQuote = u'"';
     QChar closeQuote = u'"';
     QString defaultsOnly = QStringLiteral("DEFAULT VALUES");
-    QString sameDate = QStringLiteral("%1=%2");  // that a date column holds the moment of a literal
-    QString sameLongText = QString();            // that a long text is the literal, to the letter; empty: not possible
+    QString sameDate = QStringLiteral("%1=%2");  // the condition that a date column equals a literal
+    QString sameLongText = QString();            // the same for a long text; empty if the database can't compare it
 
     QString quoted(const QString& identifier) const;
-    /// A value as a literal that no value can end; Null as NULL. Throws Overflow for a number that is none.
+    /// Returns a value as a literal, in which the value is escaped. Null is NULL. Throws Overflow for infinity and NaN.
     QString literal(const QVariant& value) const;
-    /// The condition that a column still holds a value; empty for a long text that can't be compared.
+    /// Returns the condition that a column still has a value, or an empty text for a long text that can't be compared.
     QString holds(const QString& column, Kind kind, const QVariant& value) const;
 };
 
 const Dialect& embeddedDialect();
 const Dialect& mySqlDialect();
-/// MariaDB and MySQL behind an ODBC driver, which reads a backslash in a literal.
+/// The dialect of MariaDB and MySQL over ODBC, in which a backslash in a literal is an escape character.
 const Dialect& mySqlOverOdbcDialect();
 const Dialect& sqlServerDialect();
 

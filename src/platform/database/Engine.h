@@ -1,4 +1,4 @@
-// What each kind of database supplies; its peculiarities stay in its own file.
+// What each kind of database must supply. Everything that is special about it is in its own file.
 #pragma once
 
 #include "platform/database/Dialect.h"
@@ -13,15 +13,15 @@
 
 namespace kest::db {
 
-/// All that a statement gave, in the types of the driver.
+/// The result of a statement, with values in the types of the driver.
 struct Answer {
     QStringList names;             // of the columns
     std::vector<QVariant> values;  // row after row
-    qint64 hit = 0;                // rows that the statement changed
+    qint64 hit = 0;                // the number of rows that the statement has changed
 };
 
-/// One open connection to a database of one kind. Statements are in its own dialect; each is read to its end before
-/// the next one starts, and commits alone.
+/// An open connection to a database. Statements are in the dialect of the database. Each statement commits alone, and
+/// its result is read completely before the next one starts.
 class Engine {
 public:
     Engine() = default;
@@ -29,28 +29,30 @@ public:
     Engine(const Engine&) = delete;
     Engine& operator=(const Engine&) = delete;
 
-    /// False once the server has dropped the connection.
+    /// Returns false if the server has dropped the connection.
     bool isOpen() const { return isOpen_; }
     void drop() { isOpen_ = false; }
 
     virtual const Dialect& dialect() const = 0;
 
-    /// Throws StatementFailed, or CannotOpen once the connection has gone; both with the codes of the database.
+    /// Executes a statement. Throws StatementFailed, or CannotOpen if the connection is lost, with the codes of the
+    /// database.
     virtual Answer run(const QString& statement) = 0;
-    /// The number of rows that an UPDATE, INSERT or DELETE hit, whatever triggers did besides.
+    /// Executes an UPDATE, INSERT or DELETE and returns the number of rows that it has changed, without those of
+    /// triggers.
     virtual qint64 change(const QString& statement) { return run(statement).hit; }
-    /// The identity that an INSERT gave its row.
+    /// Executes an INSERT and returns the identity of the new row.
     virtual QVariant insert(const QString& statement) = 0;
 
-    /// Asks the server for a sign of life. Takes seconds, not the time that a statement may take.
+    /// Checks if the server still answers. Waits some seconds at most, even if a statement may take longer.
     virtual void ping() { run(QStringLiteral("SELECT 1")); }
-    /// Seconds that a statement may take; 0 is no limit.
+    /// Sets how many seconds a statement may take. 0 means no limit.
     virtual void setTimeout(int seconds) = 0;
 
     virtual QStringList tableNames() = 0;
     virtual std::unique_ptr<TableInfo> readTable(const QString& name) = 0;
 
-    /// False if someone else, or this connection, holds the name after that time.
+    /// Gets a named lock. Returns false if someone else, or this connection, still has it after that time.
     virtual bool lock(const QString& name, int seconds) = 0;
     virtual void unlock(const QString& name) = 0;
 
@@ -60,7 +62,7 @@ private:
     bool isOpen_ = true;
 };
 
-/// These throw CannotOpen.
+/// These functions throw CannotOpen.
 std::unique_ptr<Engine> openEmbedded(const QString& file);
 std::unique_ptr<Engine> openMySql(const QString& host, int port, const QString& database, const QString& user,
                                   const QString& password);

@@ -1,4 +1,4 @@
-// MariaDB and MySQL, reached directly through QMYSQL.
+// The engine for MariaDB and MySQL, which uses QMYSQL.
 #include "platform/database/MySqlServer.h"
 #include "platform/database/QtSqlEngine.h"
 
@@ -20,7 +20,7 @@ public:
                 const QString& password)
         : QtSqlEngine(u"QMYSQL"_s)
     {
-        // "localhost" would be answered by a local socket, whatever the port
+        // with "localhost", the driver would use a local socket and ignore the port
         database.setHostName(host.compare(u"localhost"_s, Qt::CaseInsensitive) == 0 && port > 0 ? u"127.0.0.1"_s
                                                                                                 : host);
         if (port > 0)
@@ -30,7 +30,8 @@ public:
         database.setPassword(password);
         database.setConnectOptions(u"CLIENT_FOUND_ROWS=1;MYSQL_OPT_CONNECT_TIMEOUT=%1"_s.arg(connectSeconds));
         openDatabase();
-        // strict: a value that does not fit is refused and not cut, however the server is set
+        // strict mode, so that a value that is too long is refused and not cut, even if the server is configured
+        // otherwise
         run(u"SET SESSION sql_mode=CONCAT(@@sql_mode, ',NO_BACKSLASH_ESCAPES,PIPES_AS_CONCAT,STRICT_ALL_TABLES'), "
             "autocommit=1"_s);
         server.emplace(*this);

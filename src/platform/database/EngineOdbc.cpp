@@ -1,4 +1,5 @@
-// Whatever a registered ODBC driver reaches, through QODBC: SQL Server, and others by the name that they answer with.
+// The engine for ODBC drivers, which uses QODBC: for SQL Server, and for others, recognised by the name that they
+// return.
 #include "platform/database/MySqlServer.h"
 #include "platform/database/QtSqlEngine.h"
 
@@ -20,7 +21,7 @@ class EngineOdbc final : public QtSqlEngine {
 public:
     explicit EngineOdbc(QString connectionText) : QtSqlEngine(u"QODBC"_s)
     {
-        while (connectionText.endsWith(u';'))  // the driver manager takes a last one for an empty field, and fails
+        while (connectionText.endsWith(u';'))  // the driver manager would read an empty field after it, and fail
             connectionText.chop(1);
         database.setConnectOptions(u"SQL_ATTR_LOGIN_TIMEOUT=%1"_s.arg(connectSeconds));
         openNamed(connectionText);
@@ -28,7 +29,7 @@ public:
         if (!version.contains(u"MariaDB"_s, Qt::CaseInsensitive) &&
             database.driver()->dbmsType() != QSqlDriver::MySqlServer)
             return;
-        // only with this option does an update to the value already there count as a row that was hit
+        // without this option, an update that sets the same value would count as no row
         if (!connectionText.contains(u"option="_s, Qt::CaseInsensitive)) {
             database.close();
             openNamed(connectionText + u";OPTION=2"_s);

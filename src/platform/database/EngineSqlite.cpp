@@ -1,4 +1,4 @@
-// The embedded engine: one file of the profile, opened by QSQLITE and told how texts compare.
+// The embedded engine: a file of the profile, opened by QSQLITE, with our comparison of texts.
 #include "platform/RuntimeError.h"
 #include "platform/database/Collation.h"
 #include "platform/database/QtSqlEngine.h"
@@ -23,7 +23,7 @@ using namespace Qt::StringLiterals;
 namespace {
 
 constexpr int busySeconds = 5;
-constexpr int instructionsBetweenLooks = 100000;  // some milliseconds of work
+constexpr int instructionsBetweenLooks = 100000;  // some milliseconds
 
 bool isPlain(QByteArrayView text)
 {
@@ -35,7 +35,8 @@ char lower(char c)
     return c >= 'A' && c <= 'Z' ? char(c + ('a' - 'A')) : c;
 }
 
-/// The full meaning of the collation that the schema names NOCASE. Plain texts, nearly all of them, need no conversion.
+/// Compares texts for the collation NOCASE of the schema, by our full rule. ASCII texts, which are nearly all, need no
+/// conversion.
 int compareWithoutCase(void*, int leftSize, const void* leftBytes, int rightSize, const void* rightBytes)
 {
     QByteArrayView left(static_cast<const char*>(leftBytes), leftSize);
@@ -59,12 +60,12 @@ QStringView textOfValue(sqlite3_value* value)
     return QStringView(text, text ? sqlite3_value_bytes16(value) / 2 : 0);
 }
 
-/// X LIKE Y arrives as like(Y, X).
+/// SQLite calls like(Y, X) for X LIKE Y.
 void likeFunction(sqlite3_context* context, int, sqlite3_value** arguments)
 {
     if (sqlite3_value_type(arguments[0]) == SQLITE_NULL || sqlite3_value_type(arguments[1]) == SQLITE_NULL)
         return sqlite3_result_null(context);
-    const QString pattern = textOfValue(arguments[0]).toString();  // the next call may move the first text
+    const QString pattern = textOfValue(arguments[0]).toString();  // because the next call may move the first text
     sqlite3_result_int(context, isLike(textOfValue(arguments[1]), pattern));
 }
 
@@ -101,7 +102,7 @@ public:
         if (!attempt([&] {
                 lock = std::make_unique<files::Lock>(database.databaseName() + u"-locks"_s, name, seconds * 1000);
             }))
-            return true;  // the folder can't be written, as the next statement will tell
+            return true;  // the folder can't be written, which the next statement will report
         if (!lock->isHeld())
             return false;
         locks[name] = std::move(lock);
@@ -174,8 +175,8 @@ protected:
         }
     }
 
-    /// The library prepares a statement by the schema that it remembers, and again once it reads a newer one; the
-    /// driver does not expect columns to become more in between.
+    /// Makes SQLite read the current schema. Otherwise it may prepare a statement with an old schema, and again with
+    /// the new one, and the driver does not expect that the number of columns changes.
     void beforeStatement() override
     {
         sqlite3_step(schemaReader);
@@ -186,7 +187,7 @@ protected:
 private:
     sqlite3* handle() const { return *static_cast<sqlite3* const*>(database.driver()->handle().constData()); }
 
-    /// Directly after the open: later a name is refused while a statement is active.
+    /// Call this directly after opening: later, SQLite refuses to change a collation while a statement is active.
     void teachComparison()
     {
         const int collation =

@@ -1,4 +1,4 @@
-// Lets a test make a statement fail, to see what a routine leaves behind.
+// Makes statements fail in tests.
 #pragma once
 
 #include "platform/RuntimeError.h"
@@ -7,9 +7,9 @@
 
 namespace kest::db {
 
-/// `fault` is asked before each statement of every connection; where it answers true the statement is not run and fails
-/// with `number`: StatementFailed, or CannotOpen, after which the connection is closed. An empty function ends it.
-/// What the layer asks about the schema itself is not counted.
+/// Sets a function that is called before each statement of every connection. If it returns true, the statement is not
+/// executed and fails with `number`: StatementFailed, or CannotOpen, which also closes the connection. An empty
+/// function turns this off. The layer's own queries for the schema don't count.
 void setStatementFault(std::function<bool()> fault, int number = StatementFailed);
 
 }  // namespace kest::db

@@ -8,7 +8,7 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-constexpr int longestText = 65535;  // a longer one has no size that would have to be checked
+constexpr int longestText = 65535;  // the length of longer texts is not checked
 
 QString textOf(const QVariant& value)
 {

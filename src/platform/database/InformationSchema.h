@@ -1,4 +1,4 @@
-// What servers tell of their tables, through the views that they have in common.
+// Reads the tables of a server from INFORMATION_SCHEMA.
 #pragma once
 
 #include "platform/database/Engine.h"
@@ -7,14 +7,16 @@
 
 namespace kest::db {
 
-/// What each server says in its own words.
+/// The parts of the queries that differ between servers.
 struct InformationSchemaTerms {
     QString ofDatabase;  // the condition for the database of the connection
     QString type;        // the declared type of a column
-    QString identity;    // 1 for a column that the database numbers
+    QString identity;    // 1 if the column is an identity
 };
 
+/// Returns the names of all tables.
 QStringList tableNamesOf(Engine& engine, const InformationSchemaTerms& terms);
+/// Returns a table, or null if there is none of that name.
 std::unique_ptr<TableInfo> tableOf(Engine& engine, const InformationSchemaTerms& terms, const QString& name);
 
 }  // namespace kest::db

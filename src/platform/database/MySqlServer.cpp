@@ -28,7 +28,7 @@ QString MySqlServer::timeoutStatement(int seconds) const
 
 QString MySqlServer::lockName(const QString& name) const
 {
-    // the lock is one of the server, so its name holds the database's; it may have 64 characters
+    // locks belong to the server, so the name includes that of the database; a name can have 64 characters
     return u"SHA1(CONCAT(DATABASE(), '/', "_s + engine_.dialect().literal(name) + u"))"_s;
 }
 

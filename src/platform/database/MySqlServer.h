@@ -1,4 +1,4 @@
-// What MariaDB and MySQL have in common, whichever driver reaches them.
+// What MariaDB and MySQL have in common, with any driver.
 #pragma once
 
 #include "platform/database/InformationSchema.h"
@@ -8,9 +8,10 @@
 
 namespace kest::db {
 
+/// The statements and error codes of MariaDB and MySQL.
 class MySqlServer {
 public:
-    /// Asks which of the two answers.
+    /// Finds out which of the two it is.
     explicit MySqlServer(Engine& engine);
 
     static const InformationSchemaTerms& informationSchema();
@@ -21,7 +22,7 @@ public:
     void unlock(const QString& name);
 
     static bool meansConnectionLost(const QString& nativeCode);
-    /// The driver keeps the state to itself; it follows from the server's own code.
+    /// Returns the SQLSTATE for a code of the server, because the driver does not return it.
     static QString sqlState(const QString& nativeCode);
 
 private:
@@ -29,7 +30,7 @@ private:
 
     Engine& engine_;
     bool isMariaDb = false;
-    QSet<QString> locks;  // the server gives one twice to the same connection
+    QSet<QString> locks;  // checked here, because the server grants a lock twice to the same connection
 };
 
 }  // namespace kest::db

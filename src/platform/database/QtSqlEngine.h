@@ -1,4 +1,4 @@
-// What the engines that go through a driver of Qt have in common.
+// What the engines that use a driver of Qt have in common.
 #pragma once
 
 #include "platform/database/Engine.h"
@@ -10,6 +10,7 @@ class QSqlQuery;
 
 namespace kest::db {
 
+/// An engine that uses a QSqlDatabase.
 class QtSqlEngine : public Engine {
 public:
     ~QtSqlEngine() override;
@@ -20,10 +21,13 @@ public:
 protected:
     explicit QtSqlEngine(const QString& driver);
 
-    /// Opens `database`; throws CannotOpen.
+    /// Opens `database`. Throws CannotOpen.
     void openDatabase();
+    /// Returns true if the error says that the connection is lost.
     virtual bool meansConnectionLost(const QSqlError& error) const = 0;
+    /// Returns the SQLSTATE of an error.
     virtual QString sqlState(const QSqlError& error) const = 0;
+    /// Called before each statement.
     virtual void beforeStatement() {}
 
     QSqlDatabase database;

@@ -29,7 +29,7 @@ qint64 asWholeNumber(const QVariant& value)
     return qint64(number);
 }
 
-/// A value as a column of that kind holds it; throws where it does not convert.
+/// Converts a value to the kind of a column. Throws TypeMismatch if it can't be converted.
 QVariant converted(const QVariant& value, Kind kind, int cutAt)
 {
     if (value.isNull())
@@ -106,7 +106,7 @@ const Index& Recordset::Data::indexOf(int column)
     return *indexes.insert(column, std::move(index));
 }
 
-/// The one place that changes a value, so that an index stays right.
+/// Changes a value and updates the indexes. All changes are made here.
 void Recordset::Data::store(int row, int column, const QVariant& value)
 {
     QVariant& held = at(row, column);
@@ -295,7 +295,7 @@ void Recordset::setFilter(const QString& text)
     data->requireOpen();
     const QList<Criterion> criteria = criteriaIn(text);
     for (const Criterion& criterion : criteria)
-        data->columnNumber(criterion.column);  // an unknown name fails here, not at some later row
+        data->columnNumber(criterion.column);  // an unknown name must fail here and not at a later row
     data->filter = criteria;
     data->showFiltered();
 }

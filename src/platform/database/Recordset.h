@@ -1,4 +1,4 @@
-// The rows of a query, read and changed one at a time, with the behaviour of a client-side cursor.
+// Reads and changes the rows of a query, as a client-side cursor does.
 #pragma once
 
 #include "platform/database/Connection.h"
@@ -11,6 +11,7 @@
 
 namespace kest::db {
 
+/// The kind of a column, which determines the C++ type of its values.
 enum class Kind { Text, LongText, WholeNumber, Number, Flag, Date };
 
 /// A query fetched whole when it is opened. Columns are found without regard to case; of two columns with one name the
@@ -21,63 +22,65 @@ enum class Kind { Text, LongText, WholeNumber, Number, Flag, Date };
 class Recordset {
 public:
     Recordset();
-    /// A null connection is accepted here; `open` then throws NoObject.
+    /// A null connection is accepted, but open() then throws NoObject.
     explicit Recordset(ConnectionPtr connection);
     ~Recordset();
     Recordset(Recordset&&) noexcept;
     Recordset& operator=(Recordset&&) noexcept;
 
-    /// Fetches all rows of a SELECT and stands on the first. Throws StatementFailed, CannotOpen.
+    /// Fetches all rows of a SELECT. The first row becomes current. Throws StatementFailed or CannotOpen.
     void open(const QString& select);
-    /// Runs the query again and stands on the first row.
+    /// Runs the query again. The first row becomes current.
     void requery();
     void close();
     bool isOpen() const;
-    /// The rows live on without the connection; they can be read, moved through and filtered, but not updated.
+    /// Releases the connection. The rows can still be read, moved through and filtered, but not updated.
     void disconnect();
 
-    /// Declares a field of a table without a connection. Texts are cut to `size` characters; 0 is no limit.
+    /// Declares a field of a table without a connection. Texts are cut to `size` characters; 0 means no limit.
     void declare(const QString& name, Kind kind, int size = 0);
-    /// Opens the declared table, empty. Its pending row counts as a row.
+    /// Opens the declared table, which is empty. A pending row counts as a row.
     void openDeclared();
 
     bool eof() const;
     bool bof() const;
-    /// Rows that the filter shows, a pending new row included.
+    /// Returns the number of rows that the filter shows, including a pending new row.
     int recordCount() const;
-    /// The number of the current row from 1, among those that the filter shows; -1 where there is none.
+    /// Returns the number of the current row, counted from 1 among the rows that the filter shows, or -1 if there is
+    /// none.
     int absolutePosition() const;
     void setAbsolutePosition(int position);
     void moveFirst();
-    void moveNext();  // NoCurrentRow at eof
+    void moveNext();  // throws NoCurrentRow at eof
     void movePrevious();
     void moveLast();
 
-    /// Forward from the current row to one that matches, that row itself included; `eof` where there is none, and in an
-    /// empty recordset. `column='text'` or `column=number`, with = <> < <= > >= and LIKE; equality costs one index
-    /// probe.
+    /// Moves forward to the next row that matches, starting with the current row. If there is none, or if the recordset
+    /// is empty, eof() becomes true. A criterion is `column='text'` or `column=number`, with = <> < <= > >= or LIKE. A
+    /// search for equality uses an index.
     void find(const QString& criterion);
-    /// Shows only the rows that match, joined by AND where several are given; empty shows all. Stands on the first.
+    /// Shows only the rows that match all conditions, which are joined by AND. An empty text shows all rows. The first
+    /// row becomes current.
     void setFilter(const QString& criterion);
 
-    /// Throw NoCurrentRow, and NoSuchColumn for a name that the query does not give.
+    /// These throw NoCurrentRow, or NoSuchColumn if the query has no such column.
     QVariant value(const QString& column) const;
-    /// The value followed by an empty text: a Null is empty.
+    /// Returns the value as text, or an empty text for a Null.
     QString text(const QString& column) const;
     bool isNull(const QString& column) const;
-    /// Converts to the column's kind; throws TypeMismatch where that fails, and ValueTooLong for a text that a table's
-    /// column does not take, so that no engine cuts it or refuses it only when other rows are written. A null QVariant
-    /// sets Null.
+    /// Sets a column of the current row, converted to its kind. A null QVariant sets Null. Throws TypeMismatch if the
+    /// value can't be converted. Throws ValueTooLong if a text is longer than the column, so that no engine cuts it, or
+    /// refuses it only after other rows have been written.
     void set(const QString& column, const QVariant& value);
 
-    /// Appends a row, current at once, all columns unset.
+    /// Adds a row without values. It becomes current.
     void addNew();
-    /// Writes the columns whose value differs, to the row with the same key and the old values of those columns; a row
-    /// that is no longer so throws RowChanged. After an insert, identity and column defaults are read back.
-    /// Without a pending change nothing happens.
+    /// Stores the pending change, if there is one. Writes only columns whose value differs, to the row that still has
+    /// the same key and the old values of those columns. Throws RowChanged if there is no such row. After an insert,
+    /// reads the identity and the defaults of the columns.
     void update();
     void cancelUpdate();
-    /// Deletes the current row in its base table, and stands on the next.
+    /// Deletes the current row in its base table. The next row becomes current.
     void remove();
 
     QStringList columns() const;

@@ -1,4 +1,4 @@
-// What a recordset holds, for the two halves of its work: reading and moving, and writing changes back.
+// The data of a recordset, shared by the files that read rows and that write changes.
 #pragma once
 
 #include "platform/RuntimeError.h"
@@ -12,12 +12,13 @@
 
 namespace kest::db {
 
-/// The rows with one value, in their order.
+/// The rows with the same value, in order.
 using Bucket = std::vector<int>;
 using Index = QHash<QString, Bucket>;
 
 [[noreturn]] void failNoCurrentRow();
 
+/// The rows of a recordset, its position and its pending change.
 struct Recordset::Data {
     enum class Pending { None, Change, Insert };
 
@@ -28,18 +29,18 @@ struct Recordset::Data {
     bool disconnected = false;
 
     QList<ResultColumn> columns;
-    QHash<QString, int> columnNumbers;  // by the name in lower case; of two with one name the first
-    std::vector<QVariant> values;       // row behind row, removed ones included
-    std::vector<int> rows;              // those not removed
-    std::vector<int> visible;           // those that the filter shows
-    int position = 0;                   // among the visible ones; -1 before the first
+    QHash<QString, int> columnNumbers;  // by the name in lower case; the first one of two with the same name
+    std::vector<QVariant> values;       // all rows one after the other, including removed ones
+    std::vector<int> rows;              // the rows that have not been removed
+    std::vector<int> visible;           // the rows that the filter shows
+    int position = 0;                   // index into `visible`; -1 before the first row
 
     Pending pending = Pending::None;
-    std::vector<QVariant> original;  // of the row with the pending change
+    std::vector<QVariant> original;  // the values before the pending change
     std::vector<bool> assigned;
 
     QList<Criterion> filter;
-    QHash<int, Index> indexes;  // by column, made when a search first needs one
+    QHash<int, Index> indexes;  // by column; created by the first search that needs it
 
     void requireOpen() const
     {

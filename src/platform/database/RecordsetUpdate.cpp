@@ -1,4 +1,4 @@
-// Writes a recordset's pending change to the base tables that its columns come from.
+// Writes the pending change of a recordset to the base tables of its columns.
 #include "platform/database/RecordsetData.h"
 
 #include <algorithm>
@@ -79,7 +79,8 @@ int Recordset::Data::resultColumn(const QString& table, const QString& name) con
     return -1;
 }
 
-/// The condition for the current row in a table: its primary key, or all selected columns where the key is not there.
+/// Returns the condition for the current row in a table: its primary key, or all selected columns if the query does not
+/// contain the key.
 QString Recordset::Data::keyCondition(const TableInfo& table)
 {
     const auto before = [&](int column) {
@@ -105,7 +106,7 @@ QString Recordset::Data::keyCondition(const TableInfo& table)
     return conditions.join(u" AND "_s);
 }
 
-/// Where the engine can't compare long texts in a condition, the ones about to be written are read again.
+/// If the engine can't compare long texts in a condition, reads those that will be written again and compares them.
 void Recordset::Data::checkLongTexts(const TableInfo& table, const QString& key)
 {
     QList<int> longTexts;
@@ -180,7 +181,7 @@ void Recordset::Data::writeInsert(const QString& tableName)
     readBack(*table, session().insert(*table, names, literals));
 }
 
-/// What the database itself put into the new row: its identity and the defaults of the columns that were not set.
+/// Reads what the database has set in the new row: its identity, and the defaults of the columns without a value.
 void Recordset::Data::readBack(const TableInfo& table, const QVariant& identity)
 {
     QList<int> wanted;
@@ -209,7 +210,7 @@ void Recordset::Data::readBack(const TableInfo& table, const QVariant& identity)
         store(row(), wanted[i], stored.values[size_t(i)]);
 }
 
-/// A table without identity: the row with all the values that were set.
+/// Finds a row in a table without an identity by all the values that were set.
 QString Recordset::Data::insertedRow(const TableInfo& table)
 {
     QStringList conditions{u"1=1"_s};

@@ -1,4 +1,4 @@
-// What is known of a database's tables and columns.
+// Describes the tables and columns of a database.
 #pragma once
 
 #include "platform/database/Recordset.h"
@@ -9,34 +9,39 @@
 
 namespace kest::db {
 
+/// A column of a table.
 struct TableColumn {
     QString name;
     Kind kind = Kind::Text;
-    int size = 0;    // of a text in characters; 0 is no limit
-    int scale = -1;  // digits after the point of an exact number; -1 for a floating one
+    int size = 0;    // characters of a text; 0 means no limit
+    int scale = -1;  // digits after the point of an exact number; -1 for a floating-point number
     bool identity = false;
     bool hasDefault = false;
 };
 
+/// A table of the database.
 struct TableInfo {
     QString name;  // the schema's spelling
     QList<TableColumn> columns;
     QStringList key;  // the columns of the primary key; empty if there is none
 
+    /// Returns the column with that name, in any case, or null.
     const TableColumn* column(const QString& name) const;
+    /// Returns the identity column, or null if there is none.
     const TableColumn* identity() const;
 };
 
+/// Looks up the tables of a database.
 class Schema {
 public:
     virtual ~Schema() = default;
-    /// Null for a table that the database does not have.
+    /// Returns a table, or null if the database does not have it.
     virtual const TableInfo* table(const QString& name) = 0;
-    /// The table's name as the database spells it; empty if there is no such table.
+    /// Returns a table's name in the spelling of the database, or an empty text if there is no such table.
     virtual QString tableSpelling(const QString& name) = 0;
 };
 
-/// What a column of that declared type holds.
+/// Returns the kind of a column with that declared type.
 Kind kindOfType(const QString& declaredType);
 
 }  // namespace kest::db

@@ -35,7 +35,7 @@ public:
     }
 
 private:
-    /// Splits the statement at the commas and words that stand in no parentheses.
+    /// Splits the statement at the commas and keywords outside of parentheses.
     void readItems(Index select)
     {
         Index i = afterTop(tokens.next(select));
@@ -72,10 +72,10 @@ private:
         return tokens.isAt(i, u"TOP") ? tokens.next(tokens.next(i)) : i;
     }
 
-    /// True if a table follows, or a query in parentheses in its place.
+    /// Returns true if a table, or a query in parentheses, follows.
     bool isPlaceOfTable(Index i) const { return tokens.isAt(i, u",") || namesTables(tokens.at(i)); }
 
-    /// False if nobody knows how many columns it is.
+    /// Adds the columns of an item. Returns false if their number is unknown.
     bool take(const Item& item)
     {
         if (item.last == Tokens::none)
@@ -105,7 +105,8 @@ private:
         return true;
     }
 
-    /// The largest and the smallest value of a column are values of that column: leaves the place of its name.
+    /// Returns true for MAX(column) and MIN(column), whose results are values of the column, and sets `first` and
+    /// `last` to its name.
     bool isWorkedOut(Index& first, Index& last) const
     {
         if (!(tokens.isAt(first, u"MAX") || tokens.isAt(first, u"MIN")) || !tokens.isAt(tokens.next(first), u"(") ||
@@ -133,7 +134,7 @@ private:
         return isKnown && (ofOne || isComplete);
     }
 
-    /// The table of "column" or "table.column"; none for anything else.
+    /// Returns the table of "column" or "table.column", or null for anything else.
     const NamedTable* tableOf(Index first, Index last)
     {
         if (!tokens.at(last).isIdentifier())
@@ -157,7 +158,7 @@ private:
         return qualified || isComplete ? found : nullptr;
     }
 
-    /// A table that is there twice would be searched by the key of the wrong row.
+    /// Returns false for a table that occurs twice, because the key might be that of the other row.
     bool isChangeable(const NamedTable& table) const
     {
         return canChange && std::count_if(tables.begin(), tables.end(), [&](const NamedTable& other) {

@@ -1,4 +1,5 @@
-// Where the columns of a query come from, by the statement and the schema: drivers tell it in part, or not at all.
+// Finds out from the statement and the schema where the columns of a query come from. Drivers say this only in part or
+// not at all.
 #pragma once
 
 #include "platform/database/Schema.h"
@@ -13,12 +14,13 @@ namespace kest::db {
 
 /// A column of the select list.
 struct SelectedColumn {
-    QString name;                     // as the result names it; empty if the database makes a name up
-    QString table;                    // where it can be changed, in the schema's spelling; empty: read only
-    std::optional<TableColumn> base;  // whose values it shows; none for an expression
+    QString name;   // its name in the result; empty if the database invents one
+    QString table;  // the table in which it can be changed, in the schema's spelling; empty if it is read-only
+    std::optional<TableColumn> base;  // the column whose values it shows; empty for an expression
 };
 
-/// None if the statement is no SELECT from tables, or if it can't be said how many columns it gives.
+/// Returns the columns of a SELECT. Returns nothing if the statement is not a SELECT from tables, or if the number of
+/// its columns is unknown.
 std::optional<QList<SelectedColumn>> selectedColumns(const Tokens& tokens, Schema& schema);
 
 }  // namespace kest::db

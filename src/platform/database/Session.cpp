@@ -23,15 +23,15 @@ bool isNamed(const SelectedColumn& column, const QString& name)
     return column.name.isEmpty() || column.name.compare(name, Qt::CaseInsensitive) == 0;
 }
 
-/// True if the statement's account of its columns is that of the result.
+/// Returns true if the columns of the statement agree with those of the result.
 bool fits(const std::optional<QList<SelectedColumn>>& selected, const QStringList& names)
 {
     if (!selected)
-        return true;  // it has none
+        return true;  // a statement without columns
     return std::equal(selected->begin(), selected->end(), names.begin(), names.end(), isNamed);
 }
 
-/// A column that the statement does not tell, or tells otherwise than the result, can only be read.
+/// Returns the columns of a result. A column that the statement does not show, or shows differently, is read-only.
 QList<ResultColumn> described(const std::optional<QList<SelectedColumn>>& selected, const Answer& answer)
 {
     const bool known = selected && selected->size() == answer.names.size();
@@ -45,7 +45,7 @@ QList<ResultColumn> described(const std::optional<QList<SelectedColumn>>& select
             column.kind = base.kind;
             column.size = base.size;
             column.scale = base.scale;
-        } else {  // by its first value
+        } else {  // the kind of its first value
             const size_t width = size_t(answer.names.size());
             for (size_t value = size_t(i); value < answer.values.size(); value += width) {
                 if (answer.values[value].isNull())
@@ -86,7 +86,7 @@ Rows Session::select(const QString& statement)
     Translated query = translated(statement, dialect(), *this);
     checkFault();
     Answer answer = engine_->run(query.text);
-    if (!fits(query.columns, answer.names)) {  // the host has changed the table meanwhile
+    if (!fits(query.columns, answer.names)) {  // the host has changed the table
         forgetSchema();
         query = translated(statement, dialect(), *this);
     }

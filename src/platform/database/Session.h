@@ -1,4 +1,4 @@
-// One open database as connection and recordset use it: statements are translated, results described, values converted.
+// An open database as Connection and Recordset use it: translates statements, describes results and converts values.
 #pragma once
 
 #include "platform/database/Engine.h"
@@ -17,15 +17,16 @@
 
 namespace kest::db {
 
+/// A column of a result.
 struct ResultColumn {
     QString name;
-    QString table;  // the base table in the schema's spelling; empty for a column that can't be changed
+    QString table;  // the base table in the schema's spelling; empty if the column can't be changed
     Kind kind = Kind::Text;
     int size = 0;
-    int scale = -1;  // as TableColumn has it
+    int scale = -1;  // as in TableColumn
 };
 
-/// A result fetched whole, row after row.
+/// A completely fetched result, one row after the other.
 struct Rows {
     QList<ResultColumn> columns;
     std::vector<QVariant> values;
@@ -33,6 +34,7 @@ struct Rows {
     int count() const { return columns.isEmpty() ? 0 : int(values.size()) / int(columns.size()); }
 };
 
+/// A database and its schema. Each statement commits alone.
 class Session final : Schema {
 public:
     explicit Session(std::unique_ptr<Engine> engine) : engine_(std::move(engine)) {}
@@ -40,18 +42,24 @@ public:
     Engine& engine() const { return *engine_; }
     const Dialect& dialect() const { return engine_->dialect(); }
 
-    // In the dialect of SQL Server:
+    // These statements are in the dialect of SQL Server.
+
+    /// Runs a query and returns its rows.
     Rows select(const QString& statement);
+    /// Executes any other statement and returns the number of rows that it affects.
     qint64 execute(const QString& statement);
 
-    // In the engine's own dialect, as the recordset builds them:
-    /// A query whose columns are known.
+    // These statements are in the engine's own dialect. The recordset builds them.
+
+    /// Runs a query whose columns are known.
     Rows selectNative(const QString& statement, const QList<ResultColumn>& columns);
+    /// Executes any other statement and returns the number of rows that it affects.
     qint64 executeNative(const QString& statement);
-    /// Inserts the values and returns the identity that the database gave; Null if the table has none.
+    /// Inserts a row and returns its identity, or Null if the table has none.
     QVariant insert(const TableInfo& table, const QStringList& columns, const QStringList& literals);
 
-    /// Null for a table that the database does not have. Asked once a connection; valid until a definition changes.
+    /// Returns a table, or null if the database does not have it. Asks the database only once. The result is valid
+    /// until a definition changes.
     const TableInfo* table(const QString& name) override;
 
 private:
@@ -60,7 +68,7 @@ private:
     void forgetSchema();
 
     std::unique_ptr<Engine> engine_;
-    QHash<QString, QString> spellings;  // lower case to the schema's spelling
+    QHash<QString, QString> spellings;  // from lower case to the schema's spelling
     QHash<QString, std::shared_ptr<TableInfo>> tables;
     bool spellingsKnown = false;
 };

@@ -1,4 +1,4 @@
-// Statements are pasted text: the one place that pastes values.
+// Builds statements. All values are pasted into statements here.
 #pragma once
 
 #include <QString>
@@ -8,16 +8,16 @@
 
 namespace kest::db {
 
-/// Fills each "{}" of a statement or a criterion, in order. Inside single quotes a value is text (a Null is empty) and
-/// its quotes are doubled; outside quotes it must be a number or a flag, and a Null is pasted as NULL, which finds no
-/// row. Throws TypeMismatch for a value outside quotes that is no number.
+/// Replaces each "{}" of a statement or criterion by the next value. In single quotes, a value is text with its quotes
+/// doubled, and a Null is an empty text. Outside of quotes, it must be a number or a flag, and a Null becomes NULL,
+/// which finds no row. Throws TypeMismatch for any other value outside of quotes.
 QString pasted(const QString& statement, std::initializer_list<QVariant> values);
 
 }  // namespace kest::db
 
 namespace kest {
 
-/// sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE={}", number, subquote)
+/// For example sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE={}", number, subquote).
 template <class... Values>
 QString sql(const char* statement, const Values&... values)
 {

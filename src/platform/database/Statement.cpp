@@ -14,7 +14,7 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-/// One statement on its way from one dialect to the other. Each step below changes tokens in place.
+/// Translates a statement. Each step changes its tokens in place.
 class Translation {
 public:
     Translation(const QString& statement, const Dialect& wanted, Schema& known)
@@ -108,7 +108,7 @@ private:
         return table ? table->column(column) : nullptr;
     }
 
-    /// The column whose name ends at a token, or none; `first` is set to where the name begins.
+    /// Returns the column whose name ends at a token, or null. Sets `first` to the beginning of the name.
     const TableColumn* columnEndingAt(Index i, Index* first = nullptr)
     {
         if (i == none || !at(i).isIdentifier())
@@ -168,14 +168,14 @@ private:
         const TableColumn* column = columnEndingAt(isAt(before, u"NOT") ? previous(before) : before);
         const Index start = next(next(in));
         if (isAt(start, u"SELECT"))
-            return;  // the literals of an inner query meet its own columns
+            return;  // the literals of an inner query are compared with its own columns
         for (Index i = start; column && i != none && !isAt(i, u")"); i = next(i)) {
             if (at(i).part == Part::Literal)
                 writeLiteral(at(i), column, u"="_s, false);
         }
     }
 
-    /// A literal that meets a number, flag or date column is written as that kind of value.
+    /// Writes a literal that is compared with a number, flag or date column as a value of that kind.
     void writeLiteral(Token& literal, const TableColumn* column, const QString& comparison, bool assigned)
     {
         if (!column || column->kind == Kind::Text || column->kind == Kind::LongText)
@@ -196,7 +196,7 @@ private:
             literal = {Part::Number, u"1"_s};
         else if (column->kind == Kind::Flag && text.compare(u"false", Qt::CaseInsensitive) == 0)
             literal = {Part::Number, u"0"_s};
-        else if (!assigned)  // every number differs from it, and none equals it or stands before or behind it
+        else if (!assigned)  // every number is unequal to it, and none is equal, less or greater
             literal = {Part::Number, comparison == u"<>" || comparison == u"!=" ? u"1.7e308"_s : u"NULL"_s};
     }
 
@@ -206,8 +206,8 @@ private:
         return plain.match(text).hasMatch() ? text : QString::number(number, 'g', 17);
     }
 
-    /// Where LIKE takes trailing blanks at their word and knows no sets: a pattern with a set becomes a regular
-    /// expression, and a pattern without "%" at its end is held against the text without its trailing blanks.
+    /// For databases whose LIKE compares trailing blanks and has no sets: turns a pattern with a set into a regular
+    /// expression, and compares a pattern without "%" at its end with the text without its trailing blanks.
     void writePatterns()
     {
         for (Index i = 0; i < count(); ++i) {
@@ -266,7 +266,7 @@ private:
         return column && (column->kind == Kind::Text || column->kind == Kind::LongText);
     }
 
-    /// A "+" beside a text joins texts, and so does each "+" of the same chain.
+    /// A "+" next to a text joins texts, and so do all "+" of the same chain.
     void joinTexts()
     {
         bool chain = false;
@@ -313,7 +313,7 @@ private:
         }
     }
 
-    /// behind the last token of the SELECT at `i`: the parenthesis that closes around it, or the end.
+    /// Returns the end of the SELECT at `i`: the closing parenthesis around it, or the end of the statement.
     Index endOfSelect(Index i)
     {
         int depth = 0;

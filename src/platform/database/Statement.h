@@ -1,4 +1,4 @@
-// Statements are written in the dialect of SQL Server; this turns one into the dialect of the engine that answers.
+// Translates statements from the dialect of SQL Server to that of another engine.
 #pragma once
 
 #include "platform/database/Dialect.h"
@@ -11,14 +11,15 @@
 
 namespace kest::db {
 
+/// A translated statement.
 struct Translated {
     QString text;
-    std::optional<QList<SelectedColumn>> columns;  // of a query, as far as the statement tells them
+    std::optional<QList<SelectedColumn>> columns;  // the columns of a query, as far as the statement shows them
 };
 
-/// Throws StatementFailed if a second statement follows a ";". Nothing inside a literal is touched, but a literal that
-/// is compared with a number column becomes the number that it means: "''" is 0, and a text that is no number equals no
-/// number.
+/// Translates a statement. The text of literals is not changed, but a literal that is compared with a number column
+/// becomes a number: "''" is 0, and a text that is not a number equals no number. Throws StatementFailed if a second
+/// statement follows a ";".
 Translated translated(const QString& statement, const Dialect& dialect, Schema& schema);
 
 }  // namespace kest::db

@@ -17,7 +17,7 @@ bool startsWord(QChar c)
     return c.isLetter() || c == u'_' || c == u'@' || c == u'#' || c == u'$';
 }
 
-/// Where the text in quotes ends, after the closing one; a doubled closing quote stands for itself.
+/// Returns the index after the closing quote. A doubled closing quote is a quote in the text.
 qsizetype endOfQuoted(const QString& statement, qsizetype start, QChar close)
 {
     for (qsizetype i = start + 1; i < statement.size(); ++i) {
@@ -124,7 +124,7 @@ QList<NamedTable> tablesAfter(const Tokens& tokens, Tokens::Index keyword)
     for (auto i = tokens.next(keyword); i != Tokens::none && tokens.at(i).isIdentifier();) {
         QString table = tokens.at(i).name();
         i = tokens.next(i);
-        while (tokens.isAt(i, u".") && tokens.next(i) != Tokens::none) {  // of another schema: no table that we know
+        while (tokens.isAt(i, u".") && tokens.next(i) != Tokens::none) {  // a table of another, unknown schema
             i = tokens.next(i);
             table += u'.' + tokens.at(i).name();
             i = tokens.next(i);

@@ -1,4 +1,4 @@
-// A statement in its smallest parts.
+// Splits statements into tokens.
 #pragma once
 
 #include <QString>
@@ -7,34 +7,38 @@
 
 namespace kest::db {
 
+/// The kind of a token.
 enum class Part { Blank, Word, Name, Literal, Number, Symbol };  // Name: an identifier in brackets or quotes
 
+/// A part of a statement, such as a word or a literal.
 struct Token {
     Part part;
     QString text;
 
     bool is(QStringView word) const { return part != Part::Literal && text.compare(word, Qt::CaseInsensitive) == 0; }
     bool isIdentifier() const { return part == Part::Word || part == Part::Name; }
-    /// The identifier without its brackets or quotes.
+    /// Returns the identifier without its brackets or quotes.
     QString name() const { return part == Part::Name ? text.sliced(1, text.size() - 2) : text; }
-    /// What a literal says.
+    /// Returns the text of a literal.
     QString value() const;
 };
 
+/// The tokens of a statement.
 class Tokens {
 public:
     using Index = qsizetype;
     static constexpr Index none = -1;
 
-    /// Throws StatementFailed for a quotation mark that is not closed.
+    /// Throws StatementFailed if a quotation mark is not closed.
     explicit Tokens(const QString& statement);
 
     Index count() const { return Index(tokens.size()); }
     Token& at(Index i) { return tokens[size_t(i)]; }
     const Token& at(Index i) const { return tokens[size_t(i)]; }
     bool isAt(Index i, QStringView word) const { return i != none && at(i).is(word); }
-    /// The next one that is not blank, or none.
+    /// Returns the next token that is not blank, or none.
     Index next(Index i) const;
+    /// Returns the previous token that is not blank, or none.
     Index previous(Index i) const;
 
     void insert(Index before, Token token) { tokens.insert(tokens.begin() + before, std::move(token)); }
@@ -48,15 +52,16 @@ private:
     std::vector<Token> tokens;
 };
 
-/// A table that a statement names.
+/// A table in a statement.
 struct NamedTable {
     QString table;
-    QString alias;  // the table's own name if it has no other
+    QString alias;  // the name of the table if it has no alias
 
+    /// Returns true if the qualifier of a column means this table.
     bool answersTo(QStringView qualifier) const;
 };
 
-/// The tables listed after the FROM, JOIN, INTO or UPDATE at that place.
+/// Returns the tables after the FROM, JOIN, INTO or UPDATE at that index.
 QList<NamedTable> tablesAfter(const Tokens& tokens, Tokens::Index keyword);
 bool namesTables(const Token& token);
 

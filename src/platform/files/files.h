@@ -31,6 +31,7 @@ QByteArray readBytes(const QString& path);
 /// A variant of the name in another case is replaced and takes the new spelling. Characters outside the code page
 /// become "?".
 void write(const QString& path, const QString& text);
+/// Who can read a written file.
 enum class Access { AsBefore, OwnerAlone };
 void writeBytes(const QString& path, const QByteArray& bytes, Access access = Access::AsBefore);
 /// Takes the rights of everybody but the owner.

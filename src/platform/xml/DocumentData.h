@@ -14,6 +14,7 @@
 
 namespace kest::xml {
 
+/// A document of libxml2, and what this layer knows about it.
 struct DocumentData {
     DocumentData();
     ~DocumentData();

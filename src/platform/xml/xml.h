@@ -17,6 +17,7 @@ enum class NodeType { Element = 1, Attribute = 2, Text = 3, CDataSection = 4, Pr
 constexpr quint32 BareAmpersand = 0xC00CE513;
 constexpr quint32 SecondRoot = 0xC00CE555;
 
+/// Why the last parse failed.
 struct ParseError {
     quint32 errorCode = 0;  // 0: the last parse succeeded
     QString reason;
@@ -25,6 +26,7 @@ struct ParseError {
     int linePosition = 0;
 };
 
+/// An attribute or a namespace declaration.
 struct Attribute {
     QString name;  // with its prefix; a namespace declaration is "xmlns" or "xmlns:prefix"
     QString value;
