@@ -263,7 +263,7 @@ bool showsTransport(const CommandLine& line)
     return line.command == u"transport"_s && line.arguments.contains(u"--window"_s);
 }
 
-/// Why there is no profile to work on; empty if there is one.
+/// Returns why there is no usable profile, or an empty text if there is one.
 QString profileFault()
 {
     if (!QFileInfo::exists(profile::root() + u"/registry.ini"_s))

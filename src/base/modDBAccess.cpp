@@ -91,11 +91,11 @@ void OpenDatabase()
     attempt([&] {
         try {
             readConnectionSettings();
-            settings::check();  // a damaged file must not lead to the database of the defaults
+            settings::check();  // a damaged file must not open the database of the default settings
             gcnDB->open(connectionText(driverNumber()));
         } catch (const RuntimeError& error) {
             lastFailure = error;
-            if (error.description() != failureBefore)  // each event of an open window tries again
+            if (error.description() != failureBefore)  // only once, because each event of an open window tries again
                 logFailure(error, u"modDBAccess.OpenDatabase"_s);
         }
     });

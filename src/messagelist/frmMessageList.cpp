@@ -200,7 +200,7 @@ bool frmMessageList::load(const QString& file)
             tmrRefresh->start();
             return false;
         }
-        text.clear();  // a large one would be in memory twice
+        text.clear();  // otherwise a large text would be in memory twice
         MoveMessage(file, u"read"_s);
         RefreshList();
         if (files::exists(gsCurFolder + file))

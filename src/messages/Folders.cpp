@@ -129,7 +129,7 @@ void MoveMessage(const QString& file, const QString& action)
             gsMatchedQTNNO.isEmpty() ? GetReadFileName(gsUnreadPath + file) : GetMatchedFileName(gsMatchedQTNNO);
         if (name.isEmpty())
             name = file;
-        // an older message of that name goes only when its successor is there: the disk may be full
+        // replace an older message of that name only after the copy exists, because the disk may be full
         const bool copied = attempt([&] { files::copy(gsUnreadPath + file, gsReadPath + name); });
         if (copied && files::exists(gsReadPath + name))
             attempt([&] { files::remove(gsUnreadPath + file); });

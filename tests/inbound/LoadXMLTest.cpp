@@ -51,7 +51,7 @@ TEST_F(Dispatcher, AFailingLogAddsNoBox)
 {
     quote("500").line(1);
     QFile::remove(files::systemPath(errorLogPath()));
-    files::makeFolder(errorLogPath());  // in the way
+    files::makeFolder(errorLogPath());  // a folder with the name of the file
     arrive("m.xml", authorisedQuote("500").labour(1, "Z"));
     EXPECT_FALSE(loadAsTheWindow(u"m.xml"_s));
     const std::string boxes = shown();

@@ -199,7 +199,7 @@ TEST_F(Files, AFileThatIsHeldGoesInTheBackground)
 
 TEST_F(Files, ANameThatIsNoUtf8IsOneLikeAnyOther)
 {
-    const QString emoji = u"\U0001F480.xml"_s;  // half of its character looks like a byte
+    const QString emoji = u"\U0001F480.xml"_s;  // half of the character looks like the code for a byte
     files::write(box + emoji, u"1"_s);
     for (const char* name : {"caf\xe9.xml", "\xff\xfe", "Gr\xc3\xbc\xdf.xml"}) {
         const int made = ::creat((onDisk({}).toUtf8() + name).constData(), 0644);

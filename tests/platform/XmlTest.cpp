@@ -45,7 +45,7 @@ QString names(const QList<Node>& nodes)
     return all.join(u' ');
 }
 
-/// Pieces with a number each.
+/// Returns text pieces with numbers.
 QString numbered(const QString& piece, int count)
 {
     QString text;
@@ -60,7 +60,7 @@ QString megabyteOf(const QString& piece)
 }
 
 #if defined(__SANITIZE_ADDRESS__)
-constexpr bool memoryIsReal = false;  // the sanitizer keeps what is freed
+constexpr bool memoryIsReal = false;  // the sanitizer keeps released memory
 constexpr double slowness = 10;
 #elif defined(__OPTIMIZE__)
 constexpr bool memoryIsReal = true;
@@ -75,7 +75,7 @@ struct Cost {
     double megabytes = 0;
 };
 
-/// The most memory that this process has held since the last reset, in megabytes.
+/// Returns the most memory that this process has used since the last reset, in megabytes.
 double peakMemory(bool reset)
 {
     if (reset) {
@@ -89,7 +89,7 @@ double peakMemory(bool reset)
     return all.sliced(at, all.indexOf(" kB", at) - at).trimmed().toDouble() / 1024;
 }
 
-/// What a parse takes beside the text itself.
+/// Returns the memory that a parse uses in addition to the text, in megabytes.
 Cost costOf(const QString& text, const QString& expected)
 {
     ::malloc_trim(0);

@@ -1,4 +1,4 @@
-// A disk without room.
+// Simulates a full disk.
 #pragma once
 
 #include <QtGlobal>

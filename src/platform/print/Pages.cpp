@@ -27,7 +27,7 @@ constexpr double margin = 15;       // millimetres
 constexpr int pdfResolution = 600;  // dots per inch
 constexpr double gap = 6;           // points between the body and header or footer
 constexpr double pointsPerInch = 72;
-constexpr double leastRoom = 36;  // points of a page that the body needs: three lines
+constexpr double leastRoom = 36;  // points that the body needs on a page: three lines
 
 double heightOf(const QTextDocument& document)
 {
@@ -158,7 +158,7 @@ void Pages::slice()
             ++next;
         if (next < pieces.size())
             page.bottom = next > first ? pieces[next].top : lastLineAbove(top, limit);
-        if (page.bottom <= top)  // pieces side by side
+        if (page.bottom <= top)  // if pieces are side by side
             page.bottom = limit;
         slices.append(page);
         top = page.bottom;
