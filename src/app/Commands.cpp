@@ -125,7 +125,7 @@ QJsonArray settingsAsJson()
 }
 
 /// Reads a password from standard input, so that it appears neither in the list of processes nor in a shell's history.
-/// Returns nothing if a connection text can't hold it.
+/// Returns nothing if a connection text can't contain it.
 std::optional<QString> passwordFromInput()
 {
     QFile input;

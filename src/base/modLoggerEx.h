@@ -13,7 +13,7 @@ enum LogMode : int { BoxOnly = 0, BoxAndFile = 1 };
 /// can't be written, the box says so, and the failure is thrown as one that the user knows already (`isTold`).
 void LogError(int line, const QString& source, const QString& number, const QString& description, const QString& title,
               int mode);
-/// Reports an exception with a box and a record. Throws one that the user knows already again.
+/// Reports an exception with a box and a record. If a box has already shown it, only throws it again.
 void LogError(const RuntimeError& error, const QString& source, const QString& title);
 
 /// Adds a record without a box. Throws RuntimeError if the file can't be written.

@@ -262,7 +262,7 @@ void takeSublet(const db::Recordset& quote, db::Recordset& row, const MessageLin
     storeWithItemNo(row);
 }
 
-/// Throws for a line that says to do something unknown.
+/// Returns the quote body. Throws TypeMismatch if a line has an unknown change indicator.
 xml::Node bodyOf(const xml::Document& message)
 {
     const xml::Node body = message.selectSingleNode(u"rootns:quoteBody"_s);

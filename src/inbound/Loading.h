@@ -1,4 +1,4 @@
-// What the loaders share: how they fill rows and how they refuse.
+// Functions that all loaders share.
 #pragma once
 
 #include "platform/database/Recordset.h"

@@ -1,4 +1,4 @@
-// Finds the numbers that a load gives: those of quotes, of images, of lines and their documents, and item codes.
+// Finds the numbers that a load needs: those of quotes, images, lines and documents, and item codes.
 #pragma once
 
 #include "platform/database/Connection.h"

@@ -44,13 +44,14 @@ bool parseWithRepairs(xml::Document& document, QString& text);
 /// Adds the schema-instance declaration to `text` and parses it. The caller must check `parseError` of the result.
 xml::Document parsedMessage(QString& text);
 
-/// A parsed message that several may read and nobody changes.
+/// A parsed message that several routines read and none changes.
 using SharedMessage = std::shared_ptr<const xml::Document>;
-/// As parsedMessage(), but hands on the document of the last call if a KeptMessage lives and the text is the same.
+/// Does the same as parsedMessage(), but returns the document of the last call if a KeptMessage exists and the text is
+/// the same.
 SharedMessage sharedMessage(QString& text);
 
-/// While one lives, the last document of sharedMessage() is kept: the steps of a load get the same text one after the
-/// other. It is not kept longer, because a message can hold documents of many megabytes.
+/// While an object exists, the last document of sharedMessage() is kept, because the steps of a load read the same text
+/// one after the other. It is not kept longer, because a message can contain documents of many megabytes.
 class KeptMessage {
 public:
     KeptMessage();

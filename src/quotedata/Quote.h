@@ -1,4 +1,4 @@
-// A quote's records: the one place that opens header, lines and notes by their key.
+// Opens the header, the lines and the notes of a quote.
 #pragma once
 
 #include "base/QuoteKey.h"
@@ -8,13 +8,14 @@
 
 namespace kest {
 
-/// A quote in the host's tables. Opens each of its recordsets on `gConn` when it is first asked for. They can be changed
-/// and updated. Throws RuntimeError if one can't be opened.
+/// A quote in the host's tables. Opens each of its recordsets on `gConn` when it is first asked for. They can be
+/// changed and updated. Throws RuntimeError if one can't be opened.
 class Quote {
 public:
-    /// The quote with this key.
+    /// Refers to the quote with this key.
     explicit Quote(QuoteKey key);
-    /// A quote that another statement has found. `header` is on its row, or at `eof` if there is none.
+    /// Refers to a quote that another statement has found. Its row is current in `header`, which is at eof() if there
+    /// is none.
     explicit Quote(db::Recordset header);
     /// The same, but with the lines and notes of `key`.
     Quote(QuoteKey key, db::Recordset header);

@@ -73,7 +73,7 @@ bool hasConnection()
 {
     gConn = GetConnection();
     if (!gConn) {
-        constexpr qsizetype longestReason = 300;  // characters; all of it is in the error log
+        constexpr qsizetype longestReason = 300;  // characters; the error log contains the whole text
         desktop::msgBox(u"Could not connect to the quote database, Please contact MarlinDesk Support.\r\n\r\n"_s +
                             connectionFailure().left(longestReason),
                         desktop::Icon::Critical);

@@ -1,4 +1,4 @@
-// A load parses its message once, however many of its steps ask for it.
+// Tests that a load parses its message only once.
 #include "messagelist/frmMessageList.h"
 #include "support/Shop.h"
 
@@ -10,7 +10,7 @@ int parses = 0;
 
 }  // namespace
 
-/// Stands in front of the parser's own function.
+/// Replaces the function of the parser.
 extern "C" __attribute__((visibility("default"))) void* xmlCtxtReadMemory(void* parser, const char* text, int size,
                                                                           const char* url, const char* encoding,
                                                                           int options)

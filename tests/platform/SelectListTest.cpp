@@ -1,4 +1,4 @@
-// Where the columns of a query come from, by its own words.
+// Tests that the columns of a query are found from its text.
 #include "platform/database/SelectList.h"
 #include "support/Cases.h"
 

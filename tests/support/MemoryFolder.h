@@ -7,7 +7,7 @@
 
 namespace kest::test {
 
-/// A template for QTemporaryDir, in memory if there is room: databases and files that are written safely wait for the
+/// Returns a template for QTemporaryDir, in memory if there is room, because databases and safe writes wait for the
 /// disk at each change.
 inline QString memoryFolder(const QString& use)
 {

@@ -24,7 +24,7 @@ constexpr auto pause = std::chrono::milliseconds(100);
 
 QStringList waiting;  // paths of this system
 
-/// Identifies the file itself: a later file of the same name is another message.
+/// Returns what identifies the file itself, because a later file of the same name is another message.
 QJsonArray stateOf(const QString& file)
 {
     const QFileInfo info(file);
@@ -36,7 +36,7 @@ QString listOfRemovals()
     return profile::root() + u"/removals.json"_s;
 }
 
-/// The files of the list that are still those which were to be deleted.
+/// Returns the files of the list that have not been replaced since.
 QStringList remembered()
 {
     QStringList files;
@@ -74,7 +74,7 @@ void tryAll()
     });
 }
 
-/// Tries again while there are events, which is while a window is open.
+/// Tries again later, as long as events are processed, which is while a window is open.
 void tryLater()
 {
     static QPointer<QTimer> timer;

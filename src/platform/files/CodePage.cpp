@@ -10,7 +10,8 @@ namespace kest::files {
 
 namespace {
 
-// The bytes 0x80 to 0x9F; those without a character of their own stand for the control character of their number.
+// The characters of the bytes 0x80 to 0x9F. A byte without a character of its own is the control character with its
+// number.
 constexpr char16_t upperControls[] = {
     0x20AC, 0x0081, 0x201A, 0x0192, 0x201E, 0x2026, 0x2020, 0x2021, 0x02C6, 0x2030, 0x0160,
     0x2039, 0x0152, 0x008D, 0x017D, 0x008F, 0x0090, 0x2018, 0x2019, 0x201C, 0x201D, 0x2022,
@@ -45,7 +46,7 @@ QByteArray toCodePage(const QString& text)
         const bool pair = text[i].isHighSurrogate() && i + 1 < text.size() && text[i + 1].isLowSurrogate();
         *out++ = byteOf(text[i].unicode());
         if (pair)
-            ++i;  // two units, one character
+            ++i;  // a surrogate pair is a single character
     }
     bytes.truncate(out - bytes.constData());
     return bytes;

@@ -1,12 +1,12 @@
-// Makes a file operation fail on purpose, so that a test sees what a full disk or a locked file leaves behind.
+// Makes file operations fail in tests, as a full disk or a locked file would.
 #pragma once
 
 #include <functional>
 
 namespace kest::files {
 
-/// Asked before each read, write, append, copy, move and removal of a file; true makes it fail as FileInputOutput.
-/// An empty function takes it away.
+/// Sets a function that is called before each read, write, append, copy, move and removal of a file. If it returns
+/// true, the operation fails with FileInputOutput. An empty function turns this off.
 void setFault(std::function<bool()> fault);
 
 }  // namespace kest::files

@@ -14,7 +14,7 @@ namespace kest::files {
 
 namespace {
 
-/// The byte of the file that stands for a name; it need not be there to be locked.
+/// Returns the byte of the file whose lock belongs to a name. The byte need not exist.
 qint64 byteOf(const QString& name)
 {
     if (name.isEmpty())

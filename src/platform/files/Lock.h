@@ -1,4 +1,4 @@
-// A lock between processes that the system frees with the process that holds it.
+// A lock between processes. If a process ends, the system releases its locks.
 #pragma once
 
 #include <QString>
@@ -9,11 +9,11 @@ namespace kest::files {
 
 class SystemFile;
 
-/// Held by one object at a time among all that ask for the same name in the same file, in this process or another one.
-/// The file only carries the locks: it stays behind, and what is in it does not matter.
+/// A lock on a name in a file. Only one object can hold it at a time, in this process and all others. The file is never
+/// deleted, and its content does not matter.
 class Lock {
 public:
-    /// Waits so long for another one to let go. Throws if the file cannot be opened or carries no locks.
+    /// Tries to get the lock and waits up to this time. Throws RuntimeError if the file can't be opened or locked.
     explicit Lock(const QString& path, const QString& name = {}, int milliseconds = 0);
     ~Lock();
     Lock(const Lock&) = delete;

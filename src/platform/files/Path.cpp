@@ -34,13 +34,13 @@ bool isDriveLetter(QChar c)
     return (c >= u'a' && c <= u'z') || (c >= u'A' && c <= u'Z');
 }
 
-/// A path as the folder where the search for its names begins, and those names.
+/// A path, split into the folder in which the search begins and the names to find.
 struct Route {
     QString start;
     QStringList names;
 };
 
-/// ".." never leads out of a drive.
+/// Splits a path into names. ".." never leads out of a drive.
 QStringList namesOf(const QString& path)
 {
     QStringList names;
@@ -67,10 +67,10 @@ Route routeOf(const QString& path)
         return {profile::root() + u"/unc"_s, namesOf(rest)};
     if (path.startsWith(u'/'))
         return {QString(), namesOf(rest)};
-    return {profile::root() + u"/drive_c"_s, namesOf(rest)};  // without a drive: the host's first one
+    return {profile::root() + u"/drive_c"_s, namesOf(rest)};  // without a drive, C: is meant
 }
 
-/// The name in the folder that equals this one but for its case; empty where there is none.
+/// Returns the name in the folder that differs only in case, or an empty text if there is none.
 QString variantIn(const QString& folder, const QString& name)
 {
     const Folder open = openFolder(folder.isEmpty() ? u"/"_s : folder);
@@ -96,7 +96,7 @@ bool isThere(const QString& systemPath)
     return !systemPath.contains(QChar(u'\0')) && ::lstat(encodedPath(systemPath).constData(), &state) == 0;
 }
 
-/// The path with each name in the spelling that it has on the disk, up to the first that is not there.
+/// Returns the path with each name in its spelling on the disk, up to the first name that does not exist.
 QString found(const QString& start, const QStringList& names)
 {
     const QString asAsked = names.isEmpty() ? start : start + u'/' + names.join(u'/');
@@ -159,7 +159,7 @@ bool matches(const QString& name, const QString& pattern)
     const QString mask = pattern.toUpper();
     qsizetype at = 0;
     qsizetype maskAt = 0;
-    qsizetype star = -1;  // the last "*" met, and where its text began: only that one is ever tried again
+    qsizetype star = -1;  // the last "*" and where its text begins; only this one is ever extended
     qsizetype starText = -1;
     while (at < text.size()) {
         if (maskAt < mask.size() && mask[maskAt] == u'*') {

@@ -24,7 +24,7 @@ namespace {
 constexpr mode_t anyoneMayRead = S_IRUSR | S_IRGRP | S_IROTH;
 constexpr mode_t anyoneMayWrite = S_IWUSR | S_IWGRP | S_IWOTH;
 
-// Bytes of a name that is no UTF-8, as characters that no text has.
+// The characters for bytes of names that are not UTF-8. No valid text contains them.
 constexpr char16_t byteOffset = 0xDC00;
 constexpr char16_t firstByte = 0xDC80;
 constexpr char16_t lastByte = 0xDCFF;
@@ -51,7 +51,7 @@ QString temporaryName()
     return u".kest-"_s + QString::number(QRandomGenerator::global()->generate64(), 36) + u".tmp"_s;
 }
 
-/// A rename is on the disk only when its folder is.
+/// Writes a folder to the disk. A rename is safe only after that.
 void commitFolder(const QString& folder)
 {
     SystemFile(folder, O_RDONLY | O_DIRECTORY).commit();
@@ -86,7 +86,7 @@ QByteArray encodedPath(const QString& systemPath)
     if (systemPath.contains(QChar(u'\0')))
         throwFileError(PathNotFound, systemPath);
     QByteArray path;
-    qsizetype from = 0;  // where the text begins that is not yet in `path`
+    qsizetype from = 0;  // where the part of the text begins that is not yet in `path`
     for (qsizetype i = 0; i < systemPath.size(); ++i) {
         const char16_t c = systemPath[i].unicode();
         const bool isByte = c >= firstByte && c <= lastByte && !(i > 0 && systemPath[i - 1].isHighSurrogate());
@@ -235,7 +235,7 @@ bool SystemFile::lockByte(qint64 at)
 
 void SystemFile::commit()
 {
-    if (::fsync(descriptor) != 0 && errno != EINVAL && errno != EROFS)  // some file systems can't
+    if (::fsync(descriptor) != 0 && errno != EINVAL && errno != EROFS)  // some file systems can't do this
         throwSystemError(path);
     const int closing = std::exchange(descriptor, -1);
     if (::close(closing) != 0 && errno != EINTR)
@@ -296,7 +296,7 @@ void replaceFile(const QString& target, const QString& spelled, const std::funct
         ::unlink(encodedPath(temporary).constData());
         throw;
     }
-    // what lay there under another spelling takes the new one: at no moment are there two files or none
+    // a file in another spelling is renamed last, so that there is always exactly one file
     if (spelled != target)
         renameFile(target, spelled);
 }

@@ -1,4 +1,4 @@
-// The calls of this system behind files.h: open files, their failures as RuntimeError, writes that appear whole.
+// The system calls for files.h: open files, errors as RuntimeError, and atomic writes.
 #pragma once
 
 #include <QByteArray>
@@ -9,24 +9,24 @@
 
 namespace kest::files {
 
-/// An open file that is closed with its owner.
+/// An open file. The destructor closes it.
 class SystemFile {
 public:
-    /// A file that is made takes that mode, less what the process withholds from new files.
+    /// A new file gets this mode, reduced by the umask of the process.
     SystemFile(const QString& path, int flags, unsigned mode = 0666);
     ~SystemFile();
     SystemFile(const SystemFile&) = delete;
     SystemFile& operator=(const SystemFile&) = delete;
 
     qint64 size() const;
-    /// The next bytes, at most so many; none at the end.
+    /// Reads at most `most` bytes. Returns none at the end of the file.
     QByteArray read(qsizetype most);
     void write(const QByteArray& bytes);
     void cutTo(qint64 size);
     void setMode(unsigned mode);
-    /// Locks one byte, there or not, until the file is closed. False while another open file has it locked.
+    /// Locks a byte, which need not exist, until the file is closed. Returns false if another open file has locked it.
     bool lockByte(qint64 at);
-    /// Waits until the bytes are on the disk and closes, so that no failure stays unseen.
+    /// Waits until the bytes are on the disk and closes the file. Throws RuntimeError if this fails.
     void commit();
 
 private:
@@ -34,17 +34,16 @@ private:
     int descriptor;
 };
 
-/// The bytes that a path takes in a call of this system; a path with a NUL in it is PathNotFound.
+/// Returns a path for a system call. Throws PathNotFound if it contains a NUL.
 QByteArray encodedPath(const QString& systemPath);
-/// A name as a folder of this system gives it; `encodedPath` makes the same bytes of it.
+/// Returns the text for a name in a folder. encodedPath() turns it back into the same bytes.
 QString decodedName(const char* name);
 
-/// Throws what the last call's `errno` means for this path.
+/// Throws the RuntimeError for the `errno` of the last call.
 [[noreturn]] void throwSystemError(const QString& systemPath);
 [[noreturn]] void throwFileError(int number, const QString& systemPath);
 
-/// Throws where the file may not be read, changed or replaced. The permission bits count even for a user whom this
-/// system refuses nothing.
+/// Throw if the file may not be read, changed or replaced. The permission bits count even for root.
 void checkReadable(const QString& systemPath);
 void checkWritable(const QString& systemPath);
 void checkFolderWritable(const QString& systemPath);
@@ -52,24 +51,24 @@ void checkFolderWritable(const QString& systemPath);
 bool isFile(const QString& systemPath);
 bool isFolder(const QString& systemPath);
 
-/// Puts a file in place that `fill` has written under a temporary name. `spelled` is its path as it was asked for.
-/// Without a mode it keeps that of the file before.
+/// Lets `fill` write a temporary file and renames it to `target`. `spelled` is the path in the spelling of the caller.
+/// Without a mode, the file keeps the mode of the one that it replaces.
 void replaceFile(const QString& target, const QString& spelled, const std::function<void(SystemFile&)>& fill,
                  std::optional<unsigned> mode = {});
 bool sameVolume(const QString& from, const QString& to);
 void renameFile(const QString& from, const QString& to);
 void removeFile(const QString& systemPath);
 
-/// Seconds since the last write; 0 for a file that is not there.
+/// Returns the seconds since the last write, or 0 if the file does not exist.
 qint64 ageOf(const QString& systemPath);
 
-/// True for the temporary names of `replaceFile`.
+/// Returns true for the temporary names of replaceFile().
 bool isTemporaryName(const QString& name);
 
-/// The path on this system with the last element as it was asked for, even where a variant in another case exists.
+/// Returns the path on this system with the last name in the spelling of the caller, even if it exists in another case.
 QString spelledPath(const QString& path);
 
-/// Throws when a test wants this operation to fail.
+/// Throws if a test has requested that this operation fails.
 void failOnRequest(const QString& path);
 
 }  // namespace kest::files

@@ -14,7 +14,7 @@ namespace kest::files {
 
 namespace {
 constexpr unsigned ownerAlone = 0600;
-constexpr qint64 largestFile = 512LL * 1024 * 1024;  // bytes that one read takes into memory
+constexpr qint64 largestFile = 512LL * 1024 * 1024;  // bytes; larger files are not read
 }  // namespace
 
 bool exists(const QString& path)
@@ -81,7 +81,7 @@ void append(const QString& path, const QString& text)
     try {
         file.write(toCodePage(text));
     } catch (const RuntimeError&) {
-        attempt([&] { file.cutTo(before); });  // no half record stays behind
+        attempt([&] { file.cutTo(before); });  // removes an incomplete record
         throw;
     }
     file.commit();

@@ -16,7 +16,7 @@ constexpr std::pair<Type, QLatin1StringView> typeNames[] = {
     {Type::Number, "number"_L1},
 };
 
-/// `special` are the characters that would be read as something else at this place.
+/// Escapes a text. `special` are the characters that have a meaning at this place.
 QByteArray escaped(const QString& text, QByteArrayView special)
 {
     QByteArray out;
@@ -64,7 +64,7 @@ RegistryFile RegistryFile::fromBytes(const QByteArray& bytes)
         const qsizetype equals = line.indexOf('=');
         const qsizetype colon = line.indexOf(':', equals);
         if (path.isEmpty() || line.startsWith(';') || equals < 0 || colon < 0)
-            continue;  // a remark
+            continue;  // a comment
         const QString type = QString::fromUtf8(line.sliced(equals + 1, colon - equals - 1)).trimmed();
         const QByteArray name = line.first(equals).trimmed();
         for (const auto& [number, typeName] : typeNames) {

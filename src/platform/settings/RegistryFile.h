@@ -1,4 +1,4 @@
-// The text of registry.ini: sections for keys, one line for each value.
+// Reads and writes the text of registry.ini, which has a section for each key and a line for each value.
 #pragma once
 
 #include "platform/settings/registry.h"
@@ -9,28 +9,32 @@
 
 namespace kest::settings {
 
-/// What the file holds, in its order. Keys are paths that begin with the hive's name.
+/// The content of the file in its order. Keys are paths that begin with the name of the hive.
 //
 //   ; Settings of KEST2
 //   [HKEY_LOCAL_MACHINE\SOFTWARE\wirra32\frmsplash]
 //   EcomHome=text:c:\wirdoc\           a value; "@" is the key's default value
 //   Retries=number:3
 //
-// Control characters, "%", and what has a meaning at its place are written as %XX of their UTF-8 bytes.
+// Control characters, "%", and characters with a meaning at their place are written as %XX, in UTF-8.
 class RegistryFile {
 public:
+    /// A named value of a key.
     struct Value {
         QString name;
         settings::Value value;
     };
+    /// A key with its values.
     struct Key {
         QString path;
         QList<Value> values;
     };
 
-    /// False for an empty file, and for one that something else has written.
+    /// Returns true if the bytes are a settings file, and false if they are empty or another program has written them.
     static bool isOne(const QByteArray& bytes);
+    /// Reads the content of a file.
     static RegistryFile fromBytes(const QByteArray& bytes);
+    /// Returns the content as it is written.
     QByteArray toBytes() const;
 
     const QList<Key>& keys() const { return allKeys; }
@@ -38,14 +42,14 @@ public:
     const settings::Value* find(const QString& path, const QString& name) const;
     bool hasSubkeys(const QString& path) const;
 
-    /// Makes the key and those above it.
+    /// Returns the key. Creates it and the keys above it if necessary.
     Key& make(const QString& path);
     void set(const QString& path, const QString& name, const settings::Value& value);
     void remove(const QString& path);
 
 private:
     QList<Key> allKeys;
-    QHash<QString, qsizetype> places;  // of a path without regard to case: its index
+    QHash<QString, qsizetype> places;  // the index of each path, in folded case
 };
 
 }  // namespace kest::settings

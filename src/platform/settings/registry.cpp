@@ -40,7 +40,7 @@ QLatin1StringView nameOf(Hive hive)
     Q_UNREACHABLE();
 }
 
-/// The key's path with its hive; backslashes too many are passed over.
+/// Returns the path of the key with its hive, without surplus backslashes.
 QString pathOf(Hive hive, const QString& key)
 {
     QString path = nameOf(hive);
@@ -54,7 +54,7 @@ QString userKey(const QString& application, const QString& section)
     return u"Software\\ApplicationSettings\\"_s + application + u'\\' + section;
 }
 
-/// Tells one state of the file from another: each change is a new file.
+/// Identifies a state of the file: each change creates a new file.
 using Identity = std::tuple<QString, quint64, qint64, qint64, qint64>;
 
 std::optional<Identity> identityOf(const QString& path)
@@ -77,7 +77,7 @@ Cache& cache()
     return instance;
 }
 
-/// What the file holds now; a missing file holds nothing. Throws if it can't be read or is no settings file.
+/// Reads the file. A missing file is empty. Throws RuntimeError if it can't be read or is not a settings file.
 RegistryFile present()
 {
     const QString path = registryPath();
@@ -98,7 +98,7 @@ RegistryFile present()
     return kept.content;
 }
 
-/// What can't be read is empty.
+/// Reads the file, or returns an empty content if it can't be read.
 RegistryFile readable()
 {
     RegistryFile content;
@@ -106,7 +106,7 @@ RegistryFile readable()
     return content;
 }
 
-/// Changes the file as a whole. False when `edit` refuses or when the file cannot be written.
+/// Reads, edits and replaces the file under a lock. Returns false if `edit` does, or if the file can't be written.
 bool change(const std::function<bool(RegistryFile&)>& edit)
 {
     constexpr int longestWait = 10000;  // milliseconds
@@ -129,7 +129,7 @@ bool change(const std::function<bool(RegistryFile&)>& edit)
 void check()
 {
     present();
-    attempt([] { files::restrictToOwner(registryPath()); });  // it may be someone else's, or not there
+    attempt([] { files::restrictToOwner(registryPath()); });  // the file may be missing or belong to someone else
 }
 
 bool keyExists(Hive hive, const QString& key)

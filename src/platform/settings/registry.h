@@ -1,4 +1,4 @@
-// The registry: hives, keys and typed values in the one file registry.ini of the profile.
+// The registry: hives, keys and typed values, stored in the file registry.ini of the profile.
 #pragma once
 
 #include <QString>
@@ -8,23 +8,26 @@
 
 namespace kest::settings {
 
-// Keys are paths joined by backslashes; names are found without regard to case and keep the spelling they were made
-// with. Each change is one atomic replacement of the file under a lock, so that two processes can write at once.
+// Keys are paths with backslashes. Names are found in any case and keep the spelling with which they were created. Each
+// change replaces the file atomically under a lock, so that two processes can write at the same time.
 
-/// Throws if the file is there but can't be read or is no settings file; such a file is never written over. Takes from
-/// others the right to read it, since it holds the database's password. A missing file holds nothing.
+/// Throws RuntimeError if the file exists but can't be read or is not a settings file; such a file is never
+/// overwritten. Removes the rights of other users, because the file contains the database's password. A missing file is
+/// fine.
 void check();
 
 enum class Hive { ClassesRoot, CurrentUser, LocalMachine };
 enum class Type { Text = 1, Binary = 3, Number = 4 };
 
+/// A value and its type.
 struct Value {
     Type type = Type::Text;
-    QString data;  // a Number is its decimal text
+    QString data;  // a Number is stored as decimal text
 
     bool operator==(const Value&) const = default;
 };
 
+/// A value with its place.
 struct Entry {
     Hive hive = Hive::LocalMachine;
     QString key;
@@ -32,19 +35,22 @@ struct Entry {
     Value value;
 };
 
+/// Returns true if the key exists.
 bool keyExists(Hive hive, const QString& key);
-/// The value, or none where key or value is missing. An empty name is the key's default value.
+/// Returns a value, or nothing if the key or the value is missing. An empty name is the key's default value.
 std::optional<Value> query(Hive hive, const QString& key, const QString& name);
-/// False when the key does not exist or the file cannot be written.
+/// Sets a value. Returns false if the key does not exist or the file can't be written.
 bool setValue(Hive hive, const QString& key, const QString& name, const Value& value);
-/// Makes the key and those above it. False when the file cannot be written.
+/// Creates the key and the keys above it. Returns false if the file can't be written.
 bool createKey(Hive hive, const QString& key);
-/// Removes a key without subkeys, with its values. False when it is missing, has subkeys or cannot be removed.
+/// Removes a key and its values. Returns false if it is missing, has subkeys or can't be removed.
 bool removeKey(Hive hive, const QString& key);
+/// Returns all values.
 QList<Entry> entries();
 
-/// The per-user settings area of applications: the value, or the default where there is none.
+/// Returns a value from the per-user area of applications, or `fallback` if there is none.
 QString userSetting(const QString& application, const QString& section, const QString& name, const QString& fallback);
+/// Sets a value in the per-user area. Returns false if it can't be written.
 bool setUserSetting(const QString& application, const QString& section, const QString& name, const QString& value);
 
 }  // namespace kest::settings

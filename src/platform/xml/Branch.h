@@ -1,4 +1,4 @@
-// Builds the element tree of an outgoing document: an element list is a list of elements.
+// Builds the elements of outgoing documents from lists.
 #pragma once
 
 #include "platform/xml/xml.h"
@@ -9,7 +9,7 @@
 
 namespace kest {
 
-/// One row of an element list: an element, whether it is there, and its text.
+/// An element of a list: its name, whether it is present, and its text.
 struct Leaf {
     const char* name;
     bool present;
@@ -17,29 +17,30 @@ struct Leaf {
 };
 using Leaves = std::vector<Leaf>;
 
-/// Marks the elements that every document carries, with a text or without.
+/// Marks elements that are present in every document, even without a text.
 constexpr bool always = true;
 
-/// An element that is there only when its text is not empty.
+/// Returns an element that is present only if its text is not empty.
 inline Leaf filled(const char* name, const QString& text)
 {
     return {name, !text.isEmpty(), text};
 }
 
-/// An element of a document that is being built. It stands in the tree as soon as it is made.
+/// An element of a document under construction. It is part of the tree from the beginning.
 class Branch {
 public:
-    /// The root of an empty document; everything below it lies in the same namespace, none for an empty one.
+    /// Creates the root of an empty document. All elements below it have the same namespace, or none if `namespaceURI`
+    /// is empty.
     Branch(xml::Document& document, const char* rootName, const QString& namespaceURI = {});
 
     Branch add(const char* name) const;
     void add(const char* name, const QString& text) const;
-    /// Those of the list that are present, in its order.
+    /// Adds those elements of the list that are present, in order.
     void add(const Leaves& leaves) const;
-    /// An element that lies in no namespace.
+    /// Adds an element without a namespace.
     void addOutside(const char* name, const QString& text) const;
 
-    /// The serialised text of the element.
+    /// Returns the element as XML text.
     QString xml() const { return node.xml(); }
 
 private:

@@ -74,7 +74,7 @@ xmlNsPtr DocumentData::namespaceFor(const QString& prefix, const QString& uri)
 
 void DocumentData::link(xmlNodePtr parent, xmlNodePtr child, xmlNodePtr before)
 {
-    // done by hand: the library's own routines join neighbouring texts and free the node that was handed over
+    // not with libxml2's own functions, which join neighbouring texts and free the given node
     if (isAncestorOrSelf(child, parent))
         throw RuntimeError(TypeMismatch, u"A node cannot stand below itself"_s);
     if (before == child)

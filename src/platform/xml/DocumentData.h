@@ -1,4 +1,4 @@
-// What a document holds behind its nodes, and the steps that the files of this folder share.
+// The data of a document, and functions that the files of this folder share.
 #pragma once
 
 #include "platform/xml/xml.h"
@@ -21,18 +21,18 @@ struct DocumentData {
     DocumentData(const DocumentData&) = delete;
     DocumentData& operator=(const DocumentData&) = delete;
 
-    /// Frees everything and starts an empty document.
+    /// Deletes all nodes. The document is empty afterwards.
     void clear();
-    /// Takes a parsed document over.
+    /// Takes ownership of a parsed document.
     void take(xmlDocPtr parsed, QHash<const xmlNode*, QByteArray> tags);
 
     Node wrap(xmlNodePtr node) { return node ? Node(node, this) : Node(); }
-    /// A namespace for nodes that were made here; it is declared when the document is written.
+    /// Returns a namespace for a created node. It is declared when the document is written.
     xmlNsPtr namespaceFor(const QString& prefix, const QString& uri);
 
-    /// Puts a node among the children of `parent`, in front of `before` or last.
+    /// Adds a node to the children of `parent`, before `before` or, if that is null, at the end.
     void link(xmlNodePtr parent, xmlNodePtr child, xmlNodePtr before);
-    /// Takes a node out of the tree; it lives on as long as the document.
+    /// Removes a node from the tree. It lives as long as the document.
     void unlink(xmlNodePtr node);
 
     QList<Node> select(xmlNodePtr from, const QString& path, bool firstOnly);
@@ -40,7 +40,7 @@ struct DocumentData {
     xmlDocPtr document = nullptr;
     ParseError error;
     QMap<QString, QString> prefixes;
-    /// Of elements with a declaration after an attribute: the text that tells their order.
+    /// The start tags of elements in which a declaration comes after an attribute. They tell the order.
     QHash<const xmlNode*, QByteArray> startTags;
 
 private:
@@ -50,7 +50,7 @@ private:
 
     xmlXPathContextPtr context = nullptr;
     QMap<QString, QString> contextPrefixes;
-    bool ordered = false;  // libxml2 knows the order of the elements, as long as the tree stays as it is
+    bool ordered = false;  // true if libxml2 has numbered the elements; a change of the tree resets it
     QSet<xmlNodePtr> loose;
     std::vector<xmlNsPtr> namespaces;
 };
@@ -65,17 +65,17 @@ inline const xmlChar* toXml(const QByteArray& utf8)
     return reinterpret_cast<const xmlChar*>(utf8.constData());
 }
 
-/// Text without the characters that XML forbids.
+/// Returns the text without the characters that XML forbids.
 QString allowedText(const QString& text);
 bool isBlankText(const xmlNode* node);
 QString textOfNode(const xmlNode* node);
 QString qualifiedName(const xmlNode* node);
 QList<Attribute> attributesOf(const DocumentData& data, const xmlNode* element);
 
-/// The names of a start tag's attributes, declarations among them, in the order of its text.
+/// Returns the names of the attributes and declarations in a start tag, in their order.
 std::vector<std::string_view> namesInStartTag(std::string_view tag);
 
-/// Parses into `data`; false leaves it empty with its error filled.
+/// Parses a text into `data`. If it fails, returns false and sets the error; `data` is then empty.
 bool parse(DocumentData& data, const QString& text);
 QString serialized(const DocumentData& data, const xmlNode* node);
 

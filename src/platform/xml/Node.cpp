@@ -9,7 +9,7 @@ namespace kest::xml {
 
 namespace {
 
-/// The next of these siblings that counts as a node.
+/// Returns the next of these siblings that counts as a node.
 xmlNodePtr counting(xmlNodePtr node)
 {
     while (node && isBlankText(node))
@@ -108,7 +108,7 @@ QList<Attribute> attributesOf(const DocumentData& data, const xmlNode* element)
         for (const std::string_view name : namesInStartTag({tag->constData(), static_cast<size_t>(tag->size())}))
             places.insert(QString::fromUtf8(name.data(), static_cast<qsizetype>(name.size())), places.size());
         const auto place = [&](const Attribute& attribute) {
-            return places.value(attribute.name, places.size());  // what was added later comes last
+            return places.value(attribute.name, places.size());  // attributes that were added later come last
         };
         std::stable_sort(attributes.begin(), attributes.end(),
                          [&](const Attribute& a, const Attribute& b) { return place(a) < place(b); });

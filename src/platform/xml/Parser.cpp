@@ -16,7 +16,7 @@ namespace kest::xml {
 
 namespace {
 
-// Failures of our own limits; the library's own stand above `libraryErrors` by their number.
+// Error codes for our own limits. Those of libxml2 are its numbers, added to `libraryErrors`.
 constexpr quint32 TooLarge = 0xC00CEF01;
 constexpr quint32 TooDeep = 0xC00CEF02;
 constexpr quint32 TooManyAttributes = 0xC00CEF03;
@@ -25,17 +25,17 @@ constexpr quint32 DtdRefused = 0xC00CEF04;
 constexpr quint32 NulCharacter = 0xC00CEF05;
 constexpr quint32 libraryErrors = 0xC00CE800;
 
-// The library compares each attribute of an element with each, and each name with each namespace in force.
+// libxml2 compares all attributes of an element with each other, and each name with all namespaces in scope.
 constexpr int mostAttributes = 500;
 constexpr int mostNamespaces = 500;
 constexpr auto tooManyAttributes = "An element has too many attributes."_L1;
-constexpr qsizetype longestSource = 10000;  // characters of a line that are shown
+constexpr qsizetype longestSource = 10000;  // the most characters of a line to show
 
-/// What one parse has met so far; the first failure decides.
+/// The state of a parse. Only the first error counts.
 struct Progress {
     const QString& text;
     xmlParserCtxtPtr parser = nullptr;
-    qsizetype fed = 0;  // characters that the library has been given
+    qsizetype fed = 0;  // how many characters libxml2 has been given
     int nodes = 0;
     std::optional<ParseError> failure = {};
     int firstCode = 0;
@@ -57,7 +57,7 @@ bool isNameStart(char c)
     return (c >= 'a' && c <= 'z') || (c >= 'A' && c <= 'Z') || c == '_' || c == ':' || (c & 0x80);
 }
 
-/// True where the text behind the root goes on with an element.
+/// Returns true if the text after the root continues with an element.
 bool isElementNext(std::string_view rest)
 {
     constexpr std::pair<std::string_view, std::string_view> passedOver[] = {
@@ -102,7 +102,8 @@ void fail(Progress& progress, xmlParserCtxtPtr parser, quint32 code, const QStri
 void takeError(void* userData, xmlErrorPtr error)
 {
     const auto parser = static_cast<xmlParserCtxtPtr>(userData);
-    const bool isNameOnly = error->code == XML_WAR_NS_URI || error->code == XML_WAR_NS_URI_RELATIVE;  // any text is one
+    // any text is a valid namespace name
+    const bool isNameOnly = error->code == XML_WAR_NS_URI || error->code == XML_WAR_NS_URI_RELATIVE;
     const bool counts = (error->level >= XML_ERR_ERROR || error->code == XML_NS_ERR_UNDEFINED_NAMESPACE) && !isNameOnly;
     if (!counts || !parser->_private)
         return;
@@ -126,7 +127,7 @@ void takeError(void* userData, xmlErrorPtr error)
              QString::fromUtf8(error->message).trimmed());
 }
 
-/// Ends the parse at a limit of our own.
+/// Ends the parse because of one of our limits.
 void refuse(xmlParserCtxtPtr parser, quint32 code, const QString& reason)
 {
     fail(progressOf(parser), parser, code, reason);
@@ -138,14 +139,14 @@ void refuseDtd(void* userData, const xmlChar*, const xmlChar*, const xmlChar*)
     refuse(static_cast<xmlParserCtxtPtr>(userData), DtdRefused, u"A document type declaration is not accepted."_s);
 }
 
-/// Gives the library the next piece of the text; nothing more once the parse has failed, or while it reads a start tag
-/// that is beyond the limits: the library would go through the whole flood before it calls `startElement`.
+/// Gives libxml2 the next piece of the text. Ends the text if the parse has failed or if a start tag exceeds the
+/// limits, because libxml2 would read such a tag to its end before it calls `startElement`.
 int feed(void* userData, char* buffer, int length)
 {
-    constexpr int longestCharacter = 3;  // bytes of one UTF-16 unit in UTF-8
+    constexpr int longestCharacter = 3;  // the most bytes of a UTF-16 unit in UTF-8
     Progress& progress = *static_cast<Progress*>(userData);
     const xmlParserCtxtPtr parser = progress.parser;
-    // Each attribute takes five places, and the library doubles the places when they are used up.
+    // Each attribute takes five places, and libxml2 doubles the number of places if all are in use.
     if (parser->maxatts > 2 * 5 * (mostAttributes + 2) || parser->nsNr > 2 * mostNamespaces)
         fail(progress, parser, TooManyAttributes, tooManyAttributes);
     if (progress.failure && progress.firstCode != XML_ERR_RESERVED_XML_NAME)
@@ -175,7 +176,7 @@ void addText(void* userData, const xmlChar* text, int length)
         countNodes(parser, 1);
 }
 
-/// Neighbouring sections stay apart; the library would join them.
+/// Keeps neighbouring CDATA sections apart, which libxml2 would join.
 void addCData(void* userData, const xmlChar* text, int length)
 {
     const auto parser = static_cast<xmlParserCtxtPtr>(userData);
@@ -195,13 +196,13 @@ void addInstruction(void* userData, const xmlChar* target, const xmlChar* data)
     countNodes(static_cast<xmlParserCtxtPtr>(userData), 1);
 }
 
-/// Keeps the start tag of an element whose declarations don't all come first.
+/// Stores the start tag of an element in which a declaration comes after an attribute.
 void keepAttributeOrder(xmlParserCtxtPtr parser)
 {
     const auto* const begin = reinterpret_cast<const char*>(parser->input->base);
     const auto* const end = reinterpret_cast<const char*>(parser->input->cur);
     const auto* at = end;
-    while (at > begin && *at != '<')  // no "<" can stand inside a tag, not even in a value
+    while (at > begin && *at != '<')  // a tag can't contain "<", not even in a value
         --at;
     const std::string_view tag(at, static_cast<size_t>(end - at));
     const std::vector<std::string_view> names = namesInStartTag(tag);
@@ -222,7 +223,7 @@ void startElement(void* userData, const xmlChar* name, const xmlChar* prefix, co
                           attributes);
     if (namespaceCount > 0 && attributeCount > 0)
         keepAttributeOrder(parser);
-    countNodes(parser, 1 + namespaceCount + 2 * attributeCount);  // an attribute's value is a node too
+    countNodes(parser, 1 + namespaceCount + 2 * attributeCount);  // because the value of an attribute is a node too
 }
 
 void removeBlankTexts(xmlDocPtr document)
@@ -240,7 +241,7 @@ void removeBlankTexts(xmlDocPtr document)
     }
 }
 
-/// The line of an error, or the part of it around the error.
+/// Returns the line of an error, or the part of a long line around it.
 QString sourceText(const QString& text, const ParseError& failure)
 {
     qsizetype start = 0;
@@ -304,7 +305,7 @@ bool parse(DocumentData& data, const QString& text)
         data.error = limitError(TooLarge, u"The text is too large."_s);
         return false;
     }
-    if (text.contains(QChar(u'\0'))) {  // the library would take it for the end of the text
+    if (text.contains(QChar(u'\0'))) {  // libxml2 would end the text here
         data.error = limitError(NulCharacter, u"There is a character of the code 0."_s);
         return false;
     }

@@ -16,7 +16,7 @@ using Expression = std::unique_ptr<xmlXPathCompExpr, decltype(&xmlXPathFreeCompE
 using Context = std::unique_ptr<xmlXPathContext, decltype(&xmlXPathFreeContext)>;
 using Result = std::unique_ptr<xmlXPathObject, decltype(&xmlXPathFreeObject)>;
 
-/// The library would print to standard error.
+/// Prevents libxml2 from printing to standard error.
 void passOver(void*, xmlErrorPtr) {}
 
 [[noreturn]] void failAsExpression(const QString& path)
@@ -24,7 +24,8 @@ void passOver(void*, xmlErrorPtr) {}
     throw RuntimeError(TypeMismatch, u"The path cannot be evaluated: "_s + path);
 }
 
-/// Each path is compiled once a thread; the limit is for paths that hold values.
+/// Returns a compiled path. Each thread keeps its compiled paths, but not without limit, because paths can contain
+/// values.
 xmlXPathCompExprPtr compiled(const QString& path)
 {
     constexpr size_t mostKept = 2000;
@@ -84,7 +85,7 @@ QList<Node> DocumentData::select(xmlNodePtr from, const QString& path, bool firs
     for (int i = 0; found && i < found->nodeNr; ++i) {
         const xmlNodePtr node = found->nodeTab[i];
         if (node->type == XML_NAMESPACE_DECL || node->type == XML_DOCUMENT_NODE)
-            continue;  // neither has a place among the nodes of this layer
+            continue;  // this layer has no such nodes
         nodes.append(wrap(node));
         if (firstOnly)
             break;

@@ -34,7 +34,7 @@ void appendEscaped(QString& out, const QString& text, Place place)
             case u'\n':
             case u'\r':
                 if (inAttribute)
-                    out += u"&#"_s + QString::number(c.unicode()) + u';';  // read back as blanks otherwise
+                    out += u"&#"_s + QString::number(c.unicode()) + u';';  // a parser would read it as a blank
                 else
                     out += c;
                 break;
@@ -44,7 +44,7 @@ void appendEscaped(QString& out, const QString& text, Place place)
     }
 }
 
-/// Writes a node and all below it without recursion, and declares each namespace where it is not in force yet.
+/// Writes a node and its descendants without recursion. Declares each namespace if it is not yet in scope.
 class Writer {
 public:
     explicit Writer(const DocumentData& source) : data(source) {}
@@ -126,7 +126,8 @@ private:
         }
     }
 
-    /// Declares what an element or attribute needs and is not in force; no namespace at all is one for an element only.
+    /// Declares the namespace of an element or attribute if it is not in scope. Only an element can need the
+    /// declaration of no namespace.
     void declare(const xmlNs* needed, bool ofElement)
     {
         const QString prefix = needed ? fromXml(needed->prefix) : QString();
@@ -161,8 +162,8 @@ private:
 
     const DocumentData& data;
     QString out;
-    QList<Binding> bindings;  // in force at this place, the inner ones last
-    QList<qsizetype> scopes;  // of each open element: how many there were before it
+    QList<Binding> bindings;  // in scope at this point, the innermost last
+    QList<qsizetype> scopes;  // for each open element, how many bindings there were before it
 };
 
 }  // namespace

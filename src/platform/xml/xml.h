@@ -1,4 +1,4 @@
-// The document object of the message code, over libxml2.
+// XML documents for the message code, based on libxml2.
 #pragma once
 
 #include <QList>
@@ -13,15 +13,15 @@ namespace kest::xml {
 
 enum class NodeType { Element = 1, Attribute = 2, Text = 3, CDataSection = 4, ProcessingInstruction = 7, Comment = 8 };
 
-/// The two errors that the message code repairs; every other failure has another code.
+/// The two errors that the message code repairs. All other errors have other codes.
 constexpr quint32 BareAmpersand = 0xC00CE513;
 constexpr quint32 SecondRoot = 0xC00CE555;
 
 /// Why the last parse failed.
 struct ParseError {
-    quint32 errorCode = 0;  // 0: the last parse succeeded
+    quint32 errorCode = 0;  // 0 if the last parse succeeded
     QString reason;
-    QString srcText;  // the line that holds the error
+    QString srcText;  // the line with the error
     int line = 0;     // from 1
     int linePosition = 0;
 };
@@ -34,8 +34,8 @@ struct Attribute {
 
 struct DocumentData;
 
-/// A light reference to a node, valid until its document goes or loads another text; it outlives a move. A null node
-/// answers `isNull`; anything else asked of it throws NoObject.
+/// A reference to a node. It is cheap to copy, and valid until its document is destroyed or loads another text, even if
+/// the document is moved. All functions of a null node except isNull() throw NoObject.
 class Node {
 public:
     Node() = default;
@@ -45,18 +45,19 @@ public:
     bool operator==(const Node&) const = default;
 
     NodeType nodeType() const;
-    /// With the prefix that the file gives; "#text", "#cdata-section" and "#comment" for those.
+    /// The name with its prefix, or "#text", "#cdata-section" or "#comment".
     QString nodeName() const;
     QString localName() const;
     QString namespaceURI() const;
-    /// The text of all descendants, joined; a text node of white space only counts for nothing.
+    /// The joined text of all descendants. Text nodes with only white space are ignored.
     QString text() const;
-    /// The same as UTF-8; of an element with one text it refers to the document's own memory, and lives as long.
+    /// The text as UTF-8. If an element contains a single text, the result refers to the memory of the document and is
+    /// valid as long as that.
     QByteArray utf8() const;
     void setText(const QString& text);
-    /// Without declaration and added white space.
+    /// The node as XML text, without a declaration and without added white space.
     QString xml() const;
-    /// Namespace declarations included, in document order.
+    /// All attributes and namespace declarations in document order.
     QList<Attribute> attributes() const;
     void setAttribute(const QString& name, const QString& value);
 
@@ -64,16 +65,17 @@ public:
     Node firstChild() const;
     Node lastChild() const;
     Node nextSibling() const;
-    /// Text that is white space only is no node.
+    /// All children except texts with only white space.
     QList<Node> childNodes() const;
     Node appendChild(Node child) const;
     Node insertBefore(Node child, Node reference) const;
     void removeChild(Node child) const;
 
-    /// Null when nothing matches. The prefixes are those of the document's selection namespaces.
+    /// Returns the first match, or null. Prefixes are those of the document's selection namespaces.
     Node selectSingleNode(const QString& path) const;
     QList<Node> selectNodes(const QString& path) const;
-    /// The text at a path. `textOf` throws NoObject where nothing is, `textOrEmptyOf` gives the empty text.
+    /// The text of the first node at a path. If there is none, textOf() throws NoObject, and textOrEmptyOf() returns an
+    /// empty text.
     QString textOf(const QString& path) const;
     QString textOrEmptyOf(const QString& path) const;
 
@@ -81,53 +83,53 @@ private:
     friend class Document;
     friend struct DocumentData;
     Node(_xmlNode* n, DocumentData* d) : node(n), document(d) {}
-    /// The node behind this one; throws NoObject for a null node.
+    /// Returns the node of libxml2. Throws NoObject for a null node.
     _xmlNode* required() const;
 
     _xmlNode* node = nullptr;
     DocumentData* document = nullptr;
 };
 
-/// One XML document. No DTD is accepted, and nothing outside the document is ever fetched. The limits bound what a
-/// hostile text costs: beyond them the parse fails like any other.
+/// An XML document. It accepts no DTD and never reads anything outside of the text. A text that exceeds one of the
+/// limits can't be parsed, so that a hostile text costs little time and memory.
 class Document {
 public:
-    static constexpr qint64 maximumBytes = 256LL * 1024 * 1024;  // of the text, a byte for each character
+    static constexpr qint64 maximumBytes = 256LL * 1024 * 1024;  // of the text, with one byte for each character
     static constexpr int maximumDepth = 250;
-    static constexpr int maximumNodes = 1'500'000;  // elements, attributes and their values, texts and others
+    static constexpr int maximumNodes = 1'500'000;  // including attributes, their values and texts
 
     Document();
     ~Document();
     Document(Document&&) noexcept;
     Document& operator=(Document&&) noexcept;
 
-    /// Prefixes for selections, to URIs. They hold for later parses too.
+    /// Sets the URIs of the prefixes in paths. They stay for later parses.
     void setSelectionNamespaces(const QMap<QString, QString>& prefixes);
 
-    /// False leaves the document empty and `parseError` filled.
+    /// Parses a text. If it fails, returns false and sets parseError(); the document is then empty.
     bool loadXML(const QString& text);
     const ParseError& parseError() const;
 
-    /// The root element, whatever stands before it; null for an empty document.
+    /// Returns the root element, or null if the document is empty.
     Node documentElement() const;
-    /// The same: what the message code calls the document's first child.
+    /// The same; the message code uses this name.
     Node firstChild() const { return documentElement(); }
 
-    /// A node of this document that is not yet in the tree. `name` may carry a prefix, which is declared with
-    /// `namespaceURI` where it is not in force yet; an empty URI is no namespace.
+    /// Creates a node that is not yet in the tree. `name` may have a prefix, which is declared with `namespaceURI` if
+    /// necessary. An empty URI means no namespace.
     Node createNode(NodeType type, const QString& name, const QString& namespaceURI = {});
-    /// Puts the root of an empty document.
+    /// Adds the root to an empty document.
     Node appendChild(Node root);
 
-    /// Relative paths begin at the root element.
+    /// Relative paths start at the root element.
     Node selectSingleNode(const QString& path) const;
     QList<Node> selectNodes(const QString& path) const;
-    /// As Node::textOf and Node::textOrEmptyOf, from the root.
+    /// Like Node::textOf() and Node::textOrEmptyOf(), from the root element.
     QString textOf(const QString& path) const;
     QString textOrEmptyOf(const QString& path) const;
 
-    /// Characters as themselves, not as references, except those that markup needs; characters that XML forbids are
-    /// dropped.
+    /// Returns the document as XML text. Only characters with a meaning in XML are written as references, and
+    /// characters that XML forbids are dropped.
     QString xml() const;
 
 private:
