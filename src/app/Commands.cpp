@@ -143,8 +143,8 @@ std::optional<QString> passwordFromInput()
 Outcome badPassword()
 {
     return refused(
-        u"the password is read from standard input, and may hold no \";\", no blank at its ends and only "
-        "characters of the code page 1252"_s,
+        u"the password is read from standard input, and must not contain \";\", blanks at its ends or characters "
+        "outside of code page 1252"_s,
         Refused);
 }
 

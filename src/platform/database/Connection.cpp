@@ -83,7 +83,7 @@ bool isThisMachine(const QString& server)
 std::unique_ptr<Engine> openLocal(const QString& name)
 {
     if (!files::isPlainName(name))
-        throw RuntimeError(CannotOpen, u"\""_s + name + u"\" is no name of a database."_s);
+        throw RuntimeError(CannotOpen, u"\""_s + name + u"\" is not the name of a database."_s);
     return openEmbedded(files::systemPath(profile::root() + u"/databases/"_s + name + u".db"_s));
 }
 

@@ -75,7 +75,7 @@ QVariant QtSqlEngine::insert(const QString& statement)
 void QtSqlEngine::execute(QSqlQuery& query, const QString& statement)
 {
     if (!isOpen())
-        throw RuntimeError(CannotOpen, u"The connection to the database has gone."_s);
+        throw RuntimeError(CannotOpen, u"The connection to the database is lost."_s);
     query.setForwardOnly(true);
     beforeStatement();
     if (!query.exec(statement))

@@ -102,7 +102,7 @@ QString Recordset::Data::keyCondition(const TableInfo& table)
         }
     }
     if (conditions.isEmpty())
-        throw RuntimeError(StatementFailed, u"The columns of the query don't tell a row of "_s + table.name);
+        throw RuntimeError(StatementFailed, u"The columns of the query don't identify a row of "_s + table.name);
     return conditions.join(u" AND "_s);
 }
 

@@ -60,7 +60,7 @@ private:
             --end;
         tokens.erase(end, count());
         if (std::any_of(tokens.begin(), tokens.end(), [](const Token& token) { return token.is(u";"); }))
-            throw RuntimeError(StatementFailed, u"A second statement stands behind a semicolon."_s);
+            throw RuntimeError(StatementFailed, u"A second statement follows a semicolon."_s);
     }
 
     void findTables()

@@ -189,7 +189,7 @@ void Report::putInFragments()
         body_.remove(found.capturedStart(), found.capturedLength());
         body_.replace(u"{{>"_s + found.captured(1) + u"}}"_s, found.captured(2).trimmed());
         if (body_.size() > longestBody)
-            noTemplate(u"its fragments hold each other"_s);
+            noTemplate(u"its fragments contain each other"_s);
     }
 }
 

@@ -76,7 +76,7 @@ void DocumentData::link(xmlNodePtr parent, xmlNodePtr child, xmlNodePtr before)
 {
     // not with libxml2's own functions, which join neighbouring texts and free the given node
     if (isAncestorOrSelf(child, parent))
-        throw RuntimeError(TypeMismatch, u"A node cannot stand below itself"_s);
+        throw RuntimeError(TypeMismatch, u"A node can't be below itself"_s);
     if (before == child)
         return;
     unlink(child);
@@ -135,7 +135,7 @@ Node Document::createNode(NodeType type, const QString& name, const QString& nam
     const QByteArray whole = name.toUtf8();
     const bool named = type == NodeType::Element || type == NodeType::ProcessingInstruction;
     if (type == NodeType::Attribute || (named && xmlValidateQName(toXml(whole), 0) != 0))
-        throw RuntimeError(TypeMismatch, u"No node can be made with the name "_s + name);
+        throw RuntimeError(TypeMismatch, u"No node can be created with the name "_s + name);
 
     xmlNodePtr node = nullptr;
     switch (type) {
@@ -173,7 +173,7 @@ Node Document::appendChild(Node root)
     if (root.document != data.get())
         throw RuntimeError(TypeMismatch, u"The node belongs to another document"_s);
     if (node->type == XML_ELEMENT_NODE && xmlDocGetRootElement(data->document))
-        throw RuntimeError(TypeMismatch, u"The document has a root already"_s);
+        throw RuntimeError(TypeMismatch, u"The document already has a root"_s);
     data->link(reinterpret_cast<xmlNodePtr>(data->document), node, nullptr);
     return root;
 }

@@ -197,14 +197,14 @@ void Node::setAttribute(const QString& name, const QString& value)
 {
     const QByteArray whole = name.toUtf8();
     if (required()->type != XML_ELEMENT_NODE || xmlValidateQName(toXml(whole), 0) != 0)
-        throw RuntimeError(TypeMismatch, u"No attribute can be made with the name "_s + name);
+        throw RuntimeError(TypeMismatch, u"No attribute can be created with the name "_s + name);
     const QByteArray text = allowedText(value).toUtf8();
     const qsizetype colon = name.indexOf(u':');
     const QString prefix = colon < 0 ? QString() : name.first(colon);
     const QByteArray local = name.sliced(colon + 1).toUtf8();
     if (name == "xmlns"_L1 || prefix == "xmlns"_L1) {
         if (!xmlNewNs(node, toXml(text), prefix.isEmpty() ? nullptr : toXml(local)))
-            throw RuntimeError(TypeMismatch, u"The namespace is declared already: "_s + name);
+            throw RuntimeError(TypeMismatch, u"The namespace is already declared: "_s + name);
         return;
     }
     xmlNsPtr space = prefix.isEmpty() ? nullptr : xmlSearchNs(node->doc, node, toXml(prefix.toUtf8()));
@@ -256,7 +256,7 @@ Node Node::insertBefore(Node child, Node reference) const
 {
     if (required()->type != XML_ELEMENT_NODE || child.required()->type == XML_ATTRIBUTE_NODE ||
         child.document != document || (reference && reference.node->parent != node))
-        throw RuntimeError(TypeMismatch, u"The node cannot be put there"_s);
+        throw RuntimeError(TypeMismatch, u"The node can't be added here"_s);
     document->link(node, child.node, reference.node);
     return child;
 }
@@ -264,7 +264,7 @@ Node Node::insertBefore(Node child, Node reference) const
 void Node::removeChild(Node child) const
 {
     if (child.required()->parent != required() || child.node->type == XML_ATTRIBUTE_NODE)
-        throw RuntimeError(TypeMismatch, u"The node is no child of this one"_s);
+        throw RuntimeError(TypeMismatch, u"The node is not a child of this one"_s);
     document->unlink(child.node);
 }
 

@@ -121,7 +121,7 @@ void takeError(void* userData, xmlErrorPtr error)
         return;
     progress.firstCode = error->code;
     if (isBareAmpersand(*error))
-        fail(progress, parser, BareAmpersand, u"An ampersand begins no entity reference."_s);
+        fail(progress, parser, BareAmpersand, u"An ampersand does not begin an entity reference."_s);
     else
         fail(progress, parser, libraryErrors + static_cast<quint32>(error->code),
              QString::fromUtf8(error->message).trimmed());

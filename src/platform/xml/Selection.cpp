@@ -21,7 +21,7 @@ void passOver(void*, xmlErrorPtr) {}
 
 [[noreturn]] void failAsExpression(const QString& path)
 {
-    throw RuntimeError(TypeMismatch, u"The path cannot be evaluated: "_s + path);
+    throw RuntimeError(TypeMismatch, u"The path can't be evaluated: "_s + path);
 }
 
 /// Returns a compiled path. Each thread keeps its compiled paths, but not without limit, because paths can contain
