@@ -85,7 +85,7 @@ TEST_F(Command, AFillThatEndedEarlyIsRefusedWithItsReason)
     const Ended ended = kest2(u"list unread"_s);
     EXPECT_EQ(ended.exitCode, app::Refused);
     EXPECT_EQ(ended.json[u"rows"].toArray(), QJsonArray());
-    EXPECT_EQ(ended.json[u"failure"].toString(), u"c:\\gone\\AUnread\\: the folder is not there"_s);
+    EXPECT_EQ(ended.json[u"failure"].toString(), u"c:\\gone\\AUnread\\: the folder does not exist"_s);
     EXPECT_TRUE(ended.errors.contains(ended.json[u"failure"].toString()));
 }
 

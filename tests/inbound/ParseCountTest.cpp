@@ -11,14 +11,14 @@ int parses = 0;
 }  // namespace
 
 /// Replaces the function of the parser.
-extern "C" __attribute__((visibility("default"))) void* xmlCtxtReadMemory(void* parser, const char* text, int size,
-                                                                          const char* url, const char* encoding,
-                                                                          int options)
+extern "C" __attribute__((visibility("default"))) void* xmlCtxtReadIO(void* parser, void* feed, void* close,
+                                                                      void* context, const char* url,
+                                                                      const char* encoding, int options)
 {
-    using Read = void* (*)(void*, const char*, int, const char*, const char*, int);
-    static const auto read = reinterpret_cast<Read>(dlsym(RTLD_NEXT, "xmlCtxtReadMemory"));
+    using Read = void* (*)(void*, void*, void*, void*, const char*, const char*, int);
+    static const auto read = reinterpret_cast<Read>(dlsym(RTLD_NEXT, "xmlCtxtReadIO"));
     ++parses;
-    return read(parser, text, size, url, encoding, options);
+    return read(parser, feed, close, context, url, encoding, options);
 }
 
 namespace kest::test {

@@ -266,6 +266,7 @@ TEST_F(QuoteBody, TenThousandLines)
         message.labour(line, "I");
     gConn->execute(u"BEGIN"_s);  // instead of 20,000 commits
     EXPECT_TRUE(apply(message));
+    gConn->execute(u"COMMIT"_s);
     EXPECT_EQ(quote("500").lines(), 10'000);
     EXPECT_EQ(quote("500").line(10'000).text("itemno"), "999");
 }
