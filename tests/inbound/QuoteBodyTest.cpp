@@ -264,6 +264,7 @@ TEST_F(QuoteBody, TenThousandLines)
     Message message = body();
     for (int line = 1; line <= 10'000; ++line)
         message.labour(line, "I");
+    quote("500");
     gConn->execute(u"BEGIN"_s);  // instead of 20,000 commits
     EXPECT_TRUE(apply(message));
     gConn->execute(u"COMMIT"_s);
