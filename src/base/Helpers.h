@@ -19,7 +19,7 @@ double SafeVal(const QString& text, const QString& fallback);
 QString NormaliseRego(const QString& rego);
 /// Removes a subquote of 0: "123/0" becomes "123"; "123" and "123/2" stay.
 QString NormaliseQuoteRef(const QString& reference);
-/// Quote number and subquote; without a "/" the subquote is "0".
+/// Returns the quote number and the subquote. Without a "/" the subquote is "0".
 std::pair<QString, QString> SplitQuoteRef(const QString& reference);
 /// Returns the letters and digits of a text.
 QString AlphaNumericOnly(const QString& text);

@@ -47,6 +47,7 @@ public:
     static constexpr QLatin1StringView rulesName{"insurer.rules"};
     static constexpr QLatin1StringView stateName{"transport.json"};
 
+    /// Creates a transport. The first carry() reads its state.
     explicit Transport(TransportFolders folders);
 
     /// Takes the files in the outgoing folder, answers each quote, and sends the next message of every rule that has

@@ -13,6 +13,7 @@ inline constexpr MessageFolder messageFolders[] = {MessageFolder::Unread, Messag
 
 /// Returns "unread", "read" or "sent".
 QString wordOf(MessageFolder folder);
+/// Returns the path of a folder, such as `gsUnreadPath`.
 QString pathOf(MessageFolder folder);
 
 /// Returns true if `file` is the name of a file without a folder. The transport chooses the name, so it may contain a

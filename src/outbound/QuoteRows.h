@@ -10,6 +10,7 @@ namespace kest {
 
 /// The records of a quote, read once.
 struct QuoteRows {
+    /// Reads the records. Throws RuntimeError if a required one is missing.
     explicit QuoteRows(db::Recordset& quoteRecord);
 
     db::Recordset& quote;

@@ -41,11 +41,13 @@ public:
     /// The engine's own error code and SQLSTATE. Empty if it is not a database error.
     const QString& nativeCode() const { return nativeCode_; }
     const QString& sqlState() const { return sqlState_; }
+    /// Sets the codes of a database error.
     RuntimeError& withDatabaseCodes(QString native, QString state);
 
     /// Returns true if a box has already shown this error. It still ends all routines that don't catch it, but no other
     /// box appears.
     bool isTold() const { return told_; }
+    /// Marks the error as already shown to the user.
     RuntimeError& asTold();
 
     const char* what() const noexcept override { return utf8_.constData(); }

@@ -17,17 +17,20 @@ namespace kest {
 // A zone mark is ignored: date and time stay as they are written.
 // They throw NullValue for a Null, TypeMismatch for any other text, and Overflow for a number that is too large.
 
+/// Returns a number.
 double toDouble(const QVariant& value);
 /// Returns a 32-bit whole number. A fraction is rounded to the nearest number, a half to the even one.
 qint64 toLong(const QVariant& value);
 /// Returns a 16-bit whole number, rounded like toLong(). Throws Overflow outside of -32768 to 32767.
 qint64 toInteger(const QVariant& value);
+/// Returns a flag. Any number except 0 is true.
 bool toBool(const QVariant& value);
 /// Returns the flag of a column, or false for a Null.
 inline bool isTrue(const QVariant& flag)
 {
     return !flag.isNull() && toBool(flag);
 }
+/// Returns a date.
 QDateTime toDate(const QVariant& value);
 /// Returns a date as columns store it. It has no time zone, so the hour that a clock change skips is a normal hour.
 QDateTime columnDate(const QDate& date, const QTime& time);

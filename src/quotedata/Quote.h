@@ -29,6 +29,7 @@ public:
     db::Recordset& lines();   // QUOTE2
     db::Recordset& notes();   // QUOTE3
 
+    /// Open the records of a quote directly.
     static db::Recordset openHeader(const QuoteKey& key);
     static db::Recordset openLines(const QuoteKey& key);
     static db::Recordset openNotes(const QuoteKey& key);

@@ -24,6 +24,7 @@ public:
     /// without such a driver, the embedded engine is used. Throws CannotOpen; if a server does not answer, this takes
     /// some seconds.
     void open(const QString& connectionText);
+    /// Closes the connection. Recordsets keep their rows.
     void close();
     /// Returns 1 if the connection is open, otherwise 0. A connection that the server has dropped is closed.
     int state() const;

@@ -23,6 +23,7 @@ struct Dialect {
     QString sameDate = QStringLiteral("%1=%2");  // the condition that a date column equals a literal
     QString sameLongText = QString();            // the same for a long text; empty if the database can't compare it
 
+    /// Returns a quoted identifier.
     QString quoted(const QString& identifier) const;
     /// Returns a value as a literal, in which the value is escaped. Null is NULL. Throws Overflow for infinity and NaN.
     QString literal(const QVariant& value) const;

@@ -31,6 +31,7 @@ public:
 
     /// Returns false if the server has dropped the connection.
     bool isOpen() const { return isOpen_; }
+    /// Marks the connection as lost.
     void drop() { isOpen_ = false; }
 
     virtual const Dialect& dialect() const = 0;
@@ -49,13 +50,16 @@ public:
     /// Sets how many seconds a statement may take. 0 means no limit.
     virtual void setTimeout(int seconds) = 0;
 
+    /// Returns the names of all tables in the spelling of the database.
     virtual QStringList tableNames() = 0;
+    /// Reads the columns and the key of a table.
     virtual std::unique_ptr<TableInfo> readTable(const QString& name) = 0;
 
     /// Gets a named lock. Returns false if someone else, or this connection, still has it after that time.
     virtual bool lock(const QString& name, int seconds) = 0;
     virtual void unlock(const QString& name) = 0;
 
+    /// Rebuilds all indexes, if another program can have damaged them.
     virtual void rebuildIndexes() {}
 
 private:

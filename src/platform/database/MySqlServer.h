@@ -14,13 +14,16 @@ public:
     /// Finds out which of the two it is.
     explicit MySqlServer(Engine& engine);
 
+    /// Returns the terms for queries to INFORMATION_SCHEMA.
     static const InformationSchemaTerms& informationSchema();
 
+    /// Returns the statement that limits the time of the following statements.
     QString timeoutStatement(int seconds) const;
 
     bool lock(const QString& name, int seconds);
     void unlock(const QString& name);
 
+    /// Returns true if an error code of the server says that the connection is lost.
     static bool meansConnectionLost(const QString& nativeCode);
     /// Returns the SQLSTATE for a code of the server, because the driver does not return it.
     static QString sqlState(const QString& nativeCode);

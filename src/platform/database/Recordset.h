@@ -32,6 +32,7 @@ public:
     void open(const QString& select);
     /// Runs the query again. The first row becomes current.
     void requery();
+    /// Discards the pending change and all rows.
     void close();
     bool isOpen() const;
     /// Releases the connection. The rows can still be read, moved through and filtered, but not updated.
@@ -42,13 +43,16 @@ public:
     /// Opens the declared table, which is empty. A pending row counts as a row.
     void openDeclared();
 
+    /// Returns true after the last row, and in an empty recordset.
     bool eof() const;
+    /// Returns true before the first row, and in an empty recordset.
     bool bof() const;
     /// Returns the number of rows that the filter shows, including a pending new row.
     int recordCount() const;
     /// Returns the number of the current row, counted from 1 among the rows that the filter shows, or -1 if there is
     /// none.
     int absolutePosition() const;
+    /// Makes the row with that number, counted from 1, the current row.
     void setAbsolutePosition(int position);
     void moveFirst();
     void moveNext();  // throws NoCurrentRow at eof
@@ -79,13 +83,17 @@ public:
     /// the same key and the old values of those columns. Throws RowChanged if there is no such row. After an insert,
     /// reads the identity and the defaults of the columns.
     void update();
+    /// Discards the pending change.
     void cancelUpdate();
     /// Deletes the current row in its base table. The next row becomes current.
     void remove();
 
+    /// Returns the names of all columns in select order.
     QStringList columns() const;
     bool hasColumn(const QString& column) const;
+    /// Returns the kind of a column. Throws NoSuchColumn.
     Kind kind(const QString& column) const;
+    /// Returns the most characters of a text column, or 0 if there is no limit. Throws NoSuchColumn.
     int size(const QString& column) const;
 
 private:

@@ -63,6 +63,7 @@ struct NamedTable {
 
 /// Returns the tables after the FROM, JOIN, INTO or UPDATE at that index.
 QList<NamedTable> tablesAfter(const Tokens& tokens, Tokens::Index keyword);
+/// Returns true for the keywords after which tables follow.
 bool namesTables(const Token& token);
 
 }  // namespace kest::db

@@ -18,11 +18,14 @@ public:
     SystemFile(const SystemFile&) = delete;
     SystemFile& operator=(const SystemFile&) = delete;
 
+    /// Returns the size in bytes.
     qint64 size() const;
     /// Reads at most `most` bytes. Returns none at the end of the file.
     QByteArray read(qsizetype most);
     void write(const QByteArray& bytes);
+    /// Cuts the file to that size in bytes.
     void cutTo(qint64 size);
+    /// Sets the permission bits.
     void setMode(unsigned mode);
     /// Locks a byte, which need not exist, until the file is closed. Returns false if another open file has locked it.
     bool lockByte(qint64 at);
@@ -55,6 +58,7 @@ bool isFolder(const QString& systemPath);
 /// Without a mode, the file keeps the mode of the one that it replaces.
 void replaceFile(const QString& target, const QString& spelled, const std::function<void(SystemFile&)>& fill,
                  std::optional<unsigned> mode = {});
+/// Returns true if both paths are on the same file system, so that a rename can move the file.
 bool sameVolume(const QString& from, const QString& to);
 void renameFile(const QString& from, const QString& to);
 void removeFile(const QString& systemPath);

@@ -26,6 +26,7 @@ qint64 size(const QString& path);
 
 /// Reads a file as text in Windows-1252. All 256 bytes survive a round trip.
 QString read(const QString& path);
+/// Reads a file as it is.
 QByteArray readBytes(const QString& path);
 
 /// Writes a file in Windows-1252; other characters become "?". Writes to a temporary name first, which list() never
@@ -42,6 +43,7 @@ void append(const QString& path, const QString& text);
 
 /// Copies a file and replaces the target. No reader sees part of the target.
 void copy(const QString& from, const QString& to);
+/// Moves a file and replaces the target.
 void move(const QString& from, const QString& to);
 enum class Force { No, Yes };
 /// Deletes a file. Throws FileNotFound if it does not exist, and PermissionDenied if it is read-only, unless forced.
@@ -53,6 +55,7 @@ void makeFolder(const QString& path);
 /// ignored. The names are sorted by their upper-case forms in code order. Temporary files are left out. A folder that
 /// does not exist has no files.
 QStringList list(const QString& folder, const QString& pattern = QStringLiteral("*"));
+/// Returns true if a name matches a pattern as in list().
 bool matches(const QString& name, const QString& pattern);
 
 /// Removes temporary files that are older than a day, which killed processes have left. Ignores files that it can't
@@ -72,7 +75,9 @@ bool waitForBackground(int milliseconds);
 /// Continues the deletions that an earlier process has left, except for files that have changed since.
 void resumeRemovals();
 
+/// Encodes a text in Windows-1252. Other characters become "?".
 QByteArray toCodePage(const QString& text);
+/// Decodes Windows-1252. All 256 bytes are characters.
 QString fromCodePage(const QByteArray& bytes);
 /// Decodes base64 and ignores white space. Throws TypeMismatch for any other character or a wrong length.
 QByteArray fromBase64(QByteArrayView text);

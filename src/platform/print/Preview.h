@@ -26,6 +26,7 @@ public:
     Preview(QWidget* parent, const std::function<void()>& print);
     ~Preview() override;
 
+    /// Shows a report.
     void setReport(Report report);
     /// Returns the report that was set last.
     const Report& report() const { return shown.value(); }

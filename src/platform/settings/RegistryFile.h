@@ -38,7 +38,9 @@ public:
     QByteArray toBytes() const;
 
     const QList<Key>& keys() const { return allKeys; }
+    /// Returns a key, or null if it does not exist.
     const Key* find(const QString& path) const;
+    /// Returns a value, or null if it does not exist.
     const settings::Value* find(const QString& path, const QString& name) const;
     bool hasSubkeys(const QString& path) const;
 

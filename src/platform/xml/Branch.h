@@ -33,7 +33,9 @@ public:
     /// is empty.
     Branch(xml::Document& document, const char* rootName, const QString& namespaceURI = {});
 
+    /// Adds an element for other elements.
     Branch add(const char* name) const;
+    /// Adds an element with a text.
     void add(const char* name, const QString& text) const;
     /// Adds those elements of the list that are present, in order.
     void add(const Leaves& leaves) const;

@@ -69,6 +69,7 @@ inline const xmlChar* toXml(const QByteArray& utf8)
 QString allowedText(const QString& text);
 bool isBlankText(const xmlNode* node);
 QString textOfNode(const xmlNode* node);
+/// Returns the name with its prefix.
 QString qualifiedName(const xmlNode* node);
 QList<Attribute> attributesOf(const DocumentData& data, const xmlNode* element);
 
@@ -77,6 +78,7 @@ std::vector<std::string_view> namesInStartTag(std::string_view tag);
 
 /// Parses a text into `data`. If it fails, returns false and sets the error; `data` is then empty.
 bool parse(DocumentData& data, const QString& text);
+/// Returns a node as XML text.
 QString serialized(const DocumentData& data, const xmlNode* node);
 
 }  // namespace kest::xml

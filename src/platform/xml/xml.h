@@ -54,11 +54,13 @@ public:
     /// The text as UTF-8. If an element contains a single text, the result refers to the memory of the document and is
     /// valid as long as that.
     QByteArray utf8() const;
+    /// Replaces the content by a text.
     void setText(const QString& text);
     /// The node as XML text, without a declaration and without added white space.
     QString xml() const;
     /// All attributes and namespace declarations in document order.
     QList<Attribute> attributes() const;
+    /// Sets an attribute or declares a namespace. Throws TypeMismatch for an invalid name or an unknown prefix.
     void setAttribute(const QString& name, const QString& value);
 
     Node parentNode() const;
@@ -67,7 +69,9 @@ public:
     Node nextSibling() const;
     /// All children except texts with only white space.
     QList<Node> childNodes() const;
+    /// Moves a node of the same document to the end of the children. Throws TypeMismatch if that is not possible.
     Node appendChild(Node child) const;
+    /// Moves a node to a place before the child `reference`, or to the end if that is null.
     Node insertBefore(Node child, Node reference) const;
     void removeChild(Node child) const;
 
@@ -108,6 +112,7 @@ public:
 
     /// Parses a text. If it fails, returns false and sets parseError(); the document is then empty.
     bool loadXML(const QString& text);
+    /// Returns the error of the last parse.
     const ParseError& parseError() const;
 
     /// Returns the root element, or null if the document is empty.
