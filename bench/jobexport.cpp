@@ -8,6 +8,7 @@
 #include "platform/script/Script.h"
 #include "setup/Profile.h"
 #include "shell/eKEST.h"
+#include "shell/component.h"
 #include "support/MariaDbServer.h"
 
 #include <QApplication>
@@ -28,7 +29,7 @@ public:
     Shop()
     {
         profile::setRoot(folder.filePath(u"shop"_s));
-        app::initProfile(true);
+        app::initProfile(registerClass, true);
         host = std::make_unique<eKEST>();
         QFile tables(QStringLiteral(KEST_SOURCE_DIR "/sql/joblink.sql"));
         if (!tables.open(QIODevice::ReadOnly))

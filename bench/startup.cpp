@@ -1,6 +1,7 @@
 // Measures the time from process start to the visible panel against a program that shows one empty window.
 #include "setup/Profile.h"
 #include "platform/profile.h"
+#include "shell/component.h"
 
 #include <QApplication>
 #include <QElapsedTimer>
@@ -74,7 +75,7 @@ int main(int argc, char** argv)
     qputenv("QT_QPA_PLATFORM", "offscreen");
     QApplication application(argc, argv);
     kest::profile::setRoot(folder().path() + QStringLiteral("/shop"));
-    kest::app::initProfile(false);
+    kest::app::initProfile(kest::registerClass, false);
     QFile script(folder().path() + QStringLiteral("/close.json"));
     if (!script.open(QIODevice::WriteOnly) || script.write(R"({"windows": {"frmKEST": [[{"click": "cmdExit"}]]}})") < 0)
         return 1;
