@@ -206,19 +206,21 @@ bool LoadMANQ(QString& text, const QString& fileName)
     respellColour(car, colours);
     car.set(u"REGO"_s, manual.rego);
 
-    // After this, a failure leaves the quote without lines until the message is loaded again.
     if (!checkQuoteBody(*message))
         return refuseLines();
+    std::unique_ptr<db::Lock> newQuotes;
+    if (isNew) {
+        newQuotes = lockNewQuotes();
+        if (Quote(*key).exists())
+            throw RuntimeError(RowChanged,
+                               u"Another workstation has meanwhile created quote %1."_s.arg(key->fullReference()));
+    }
+    // After this, a failure leaves the quote without lines until the message is loaded again.
     while (!lines.eof())
         lines.remove();
     car.update();
-    {
-        const std::unique_ptr<db::Lock> newQuotes = lockNewQuotes();
-        if (isNew && Quote(*key).exists())
-            throw RuntimeError(RowChanged,
-                               u"Another workstation has meanwhile created quote %1."_s.arg(key->fullReference()));
-        quote.update();
-    }
+    quote.update();
+    newQuotes.reset();
     if (!LoadQuoteBody(quote, lines, *message))
         return refuseLines();
     CalcQuoteTotals(quote, lines);

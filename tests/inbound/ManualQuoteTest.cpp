@@ -88,6 +88,16 @@ TEST_F(ManualQuotes, ACarTypedWithBlanksTakesTheNetworksRegistration)
     EXPECT_EQ(quote("501").text("REGO"), "abc 12-3");
 }
 
+TEST_F(ManualQuotes, AQuoteThatExistsWaitsForNobodyWhoCreatesOne)
+{
+    quote("500").line(7);
+    const auto other = std::make_shared<db::Connection>();
+    other->open(connectionText(driverNumber()));
+    const db::Lock creating(other, u"new quote"_s);
+    ASSERT_TRUE(creating.isHeld());
+    EXPECT_TRUE(load(manualQuote("500").labour(1, "I"))) << shown();
+}
+
 TEST_F(ManualQuotes, ARefusalTouchesNoLine)
 {
     quote("500").line(7);
