@@ -125,9 +125,10 @@ bool LoadQTDL(QString& text, const QString&)
         quote.header().update();
         notes.update();
     } else if ((taken = agreesToDeletion())) {
-        deleteQuoteRows(quote.key());
+        // first, because after the deletion the message finds no quote, and a failure here could not be repaired
         applyTransition(supplementaryDeleted, quote.header(), notes, quote.key().reference());
         notes.update();
+        deleteQuoteRows(quote.key());
     }
 
     tell({u"ORLA has requested quote "_s + quote.key().reference() + u" be deleted."_s, u"Reason: "_s + reason,
