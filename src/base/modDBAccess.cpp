@@ -151,6 +151,12 @@ db::Recordset opened(const QString& select)
     return rows;
 }
 
+QString cutFor(const db::Recordset& row, const QString& column, const QString& text)
+{
+    const int size = row.size(column);
+    return size > 0 ? text.left(size) : text;
+}
+
 QString GetComputerName()
 {
     return QSysInfo::machineHostName();

@@ -37,6 +37,8 @@ int driverNumber(CopyUp copyUp = CopyUp::Yes);
 std::optional<db::Recordset> OpenRecordset(const QString& select, bool disconnect = false, bool reconnect = false);
 /// Opens a query on the shared connection `gConn`. Throws RuntimeError if it fails.
 db::Recordset opened(const QString& select);
+/// Returns the text, cut to the size of the column.
+QString cutFor(const db::Recordset& row, const QString& column, const QString& text);
 /// Returns the name of this machine, or an empty text if that fails.
 QString GetComputerName();
 

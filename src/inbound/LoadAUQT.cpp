@@ -128,7 +128,7 @@ void fillHeader(db::Recordset& quote, const Authorisation& told, const QString& 
                           {"KESTAuthNo"_L1, told.authorisedNumber},
                           {"Claim"_L1, told.claim},
                           {"REGO"_L1, rego},
-                          {"assess"_L1, surnameFirst(told.assessor)},
+                          {"assess"_L1, cutFor(quote, u"assess"_s, surnameFirst(told.assessor))},
                           {"AuthDate"_L1, shortDate(QDate::currentDate())},
                           {"targetdate"_L1, toDate(told.completionDate)},
                           {"INSURER_ID"_L1, insurer.value(u"INSURER_ID"_s)},

@@ -20,12 +20,10 @@ QVariant findOrAddVendor(const QString& name, const QString& street, const QStri
     db::Recordset vendor = opened(sql("SELECT * FROM VENDOR WHERE NAME LIKE '%{}%'", name));
     if (vendor.eof()) {
         vendor.addNew();
-        // cut to the size of the column: a long address must not make an authorisation fail
+        // cut, because a long address must not make an authorisation fail
         const std::pair<QString, QString> texts[] = {{u"Name"_s, name}, {u"street"_s, street}, {u"phone"_s, phone}};
-        for (const auto& [column, text] : texts) {
-            const int size = vendor.size(column);
-            vendor.set(column, size > 0 ? text.left(size) : text);
-        }
+        for (const auto& [column, text] : texts)
+            vendor.set(column, cutFor(vendor, column, text));
         for (const QLatin1StringView empty :
              {"contact"_L1, "suburb"_L1, "Fax"_L1, "accno"_L1, "email"_L1, "vendor_abn"_L1})
             vendor.set(empty, u""_s);
