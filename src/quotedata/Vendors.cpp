@@ -17,6 +17,8 @@ constexpr int vendorAccount = 293;  // of the ledger
 
 QVariant findOrAddVendor(const QString& name, const QString& street, const QString& phone)
 {
+    if (name.trimmed().isEmpty())
+        return 0;
     db::Recordset vendor = opened(sql("SELECT * FROM VENDOR WHERE NAME LIKE '%{}%'", name));
     if (vendor.eof()) {
         vendor.addNew();

@@ -209,7 +209,9 @@ bool printAuthorised(const xml::Document& message, bool Reprint)
 bool print(const QString& fileName, bool Reprint)
 {
     QString text = files::read(gsListFolder + fileName);
-    const SharedMessage message = sharedMessage(text);
+    SharedMessage message = sharedMessage(text);
+    if (message->parseError().errorCode == xml::BareAmpersand && escapeAmpersands(text))
+        message = sharedMessage(text);  // repaired for the report as for the load
     const MessageType* type = findMessageType(message->documentElement().textOrEmptyOf(u"//*[name()='messageType']"_s));
     if (!type)
         return true;

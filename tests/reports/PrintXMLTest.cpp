@@ -102,6 +102,21 @@ TEST_F(Printing, EachTypeHasItsReportOrNone)
     EXPECT_EQ(shown().substr(0, 67), "[none] An error 91 has occured, Please contact MarlinDesk Support\r\n");
 }
 
+TEST_F(Printing, AMessageIsRepairedForItsReportAsForItsLoad)
+{
+    quote("500").request("QR1");
+    const std::pair<Message, const char*> cases[] = {
+        {quoteRequest("QR1").set("claimDescription", "Hail and wind"), "frmPrintPreview710"},
+        {cancellation("QR1").reason("Hail and wind"), ""},
+    };
+    for (const auto& [message, reports] : cases) {
+        print(message.text().replace(u"Hail and"_s, u"Hail &"_s));
+        EXPECT_EQ(shownReports(), reports);
+        EXPECT_EQ(shown(), "");
+        EXPECT_TRUE(files::read(gsReadPath + u"message.xml"_s).contains(u"Hail & wind"_s)) << "the file stays";
+    }
+}
+
 TEST_F(Printing, TheListWindowReprintsItsReadMessages)
 {
     quote("500").request("QR1").line(1, "PRT").set("qty", 1.0);
