@@ -7,8 +7,8 @@
 #include "platform/profile.h"
 #include "platform/script/Script.h"
 #include "setup/Profile.h"
-#include "shell/eKEST.h"
 #include "shell/component.h"
+#include "shell/eKEST.h"
 #include "support/MariaDbServer.h"
 
 #include <QApplication>

@@ -1,12 +1,12 @@
 // Measures loads of authorised and manual quotes with many lines against the plain statements of the same load.
-#include "setup/QuoteDatabase.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
-#include "base/SharedVariables.h"
-#include "base/modDBAccess.h"
+#include "setup/QuoteDatabase.h"
 
 #include <QCoreApplication>
 #include <QElapsedTimer>

@@ -1,9 +1,9 @@
 // Measures a fill of the message list against reading and parsing each file once.
-#include "messages/Envelope.h"
+#include "base/SharedVariables.h"
 #include "messagelist/Summary.h"
+#include "messages/Envelope.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
-#include "base/SharedVariables.h"
 
 #include <QCoreApplication>
 #include <QElapsedTimer>

@@ -1,11 +1,11 @@
 // Measures search as you type in the message list: the time for a key press, including painting the list.
-#include "setup/QuoteDatabase.h"
-#include "messages/Envelope.h"
-#include "messagelist/frmMessageList.h"
-#include "platform/files/files.h"
-#include "platform/profile.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
+#include "messagelist/frmMessageList.h"
+#include "messages/Envelope.h"
+#include "platform/files/files.h"
+#include "platform/profile.h"
+#include "setup/QuoteDatabase.h"
 
 #include <QApplication>
 #include <QKeyEvent>

@@ -1,13 +1,13 @@
 // Measures the load of a message against the plain statements that it needs, on the same database. Also measures the
 // note chain.
-#include "setup/QuoteDatabase.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
 #include "quotedata/NoteChain.h"
-#include "base/SharedVariables.h"
-#include "base/modDBAccess.h"
+#include "setup/QuoteDatabase.h"
 
 #include <QCoreApplication>
 #include <QElapsedTimer>

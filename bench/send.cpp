@@ -1,15 +1,15 @@
 // Measures a send against the plain statements that it needs and the serialisation of the same tree. Also measures the
 // totals.
-#include "setup/QuoteDatabase.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 #include "outbound/SendQuote.h"
-#include "platform/database/Sql.h"
 #include "platform/Prompt.h"
+#include "platform/database/Sql.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
 #include "platform/xml/xml.h"
 #include "quotedata/QuoteTotals.h"
-#include "base/SharedVariables.h"
-#include "base/modDBAccess.h"
+#include "setup/QuoteDatabase.h"
 
 #include <QCoreApplication>
 #include <QElapsedTimer>

@@ -1,6 +1,6 @@
 // Measures the time from process start to the visible panel against a program that shows one empty window.
-#include "setup/Profile.h"
 #include "platform/profile.h"
+#include "setup/Profile.h"
 #include "shell/component.h"
 
 #include <QApplication>

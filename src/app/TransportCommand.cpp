@@ -1,8 +1,8 @@
 #include "app/TransportCommand.h"
 
 #include "loopback/TransportWindow.h"
-#include "platform/RuntimeError.h"
 #include "platform/Prompt.h"
+#include "platform/RuntimeError.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
 

@@ -21,8 +21,8 @@ db::ConnectionPtr GetConnection();
 /// Opens the connection if it is closed or if the server has dropped it, and returns whether it is open. Every action
 /// of a user that needs the database calls this first.
 bool EnsureConnection();
-/// Reads the settings and opens the connection. If that fails, the connection is closed afterwards, and the reason is in
-/// the error log.
+/// Reads the settings and opens the connection. If that fails, the connection is closed afterwards, and the reason is
+/// in the error log.
 void OpenDatabase();
 /// Returns why the last attempt to open the connection failed, or an empty text if it did not.
 QString connectionFailure();

@@ -1,7 +1,7 @@
 // The command kest2-day plays the working day on a new demo shop, to its end or until the given step has been played.
 #include "day/Day.h"
-#include "platform/RuntimeError.h"
 #include "platform/Prompt.h"
+#include "platform/RuntimeError.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
 

@@ -1,7 +1,7 @@
 #include "loopback/TransportRunner.h"
 
-#include "setup/Profile.h"
 #include "platform/files/files.h"
+#include "setup/Profile.h"
 
 #include <QJsonObject>
 #include <QSocketNotifier>

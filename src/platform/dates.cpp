@@ -21,10 +21,10 @@ const QRegularExpression& isoForm()
 /// Reads d/M/yyyy, alone or with a 24-hour time, or with a 12-hour time and AM or PM.
 const QRegularExpression& shortForm()
 {
-    static const QRegularExpression form(QRegularExpression::anchoredPattern(
-        uR"([ \t\r\n]*(?<day>\d\d?)/(?<month>\d\d?)/(?<year>\d{4}))"
-        uR"((?: [ \t\r\n]*(?<hour>\d\d?):(?<minute>\d\d)(?::(?<second>\d\d))?)"
-        uR"([ \t\r\n]*(?<marker>[AaPp][Mm])?)?[ \t\r\n]*)"_s));
+    static const QRegularExpression form(
+        QRegularExpression::anchoredPattern(uR"([ \t\r\n]*(?<day>\d\d?)/(?<month>\d\d?)/(?<year>\d{4}))"
+                                            uR"((?: [ \t\r\n]*(?<hour>\d\d?):(?<minute>\d\d)(?::(?<second>\d\d))?)"
+                                            uR"([ \t\r\n]*(?<marker>[AaPp][Mm])?)?[ \t\r\n]*)"_s));
     return form;
 }
 

@@ -1,8 +1,8 @@
 #include "setup/DemoShop.h"
 
-#include "setup/QuoteDatabase.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
+#include "setup/QuoteDatabase.h"
 
 #include <QBuffer>
 #include <QDir>

@@ -1,7 +1,7 @@
 #include "shell/component.h"
 
-#include "platform/desktop/Display.h"
 #include "platform/Prompt.h"
+#include "platform/desktop/Display.h"
 #include "platform/desktop/Window.h"
 #include "platform/settings/registry.h"
 #include "shell/eKEST.h"

@@ -1,5 +1,5 @@
-#include "platform/desktop/Programs.h"
 #include "platform/Prompt.h"
+#include "platform/desktop/Programs.h"
 #include "platform/desktop/Window.h"
 
 #include <QApplication>

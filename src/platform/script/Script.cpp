@@ -1,8 +1,8 @@
 #include "platform/script/Script.h"
 
 #include "platform/RuntimeError.h"
-#include "platform/script/Gestures.h"
 #include "platform/desktop/Programs.h"
+#include "platform/script/Gestures.h"
 #include "platform/script/Refusal.h"
 
 #include <QScopeGuard>

@@ -2,8 +2,8 @@
 #pragma once
 
 #include "platform/Prompt.h"
-#include "platform/script/ScriptStep.h"
 #include "platform/desktop/Window.h"
+#include "platform/script/ScriptStep.h"
 
 #include <QHash>
 #include <QJsonArray>

@@ -1,10 +1,10 @@
 #include "platform/script/ScriptStep.h"
 
 #include "platform/RuntimeError.h"
+#include "platform/desktop/Window.h"
 #include "platform/script/Controls.h"
 #include "platform/script/Gestures.h"
 #include "platform/script/Refusal.h"
-#include "platform/desktop/Window.h"
 
 #include <QDialog>
 #include <QEventLoop>
