@@ -40,13 +40,13 @@ QList<ListedMessage> BuildMessageList(MessageFolder folder, const FillHooks& hoo
 
 /// Returns false if a picture that the request names is not yet in the unread folder.
 bool AllImagesPresent(const xml::Document& message);
-/// Returns true if `listed` already has an earlier message of the same request. A manual quote is never held by that
-/// message: it replaces it in `listed`.
+/// Returns true if this fill has already listed an earlier message of the same request, or if the message can't be read.
+/// A manual quote replaces the earlier message in `listed` instead.
 bool IsHeldBehindEarlier(const xml::Document& message, QList<ListedMessage>& listed, const QString& file);
 /// Returns the row of a network message or, if `typeName` is "SENT", of a wrapped outbound document. Never throws: a
 /// value that can't be read stays empty or becomes "-".
 MessageRow GetMessageRow(const QString& text, const QString& typeName);
-/// Returns the row of a quote deletion or another marker. Never throws.
+/// Returns the row of a marker, such as a notice that a quote was sent twice. Never throws.
 MessageRow GetMarkerRow(const QString& text, const QString& typeName);
 /// The same for a text that has already been prepared and parsed.
 MessageRow GetMessageRow(const xml::Document& message, const QString& typeName);
