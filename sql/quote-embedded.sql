@@ -82,7 +82,6 @@ CREATE TABLE QUOTE2 (
     Report_on   INTEGER DEFAULT 0,
     itemno      VARCHAR(5) COLLATE NOCASE
 );
-CREATE INDEX QUOTE2_QUOTE ON QUOTE2 (QTNNO, Subquote);
 
 -- QUOTE3: the long texts of a quote, such as the note chain
 CREATE TABLE QUOTE3 (

@@ -100,11 +100,11 @@ void makeDatabase(bool demo, const QDate& today)
     files::move(embeddedFile(unfinished), embeddedFile(databaseName));
 }
 
-void rebuildIndexes()
+void repairDatabases()
 {
     const QString folder = profile::root() + u"/databases"_s;
     for (const QString& file : files::list(folder, u"*.db"_s))
-        attempt([&] { openEmbedded(file.chopped(3))->rebuildIndexes(); });  // a file may not be a database
+        attempt([&] { repairIndexes(*openEmbedded(file.chopped(3))); });  // a file may not be a quote database
 }
 
 void installTemplates()
@@ -126,7 +126,7 @@ bool initProfile(const std::function<bool()>& registerClass, bool demo, const QD
 {
     settings::check();
     if (isWhole()) {
-        rebuildIndexes();
+        repairDatabases();
         return false;
     }
     files::makeFolder(profile::root());

@@ -45,6 +45,26 @@ void registerResources()
 void createTables(db::Connection& database, Dialect dialect)
 {
     run(database, script(dialect == Dialect::Embedded ? u"quote-embedded.sql"_s : u"quote-mariadb.sql"_s));
+    for (const Index& index : quoteIndexes())
+        database.execute(index.statement);
+}
+
+QList<Index> quoteIndexes()
+{
+    static const QRegularExpression form(u"^CREATE INDEX (\\w+) ON (\\w+) \\((.+)\\)$"_s);
+    QList<Index> indexes;
+    for (const QString& statement : statementsIn(script(u"quote-indexes.sql"_s))) {
+        const auto parts = form.match(statement);
+        indexes.append({parts.captured(1), parts.captured(2), parts.captured(3).split(u", "_s), statement});
+    }
+    return indexes;
+}
+
+void repairIndexes(db::Connection& database)
+{
+    database.rebuildIndexes();
+    for (const Index& index : quoteIndexes())
+        database.execute(QString(index.statement).replace("INDEX "_L1, "INDEX IF NOT EXISTS "_L1));
 }
 
 void fillNewShop(db::Connection& database)

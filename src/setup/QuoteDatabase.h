@@ -4,6 +4,7 @@
 #include "platform/database/Connection.h"
 
 #include <QDate>
+#include <QList>
 #include <QString>
 #include <QStringList>
 
@@ -11,7 +12,20 @@ namespace kest::app {
 
 enum class Dialect { Embedded, MariaDb };
 
-/// Creates all tables in an empty database.
+/// An index of the quote database.
+struct Index {
+    QString name;
+    QString table;
+    QStringList columns;
+    QString statement;  // which creates it, on every engine
+};
+/// Returns the indexes that serve the component's searches, as in quote-indexes.sql.
+QList<Index> quoteIndexes();
+/// Rebuilds all indexes of an embedded quote database, because another tool may have left them in another order, and
+/// creates those that it lacks.
+void repairIndexes(db::Connection& database);
+
+/// Creates all tables and indexes in an empty database.
 void createTables(db::Connection& database, Dialect dialect);
 /// Adds what a host stores before the first quote: settings, stages, colours and the network's insurer.
 void fillNewShop(db::Connection& database);

@@ -151,6 +151,45 @@ TEST_F(Profile, ItsTablesTakeWhatAHostWrites)
     EXPECT_THROW(database->execute(u"INSERT INTO CAR (REGO) VALUES ('abc123 ')"_s), RuntimeError);
 }
 
+// A host's own profile, or one from before there were indexes.
+TEST_F(Profile, GetsTheIndexesThatItLacks)
+{
+    ASSERT_TRUE(app::initProfile(registerClass, false));
+    const QString ours = u"SELECT name FROM sqlite_master WHERE type='index' AND sql<>'' ORDER BY name"_s;
+    const std::string all = column(ours);
+    ASSERT_EQ(all.find("CUSTOMER_NAME"), 0U);
+    for (const app::Index& index : app::quoteIndexes())
+        app::openEmbedded(u"WirSql"_s)->execute(u"DROP INDEX "_s + index.name);
+    ASSERT_EQ(column(ours), "");
+    EXPECT_FALSE(app::initProfile(registerClass, false));
+    EXPECT_EQ(column(ours), all);
+}
+
+// The statements that take the first or the last of several rows count on this order.
+TEST_F(Profile, LeavesRowsOfOneKeyInTheOrderInWhichTheyWereAdded)
+{
+    ASSERT_TRUE(app::initProfile(registerClass, false));
+    db::ConnectionPtr database = app::openEmbedded(u"WirSql"_s);
+    for (const int subquote : {1, 0, 1, 0}) {
+        const QString row = u"(QTNNO, Subquote) VALUES ('9', %1)"_s.arg(subquote);
+        for (const QString& table : {u"QUOTE1"_s, u"QUOTE2"_s, u"QUOTE3"_s})
+            database->execute(u"INSERT INTO "_s + table + u' ' + row);
+    }
+    database->execute(u"UPDATE QUOTE1 SET KESTQRNo='Q', KESTQuoteNo='N'"_s);
+    const std::pair<QString, std::string> cases[] = {
+        {u"SELECT rec_id FROM QUOTE1 WHERE QTNNO='9'"_s, "1 2 3 4"},
+        {u"SELECT rec_id FROM QUOTE1 WHERE QTNNO='9' ORDER BY Subquote"_s, "2 4 1 3"},
+        {u"SELECT rec_id FROM QUOTE1 WHERE QTNNO='9' ORDER BY Subquote DESC"_s, "1 3 2 4"},
+        {u"SELECT rec_id FROM QUOTE1 WHERE QTNNO='9' AND Subquote='1'"_s, "1 3"},
+        {u"SELECT rec_id FROM QUOTE1 WHERE KESTQRNo='q' ORDER BY Subquote DESC"_s, "1 3 2 4"},
+        {u"SELECT rec_id FROM QUOTE1 WHERE KESTQuoteNo='N '"_s, "1 2 3 4"},
+        {u"SELECT itemid FROM QUOTE2 WHERE QTNNO='9' AND Subquote='0'"_s, "2 4"},
+        {u"SELECT Subquote FROM QUOTE3 WHERE QTNNO='9'"_s, "1 0 1 0"},
+    };
+    for (const auto& [select, expected] : cases)
+        EXPECT_EQ(column(select), expected) << select.toStdString();
+}
+
 TEST_F(DemoShop, HoldsTogetherAndItsMessagesAreListedAndLoad)
 {
     for (const QString& rows : linesOf("app/demo-faults.txt"))
