@@ -9,6 +9,7 @@
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
+#include "quotedata/Quote.h"
 #include "quotedata/Rounding.h"
 
 #include <array>
@@ -335,9 +336,7 @@ void WriteQuote(const QString& quoteNumber, const QString& subquote)
     if (!settings.isOpen() || settings.eof())
         return;
 
-    attempt([&] {
-        openRows(job.quote, sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quoteNumber, subquote));
-    });
+    attempt([&] { openRows(job.quote, Quote::headerQuery({quoteNumber, subquote})); });
     attempt([&] {
         openRows(job.mainQuote,
                  sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE=0", job.quote.text(u"QTNNO"_s)));

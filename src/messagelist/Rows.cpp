@@ -1,5 +1,4 @@
 #include "base/Helpers.h"
-#include "base/QuoteKey.h"
 #include "base/SharedVariables.h"
 #include "messagelist/Summary.h"
 #include "messages/Envelope.h"
@@ -8,13 +7,14 @@
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
+#include "quotedata/Quote.h"
 
 using namespace Qt::StringLiterals;
 
 namespace kest {
 namespace {
 
-enum Column { Type, Rego, Claim, Customer, Quote, Vehicle };
+enum RowField { TypeField, RegoField, ClaimField, CustomerField, QuoteField, VehicleField };
 
 // The query that finds the rows of a quote by the key in the message.
 const char* queryOf(RowSource source)
@@ -42,11 +42,11 @@ void draw(QString& value, Draw&& drawn)
     attempt([&] { value = drawn(); });
 }
 
-void dashWhereEmpty(MessageRow& row, std::initializer_list<Column> columns)
+void dashWhereEmpty(MessageRow& row, std::initializer_list<RowField> fields)
 {
-    for (const Column column : columns)
-        if (row[column].isEmpty())
-            row[column] = u"-"_s;
+    for (const RowField field : fields)
+        if (row[field].isEmpty())
+            row[field] = u"-"_s;
 }
 
 QString personName(const xml::Node& person, const QString& prefix)
@@ -91,27 +91,28 @@ QString vehicleName(const QVariant& model)
 
 void drawFromMessage(MessageRow& row, const xml::Document& message, const MessageType& type)
 {
-    draw(row[Rego], [&] { return NormaliseRego(message.textOf(u"//rootns:vehicleRegistration"_s)); });
-    draw(row[Claim], [&] { return message.textOf(u"//rootns:claimNumber"_s); });
-    draw(row[Vehicle], [&] { return message.textOf(u"//rootns:vehicleDescription"_s); });
+    draw(row[RegoField], [&] { return NormaliseRego(message.textOf(u"//rootns:vehicleRegistration"_s)); });
+    draw(row[ClaimField], [&] { return message.textOf(u"//rootns:claimNumber"_s); });
+    draw(row[VehicleField], [&] { return message.textOf(u"//rootns:vehicleDescription"_s); });
     if (type.code == MessageCode::QREQ) {
-        row[Quote] = u"-"_s;
-        draw(row[Customer], [&] { return customerOfRequest(message); });
+        row[QuoteField] = u"-"_s;
+        draw(row[CustomerField], [&] { return customerOfRequest(message); });
         return;
     }
-    draw(row[Quote], [&] { return NormaliseQuoteRef(message.textOf(u"//rootns:quoteBody/rootns:quoteReference"_s)); });
-    draw(row[Customer], [&] { return customerOfCar(row[Rego], type.rowsNeeded); });
+    draw(row[QuoteField],
+         [&] { return NormaliseQuoteRef(message.textOf(u"//rootns:quoteBody/rootns:quoteReference"_s)); });
+    draw(row[CustomerField], [&] { return customerOfCar(row[RegoField], type.rowsNeeded); });
 }
 
 // `quote` is a row of QUOTE1 joined with its CAR.
 void drawFromQuote(MessageRow& row, const db::Recordset& quote)
 {
-    draw(row[Claim], [&] { return toText(quote.value(u"Claim"_s)); });
-    draw(row[Quote], [&] {
+    draw(row[ClaimField], [&] { return toText(quote.value(u"Claim"_s)); });
+    draw(row[QuoteField], [&] {
         return NormaliseQuoteRef(toText(quote.value(u"QTNNO"_s)) + u'/' + toText(quote.value(u"Subquote"_s)));
     });
-    draw(row[Vehicle], [&] { return vehicleName(quote.value(u"MODEL_ID"_s)); });
-    draw(row[Customer], [&] { return customerName(quote.value(u"CUST_ID"_s), RowsNeeded::ExactlyOne); });
+    draw(row[VehicleField], [&] { return vehicleName(quote.value(u"MODEL_ID"_s)); });
+    draw(row[CustomerField], [&] { return customerName(quote.value(u"CUST_ID"_s), RowsNeeded::ExactlyOne); });
 }
 
 void drawThroughKey(MessageRow& row, const xml::Document& message, const MessageType& type)
@@ -121,16 +122,14 @@ void drawThroughKey(MessageRow& row, const xml::Document& message, const Message
         quote.open(sql(queryOf(type.rowSource), message.textOf(type.rowKey)));
         if (!suffices(quote, type.rowsNeeded))
             return;
-        draw(row[Rego], [&] { return toText(quote.value(u"REGO"_s)); });
+        draw(row[RegoField], [&] { return toText(quote.value(u"REGO"_s)); });
         drawFromQuote(row, quote);
     });
 }
 
 QString claimOfQuote(const QString& reference)
 {
-    const QuoteKey key = QuoteKey::fromReference(reference);
-    db::Recordset quote(gConn);
-    quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key.number, key.subquote));
+    const db::Recordset quote = Quote::openHeader(QuoteKey::fromReference(reference));
     if (!suffices(quote, RowsNeeded::ExactlyOne))
         return {};
     return quote.isNull(u"Claim"_s) ? u"-"_s : quote.text(u"Claim"_s);
@@ -147,15 +146,15 @@ QString customerOfSentQuote(const xml::Document& document)
 MessageRow sentRow(const xml::Document& document)
 {
     MessageRow row{u"Sent Quote"_s};
-    draw(row[Rego], [&] { return NormaliseRego(document.textOf(u"//request/vehicleRegistration"_s)); });
+    draw(row[RegoField], [&] { return NormaliseRego(document.textOf(u"//request/vehicleRegistration"_s)); });
     attempt([&] {
         const QString reference = document.textOf(u"//request/quoteBody/quoteReference"_s);
-        row[Quote] = NormaliseQuoteRef(reference);
-        row[Claim] = claimOfQuote(reference);
+        row[QuoteField] = NormaliseQuoteRef(reference);
+        row[ClaimField] = claimOfQuote(reference);
     });
-    draw(row[Customer], [&] { return customerOfSentQuote(document); });
-    draw(row[Vehicle], [&] { return document.textOf(u"//request/vehicleDescription"_s); });
-    dashWhereEmpty(row, {Rego, Customer, Vehicle});
+    draw(row[CustomerField], [&] { return customerOfSentQuote(document); });
+    draw(row[VehicleField], [&] { return document.textOf(u"//request/vehicleDescription"_s); });
+    dashWhereEmpty(row, {RegoField, CustomerField, VehicleField});
     return row;
 }
 
@@ -179,10 +178,10 @@ MessageRow GetMessageRow(const xml::Document& message, const QString& typeName)
     MessageRow row{typeName};
     if (type->rowSource == RowSource::Message) {
         drawFromMessage(row, message, *type);
-        dashWhereEmpty(row, {Rego, Customer, Quote, Vehicle});
+        dashWhereEmpty(row, {RegoField, CustomerField, QuoteField, VehicleField});
     } else {
         drawThroughKey(row, message, *type);
-        dashWhereEmpty(row, {Rego, Claim, Customer, Quote, Vehicle});
+        dashWhereEmpty(row, {RegoField, ClaimField, CustomerField, QuoteField, VehicleField});
     }
     return row;
 }
@@ -197,19 +196,19 @@ MessageRow GetMarkerRow(const xml::Document& marker, const QString& typeName)
 {
     MessageRow row{typeName};
     QString subquote;
-    draw(row[Quote], [&] { return marker.textOf(u"qtnno"_s); });
+    draw(row[QuoteField], [&] { return marker.textOf(u"qtnno"_s); });
     draw(subquote, [&] { return marker.textOf(u"subquote"_s); });
-    draw(row[Rego], [&] { return marker.textOf(u"rego"_s); });
+    draw(row[RegoField], [&] { return marker.textOf(u"rego"_s); });
     attempt([&] {
         db::Recordset quote(gConn);
         quote.open(
             sql("SELECT * FROM QUOTE1, CAR WHERE QUOTE1.REGO=CAR.REGO AND QUOTE1.QTNNO='{}' AND "
                 "QUOTE1.subquote='{}' ORDER BY QUOTE1.rec_id DESC",
-                row[Quote], subquote));
+                row[QuoteField], subquote));
         if (suffices(quote, RowsNeeded::ExactlyOne))
             drawFromQuote(row, quote);
     });
-    dashWhereEmpty(row, {Rego, Claim, Customer, Quote, Vehicle});
+    dashWhereEmpty(row, {RegoField, ClaimField, CustomerField, QuoteField, VehicleField});
     return row;
 }
 

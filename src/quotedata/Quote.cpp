@@ -52,9 +52,14 @@ db::Recordset& Quote::notes()
     return openedOnce(noteRow, openNotes, quoteKey);
 }
 
+QString Quote::headerQuery(const QuoteKey& key)
+{
+    return sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key.number, key.subquote);
+}
+
 db::Recordset Quote::openHeader(const QuoteKey& key)
 {
-    return opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key.number, key.subquote));
+    return opened(headerQuery(key));
 }
 
 db::Recordset Quote::openLines(const QuoteKey& key)

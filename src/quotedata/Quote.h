@@ -29,6 +29,8 @@ public:
     db::Recordset& lines();   // QUOTE2
     db::Recordset& notes();   // QUOTE3
 
+    /// Returns the statement that openHeader() opens.
+    static QString headerQuery(const QuoteKey& key);
     /// Open the records of a quote directly.
     static db::Recordset openHeader(const QuoteKey& key);
     static db::Recordset openLines(const QuoteKey& key);

@@ -6,6 +6,7 @@
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
+#include "quotedata/Quote.h"
 
 #include <QRegularExpression>
 
@@ -38,11 +39,9 @@ QStringList subletDocumentNumbers(const QuoteKey& quote)
 
 QList<SubletDocument> subletDocuments(const QuoteKey& quote, const QStringList& numbers)
 {
-    db::Recordset lines(gConn);
+    db::Recordset lines;
     db::Recordset vendors(gConn);
-    attempt([&] {
-        lines.open(sql("SELECT * FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", quote.number, quote.subquote));
-    });
+    attempt([&] { lines = Quote::openLines(quote); });
     attempt([&] { vendors.open(u"SELECT VENDOR_ID, NAME FROM VENDOR"_s); });
 
     QList<SubletDocument> documents;
