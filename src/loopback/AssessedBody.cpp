@@ -117,7 +117,7 @@ void authorise(BodyLine& sublet, const QString& reference)
 }
 
 /// Returns all lines in random order, without the sublets, whose amounts an insurer does not change.
-QList<std::pair<int, BodyLine*>> changeable(QuoteBody& body, Dice& dice)
+QList<std::pair<int, BodyLine*>> changeable(AssessedBody& body, Dice& dice)
 {
     QList<std::pair<int, BodyLine*>> lines;
     for (const int section : {Labours, Paints, Parts})
@@ -153,7 +153,7 @@ double sum(const QList<BodyLine>& lines, const QString& name)
 }
 
 struct Totals {
-    explicit Totals(const QuoteBody& body)
+    explicit Totals(const AssessedBody& body)
         : labour(sum(body.lines[Labours], u"labourAmount"_s)),
           paint(sum(body.lines[Paints], u"paintAmount"_s)),
           parts(sum(body.lines[Parts], u"partAmount"_s)),
@@ -168,12 +168,12 @@ struct Totals {
 
 }  // namespace
 
-double QuoteBody::total() const
+double AssessedBody::total() const
 {
     return Totals(*this).whole;
 }
 
-void QuoteBody::writeTo(const Branch& body) const
+void AssessedBody::writeTo(const Branch& body) const
 {
     const auto section = [&](int index) {
         const BodySection& kind = bodySections()[index];
@@ -197,16 +197,16 @@ void QuoteBody::writeTo(const Branch& body) const
     section(Sublets);
 }
 
-QuoteBody sameBody(const QuoteDocument& quote)
+AssessedBody sameBody(const QuoteDocument& quote)
 {
-    QuoteBody body{quote.reference(), quote.type, {}};
+    AssessedBody body{quote.reference(), quote.type, {}};
     std::copy(std::begin(quote.lines), std::end(quote.lines), body.lines);
     return body;
 }
 
-QuoteBody assessedBody(const QuoteDocument& quote, const Changes& changes, Dice& dice)
+AssessedBody assessedBody(const QuoteDocument& quote, const Changes& changes, Dice& dice)
 {
-    QuoteBody body = sameBody(quote);
+    AssessedBody body = sameBody(quote);
     for (QList<BodyLine>& section : body.lines)
         for (BodyLine& line : section)
             line.indicator = u"N"_s;
@@ -235,9 +235,9 @@ QuoteBody assessedBody(const QuoteDocument& quote, const Changes& changes, Dice&
     return body;
 }
 
-QuoteBody manualBody(const QString& reference, const QString& type, const int (&counts)[SectionCount], Dice& dice)
+AssessedBody manualBody(const QString& reference, const QString& type, const int (&counts)[SectionCount], Dice& dice)
 {
-    QuoteBody body{reference, type, {}};
+    AssessedBody body{reference, type, {}};
     int number = 0;
     for (int section = 0; section < SectionCount; ++section)
         for (int line = 0; line < counts[section]; ++line)

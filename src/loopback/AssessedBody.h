@@ -8,7 +8,7 @@
 namespace kest::app {
 
 /// The body of a quote document from the insurer.
-struct QuoteBody {
+struct AssessedBody {
     QString reference;
     QString type;
     QList<BodyLine> lines[SectionCount];
@@ -29,10 +29,10 @@ struct Changes {
 
 /// Returns the shop's lines after the changes, each with its indicator. The numbers of added lines are higher than all
 /// of the shop's.
-QuoteBody assessedBody(const QuoteDocument& quote, const Changes& changes, Dice& dice);
+AssessedBody assessedBody(const QuoteDocument& quote, const Changes& changes, Dice& dice);
 /// Returns the shop's lines unchanged and without indicators.
-QuoteBody sameBody(const QuoteDocument& quote);
+AssessedBody sameBody(const QuoteDocument& quote);
 /// Returns a quote that the insurer wrote. `counts` is the number of lines in each section.
-QuoteBody manualBody(const QString& reference, const QString& type, const int (&counts)[SectionCount], Dice& dice);
+AssessedBody manualBody(const QString& reference, const QString& type, const int (&counts)[SectionCount], Dice& dice);
 
 }  // namespace kest::app

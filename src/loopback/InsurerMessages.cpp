@@ -15,20 +15,21 @@ namespace {
 constexpr int daysToQuote = 2;
 constexpr int daysToRepair = 14;
 
-struct Kind {
+/// The code of a message and the name of its root element.
+struct MessageHead {
     QLatin1StringView code;
     QLatin1StringView root;
 };
 
-Kind of(MessageCode code)
+MessageHead of(MessageCode code)
 {
     const MessageType& type = messageType(code);
     return {type.text, type.root};
 }
 
-const Kind& kindOf(Act act)
+const MessageHead& headOf(Act act)
 {
-    static const std::map<Act, Kind> kinds{
+    static const std::map<Act, MessageHead> heads{
         {Act::Request, of(MessageCode::QREQ)},   {Act::Respond, {""_L1, "submitQuoteResponse"_L1}},
         {Act::Match, of(MessageCode::QMQR)},     {Act::Authorise, of(MessageCode::AUQT)},
         {Act::Adjust, of(MessageCode::ADQT)},    {Act::Revise, of(MessageCode::RRQT)},
@@ -36,7 +37,7 @@ const Kind& kindOf(Act act)
         {Act::Reinstate, of(MessageCode::BCQR)}, {Act::Reject, of(MessageCode::ARES)},
         {Act::BackOut, of(MessageCode::BACA)},   {Act::Waive, of(MessageCode::EWAP)},
         {Act::Manual, of(MessageCode::MANQ)},    {Act::Marker, {"MDMSG"_L1, "mail"_L1}}};
-    return kinds.at(act);
+    return heads.at(act);
 }
 
 /// Returns the values of a step's parameters, or random ones if the step does not have them.
@@ -137,7 +138,7 @@ Changes changesOf(const Step& step)
 
 void writeAuthorised(const Branch& quote, const Step& step, const Matter& matter, Dice& dice, const QDate& today)
 {
-    const QuoteBody body = assessedBody(matter.document, changesOf(step), dice);
+    const AssessedBody body = assessedBody(matter.document, changesOf(step), dice);
     quote.add({{"kestAuthorisedQuoteNumber", always, matter.authorised},
                {"authorityNumber", always, u"AU"_s + matter.authorised},
                {"quoteRequestNumber", always, matter.request},
@@ -170,7 +171,7 @@ void writeAdjusted(const Branch& quote, const Step& step, const Matter& matter, 
 }
 
 /// Writes a quote that returns to the shop, with its request and its vehicle.
-void writeQuote(const Branch& quote, const Matter& matter, const QuoteBody& body)
+void writeQuote(const Branch& quote, const Matter& matter, const AssessedBody& body)
 {
     quote.add({{"kestQuoteNumber", always, matter.network},
                filled("quoteRequestNumber", matter.request),  // an empty number would hold back other messages
@@ -180,7 +181,7 @@ void writeQuote(const Branch& quote, const Matter& matter, const QuoteBody& body
     body.writeTo(quote.add("quoteBody"));
 }
 
-QuoteBody manualBodyOf(const Step& step, const Matter& matter, Dice& dice)
+AssessedBody manualBodyOf(const Step& step, const Matter& matter, Dice& dice)
 {
     const int counts[] = {step.number(u"labour"_s, 2), step.number(u"paint"_s, 1), step.number(u"parts"_s, 1),
                           step.number(u"sublet"_s)};
@@ -246,16 +247,16 @@ void write(const Branch& root, const Step& step, const Matter& matter, Dice& dic
 
 QString messageCode(Act act)
 {
-    return kindOf(act).code;
+    return headOf(act).code;
 }
 
 QString messageText(const Step& step, const Matter& matter, Dice& dice, const QDate& today)
 {
     xml::Document document;
-    const Kind& kind = kindOf(step.act);
-    const Branch root(document, kind.root.data(), step.act == Act::Marker ? QString() : GetNamespaceURI());
+    const MessageHead& head = headOf(step.act);
+    const Branch root(document, head.root.data(), step.act == Act::Marker ? QString() : GetNamespaceURI());
     if (step.act != Act::Marker && step.act != Act::Respond)
-        root.addOutside("messageType", kind.code);
+        root.addOutside("messageType", head.code);
     write(root, step, matter, dice, today);
     return document.xml();
 }

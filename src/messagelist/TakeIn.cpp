@@ -19,10 +19,10 @@ namespace {
 
 constexpr qsizetype refusalsSaid = 10;  // more would make the box taller than the screen
 
-enum class Kind { Picture, Description, Message };
+enum class FileKind { Picture, Description, Message };
 
-// Thrown if a file is refused.
-struct Refusal {
+/// Thrown if a file is not taken in.
+struct NotTaken {
     QString why;
 };
 
@@ -31,47 +31,47 @@ void checkResponse(const xml::Document& document, const QString& name)
 {
     if (document.textOrEmptyOf(u"rootns:kestQuoteNumber"_s).isEmpty() ||
         document.textOrEmptyOf(u"rootns:quoteSubmissionStatus"_s).isEmpty())
-        throw Refusal{u"it is not a response of the network"_s};
+        throw NotTaken{u"it is not a response of the network"_s};
     if (Quote::openHeader(QuoteKey::fromResponseName(name)).eof())
-        throw Refusal{u"the quote that it answers does not exist"_s};
+        throw NotTaken{u"the quote that it answers does not exist"_s};
 }
 
 void checkMessage(const QString& path, const QString& name)
 {
     if (files::size(path) > xml::Document::maximumBytes)
-        throw Refusal{u"it is too large for a message"_s};
+        throw NotTaken{u"it is too large for a message"_s};
     QString text = files::read(path);
     xml::Document document;
     SetupDocument(document);
     if (!parseWithRepairs(document, text))
-        throw Refusal{u"it can't be read as XML"_s};
+        throw NotTaken{u"it can't be read as XML"_s};
     if (name.startsWith("R_"_L1))
         return checkResponse(document, name);
     const bool isNetworkMessage = !name.contains("MDMSG"_L1) && GetMessageTypeName(document) != unknownMessageType;
     if (!isNetworkMessage && !isMarker(document))
-        throw Refusal{u"it is not a message of the network"_s};
+        throw NotTaken{u"it is not a message of the network"_s};
 }
 
-Kind kindOf(const QString& path, const QString& name)
+FileKind kindOf(const QString& path, const QString& name)
 {
     if (files::folderExists(path))
-        throw Refusal{u"it is a folder"_s};
+        throw NotTaken{u"it is a folder"_s};
     if (!files::isPlainName(name) || !files::exists(path))
-        throw Refusal{u"there is no such file"_s};
+        throw NotTaken{u"there is no such file"_s};
     if (QFileInfo(path).canonicalPath() == QFileInfo(files::systemPath(gsUnreadPath)).canonicalFilePath())
-        throw Refusal{u"it is already in the unread folder"_s};
+        throw NotTaken{u"it is already in the unread folder"_s};
     if (name.endsWith("xml"_L1)) {
         checkMessage(path, name);
-        return Kind::Message;
+        return FileKind::Message;
     }
     if (name.endsWith(".xml"_L1, Qt::CaseInsensitive))
-        throw Refusal{u"the name of a message must end in \"xml\" in lower case"_s};
+        throw NotTaken{u"the name of a message must end in \"xml\" in lower case"_s};
     const bool isPicture = files::matches(name, u"*.jpg"_s);
     if (!isPicture && !files::matches(name, u"*.txt"_s))
-        throw Refusal{u"it is not a message, a picture (.jpg) or a description (.txt)"_s};
+        throw NotTaken{u"it is not a message, a picture (.jpg) or a description (.txt)"_s};
     if (!files::matches(name, u"?*_???*.???"_s))
-        throw Refusal{u"its name must be like that of a request's picture, such as 20551_001.jpg"_s};
-    return isPicture ? Kind::Picture : Kind::Description;
+        throw NotTaken{u"its name must be like that of a request's picture, such as 20551_001.jpg"_s};
+    return isPicture ? FileKind::Picture : FileKind::Description;
 }
 
 bool mayBeWritten(const QString& name)
@@ -84,7 +84,7 @@ bool mayBeWritten(const QString& name)
 struct Brought {
     QString path;
     QString name;
-    Kind kind;
+    FileKind kind;
 };
 
 QString counted(int count, const QString& one)
@@ -118,7 +118,7 @@ TakenIn takeInFiles(const QList<QUrl>& urls, const std::function<void(qint64 don
     const auto unlessRefused = [&](const QString& name, const auto& step) {
         try {
             step();
-        } catch (const Refusal& refusal) {
+        } catch (const NotTaken& refusal) {
             result.refused.append(name + ": "_L1 + refusal.why);
         } catch (const RuntimeError& error) {
             result.refused.append(name + ": "_L1 + error.description());
@@ -131,7 +131,7 @@ TakenIn takeInFiles(const QList<QUrl>& urls, const std::function<void(qint64 don
         const QString name = QFileInfo(path).fileName();
         unlessRefused(url.isLocalFile() && !name.isEmpty() ? name : url.toDisplayString(), [&] {
             if (!url.isLocalFile())
-                throw Refusal{u"it is not on this computer"_s};
+                throw NotTaken{u"it is not on this computer"_s};
             brought.append({path, name, kindOf(path, name)});
         });
     }
@@ -144,8 +144,10 @@ TakenIn takeInFiles(const QList<QUrl>& urls, const std::function<void(qint64 don
             if (!mayBeWritten(name))
                 return;
             files::copy(path, files::pathForWriting(gsUnreadPath, name));
-            ++(kind == Kind::Message ? result.messages : kind == Kind::Picture ? result.pictures : result.descriptions);
-            if (kind == Kind::Message && !name.startsWith("R_"_L1))
+            ++(kind == FileKind::Message   ? result.messages
+               : kind == FileKind::Picture ? result.pictures
+                                           : result.descriptions);
+            if (kind == FileKind::Message && !name.startsWith("R_"_L1))
                 result.toList.append(name);
         });
         if (progress)

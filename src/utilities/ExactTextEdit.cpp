@@ -21,14 +21,14 @@ bool endsLine(QChar c)
 }
 
 /// A line as it is shown, and the characters between it and the line before.
-struct Line {
+struct ShownLine {
     QStringView characters;
     QStringView jointBefore;
 };
 
-QList<Line> linesOf(QStringView text)
+QList<ShownLine> linesOf(QStringView text)
 {
-    QList<Line> lines;
+    QList<ShownLine> lines;
     QStringView jointBefore;
     while (true) {
         const auto limit = text.begin() + qMin(text.size(), longestLine);
@@ -48,10 +48,10 @@ ExactTextEdit::ExactTextEdit(QWidget* parent) : QPlainTextEdit(parent) {}
 
 void ExactTextEdit::setExactText(const QString& text)
 {
-    const QList<Line> lines = linesOf(text);
+    const QList<ShownLine> lines = linesOf(text);
     QString shown = lines.first().characters.toString();
     shown.reserve(text.size() + lines.size());
-    for (const Line& line : lines.sliced(1)) {
+    for (const ShownLine& line : lines.sliced(1)) {
         shown += u'\n';
         shown += line.characters;
     }
@@ -62,7 +62,7 @@ void ExactTextEdit::setExactText(const QString& text)
     QTextCursor cursor(document());
     cursor.beginEditBlock();
     QTextBlock block = document()->begin();
-    for (const Line& line : lines.sliced(1)) {
+    for (const ShownLine& line : lines.sliced(1)) {
         block = block.next();
         if (line.jointBefore == usualJoint)
             continue;

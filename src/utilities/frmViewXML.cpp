@@ -94,14 +94,14 @@ void frmViewXML::fillFindBar()
         before = control;
     }
 
-    const auto find = [this](auto* sender, auto signal, bool backward) {
-        desktop::onEvent(sender, signal, this, u"frmViewXML.Find"_s, [this, backward] { findNext(backward); });
+    const auto find = [this](auto* sender, auto signal, QTextDocument::FindFlags direction) {
+        desktop::onEvent(sender, signal, this, u"frmViewXML.Find"_s, [this, direction] { findNext(direction); });
     };
-    find(txtFind, &QLineEdit::returnPressed, false);
-    find(next, &QPushButton::clicked, false);
-    find(previous, &QPushButton::clicked, true);
-    find(new QShortcut(QKeySequence(Qt::Key_F3), this), &QShortcut::activated, false);
-    find(new QShortcut(QKeySequence(Qt::SHIFT | Qt::Key_F3), this), &QShortcut::activated, true);
+    find(txtFind, &QLineEdit::returnPressed, {});
+    find(next, &QPushButton::clicked, {});
+    find(previous, &QPushButton::clicked, QTextDocument::FindBackward);
+    find(new QShortcut(QKeySequence(Qt::Key_F3), this), &QShortcut::activated, {});
+    find(new QShortcut(QKeySequence(Qt::SHIFT | Qt::Key_F3), this), &QShortcut::activated, QTextDocument::FindBackward);
     desktop::onEvent(new QShortcut(QKeySequence::Find, this), &QShortcut::activated, this, u"frmViewXML.Find"_s,
                      [this] {
                          txtFind->setFocus();
@@ -181,16 +181,15 @@ void frmViewXML::Command2_Click()
     close();
 }
 
-void frmViewXML::findNext(bool backward)
+void frmViewXML::findNext(QTextDocument::FindFlags direction)
 {
     const QString wanted = txtFind->text();
     if (wanted.isEmpty())
         return;
-    const QTextDocument::FindFlags direction = backward ? QTextDocument::FindBackward : QTextDocument::FindFlags();
     if (txtXML->find(wanted, direction))
         return;
     const QTextCursor here = txtXML->textCursor();
-    txtXML->moveCursor(backward ? QTextCursor::End : QTextCursor::Start);
+    txtXML->moveCursor(direction.testFlag(QTextDocument::FindBackward) ? QTextCursor::End : QTextCursor::Start);
     if (txtXML->find(wanted, direction))
         return;
     txtXML->setTextCursor(here);

@@ -3,6 +3,8 @@
 
 #include "platform/desktop/Form.h"
 
+#include <QTextDocument>
+
 #include <array>
 
 class QLabel;
@@ -32,7 +34,7 @@ private:
     void fillFindBar();
     void Command1_Click();
     void Command2_Click();
-    void findNext(bool backward);
+    void findNext(QTextDocument::FindFlags direction);
     void showPosition();
     void colourVisibleTags();
 

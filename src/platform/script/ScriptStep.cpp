@@ -166,19 +166,20 @@ Action shotStep(const StepForm& form)
     };
 }
 
-struct Kind {
+/// A word that begins a step, and how to read the step.
+struct StepWord {
     QLatin1StringView word;
     QLatin1StringView argument;  // empty if the step has no second key
     Action (*parse)(const StepForm&);
 };
 
 // "tab" comes before "key", because "key" is also its argument.
-constexpr std::array kinds{
-    Kind{"click"_L1, ""_L1, clickStep},   Kind{"doubleClick"_L1, ""_L1, doubleClickStep},
-    Kind{"set"_L1, "text"_L1, setStep},   Kind{"tab"_L1, "key"_L1, tabStep},
-    Kind{"key"_L1, "keys"_L1, keyStep},   Kind{"select"_L1, "item"_L1, selectStep},
-    Kind{"resize"_L1, ""_L1, resizeStep}, Kind{"wait"_L1, ""_L1, waitStep},
-    Kind{"read"_L1, ""_L1, readStep},     Kind{"shot"_L1, ""_L1, shotStep},
+constexpr std::array stepWords{
+    StepWord{"click"_L1, ""_L1, clickStep},   StepWord{"doubleClick"_L1, ""_L1, doubleClickStep},
+    StepWord{"set"_L1, "text"_L1, setStep},   StepWord{"tab"_L1, "key"_L1, tabStep},
+    StepWord{"key"_L1, "keys"_L1, keyStep},   StepWord{"select"_L1, "item"_L1, selectStep},
+    StepWord{"resize"_L1, ""_L1, resizeStep}, StepWord{"wait"_L1, ""_L1, waitStep},
+    StepWord{"read"_L1, ""_L1, readStep},     StepWord{"shot"_L1, ""_L1, shotStep},
 };
 
 }  // namespace
@@ -187,14 +188,15 @@ ScriptStep parseStep(const QJsonValue& json, const QString& place)
 {
     const QJsonObject object = json.toObject();
     const StepForm form(object, place);
-    const auto kind = std::ranges::find_if(kinds, [&](const Kind& known) { return object.contains(known.word); });
-    if (kind == kinds.end())
+    const auto step =
+        std::ranges::find_if(stepWords, [&](const StepWord& known) { return object.contains(known.word); });
+    if (step == stepWords.end())
         form.fail(u"this is not a step"_s);
     for (const QString& key : object.keys())
-        if (key != kind->word && (kind->argument.isEmpty() || key != kind->argument))
-            form.fail(u"\"%1\" does not belong to a step \"%2\""_s.arg(key, kind->word));
+        if (key != step->word && (step->argument.isEmpty() || key != step->argument))
+            form.fail(u"\"%1\" does not belong to a step \"%2\""_s.arg(key, step->word));
     const QString description = QString::fromUtf8(QJsonDocument(object).toJson(QJsonDocument::Compact));
-    return {description, kind->parse(form)};
+    return {description, step->parse(form)};
 }
 
 }  // namespace kest::desktop
