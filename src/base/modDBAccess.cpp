@@ -7,6 +7,8 @@
 #include "platform/settings/registry.h"
 #include "platform/values.h"
 
+#include <QDeadlineTimer>
+#include <QElapsedTimer>
 #include <QSysInfo>
 
 namespace kest {
@@ -21,14 +23,31 @@ QString gsInstance;
 
 namespace {
 
-constexpr int commandTimeout = 120;  // seconds
+constexpr int longestCommand = 120;         // seconds
+constexpr qint64 slowMilliseconds = 1000;   // an attempt that takes longer to fail has met a silent server
+constexpr qint64 pauseMilliseconds = 5000;  // before a silent server is tried again
 constexpr auto mysqlServer = "mysql:"_L1;
 
 std::optional<RuntimeError> lastFailure;  // from the last attempt to open the connection
+QDeadlineTimer silence;                   // until then, a silent server is not tried again
 
 QString splashSetting(const QString& key, const QString& fallback = {})
 {
     return GetRegSetting(u"wirra32"_s, u"frmsplash"_s, key, fallback, CopyUp::No);
+}
+
+/// Returns the time limit of a statement in seconds. A setting can only lower it.
+int commandTimeout()
+{
+    double seconds = 0;
+    attempt([&] { seconds = toDouble(splashSetting(u"CommandTimeout"_s)); });
+    return seconds >= 1 && seconds < longestCommand ? int(seconds) : longestCommand;
+}
+
+QString odbcOptions()
+{
+    const QString prefix = splashSetting(u"TabletUseMaster"_s) == u"1"_s ? u"TabletMaster"_s : QString();
+    return qEnvironmentVariable("KEST2_ODBC_OPTIONS", splashSetting(prefix + u"OdbcOptions"_s));
 }
 
 }  // namespace
@@ -77,6 +96,8 @@ bool EnsureConnection()
 {
     if (isOpen())
         return true;
+    if (gcnDB && !silence.hasExpired())
+        return false;  // otherwise each of several steps would wait for the same server
     OpenDatabase();
     gConn = gcnDB;
     return isOpen();
@@ -88,10 +109,15 @@ void OpenDatabase()
         gcnDB = std::make_shared<db::Connection>();  // keep an existing one: recordsets, such as the panel's, use it
     const QString failureBefore = connectionFailure();
     lastFailure.reset();
+    QElapsedTimer time;
+    time.start();
     attempt([&] {
         try {
             readConnectionSettings();
             settings::check();  // a damaged file must not open the database of the default settings
+            gcnDB->close();
+            gcnDB->setCommandTimeout(commandTimeout());
+            gcnDB->setOdbcOptions(odbcOptions());
             gcnDB->open(connectionText(driverNumber()));
         } catch (const RuntimeError& error) {
             lastFailure = error;
@@ -99,7 +125,7 @@ void OpenDatabase()
                 logFailure(error, u"modDBAccess.OpenDatabase"_s);
         }
     });
-    attempt([] { gcnDB->setCommandTimeout(commandTimeout); });
+    silence = QDeadlineTimer(lastFailure && time.hasExpired(slowMilliseconds) ? pauseMilliseconds : 0);
 }
 
 QString connectionFailure()

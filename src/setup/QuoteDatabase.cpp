@@ -91,6 +91,7 @@ db::ConnectionPtr openEmbedded(const QString& name)
     }
     // no machine registers this driver with ODBC, so the connection uses the embedded engine
     auto database = std::make_shared<db::Connection>();
+    database->setCommandTimeout(0);  // a large database takes long to set up
     database->open(u"Driver={embedded};Server=(local)\\;Database=%1;"_s.arg(name));
     return database;
 }

@@ -164,8 +164,7 @@ TEST_P(Database, AConnectionThatHasGoneIsNoticedAndCanBeOpenedAgain)
     EXPECT_EQ(failure([&] { none.open(u"SELECT 1"_s); }).number(), NoObject);
 }
 
-INSTANTIATE_TEST_SUITE_P(Engines, Database, ::testing::Values(On::Embedded, On::MySql, On::Odbc));
-INSTANTIATE_TEST_SUITE_P(DISABLED_SqlServer, Database, ::testing::Values(On::Tds));
+INSTANTIATE_TEST_SUITE_P(Engines, Database, ::testing::Values(On::Embedded, On::MySql, On::Odbc, On::Tds));
 
 class EmbeddedDatabase : public Database {};
 

@@ -309,8 +309,7 @@ TEST_P(RecordsetOn, AFilterShowsTheRowsThatMatchAndADisconnectedOneLivesOn)
     EXPECT_EQ(failure([&] { lines.update(); }).number(), ObjectClosed);
 }
 
-INSTANTIATE_TEST_SUITE_P(Engines, RecordsetOn, ::testing::Values(On::Embedded, On::MySql, On::Odbc));
-INSTANTIATE_TEST_SUITE_P(DISABLED_SqlServer, RecordsetOn, ::testing::Values(On::Tds));
+INSTANTIATE_TEST_SUITE_P(Engines, RecordsetOn, ::testing::Values(On::Embedded, On::MySql, On::Odbc, On::Tds));
 
 TEST(DeclaredTable, CutsTextsAndCountsItsPendingRow)
 {

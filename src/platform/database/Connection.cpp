@@ -1,13 +1,12 @@
 #include "platform/database/Connection.h"
 
 #include "platform/RuntimeError.h"
+#include "platform/database/ConnectionText.h"
+#include "platform/database/OdbcDrivers.h"
 #include "platform/database/Session.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
 
-#include <QDir>
-#include <QFile>
-#include <QHash>
 #include <QSysInfo>
 
 namespace kest::db {
@@ -15,54 +14,6 @@ namespace kest::db {
 using namespace Qt::StringLiterals;
 
 namespace {
-
-/// Returns the fields of a connection text with their names in lower case. A value in braces may contain ";".
-QHash<QString, QString> fieldsOf(const QString& text)
-{
-    QHash<QString, QString> fields;
-    for (qsizetype i = 0; i < text.size();) {
-        const qsizetype equals = text.indexOf(u'=', i);
-        if (equals < 0)
-            break;
-        const QString name = text.sliced(i, equals - i).trimmed().toLower();
-        const bool braced = equals + 1 < text.size() && text[equals + 1] == u'{';
-        const qsizetype close = braced ? text.indexOf(u'}', equals) : -1;
-        const qsizetype end = text.indexOf(u';', close < 0 ? equals : close);
-        const qsizetype stop = end < 0 ? text.size() : end;
-        const QString value =
-            close < 0 ? text.sliced(equals + 1, stop - equals - 1) : text.sliced(equals + 2, close - equals - 2);
-        if (!fields.contains(name))
-            fields.insert(name, value.trimmed());
-        i = stop + 1;
-    }
-    return fields;
-}
-
-QString fieldOf(const QHash<QString, QString>& fields, const QString& name, const QString& otherName)
-{
-    return fields.contains(name) ? fields.value(name) : fields.value(otherName);
-}
-
-/// Returns true if the driver is in the list of drivers of this process, this user or this machine.
-bool isRegistered(const QString& driver)
-{
-    const QString folder = qEnvironmentVariable("ODBCSYSINI", u"/etc"_s);
-    QString systemList = qEnvironmentVariable("ODBCINSTINI", u"odbcinst.ini"_s);
-    if (QDir::isRelativePath(systemList))
-        systemList = folder + u'/' + systemList;
-    for (const QString& path : {systemList, QDir::homePath() + u"/.odbcinst.ini"_s}) {
-        QFile list(path);
-        if (!list.open(QIODevice::ReadOnly))
-            continue;
-        for (const QByteArray& line : list.readAll().split('\n')) {
-            const QString section = QString::fromUtf8(line).trimmed();
-            if (section.startsWith(u'[') && section.endsWith(u']') &&
-                section.sliced(1, section.size() - 2).trimmed().compare(driver, Qt::CaseInsensitive) == 0)
-                return true;
-        }
-    }
-    return false;
-}
 
 bool isMySql(const QString& driver)
 {
@@ -87,35 +38,39 @@ std::unique_ptr<Engine> openLocal(const QString& name)
     return openEmbedded(files::systemPath(profile::root() + u"/databases/"_s + name + u".db"_s));
 }
 
-std::unique_ptr<Engine> openEngine(const QString& text)
+std::unique_ptr<Engine> openEngine(const QString& connectionText, const ConnectionText& odbcOptions,
+                                   int statementSeconds)
 {
-    const QHash<QString, QString> fields = fieldsOf(text);
-    const QString driver = fields.value(u"driver"_s);
-    const QString server = fields.value(u"server"_s);
-    const QString databaseName = fields.value(u"database"_s);
+    const ConnectionText text(connectionText);
+    const QString driver = text.value(u"Driver");
     if (isMySql(driver)) {
-        return openMySql(server, fields.value(u"port"_s).toInt(), databaseName, fieldOf(fields, u"uid"_s, u"user"_s),
-                         fieldOf(fields, u"pwd"_s, u"password"_s));
+        const MySqlAddress address{text.value(u"Server"), text.value(u"Port").toInt(), text.value(u"Database"),
+                                   text.value(u"Uid", u"User"), text.value(u"Pwd", u"Password")};
+        return openMySql(address, statementSeconds);
     }
-    if (!driver.isEmpty() && isRegistered(driver))
-        return openOdbc(text);
-    if (const QString name = embeddedName(text); !name.isEmpty())
+    if (isRegistered(driver))
+        return openOdbc(odbcTarget(text, driver, odbcOptions));
+    if (const QString name = embeddedName(connectionText); !name.isEmpty())
         return openLocal(name);
-    throw RuntimeError(CannotOpen, u"No driver on this machine reaches the server \""_s + server + u'"')
-        .withDatabaseCodes(u"0"_s, u"IM002"_s);
+    const QString other = driver.contains(u"SQL"_s, Qt::CaseInsensitive) ? sqlServerDriver() : QString();
+    if (other.isEmpty())
+        throw RuntimeError(CannotOpen,
+                           u"No driver on this machine reaches the server \""_s + text.value(u"Server") + u'"')
+            .withDatabaseCodes(u"0"_s, u"IM002"_s);
+    return openOdbc(odbcTarget(text, other, odbcOptions));
 }
 
 }  // namespace
 
 QString embeddedName(const QString& connectionText)
 {
-    const QHash<QString, QString> fields = fieldsOf(connectionText);
-    const QString driver = fields.value(u"driver"_s);
-    const QString server = fields.value(u"server"_s);
+    const ConnectionText text(connectionText);
+    const QString driver = text.value(u"Driver");
+    const QString server = text.value(u"Server");
     if (driver.isEmpty() || isMySql(driver) || isRegistered(driver) || !isThisMachine(server.section(u'\\', 0, 0)))
         return {};
     const QString instance = server.section(u'\\', 1);
-    const QString database = fields.value(u"database"_s);
+    const QString database = text.value(u"Database");
     return instance.isEmpty() ? database : instance + u'.' + database;
 }
 
@@ -125,7 +80,7 @@ Connection::~Connection() = default;
 void Connection::open(const QString& connectionText)
 {
     close();
-    session_ = std::make_unique<Session>(openEngine(connectionText));
+    session_ = std::make_unique<Session>(openEngine(connectionText, ConnectionText(odbcOptions_), commandTimeout_));
     session_->engine().setTimeout(commandTimeout_);
 }
 
@@ -141,8 +96,8 @@ int Connection::state() const
 
 bool Connection::answers() const
 {
-    if (state() == 1)
-        attempt([&] { session_->engine().ping(); });
+    if (state() == 1 && !attempt([&] { session_->engine().ping(); }))
+        session_->engine().drop();  // whatever the reason
     return state() == 1;
 }
 

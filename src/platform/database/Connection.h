@@ -28,11 +28,14 @@ public:
     void close();
     /// Returns 1 if the connection is open, otherwise 0. A connection that the server has dropped is closed.
     int state() const;
-    /// Checks if the server still answers. If it has dropped the connection, the connection is closed afterwards.
+    /// Checks if the server still answers. If it does not, for whatever reason, the connection is closed afterwards.
     bool answers() const;
 
-    /// Sets how many seconds a statement may take. 0 means no limit.
+    /// Sets how many seconds a statement may take. 0 means no limit. Set before `open`, it also limits how long a
+    /// silent server is waited for.
     void setCommandTimeout(int seconds);
+    /// Sets fields such as "Port=1433;Encrypt=no" that the next `open` adds to the connection texts of ODBC drivers.
+    void setOdbcOptions(const QString& options) { odbcOptions_ = options; }
 
     /// Executes and commits a statement that returns no rows. Returns the number of rows that it affects. Throws
     /// StatementFailed with the codes of the engine, or CannotOpen if the connection is lost.
@@ -46,7 +49,8 @@ public:
 
 private:
     std::unique_ptr<Session> session_;
-    int commandTimeout_ = 0;
+    int commandTimeout_ = 30;
+    QString odbcOptions_;
 };
 
 using ConnectionPtr = std::shared_ptr<Connection>;

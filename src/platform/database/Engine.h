@@ -45,7 +45,8 @@ public:
     /// Executes an INSERT and returns the identity of the new row.
     virtual QVariant insert(const QString& statement) = 0;
 
-    /// Checks if the server still answers. Waits some seconds at most, even if a statement may take longer.
+    /// Checks if the server still answers, and throws if it does not. Waits some seconds at most, even if a statement
+    /// may take longer.
     virtual void ping() { run(QStringLiteral("SELECT 1")); }
     /// Sets how many seconds a statement may take. 0 means no limit.
     virtual void setTimeout(int seconds) = 0;
@@ -66,10 +67,27 @@ private:
     bool isOpen_ = true;
 };
 
-/// These functions throw CannotOpen.
+/// The address of a MySQL or MariaDB server.
+struct MySqlAddress {
+    QString host;
+    int port = 0;  // 0 means the usual one
+    QString database;
+    QString user;
+    QString password;
+};
+
+/// How to reach a server through an ODBC driver.
+struct OdbcTarget {
+    QString connectionText;
+    // a server that must show first that it answers, because its driver could wait without end; may be empty
+    QString host = QString();
+    int port = 0;
+};
+
+/// These functions throw CannotOpen. A server that does not answer costs less than five seconds.
 std::unique_ptr<Engine> openEmbedded(const QString& file);
-std::unique_ptr<Engine> openMySql(const QString& host, int port, const QString& database, const QString& user,
-                                  const QString& password);
-std::unique_ptr<Engine> openOdbc(const QString& connectionText);
+/// A server that is silent for longer than a statement may take counts as lost.
+std::unique_ptr<Engine> openMySql(const MySqlAddress& address, int statementSeconds);
+std::unique_ptr<Engine> openOdbc(const OdbcTarget& target);
 
 }  // namespace kest::db

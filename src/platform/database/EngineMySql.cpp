@@ -1,4 +1,5 @@
-// The engine for MariaDB and MySQL, which uses QMYSQL.
+// The engines for MariaDB and MySQL: one uses QMYSQL, the other an ODBC driver.
+#include "platform/database/EngineOdbc.h"
 #include "platform/database/MySqlServer.h"
 #include "platform/database/QtSqlEngine.h"
 
@@ -12,23 +13,26 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-constexpr int connectSeconds = 5;
+constexpr int connectSeconds = 4;
+constexpr int graceSeconds = 5;  // more than the limit that the server observes itself
+constexpr qint64 freshMilliseconds = 1000;
 
 class EngineMySql final : public QtSqlEngine {
 public:
-    EngineMySql(const QString& host, int port, const QString& databaseName, const QString& user,
-                const QString& password)
-        : QtSqlEngine(u"QMYSQL"_s)
+    EngineMySql(const MySqlAddress& address, int statementSeconds) : QtSqlEngine(u"QMYSQL"_s)
     {
         // with "localhost", the driver would use a local socket and ignore the port
-        database.setHostName(host.compare(u"localhost"_s, Qt::CaseInsensitive) == 0 && port > 0 ? u"127.0.0.1"_s
-                                                                                                : host);
-        if (port > 0)
-            database.setPort(port);
-        database.setDatabaseName(databaseName);
-        database.setUserName(user);
-        database.setPassword(password);
-        database.setConnectOptions(u"CLIENT_FOUND_ROWS=1;MYSQL_OPT_CONNECT_TIMEOUT=%1"_s.arg(connectSeconds));
+        const bool isHere = address.host.compare(u"localhost"_s, Qt::CaseInsensitive) == 0 && address.port > 0;
+        database.setHostName(isHere ? u"127.0.0.1"_s : address.host);
+        if (address.port > 0)
+            database.setPort(address.port);
+        database.setDatabaseName(address.database);
+        database.setUserName(address.user);
+        database.setPassword(address.password);
+        QString options = u"CLIENT_FOUND_ROWS=1;MYSQL_OPT_CONNECT_TIMEOUT=%1"_s.arg(connectSeconds);
+        if (statementSeconds > 0)
+            options += u";MYSQL_OPT_READ_TIMEOUT=%1;MYSQL_OPT_WRITE_TIMEOUT=%1"_s.arg(statementSeconds + graceSeconds);
+        database.setConnectOptions(options);
         openDatabase();
         // strict mode, so that a value that is too long is refused and not cut, even if the server is configured
         // otherwise
@@ -39,6 +43,14 @@ public:
 
     const Dialect& dialect() const override { return mySqlDialect(); }
     void setTimeout(int seconds) override { run(server->timeoutStatement(seconds)); }
+
+    // A second connection asks first. On this one, the ping of a silent server would take as long as a statement may.
+    void ping() override
+    {
+        if (!lastAnswer.isValid() || lastAnswer.hasExpired(freshMilliseconds))
+            greet();
+        QtSqlEngine::ping();
+    }
 
     QStringList tableNames() override { return tableNamesOf(*this, MySqlServer::informationSchema()); }
     std::unique_ptr<TableInfo> readTable(const QString& name) override
@@ -57,15 +69,71 @@ protected:
     QString sqlState(const QSqlError& error) const override { return MySqlServer::sqlState(error.nativeErrorCode()); }
 
 private:
+    void greet()
+    {
+        const QString name = database.connectionName() + u"-ping"_s;
+        QSqlError error;
+        {
+            QSqlDatabase second = QSqlDatabase::cloneDatabase(database, name);
+            if (!second.open())
+                error = second.lastError();
+        }
+        QSqlDatabase::removeDatabase(name);
+        if (meansConnectionLost(error))  // any other error is an answer
+            fail(error);
+    }
+
     std::optional<MySqlServer> server;
+};
+
+/// Uses an ODBC driver for MariaDB or MySQL.
+class EngineMySqlOverOdbc final : public EngineOdbc {
+public:
+    explicit EngineMySqlOverOdbc(std::unique_ptr<OdbcConnection> connection)
+        : EngineOdbc(std::move(connection)), server(*this)
+    {
+        run(u"SET SESSION sql_mode=CONCAT(@@sql_mode, ',PIPES_AS_CONCAT')"_s);
+    }
+
+    const Dialect& dialect() const override { return mySqlOverOdbcDialect(); }
+    QVariant insert(const QString& statement) override
+    {
+        run(statement);
+        return run(u"SELECT LAST_INSERT_ID()"_s).values.front();
+    }
+    void setTimeout(int seconds) override { run(server.timeoutStatement(seconds)); }
+
+    QStringList tableNames() override { return tableNamesOf(*this, MySqlServer::informationSchema()); }
+    std::unique_ptr<TableInfo> readTable(const QString& name) override
+    {
+        return tableOf(*this, MySqlServer::informationSchema(), name);
+    }
+
+    bool lock(const QString& name, int seconds) override { return server.lock(name, seconds); }
+    void unlock(const QString& name) override { server.unlock(name); }
+
+protected:
+    int statementSeconds() const override { return 0; }
+    bool meansConnectionLost(const OdbcMessage& message) const override
+    {
+        return MySqlServer::meansConnectionLost(QString::number(message.native));
+    }
+    QString sqlState(const OdbcMessage& message) const override { return message.state; }
+
+private:
+    MySqlServer server;
 };
 
 }  // namespace
 
-std::unique_ptr<Engine> openMySql(const QString& host, int port, const QString& database, const QString& user,
-                                  const QString& password)
+std::unique_ptr<Engine> openMySql(const MySqlAddress& address, int statementSeconds)
 {
-    return std::make_unique<EngineMySql>(host, port, database, user, password);
+    return std::make_unique<EngineMySql>(address, statementSeconds);
+}
+
+std::unique_ptr<Engine> mySqlOverOdbc(std::unique_ptr<OdbcConnection> connection)
+{
+    return std::make_unique<EngineMySqlOverOdbc>(std::move(connection));
 }
 
 }  // namespace kest::db

@@ -1,13 +1,12 @@
-// The engine for ODBC drivers, which uses QODBC: for SQL Server, and for others, recognised by the name that they
-// return.
-#include "platform/database/MySqlServer.h"
-#include "platform/database/QtSqlEngine.h"
+#include "platform/database/EngineOdbc.h"
 
-#include <QHash>
-#include <QSqlDriver>
-#include <QSqlError>
+#include "platform/RuntimeError.h"
+#include "platform/database/OdbcDrivers.h"
+#include "platform/database/TdsServer.h"
 
-#include <optional>
+#include <QRegularExpression>
+
+#include <algorithm>
 
 namespace kest::db {
 
@@ -15,97 +14,74 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-constexpr int connectSeconds = 5;
+constexpr int connectSeconds = 4;
+// A silent server costs twice that, because a driver also waits for the answer to its cancellation.
+constexpr int pingSeconds = 2;
 
-class EngineOdbc final : public QtSqlEngine {
-public:
-    explicit EngineOdbc(QString connectionText) : QtSqlEngine(u"QODBC"_s)
-    {
-        while (connectionText.endsWith(u';'))  // the driver manager would read an empty field after it, and fail
-            connectionText.chop(1);
-        database.setConnectOptions(u"SQL_ATTR_LOGIN_TIMEOUT=%1"_s.arg(connectSeconds));
-        openNamed(connectionText);
-        const QString version = run(u"SELECT @@version"_s).values.front().toString();
-        if (!version.contains(u"MariaDB"_s, Qt::CaseInsensitive) &&
-            database.driver()->dbmsType() != QSqlDriver::MySqlServer)
-            return;
-        // without this option, an update that sets the same value would count as no row
-        if (!connectionText.contains(u"option="_s, Qt::CaseInsensitive)) {
-            database.close();
-            openNamed(connectionText + u";OPTION=2"_s);
-        }
-        mySql.emplace(*this);
-        run(u"SET SESSION sql_mode=CONCAT(@@sql_mode, ',PIPES_AS_CONCAT')"_s);
-    }
+/// Returns the message that says what failed: the first that is more than a warning.
+OdbcMessage decisive(const QList<OdbcMessage>& messages)
+{
+    const auto found = std::find_if(messages.begin(), messages.end(),
+                                    [](const OdbcMessage& message) { return !message.state.startsWith(u"01"_s); });
+    if (found != messages.end())
+        return *found;
+    return messages.isEmpty() ? OdbcMessage{u"HY000"_s, 0, u"The driver gives no reason."_s} : messages.first();
+}
 
-    const Dialect& dialect() const override { return mySql ? mySqlOverOdbcDialect() : sqlServerDialect(); }
-
-    QVariant insert(const QString& statement) override
-    {
-        run(statement);
-        return run(u"SELECT @@IDENTITY"_s).values.front();
-    }
-
-    void setTimeout(int seconds) override
-    {
-        run(mySql ? mySql->timeoutStatement(seconds)
-                  : u"SET LOCK_TIMEOUT "_s + QString::number(seconds > 0 ? qint64(seconds) * 1000 : -1));
-    }
-
-    QStringList tableNames() override { return tableNamesOf(*this, informationSchema()); }
-    std::unique_ptr<TableInfo> readTable(const QString& name) override
-    {
-        return tableOf(*this, informationSchema(), name);
-    }
-
-    bool lock(const QString& name, int seconds) override { return !mySql || mySql->lock(name, seconds); }
-    void unlock(const QString& name) override
-    {
-        if (mySql)
-            mySql->unlock(name);
-    }
-
-protected:
-    bool meansConnectionLost(const QSqlError& error) const override
-    {
-        return error.databaseText().contains(u"08S01"_s) || error.databaseText().contains(u"08003"_s) ||
-               MySqlServer::meansConnectionLost(codeOf(error));
-    }
-    QString sqlState(const QSqlError& error) const override
-    {
-        static const QHash<QString, QString> states{
-            {u"102"_s, u"42000"_s},  {u"207"_s, u"42S22"_s},  {u"208"_s, u"42S02"_s},  {u"1205"_s, u"40001"_s},
-            {u"2601"_s, u"23000"_s}, {u"2627"_s, u"23000"_s}, {u"4060"_s, u"42000"_s}, {u"18456"_s, u"28000"_s}};
-        return mySql ? MySqlServer::sqlState(codeOf(error)) : states.value(codeOf(error), u"HY000"_s);
-    }
-
-private:
-    static QString codeOf(const QSqlError& error) { return error.nativeErrorCode().section(u';', 0, 0); }
-
-    void openNamed(const QString& connectionText)
-    {
-        database.setDatabaseName(connectionText);
-        openDatabase();
-    }
-
-    const InformationSchemaTerms& informationSchema() const
-    {
-        static const InformationSchemaTerms ofSqlServer{
-            u"TABLE_CATALOG=DB_NAME()"_s,
-            u"CASE WHEN CHARACTER_MAXIMUM_LENGTH=-1 OR DATA_TYPE IN ('text', 'ntext') THEN 'longtext' "
-            "ELSE DATA_TYPE END"_s,
-            u"COLUMNPROPERTY(OBJECT_ID(TABLE_SCHEMA + '.' + TABLE_NAME), COLUMN_NAME, 'IsIdentity')"_s};
-        return mySql ? MySqlServer::informationSchema() : ofSqlServer;
-    }
-
-    std::optional<MySqlServer> mySql;
-};
+/// Returns a message without the names of those who passed it on: "[driver][server]".
+QString plain(QString message)
+{
+    static const QRegularExpression senders(u"\\A(\\[[^\\]]*\\])+"_s);
+    return message.remove(senders).trimmed();
+}
 
 }  // namespace
 
-std::unique_ptr<Engine> openOdbc(const QString& connectionText)
+void EngineOdbc::ping()
 {
-    return std::make_unique<EngineOdbc>(connectionText);
+    run(u"SELECT 1"_s, pingSeconds);
+}
+
+Answer EngineOdbc::run(const QString& statement, int seconds)
+{
+    if (!isOpen())
+        throw RuntimeError(CannotOpen, u"The connection to the database is lost."_s);
+    try {
+        return connection_->run(statement, seconds);
+    } catch (const OdbcFailure& failure) {
+        fail(failure);
+    }
+}
+
+void EngineOdbc::fail(const OdbcFailure& failure)
+{
+    const bool lost = failure.connectionIsDead ||
+                      std::any_of(failure.messages.begin(), failure.messages.end(), [&](const OdbcMessage& message) {
+                          return message.state.startsWith(u"08"_s) || meansConnectionLost(message);
+                      });
+    if (lost)
+        drop();
+    const OdbcMessage message = decisive(failure.messages);
+    throw RuntimeError(lost ? CannotOpen : StatementFailed, plain(message.text))
+        .withDatabaseCodes(QString::number(message.native), sqlState(message));
+}
+
+std::unique_ptr<Engine> openOdbc(const OdbcTarget& target)
+{
+    if (!target.host.isEmpty() && !answersHello(target.host, target.port, connectSeconds * 1000))
+        throw RuntimeError(CannotOpen, u"The server %1 does not answer on port %2."_s.arg(target.host).arg(target.port))
+            .withDatabaseCodes(u"0"_s, u"08001"_s);
+    try {
+        auto connection = std::make_unique<OdbcConnection>(target.connectionText, connectSeconds);
+        const QString name = connection->databaseName();
+        if (name.contains(u"MySQL"_s, Qt::CaseInsensitive) || name.contains(u"MariaDB"_s, Qt::CaseInsensitive))
+            return mySqlOverOdbc(std::move(connection));
+        return sqlServerOverOdbc(std::move(connection));
+    } catch (const OdbcFailure& failure) {
+        const OdbcMessage message = decisive(failure.messages);
+        throw RuntimeError(CannotOpen, plain(message.text))
+            .withDatabaseCodes(QString::number(message.native), message.state);
+    }
 }
 
 }  // namespace kest::db

@@ -80,6 +80,7 @@ void QtSqlEngine::execute(QSqlQuery& query, const QString& statement)
     beforeStatement();
     if (!query.exec(statement))
         fail(query.lastError());
+    lastAnswer.start();
 }
 
 void QtSqlEngine::fail(const QSqlError& error)

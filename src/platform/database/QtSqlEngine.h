@@ -3,6 +3,7 @@
 
 #include "platform/database/Engine.h"
 
+#include <QElapsedTimer>
 #include <QSqlDatabase>
 
 class QSqlError;
@@ -29,12 +30,13 @@ protected:
     virtual QString sqlState(const QSqlError& error) const = 0;
     /// Called before each statement.
     virtual void beforeStatement() {}
+    [[noreturn]] void fail(const QSqlError& error);
 
     QSqlDatabase database;
+    QElapsedTimer lastAnswer;  // since the database has last answered
 
 private:
     void execute(QSqlQuery& query, const QString& statement);
-    [[noreturn]] void fail(const QSqlError& error);
 
     QString connectionName;
 };

@@ -31,8 +31,7 @@ public:
         spellNames();
         writeFlags();
         writeComparedLiterals();
-        if (!dialect.patternSets)
-            writePatterns();
+        writePatterns();
         if (!dialect.plusJoinsTexts)
             joinTexts();
         if (!dialect.top)
@@ -206,8 +205,7 @@ private:
         return plain.match(text).hasMatch() ? text : QString::number(number, 'g', 17);
     }
 
-    /// For databases whose LIKE compares trailing blanks and has no sets: turns a pattern with a set into a regular
-    /// expression, and compares a pattern without "%" at its end with the text without its trailing blanks.
+    /// A pattern ignores trailing blanks, its own and those of the text, and a bracket without an end has no meaning.
     void writePatterns()
     {
         for (Index i = 0; i < count(); ++i) {
@@ -215,23 +213,44 @@ private:
             if (pattern == none || at(pattern).part != Part::Literal)
                 continue;
             QString wanted = at(pattern).value();
-            if (wanted.contains(u'[')) {
-                at(i).text = u"REGEXP"_s;
-                at(pattern).text = u'\'' + asRegularExpression(wanted).replace(u'\'', u"''"_s) + u'\'';
-                continue;
-            }
-            Index last = previous(i);
-            if (isAt(last, u"NOT"))
-                last = previous(last);
-            Index first = none;
-            if (wanted.endsWith(u'%') || !columnEndingAt(last, &first))
-                continue;
             while (wanted.endsWith(u' '))
                 wanted.chop(1);
+            if (dialect.patternSets)
+                wanted = withoutOpenBracket(wanted);
+            else
+                wanted = withoutSets(wanted, i);
             at(pattern).text = u'\'' + wanted.replace(u'\'', u"''"_s) + u'\'';
+        }
+    }
+
+    static QString withoutOpenBracket(QString pattern)
+    {
+        qsizetype open = pattern.indexOf(u'[');
+        for (qsizetype close = 0; open >= 0; open = pattern.indexOf(u'[', close)) {
+            close = pattern.indexOf(u']', open);
+            if (close < 0)
+                return pattern.left(open) + pattern.sliced(open).replace(u'[', u"[[]"_s);
+        }
+        return pattern;
+    }
+
+    /// For databases whose LIKE has no sets and compares trailing blanks: turns a pattern with a set into a regular
+    /// expression, and compares a pattern without "%" at its end with the text without its trailing blanks.
+    QString withoutSets(const QString& pattern, Index like)
+    {
+        if (pattern.contains(u'[')) {
+            at(like).text = u"REGEXP"_s;
+            return asRegularExpression(pattern);
+        }
+        Index last = previous(like);
+        if (isAt(last, u"NOT"))
+            last = previous(last);
+        Index first = none;
+        if (!pattern.endsWith(u'%') && columnEndingAt(last, &first)) {
             at(first).text.prepend(u"RTRIM("_s);
             at(last).text.append(u')');
         }
+        return pattern;
     }
 
     static QString asRegularExpression(const QString& pattern)

@@ -168,6 +168,13 @@ class Database:
                     self.lite.execute('CREATE TRIGGER "{0}_{1}" AFTER {1} ON "{0}" BEGIN UPDATE "{0}" SET '
                                       '"{2}"=randomblob(8) WHERE rowid=NEW.rowid; END'.format(name, event, row[2]))
 
+    def add_column(self, statement):
+        name, declaration = re.match(r"ALTER\s+TABLE\s+\[?(\w+)\]?\s+ADD\s+(.*)", statement, re.I | re.S).groups()
+        line, row = column_of(declaration.strip())
+        self.lite.execute('ALTER TABLE "%s" ADD COLUMN %s' % (name, line))
+        self.lite.execute("INSERT INTO sys_of_columns SELECT MIN(table_name), MAX(ordinal)+1,?,?,?,?,?,?,?,? "
+                          "FROM sys_of_columns WHERE table_name=? COLLATE NOCASE", row + (name, ))
+
     def drop_table(self, name):
         if not self.columns(name):
             raise ServerError(3701, "Cannot drop the table '%s', because it does not exist." % name, 11)

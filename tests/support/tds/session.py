@@ -240,6 +240,8 @@ class Session:
             databases.create(self.server.folder, text.split()[2].strip("[]"))
         elif (verb, what) == ("CREATE", "TABLE"):
             self.database.create_table(text)
+        elif (verb, what) == ("ALTER", "TABLE"):
+            self.database.add_column(text)
         elif (verb, what) == ("DROP", "TABLE"):
             self.database.drop_table(text.split()[2].strip("[]"))
         elif (verb, what) == ("CREATE", "TRIGGER"):
@@ -258,7 +260,7 @@ class Session:
         return wire.done()
 
     STEPS = {"SET": set_option, "WAITFOR DELAY": wait_for, "BEGIN TRAN": transaction, "BEGIN TRANSACTION": transaction,
-             "COMMIT": transaction, "ROLLBACK": transaction, "CREATE": define, "DROP": define, "KILL": kill}
+             "COMMIT": transaction, "ROLLBACK": transaction, "CREATE": define, "ALTER": define, "DROP": define, "KILL": kill}
     PROCEDURES = {"sp_getapplock": get_lock, "sp_releaseapplock": release_lock, "standin_silence": fall_silent,
                   "standin_copy": copy_database}
 
