@@ -123,7 +123,7 @@ TEST_F(StandIn, KeepsOnlyLettersThatTheTypeHas)
 {
     client->run(u"INSERT INTO LINE (CODE, local) VALUES (N'Żoë €', N'Żoë €')"_s);
     client->run(u"INSERT INTO LINE (local) VALUES ('Żoë €')"_s);
-    EXPECT_EQ(client->ask(u"SELECT CODE FROM LINE WHERE id=1"_s).toString(), u"?oë €"_s);
+    EXPECT_EQ(client->ask(u"SELECT COUNT(*) FROM LINE WHERE CODE=N'?oë €'"_s).toInt(), 1);
     EXPECT_EQ(client->ask(u"SELECT COUNT(*) FROM LINE WHERE local=N'żoë €'"_s).toInt(), 1);
 }
 
