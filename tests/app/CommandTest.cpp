@@ -1,22 +1,8 @@
 #include "app/CommandLine.h"
-#include "platform/files/files.h"
 #include "platform/settings/registry.h"
 #include "setup/Profile.h"
 #include "shell/component.h"
-#include "support/Cases.h"
-#include "support/TestProfile.h"
-
-#include <QFile>
-#include <QJsonArray>
-#include <QJsonDocument>
-#include <QJsonObject>
-#include <QProcess>
-
-#include <gtest/gtest.h>
-
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
+#include "support/Test.h"
 
 namespace {
 
@@ -59,21 +45,21 @@ TEST_F(Command, ExitCodeAndErrorsTellWhatBecameOfIt)
     files::write(u"c:\\wirdoc\\AUnread\\a..xml"_s, u"<a><messageType>NONE</messageType></a>"_s);
     for (const auto& [words, code, line] : casesIn<3>("app/commands.txt")) {
         const Ended ended = kest2(words);
-        EXPECT_EQ(ended.exitCode, code.toInt()) << words.toStdString();
-        EXPECT_TRUE(ended.errors.contains(line)) << ended.errors.toStdString();
+        EXPECT_EQ(ended.exitCode, code.toInt()) << words;
+        EXPECT_TRUE(ended.errors.contains(line)) << ended.errors;
     }
     files::remove(profile.root() + u"/databases/WirSql.db"_s);
     const Ended ended = kest2(u"list unread"_s);
     EXPECT_EQ(ended.exitCode, app::NoConnection);
     const QString box = ended.json[u"boxes"][0][u"text"].toString();
     EXPECT_TRUE(box.startsWith(u"Could not connect to the quote database, Please contact MarlinDesk Support."_s));
-    EXPECT_TRUE(box.contains(u"WirSql.db"_s)) << box.toStdString();
+    EXPECT_TRUE(box.contains(u"WirSql.db"_s)) << box;
 
     files::write(profile.root() + u"/registry.ini"_s, {});
     for (const QString& words : {u"list unread"_s, u"setting list"_s, u"transport --once"_s, u"init"_s, u"where"_s}) {
         const Ended damaged = kest2(words);
-        EXPECT_NE(damaged.exitCode, app::Done) << words.toStdString();
-        EXPECT_TRUE(damaged.errors.contains(u"registry.ini is empty or damaged"_s)) << damaged.errors.toStdString();
+        EXPECT_NE(damaged.exitCode, app::Done) << words;
+        EXPECT_TRUE(damaged.errors.contains(u"registry.ini is empty or damaged"_s)) << damaged.errors;
     }
     EXPECT_EQ(files::size(profile.root() + u"/registry.ini"_s), 0);
 }
@@ -170,5 +156,3 @@ TEST(DemoProfile, HasAKESTWebThatWorksOnItsOwnProfile)
     EXPECT_EQ(web.exitStatus(), QProcess::NormalExit);
     EXPECT_EQ(web.exitCode(), app::Done);
 }
-
-}  // namespace kest::test

@@ -1,22 +1,8 @@
 // Tests two workstations with the same database and message folders. The second one is the command `kest2`.
-#include "base/modDBAccess.h"
 #include "messagelist/frmMessageList.h"
 #include "outbound/SendQuote.h"
-#include "platform/RuntimeError.h"
-#include "platform/database/FaultInjection.h"
 #include "platform/settings/registry.h"
-#include "support/Failure.h"
 #include "support/Shop.h"
-#include "support/ShopDatabase.h"
-#include "support/Snapshot.h"
-
-#include <QDir>
-#include <QFile>
-#include <QProcess>
-
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
 
 namespace {
 
@@ -134,5 +120,3 @@ TEST_F(Workstations, ALoadGoesOverANewConnectionWhereTheOldOneHasGone)
     dropConnection();
     EXPECT_TRUE(window.loadFile(u"m.xml"_s)) << shown();
 }
-
-}  // namespace kest::test

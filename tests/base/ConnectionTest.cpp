@@ -1,16 +1,8 @@
 #include "base/ModRegistry.h"
-#include "base/SharedVariables.h"
-#include "base/modDBAccess.h"
 #include "base/modLoggerEx.h"
-#include "support/ScriptedDesktop.h"
 #include "support/Shop.h"
 
-#include <gtest/gtest.h>
-
-namespace kest {
 namespace {
-
-using namespace Qt::StringLiterals;
 
 void setSetting(const QString& key, const QString& value, const QString& section = u"wirra32\\frmsplash"_s)
 {
@@ -46,8 +38,8 @@ TEST_F(ShopConnection, ATabletWorksOnTheMasterOrOnItsOwn)
          {std::tuple(u"1"_s, u"Master"_s, false), {u"0"_s, u"Own"_s, true}, {u"yes"_s, u"Own"_s, false}}) {
         setSetting(u"TabletUseMaster"_s, useMaster);
         OpenDatabase();
-        EXPECT_EQ(gsDatabase, database) << useMaster.toStdString();
-        EXPECT_EQ(gbTabletLocal, local) << useMaster.toStdString();
+        EXPECT_EQ(gsDatabase, database) << useMaster;
+        EXPECT_EQ(gbTabletLocal, local) << useMaster;
     }
     gbTabletLocal = false;
 }
@@ -69,7 +61,7 @@ TEST_F(ShopConnection, WhyItFailedStandsInTheBoxAndOnceInTheLog)
     EXPECT_FALSE(hasConnection());
     EXPECT_FALSE(EnsureConnection());
     const QString reason = connectionFailure();
-    EXPECT_TRUE(reason.contains(u"Nowhere.db"_s)) << reason.toStdString();
+    EXPECT_TRUE(reason.contains(u"Nowhere.db"_s)) << reason;
     EXPECT_EQ(
         desktop->boxTexts(),
         QStringList{u"Could not connect to the quote database, Please contact MarlinDesk Support.\r\n\r\n"_s + reason});
@@ -92,4 +84,3 @@ TEST_F(ShopConnection, AMissingDatabaseIsTold)
 }
 
 }  // namespace
-}  // namespace kest

@@ -1,12 +1,7 @@
 // Tests the small routines that read messages.
 #include "base/Helpers.h"
-#include "support/Cases.h"
-#include "support/Failure.h"
-#include "support/TestProfile.h"
+#include "support/Test.h"
 #include "support/TimeZone.h"
-
-using namespace Qt::StringLiterals;
-using namespace kest;
 
 namespace {
 
@@ -36,8 +31,7 @@ TEST(Helpers, ReadAndChangeTextsAsTheTableSays)
 {
     const test::TimeZone zone("Australia/Sydney");
     for (const QStringList& row : test::rowsIn("helpers.txt"))
-        EXPECT_EQ(test::outcomeOf([&] { return result(row[0], row.mid(2)); }), row[1])
-            << row.join(u" | "_s).toStdString();
+        EXPECT_EQ(test::outcomeOf([&] { return result(row[0], row.mid(2)); }), row[1]) << row.join(u" | "_s);
     EXPECT_EQ(SafeVal(QString(500, u'9'), u"7"_s), 7);
     EXPECT_EQ(UtcToLocal(QDateTime(QDate(2024, 7, 1), QTime(0, 0, 5, 900))).time(), QTime(10, 0, 5));
 }

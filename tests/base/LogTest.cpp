@@ -1,19 +1,8 @@
 #include "base/modLoggerEx.h"
-#include "platform/RuntimeError.h"
-#include "platform/files/files.h"
-#include "platform/profile.h"
 #include "support/ScriptedDesktop.h"
-#include "support/TestProfile.h"
+#include "support/Test.h"
 
-#include <QDir>
-#include <QRegularExpression>
-
-#include <gtest/gtest.h>
-
-namespace kest {
 namespace {
-
-using namespace Qt::StringLiterals;
 
 class ErrorLog : public ::testing::Test {
 protected:
@@ -39,7 +28,7 @@ TEST_F(ErrorLog, TheModeChoosesBoxAndRecord)
                 "\t\tError Number: 94\r\n\t\tDescription: Null here\r\n){%1}$"_s.arg(records))
                 .match(log)
                 .hasMatch())
-            << log.toStdString();
+            << log;
     }
     EXPECT_EQ(desktop.boxes().last(),
               u"critical|LoadY|Line No: 7\r\nSource: modX.LoadY\r\nError Number: 94\r\nDescription: Null here|ok"_s);
@@ -71,4 +60,3 @@ TEST(QuoteClean, TrimsBlanksAndTurnsDoubleQuotes)
 }
 
 }  // namespace
-}  // namespace kest

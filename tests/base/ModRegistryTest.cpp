@@ -1,10 +1,8 @@
 #include "base/ModRegistry.h"
-#include "support/TestProfile.h"
+#include "support/Test.h"
 
-namespace kest {
 namespace {
 
-using namespace Qt::StringLiterals;
 using settings::Hive;
 using settings::Type;
 
@@ -60,4 +58,3 @@ TEST_F(Settings, AValueIsReadAndWrittenByItsType)
 }
 
 }  // namespace
-}  // namespace kest

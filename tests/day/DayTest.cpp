@@ -3,28 +3,11 @@
 #include "base/modDBAccess.h"
 #include "day/Day.h"
 #include "jobexport/JobLinkSettings.h"
-#include "platform/files/files.h"
-#include "platform/values.h"
 #include "setup/Profile.h"
 #include "shell/component.h"
-#include "support/Cases.h"
 #include "support/MariaDbServer.h"
-#include "support/Places.h"
 #include "support/Snapshot.h"
-#include "support/TestProfile.h"
-
-#include <QDir>
-#include <QImage>
-#include <QJsonObject>
-#include <QMap>
-
-#include <gtest/gtest.h>
-
-#include <functional>
-
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
+#include "support/Test.h"
 
 namespace {
 
@@ -127,12 +110,12 @@ void checkPictures(const QDir& pictures)
                               u"panel"_s,      u"sublet-document"_s,   u"text"_s,         u"transport"_s,
                               u"utilities"_s,  u"report-1-710"_s,      u"report-1-720"_s, u"report-1-730"_s};
     for (const QString& window : windows)
-        EXPECT_FALSE(pictures.entryList({u"*-"_s + window + u".png"_s}).isEmpty()) << window.toStdString();
+        EXPECT_FALSE(pictures.entryList({u"*-"_s + window + u".png"_s}).isEmpty()) << window;
     for (const QString& file : pictures.entryList(QDir::Files)) {
         const QImage picture(pictures.filePath(file));
         QImage blank = picture;
         blank.fill(picture.pixelColor(0, 0));
-        EXPECT_FALSE(picture == blank) << file.toStdString();
+        EXPECT_FALSE(picture == blank) << file;
     }
 }
 
@@ -172,10 +155,8 @@ TEST(Day, LeavesAfterEachStepWhatItShouldAndTheSameEachTime)
         if (!before.isEmpty() && !step.endsWith(u".sql"_s))
             lines << changes(before, after);
         before = after;
-        EXPECT_EQ(expected[step].join(u'\n').toStdString(), lines.join(u'\n').toStdString()) << step.toStdString();
+        EXPECT_EQ(expected[step].join(u'\n').toStdString(), lines.join(u'\n').toStdString()) << step;
     });
     const std::string again = played(server, [](const QString&, const desktop::Record&) {});
     EXPECT_TRUE(first == again) << difference(first, again);
 }
-
-}  // namespace kest::test

@@ -1,8 +1,5 @@
 #include "inbound/modLoadXML.h"
-#include "platform/RuntimeError.h"
 #include "support/Shop.h"
-
-namespace kest::test {
 
 using Assessments = Shop;
 
@@ -23,7 +20,7 @@ TEST_F(Assessments, ABackOutUndoesWhatWasDecided)
         row.set("AuthDate", "01/02/2008");
         EXPECT_TRUE(load(assessmentBackout("QR1")));
         EXPECT_EQ(row.state(), "3 locked - " + after.toStdString());
-        EXPECT_TRUE(row.shows(authorisation)) << before.toStdString();
+        EXPECT_TRUE(row.shows(authorisation)) << before;
     }
 }
 
@@ -60,5 +57,3 @@ TEST_F(Assessments, ASubmissionResponseGivesTheQuoteItsNumber)
     EXPECT_THROW(takeResponse("R_501.xml", "KQ7"), RuntimeError);
     EXPECT_EQ(quote("501").text("KESTQuoteNo"), "KQ6");
 }
-
-}  // namespace kest::test

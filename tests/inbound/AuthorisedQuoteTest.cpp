@@ -1,15 +1,6 @@
 // Tests the load of authorised quotes: which quote they find, what is refused, and what is stored.
-#include "base/modDBAccess.h"
 #include "inbound/LoadQuoteBody.h"
 #include "support/Shop.h"
-
-#include <QFile>
-#include <QJsonArray>
-#include <QJsonDocument>
-
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
 
 namespace {
 
@@ -94,8 +85,8 @@ TEST_F(AuthorisedQuotes, AssessorRegistrationAndExcessComeOverToTheMainQuote)
         fill(quote("500"), before);
         EXPECT_TRUE(load(authorisedQuote("500").with(elements)));
         EXPECT_TRUE(load(authorisedQuote("500/1").with(elements)));
-        EXPECT_TRUE(quote("500").shows(after)) << elements.toStdString();
-        EXPECT_TRUE(quote("500", 1).shows("excess=7 contri=8")) << elements.toStdString();
+        EXPECT_TRUE(quote("500").shows(after)) << elements;
+        EXPECT_TRUE(quote("500", 1).shows("excess=7 contri=8")) << elements;
     }
 }
 
@@ -172,5 +163,3 @@ TEST_F(AuthorisedQuotes, ACompanyNeedsNoPersonsName)
                          .without("authorisedQuoteClaimCustomer/*")
                          .set("authorisedQuoteClaimCustomer/companyName", "Fenwick Freight")));
 }
-
-}  // namespace kest::test

@@ -1,17 +1,7 @@
 // Lets each statement and each file operation of each load fail once, and then repeats the load. In the end the shop
 // must be as if nothing had failed, unless the test says why not.
 #include "inbound/modLoadXML.h"
-#include "platform/RuntimeError.h"
-#include "platform/database/FaultInjection.h"
-#include "platform/files/FaultInjection.h"
 #include "support/Shop.h"
-#include "support/Snapshot.h"
-
-#include <QRegularExpression>
-
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
 
 namespace {
 
@@ -220,5 +210,3 @@ TEST_F(DisturbedLines, AManualQuoteWhoseCarWasTypedWithBlanks)
              isFiledTwice,
              hasNoTotals});
 }
-
-}  // namespace kest::test

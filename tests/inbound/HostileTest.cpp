@@ -1,13 +1,6 @@
 // Loads messages in which each element in turn is missing, doubled or has an unexpected value.
 #include "messages/Envelope.h"
 #include "support/Shop.h"
-#include "support/Snapshot.h"
-
-#include <QRegularExpression>
-
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
 
 namespace {
 
@@ -104,5 +97,3 @@ INSTANTIATE_TEST_SUITE_P(Messages, Hostile,
                                            manualQuote("500").part(1, "I").paint(2, "I")));
 
 }  // namespace
-
-}  // namespace kest::test

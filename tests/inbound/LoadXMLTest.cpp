@@ -2,12 +2,6 @@
 #include "inbound/modLoadXML.h"
 #include "support/Shop.h"
 
-#include <QFile>
-#include <QRegularExpression>
-
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
 using Dispatcher = Shop;
 
 TEST_F(Dispatcher, ABareAmpersandIsRepairedOnce)
@@ -28,7 +22,7 @@ TEST_F(Dispatcher, AMessageThatDoesNotParseIsReportedInFiveLines)
     const QRegularExpression fiveLines(
         uR"(^\[critical\] KEST: Error loading XML file: bad\.xml\r\nError Code: -\d+\r\nReason: .+\r\n)"
         uR"(Source Text:\r\n<b>1</c> </a>$)"_s);
-    EXPECT_TRUE(fiveLines.match(box).hasMatch()) << box.toStdString();
+    EXPECT_TRUE(fiveLines.match(box).hasMatch()) << box;
 }
 
 TEST_F(Dispatcher, TheTypeDecidesInAnyCase)
@@ -98,5 +92,3 @@ TEST_F(Dispatcher, AManualQuoteWithdrawsTheRequestThatItAnswers)
     load(manualQuote("MANQ").text().replace(u">MANQ</messageType>"_s, u">manq</messageType>"_s));
     EXPECT_TRUE(filesIn(gsUnreadPath).contains(u"a.xml"_s));
 }
-
-}  // namespace kest::test

@@ -1,11 +1,7 @@
 // Tests the load of manual quotes: which quote they become, and what they replace.
-#include "base/modDBAccess.h"
+
 #include "support/Shop.h"
-#include "support/Snapshot.h"
 
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
 using ManualQuotes = Shop;
 
 namespace {
@@ -32,11 +28,10 @@ TEST_F(ManualQuotes, EachIsMatchedByNumberThenByRequestElseNewAndTakesTheNextSub
     const Snapshot before;
     for (const auto& [elements, quote] : casesIn<2>("inbound/manual-quotes.txt")) {
         const bool taken = quote != u"none"_s;
-        EXPECT_EQ(load(Message::told(u"MANQ "_s + elements)), taken) << elements.toStdString();
-        EXPECT_EQ(shown(), taken ? "" : "[critical] Failed matching to existing parent KEST Quote")
-            << elements.toStdString();
-        EXPECT_EQ(loadedQuote(), quote.toStdString()) << elements.toStdString();
-        EXPECT_EQ(gsMatchedQTNNO, taken ? quote.section(u'/', 0, 0) : QString()) << elements.toStdString();
+        EXPECT_EQ(load(Message::told(u"MANQ "_s + elements)), taken) << elements;
+        EXPECT_EQ(shown(), taken ? "" : "[critical] Failed matching to existing parent KEST Quote") << elements;
+        EXPECT_EQ(loadedQuote(), quote.toStdString()) << elements;
+        EXPECT_EQ(gsMatchedQTNNO, taken ? quote.section(u'/', 0, 0) : QString()) << elements;
         EXPECT_EQ(opened(u"SELECT * FROM CINFO"_s).text(u"QUOTE_VAL"_s), u"1001"_s);  // the counter does not change
         before.restore();
     }
@@ -127,5 +122,3 @@ TEST_F(ManualQuotes, AFailureInALineLeavesTheQuoteToTheNextLoad)
     EXPECT_TRUE(load(manualQuote("500").labour(1, "I").paint(2, "I")));
     EXPECT_EQ(quote("500").lines(), 2);
 }
-
-}  // namespace kest::test

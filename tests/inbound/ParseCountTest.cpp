@@ -21,9 +21,6 @@ extern "C" __attribute__((visibility("default"))) void* xmlCtxtReadIO(void* pars
     return read(parser, feed, close, context, url, encoding, options);
 }
 
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
 using ParseCount = Shop;
 
 TEST_F(ParseCount, ALoadParsesItsMessageOnce)
@@ -40,5 +37,3 @@ TEST_F(ParseCount, ALoadParsesItsMessageOnce)
         EXPECT_EQ(filesIn(gsUnreadPath), QStringList()) << told;
     }
 }
-
-}  // namespace kest::test

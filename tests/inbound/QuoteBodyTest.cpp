@@ -1,14 +1,9 @@
 // Tests what the lines of a message change in a quote, by section, by change indicator, and with bad values.
-#include "base/modDBAccess.h"
 #include "inbound/LoadQuoteBody.h"
 #include "inbound/NextNumbers.h"
 #include "messages/Envelope.h"
 #include "sublets/SubletDocuments.h"
 #include "support/Shop.h"
-
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
 
 namespace {
 
@@ -65,7 +60,7 @@ TEST_F(QuoteBody, ANewLineIsFilledAsItsSectionSays)
     EXPECT_TRUE(apply(message));
     number = 0;
     for (const auto& [kind, elements, columns] : cases)
-        EXPECT_TRUE(line(++number).shows(columns + u" blend=0 Tag=1 delitem=0 tosend=A"_s)) << elements.toStdString();
+        EXPECT_TRUE(line(++number).shows(columns + u" blend=0 Tag=1 delitem=0 tosend=A"_s)) << elements;
 }
 
 TEST_F(QuoteBody, TheIndicatorSaysWhatHappensToTheLine)
@@ -77,7 +72,7 @@ TEST_F(QuoteBody, TheIndicatorSaysWhatHappensToTheLine)
             quote("500").line(2, "PRT");
             EXPECT_TRUE(apply(body().line(kind, number.toInt(), indicator, {{kind + u"Description"_s, "new"}})));
             EXPECT_EQ(numbers() + ' ' + line(1).text("script"), (left + u' ' + first).toStdString())
-                << indicator.toStdString() << number.toStdString();
+                << indicator << number;
         }
 }
 
@@ -227,9 +222,9 @@ TEST_F(QuoteBody, ItemNumbersComeFromThePoolOfTheCategory)
             EXPECT_EQ(lines.text(u"SEQ_NO"_s), number);  // the current line has not changed
             lines.set(u"itemno"_s, given.last());
         }
-        EXPECT_EQ(given.first() + given[qMax(0, count - 1)], first + last) << category.toStdString();
-        EXPECT_EQ(given.mid(count), QStringList(2, u"999"_s)) << category.toStdString();
-        EXPECT_EQ(given.removeDuplicates(), 1) << category.toStdString();
+        EXPECT_EQ(given.first() + given[qMax(0, count - 1)], first + last) << category;
+        EXPECT_EQ(given.mid(count), QStringList(2, u"999"_s)) << category;
+        EXPECT_EQ(given.removeDuplicates(), 1) << category;
     }
 }
 
@@ -239,7 +234,7 @@ TEST_F(QuoteBody, AValueThatDoesNotConvertEndsTheBodyAtItsLine)
         gConn->execute(u"DELETE FROM QUOTE2"_s);
         EXPECT_FALSE(apply(body().labour(1, "I").line(kind, 2, indicator, fieldsIn(elements)).sublet(3, "I")));
         EXPECT_FALSE(shown().empty());
-        EXPECT_EQ(numbers(), "1") << elements.toStdString();
+        EXPECT_EQ(numbers(), "1") << elements;
     }
     EXPECT_FALSE(apply(body().labour(4, "D").labour(5, "I").without("quoteBody/gst")));
     EXPECT_EQ(numbers(), "1");
@@ -271,5 +266,3 @@ TEST_F(QuoteBody, TenThousandLines)
     EXPECT_EQ(quote("500").lines(), 10'000);
     EXPECT_EQ(quote("500").line(10'000).text("itemno"), "999");
 }
-
-}  // namespace kest::test

@@ -1,10 +1,5 @@
-#include "base/modDBAccess.h"
 #include "inbound/NextNumbers.h"
 #include "support/Shop.h"
-
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
 
 namespace {
 
@@ -92,9 +87,9 @@ TEST_F(Requests, TheCustomerIsFoundByNameOrMade)
         const std::string key = "CAR" + std::to_string(rowCount("CAR"));
         const int before = rowCount("CUSTOMER");
         EXPECT_TRUE(load(quoteRequest(key).rego(key).with(elements)));
-        EXPECT_EQ(rowCount("CUSTOMER"), before + (found == u"new"_s ? 1 : 0)) << elements.toStdString();
+        EXPECT_EQ(rowCount("CUSTOMER"), before + (found == u"new"_s ? 1 : 0)) << elements;
         if (found != u"new"_s) {
-            EXPECT_TRUE(car(key).shows("CUST_ID=" + customer(found).text("CUST_ID"))) << elements.toStdString();
+            EXPECT_TRUE(car(key).shows("CUST_ID=" + customer(found).text("CUST_ID"))) << elements;
         }
     }
     // texts are cut to the size of the host's columns
@@ -127,7 +122,7 @@ TEST_F(Requests, ANewCarTakesWhatTheMessageTells)
     for (const auto& [elements, columns] : casesIn<2>("inbound/new-cars.txt")) {
         const std::string key = "CAR" + std::to_string(rowCount("CAR"));
         EXPECT_TRUE(load(quoteRequest(key).rego(key).with(elements)));
-        EXPECT_TRUE(car(key).shows(columns)) << elements.toStdString();
+        EXPECT_TRUE(car(key).shows(columns)) << elements;
     }
 }
 
@@ -179,5 +174,3 @@ TEST_F(Requests, PhotographsMoveIntoTheImagesFolder)
     EXPECT_EQ(files::read(gsImagesPath + u"1002_01000.jpg"_s), u"QR2_001.jpg"_s);
     EXPECT_EQ(files::read(gsImagesPath + u"1002_01001.jpg"_s), u"second"_s) << "behind 999 no picture is lost";
 }
-
-}  // namespace kest::test

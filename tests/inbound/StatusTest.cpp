@@ -1,8 +1,5 @@
 #include "support/Shop.h"
 
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
 using StatusMessages = Shop;
 
 TEST_F(StatusMessages, EachMovesTheQuoteToItsState)
@@ -14,7 +11,7 @@ TEST_F(StatusMessages, EachMovesTheQuoteToItsState)
         EXPECT_TRUE(load(Message::told(message)));
         EXPECT_EQ(row.state(), state.toStdString());
         EXPECT_EQ(QString::fromStdString(shown()).replace(u"\r\n"_s, u" / "_s), boxes);
-        EXPECT_EQ(row.number("excess"), message.startsWith(u"EWAP"_s) ? 0 : 300) << message.toStdString();
+        EXPECT_EQ(row.number("excess"), message.startsWith(u"EWAP"_s) ? 0 : 300) << message;
     }
 }
 
@@ -38,8 +35,8 @@ TEST_F(StatusMessages, EachMeansOneQuoteOfTheRequest)
         for (const int subquote : {oldest, newest})
             quote("500", subquote).request("QR1").quoteNumber("KQ1").stage(7);
         EXPECT_TRUE(load(message));
-        EXPECT_NE(quote("500", meant).stage(), 7) << message.text().toStdString();
-        EXPECT_EQ(quote("500", 1 - meant).stage(), 7) << message.text().toStdString();
+        EXPECT_NE(quote("500", meant).stage(), 7) << message.text();
+        EXPECT_EQ(quote("500", 1 - meant).stage(), 7) << message.text();
     }
 }
 
@@ -93,5 +90,3 @@ TEST_F(StatusMessages, AMessageWhoseQuoteIsUnknownIsRefused)
     EXPECT_EQ(quote("500").state(), "7 open - ");
     EXPECT_EQ(quote("500").lines(), 1);
 }
-
-}  // namespace kest::test

@@ -2,20 +2,8 @@
 #include "base/CredentialCipher.h"
 #include "jobexport/JobLinkSettings.h"
 #include "jobexport/WriteQuote.h"
-#include "platform/database/FaultInjection.h"
-#include "platform/database/Recordset.h"
-#include "platform/database/Sql.h"
 #include "support/MariaDbServer.h"
-#include "support/Places.h"
 #include "support/Shop.h"
-
-#include <QElapsedTimer>
-
-#include <gtest/gtest.h>
-
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
 
 namespace {
 
@@ -78,7 +66,7 @@ TEST_F(JobLink, TheHeaderHoldsQuoteCarAndPeople)
     exportQuote();
 
     for (const auto& [column, value] : casesIn<2>("jobexport/header.txt"))
-        EXPECT_EQ(header(column), value.toStdString()) << column.toStdString();
+        EXPECT_EQ(header(column), value.toStdString()) << column;
     EXPECT_EQ(details("coreTitle"), "");
     EXPECT_EQ(statusOfTheJob(), 1);
     EXPECT_EQ(shown(), "");
@@ -196,8 +184,7 @@ TEST(Cipher, WhatIsStoredComesBack)
         EXPECT_EQ(DecryptText(stored + u"00112233445566"_s), plain);
     }
     for (const QString& pair : {u"zz"_s, u"a "_s, u"\ta"_s, u"+a"_s})
-        EXPECT_THROW(DecryptText(pair + u"00112233445566"_s), RuntimeError) << pair.toStdString();
+        EXPECT_THROW(DecryptText(pair + u"00112233445566"_s), RuntimeError) << pair;
 }
 
 }  // namespace
-}  // namespace kest::test

@@ -1,14 +1,5 @@
 #include "loopback/InsurerRules.h"
-#include "platform/RuntimeError.h"
-#include "platform/files/files.h"
-#include "support/Cases.h"
-#include "support/Places.h"
-
-#include <gtest/gtest.h>
-
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
+#include "support/Test.h"
 
 namespace {
 
@@ -56,9 +47,7 @@ TEST(InsurerRules, TheRuleThatNamesTheQuoteGoesBeforeThoseForItsRequestAndForAny
     for (const auto& [quote, subquote, request, time, line] : casesIn<5>("loopback/rule-choice.txt")) {
         const app::Rule* rule = rules.ruleFor(quote, subquote, request, time.toInt());
         ASSERT_NE(rule, nullptr);
-        EXPECT_EQ(rule->line, line.toInt()) << quote.toStdString() << '/' << subquote.toStdString();
+        EXPECT_EQ(rule->line, line.toInt()) << quote << '/' << subquote;
     }
     EXPECT_EQ(app::parsedRules(u"on quote 1"_s).ruleFor(u"2"_s, u"0"_s, {}, 1), nullptr);
 }
-
-}  // namespace kest::test

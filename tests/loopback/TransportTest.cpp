@@ -1,14 +1,7 @@
 #include "app/TransportCommand.h"
 #include "loopback/Transport.h"
 #include "outbound/SendQuote.h"
-#include "platform/profile.h"
 #include "support/Shop.h"
-
-#include <QFile>
-
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
 
 namespace {
 
@@ -59,7 +52,7 @@ protected:
     static std::string loadOne()
     {
         const QStringList files = listed();
-        EXPECT_EQ(files.size(), 1) << files.join(u' ').toStdString();
+        EXPECT_EQ(files.size(), 1) << files.join(u' ');
         EXPECT_TRUE(loadAsTheWindow(files.value(0)));
         return files.value(0).section(u'_', 2, 2).toStdString();
     }
@@ -90,7 +83,7 @@ TEST_F(Loopback, OneTransportWorksOnTheFoldersAndADeadOneLocksNobodyOut)
         files::write(folders().own + u"KESTWeb.lock"_s, leftOver);
         app::TransportRunner first(folders(), [](const app::Carry&) {});
         app::TransportRunner second(folders(), [](const app::Carry&) {});
-        EXPECT_TRUE(first.claim()) << leftOver.toStdString();
+        EXPECT_TRUE(first.claim()) << leftOver;
         EXPECT_FALSE(second.claim());
     }
 }
@@ -109,7 +102,7 @@ TEST_F(Loopback, EachMessageHasTheEffectThatItsTypeTells)
         EXPECT_EQ(loadOne(), type.toStdString());
         listed();  // because an old answer would lock the quote again
         const QString state = QString::fromStdString(quote("1004").state());
-        EXPECT_TRUE(state.startsWith(stage + u' ') && state.contains(u" : %1)"_s.arg(note))) << state.toStdString();
+        EXPECT_TRUE(state.startsWith(stage + u' ') && state.contains(u" : %1)"_s.arg(note))) << state;
     }
     EXPECT_EQ(desktop->boxes().filter(u"critical|"_s), QStringList());
 }
@@ -160,8 +153,8 @@ TEST_F(Loopback, WhatCannotBeSentStaysAndIsToldOnceForEachChange)
          {u"<quoteBody>"_s, QString(), u"\u0001\u00ff&"_s, sentDocument(""), sentDocument("1004/12"),
           sentDocument("../1004/0"), sentDocument("10_04/0"), u"<!DOCTYPE x []><quoteBody/>"_s}) {
         files::write(gsUnsentPath + u"odd.xml"_s, text);
-        EXPECT_TRUE(faults().starts_with("odd.xml")) << text.toStdString();
-        EXPECT_EQ(faults(), "") << text.toStdString();
+        EXPECT_TRUE(faults().starts_with("odd.xml")) << text;
+        EXPECT_EQ(faults(), "") << text;
         EXPECT_EQ(files::read(gsUnsentPath + u"odd.xml"_s), text);
     }
     files::write(gsUnsentPath + u"I_odd.xml"_s, u"<request>"_s);
@@ -250,5 +243,3 @@ TEST_F(Loopback, TheWindowShowsWhatIsCarriedAndASecondOneSaysSo)
     EXPECT_EQ(desktop->boxTexts().last(), u"KESTWeb is running already."_s);
     EXPECT_FALSE(app::runTransport(app::TransportMode::Once, {}));
 }
-
-}  // namespace kest::test

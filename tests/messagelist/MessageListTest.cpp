@@ -3,17 +3,6 @@
 #include "support/Hands.h"
 #include "support/Shop.h"
 
-#include <QClipboard>
-#include <QDropEvent>
-#include <QGuiApplication>
-#include <QHeaderView>
-#include <QLabel>
-#include <QMimeData>
-#include <QTreeView>
-
-using namespace Qt::StringLiterals;
-
-namespace kest::test {
 namespace {
 
 class MessageListWindow : public Shop {
@@ -197,8 +186,8 @@ TEST_F(Searched, WhatIsTypedInTheListLeavesTheRowsThatHoldIt)
 {
     for (const auto& [keys, rows, line, chosen] : casesIn<4>("messages/search.txt")) {
         visit({key("ListView1", keys), readAll, click("Command6")});
-        EXPECT_EQ(listed(), (rows + u": "_s + line).toStdString()) << keys.toStdString();
-        EXPECT_EQ(desktop->boxTexts().join(u' ').section(u' ', 5, 5), chosen) << keys.toStdString();
+        EXPECT_EQ(listed(), (rows + u": "_s + line).toStdString()) << keys;
+        EXPECT_EQ(desktop->boxTexts().join(u' ').section(u' ', 5, 5), chosen) << keys;
     }
 }
 
@@ -230,7 +219,7 @@ TEST_F(Searched, OrderWidthsAndPlaceOutliveARefreshAndOrderAndWidthsTheWindow)
             desktop::gestures::press(window, Qt::CTRL | Qt::Key_1);
             EXPECT_EQ(list.model()->index(0, 0).data(), order == 0 ? u"a.xml"_s : u"c.xml"_s);
             desktop::gestures::press(window, Qt::Key_F5);
-            EXPECT_TRUE(state(list).startsWith(u"b.xml chosen, width 177"_s)) << state(list).toStdString();
+            EXPECT_TRUE(state(list).startsWith(u"b.xml chosen, width 177"_s)) << state(list);
         }
         EXPECT_EQ(state(list), u"b.xml chosen, width 177, order 1 of column 0"_s);
     };
@@ -288,4 +277,3 @@ TEST_F(Searched, FilesAreDroppedOrPastedWhileTheUnreadMessagesAreShown)
 }
 
 }  // namespace
-}  // namespace kest::test

@@ -1,10 +1,5 @@
 #include "support/Shop.h"
 
-#include <QFile>
-
-using namespace Qt::StringLiterals;
-
-namespace kest::test {
 namespace {
 
 class MessageList : public Shop {
@@ -37,7 +32,7 @@ TEST_F(MessageList, AMessageShowsWhatItSaysAndTheCustomerOfItsCar)
 {
     car("ABC123");
     for (const auto& [message, expected] : casesIn<2>("messages/rows.txt")) {
-        EXPECT_EQ(row(Message::told(message)), expected.toStdString()) << message.toStdString();
+        EXPECT_EQ(row(Message::told(message)), expected.toStdString()) << message;
     }
     EXPECT_EQ(row(Message("QREQ", "getQuoteRequestResponse")), "Quote Request|-||-|-|-");
     EXPECT_EQ(row(Message("qreq", "getQuoteRequestResponse")), "ERROR|||||");
@@ -189,4 +184,3 @@ TEST_F(MessageList, OneMessageOfARequestIsShownAtATime)
 }
 
 }  // namespace
-}  // namespace kest::test

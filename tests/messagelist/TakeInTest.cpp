@@ -2,10 +2,7 @@
 #include "messagelist/TakeIn.h"
 #include "support/Shop.h"
 
-namespace kest::test {
 namespace {
-
-using namespace Qt::StringLiterals;
 
 using TakingIn = Shop;
 
@@ -21,8 +18,8 @@ TEST_F(TakingIn, OnlyMessagesAndWhatBelongsToRequestsAreTaken)
     for (const auto& [name, content, refusal] : casesIn<3>("messages/taken-in.txt")) {
         const TakenIn taken = takeInFiles({bring(name, contents.value(content, content))});
         EXPECT_EQ(taken.refused.join(u' '), refusal.isEmpty() ? QString() : name + u": "_s + refusal);
-        EXPECT_EQ(taken.messages + taken.pictures + taken.descriptions, refusal.isEmpty()) << name.toStdString();
-        EXPECT_EQ(files::exists(gsUnreadPath + name), refusal.isEmpty()) << name.toStdString();
+        EXPECT_EQ(taken.messages + taken.pictures + taken.descriptions, refusal.isEmpty()) << name;
+        EXPECT_EQ(files::exists(gsUnreadPath + name), refusal.isEmpty()) << name;
         EXPECT_TRUE(files::exists(root() + u"/stick/"_s + name));
     }
     QList<QUrl> others{QUrl::fromLocalFile(root()), QUrl::fromLocalFile(u"/nowhere/x.xml"_s),
@@ -64,4 +61,3 @@ TEST_F(TakingIn, AFileThatLiesThereIsReplacedOnlyAfterYes)
 }
 
 }  // namespace
-}  // namespace kest::test

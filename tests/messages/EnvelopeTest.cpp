@@ -1,11 +1,7 @@
 #include "messages/Envelope.h"
 #include "support/Messages.h"
+#include "support/Test.h"
 
-#include <gtest/gtest.h>
-
-using namespace Qt::StringLiterals;
-
-namespace kest::test {
 namespace {
 
 const QString xsi = u"xmlns:xsi=\"http://www.w3.org/2001/XMLSchema-instance\" "_s;
@@ -36,4 +32,3 @@ TEST(Envelope, AmpersandsAreEscapedAsFarAsAParseGoes)
 }
 
 }  // namespace
-}  // namespace kest::test

@@ -2,11 +2,6 @@
 #include "support/FullDisk.h"
 #include "support/Shop.h"
 
-#include <QFile>
-
-using namespace Qt::StringLiterals;
-
-namespace kest::test {
 namespace {
 
 class MessageFolders : public Shop {
@@ -33,7 +28,7 @@ TEST_F(MessageFolders, ALoadedMessageIsNamedAfterItsQuote)
     EXPECT_EQ(moved(revisionRequest("QR1").version("2")), "500.2_1.xml");
     for (const Message& ofTheNewestQuote : {cancellation("QR1"), cancellationBackout("QR1"), assessmentBackout("QR1"),
                                             assessmentResult("KQ1"), quoteDeletion("KQ1")})
-        EXPECT_EQ(moved(ofTheNewestQuote), "500.2_1.xml") << ofTheNewestQuote.text().toStdString();
+        EXPECT_EQ(moved(ofTheNewestQuote), "500.2_1.xml") << ofTheNewestQuote.text();
     for (const Message& message :
          {quoteMatch("123/2"), manualQuote("123/2"), adjustedQuote("123/2"), authorisedQuote("123/2")})
         EXPECT_EQ(moved(message), "123.2_1.xml");
@@ -47,7 +42,7 @@ TEST_F(MessageFolders, AMessageThatReachesNoQuoteKeepsItsName)
          {quoteRequest("QR1").version("2"), quoteRequest("QR9"), cancellation("Q'; DROP TABLE QUOTE1; --"),
           quoteRequest("QR1").without("quoteRequestVersionNumber"), assessmentResult("KQ9"), quoteMatch(""),
           excessWaiver("500"), quoteMatch("..\\..\\x"), quoteMatch("5/../../x"), quoteMatch("c:5")})
-        EXPECT_EQ(moved(message), "in.xml") << message.text().toStdString();
+        EXPECT_EQ(moved(message), "in.xml") << message.text();
     EXPECT_EQ(moved("no message"), "in.xml");
     EXPECT_EQ(moved(quoteMatch("a\tb"), "..two dots.xml"), "..two dots.xml");
     EXPECT_TRUE(quoteExists("500"));
@@ -73,7 +68,7 @@ TEST_F(MessageFolders, TheRunningNumberCountsTheMessagesOfAQuoteAndSubquote)
     for (const auto& [read, reference, name] : casesIn<3>("messages/running-numbers.txt")) {
         for (const QString& file : read.split(u' '))
             files::write(gsReadPath + file, u"old"_s);
-        EXPECT_EQ(GetMatchedFileName(reference), name) << read.toStdString();
+        EXPECT_EQ(GetMatchedFileName(reference), name) << read;
         for (const QString& file : read.split(u' '))
             files::remove(gsReadPath + file);
     }
@@ -115,4 +110,3 @@ TEST_F(MessageFolders, AnOldCopySurvivesAFullDiskAndABadNameIsPassedOver)
 }
 
 }  // namespace
-}  // namespace kest::test

@@ -3,8 +3,6 @@
 #include "outbound/frmExtraInfo.h"
 #include "platform/Prompt.h"
 
-namespace kest::test {
-
 class ExtraInformation : public Sending {
 protected:
     /// Shows the dialog for the quote 500 and does these steps, which are JSON with single instead of double quotes.
@@ -32,7 +30,7 @@ TEST_F(ExtraInformation, EachFieldIsCheckedBeforeItIsLeft)
 {
     for (const auto& [field, text, message] : casesIn<3>("outbound/extra-checks.txt")) {
         show(complete + typed(field, text) + done + u", "_s + completeAndDone);
-        EXPECT_EQ(desktop->boxes(), QStringList(u"none||%1|ok"_s.arg(message))) << field.toStdString();
+        EXPECT_EQ(desktop->boxes(), QStringList(u"none||%1|ok"_s.arg(message))) << field;
     }
     car("ABC123").set("COLOUR", "Mauve");
     show(typed(u"txtDamageDesc"_s, u"dent"_s) + typed(u"txtVIN"_s, u"V1"_s) + typed(u"txtCylinders"_s, u"4"_s) + done +
@@ -73,8 +71,8 @@ TEST_F(ExtraInformation, ColoursCompleteThemselves)
 {
     for (const auto& [steps, colour] : casesIn<2>("outbound/colours.txt")) {
         show(steps + u", {'read': ['txtColour', 'lvColour']}, "_s + completeAndDone);
-        EXPECT_EQ(desktop->read(u"txtColour"_s), colour) << steps.toStdString();
-        EXPECT_EQ(desktop->read(u"lvColour"_s, u"visible"_s), false) << steps.toStdString();
+        EXPECT_EQ(desktop->read(u"txtColour"_s), colour) << steps;
+        EXPECT_EQ(desktop->read(u"lvColour"_s, u"visible"_s), false) << steps;
     }
 }
 
@@ -105,7 +103,7 @@ TEST_F(ExtraInformation, TheCarTakesItsNormalFormsOnEverySend)
         EXPECT_EQ(sent(extra + u"monthOfManufacture"_s) + ' ' + sent(extra + u"yearOfManufacture"_s) + ' ' +
                       sent(extra + u"color"_s),
                   document.toStdString())
-            << before.toStdString();
+            << before;
     }
 }
 
@@ -118,8 +116,6 @@ TEST_F(ExtraInformation, ThePersonOfACustomerIsToldByTitleAndFirstName)
         QStringList told;
         for (const char* element : {"companyName", "title", "firstName", "surname"})
             told << QString::fromStdString(sent(u"quoteClaimCustomer/"_s + QLatin1StringView(element)));
-        EXPECT_EQ(told.join(u", "_s), expected) << columns.toStdString();
+        EXPECT_EQ(told.join(u", "_s), expected) << columns;
     }
 }
-
-}  // namespace kest::test

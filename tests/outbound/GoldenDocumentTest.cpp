@@ -1,10 +1,6 @@
 // Compares complete quote documents with files. The quote lines come from a file of tests/data/outbound, too.
 #include "Sending.h"
 
-#include <QXmlStreamReader>
-
-namespace kest::test {
-
 namespace {
 
 const QString quoteNamespace = u"http://quote3.webservice.orla.example"_s;
@@ -98,5 +94,3 @@ TEST_F(GoldenDocument, AMainQuoteOfFortyLinesInEverySet)
 {
     sends(quote("A-40").request("QR40", "1").note("Active Quote Request"), "forty-lines", 3843.5, u"A-40.0_1.xml"_s);
 }
-
-}  // namespace kest::test

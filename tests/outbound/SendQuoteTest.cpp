@@ -1,12 +1,6 @@
 #include "Sending.h"
-#include "platform/RuntimeError.h"
 #include "platform/database/FaultInjection.h"
 #include "platform/files/FaultInjection.h"
-#include "support/Failure.h"
-
-#include <QDir>
-
-namespace kest::test {
 
 namespace {
 
@@ -27,8 +21,8 @@ TEST_F(Sending, EachRefusalHasItsMessageAndChangesNothing)
         const std::string before = row.exists() ? row.state() : "";
         EXPECT_EQ(send("500"), 0);
         EXPECT_EQ(shown(), "[critical] " + message.toStdString());
-        EXPECT_EQ(row.exists() ? row.state() : "", before) << message.toStdString();
-        EXPECT_EQ(filesIn(gsUnsentPath), QStringList()) << message.toStdString();
+        EXPECT_EQ(row.exists() ? row.state() : "", before) << message;
+        EXPECT_EQ(filesIn(gsUnsentPath), QStringList()) << message;
         empty({"QUOTE1", "QUOTE2", "QUOTE3", "CAR", "CUSTOMER"});
         gConn->execute(u"UPDATE INSURER SET KEST=1"_s);
     }
@@ -91,9 +85,9 @@ TEST_F(Sending, AQuoteIsLockedOnlyWhenItsDocumentStands)
         const QuoteRow row = sendable();
         if (!statement.isEmpty())
             gConn->execute(statement);
-        EXPECT_EQ(failureOf([] { send("500"); }), number) << statement.toStdString();
-        EXPECT_FALSE(row.locked()) << statement.toStdString();
-        EXPECT_EQ(filesIn(gsUnsentPath), QStringList()) << statement.toStdString();
+        EXPECT_EQ(failureOf([] { send("500"); }), number) << statement;
+        EXPECT_FALSE(row.locked()) << statement;
+        EXPECT_EQ(filesIn(gsUnsentPath), QStringList()) << statement;
         EXPECT_EQ(shown(), "");
         empty({"QUOTE1", "QUOTE2", "QUOTE3"});
     };
@@ -156,5 +150,3 @@ TEST_F(Sending, ImagesAreListedAndGoOutWithTheirDocuments)
     send("600");
     EXPECT_EQ(sent(u"imageCount"_s, u"600.0_1.xml"_s) + sent(u"quoteImageIds"_s, u"600.0_1.xml"_s), "0(none)");
 }
-
-}  // namespace kest::test

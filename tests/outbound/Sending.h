@@ -1,15 +1,11 @@
 // A shop that sends quotes, with functions that read its outgoing folder.
 #pragma once
 
-#include "base/modDBAccess.h"
 #include "outbound/SendQuote.h"
-#include "platform/database/Sql.h"
 #include "platform/xml/xml.h"
 #include "support/Shop.h"
 
 namespace kest::test {
-
-using namespace Qt::StringLiterals;
 
 class Sending : public Shop {
 protected:

@@ -1,24 +1,14 @@
 // Tests connections and statements: which engine is used, how each compares values, and which errors occur.
 #include "platform/Databases.h"
 #include "platform/database/FaultInjection.h"
-#include "platform/files/files.h"
-#include "platform/values.h"
-#include "support/Cases.h"
-#include "support/Failure.h"
 
-#include <QElapsedTimer>
-#include <QFile>
 #include <QSqlDatabase>
 #include <QSqlQuery>
-#include <QSysInfo>
 
 #include <arpa/inet.h>
 #include <sys/socket.h>
 #include <unistd.h>
 
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
 using db::Recordset;
 
 namespace {
@@ -44,7 +34,7 @@ TEST_P(Database, AComparisonMeansTheSameOnEveryEngine)
     insert(u"CODE, SEQ"_s, u"'', 7"_s);
     for (const QStringList& row : rowsIn("comparisons.txt"))
         for (const QString& condition : row.mid(1))
-            EXPECT_EQ(count(condition), row[0].toInt()) << condition.toStdString();
+            EXPECT_EQ(count(condition), row[0].toInt()) << condition;
 }
 
 TEST_P(Database, StatementsInTheDialectOfTheHostAreUnderstood)
@@ -77,17 +67,17 @@ TEST_P(Database, NoValueEndsItsLiteral)
         connection->execute(u"DELETE FROM LINE"_s);
         connection->execute(sql("INSERT INTO LINE (CODE, notes) VALUES ('{}', '{}')", code, text));
         Recordset rows = query(sql("SELECT * FROM LINE WHERE CODE='{}'", code));
-        ASSERT_EQ(rows.recordCount(), 1) << text.toStdString();
+        ASSERT_EQ(rows.recordCount(), 1) << text;
         EXPECT_EQ(rows.text(u"notes"_s), text);
         rows.find(sql("CODE='{}'", code));
-        EXPECT_FALSE(rows.eof()) << text.toStdString();
+        EXPECT_FALSE(rows.eof()) << text;
         for (const QString& written : {u"x"_s, code}) {
             rows.set(u"CODE"_s, written);
             rows.set(u"notes"_s, text + written);
             rows.update();
         }
         rows.requery();
-        ASSERT_EQ(rows.recordCount(), 1) << text.toStdString();
+        ASSERT_EQ(rows.recordCount(), 1) << text;
         EXPECT_EQ(rows.text(u"notes"_s), text + code);
     }
     insert(u"SEQ"_s, u"1"_s);
@@ -102,7 +92,7 @@ TEST_P(Database, AFailureKeepsTheCodesOfTheDatabase)
     const RuntimeError noTable = failure([&] { query(u"SELECT * FROM NOSUCH"_s); });
     EXPECT_EQ(noTable.number(), StatementFailed);
     EXPECT_FALSE(noTable.nativeCode().isEmpty());
-    EXPECT_TRUE(noTable.sqlState().startsWith(u"42"_s)) << noTable.sqlState().toStdString();
+    EXPECT_TRUE(noTable.sqlState().startsWith(u"42"_s)) << noTable.sqlState();
     EXPECT_TRUE(noTable.description().contains(u"NOSUCH"_s, Qt::CaseInsensitive)) << noTable.what();
 
     Recordset cars = query(u"SELECT * FROM CAR"_s);
@@ -211,8 +201,8 @@ TEST(connectionText, ChoosesTheEngineThatAnswers)
         text.replace(u"THISHOST"_s, QSysInfo::machineHostName());
         const bool opens = outcome == u"opens"_s;
         db::Connection connection;
-        EXPECT_EQ(failure([&] { connection.open(text); }).number(), opens ? 0 : CannotOpen) << text.toStdString();
-        EXPECT_EQ(connection.state(), opens ? 1 : 0) << text.toStdString();
+        EXPECT_EQ(failure([&] { connection.open(text); }).number(), opens ? 0 : CannotOpen) << text;
+        EXPECT_EQ(connection.state(), opens ? 1 : 0) << text;
     }
     EXPECT_FALSE(QFile::exists(profile.root() + u"/databases/NoShop.db"_s)) << "a missing database is not made";
 }
@@ -247,7 +237,7 @@ TEST(connectionText, AServerThatRefusesOrDoesNotAnswerCostsSeconds)
         time.start();
         db::Connection connection;
         const RuntimeError thrown = failure([&] { connection.open(connectionText); });
-        EXPECT_EQ(thrown.number(), number) << connectionText.toStdString();
+        EXPECT_EQ(thrown.number(), number) << connectionText;
         EXPECT_EQ(thrown.nativeCode(), native);
         EXPECT_LT(time.elapsed(), 10000);
     }
@@ -262,5 +252,3 @@ TEST(PastedStatement, FillsPlacesByWhereTheyStand)
     EXPECT_EQ(sql("A={} AND B='{}'", QVariant(), QVariant()), u"A=NULL AND B=''"_s);
     EXPECT_EQ(sql("A='{}' AND B={} AND C='{}'", u"{}'"_s, 1, u"c"_s), u"A='{}''' AND B=1 AND C='c'"_s);
 }
-
-}  // namespace kest::test

@@ -3,10 +3,6 @@
 #include "setup/QuoteDatabase.h"
 #include "support/OdbcDrivers.h"
 
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
-
 namespace {
 
 const auto embeddedSchema =
@@ -69,5 +65,3 @@ int Databases::count(const QString& condition) const
 {
     return query(u"SELECT * FROM LINE WHERE "_s + condition).recordCount();
 }
-
-}  // namespace kest::test

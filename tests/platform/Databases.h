@@ -1,16 +1,11 @@
 // Provides the same small database on each engine, so that a test states a rule for all of them.
 #pragma once
 
-#include "platform/RuntimeError.h"
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
 #include "support/MariaDbServer.h"
 #include "support/TdsServer.h"
-#include "support/TestProfile.h"
-
-#include <QString>
-
-#include <gtest/gtest.h>
+#include "support/Test.h"
 
 namespace kest::test {
 

@@ -1,29 +1,13 @@
 // Tests boxes, input boxes, starting programs, the guard of window events, and the remembered window layout.
 #include "platform/Prompt.h"
-#include "platform/RuntimeError.h"
 #include "platform/desktop/Form.h"
 #include "platform/desktop/Progress.h"
-#include "platform/files/files.h"
 #include "platform/script/Gestures.h"
 #include "support/ScriptedDesktop.h"
-#include "support/TestProfile.h"
+#include "support/Test.h"
 
-#include <QFile>
-#include <QInputDialog>
-#include <QJsonDocument>
-#include <QMessageBox>
-#include <QProgressBar>
-#include <QScreen>
-#include <QThread>
-#include <QTimer>
-
-namespace kest {
-
-using namespace Qt::StringLiterals;
 using desktop::Answer;
 using desktop::Icon;
-using test::ScriptedDesktop;
-using test::TestProfile;
 
 TEST(Seam, TheScriptAnswersByTheFirstEntryThatFitsAndElseByTheDefault)
 {
@@ -180,5 +164,3 @@ TEST_F(Person, FindsEveryWindowAsItWasLeftAndInTheMiddle)
         desktop::showModal(window);
     }
 }
-
-}  // namespace kest

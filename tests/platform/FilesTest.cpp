@@ -1,15 +1,7 @@
 // Tests files with the host's names: where they are, what remains after an error, and which names are valid.
 #include "platform/files/Lock.h"
-#include "platform/files/files.h"
-#include "platform/values.h"
-#include "support/Cases.h"
-#include "support/Failure.h"
 #include "support/FullDisk.h"
-#include "support/TestProfile.h"
-
-#include <QDir>
-#include <QElapsedTimer>
-#include <QFile>
+#include "support/Test.h"
 
 #include <fcntl.h>
 #include <sys/stat.h>
@@ -18,12 +10,7 @@
 
 #include <atomic>
 #include <csignal>
-#include <functional>
 #include <thread>
-
-using namespace Qt::StringLiterals;
-using namespace kest;
-using test::failureOf;
 
 namespace {
 
@@ -64,8 +51,7 @@ TEST_F(Files, PathsNamesPatternsAndBase64AreTakenAsTheTableSays)
     };
     for (const QStringList& row : test::rowsIn("files.txt"))
         for (const QString& text : row.mid(2))
-            EXPECT_EQ(test::outcomeOf([&] { return answer(row[0], text); }), row[1])
-                << row[0].toStdString() << ": " << text.toStdString();
+            EXPECT_EQ(test::outcomeOf([&] { return answer(row[0], text); }), row[1]) << row[0] << ": " << text;
     EXPECT_EQ(files::systemPath(onDisk(u"x"_s)), onDisk(u"x"_s));
     EXPECT_FALSE(files::isPlainName(u"..\\x"_s));
 
@@ -259,7 +245,7 @@ TEST_F(Files, ALockGoesWithItsProcessWhateverItsFileHolds)
     const auto isFree = [&](const QString& name, int wait = 0) { return files::Lock(path, name, wait).isHeld(); };
     for (const QString& leftOver : {u""_s, u"1\nkest2\nanother-machine\n"_s}) {
         files::write(path, leftOver);
-        EXPECT_TRUE(isFree(u"load m.xml"_s)) << leftOver.toStdString();
+        EXPECT_TRUE(isFree(u"load m.xml"_s)) << leftOver;
     }
     int ready[2];
     ASSERT_EQ(::pipe(ready), 0);

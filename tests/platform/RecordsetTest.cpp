@@ -1,13 +1,8 @@
 // Tests the recordset: what it reads, writes, refuses and finds on each engine.
 #include "platform/Databases.h"
 #include "platform/database/FaultInjection.h"
-#include "platform/values.h"
-#include "support/Cases.h"
 #include "support/TimeZone.h"
 
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
 using db::Kind;
 using db::Recordset;
 
@@ -78,9 +73,9 @@ TEST_P(RecordsetOn, AKindOfColumnHasOneTypeOnEveryEngine)
     lines.update();
     lines.requery();
     for (const auto& [name, kind, text, value] : columns) {
-        EXPECT_EQ(lines.kind(name), kind) << name.toStdString();
-        EXPECT_EQ(lines.value(name).typeId(), value.typeId()) << name.toStdString();
-        EXPECT_EQ(lines.value(name), value) << name.toStdString();
+        EXPECT_EQ(lines.kind(name), kind) << name;
+        EXPECT_EQ(lines.value(name).typeId(), value.typeId()) << name;
+        EXPECT_EQ(lines.value(name), value) << name;
     }
     EXPECT_EQ(lines.value(u"id"_s), QVariant(qint64(1)));
     EXPECT_EQ(lines.size(u"code"_s), 20);
@@ -89,7 +84,7 @@ TEST_P(RecordsetOn, AKindOfColumnHasOneTypeOnEveryEngine)
 
     const std::pair<QString, QString> wrong[] = {{u"SEQ"_s, u"x"_s}, {u"amount"_s, u""_s}, {u"day"_s, u"soon"_s}};
     for (const auto& [column, text] : wrong)
-        EXPECT_EQ(failure([&] { lines.set(column, text); }).number(), TypeMismatch) << column.toStdString();
+        EXPECT_EQ(failure([&] { lines.set(column, text); }).number(), TypeMismatch) << column;
     EXPECT_EQ(failure([&] { lines.value(u"nosuch"_s); }).number(), NoSuchColumn);
 }
 
@@ -132,7 +127,7 @@ TEST_P(RecordsetOn, ARowThatSomeoneElseHasChangedIsNotOverwritten)
         lines.set(column, ours.isEmpty() ? QVariant() : ours);
         elsewhere(u"UPDATE LINE SET %1=%2"_s.arg(column, theirs));
         EXPECT_EQ(failure([&] { lines.update(); }).number(), outcome == u"refused"_s ? RowChanged : 0)
-            << column.toStdString() << ' ' << before.toStdString() << ' ' << theirs.toStdString();
+            << column << ' ' << before << ' ' << theirs;
         lines.cancelUpdate();
     }
     lines.set(u"CODE"_s, u"gone"_s);
@@ -217,7 +212,7 @@ TEST_P(RecordsetOn, SearchesGoForwardAndCompareByTheKindOfTheColumn)
     write(u"day"_s, someDay);
     for (const QStringList& row : rowsIn("criteria.txt"))
         for (const QString& criterion : row.mid(1))
-            EXPECT_EQ(found(criterion), row[0].toInt()) << criterion.toStdString();
+            EXPECT_EQ(found(criterion), row[0].toInt()) << criterion;
     lines.setAbsolutePosition(2);
     lines.find(u"code = 'Red '"_s);
     EXPECT_EQ(lines.absolutePosition(), 4);
@@ -329,5 +324,3 @@ TEST(DeclaredTable, CutsTextsAndCountsItsPendingRow)
     table.moveNext();
     EXPECT_TRUE(table.isNull(u"Price"_s));
 }
-
-}  // namespace kest::test

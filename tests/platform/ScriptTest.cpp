@@ -1,32 +1,9 @@
 // Tests that the steps of a script act like a person, and that a step that a person could not do ends the run.
-#include "platform/RuntimeError.h"
 #include "platform/desktop/Form.h"
-#include "support/Cases.h"
 #include "support/ScriptedDesktop.h"
-#include "support/TestProfile.h"
+#include "support/Test.h"
 
-#include <QCheckBox>
-#include <QCloseEvent>
-#include <QComboBox>
-#include <QElapsedTimer>
-#include <QIntValidator>
-#include <QJsonDocument>
-#include <QLabel>
-#include <QLineEdit>
-#include <QPlainTextEdit>
-#include <QPushButton>
-#include <QRadioButton>
-#include <QShortcut>
-#include <QSpinBox>
-#include <QTabBar>
-#include <QTreeWidget>
-#include <QVBoxLayout>
-
-namespace kest {
-
-using namespace Qt::StringLiterals;
 using desktop::NeedsAnswer;
-using test::ScriptedDesktop;
 
 namespace {
 
@@ -118,7 +95,7 @@ struct Steps : testing::Test {
 TEST_F(Steps, AreThoseOfAPersonAndOneThatNobodyCouldTakeEndsTheRun)
 {
     for (const QStringList& row : test::rowsIn("script-steps.txt"))
-        EXPECT_EQ(run(row[0]), row[1]) << row[0].toStdString();
+        EXPECT_EQ(run(row[0]), row[1]) << row[0];
 }
 
 TEST_F(Steps, TypeIntoEveryKindOfFieldAndReadWhatTheControlsHave)
@@ -129,8 +106,7 @@ TEST_F(Steps, TypeIntoEveryKindOfFieldAndReadWhatTheControlsHave)
     const QJsonArray reads = desk->record().reads;
     ASSERT_EQ(reads.size(), 2);
     for (const QStringList& row : test::rowsIn("script-readings.txt"))
-        EXPECT_EQ(reads[0][u"values"_s][row[0]], QJsonDocument::fromJson(row[1].toUtf8()).object())
-            << row[0].toStdString();
+        EXPECT_EQ(reads[0][u"values"_s][row[0]], QJsonDocument::fromJson(row[1].toUtf8()).object()) << row[0];
     EXPECT_EQ(reads[1][u"values"_s].toObject().keys(), (QStringList{u"frmSample"_s, u"txtLine"_s}));
     EXPECT_EQ(desk->read(u"frmSample"_s).toString(), u"Sample"_s);
 }
@@ -176,11 +152,9 @@ TEST(ScriptForm, IsCheckedBeforeAnythingRuns)
     for (const QStringList& row : test::rowsIn("script-form.txt")) {
         try {
             desktop::Script{QJsonDocument::fromJson(row[0].toUtf8()).object()};
-            ADD_FAILURE() << row[0].toStdString();
+            ADD_FAILURE() << row[0];
         } catch (const RuntimeError& error) {
             EXPECT_TRUE(error.description().contains(row[1])) << error.what();
         }
     }
 }
-
-}  // namespace kest

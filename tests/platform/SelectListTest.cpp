@@ -1,12 +1,7 @@
 // Tests that the columns of a query are found from its text.
 #include "platform/database/SelectList.h"
-#include "support/Cases.h"
+#include "support/Test.h"
 
-#include <gtest/gtest.h>
-
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
 using db::Kind;
 
 namespace {
@@ -49,7 +44,5 @@ TEST(SelectList, TellsWhereEachColumnCanBeChanged)
 {
     FixedSchema schema;
     for (const auto& [statement, columns] : casesIn<2>("select-lists.txt"))
-        EXPECT_EQ(told(db::selectedColumns(db::Tokens(statement), schema)), columns) << statement.toStdString();
+        EXPECT_EQ(told(db::selectedColumns(db::Tokens(statement), schema)), columns) << statement;
 }
-
-}  // namespace kest::test

@@ -1,19 +1,11 @@
 // Tests the registry: names, types, any text, two writers at once, and a missing profile.
-#include "platform/files/files.h"
-#include "platform/profile.h"
 #include "platform/settings/registry.h"
-#include "support/Failure.h"
-#include "support/TestProfile.h"
-
-#include <QDir>
-#include <QFile>
+#include "support/Test.h"
 
 #include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
-using namespace Qt::StringLiterals;
-using namespace kest;
 using namespace kest::settings;
 
 namespace {
@@ -30,7 +22,7 @@ protected:
     }
     static QString text(const QString& name)
     {
-        return query(Hive::LocalMachine, key, name).value_or(Value{Type::Binary, u"(none)"_s}).data;
+        return query(Hive::LocalMachine, key, name).value_or(settings::Value{Type::Binary, u"(none)"_s}).data;
     }
     QString file() const { return profile.root() + u"/registry.ini"_s; }
 
@@ -46,7 +38,7 @@ TEST_F(Registry, NamesAreFoundInAnyCaseAndKeepTheirSpelling)
     const QList<Entry> all = entries();
     ASSERT_EQ(all.size(), 1);
     EXPECT_EQ(all[0].key + u' ' + all[0].name, key + u" EcomHome"_s);
-    EXPECT_EQ(all[0].value, (Value{Type::Number, u"2"_s}));
+    EXPECT_EQ(all[0].value, (settings::Value{Type::Number, u"2"_s}));
     EXPECT_EQ(query(Hive::LocalMachine, u"\\Software\\\\Wirra32\\FRMSPLASH"_s, u"ecomhome"_s), all[0].value);
 }
 
@@ -56,9 +48,9 @@ TEST_F(Registry, AnyTextSurvivesAsNameAndValueAndInTheUsersArea)
          u"| blanks |a=b:c|[x]|;x|@|50%25 %|a\r\nb\tc\n|\u00e9\u20ac\U0001F697|c:\\x\\|x\u0000y|\u0085|\""_s.split(
              u'|')) {
         EXPECT_TRUE(set(text, text));
-        EXPECT_EQ(Registry::text(text), text) << text.toStdString();
+        EXPECT_EQ(Registry::text(text), text) << text;
         setUserSetting(u"an app"_s, u"a section"_s, text + u"1"_s, text);
-        EXPECT_EQ(userSetting(u"AN APP"_s, u"A Section"_s, text + u"1"_s, u"fallback"_s), text) << text.toStdString();
+        EXPECT_EQ(userSetting(u"AN APP"_s, u"A Section"_s, text + u"1"_s, u"fallback"_s), text) << text;
     }
     EXPECT_EQ(userSetting(u"an app"_s, u"other"_s, u"x"_s, u"fallback"_s), u"fallback"_s);
 }

@@ -1,20 +1,12 @@
 // Tests that the simulated SQL Server answers the real driver as the server does, as far as other tests rely on it.
 #include "support/TdsServer.h"
+#include "support/Test.h"
 
-#include <QElapsedTimer>
 #include <QSqlDatabase>
 #include <QSqlError>
 #include <QSqlField>
 #include <QSqlQuery>
 #include <QSqlRecord>
-
-#include <gtest/gtest.h>
-
-#include <optional>
-
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
 
 namespace {
 
@@ -101,8 +93,7 @@ TEST_F(StandIn, RefusesAsTheServerDoes)
                                                  {u"INSERT INTO LINE (version) VALUES (5)"_s, u"273"_s},
                                                  {u"EXEC sp_nosuch"_s, u"2812"_s}};
     for (const auto& [statement, number] : cases)
-        EXPECT_EQ(client->run(statement).lastError().nativeErrorCode().section(u';', 0, 0), number)
-            << statement.toStdString();
+        EXPECT_EQ(client->run(statement).lastError().nativeErrorCode().section(u';', 0, 0), number) << statement;
     EXPECT_FALSE(Client(u"wrong"_s, tdsServer().connectionText(u"plain"_s).replace(u"Pwd="_s, u"Pwd=x"_s)).isOpen());
     EXPECT_FALSE(Client(u"nowhere"_s, tdsServer().connectionText(u"nosuch"_s)).isOpen());
 }
@@ -156,5 +147,3 @@ TEST_F(StandIn, TakesItsTimeWhenItIsTold)
     client->run(u"WAITFOR DELAY '00:00:00.3'"_s);
     EXPECT_GE(time.elapsed(), 300);
 }
-
-}  // namespace kest::test

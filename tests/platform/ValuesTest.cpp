@@ -1,14 +1,8 @@
 // Tests which numbers, flags, dates and texts are read, refused and written.
-#include "platform/values.h"
-#include "support/Cases.h"
-#include "support/Failure.h"
-#include "support/TestProfile.h"
+
+#include "support/Test.h"
 
 #include <cmath>
-
-using namespace Qt::StringLiterals;
-using namespace kest;
-using test::failureOf;
 
 namespace {
 
@@ -31,8 +25,7 @@ TEST(Values, AreReadFromTheFormsOfTheirKindAndNoOthers)
 {
     for (const QStringList& row : test::rowsIn("values.txt"))
         for (const QString& text : row.mid(2))
-            EXPECT_EQ(test::outcomeOf([&] { return read(row[0], text); }), row[1])
-                << row[0].toStdString() << ' ' << text.toStdString();
+            EXPECT_EQ(test::outcomeOf([&] { return read(row[0], text); }), row[1]) << row[0] << ' ' << text;
     EXPECT_EQ(toDate(u"2024-05-06T10:20:30.123456Z"_s).time().msec(), 123);
     EXPECT_EQ(failureOf([] { toLong(std::nan("")); }), Overflow);
     EXPECT_EQ(failureOf([] { toDate(45000); }), TypeMismatch) << "a day's number is no date";

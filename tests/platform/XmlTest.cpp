@@ -1,19 +1,12 @@
 // Tests documents: which texts are refused with which code, what nodes return, and how documents are written.
 #include "platform/xml/xml.h"
-#include "support/Cases.h"
-#include "support/Failure.h"
-#include "support/TestProfile.h"
-
-#include <QFile>
+#include "support/Test.h"
 
 #include <malloc.h>
 
 #include <ctime>
 
-using namespace Qt::StringLiterals;
-using namespace kest;
 using namespace kest::xml;
-using test::failureOf;
 
 namespace {
 
@@ -22,8 +15,8 @@ QString outcome(const QString& text)
     Document document;
     const bool loaded = document.loadXML(text);
     const quint32 code = document.parseError().errorCode;
-    EXPECT_EQ(loaded, code == 0) << text.left(80).toStdString();
-    EXPECT_EQ(document.documentElement().isNull(), code != 0) << text.left(80).toStdString();
+    EXPECT_EQ(loaded, code == 0) << text.left(80);
+    EXPECT_EQ(document.documentElement().isNull(), code != 0) << text.left(80);
     if (code == 0)
         return u"fine"_s;
     return code == BareAmpersand ? u"bare ampersand"_s : code == SecondRoot ? u"second root"_s : u"other"_s;
@@ -33,7 +26,7 @@ Document parsed(const QString& text)
 {
     Document document;
     document.setSelectionNamespaces({{u"rootns"_s, u"urn:quote"_s}});
-    EXPECT_TRUE(document.loadXML(text)) << document.parseError().reason.toStdString();
+    EXPECT_TRUE(document.loadXML(text)) << document.parseError().reason;
     return document;
 }
 
@@ -95,7 +88,7 @@ Cost costOf(const QString& text, const QString& expected)
     ::malloc_trim(0);
     const double before = peakMemory(true);
     const std::clock_t start = std::clock();
-    EXPECT_EQ(outcome(text), expected) << text.left(80).toStdString();
+    EXPECT_EQ(outcome(text), expected) << text.left(80);
     return {1000.0 * double(std::clock() - start) / CLOCKS_PER_SEC, peakMemory(false) - before};
 }
 
@@ -110,7 +103,7 @@ TEST(XmlErrors, TheBareAmpersandAndTheSecondRootHaveCodesOfTheirOwn)
 {
     for (const QStringList& row : test::rowsIn("xml-errors.txt"))
         for (const QString& text : row.mid(1))
-            EXPECT_EQ(outcome(text), row[0]) << text.toStdString();
+            EXPECT_EQ(outcome(text), row[0]) << text;
 }
 
 TEST(XmlErrors, NoTextOfAMegabyteCostsMuchTimeOrMemory)
@@ -212,7 +205,7 @@ TEST(XmlNodes, SelectionsKnowThePrefixesOfTheDocument)
     EXPECT_EQ(document.textOrEmptyOf(u"nothing"_s), QString());
     EXPECT_EQ(failureOf([&] { document.textOf(u"nothing"_s); }), NoObject);
     for (const QString& path : {u"//["_s, u"//unknown:x"_s, u"count(//l)"_s})
-        EXPECT_EQ(failureOf([&] { document.selectNodes(path); }), TypeMismatch) << path.toStdString();
+        EXPECT_EQ(failureOf([&] { document.selectNodes(path); }), TypeMismatch) << path;
 }
 
 TEST(XmlNodes, ADeclaredEncodingDoesNotMatter)

@@ -1,12 +1,5 @@
 #include "quotedata/NetworkCodes.h"
-
-#include <gtest/gtest.h>
-
-#include <tuple>
-
-using namespace Qt::StringLiterals;
-
-namespace kest::test {
+#include "support/Test.h"
 
 TEST(NetworkCodes, WhatGoesOutComesBackAsTheFirstOfItsCode)
 {
@@ -35,5 +28,3 @@ TEST(NetworkCodes, AReasonThatEndsTheRepairIsNotedButNotReported)
     EXPECT_EQ(reportedReasonOfCode(u"notp"_s), std::nullopt);
     EXPECT_EQ(reportedReasonOfCode(u"meth"_s), u"Method of Repair"_s);
 }
-
-}  // namespace kest::test

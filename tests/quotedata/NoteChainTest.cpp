@@ -1,12 +1,5 @@
-#include "platform/values.h"
 #include "quotedata/NoteChain.h"
-#include "support/Cases.h"
-
-#include <gtest/gtest.h>
-
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
+#include "support/Test.h"
 
 TEST(NoteChain, ANoteIsAddedOrChangedInPlace)
 {
@@ -23,13 +16,11 @@ TEST(NoteChain, ANoteIsAddedOrChangedInPlace)
 TEST(NoteChain, TheStatusIsThatOfTheFirstNote)
 {
     for (const auto& [chain, subject, status] : casesIn<3>("quotedata/note-status.txt"))
-        EXPECT_EQ(GetNoteStatus(subject, chain), status) << chain.toStdString();
+        EXPECT_EQ(GetNoteStatus(subject, chain), status) << chain;
 }
 
 TEST(NoteChain, AllNotesOfASubjectAreRemoved)
 {
     for (const auto& [chain, subject, after] : casesIn<3>("quotedata/notes-removed.txt"))
-        EXPECT_EQ(RemoveNote(subject, chain), after) << chain.toStdString();
+        EXPECT_EQ(RemoveNote(subject, chain), after) << chain;
 }
-
-}  // namespace kest::test

@@ -1,12 +1,7 @@
-#include "base/modDBAccess.h"
-#include "platform/RuntimeError.h"
 #include "quotedata/QuoteTotals.h"
 #include "quotedata/Rounding.h"
 #include "support/Shop.h"
 
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
 using Totals = Shop;
 
 namespace {
@@ -42,8 +37,8 @@ TEST(RoundAmount, RoundsTheBinaryValueHalfAwayFromZeroOrFails)
 {
     for (const auto& [amount, rounded] : casesIn<2>("quotedata/rounding.txt")) {
         double changed = amount.toDouble();
-        EXPECT_DOUBLE_EQ(RoundAmount(changed, 2), rounded.toDouble()) << amount.toStdString();
-        EXPECT_DOUBLE_EQ(changed, rounded.toDouble()) << amount.toStdString();
+        EXPECT_DOUBLE_EQ(RoundAmount(changed, 2), rounded.toDouble()) << amount;
+        EXPECT_DOUBLE_EQ(changed, rounded.toDouble()) << amount;
     }
     EXPECT_EQ(RoundAmount(234.5, 0), 235);
     for (double value : {21474836.48, -21474836.50, 1.5e15, 1e307})
@@ -120,7 +115,7 @@ TEST_F(Totals, ANullThatMattersLeavesTheQuoteAsItWas)
              {std::pair(&CalcQuoteTotals, send), {&CalcAuthorisedTotals, authorisation}}) {
             quote("500").set("MISTOTAL", 7);
             calc(routine);
-            EXPECT_EQ(quote("500").number("MISTOTAL"), effect == u"totalled"_s ? 0 : 7) << column.toStdString();
+            EXPECT_EQ(quote("500").number("MISTOTAL"), effect == u"totalled"_s ? 0 : 7) << column;
         }
         gConn->execute(u"DELETE FROM QUOTE2"_s);
     }
@@ -140,5 +135,3 @@ TEST_F(Totals, RoundingStoresMoneyAndHoursAndTotalsThem)
     line.set("unitcost", 30000000);
     EXPECT_THROW(RoundQuoteLines(opened.header), RuntimeError) << "a failure goes to the caller";
 }
-
-}  // namespace kest::test

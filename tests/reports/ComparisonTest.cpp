@@ -4,10 +4,6 @@
 #include "reports/QuoteComparison.h"
 #include "support/Shop.h"
 
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
-
 namespace {
 
 class Comparison : public Shop {
@@ -71,10 +67,10 @@ TEST_F(Comparison, EachLineStandsBesideTheShops)
             db::Recordset& table = tables[isAdjusted];
             table.moveFirst();
             table.find(u"line_no='%1'"_s.arg(number));
-            ASSERT_FALSE(table.eof()) << number.toStdString();
+            ASSERT_FALSE(table.eof()) << number;
             EXPECT_EQ(cells(table, "amount old_amount qty old_qty itemno category script gst", u'/'),
                       (isAdjusted ? ofAdjusted : ofAuthorised).toStdString())
-                << (isAdjusted ? "adjusted, line " : "authorised, line ") << number.toStdString();
+                << (isAdjusted ? "adjusted, line " : "authorised, line ") << number;
         }
 }
 
@@ -88,8 +84,8 @@ TEST_F(Comparison, TheHeaderIsOnEveryRow)
     quote("500").set("TOTAL", 242.0);
     db::Recordset ofAdjusted = adjusted(adjustedQuote("500").set("quoteBody/quoteTotal", "868.730").labour(1, "C"));
     for (const auto& [field, first, second] : casesIn<3>("reports/comparison-header.txt")) {
-        EXPECT_EQ(column(ofAuthorised, field), (first + u", "_s + first).toStdString()) << field.toStdString();
-        EXPECT_EQ(column(ofAdjusted, field), second.toStdString()) << field.toStdString();
+        EXPECT_EQ(column(ofAuthorised, field), (first + u", "_s + first).toStdString()) << field;
+        EXPECT_EQ(column(ofAdjusted, field), second.toStdString()) << field;
     }
     EXPECT_FALSE(ofAdjusted.hasColumn(u"vendor"_s));
     EXPECT_EQ(ofAdjusted.columns().size(), 27);
@@ -179,5 +175,3 @@ TEST_F(Comparison, TheQuoteIsThatOfTheReferenceAndTheRequest)
     db::Recordset table = openComparison(ComparisonOf::AdjustedQuote);
     EXPECT_FALSE(fillAdjustedReport(table, parsedMessage(text), false));
 }
-
-}  // namespace kest::test

@@ -7,18 +7,8 @@
 #include "reports/BuildAuthReport.h"
 #include "reports/Previews.h"
 #include "reports/frmPrintPreview.h"
-#include "support/Failure.h"
 #include "support/FullDisk.h"
 #include "support/Hands.h"
-
-#include <QJsonDocument>
-#include <QLabel>
-#include <QPdfWriter>
-#include <QPushButton>
-#include <QRegularExpression>
-#include <QToolButton>
-
-namespace kest::test {
 
 namespace {
 
@@ -67,7 +57,7 @@ TEST_F(Preview, ATemplateIsFilledByFieldConditionAndRow)
         putTemplate("test.html", dataFile("reports/tags.html").replace("@tags@", tags.toUtf8()));
         report::Report report(u"c:\\wirra32\\report\\test.html"_s);
         report.setTable(report::tableOf(row));
-        EXPECT_EQ(report.body().section(u"<body>"_s, 1).section(u"</body>"_s, 0, 0), text) << tags.toStdString();
+        EXPECT_EQ(report.body().section(u"<body>"_s, 1).section(u"</body>"_s, 0, 0), text) << tags;
     }
 }
 
@@ -103,7 +93,7 @@ TEST_F(Preview, EachPreviewIsKeptInTheFolderOfReports)
     show(720);
     EXPECT_EQ(filesIn(folder).join(u' '), u"1-720.json 1-720.pdf 2-720.json 2-720.pdf"_s);
     const QString text = pdfText(folder + u"/1-720.pdf"_s);
-    EXPECT_TRUE(text.contains(u"Assessment Result"_s) && text.contains(u"KQ1"_s)) << text.toStdString();
+    EXPECT_TRUE(text.contains(u"Assessment Result"_s) && text.contains(u"KQ1"_s)) << text;
     EXPECT_TRUE(pdfText(folder + u"/2-720.pdf"_s).contains(u"sample"_s)) << "the template's own saved rows";
     EXPECT_EQ(QJsonDocument::fromJson(files::readBytes(folder + u"/1-720.json"_s)).object(), windows()[0]);
     EXPECT_TRUE(QJsonDocument::fromJson(files::readBytes(folder + u"/2-720.json"_s))[u"table"].isNull());
@@ -234,5 +224,3 @@ TEST_F(Preview, ThePrintButtonAsksForAPrinterAndPrintsWhatWasChosen)
         EXPECT_EQ(text.count(u'\f'), only ? 1 : 5);
     }
 }
-
-}  // namespace kest::test

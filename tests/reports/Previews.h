@@ -1,17 +1,9 @@
 // Sets the report templates of a test's shop, and reads the reports that were shown.
 #pragma once
 
-#include "support/Places.h"
 #include "support/Shop.h"
 
-#include <QFile>
-#include <QJsonArray>
-#include <QJsonObject>
-#include <QProcess>
-
 namespace kest::test {
-
-using namespace Qt::StringLiterals;
 
 class Previews : public Shop {
 protected:

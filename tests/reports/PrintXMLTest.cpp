@@ -4,10 +4,6 @@
 #include "reports/Previews.h"
 #include "reports/PrintXML.h"
 
-#include <QRegularExpression>
-
-namespace kest::test {
-
 namespace {
 
 class Printing : public Previews {
@@ -44,14 +40,14 @@ TEST_F(Printing, ARequestShowsOneRowForEachImage)
     const QString page = pdfText(root() + u"/out/1-710.pdf"_s);
     for (const QString& text : {u"Quote request QR1"_s, u"Mr Alex Tarrant"_s, u"Reversed into a bollard"_s,
                                 u"Rear bumper"_s, u"Quote from photographs"_s, u"Bumper & grille, L/H"_s})
-        EXPECT_TRUE(page.contains(text)) << text.toStdString();
+        EXPECT_TRUE(page.contains(text)) << text;
     const QJsonObject window = onlyWindow();
     EXPECT_EQ(window[u"report"].toInt(), 710);
     EXPECT_EQ(window[u"parameters"].toObject(), (QJsonObject{{u"Comp"_s, u""_s}}));
     ASSERT_EQ(window[u"table"][u"rows"].toArray().size(), 3);
     for (int row = 0; row < 3; ++row)
         for (const auto& [field, value] : casesIn<2>("reports/request.txt"))
-            EXPECT_EQ(cells(window, row, field), value.toStdString()) << field.toStdString();
+            EXPECT_EQ(cells(window, row, field), value.toStdString()) << field;
     EXPECT_EQ(cells(window, 0, "image_id image_desc"), "1|Bumper & grille, L/H");
     EXPECT_EQ(cells(window, 1, "image_id image_desc") + cells(window, 2, "image_id image_desc"), "2|3|");
 }
@@ -61,7 +57,7 @@ TEST_F(Printing, ValuesOfARequestAreMadeFromWhatTheMessageHolds)
     quote("500").request("QR1");
     for (const auto& [elements, fields, expected] : casesIn<3>("reports/request-values.txt")) {
         print(quoteRequest("QR1").with(elements));
-        EXPECT_EQ(cells(onlyWindow(), 0, fields), expected.toStdString()) << elements.toStdString();
+        EXPECT_EQ(cells(onlyWindow(), 0, fields), expected.toStdString()) << elements;
     }
 }
 
@@ -95,8 +91,8 @@ TEST_F(Printing, EachTypeHasItsReportOrNone)
     EXPECT_EQ(shownReports() + shown(), "");
     for (const auto& [message, reports, box] : casesIn<3>("reports/reports.txt")) {
         print(Message::told(message));
-        EXPECT_EQ(shownReports(), reports.toStdString()) << message.toStdString();
-        EXPECT_EQ(shown(), box.toStdString()) << message.toStdString();
+        EXPECT_EQ(shownReports(), reports.toStdString()) << message;
+        EXPECT_EQ(shown(), box.toStdString()) << message;
     }
     print(adjustedQuote("500").without("assessmentComment"));
     EXPECT_EQ(shown().substr(0, 67), "[none] An error 91 has occured, Please contact MarlinDesk Support\r\n");
@@ -161,12 +157,10 @@ TEST_F(Printing, EachChangedLineStandsInItsSection)
         static const QRegularExpression script(u"(Labour|Parts|Paint|Sublet) (deleted|other|unknown|bare|kept)"_s);
         const auto found = script.match(line);
         count += found.hasMatch() ? 1 : 0;
-        EXPECT_TRUE(!found.hasMatch() || found.captured(1) == section) << line.toStdString();
+        EXPECT_TRUE(!found.hasMatch() || found.captured(1) == section) << line;
     }
     EXPECT_EQ(count, 8);
     const QString unchanged = pdfText(root() + u"/out/2-730.pdf"_s);
     EXPECT_TRUE(unchanged.contains(u"No line of this quote was changed"_s));
     EXPECT_FALSE(unchanged.contains(u"Authorised"_s));
 }
-
-}  // namespace kest::test

@@ -1,6 +1,4 @@
 #include "base/ModRegistry.h"
-#include "platform/RuntimeError.h"
-#include "platform/database/Recordset.h"
 #include "platform/settings/registry.h"
 #include "setup/Profile.h"
 #include "setup/QuoteDatabase.h"
@@ -8,16 +6,8 @@
 #include "support/OdbcDrivers.h"
 #include "support/Shop.h"
 
-#include <QFileInfo>
-#include <QJsonObject>
 #include <QSqlDatabase>
 #include <QSqlQuery>
-
-#include <gtest/gtest.h>
-
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
 
 namespace {
 
@@ -56,7 +46,7 @@ TEST_F(Profile, IsMadeWhole)
     const QJsonObject where = app::where();
     EXPECT_EQ(where.keys().join(u' '), u"component database images log pdf profile read reports sent unread unsent"_s);
     for (const QString& key : where.keys())
-        EXPECT_TRUE(key == u"log"_s || QFileInfo::exists(where[key].toString())) << key.toStdString();
+        EXPECT_TRUE(key == u"log"_s || QFileInfo::exists(where[key].toString())) << key;
     EXPECT_EQ(where[u"unread"_s].toString(), profile.driveC() + u"/wirdoc/AUnread"_s);
 
     // what the first quote request needs
@@ -193,15 +183,13 @@ TEST_F(Profile, LeavesRowsOfOneKeyInTheOrderInWhichTheyWereAdded)
 TEST_F(DemoShop, HoldsTogetherAndItsMessagesAreListedAndLoad)
 {
     for (const QString& rows : linesOf("app/demo-faults.txt"))
-        EXPECT_EQ(rowCount(rows.section(u' ', 0, 0), rows.section(u' ', 2)), 0) << rows.toStdString();
+        EXPECT_EQ(rowCount(rows.section(u' ', 0, 0), rows.section(u' ', 2)), 0) << rows;
     EXPECT_EQ(rowCount("QUOTE1"), 30);
     const QStringList names = listed();
-    EXPECT_EQ(names.size(), 15) << names.join(u' ').toStdString();
+    EXPECT_EQ(names.size(), 15) << names.join(u' ');
     EXPECT_EQ(desktop.boxTexts(),
               QStringList(u"Message QREQ_20554_1.xml unreadable, Please contact MarlinDesk Support."_s));
     for (const QString& file : names)
-        EXPECT_EQ(loadAsTheWindow(file), file != u"MDMSG_1009.xml"_s) << file.toStdString();
+        EXPECT_EQ(loadAsTheWindow(file), file != u"MDMSG_1009.xml"_s) << file;
     EXPECT_EQ(listed(), QStringList(u"QREQ_20551_2.xml"_s)) << "it waited behind the first of its request";
 }
-
-}  // namespace kest::test

@@ -1,17 +1,9 @@
-#include "platform/database/FaultInjection.h"
 #include "platform/settings/registry.h"
 #include "shell/component.h"
 #include "support/Shop.h"
 
-#include <QFileInfo>
-#include <QProcess>
-
-#include <gtest/gtest.h>
-
-namespace kest {
 namespace {
 
-using namespace Qt::StringLiterals;
 using settings::Hive;
 
 class Component : public test::Shop {
@@ -48,7 +40,7 @@ TEST_F(Component, AHostThatCanShowNoWindowsIsRefusedAndLivesOn)
     EXPECT_EQ(host({u"refused"_s, u"core"_s}), u"refused\n"_s);
     for (const auto& [platform, display] :
          {std::pair(u""_s, u""_s), {u""_s, u":7999"_s}, {u"xcb"_s, u":7999"_s}, {u"nosuch"_s, u""_s}})
-        EXPECT_EQ(host({u"refused"_s}, platform, display), u"refused\n"_s) << platform.toStdString();
+        EXPECT_EQ(host({u"refused"_s}, platform, display), u"refused\n"_s) << platform;
 }
 
 TEST_F(Component, AFailureOfAnyKindIsAnsweredAndTheNextCallWorks)
@@ -60,7 +52,7 @@ TEST_F(Component, AFailureOfAnyKindIsAnsweredAndTheNextCallWorks)
     auto* component = static_cast<IeKEST*>(object);
     desktop.emplace(R"json({"windows": {"frmKEST": [[{"click": "cmdExit"}]]}})json");
     std::u16string none = u"0";
-    Text text = none.data();
+    kest::Text text = none.data();
     db::setStatementFault([]() -> bool { throw std::bad_alloc(); });
     EXPECT_EQ(component->ShowKESTWindow(&text, &text), com::OutOfMemory);
     db::setStatementFault({});
@@ -92,4 +84,3 @@ TEST_F(Component, RegistrationEntersTheClassAndTakesItOut)
 }
 
 }  // namespace
-}  // namespace kest

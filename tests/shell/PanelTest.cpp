@@ -1,17 +1,7 @@
-#include "base/SharedVariables.h"
-#include "platform/database/FaultInjection.h"
-#include "platform/files/files.h"
-#include "platform/profile.h"
-#include "shell/eKEST.h"
 #include "support/Shop.h"
 #include "utilities/frmLogin.h"
 
-#include <gtest/gtest.h>
-
-namespace kest {
 namespace {
-
-using namespace Qt::StringLiterals;
 
 class Panel : public test::Shop {
 protected:
@@ -50,9 +40,9 @@ TEST_F(Panel, AConnectionThatWasLostIsOpenedAgainByTheNextClick)
                     password + R"json("}, {"click": "cmdOK"})json");
     db::setStatementFault({});
     const QStringList texts = desktop->boxTexts();
-    ASSERT_EQ(texts.size(), 2) << texts.join(u'\n').toStdString();
-    EXPECT_TRUE(texts[0].contains(u"-2147467259"_s)) << texts[0].toStdString();
-    EXPECT_TRUE(texts[1].contains(u"$0 variations"_s)) << texts[1].toStdString();
+    ASSERT_EQ(texts.size(), 2) << texts.join(u'\n');
+    EXPECT_TRUE(texts[0].contains(u"-2147467259"_s)) << texts[0];
+    EXPECT_TRUE(texts[1].contains(u"$0 variations"_s)) << texts[1];
 }
 
 TEST_F(Panel, WithoutAConnectionItIsNotShown)
@@ -63,9 +53,8 @@ TEST_F(Panel, WithoutAConnectionItIsNotShown)
     ASSERT_EQ(boxes.size(), 1);
     EXPECT_TRUE(boxes[0].startsWith(
         u"critical||Could not connect to the quote database, Please contact MarlinDesk Support."_s));
-    EXPECT_TRUE(boxes[0].contains(u"There is no database"_s)) << boxes[0].toStdString();
+    EXPECT_TRUE(boxes[0].contains(u"There is no database"_s)) << boxes[0];
     EXPECT_TRUE(desktop->record().reads.isEmpty());
 }
 
 }  // namespace
-}  // namespace kest

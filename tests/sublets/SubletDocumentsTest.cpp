@@ -5,15 +5,7 @@
 #include "support/Hands.h"
 #include "support/Shop.h"
 
-#include <QPainter>
 #include <QPdfDocument>
-#include <QPdfWriter>
-
-namespace kest {
-
-using namespace Qt::StringLiterals;
-using test::quote;
-using test::Shop;
 
 namespace {
 
@@ -100,5 +92,3 @@ TEST_F(Sublet, APrintTakesThePagesThatWereChosen)
         EXPECT_EQ(printed.pageCount(), only ? 1 : 2);
     }
 }
-
-}  // namespace kest

@@ -3,21 +3,19 @@
 #pragma once
 
 #include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 #include "messagelist/Summary.h"
-#include "platform/files/files.h"
+#include "platform/database/FaultInjection.h"
+#include "platform/database/Recordset.h"
+#include "platform/database/Sql.h"
+#include "platform/files/FaultInjection.h"
 #include "shell/eKEST.h"
-#include "support/Cases.h"
 #include "support/Messages.h"
 #include "support/Row.h"
 #include "support/ScriptedDesktop.h"
-#include "support/TestProfile.h"
-
-#include <QStringList>
-#include <QUrl>
-
-#include <gtest/gtest.h>
-
-#include <optional>
+#include "support/ShopDatabase.h"
+#include "support/Snapshot.h"
+#include "support/Test.h"
 
 namespace kest::test {
 

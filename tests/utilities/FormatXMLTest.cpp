@@ -1,13 +1,7 @@
 // Tests the text of the viewer: each kind of node, the two repairs, and files that are not messages.
-#include "platform/files/files.h"
-#include "support/Cases.h"
 #include "support/ScriptedDesktop.h"
-#include "support/TestProfile.h"
+#include "support/Test.h"
 #include "utilities/FormatXML.h"
-
-namespace kest {
-
-using namespace Qt::StringLiterals;
 
 TEST(FormatXML, GivesEachElementItsLineAndRepairsTheTwoKnownFaults)
 {
@@ -17,14 +11,12 @@ TEST(FormatXML, GivesEachElementItsLineAndRepairsTheTwoKnownFaults)
     QStringList boxes;
     for (const QStringList& row : test::rowsIn("format-xml.txt")) {
         files::writeBytes(file, row[0].toLatin1());
-        EXPECT_EQ(FormatXML(file), row[1]) << row[0].toStdString();
+        EXPECT_EQ(FormatXML(file), row[1]) << row[0];
         if (row[1].isEmpty())
             boxes.append(u"critical||Error loading XML - Corrupt file?|ok"_s);
-        EXPECT_EQ(desk.boxes(), boxes) << row[0].toStdString();
+        EXPECT_EQ(desk.boxes(), boxes) << row[0];
     }
     files::remove(file);
     EXPECT_EQ(FormatXML(file), QString());
     EXPECT_EQ(desk.boxes().size(), boxes.size() + 1);
 }
-
-}  // namespace kest

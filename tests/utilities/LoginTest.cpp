@@ -1,17 +1,8 @@
 // Tests the password dialog: what it accepts, what it says, and the colours of its field.
-#include "support/Cases.h"
 #include "support/Hands.h"
 #include "support/ScriptedDesktop.h"
-#include "support/TestProfile.h"
+#include "support/Test.h"
 #include "utilities/frmLogin.h"
-
-#include <QLineEdit>
-#include <QPushButton>
-
-namespace kest {
-
-using namespace Qt::StringLiterals;
-using test::control;
 
 TEST(Login, OnlyTheDaysNumberPassesAndOnlyAWrongNumberIsRemarkedOn)
 {
@@ -24,8 +15,8 @@ TEST(Login, OnlyTheDaysNumberPassesAndOnlyAWrongNumberIsRemarkedOn)
         const test::ScriptedDesktop desk(script.toUtf8());
         bool passed = passes.isEmpty();
         frmLogin::ShowForm(passed);
-        EXPECT_EQ(passed, !passes.isEmpty()) << script.toStdString();
-        EXPECT_EQ(desk.boxes().join(u'\n'), box) << script.toStdString();
+        EXPECT_EQ(passed, !passes.isEmpty()) << script;
+        EXPECT_EQ(desk.boxes().join(u'\n'), box) << script;
     }
 }
 
@@ -51,5 +42,3 @@ TEST(Login, TheControlsTellWhereOneStands)
     bool passed = false;
     frmLogin::ShowForm(passed);
 }
-
-}  // namespace kest

@@ -1,22 +1,7 @@
 // Tests the utilities window: what it shows, what its buttons change, and what a save stores.
-#include "base/SharedVariables.h"
-#include "base/modDBAccess.h"
-#include "support/Cases.h"
 #include "support/Hands.h"
 #include "support/Shop.h"
 #include "utilities/frmUtilities.h"
-
-#include <QLineEdit>
-#include <QPlainTextEdit>
-#include <QPushButton>
-#include <QTabBar>
-
-namespace kest {
-
-using namespace Qt::StringLiterals;
-using test::control;
-using test::quote;
-using test::Shop;
 
 namespace {
 
@@ -168,9 +153,9 @@ TEST_F(Utilities, AStatusButtonRewritesTickNumberAndNotes)
         row.quoteNumber("KQ1").authorised("KA1").stage(4).locked(state.startsWith(u"0"_s));
         row.remarks(QString(whole).replace(u'(', u'(' + old));
         work("{\"click\": \"" + button.toStdString() + "\"}, " + save, subquote);
-        EXPECT_EQ(QString::fromStdString(row.notes()).remove(old), notes) << button.toStdString() << subquote.toInt();
-        EXPECT_EQ(row.text("ReadOnly") + ' ' + row.text("KESTQuoteNo"), state.toStdString()) << button.toStdString();
-        EXPECT_EQ(row.text("KESTAuthNo") + ' ' + row.text("Job_stage"), "KA1 4") << button.toStdString();
+        EXPECT_EQ(QString::fromStdString(row.notes()).remove(old), notes) << button << subquote.toInt();
+        EXPECT_EQ(row.text("ReadOnly") + ' ' + row.text("KESTQuoteNo"), state.toStdString()) << button;
+        EXPECT_EQ(row.text("KESTAuthNo") + ' ' + row.text("Job_stage"), "KA1 4") << button;
     }
 }
 
@@ -197,5 +182,3 @@ TEST_F(Utilities, ASaveThatFailsIsReportedAndTheWindowStays)
         EXPECT_EQ(quote("500").text("KESTQuoteNo") + '|' + quote("500").notes(), stored) << meanwhile;
     }
 }
-
-}  // namespace kest

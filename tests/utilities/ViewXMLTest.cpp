@@ -1,20 +1,10 @@
 // Tests the text viewer: what a save writes, what prevents it, and closing with unsaved changes.
 #include "base/SharedVariables.h"
-#include "platform/files/files.h"
 #include "support/ScriptedDesktop.h"
-#include "support/TestProfile.h"
+#include "support/Test.h"
 #include "utilities/ExactTextEdit.h"
 #include "utilities/frmLogin.h"
 #include "utilities/frmViewXML.h"
-
-#include <QClipboard>
-#include <QGuiApplication>
-
-namespace kest {
-
-using namespace Qt::StringLiterals;
-using test::ScriptedDesktop;
-using test::TestProfile;
 
 namespace {
 
@@ -50,7 +40,7 @@ protected:
 };
 
 const std::string save = R"({"click": "Command2"})";
-const std::string read = R"(, {"read": "txtXML"})";
+const std::string readText = R"(, {"read": "txtXML"})";
 const QString overwrite = u"Are you sure you want to OVERWRITE this message?"_s;
 const QString leave = u"Are you sure you want to exit without saving this message?"_s;
 
@@ -78,10 +68,10 @@ TEST_F(Viewer, ASaveWritesTheTextWithoutTheWrapperAndWithTheCharactersThemselves
 
 TEST_F(Viewer, NothingIsWrittenWithoutThePasswordOrTheYes)
 {
-    EXPECT_EQ(view("<a>1</a>", save + read, R"({"text": "OVERWRITE", "answer": "no"})"), QStringList(overwrite));
+    EXPECT_EQ(view("<a>1</a>", save + readText, R"({"text": "OVERWRITE", "answer": "no"})"), QStringList(overwrite));
     EXPECT_EQ(written(), "<a>1</a>");
     EXPECT_EQ(shown, u"<a>1</a>\r\n"_s);
-    EXPECT_EQ(view("<a>1</a>", save + read, {}, "1"), QStringList(u"Invalid Password, try again!"_s));
+    EXPECT_EQ(view("<a>1</a>", save + readText, {}, "1"), QStringList(u"Invalid Password, try again!"_s));
     EXPECT_EQ(written(), "<a>1</a>");
 }
 
@@ -120,7 +110,7 @@ TEST(ExactText, ComesBackAsItWasGivenAndAsItWasEdited)
     for (const QString& text : {QString(), u"\r\n"_s, u"a\r\nb\nc\rd\r\n\r\n\n"_s, u"a\u00a0b\u2029c\ufdd0d\u2028e"_s,
                                 longLine + u"\r\n\t"_s + longLine + u'\n'}) {
         edit.setExactText(text);
-        EXPECT_TRUE(edit.exactText() == text) << text.left(40).toStdString();
+        EXPECT_TRUE(edit.exactText() == text) << text.left(40);
     }
 
     // replaces the text between two positions, in the editor and in the text itself
@@ -152,5 +142,3 @@ TEST(ExactText, ComesBackAsItWasGivenAndAsItWasEdited)
     QCoreApplication::sendEvent(&edit, &key);
     EXPECT_EQ(edit.exactText(), u"1\r\n2\r\n"_s) << "no line ends but the usual ones are put in";
 }
-
-}  // namespace kest

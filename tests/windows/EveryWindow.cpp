@@ -4,31 +4,16 @@
 #include "loopback/TransportWindow.h"
 #include "messagelist/frmMessageList.h"
 #include "outbound/frmExtraInfo.h"
-#include "platform/files/files.h"
 #include "platform/script/Gestures.h"
 #include "reports/frmPrintPreview.h"
 #include "sublets/frmSubletAuth.h"
 #include "sublets/frmViewPDF.h"
 #include "support/Hands.h"
-#include "support/Places.h"
 #include "utilities/frmLogin.h"
 #include "utilities/frmUtilities.h"
 #include "utilities/frmViewXML.h"
 
-#include <QAbstractButton>
-#include <QAbstractItemView>
-#include <QComboBox>
-#include <QLineEdit>
-#include <QPainter>
-#include <QPdfWriter>
-#include <QPlainTextEdit>
-#include <QScrollBar>
-#include <QTabBar>
-#include <QTimer>
-
 namespace kest::test {
-
-using namespace Qt::StringLiterals;
 
 namespace {
 

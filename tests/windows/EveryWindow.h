@@ -3,10 +3,6 @@
 
 #include "support/Shop.h"
 
-#include <QDialog>
-
-#include <functional>
-
 namespace kest::test {
 
 class EveryWindow : public Shop {

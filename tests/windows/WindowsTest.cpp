@@ -3,28 +3,8 @@
 #include "platform/script/Gestures.h"
 #include "windows/EveryWindow.h"
 
-#include <QAbstractButton>
-#include <QAccessible>
-#include <QAction>
-#include <QApplication>
-#include <QCheckBox>
-#include <QComboBox>
-#include <QGroupBox>
-#include <QHeaderView>
-#include <QLabel>
-#include <QLineEdit>
-#include <QMessageBox>
-#include <QPlainTextEdit>
-#include <QPushButton>
-#include <QRadioButton>
-#include <QTabBar>
-#include <QToolButton>
-#include <QTreeView>
-
-namespace kest::test {
 namespace {
 
-using namespace Qt::StringLiterals;
 namespace gestures = desktop::gestures;
 
 // --- Keys ---
@@ -85,7 +65,7 @@ TEST_F(EveryWindow, HasEachAccessKeyOnce)
             const QString key = widget->isVisible() ? accessKeyOf(*widget).toString() : QString();
             if (key.isEmpty())
                 continue;
-            EXPECT_FALSE(owners.contains(key)) << key.toStdString() << ": " << nameOf(*widget);
+            EXPECT_FALSE(owners.contains(key)) << key << ": " << nameOf(*widget);
             owners.insert(key, widget);
         }
         for (const QWidget* control : controlsOf(window)) {
@@ -199,8 +179,7 @@ TEST_F(EveryWindow, TellsNameAndRoleOfEveryControl)
             QAccessibleInterface* heard = QAccessible::queryAccessibleInterface(control);
             ASSERT_TRUE(heard) << nameOf(*control);
             const QString name = heard->text(QAccessible::Name).trimmed();
-            EXPECT_FALSE(name.isEmpty() || names.contains(name))
-                << nameOf(*control) << " is called " << name.toStdString();
+            EXPECT_FALSE(name.isEmpty() || names.contains(name)) << nameOf(*control) << " is called " << name;
             names.append(name);
             EXPECT_TRUE(heard->role() != QAccessible::Client || isA<QAbstractScrollArea>(*control)) << nameOf(*control);
         }
@@ -209,4 +188,3 @@ TEST_F(EveryWindow, TellsNameAndRoleOfEveryControl)
 }
 
 }  // namespace
-}  // namespace kest::test
