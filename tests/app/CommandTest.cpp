@@ -4,8 +4,6 @@
 #include "shell/component.h"
 #include "support/Test.h"
 
-namespace {
-
 struct Ended {
     int exitCode;
     QString errors;
@@ -13,8 +11,7 @@ struct Ended {
 };
 
 /// Runs the command as a service person would, in a demo shop.
-class Command : public ::testing::Test {
-protected:
+struct Command : ::testing::Test {
     Command() { app::initProfile(registerClass, true); }
 
     Ended kest2(const QString& words, const QByteArray& script = {}, const QByteArray& input = {}) const
@@ -37,8 +34,6 @@ protected:
 
     TestProfile profile;
 };
-
-}  // namespace
 
 TEST_F(Command, ExitCodeAndErrorsTellWhatBecameOfIt)
 {

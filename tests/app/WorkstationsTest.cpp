@@ -4,10 +4,7 @@
 #include "platform/settings/registry.h"
 #include "support/Shop.h"
 
-namespace {
-
-class Workstations : public Shop {
-protected:
+struct Workstations : Shop {
     /// Creates a second profile that uses the database and drive C: of the first.
     Workstations()
     {
@@ -41,8 +38,6 @@ protected:
 private:
     const QString second_ = root() + u"/second"_s;
 };
-
-}  // namespace
 
 TEST_F(Workstations, AMessageThatBothLoadIsLoadedOnce)
 {

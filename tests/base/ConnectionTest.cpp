@@ -2,9 +2,7 @@
 #include "base/modLoggerEx.h"
 #include "support/Shop.h"
 
-namespace {
-
-void setSetting(const QString& key, const QString& value, const QString& section = u"wirra32\\frmsplash"_s)
+static void setSetting(const QString& key, const QString& value, const QString& section = u"wirra32\\frmsplash"_s)
 {
     RegCreateSubKey(settings::Hive::LocalMachine, u"SOFTWARE\\"_s + section);
     ASSERT_TRUE(RegSetValue(settings::Hive::LocalMachine, u"SOFTWARE\\"_s + section, key, value));
@@ -82,5 +80,3 @@ TEST_F(ShopConnection, AMissingDatabaseIsTold)
     EXPECT_FALSE(OpenRecordset(u"SELECT * FROM CINFO"_s, false, true));
     EXPECT_TRUE(desktop->boxTexts().value(0).startsWith(u"-2147467259: Could not Initialize Database! - "_s));
 }
-
-}  // namespace

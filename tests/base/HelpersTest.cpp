@@ -3,9 +3,7 @@
 #include "support/Test.h"
 #include "support/TimeZone.h"
 
-namespace {
-
-QString result(const QString& routine, const QStringList& arguments)
+static QString result(const QString& routine, const QStringList& arguments)
 {
     const QString text = arguments[0];
     const QString second = arguments.value(1);
@@ -24,8 +22,6 @@ QString result(const QString& routine, const QStringList& arguments)
                                                                 {u"FormatNetworkDate"_s, FormatNetworkDate}};
     return others.at(routine)(text);
 }
-
-}  // namespace
 
 TEST(Helpers, ReadAndChangeTextsAsTheTableSays)
 {

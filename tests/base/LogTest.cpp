@@ -2,10 +2,7 @@
 #include "support/ScriptedDesktop.h"
 #include "support/Test.h"
 
-namespace {
-
-class ErrorLog : public ::testing::Test {
-protected:
+struct ErrorLog : ::testing::Test {
     ErrorLog() { files::makeFolder(profile::componentFolder()); }
     static void report(int mode) { LogError(7, u"modX.LoadY"_s, u"94"_s, u"Null here"_s, u"LoadY"_s, mode); }
 
@@ -58,5 +55,3 @@ TEST(QuoteClean, TrimsBlanksAndTurnsDoubleQuotes)
     EXPECT_EQ(QuoteClean(u"  6\" \"bar\"\t "_s), u"6' 'bar'\t"_s);
     EXPECT_EQ(QuoteClean(u"   "_s), u""_s);
 }
-
-}  // namespace

@@ -1,15 +1,12 @@
 #include "base/ModRegistry.h"
 #include "support/Test.h"
 
-namespace {
-
 using settings::Hive;
 using settings::Type;
 
 const QString splash = u"SOFTWARE\\wirra32\\frmsplash"_s;
 
-class Settings : public ::testing::Test {
-protected:
+struct Settings : ::testing::Test {
     static void machineWide(const QString& name, const settings::Value& value)
     {
         ASSERT_TRUE(settings::createKey(Hive::LocalMachine, splash));
@@ -56,5 +53,3 @@ TEST_F(Settings, AValueIsReadAndWrittenByItsType)
     EXPECT_EQ(settings::query(Hive::LocalMachine, splash, u"number"_s), (settings::Value{Type::Number, u"12"_s}));
     EXPECT_EQ(settings::query(Hive::LocalMachine, splash, u"text"_s), (settings::Value{Type::Text, u"12"_s}));
 }
-
-}  // namespace

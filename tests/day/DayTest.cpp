@@ -9,15 +9,13 @@
 #include "support/Snapshot.h"
 #include "support/Test.h"
 
-namespace {
-
 constexpr int backgroundWait = 5000;  // milliseconds
 
 /// What a clerk would look at: quotes with their notes and lines, files, and the jobs in JobLink.
 using Holdings = QMap<QString, QString>;
 
 /// Adds the columns of each row under the value of its first column.
-void addRows(Holdings& all, db::Recordset rows)
+static void addRows(Holdings& all, db::Recordset rows)
 {
     for (; !rows.eof(); rows.moveNext()) {
         QStringList values;
@@ -28,7 +26,7 @@ void addRows(Holdings& all, db::Recordset rows)
     }
 }
 
-Holdings found(const MariaDbServer& server)
+static Holdings found(const MariaDbServer& server)
 {
     Holdings all;
     addRows(all, opened(u"SELECT QTNNO||'/'||Subquote AS name, Job_stage AS stage, ReadOnly AS locked, "
@@ -58,7 +56,7 @@ Holdings found(const MariaDbServer& server)
     return all;
 }
 
-QStringList changes(const Holdings& before, const Holdings& after)
+static QStringList changes(const Holdings& before, const Holdings& after)
 {
     QStringList lines;
     for (auto was = before.begin(); was != before.end(); ++was)
@@ -71,7 +69,7 @@ QStringList changes(const Holdings& before, const Holdings& after)
 }
 
 /// Returns the boxes with their exact texts, the reports and documents, and the rows of each list that was read.
-QStringList told(const desktop::Record& record)
+static QStringList told(const desktop::Record& record)
 {
     QStringList lines;
     for (const QJsonValue box : record.boxes)
@@ -91,7 +89,7 @@ QStringList told(const desktop::Record& record)
 }
 
 /// Reads the expected lines of each step. In the file they follow a line "== step".
-QMap<QString, QStringList> expectedSteps()
+static QMap<QString, QStringList> expectedSteps()
 {
     QMap<QString, QStringList> steps;
     QString step;
@@ -104,7 +102,7 @@ QMap<QString, QStringList> expectedSteps()
 }
 
 /// Checks that every window and every report has a picture that is not empty.
-void checkPictures(const QDir& pictures)
+static void checkPictures(const QDir& pictures)
 {
     const QStringList windows{u"comparison"_s, u"extra-information"_s, u"login"_s,        u"messages"_s,
                               u"panel"_s,      u"sublet-document"_s,   u"text"_s,         u"transport"_s,
@@ -122,7 +120,7 @@ void checkPictures(const QDir& pictures)
 using Look = std::function<void(const QString& step, const desktop::Record& shown)>;
 
 /// Plays the day in a new shop, calls `look` after each step, and returns what the shop contains at the end.
-std::string played(const MariaDbServer& server, const Look& look)
+static std::string played(const MariaDbServer& server, const Look& look)
 {
     const TestProfile profile;
     const QDir pictures(profile.root() + u"/pictures"_s);
@@ -138,8 +136,6 @@ std::string played(const MariaDbServer& server, const Look& look)
     checkPictures(pictures);
     return holdings();
 }
-
-}  // namespace
 
 TEST(Day, LeavesAfterEachStepWhatItShouldAndTheSameEachTime)
 {

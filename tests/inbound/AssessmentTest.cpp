@@ -3,15 +3,11 @@
 
 using Assessments = Shop;
 
-namespace {
-
-void takeResponse(const Text& file, const Text& number, const Text& status = "Submitted")
+static void takeResponse(const Text& file, const Text& number, const Text& status = "Submitted")
 {
     QString text = submissionResponse(number).set("quoteSubmissionStatus", status).text();
     LoadSubmissionResponse(text, file);
 }
-
-}  // namespace
 
 TEST_F(Assessments, ABackOutUndoesWhatWasDecided)
 {

@@ -2,10 +2,7 @@
 #include "inbound/LoadQuoteBody.h"
 #include "support/Shop.h"
 
-namespace {
-
-class AuthorisedQuotes : public Shop {
-protected:
+struct AuthorisedQuotes : Shop {
     AuthorisedQuotes()
     {
         gbSubletDocumentArrived = false;
@@ -13,7 +10,7 @@ protected:
     }
 };
 
-void putTemplate()
+static void putTemplate()
 {
     const QString name = opened(u"SELECT * FROM ReportDefinition WHERE ReportID=730"_s).text(u"ReportName"_s);
     files::makeFolder(u"c:\\wirra32\\report"_s);
@@ -21,8 +18,6 @@ void putTemplate()
     ASSERT_TRUE(shipped.open(QIODevice::ReadOnly));
     files::writeBytes(u"c:\\wirra32\\report\\"_s + name, shipped.readAll());
 }
-
-}  // namespace
 
 TEST_F(AuthorisedQuotes, TheHeaderIsWritten)
 {

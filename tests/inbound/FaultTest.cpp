@@ -3,13 +3,11 @@
 #include "inbound/modLoadXML.h"
 #include "support/Shop.h"
 
-namespace {
-
 /// A reason why a second load may end differently, and a pattern for such cases. The pattern is searched in "first
 /// load: taken", its boxes, "second load: not taken", its boxes, and all data of the shop.
 using KnownDifference = std::pair<const char*, const char*>;
 
-bool meets(const std::string& account, const char* pattern)
+static bool meets(const std::string& account, const char* pattern)
 {
     const QRegularExpression expression(QString::fromLatin1(pattern), QRegularExpression::DotMatchesEverythingOption);
     return QString::fromStdString(account).contains(expression);
@@ -22,8 +20,7 @@ const KnownDifference isFiledTwice{"the message stood in both folders, and a sec
 const KnownDifference hasNoTotals{"totals that cannot be worked out or stored stay as they are, in silence",
                                   "first load: taken.*QUOTE1 .* TOTAL=0 PRTTOTAL=0 MISTOTAL=0 "};
 
-class DisturbedLoads : public Shop {
-protected:
+struct DisturbedLoads : Shop {
     /// Loads a message while one of its statements or file operations fails, and again without the failure, once for
     /// each of them. Fails for each result that differs and is not a known difference, and for each known difference
     /// that never occurs.
@@ -32,8 +29,7 @@ protected:
                  const std::function<bool(const QString& file)>& load = loadAsTheWindow);
 };
 
-class DisturbedLines : public DisturbedLoads {
-protected:
+struct DisturbedLines : DisturbedLoads {
     DisturbedLines()
     {
         quote("500").request("QR1").stage(3).set("excess", 500).set("contri", 50).note("Responded Quote Request");
@@ -94,8 +90,6 @@ void DisturbedLoads::disturb(const Message& message, const std::vector<KnownDiff
     for (size_t i = 0; i < known.size(); ++i)
         EXPECT_GT(seen[i], 0) << "never comes up: " << known[i].first;
 }
-
-}  // namespace
 
 TEST_F(DisturbedLoads, ARequest)
 {

@@ -2,12 +2,10 @@
 #include "messages/Envelope.h"
 #include "support/Shop.h"
 
-namespace {
-
 const QString leaves = u"//*[not(*)]"_s;
 
 /// Returns the message, and all variants that differ from it in a single element.
-QStringList variantsOf(QString text)
+static QStringList variantsOf(QString text)
 {
     QStringList wrong = linesOf("inbound/hostile-values.txt");
     wrong << QString() << QString(100'000, u'7');  // longer than any column
@@ -32,18 +30,18 @@ QStringList variantsOf(QString text)
 }
 
 /// Removes the mark of a car that a message has changed, which is the only thing that is stored before a refusal.
-std::string withoutCarMark(const std::string& held)
+static std::string withoutCarMark(const std::string& held)
 {
     static const QRegularExpression mark(u"^(CAR REGO=.*) KEST=\\S+"_s, QRegularExpression::MultilineOption);
     return QString::fromStdString(held).replace(mark, u"\\1"_s).toStdString();
 }
 
-QStringList linesAbout(const char* what, const std::string& held)
+static QStringList linesAbout(const char* what, const std::string& held)
 {
     return QString::fromStdString(held).split(u'\n').filter(QRegularExpression(QString::fromLatin1(what)));
 }
 
-QString typeOf(const QString& message)
+static QString typeOf(const QString& message)
 {
     return message.section(u"messageType>"_s, 1, 1);
 }
@@ -95,5 +93,3 @@ INSTANTIATE_TEST_SUITE_P(Messages, Hostile,
                                            assessmentBackout("QR1"),
                                            authorisedQuote("500").labour(1, "C").sublet(2, "I"),
                                            manualQuote("500").part(1, "I").paint(2, "I")));
-
-}  // namespace

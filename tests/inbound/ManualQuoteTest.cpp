@@ -4,18 +4,14 @@
 
 using ManualQuotes = Shop;
 
-namespace {
-
 const auto lineFailure = u"\n[none] Error processing Quote Items, Please contact MarlinDesk Support."_s;
 
 /// Returns the number and subquote of the quote that the last load created or found.
-std::string loadedQuote()
+static std::string loadedQuote()
 {
     const db::Recordset row = opened(u"SELECT * FROM QUOTE1 WHERE KESTQuoteNo='KQ1'"_s);
     return row.eof() ? "none" : (row.text(u"QTNNO"_s) + u'/' + row.text(u"Subquote"_s)).toStdString();
 }
-
-}  // namespace
 
 TEST_F(ManualQuotes, EachIsMatchedByNumberThenByRequestElseNewAndTakesTheNextSubquoteOfItsParent)
 {

@@ -4,11 +4,7 @@
 
 #include <dlfcn.h>
 
-namespace {
-
 int parses = 0;
-
-}  // namespace
 
 /// Replaces the function of the parser.
 extern "C" __attribute__((visibility("default"))) void* xmlCtxtReadIO(void* parser, void* feed, void* close,

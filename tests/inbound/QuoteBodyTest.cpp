@@ -5,10 +5,7 @@
 #include "sublets/SubletDocuments.h"
 #include "support/Shop.h"
 
-namespace {
-
-class QuoteBody : public Shop {
-protected:
+struct QuoteBody : Shop {
     QuoteBody() { gbSubletDocumentArrived = false; }
 
     /// Applies the lines of a message to the quote 500 or another one. Forgets the boxes.
@@ -26,13 +23,13 @@ protected:
     static QStringList documents() { return filesIn(subletFolder()); }
 };
 
-Message body()
+static Message body()
 {
     return authorisedQuote("500");
 }
 
 /// Returns the numbers of all lines in the order in which they were stored.
-std::string numbers(const Text& number = "500")
+static std::string numbers(const Text& number = "500")
 {
     db::Recordset rows = opened(u"SELECT * FROM QUOTE2 WHERE QTNNO='%1' ORDER BY itemid"_s.arg(number));
     QStringList found;
@@ -43,12 +40,10 @@ std::string numbers(const Text& number = "500")
 
 const QString pdf = u"JVBERi0x"_s;  // "%PDF-1"
 
-Message withDocument(int number, const Text& change, const Text& document = pdf)
+static Message withDocument(int number, const Text& change, const Text& document = pdf)
 {
     return body().sublet(number, change, {{"subletAuthorityDocument", document}});
 }
-
-}  // namespace
 
 TEST_F(QuoteBody, ANewLineIsFilledAsItsSectionSays)
 {

@@ -1,10 +1,7 @@
 #include "inbound/NextNumbers.h"
 #include "support/Shop.h"
 
-namespace {
-
-class Requests : public Shop {
-protected:
+struct Requests : Shop {
     static void run(const Text& statement) { gConn->execute(statement); }
     static Row cinfo() { return Row("CINFO", "1=1"); }
     static void insurers(const QString& names)
@@ -14,8 +11,6 @@ protected:
             addRow("INSURER", {{"NAME", name}, {"KEST", 1}, {"M1_RATE", 46}});
     }
 };
-
-}  // namespace
 
 TEST_F(Requests, ARequestBecomesANewQuoteWithCarAndCustomer)
 {

@@ -5,10 +5,7 @@
 #include "support/MariaDbServer.h"
 #include "support/Shop.h"
 
-namespace {
-
-class JobLink : public Shop {
-protected:
+struct JobLink : Shop {
     JobLink()
     {
         mariaDb().createDatabase(u"jobs"_s, files::read(checkoutFile(u"sql/joblink.sql"_s)));
@@ -186,5 +183,3 @@ TEST(Cipher, WhatIsStoredComesBack)
     for (const QString& pair : {u"zz"_s, u"a "_s, u"\ta"_s, u"+a"_s})
         EXPECT_THROW(DecryptText(pair + u"00112233445566"_s), RuntimeError) << pair;
 }
-
-}  // namespace

@@ -1,9 +1,7 @@
 #include "loopback/InsurerRules.h"
 #include "support/Test.h"
 
-namespace {
-
-QString faultsOf(const QString& rules)
+static QString faultsOf(const QString& rules)
 {
     try {
         app::parsedRules(rules);
@@ -12,8 +10,6 @@ QString faultsOf(const QString& rules)
         return error.description();
     }
 }
-
-}  // namespace
 
 TEST(InsurerRules, AFaultIsToldWithItsLine)
 {

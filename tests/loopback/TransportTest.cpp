@@ -3,13 +3,10 @@
 #include "outbound/SendQuote.h"
 #include "support/Shop.h"
 
-namespace {
-
 const QDate today(2008, 3, 21);
 
 /// A shop with a quote that can be sent, and a transport.
-class Loopback : public Shop {
-protected:
+struct Loopback : Shop {
     Loopback()
     {
         desktop.emplace(R"({"boxes":[{"text":"DELETED","answer":"yes"}]})");
@@ -60,8 +57,6 @@ protected:
 
     std::optional<app::Transport> transport;
 };
-
-}  // namespace
 
 TEST_F(Loopback, ASentQuoteIsCarriedAndAnswered)
 {

@@ -3,10 +3,7 @@
 #include "support/Hands.h"
 #include "support/Shop.h"
 
-namespace {
-
-class MessageListWindow : public Shop {
-protected:
+struct MessageListWindow : Shop {
     /// Opens the window, does the steps and closes it.
     void visit(const QStringList& steps, const QString& answers = u"\"boxes\": []"_s)
     {
@@ -41,17 +38,17 @@ protected:
 // Steps of visits.
 const QString readAll = uR"({"read": ["ListView1", "cmdProcess", "cmdPrint", "Frame2", "txtFilter", "lblStatus"]})"_s;
 
-QString click(const char* control)
+static QString click(const char* control)
 {
     return u"{\"click\": \"%1\"}"_s.arg(QLatin1StringView(control));
 }
 
-QString type(const char* control, const char* text)
+static QString type(const char* control, const char* text)
 {
     return u"{\"set\": \"%1\", \"text\": \"%2\"}"_s.arg(QLatin1StringView(control), QLatin1StringView(text));
 }
 
-QString key(const char* control, const QString& names)
+static QString key(const char* control, const QString& names)
 {
     return u"{\"key\": \"%1\", \"keys\": [\"%2\"]}"_s.arg(QLatin1StringView(control),
                                                           QString(names).replace(u" "_s, u"\", \""_s));
@@ -275,5 +272,3 @@ TEST_F(Searched, FilesAreDroppedOrPastedWhileTheUnreadMessagesAreShown)
     EXPECT_EQ(filesIn(root() + u"/stick"_s).size(), 4) << "nothing leaves the place that it comes from";
     EXPECT_TRUE(shown().starts_with("[exclamation] Not taken in:\ne.doc: "));
 }
-
-}  // namespace

@@ -1,9 +1,6 @@
 #include "support/Shop.h"
 
-namespace {
-
-class MessageList : public Shop {
-protected:
+struct MessageList : Shop {
     /// Returns the rows of a fill, one on each line: "file: type|rego|claim|customer|quote|vehicle".
     std::string filled(MessageFolder folder = MessageFolder::Unread)
     {
@@ -182,5 +179,3 @@ TEST_F(MessageList, OneMessageOfARequestIsShownAtATime)
         files::move(gsUnreadPath + name, gsReadPath + name);
     EXPECT_EQ(listedFiles(MessageFolder::Read), "C.xml d.xml e.xml m.xml n.xml");
 }
-
-}  // namespace

@@ -2,8 +2,6 @@
 #include "messagelist/TakeIn.h"
 #include "support/Shop.h"
 
-namespace {
-
 using TakingIn = Shop;
 
 TEST_F(TakingIn, OnlyMessagesAndWhatBelongsToRequestsAreTaken)
@@ -59,5 +57,3 @@ TEST_F(TakingIn, AFileThatLiesThereIsReplacedOnlyAfterYes)
     gsUnreadPath = u"c:\\gone\\"_s;
     EXPECT_EQ(takeInFiles({brought}).refused.size(), 1) << "what can't be copied is refused";
 }
-
-}  // namespace

@@ -2,8 +2,6 @@
 #include "support/Messages.h"
 #include "support/Test.h"
 
-namespace {
-
 const QString xsi = u"xmlns:xsi=\"http://www.w3.org/2001/XMLSchema-instance\" "_s;
 
 TEST(Envelope, ATypeCodeHasItsDisplayNameInAnyCase)
@@ -30,5 +28,3 @@ TEST(Envelope, AmpersandsAreEscapedAsFarAsAParseGoes)
     EXPECT_FALSE(escapeAmpersands(hostile));
     EXPECT_EQ(hostile.size(), xml::Document::maximumBytes / 5 + 1);
 }
-
-}  // namespace

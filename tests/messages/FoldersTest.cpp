@@ -2,10 +2,7 @@
 #include "support/FullDisk.h"
 #include "support/Shop.h"
 
-namespace {
-
-class MessageFolders : public Shop {
-protected:
+struct MessageFolders : Shop {
     /// Moves a message and returns its name in the read folder.
     std::string moved(const Text& message, const Text& arrivedAs = "in.xml")
     {
@@ -108,5 +105,3 @@ TEST_F(MessageFolders, AnOldCopySurvivesAFullDiskAndABadNameIsPassedOver)
     EXPECT_NE(files::read(gsReadPath + u"500.xml"_s), u"old"_s);
     EXPECT_EQ(GetMatchedFileName(u"500"_s), u"500.0_1.xml"_s);
 }
-
-}  // namespace

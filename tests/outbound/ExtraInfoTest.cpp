@@ -3,8 +3,7 @@
 #include "outbound/frmExtraInfo.h"
 #include "platform/Prompt.h"
 
-class ExtraInformation : public Sending {
-protected:
+struct ExtraInformation : Sending {
     /// Shows the dialog for the quote 500 and does these steps, which are JSON with single instead of double quotes.
     void show(const QString& steps)
     {

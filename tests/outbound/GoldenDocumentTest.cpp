@@ -1,13 +1,11 @@
 // Compares complete quote documents with files. The quote lines come from a file of tests/data/outbound, too.
 #include "Sending.h"
 
-namespace {
-
 const QString quoteNamespace = u"http://quote3.webservice.orla.example"_s;
 
 /// Reads a quote document with another parser. Returns a line for each element with its depth, name and text. Leaves
 /// out the version of the software, which changes with each release.
-QStringList readAsXml(const QString& document)
+static QStringList readAsXml(const QString& document)
 {
     QXmlStreamReader reader(document);
     QStringList lines;
@@ -27,10 +25,7 @@ QStringList readAsXml(const QString& document)
     return lines << reader.errorString();
 }
 
-}  // namespace
-
-class GoldenDocument : public Sending {
-protected:
+struct GoldenDocument : Sending {
     /// Adds the lines to the quote, sends it, and compares the total and the document.
     static void sends(const QuoteRow& quote, const std::string& name, double total, const QString& file)
     {

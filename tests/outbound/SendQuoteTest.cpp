@@ -2,15 +2,11 @@
 #include "platform/database/FaultInjection.h"
 #include "platform/files/FaultInjection.h"
 
-namespace {
-
-void empty(std::initializer_list<const char*> tables)
+static void empty(std::initializer_list<const char*> tables)
 {
     for (const char* table : tables)
         gConn->execute(u"DELETE FROM "_s + QLatin1StringView(table));
 }
-
-}  // namespace
 
 TEST_F(Sending, EachRefusalHasItsMessageAndChangesNothing)
 {

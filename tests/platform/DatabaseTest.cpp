@@ -11,10 +11,7 @@
 
 using db::Recordset;
 
-namespace {
-
-class Database : public Databases {
-protected:
+struct Database : Databases {
     ~Database() override { db::setStatementFault({}); }
 
     void insert(const QString& columns, const QString& values) const
@@ -22,8 +19,6 @@ protected:
         connection->execute(u"INSERT INTO LINE (%1) VALUES (%2)"_s.arg(columns, values));
     }
 };
-
-}  // namespace
 
 TEST_P(Database, AComparisonMeansTheSameOnEveryEngine)
 {

@@ -52,11 +52,9 @@ TEST(Seam, AProgramIsStartedUnderItsHostName)
     EXPECT_THROW(desktop::startProgram(u"c:\\missing.exe"_s), RuntimeError);
 }
 
-namespace {
-
 /// Waits until a window of this kind appears and calls `act` with it.
 template <class Window, class Act>
-void whenShown(const Act& act)
+static void whenShown(const Act& act)
 {
     auto* timer = new QTimer(qApp);
     QObject::connect(timer, &QTimer::timeout, timer, [timer, act] {
@@ -74,8 +72,6 @@ struct Person : testing::Test {
     ~Person() override { desktop::useScript(nullptr); }
     TestProfile profile;
 };
-
-}  // namespace
 
 TEST_F(Person, SeesABoxAsItWasMeant)
 {

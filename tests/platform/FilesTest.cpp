@@ -12,12 +12,9 @@
 #include <csignal>
 #include <thread>
 
-namespace {
-
 const QString box = u"c:\\box\\"_s;
 
-class Files : public ::testing::Test {
-protected:
+struct Files : ::testing::Test {
     Files() { QDir().mkpath(onDisk({})); }
 
     QString onDisk(const QString& name) const { return profile.driveC() + u"/box/"_s + name; }
@@ -35,8 +32,6 @@ protected:
 
     test::TestProfile profile;
 };
-
-}  // namespace
 
 TEST_F(Files, PathsNamesPatternsAndBase64AreTakenAsTheTableSays)
 {

@@ -6,10 +6,7 @@
 using db::Kind;
 using db::Recordset;
 
-namespace {
-
-class RecordsetOn : public Databases {
-protected:
+struct RecordsetOn : Databases {
     RecordsetOn() : lines(query(u"SELECT * FROM LINE ORDER BY id"_s)) {}
     ~RecordsetOn() override { db::setStatementFault({}); }
 
@@ -54,8 +51,6 @@ protected:
 };
 
 const QDateTime someDay = columnDate(QDate(2026, 2, 28), QTime(13, 5, 59));
-
-}  // namespace
 
 TEST_P(RecordsetOn, AKindOfColumnHasOneTypeOnEveryEngine)
 {

@@ -5,11 +5,8 @@
 
 using desktop::NeedsAnswer;
 
-namespace {
-
 /// A window with a control of each kind. It records all their events.
-class SampleWindow : public desktop::Form {
-public:
+struct SampleWindow : desktop::Form {
     SampleWindow() : Form(u"frmSample"_s, u"Sample"_s)
     {
         setLayout(new QVBoxLayout);
@@ -89,8 +86,6 @@ struct Steps : testing::Test {
         }
     }
 };
-
-}  // namespace
 
 TEST_F(Steps, AreThoseOfAPersonAndOneThatNobodyCouldTakeEndsTheRun)
 {

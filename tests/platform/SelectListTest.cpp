@@ -4,10 +4,7 @@
 
 using db::Kind;
 
-namespace {
-
-class FixedSchema final : public db::Schema {
-public:
+struct FixedSchema final : db::Schema {
     const db::TableInfo* table(const QString& name) override
     {
         for (const db::TableInfo* info : {&line, &car}) {
@@ -23,7 +20,7 @@ private:
     db::TableInfo car{u"Car"_s, {{u"REGO"_s}, {u"CODE"_s}}, {u"REGO"_s}};
 };
 
-QString told(const std::optional<QList<db::SelectedColumn>>& columns)
+static QString told(const std::optional<QList<db::SelectedColumn>>& columns)
 {
     if (!columns)
         return u"?"_s;
@@ -37,8 +34,6 @@ QString told(const std::optional<QList<db::SelectedColumn>>& columns)
     }
     return words.join(u' ');
 }
-
-}  // namespace
 
 TEST(SelectList, TellsWhereEachColumnCanBeChanged)
 {

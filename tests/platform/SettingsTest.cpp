@@ -8,12 +8,9 @@
 
 using namespace kest::settings;
 
-namespace {
-
 const QString key = u"SOFTWARE\\wirra32\\frmsplash"_s;
 
-class Registry : public ::testing::Test {
-protected:
+struct Registry : ::testing::Test {
     Registry() { createKey(Hive::LocalMachine, key); }
 
     static bool set(const QString& name, const QString& text)
@@ -28,8 +25,6 @@ protected:
 
     test::TestProfile profile;
 };
-
-}  // namespace
 
 TEST_F(Registry, NamesAreFoundInAnyCaseAndKeepTheirSpelling)
 {

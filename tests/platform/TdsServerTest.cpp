@@ -8,8 +8,6 @@
 #include <QSqlQuery>
 #include <QSqlRecord>
 
-namespace {
-
 /// A client that uses only Qt's plugin, the driver manager and the driver.
 class Client {
 public:
@@ -51,8 +49,7 @@ private:
     bool open_ = false;
 };
 
-class StandIn : public ::testing::Test {
-protected:
+struct StandIn : ::testing::Test {
     StandIn()
     {
         tdsServer().createDatabase(
@@ -65,8 +62,6 @@ protected:
     }
     std::optional<Client> client;
 };
-
-}  // namespace
 
 TEST_F(StandIn, NamesNoBaseTable)
 {

@@ -4,9 +4,7 @@
 
 #include <cmath>
 
-namespace {
-
-QString read(const QString& what, const QString& text)
+static QString read(const QString& what, const QString& text)
 {
     if (what == u"number"_s)
         return numberText(toDouble(text));
@@ -18,8 +16,6 @@ QString read(const QString& what, const QString& text)
         return toText(toBool(text));
     return what == u"date"_s ? toText(toDate(text)) : numberText(leadingNumber(text));
 }
-
-}  // namespace
 
 TEST(Values, AreReadFromTheFormsOfTheirKindAndNoOthers)
 {

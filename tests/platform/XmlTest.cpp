@@ -8,9 +8,7 @@
 
 using namespace kest::xml;
 
-namespace {
-
-QString outcome(const QString& text)
+static QString outcome(const QString& text)
 {
     Document document;
     const bool loaded = document.loadXML(text);
@@ -22,7 +20,7 @@ QString outcome(const QString& text)
     return code == BareAmpersand ? u"bare ampersand"_s : code == SecondRoot ? u"second root"_s : u"other"_s;
 }
 
-Document parsed(const QString& text)
+static Document parsed(const QString& text)
 {
     Document document;
     document.setSelectionNamespaces({{u"rootns"_s, u"urn:quote"_s}});
@@ -30,7 +28,7 @@ Document parsed(const QString& text)
     return document;
 }
 
-QString names(const QList<Node>& nodes)
+static QString names(const QList<Node>& nodes)
 {
     QStringList all;
     for (const Node& node : nodes)
@@ -39,7 +37,7 @@ QString names(const QList<Node>& nodes)
 }
 
 /// Returns text pieces with numbers.
-QString numbered(const QString& piece, int count)
+static QString numbered(const QString& piece, int count)
 {
     QString text;
     for (int i = 0; i < count; ++i)
@@ -47,7 +45,7 @@ QString numbered(const QString& piece, int count)
     return text;
 }
 
-QString megabyteOf(const QString& piece)
+static QString megabyteOf(const QString& piece)
 {
     return piece.repeated(1'000'000 / piece.size());
 }
@@ -69,7 +67,7 @@ struct Cost {
 };
 
 /// Returns the most memory that this process has used since the last reset, in megabytes.
-double peakMemory(bool reset)
+static double peakMemory(bool reset)
 {
     if (reset) {
         QFile references(u"/proc/self/clear_refs"_s);
@@ -83,7 +81,7 @@ double peakMemory(bool reset)
 }
 
 /// Returns the memory that a parse uses in addition to the text, in megabytes.
-Cost costOf(const QString& text, const QString& expected)
+static Cost costOf(const QString& text, const QString& expected)
 {
     ::malloc_trim(0);
     const double before = peakMemory(true);
@@ -92,12 +90,10 @@ Cost costOf(const QString& text, const QString& expected)
     return {1000.0 * double(std::clock() - start) / CLOCKS_PER_SEC, peakMemory(false) - before};
 }
 
-QString nested(int depth)
+static QString nested(int depth)
 {
     return u"<a>"_s.repeated(depth) + u"</a>"_s.repeated(depth);
 }
-
-}  // namespace
 
 TEST(XmlErrors, TheBareAmpersandAndTheSecondRootHaveCodesOfTheirOwn)
 {

@@ -4,21 +4,19 @@
 
 using Totals = Shop;
 
-namespace {
-
 /// The header and the lines of the quote 500, as a caller passes them.
 struct Opened {
     db::Recordset header = kest::opened(u"SELECT * FROM QUOTE1 WHERE QTNNO='500'"_s);
     db::Recordset lines = kest::opened(u"SELECT * FROM QUOTE2 WHERE QTNNO='500'"_s);
 };
 
-void calc(void (*routine)(db::Recordset& quote, db::Recordset& lines))
+static void calc(void (*routine)(db::Recordset& quote, db::Recordset& lines))
 {
     Opened opened;
     routine(opened.header, opened.lines);
 }
 
-std::string totals()
+static std::string totals()
 {
     std::string all;
     for (const char* column : {"TOTAL", "RR_TOTAL", "RA_TOTAL", "PAINT_TOTAL", "PRTTOTAL", "MISTOTAL"})
@@ -26,12 +24,10 @@ std::string totals()
     return all;
 }
 
-Row part(QuoteRow quote, int sequence, const Value& quantity, const Value& price)
+static Row part(QuoteRow quote, int sequence, const Value& quantity, const Value& price)
 {
     return quote.line(sequence, "PRT").set("qty", quantity).set("rrhour", price);
 }
-
-}  // namespace
 
 TEST(RoundAmount, RoundsTheBinaryValueHalfAwayFromZeroOrFails)
 {

@@ -4,10 +4,7 @@
 #include "reports/QuoteComparison.h"
 #include "support/Shop.h"
 
-namespace {
-
-class Comparison : public Shop {
-protected:
+struct Comparison : Shop {
     static db::Recordset authorised(const Message& message, bool reprint = false)
     {
         QString text = message.text();
@@ -47,8 +44,6 @@ protected:
         return texts.join(u", "_s).toStdString();
     }
 };
-
-}  // namespace
 
 TEST_F(Comparison, EachLineStandsBesideTheShops)
 {

@@ -10,10 +10,7 @@
 #include "support/FullDisk.h"
 #include "support/Hands.h"
 
-namespace {
-
-class Preview : public Previews {
-protected:
+struct Preview : Previews {
     ~Preview() override { report::setOutputFolder({}); }
 
     static void show(int number, db::Recordset* table = nullptr)
@@ -36,7 +33,7 @@ protected:
     }
 };
 
-report::Report comparisonOf(int lines, const QString& script, const QString& comment = u"A comment"_s)
+static report::Report comparisonOf(int lines, const QString& script, const QString& comment = u"A comment"_s)
 {
     report::Table table{{u"quote_ref"_s, u"quote_type"_s, u"comment"_s, u"action"_s, u"category"_s, u"script"_s}, {}};
     const QString categories[] = {u"RR"_s, u""_s, u"PAIN"_s, u"WHAL"_s};
@@ -47,8 +44,6 @@ report::Report comparisonOf(int lines, const QString& script, const QString& com
     report.setTable(table);
     return report;
 }
-
-}  // namespace
 
 TEST_F(Preview, ATemplateIsFilledByFieldConditionAndRow)
 {

@@ -4,10 +4,7 @@
 #include "reports/Previews.h"
 #include "reports/PrintXML.h"
 
-namespace {
-
-class Printing : public Previews {
-protected:
+struct Printing : Previews {
     static void print(const Text& message, bool reprint = true)
     {
         gsListFolder = gsReadPath;
@@ -21,8 +18,6 @@ protected:
         return all.value(0);
     }
 };
-
-}  // namespace
 
 TEST_F(Printing, ARequestShowsOneRowForEachImage)
 {

@@ -9,12 +9,10 @@
 #include <QSqlDatabase>
 #include <QSqlQuery>
 
-namespace {
-
 const QDate today(2008, 3, 21);
 
 /// Returns the first column of all rows, separated by blanks.
-std::string column(const QString& select)
+static std::string column(const QString& select)
 {
     QStringList texts;
     db::Recordset rows(app::openEmbedded(u"WirSql"_s));
@@ -36,8 +34,6 @@ struct DemoShop : Profile {
     ScriptedDesktop desktop{R"({"boxes":[{"text":"DELETED","answer":"yes"}]})"};
     std::optional<eKEST> host;
 };
-
-}  // namespace
 
 TEST_F(Profile, IsMadeWhole)
 {

@@ -2,12 +2,9 @@
 #include "shell/component.h"
 #include "support/Shop.h"
 
-namespace {
-
 using settings::Hive;
 
-class Component : public test::Shop {
-protected:
+struct Component : test::Shop {
     /// Runs a host program with the profile of this shop and returns what it prints.
     QString host(const QStringList& arguments, const QString& platform = u"offscreen"_s, const QString& display = {})
     {
@@ -82,5 +79,3 @@ TEST_F(Component, RegistrationEntersTheClassAndTakesItOut)
     ASSERT_EQ(DllUnregisterServer(), com::Ok);
     EXPECT_FALSE(settings::keyExists(Hive::ClassesRoot, key));
 }
-
-}  // namespace

@@ -1,10 +1,7 @@
 #include "support/Shop.h"
 #include "utilities/frmLogin.h"
 
-namespace {
-
-class Panel : public test::Shop {
-protected:
+struct Panel : test::Shop {
     /// Shows the panel for a quote, does the steps and returns the boxes.
     QStringList show(const char* quote, const QByteArray& steps)
     {
@@ -56,5 +53,3 @@ TEST_F(Panel, WithoutAConnectionItIsNotShown)
     EXPECT_TRUE(boxes[0].contains(u"There is no database"_s)) << boxes[0];
     EXPECT_TRUE(desktop->record().reads.isEmpty());
 }
-
-}  // namespace

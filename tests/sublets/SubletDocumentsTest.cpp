@@ -7,10 +7,7 @@
 
 #include <QPdfDocument>
 
-namespace {
-
-class Sublet : public Shop {
-protected:
+struct Sublet : Shop {
     static void document(const char* name, const QByteArray& content = "%PDF-1.4")
     {
         files::writeBytes(u"c:\\wirdoc\\PDF\\"_s + QString::fromLatin1(name), content);
@@ -26,8 +23,6 @@ protected:
     }
     QJsonArray windows() const { return desktop->record().windows; }
 };
-
-}  // namespace
 
 TEST_F(Sublet, ADocumentBelongsToTheQuoteWithWhoseNumberItsNameBegins)
 {

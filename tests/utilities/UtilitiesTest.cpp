@@ -3,10 +3,7 @@
 #include "support/Shop.h"
 #include "utilities/frmUtilities.h"
 
-namespace {
-
-class Utilities : public Shop {
-protected:
+struct Utilities : Shop {
     /// Shows the window for the quote 500 and does the steps.
     void work(const std::string& steps, const QString& subquote = u"0"_s)
     {
@@ -36,15 +33,13 @@ protected:
     }
 };
 
-std::string set(const std::string& control, const std::string& text)
+static std::string set(const std::string& control, const std::string& text)
 {
     return "{\"set\": \"" + control + "\", \"text\": \"" + text + "\"}, ";
 }
 
 const std::string save = R"({"click": "Command1"})";
 const std::string readAll = R"({"read": true})";
-
-}  // namespace
 
 TEST_F(Utilities, ShowTheQuoteAndANullAsAnEmptyText)
 {

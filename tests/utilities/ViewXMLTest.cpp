@@ -6,12 +6,9 @@
 #include "utilities/frmLogin.h"
 #include "utilities/frmViewXML.h"
 
-namespace {
-
 const QString file = u"m.xml"_s;
 
-class Viewer : public ::testing::Test {
-protected:
+struct Viewer : ::testing::Test {
     Viewer()
     {
         gsCurFolder = u"c:\\wirdoc\\AUnread\\"_s;
@@ -43,8 +40,6 @@ const std::string save = R"({"click": "Command2"})";
 const std::string readText = R"(, {"read": "txtXML"})";
 const QString overwrite = u"Are you sure you want to OVERWRITE this message?"_s;
 const QString leave = u"Are you sure you want to exit without saving this message?"_s;
-
-}  // namespace
 
 TEST_F(Viewer, ASaveWritesTheTextWithoutTheWrapperAndWithTheCharactersThemselves)
 {

@@ -3,13 +3,11 @@
 #include "platform/script/Gestures.h"
 #include "windows/EveryWindow.h"
 
-namespace {
-
 namespace gestures = desktop::gestures;
 
 // --- Keys ---
 
-QKeySequence accessKeyOf(const QWidget& widget)
+static QKeySequence accessKeyOf(const QWidget& widget)
 {
     if (const auto* button = qobject_cast<const QAbstractButton*>(&widget))
         return button->shortcut();
@@ -19,7 +17,7 @@ QKeySequence accessKeyOf(const QWidget& widget)
 }
 
 /// Returns all controls that Tab reaches, starting with the control that has the focus when the window opens.
-QSet<const QWidget*> tabRound(QDialog& window)
+static QSet<const QWidget*> tabRound(QDialog& window)
 {
     QSet<const QWidget*> met;
     for (int presses = 0; presses < 50; ++presses) {
@@ -36,7 +34,7 @@ QSet<const QWidget*> tabRound(QDialog& window)
 
 /// Returns true if Tab reaches the control. In a group of options, Tab reaches only the selected one, and the arrow
 /// keys the others.
-bool isMet(const QWidget& control, const QSet<const QWidget*>& met)
+static bool isMet(const QWidget& control, const QSet<const QWidget*>& met)
 {
     const auto isFellow = [&](const QWidget* other) {
         return qobject_cast<const QRadioButton*>(other) && other->parent() == control.parent();
@@ -101,13 +99,13 @@ TEST_F(EveryWindow, IsLeftByEscapeAsByItsCloseBoxAndTakesEnterWhereItHasADefault
 
 /// Returns true for widgets whose whole text must be visible: captions and items. Values can be scrolled, so only their
 /// height and their placeholder matter.
-bool hasText(const QWidget& widget)
+static bool hasText(const QWidget& widget)
 {
     const bool hasCaption = isA<QAbstractButton, QLabel>(widget) && !widget.property("text").toString().isEmpty();
     return hasCaption || isA<QComboBox, QGroupBox>(widget);
 }
 
-void expectToFit(const QWidget& widget)
+static void expectToFit(const QWidget& widget)
 {
     QSize needed = widget.minimumSizeHint();
     if (isA<QPushButton>(widget))  // its style requests more space than the caption needs
@@ -186,5 +184,3 @@ TEST_F(EveryWindow, TellsNameAndRoleOfEveryControl)
         EXPECT_FALSE(window.windowTitle().isEmpty());
     });
 }
-
-}  // namespace
