@@ -3,8 +3,6 @@
 #include "setup/QuoteDatabase.h"
 #include "support/OdbcDrivers.h"
 
-namespace {
-
 const auto embeddedSchema =
     uR"(
 CREATE TABLE LINE (id INTEGER PRIMARY KEY AUTOINCREMENT, CODE VARCHAR(20) COLLATE NOCASE, SEQ INTEGER,
@@ -25,8 +23,6 @@ CREATE TABLE LINE (id INT IDENTITY(1,1) NOT NULL PRIMARY KEY, CODE VARCHAR(20), 
     amount FLOAT DEFAULT 0, flag BIT DEFAULT 0, day DATETIME, notes TEXT);
 CREATE TABLE CAR (REGO VARCHAR(20) NOT NULL PRIMARY KEY, owner VARCHAR(30), CODE VARCHAR(20));
 CREATE TABLE Tints (Code VARCHAR(20), Script VARCHAR(30) DEFAULT 'none');)"_s;
-
-}  // namespace
 
 Databases::Databases()
 {

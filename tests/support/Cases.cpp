@@ -1,24 +1,13 @@
 #include "support/Cases.h"
 
-#include "support/Places.h"
-
-#include <QFile>
-#include <QJsonArray>
-#include <QJsonDocument>
-#include <QRegularExpression>
+#include "support/Test.h"
 
 namespace kest::test {
 
-using namespace Qt::StringLiterals;
-
-namespace {
-
-QString unquoted(const QString& text)
+static QString unquoted(const QString& text)
 {
     return text.size() > 1 && text.startsWith(u'"') && text.endsWith(u'"') ? text.sliced(1).chopped(1) : text;
 }
-
-}  // namespace
 
 QByteArray dataFile(const std::string& name)
 {

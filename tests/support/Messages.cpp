@@ -1,27 +1,19 @@
 #include "support/Messages.h"
 
 #include "messages/Envelope.h"
-#include "support/Cases.h"
-
-#include <stdexcept>
+#include "support/Test.h"
 
 namespace kest::test {
 
-using namespace Qt::StringLiterals;
-
-namespace {
-
-QString textOfSample(const QString& name)
+static QString textOfSample(const QString& name)
 {
     return QString::fromUtf8(dataFile("messages/" + name.toStdString() + ".xml"));
 }
 
-QString pathTo(const QString& path)
+static QString pathTo(const QString& path)
 {
     return u"p754:"_s + QString(path).replace(u"/"_s, u"/p754:"_s);
 }
-
-}  // namespace
 
 Fields fieldsIn(const QString& cell)
 {

@@ -1,17 +1,10 @@
 #include "support/OdbcDrivers.h"
 
-#include <QFile>
-#include <QString>
-
-#include <stdexcept>
+#include "support/Test.h"
 
 namespace kest::test {
 
-using namespace Qt::StringLiterals;
-
-namespace {
-
-QString libraryOf(const QString& name)
+static QString libraryOf(const QString& name)
 {
     QString found;
     for (const QString& place : {u"x86_64-linux-gnu/odbc"_s, u"aarch64-linux-gnu/odbc"_s, u"odbc"_s}) {
@@ -21,8 +14,6 @@ QString libraryOf(const QString& name)
     }
     return found;
 }
-
-}  // namespace
 
 OdbcDrivers::OdbcDrivers(Names names)
 {

@@ -3,32 +3,25 @@
 #include "base/modDBAccess.h"
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
-#include "platform/values.h"
-#include "support/Cases.h"
 #include "support/ShopDatabase.h"
+#include "support/Test.h"
 
 namespace kest::test {
 
-using namespace Qt::StringLiterals;
-
-namespace {
-
-QString withoutDate(QString text)
+static QString withoutDate(QString text)
 {
     return text.replace(shortDate(QDate::currentDate()), u"today"_s);
 }
 
-QString selectOf(const QString& table, const QString& condition)
+static QString selectOf(const QString& table, const QString& condition)
 {
     return u"SELECT * FROM %1 WHERE %2"_s.arg(table, condition);
 }
 
-QString keyOf(const QString& number, int subquote)
+static QString keyOf(const QString& number, int subquote)
 {
     return sql("QTNNO='{}' AND Subquote={}", number, subquote);
 }
-
-}  // namespace
 
 QSqlRecord Row::read() const
 {

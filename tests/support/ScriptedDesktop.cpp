@@ -1,18 +1,10 @@
 #include "support/ScriptedDesktop.h"
 
-#include <QJsonDocument>
-
-#include <gtest/gtest.h>
-
-#include <stdexcept>
+#include "support/Test.h"
 
 namespace kest::test {
 
-using namespace Qt::StringLiterals;
-
-namespace {
-
-QJsonObject parsed(const QByteArray& text)
+static QJsonObject parsed(const QByteArray& text)
 {
     QJsonParseError error;
     const QJsonDocument document = QJsonDocument::fromJson(text, &error);
@@ -21,15 +13,13 @@ QJsonObject parsed(const QByteArray& text)
     return document.object();
 }
 
-QStringList texts(const QJsonArray& entries, const QString& key)
+static QStringList texts(const QJsonArray& entries, const QString& key)
 {
     QStringList result;
     for (const QJsonValue entry : entries)
         result.append(entry[key].toString());
     return result;
 }
-
-}  // namespace
 
 ScriptedDesktop::ScriptedDesktop(const QByteArray& json) : script(std::make_shared<desktop::Script>(parsed(json)))
 {

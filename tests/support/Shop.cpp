@@ -2,17 +2,12 @@
 
 #include "inbound/modLoadXML.h"
 #include "messages/Folders.h"
-#include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "support/ShopDatabase.h"
 
 namespace kest::test {
 
-using namespace Qt::StringLiterals;
-
-namespace {
-
-void forgetSharedVariables()
+static void forgetSharedVariables()
 {
     for (QString* text :
          {&gsCurFolder, &gsListFolder, &gsListFilter, &gsMatchedQTNNO, &gsDeletedQTNNO, &gsDeletedSubquote})
@@ -22,7 +17,7 @@ void forgetSharedVariables()
     gbFilterAsked = gbTabletLocal = false;
 }
 
-void addQuote(const QString& number, int subquote)
+static void addQuote(const QString& number, int subquote)
 {
     car("ABC123");
     addRow("QUOTE1", {{"QTNNO", number},
@@ -35,8 +30,6 @@ void addQuote(const QString& number, int subquote)
                       {"contri", 0},
                       {"Job_stage", 1}});
 }
-
-}  // namespace
 
 QuoteRow quote(const Text& number, int subquote)
 {

@@ -3,32 +3,20 @@
 #include "base/ModRegistry.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
-#include "platform/files/files.h"
-#include "platform/profile.h"
-#include "platform/values.h"
 #include "setup/QuoteDatabase.h"
 #include "support/MariaDbServer.h"
 #include "support/TdsServer.h"
+#include "support/Test.h"
 
-#include <QFile>
-#include <QRegularExpression>
 #include <QSqlDatabase>
 #include <QSqlQuery>
 
-#include <gtest/gtest.h>
-
-#include <array>
-
 namespace kest::test {
-
-using namespace Qt::StringLiterals;
-
-namespace {
 
 const auto shopName = u"WirSql"_s;  // the default on every engine
 const auto plainName = u"plain"_s;
 
-void fillShop(db::Connection& database)
+static void fillShop(db::Connection& database)
 {
     app::fillNewShop(database);
     database.execute(
@@ -37,7 +25,7 @@ void fillShop(db::Connection& database)
         u"INSERT INTO ALLMODEL (MODEL_ID, MAKE, MODEL, SCHEDULE) VALUES ('C120', 'CORELLA', 'MERIDIAN GL', '')"_s);
 }
 
-void fill(db::Connection& database, app::Dialect dialect)
+static void fill(db::Connection& database, app::Dialect dialect)
 {
     app::createTables(database, dialect);
     fillShop(database);
@@ -58,14 +46,14 @@ const QByteArray& newShopFile()
 
 enum class Engine { Embedded, MariaDb, Tds };
 
-Engine engine()
+static Engine engine()
 {
     const QString name = qEnvironmentVariable("KEST2_TEST_ENGINE");
     return name == u"mariadb"_s ? Engine::MariaDb : name == u"tds"_s ? Engine::Tds : Engine::Embedded;
 }
 
 /// Returns the script for the tables that a host has on SQL Server.
-QString tdsSchema()
+static QString tdsSchema()
 {
     app::registerResources();
     QFile file(u":/sql/quote-mariadb.sql"_s);
@@ -163,14 +151,12 @@ public:
     }
 };
 
-ServerShop& serverShop()
+static ServerShop& serverShop()
 {
     static const std::unique_ptr<ServerShop> made =
         engine() == Engine::Tds ? std::unique_ptr<ServerShop>(new TdsShop) : std::make_unique<MariaDbShop>();
     return *made;
 }
-
-}  // namespace
 
 void dropConnection()
 {

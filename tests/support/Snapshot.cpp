@@ -3,29 +3,20 @@
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "inbound/modLoadXML.h"
-#include "platform/files/files.h"
-#include "platform/profile.h"
-
-#include <QDir>
-#include <QDirIterator>
-#include <QFile>
+#include "support/Test.h"
 
 namespace kest::test {
-
-using namespace Qt::StringLiterals;
-
-namespace {
 
 constexpr const char* tables[] = {"QUOTE1", "QUOTE2",          "QUOTE3", "CAR",   "CUSTOMER", "INSURER",     "CINFO",
                                   "VENDOR", "ALLMODEL",        "MODEL",  "BODY2", "JOBSTAGE", "KESTColours", "SUBLET",
                                   "DEBTOR", "ReportDefinition"};
 
-QString driveC()
+static QString driveC()
 {
     return profile::root() + u"/drive_c"_s;
 }
 
-QMap<QString, QByteArray> filesOnDisk()
+static QMap<QString, QByteArray> filesOnDisk()
 {
     QMap<QString, QByteArray> found;
     QDirIterator walk(driveC(), QDir::Files | QDir::Hidden, QDirIterator::Subdirectories);
@@ -36,8 +27,6 @@ QMap<QString, QByteArray> filesOnDisk()
     }
     return found;
 }
-
-}  // namespace
 
 std::string holdings()
 {

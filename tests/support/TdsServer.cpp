@@ -2,30 +2,19 @@
 
 #include "platform/database/Connection.h"
 #include "setup/QuoteDatabase.h"
-#include "support/MemoryFolder.h"
 #include "support/OdbcDrivers.h"
-#include "support/Places.h"
-
-#include <QDeadlineTimer>
+#include "support/Test.h"
 
 #include <sys/prctl.h>
 
 #include <csignal>
-#include <memory>
-#include <stdexcept>
 
 namespace kest::test {
 
-using namespace Qt::StringLiterals;
-
-namespace {
-
-std::unique_ptr<TdsServer> shared;
+static std::unique_ptr<TdsServer> shared;
 
 constexpr int startMilliseconds = 30000;
 constexpr int stopMilliseconds = 10000;
-
-}  // namespace
 
 TdsServer::TdsServer() : folder_(memoryFolder(u"tds"_s))
 {
