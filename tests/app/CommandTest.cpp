@@ -35,7 +35,7 @@ struct Command : ::testing::Test {
     TestProfile profile;
 };
 
-TEST_F(Command, ExitCodeAndErrorsTellWhatBecameOfIt)
+TEST_F(Command, TheExitCodeTellsWhatBecameOfIt)
 {
     files::write(u"c:\\wirdoc\\AUnread\\a..xml"_s, u"<a><messageType>NONE</messageType></a>"_s);
     for (const auto& [words, code, line] : casesIn<3>("app/commands.txt")) {
@@ -70,7 +70,7 @@ TEST_F(Command, AFillThatEndedEarlyIsRefusedWithItsReason)
     EXPECT_TRUE(ended.errors.contains(ended.json[u"failure"].toString()));
 }
 
-TEST_F(Command, AListGivesRowsAndTheBoxesThatCameUpAndAFilterAnswersThePromptOrIsTyped)
+TEST_F(Command, AListGivesWhatItsWindowShows)
 {
     const QJsonObject list = kest2(u"list unread"_s).json;
     EXPECT_TRUE(list[u"result"].toBool());
@@ -98,7 +98,7 @@ TEST_F(Command, AnOpenPanelIsDrivenByAScript)
     EXPECT_EQ(kest2(u"open"_s, "{\"windows\": 5}").exitCode, app::Usage);
 }
 
-TEST_F(Command, SettingsAreReadAndWrittenAndNoPasswordInClear)
+TEST_F(Command, NoSettingShowsAPassword)
 {
     EXPECT_EQ(kest2(u"setting set new section key --json"_s).exitCode, app::Done);
     EXPECT_EQ(kest2(u"setting get NEW section KEY"_s).json[u"value"].toString(), u"--json"_s);

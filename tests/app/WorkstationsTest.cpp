@@ -75,7 +75,7 @@ TEST_F(Workstations, TwoRequestsTakeTwoNumbers)
 }
 
 /// Lets the other workstation load a message before the first statement of a send, then before the second, and so on.
-TEST_F(Workstations, ASendAndALoadLoseNothingOfEachOther)
+TEST_F(Workstations, ALoadDuringASendLosesNothing)
 {
     quote("500").request("QR1").note("Active Quote Request").line(1).set("rrhour", 2).set("rr_rate2", 50);
     arrive("m.xml", cancellation("QR1"));

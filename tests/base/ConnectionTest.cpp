@@ -8,7 +8,7 @@ static void setSetting(const QString& key, const QString& value, const QString& 
     ASSERT_TRUE(RegSetValue(settings::Hive::LocalMachine, u"SOFTWARE\\"_s + section, key, value));
 }
 
-TEST(connectionText, NamesDriverServerAndInstance)
+TEST(connectionText, NamesTheServerAsItsDriverExpects)
 {
     gsDatabase = u"WirSql"_s;
     gsSAPwd = u"secret"_s;
@@ -52,7 +52,7 @@ TEST_F(ShopConnection, AnUnknownDriverNumberOnAnOldSystemOpensNothing)
     EXPECT_NE(GetConnection(), nullptr);
 }
 
-TEST_F(ShopConnection, WhyItFailedStandsInTheBoxAndOnceInTheLog)
+TEST_F(ShopConnection, WhyItFailedIsTold)
 {
     setSetting(u"DatabaseName"_s, u"Nowhere"_s);
     gcnDB->close();

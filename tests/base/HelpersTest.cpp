@@ -1,5 +1,6 @@
 // Tests the small routines that read messages.
 #include "base/Helpers.h"
+#include "base/modLoggerEx.h"
 #include "support/Test.h"
 #include "support/TimeZone.h"
 
@@ -15,15 +16,14 @@ static QString result(const QString& routine, const QStringList& arguments)
         return QString::number(SafeVal(text, second));
     if (routine == u"SplitQuoteRef"_s)
         return SplitQuoteRef(text).first + u',' + SplitQuoteRef(text).second;
-    const std::map<QString, QString (*)(const QString&)> others{{u"NormaliseRego"_s, NormaliseRego},
-                                                                {u"NormaliseQuoteRef"_s, NormaliseQuoteRef},
-                                                                {u"AlphaNumericOnly"_s, AlphaNumericOnly},
-                                                                {u"GetExtensionUpper"_s, GetExtensionUpper},
-                                                                {u"FormatNetworkDate"_s, FormatNetworkDate}};
+    const std::map<QString, QString (*)(const QString&)> others{
+        {u"NormaliseRego"_s, NormaliseRego},         {u"NormaliseQuoteRef"_s, NormaliseQuoteRef},
+        {u"AlphaNumericOnly"_s, AlphaNumericOnly},   {u"QuoteClean"_s, QuoteClean},
+        {u"GetExtensionUpper"_s, GetExtensionUpper}, {u"FormatNetworkDate"_s, FormatNetworkDate}};
     return others.at(routine)(text);
 }
 
-TEST(Helpers, ReadAndChangeTextsAsTheTableSays)
+TEST(Helpers, ReadTextsAsTheTableSays)
 {
     const test::TimeZone zone("Australia/Sydney");
     for (const QStringList& row : test::rowsIn("helpers.txt"))

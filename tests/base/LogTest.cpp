@@ -10,7 +10,7 @@ struct ErrorLog : ::testing::Test {
     test::ScriptedDesktop desktop;
 };
 
-TEST_F(ErrorLog, TheModeChoosesBoxAndRecord)
+TEST_F(ErrorLog, TheModeSaysWhereAnErrorIsReported)
 {
     const std::tuple<int, qsizetype, int> cases[] = {
         {2, 0, 0}, {BoxOnly, 1, 0}, {BoxAndFile, 2, 1}, {BoxAndFile, 3, 2}};
@@ -48,10 +48,4 @@ TEST_F(ErrorLog, AnUnwritableFileEndsTheCallersPathAfterTheBox)
     EXPECT_THROW(report(BoxAndFile), RuntimeError);
     ASSERT_EQ(desktop.boxes().size(), 1);
     EXPECT_TRUE(desktop.boxes()[0].contains(u"The error log can't be written: Path not found"_s));
-}
-
-TEST(QuoteClean, TrimsBlanksAndTurnsDoubleQuotes)
-{
-    EXPECT_EQ(QuoteClean(u"  6\" \"bar\"\t "_s), u"6' 'bar'\t"_s);
-    EXPECT_EQ(QuoteClean(u"   "_s), u""_s);
 }

@@ -25,7 +25,7 @@ struct Settings : ::testing::Test {
     test::TestProfile profile;
 };
 
-TEST_F(Settings, AMachineWideValueComesBeforeTheUsersAndTheDefaultWhichTheFirstReadFixes)
+TEST_F(Settings, TheFirstReadFixesAValueForTheMachine)
 {
     EXPECT_EQ(setting(u"default"_s, CopyUp::No), u"default"_s);
     EXPECT_EQ(setting(u""_s), u""_s);
@@ -38,7 +38,7 @@ TEST_F(Settings, AMachineWideValueComesBeforeTheUsersAndTheDefaultWhichTheFirstR
     EXPECT_EQ(setting(u"elsewhere"_s), u"user"_s);
 }
 
-TEST_F(Settings, AValueIsReadAndWrittenByItsType)
+TEST_F(Settings, AValueHasItsType)
 {
     EXPECT_FALSE(store(u"a"_s, u"1"_s)) << "the key must be there";
     machineWide(u"number"_s, {Type::Number, u"0x1A"_s});

@@ -73,7 +73,7 @@ TEST_F(AuthorisedQuotes, ARefusalSaysWhyInThisOrder)
     EXPECT_EQ(car("GONE").number("KEST"), 1);  // stored before the insurer is checked
 }
 
-TEST_F(AuthorisedQuotes, AssessorRegistrationAndExcessComeOverToTheMainQuote)
+TEST_F(AuthorisedQuotes, ValuesOfTheHeaderComeOverToTheMainQuote)
 {
     quote("500", 1).request("QR1").set("excess", 7).set("contri", 8).line(1);
     for (const auto& [elements, before, after] : casesIn<3>("inbound/authorised-columns.txt")) {
@@ -85,7 +85,7 @@ TEST_F(AuthorisedQuotes, AssessorRegistrationAndExcessComeOverToTheMainQuote)
     }
 }
 
-TEST_F(AuthorisedQuotes, LinesMergeAndTotalsFollow)
+TEST_F(AuthorisedQuotes, TotalsFollowTheMergedLines)
 {
     quote("500").line(1).set("rrhour", 2).set("rr_rate2", 38);
     quote("500").line(2, "RA").set("rahour", 1).set("rr_rate2", 50);

@@ -159,7 +159,7 @@ TEST_F(DisturbedLoads, ASubmissionResponse)
     });
 }
 
-TEST_F(DisturbedLines, AnAuthorisationThatChangesAndDeletesLines)
+TEST_F(DisturbedLines, AnAuthorisationThatChangesLines)
 {
     disturb(authorisedQuote("500")
                 .set("excess", "400")

@@ -54,7 +54,7 @@ TEST_F(Dispatcher, AFailingLogAddsNoBox)
     EXPECT_NE(boxes.find("The error log can't be written: Permission denied"), std::string::npos) << boxes;
 }
 
-TEST_F(Dispatcher, ANoticeIsShownAndPutAside)
+TEST_F(Dispatcher, ANoticeIsPutAsideOnceItWasShown)
 {
     EXPECT_FALSE(load(marker("500"), "MDMSG7.xml"));
     EXPECT_FALSE(load(marker("501"), "x.xml"));

@@ -13,7 +13,7 @@ static std::string loadedQuote()
     return row.eof() ? "none" : (row.text(u"QTNNO"_s) + u'/' + row.text(u"Subquote"_s)).toStdString();
 }
 
-TEST_F(ManualQuotes, EachIsMatchedByNumberThenByRequestElseNewAndTakesTheNextSubquoteOfItsParent)
+TEST_F(ManualQuotes, EachHasItsQuoteAsTheTableSays)
 {
     quote("500").rego("abc123 ").request("QR5");
     quote("501").rego("XYZ789").request("QR6");
@@ -35,7 +35,7 @@ TEST_F(ManualQuotes, EachIsMatchedByNumberThenByRequestElseNewAndTakesTheNextSub
     EXPECT_NE(shown().find("modLoadXML.LoadXML"), std::string::npos);
 }
 
-TEST_F(ManualQuotes, TheHeaderIsWrittenAndTheLinesReplaced)
+TEST_F(ManualQuotes, TheQuoteIsReplaced)
 {
     quote("500").request("QR5").set("excess", 500).set("QUOTER", "Pat Ferrier").note("Active Quote Request");
     quote("500").line(7, "PRT");

@@ -154,7 +154,7 @@ TEST_F(QuoteBody, ADocumentIsStoredUnderItsLinesNumber)
     EXPECT_EQ(numbers(), "4");
 }
 
-TEST_F(QuoteBody, ALineWithoutNumberTakesOneAboveLinesAndDocuments)
+TEST_F(QuoteBody, ALineWithoutNumberTakesOneThatIsFree)
 {
     line(2);
     EXPECT_TRUE(apply(withDocument(0, "I")));

@@ -12,7 +12,7 @@ struct Requests : Shop {
     }
 };
 
-TEST_F(Requests, ARequestBecomesANewQuoteWithCarAndCustomer)
+TEST_F(Requests, ARequestBecomesANewQuote)
 {
     ASSERT_TRUE(load(quoteRequest("QR1")));
     EXPECT_EQ(shown(), "");

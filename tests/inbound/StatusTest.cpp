@@ -15,7 +15,7 @@ TEST_F(StatusMessages, EachMovesTheQuoteToItsState)
     }
 }
 
-TEST_F(StatusMessages, AMatchAndARevisionTakeOverWhatTheMessageSays)
+TEST_F(StatusMessages, TheRequestsValuesComeOver)
 {
     quote("500").set("KESTQRVer", "7");
     EXPECT_TRUE(load(quoteMatch("500").request("QR8").claim("8800")));

@@ -56,7 +56,7 @@ struct JobLink : Shop {
     db::ConnectionPtr jobs;
 };
 
-TEST_F(JobLink, TheHeaderHoldsQuoteCarAndPeople)
+TEST_F(JobLink, TheHeaderHoldsWhatTheShopKnows)
 {
     fill(insurer(), "street=1 HIGH ST suburb=RICHMOND 3121 phone=03 1");
     fill(customer("Holloway"), "street=Unit 2\\3 O'Hara's Row suburb=Zoë's Point SALUTATION=");
@@ -105,7 +105,7 @@ TEST_F(JobLink, ALineThatAMarkerPointsAtIsLeftOut)
     EXPECT_EQ(details("lineDescn"), "new");
 }
 
-TEST_F(JobLink, WhatTheHeaderNeedsAndLacksIsTold)
+TEST_F(JobLink, AHeaderThatLacksSomethingIsTold)
 {
     quote("500").set("qtndate", nullptr);
     exportQuote();

@@ -21,7 +21,7 @@ TEST(InsurerRules, AFaultIsToldWithItsLine)
     EXPECT_TRUE(faultsOf(u"on monday"_s).startsWith(u"line 1: an occasion is: on start, on quote"_s));
 }
 
-TEST(InsurerRules, AValueMayHoldBlanksAndACommentEndsTheLine)
+TEST(InsurerRules, ACommentEndsALineUnlessItIsQuoted)
 {
     const app::InsurerRules rules = app::parsedRules(
         u"seed 7 # any\r\n# all of it\n\non quote 1004/1 claim=9\n\trevise reason=\"a # b\" wait=2 # c\n"_s);
@@ -35,7 +35,7 @@ TEST(InsurerRules, AValueMayHoldBlanksAndACommentEndsTheLine)
     EXPECT_EQ(app::parsedStep(rule.steps[0].text).parameters, rule.steps[0].parameters);
 }
 
-TEST(InsurerRules, TheRuleThatNamesTheQuoteGoesBeforeThoseForItsRequestAndForAny)
+TEST(InsurerRules, TheRuleThatNamesTheQuoteGoesFirst)
 {
     const app::InsurerRules rules = app::parsedRules(
         u"on quote *\non request 20\non quote A1\non quote A1\n"

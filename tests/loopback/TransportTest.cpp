@@ -58,7 +58,7 @@ struct Loopback : Shop {
     std::optional<app::Transport> transport;
 };
 
-TEST_F(Loopback, ASentQuoteIsCarriedAndAnswered)
+TEST_F(Loopback, ASentQuoteIsAnswered)
 {
     ASSERT_TRUE(send());
     const QString document = files::read(gsUnsentPath + u"1004.0_1.xml"_s);
@@ -72,7 +72,7 @@ TEST_F(Loopback, ASentQuoteIsCarriedAndAnswered)
     EXPECT_EQ(carried(), "") << "a second carry has nothing to do";
 }
 
-TEST_F(Loopback, OneTransportWorksOnTheFoldersAndADeadOneLocksNobodyOut)
+TEST_F(Loopback, OneLivingTransportWorksOnTheFolders)
 {
     for (const QString& leftOver : {u""_s, u"1\nkest2\nanother-machine\n"_s}) {
         files::write(folders().own + u"KESTWeb.lock"_s, leftOver);
@@ -115,7 +115,7 @@ TEST_F(Loopback, AStepWaitsUntilTheShopHasDealtWithTheOneBefore)
     EXPECT_EQ(carried(), "");
 }
 
-TEST_F(Loopback, AQuoteSentAgainFollowsItsNextRuleAndHasOneAnswer)
+TEST_F(Loopback, AQuoteSentAgainFollowsItsNextRule)
 {
     rules(u"on quote 1004\n  revise\n  adjust\non quote 1004\n  adjust\n"_s);
     ASSERT_TRUE(send());
@@ -129,7 +129,7 @@ TEST_F(Loopback, AQuoteSentAgainFollowsItsNextRuleAndHasOneAnswer)
     EXPECT_EQ(carried(), "in WEB_000002_ADQT_1004.xml") << "what the first rule had left is over";
 }
 
-TEST_F(Loopback, APictureAndItsDocumentGoTogether)
+TEST_F(Loopback, APictureGoesWithItsDocument)
 {
     const QString document = u"<request><kestQuoteNumber>1004/0</kestQuoteNumber></request>"_s;
     files::write(gsUnsentPath + u"I_1004_0001.xml"_s, document);
@@ -142,7 +142,7 @@ TEST_F(Loopback, APictureAndItsDocumentGoTogether)
     EXPECT_EQ(in(gsUnsentPath), "I_1004_0002.jpg");
 }
 
-TEST_F(Loopback, WhatCannotBeSentStaysAndIsToldOnceForEachChange)
+TEST_F(Loopback, WhatCannotBeSentIsToldOnceForEachChange)
 {
     for (const QString& text :
          {u"<quoteBody>"_s, QString(), u"\u0001\u00ff&"_s, sentDocument(""), sentDocument("1004/12"),
@@ -223,7 +223,7 @@ TEST_F(Loopback, TheSameSeedSendsTheSameWhateverComesBetween)
     EXPECT_NE(run(u"seed 20552"_s, false), once);
 }
 
-TEST_F(Loopback, TheWindowShowsWhatIsCarriedAndASecondOneSaysSo)
+TEST_F(Loopback, TheWindowShowsWhatIsCarried)
 {
     desktop.emplace(R"({"windows":{"KESTWeb":[[{"click":"carryButton"}, {"read":["carriedList","status"]},
         {"key":"KESTWeb","keys":"Alt+L"}]]}})");

@@ -64,7 +64,7 @@ TEST_F(MessageListWindow, ALoadedMessageMakesRoomForTheNextOfItsRequest)
               "a.xml: 1 message, b.xml: 1 message, [none] Message Loaded");
 }
 
-TEST_F(MessageListWindow, ARefusedMessageStaysAndTheListIsFilledTwiceMore)
+TEST_F(MessageListWindow, TheListIsFilledTwiceMoreAfterARefusal)
 {
     arrive("a.xml", cancellation("QR1"));
     arrive("b.xml", "");
@@ -142,7 +142,7 @@ TEST_F(MessageListWindow, AMessageIsRemovedOnlyAfterYes)
     EXPECT_EQ(filesIn(gsUnreadPath), QStringList{u"b.xml"_s});
 }
 
-TEST_F(MessageListWindow, ADoubleClickShowsASentMessageAndNoOther)
+TEST_F(MessageListWindow, ADoubleClickShowsOnlyASentMessage)
 {
     arrive("a.xml", quoteRequest("QR1"));
     files::write(gsSentPath + u"s.xml"_s, sentDocument("500"));
@@ -188,7 +188,7 @@ TEST_F(Searched, WhatIsTypedInTheListLeavesTheRowsThatHoldIt)
     }
 }
 
-TEST_F(Searched, OutlivesARefreshAndEndsWithTheFolder)
+TEST_F(Searched, EndsWithTheFolder)
 {
     files::write(gsReadPath + u"r.xml"_s, quoteRequest("QR9").text());
     visit({type("txtFind", "abc"), key("frmMessageList", u"F5"_s), readAll, type("txtFind", "zz"), click("cmdProcess"),
@@ -199,7 +199,7 @@ TEST_F(Searched, OutlivesARefreshAndEndsWithTheFolder)
     EXPECT_EQ(filesIn(gsUnreadPath).size(), 3);
 }
 
-TEST_F(Searched, OrderWidthsAndPlaceOutliveARefreshAndOrderAndWidthsTheWindow)
+TEST_F(Searched, TheOrderOutlivesTheWindow)
 {
     const auto state = [](QTreeView& list) {
         return u"%1 chosen, width %2, order %3 of column %4"_s

@@ -25,7 +25,7 @@ struct MessageList : Shop {
     }
 };
 
-TEST_F(MessageList, AMessageShowsWhatItSaysAndTheCustomerOfItsCar)
+TEST_F(MessageList, AMessageShowsWhatItSays)
 {
     car("ABC123");
     for (const auto& [message, expected] : casesIn<2>("messages/rows.txt")) {
@@ -114,7 +114,7 @@ TEST_F(MessageList, TwoFaultsOfATextAreRepairedInAnyFile)
     EXPECT_EQ(shown(), "");
 }
 
-TEST_F(MessageList, WhatCannotBeReadIsReportedAndTheRestIsListed)
+TEST_F(MessageList, WhatCannotBeReadHidesNothingElse)
 {
     for (const char* name : {"a.XML", "b.xmlx", "c.txt", "dxml", "e\\f.xml", "g..xml"})  // two of them end in "xml"
         QFile(files::systemPath(gsUnreadPath) + u'/' + QString::fromLatin1(name)).open(QIODevice::WriteOnly);

@@ -4,7 +4,7 @@
 
 using TakingIn = Shop;
 
-TEST_F(TakingIn, OnlyMessagesAndWhatBelongsToRequestsAreTaken)
+TEST_F(TakingIn, OnlyWhatTheListKnowsIsTaken)
 {
     quote("500");
     const QMap<QString, QString> contents{

@@ -60,7 +60,7 @@ TEST_F(MessageFolders, ADeletedOrMatchedQuoteNamesTheNextMessageOnce)
     EXPECT_EQ(gsMatchedQTNNO, QString());
 }
 
-TEST_F(MessageFolders, TheRunningNumberCountsTheMessagesOfAQuoteAndSubquote)
+TEST_F(MessageFolders, TheRunningNumberCountsTheMessagesOfAQuote)
 {
     for (const auto& [read, reference, name] : casesIn<3>("messages/running-numbers.txt")) {
         for (const QString& file : read.split(u' '))
@@ -87,7 +87,7 @@ TEST_F(MessageFolders, ARequestTakesThePlaceOfTheEarlierOneOrStaysUnread)
     EXPECT_EQ(filesIn(gsUnreadPath), QStringList{u"in.xml"_s});
 }
 
-TEST_F(MessageFolders, AnOldCopySurvivesAFullDiskAndABadNameIsPassedOver)
+TEST_F(MessageFolders, AnOldCopySurvivesAFullDisk)
 {
     quote("500").request("QR1");
     files::write(gsReadPath + u"500.xml"_s, u"old"_s);

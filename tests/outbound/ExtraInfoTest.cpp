@@ -75,7 +75,7 @@ TEST_F(ExtraInformation, ColoursCompleteThemselves)
     }
 }
 
-TEST_F(ExtraInformation, AMissingRecordIsSaidAndNothingIsShownOrStored)
+TEST_F(ExtraInformation, AMissingRecordStopsIt)
 {
     for (const auto& [statement, message] : casesIn<2>("outbound/missing-records.txt")) {
         quote("500");
@@ -106,7 +106,7 @@ TEST_F(ExtraInformation, TheCarTakesItsNormalFormsOnEverySend)
     }
 }
 
-TEST_F(ExtraInformation, ThePersonOfACustomerIsToldByTitleAndFirstName)
+TEST_F(ExtraInformation, APersonIsToldByTitleOrFirstName)
 {
     for (const auto& [columns, expected] : casesIn<2>("outbound/customers.txt")) {
         sendable().locked(false);

@@ -62,7 +62,7 @@ TEST_F(GoldenDocument, AMainQuoteFromARequest)
     sends(row, "main-from-request", 747.22, u"1201.0_1.xml"_s);
 }
 
-TEST_F(GoldenDocument, AMainQuoteWithAClaimAndTheExtraInformation)
+TEST_F(GoldenDocument, AMainQuoteWithTheExtraInformation)
 {
     desktop.emplace(dataFile("outbound/extra-information.json"));
     car("ABC123").set("PAINT_GP", "m2");

@@ -8,7 +8,7 @@ static void empty(std::initializer_list<const char*> tables)
         gConn->execute(u"DELETE FROM "_s + QLatin1StringView(table));
 }
 
-TEST_F(Sending, EachRefusalHasItsMessageAndChangesNothing)
+TEST_F(Sending, ARefusalChangesNothing)
 {
     for (const auto& [statements, message] : casesIn<2>("outbound/refusals.txt")) {
         QuoteRow row = sendable();
@@ -24,7 +24,7 @@ TEST_F(Sending, EachRefusalHasItsMessageAndChangesNothing)
     }
 }
 
-TEST_F(Sending, AMainQuoteOfARequestIsLockedAndNoted)
+TEST_F(Sending, AMainQuoteOfARequestIsLocked)
 {
     sendable().request("QR1", "2").note("Active Quote Request");
     EXPECT_EQ(send("500"), 110);
@@ -125,7 +125,7 @@ TEST_F(Sending, AQuoteNumberCannotLeaveTheOutgoingFolder)
     EXPECT_EQ(send("5'00"), 110);
 }
 
-TEST_F(Sending, ImagesAreListedAndGoOutWithTheirDocuments)
+TEST_F(Sending, ImagesGoOutWithTheirDocuments)
 {
     for (const char* name : {"500_0012.jpg", "500_0003.JPG", "500_0x.jpg", "500_1001.jpg", "5001_0001.jpg"})
         files::write(gsImagesPath + QLatin1StringView(name), QLatin1StringView(name));

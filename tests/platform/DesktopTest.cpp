@@ -9,7 +9,7 @@
 using desktop::Answer;
 using desktop::Icon;
 
-TEST(Seam, TheScriptAnswersByTheFirstEntryThatFitsAndElseByTheDefault)
+TEST(Seam, TheScriptAnswersByTheFirstEntryThatFits)
 {
     const ScriptedDesktop desk(R"({
         "boxes": [ {"text": "SURE", "answer": "yes"}, {"text": "SURE ?", "answer": "no"}, {"text": "!", "answer": "ok"},
@@ -143,7 +143,7 @@ TEST_F(Person, SeesHowFarAWorkIsOnceItTakesHalfASecond)
     }
 }
 
-TEST_F(Person, FindsEveryWindowAsItWasLeftAndInTheMiddle)
+TEST_F(Person, FindsEveryWindowAsItWasLeft)
 {
     for (const bool again : {false, true}) {
         desktop::Form window(u"frmMessageList"_s, u"KEST Messages"_s);

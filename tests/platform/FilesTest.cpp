@@ -33,7 +33,7 @@ struct Files : ::testing::Test {
     test::TestProfile profile;
 };
 
-TEST_F(Files, PathsNamesPatternsAndBase64AreTakenAsTheTableSays)
+TEST_F(Files, NamesAreTakenAsTheTableSays)
 {
     const auto answer = [&](const QString& question, const QString& text) {
         if (question == u"path"_s)
@@ -108,7 +108,7 @@ TEST_F(Files, FailuresHaveTheirUsualNumbers)
     EXPECT_TRUE(files::folderExists(u"c:\\BOX\\sub\\"_s));
 }
 
-TEST_F(Files, AFullDiskLeavesTheOldFileAndNoHalfOne)
+TEST_F(Files, AFullDiskLeavesTheOldFile)
 {
     files::write(box + u"a.xml"_s, u"old"_s);
     files::write(box + u"big.jpg"_s, QString(5000, u'x'));
@@ -208,7 +208,7 @@ TEST_F(Files, LeftOversOfKilledWritersGoAfterADay)
     files::removeLeftOvers(u"c:\\nowhere"_s);
 }
 
-TEST_F(Files, ADeletionOutlivesItsProcessAndSparesALaterFileOfTheName)
+TEST_F(Files, ADeletionOutlivesItsProcess)
 {
     const QString list = profile::root() + u"/removals.json"_s;
     const QString path = files::systemPath(box + u"held.xml"_s);

@@ -83,7 +83,7 @@ TEST_P(RecordsetOn, AKindOfColumnHasOneTypeOnEveryEngine)
     EXPECT_EQ(failure([&] { lines.value(u"nosuch"_s); }).number(), NoSuchColumn);
 }
 
-TEST_P(RecordsetOn, ANewRowHoldsItsIdentityAndTheDefaultsAtOnce)
+TEST_P(RecordsetOn, ANewRowHoldsItsDefaultsAtOnce)
 {
     add(u"A"_s, 1);
     lines.addNew();
@@ -198,7 +198,7 @@ TEST_P(RecordsetOn, WithoutAKeyAllSelectedColumnsTellTheRow)
     EXPECT_EQ(query(u"SELECT * FROM CAR WHERE owner='Bob'"_s).recordCount(), 1);
 }
 
-TEST_P(RecordsetOn, SearchesGoForwardAndCompareByTheKindOfTheColumn)
+TEST_P(RecordsetOn, SearchesCompareByTheKindOfTheColumn)
 {
     for (const auto& [code, seq] :
          {std::pair(u"red"_s, 1), {u"Blue "_s, 2}, {u"Österreich"_s, 3}, {u"RED"_s, 4}, {u"O'Brien"_s, 0}})
@@ -240,7 +240,7 @@ TEST_P(RecordsetOn, ASearchSeesEveryChangeMadeThroughTheRecordset)
     EXPECT_EQ(found(u"SEQ=3"_s), -1);
 }
 
-TEST_P(RecordsetOn, MovingPastAnEndIsToldOnceAndThenAnError)
+TEST_P(RecordsetOn, MovingPastAnEndTwiceIsAnError)
 {
     EXPECT_TRUE(lines.eof() && lines.bof());
     for (const auto move : {&Recordset::moveFirst, &Recordset::moveLast, &Recordset::moveNext, &Recordset::movePrevious,
@@ -263,7 +263,7 @@ TEST_P(RecordsetOn, MovingPastAnEndIsToldOnceAndThenAnError)
     EXPECT_EQ(count(u"1=1"_s), 0);
 }
 
-TEST_P(RecordsetOn, APendingChangeIsWrittenByAMoveAndForgottenByClose)
+TEST_P(RecordsetOn, APendingChangeIsWrittenByAMove)
 {
     add(u"A"_s, 1);
     add(u"B"_s, 2);
@@ -280,7 +280,7 @@ TEST_P(RecordsetOn, APendingChangeIsWrittenByAMoveAndForgottenByClose)
     EXPECT_EQ(failure([&] { lines.moveFirst(); }).number(), ObjectClosed);
 }
 
-TEST_P(RecordsetOn, AFilterShowsTheRowsThatMatchAndADisconnectedOneLivesOn)
+TEST_P(RecordsetOn, AFilterShowsTheRowsThatMatch)
 {
     for (int i = 1; i <= 6; ++i)
         add(i % 2 ? u"odd"_s : u"even"_s, i);
@@ -301,7 +301,7 @@ TEST_P(RecordsetOn, AFilterShowsTheRowsThatMatchAndADisconnectedOneLivesOn)
 
 INSTANTIATE_TEST_SUITE_P(Engines, RecordsetOn, ::testing::Values(On::Embedded, On::MySql, On::Odbc, On::Tds));
 
-TEST(DeclaredTable, CutsTextsAndCountsItsPendingRow)
+TEST(DeclaredTable, CutsTextsToTheirFields)
 {
     Recordset table;
     table.declare(u"Name"_s, Kind::Text, 5);

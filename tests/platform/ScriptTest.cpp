@@ -87,13 +87,13 @@ struct Steps : testing::Test {
     }
 };
 
-TEST_F(Steps, AreThoseOfAPersonAndOneThatNobodyCouldTakeEndsTheRun)
+TEST_F(Steps, AreThoseOfAPerson)
 {
     for (const QStringList& row : test::rowsIn("script-steps.txt"))
         EXPECT_EQ(run(row[0]), row[1]) << row[0];
 }
 
-TEST_F(Steps, TypeIntoEveryKindOfFieldAndReadWhatTheControlsHave)
+TEST_F(Steps, ReadWhatTheyTyped)
 {
     run(uR"j({"click": "chkReadOnly"}, {"set": "txtDigits", "text": "1x2"}, {"set": "spnCount", "text": "42"},
         {"set": "txtRemarks", "text": "first\r\nsecond (x)"}, {"set": "cmbGear", "text": "Manual"},
@@ -106,7 +106,7 @@ TEST_F(Steps, TypeIntoEveryKindOfFieldAndReadWhatTheControlsHave)
     EXPECT_EQ(desk->read(u"frmSample"_s).toString(), u"Sample"_s);
 }
 
-TEST_F(Steps, ResizeWaitAndPhotograph)
+TEST_F(Steps, PhotographAResizedWindow)
 {
     const QString file = profile.root() + u"/shot.png"_s;
     QElapsedTimer time;
@@ -117,7 +117,7 @@ TEST_F(Steps, ResizeWaitAndPhotograph)
     EXPECT_EQ(QImage(file).size(), window->size());
 }
 
-TEST_F(Steps, OfEachShowingAreAVisitOfTheirOwnAndTheLastServesAllFurtherOnes)
+TEST_F(Steps, OfEachShowingAreAVisitOfTheirOwn)
 {
     SampleWindow sample;
     const ScriptedDesktop visits(

@@ -26,7 +26,7 @@ struct Registry : ::testing::Test {
     test::TestProfile profile;
 };
 
-TEST_F(Registry, NamesAreFoundInAnyCaseAndKeepTheirSpelling)
+TEST_F(Registry, NamesAreFoundInAnyCase)
 {
     set(u"EcomHome"_s, u"1"_s);
     setValue(Hive::LocalMachine, key.toUpper() + u'\\', u"ECOMHOME"_s, {Type::Number, u"2"_s});
@@ -37,7 +37,7 @@ TEST_F(Registry, NamesAreFoundInAnyCaseAndKeepTheirSpelling)
     EXPECT_EQ(query(Hive::LocalMachine, u"\\Software\\\\Wirra32\\FRMSPLASH"_s, u"ecomhome"_s), all[0].value);
 }
 
-TEST_F(Registry, AnyTextSurvivesAsNameAndValueAndInTheUsersArea)
+TEST_F(Registry, AnyTextSurvives)
 {
     for (const QString& text :
          u"| blanks |a=b:c|[x]|;x|@|50%25 %|a\r\nb\tc\n|\u00e9\u20ac\U0001F697|c:\\x\\|x\u0000y|\u0085|\""_s.split(
@@ -94,7 +94,7 @@ TEST_F(Registry, TheFileIsItsOwnersAlone)
     EXPECT_EQ(mode(), 0600U);
 }
 
-TEST_F(Registry, AFileThatIsNoneIsToldAndKept)
+TEST_F(Registry, AFileThatIsNoneIsKept)
 {
     for (const QByteArray& damaged :
          {QByteArray(), QByteArray("\n\n"), QByteArray("<html></html>"), QByteArray("a=text:b\n"),
@@ -112,7 +112,7 @@ TEST_F(Registry, AFileThatIsNoneIsToldAndKept)
     EXPECT_TRUE(createKey(Hive::LocalMachine, u"a"_s)) << "the last key has gone, but not the file";
 }
 
-TEST_F(Registry, WhatCannotBeReadIsEmptyAndIsNotOverwritten)
+TEST_F(Registry, WhatCannotBeReadIsNotOverwritten)
 {
     set(u"a"_s, u"1"_s);
     ::chmod(QFile::encodeName(file()).constData(), 0444);

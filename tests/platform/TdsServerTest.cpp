@@ -73,21 +73,7 @@ TEST_F(StandIn, NamesNoBaseTable)
 TEST_F(StandIn, RefusesAsTheServerDoes)
 {
     client->run(u"INSERT INTO LINE (CODE) VALUES ('a')"_s);
-    const std::pair<QString, QString> cases[] = {{u"SELECT * FROM NOSUCH"_s, u"208"_s},
-                                                 {u"SELECT NOSUCH FROM LINE"_s, u"207"_s},
-                                                 {u"SELECT * FROM LINE WHERE flag=TRUE"_s, u"207"_s},
-                                                 {u"SELECT * FROM LINE LIMIT 1"_s, u"102"_s},
-                                                 {u"SELECT CODE || 'x' FROM LINE"_s, u"102"_s},
-                                                 {u"SELECT * FROM LINE WHERE notes='x'"_s, u"402"_s},
-                                                 {u"SELECT * FROM LINE WHERE SEQ='x'"_s, u"245"_s},
-                                                 {u"SELECT * FROM LINE WHERE day='28/02/2026'"_s, u"241"_s},
-                                                 {u"UPDATE LINE SET SEQ='x'"_s, u"245"_s},
-                                                 {u"UPDATE LINE SET CODE='twenty-one characters'"_s, u"8152"_s},
-                                                 {u"UPDATE LINE SET id=5"_s, u"8102"_s},
-                                                 {u"INSERT INTO LINE (id) VALUES (5)"_s, u"544"_s},
-                                                 {u"INSERT INTO LINE (version) VALUES (5)"_s, u"273"_s},
-                                                 {u"EXEC sp_nosuch"_s, u"2812"_s}};
-    for (const auto& [statement, number] : cases)
+    for (const auto& [number, statement] : casesIn<2>("tds-refusals.txt"))
         EXPECT_EQ(client->run(statement).lastError().nativeErrorCode().section(u';', 0, 0), number) << statement;
     EXPECT_FALSE(Client(u"wrong"_s, tdsServer().connectionText(u"plain"_s).replace(u"Pwd="_s, u"Pwd=x"_s)).isOpen());
     EXPECT_FALSE(Client(u"nowhere"_s, tdsServer().connectionText(u"nosuch"_s)).isOpen());

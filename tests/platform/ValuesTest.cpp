@@ -17,7 +17,7 @@ static QString read(const QString& what, const QString& text)
     return what == u"date"_s ? toText(toDate(text)) : numberText(leadingNumber(text));
 }
 
-TEST(Values, AreReadFromTheFormsOfTheirKindAndNoOthers)
+TEST(Values, AreReadOnlyFromTheFormsOfTheirKind)
 {
     for (const QStringList& row : test::rowsIn("values.txt"))
         for (const QString& text : row.mid(2))

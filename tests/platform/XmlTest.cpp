@@ -95,7 +95,7 @@ static QString nested(int depth)
     return u"<a>"_s.repeated(depth) + u"</a>"_s.repeated(depth);
 }
 
-TEST(XmlErrors, TheBareAmpersandAndTheSecondRootHaveCodesOfTheirOwn)
+TEST(XmlErrors, WhatCanBeRepairedHasItsOwnCode)
 {
     for (const QStringList& row : test::rowsIn("xml-errors.txt"))
         for (const QString& text : row.mid(1))
@@ -133,7 +133,7 @@ TEST(XmlErrors, NoTextOfAMegabyteCostsMuchTimeOrMemory)
     }
 }
 
-TEST(XmlErrors, ElementsHaveALimitAndALargePdfIsTaken)
+TEST(XmlErrors, ElementsHaveALimitThatNoPdfReaches)
 {
     const Cost flood = costOf(u"<a>"_s + u"<a/>"_s.repeated(3'000'000) + u"</a>"_s, u"other"_s);
     const QString large(50'000'000, u'A');
@@ -161,7 +161,7 @@ TEST(XmlErrors, TheReportShowsTheLineOfTheError)
     EXPECT_TRUE(document.parseError().srcText.contains(u"<b></c>"_s));
 }
 
-TEST(XmlNodes, BlankTextIsNoNodeAndOtherTextIsJoinedUntrimmed)
+TEST(XmlNodes, OnlyBlankTextIsNoNode)
 {
     const Document document = parsed(
         u"<?p q?><!-- x --><a>\n <b> x </b> <!-- c -->\t<c>1<d/> <e/>2</c><?p q?><f>  </f><g><![CDATA[<3>]]></g></a>"_s);

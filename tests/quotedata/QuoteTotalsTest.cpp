@@ -118,7 +118,7 @@ TEST_F(Totals, ANullThatMattersLeavesTheQuoteAsItWas)
     EXPECT_EQ(shown(), "");
 }
 
-TEST_F(Totals, RoundingStoresMoneyAndHoursAndTotalsThem)
+TEST_F(Totals, RoundedLinesAreStored)
 {
     Row line = quote("500").line(1, "MIS");
     fill(line, "unitcost=10.456 rahour=1.005 pthour=- rrhour=-2.345 qty=1.234 rr_rate2=3.333 opg_rate=4.444");

@@ -86,7 +86,7 @@ TEST_F(Comparison, TheHeaderIsOnEveryRow)
     EXPECT_EQ(ofAdjusted.columns().size(), 27);
 }
 
-TEST_F(Comparison, ExcessAndContributionStandOnlyWhereTheyDiffer)
+TEST_F(Comparison, AnExcessIsShownOnlyIfItDiffers)
 {
     quote("500").request("QR1").set("excess", 400.0).set("contri", 100.0).line(1);
     quote("500", 1).request("QR1").set("excess", 1.0).set("contri", 1.0);  // only those of the main quote count
@@ -107,7 +107,7 @@ TEST_F(Comparison, ExcessAndContributionStandOnlyWhereTheyDiffer)
     EXPECT_EQ(cells(authorised(authorisedQuote("500").set("customerContribution", "5")), "excess contri"), "0|5");
 }
 
-TEST_F(Comparison, UnchangedLinesHaveNoRowAndDeletedOnesNoneOnAReprint)
+TEST_F(Comparison, OnlyChangedLinesHaveARow)
 {
     quote("500").request("QR1").line(1).set("qty", 1.0);
     quote("500").line(2, "PRT").set("qty", 1.0);
@@ -137,7 +137,7 @@ TEST_F(Comparison, AnAuthorisedQuoteWithoutChangesStillHasARow)
     EXPECT_EQ(adjusted(adjustedQuote("500").labour(1, "N")).recordCount(), 0);
 }
 
-TEST_F(Comparison, ASubletRepairerIsAVendorAndBecomesOneByAMerePrint)
+TEST_F(Comparison, ASubletRepairerBecomesAVendorByAMerePrint)
 {
     quote("500").request("QR1");
     const int known = vendor("Straightline Alignment Pty Ltd").id();
@@ -155,7 +155,7 @@ TEST_F(Comparison, ASubletRepairerIsAVendorAndBecomesOneByAMerePrint)
     EXPECT_EQ(rowCount("VENDOR"), 2);
 }
 
-TEST_F(Comparison, TheQuoteIsThatOfTheReferenceAndTheRequest)
+TEST_F(Comparison, TheReferencedQuoteMustBeOfTheRequest)
 {
     quote("500").request("QR9");
     quote("500", 2).request("QR1");

@@ -45,7 +45,7 @@ static report::Report comparisonOf(int lines, const QString& script, const QStri
     return report;
 }
 
-TEST_F(Preview, ATemplateIsFilledByFieldConditionAndRow)
+TEST_F(Preview, ATemplateIsFilledAsTheTableSays)
 {
     db::Recordset row = table(u"name=A & B amount=1,234.5 text=n/a day=2008-04-11 kind=A none="_s);
     for (const auto& [tags, text] : casesIn<2>("reports/template-tags.txt")) {
@@ -100,7 +100,7 @@ TEST_F(Preview, EachPreviewIsKeptInTheFolderOfReports)
     EXPECT_EQ(shownReports(), "frmPrintPreview720");
 }
 
-TEST_F(Preview, EveryLineStandsOnceOnAPageAndPagesAreCounted)
+TEST_F(Preview, EveryLineStandsOnOnePage)
 {
     const QString pdf = root() + u"/out.pdf"_s;
     for (const int lines : {1, 30, 300}) {
@@ -118,7 +118,7 @@ TEST_F(Preview, EveryLineStandsOnceOnAPageAndPagesAreCounted)
     }
 }
 
-TEST_F(Preview, ARowOfSeveralLinesIsNeverDividedAndALongTextIsWhole)
+TEST_F(Preview, ATextIsWholeHoweverLongItIs)
 {
     const QString pdf = root() + u"/out.pdf"_s;
     const QString word = QString(u"Kühlerfrontblende"_s).repeated(12);
@@ -207,7 +207,7 @@ TEST_F(Preview, TheViewerFillsTheWindowAboveItsButton)
     show(730, &rows);
 }
 
-TEST_F(Preview, ThePrintButtonAsksForAPrinterAndPrintsWhatWasChosen)
+TEST_F(Preview, ThePrintButtonPrintsWhatWasChosen)
 {
     const QString output = root() + u"/printed.pdf"_s;
     db::Recordset rows = table(u"comment="_s + u"word\n"_s.repeated(300));

@@ -173,10 +173,10 @@ TEST_F(Profile, LeavesRowsOfOneKeyInTheOrderInWhichTheyWereAdded)
         {u"SELECT Subquote FROM QUOTE3 WHERE QTNNO='9'"_s, "1 0 1 0"},
     };
     for (const auto& [select, expected] : cases)
-        EXPECT_EQ(column(select), expected) << select.toStdString();
+        EXPECT_EQ(column(select), expected) << select;
 }
 
-TEST_F(DemoShop, HoldsTogetherAndItsMessagesAreListedAndLoad)
+TEST_F(DemoShop, HoldsTogether)
 {
     for (const QString& rows : linesOf("app/demo-faults.txt"))
         EXPECT_EQ(rowCount(rows.section(u' ', 0, 0), rows.section(u' ', 2)), 0) << rows;

@@ -27,12 +27,12 @@ struct Component : test::Shop {
     }
 };
 
-TEST_F(Component, AHostWithoutQtCreatesAndReleasesIt)
+TEST_F(Component, AHostNeedsNoQt)
 {
     EXPECT_EQ(host({u"create"_s}), u"done\n"_s);
 }
 
-TEST_F(Component, AHostThatCanShowNoWindowsIsRefusedAndLivesOn)
+TEST_F(Component, AHostThatCanShowNoWindowsSurvivesItsRefusal)
 {
     EXPECT_EQ(host({u"refused"_s, u"core"_s}), u"refused\n"_s);
     for (const auto& [platform, display] :
@@ -40,7 +40,7 @@ TEST_F(Component, AHostThatCanShowNoWindowsIsRefusedAndLivesOn)
         EXPECT_EQ(host({u"refused"_s}, platform, display), u"refused\n"_s) << platform;
 }
 
-TEST_F(Component, AFailureOfAnyKindIsAnsweredAndTheNextCallWorks)
+TEST_F(Component, TheCallAfterAFailureWorks)
 {
     void* object = nullptr;
     ASSERT_EQ(DllGetClassObject(CLSID_eKEST, com::IID_IClassFactory, &object), com::Ok);
@@ -67,7 +67,7 @@ TEST_F(Component, TheHostsQuoteEnablesTheSend)
     EXPECT_EQ(host({u"show"_s, u"0"_s, u"0"_s}), others.arg(u" disabled"_s));
 }
 
-TEST_F(Component, RegistrationEntersTheClassAndTakesItOut)
+TEST_F(Component, RegistrationCanBeUndone)
 {
     const QString key = u"CLSID\\"_s + com::text(CLSID_eKEST);
     ASSERT_EQ(DllRegisterServer(), com::Ok);

@@ -11,7 +11,7 @@ struct Panel : test::Shop {
     }
 };
 
-TEST_F(Panel, OkAndEnterRunTheChosenOption)
+TEST_F(Panel, EnterRunsTheChosenOptionLikeOk)
 {
     const QStringList noQuote(u"information||No quote is open.|ok"_s);
     const std::pair<const char*, QStringList> cases[] = {

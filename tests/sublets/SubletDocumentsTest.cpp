@@ -37,7 +37,7 @@ TEST_F(Sublet, ADocumentBelongsToTheQuoteWithWhoseNumberItsNameBegins)
     EXPECT_EQ(subletDocumentNumbers({u"500"_s, u"1"_s}), QStringList());
 }
 
-TEST_F(Sublet, TheListShowsLineAndVendorAndLeavesOutWhatHasNoLine)
+TEST_F(Sublet, TheListShowsTheLineOfEachDocument)
 {
     auto row = quote("500");
     row.line(1, "MIS", "Wheel alignment").set("VENDOR", test::vendor("Straight Track").id());

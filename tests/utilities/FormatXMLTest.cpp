@@ -3,7 +3,7 @@
 #include "support/Test.h"
 #include "utilities/FormatXML.h"
 
-TEST(FormatXML, GivesEachElementItsLineAndRepairsTheTwoKnownFaults)
+TEST(FormatXML, GivesEachElementItsLine)
 {
     const test::TestProfile profile;
     const test::ScriptedDesktop desk;

@@ -4,7 +4,7 @@
 #include "support/Test.h"
 #include "utilities/frmLogin.h"
 
-TEST(Login, OnlyTheDaysNumberPassesAndOnlyAWrongNumberIsRemarkedOn)
+TEST(Login, OnlyTheDaysNumberPasses)
 {
     EXPECT_EQ(dayPassword(QDate(2026, 11, 22)), 46348 + 4711);
     const test::TestProfile profile;

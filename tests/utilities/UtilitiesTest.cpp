@@ -41,7 +41,7 @@ static std::string set(const std::string& control, const std::string& text)
 const std::string save = R"({"click": "Command1"})";
 const std::string readAll = R"({"read": true})";
 
-TEST_F(Utilities, ShowTheQuoteAndANullAsAnEmptyText)
+TEST_F(Utilities, ShowTheQuote)
 {
     quote("500", 1).request("QR1", "2").quoteNumber("KQ1").authorised("KA1").note("Won Quote Request");
     quote("500", 1).set("AuthDate", QDate(2008, 3, 21)).stage(4).locked(true);
@@ -85,7 +85,7 @@ TEST_F(Utilities, ATabForEachRowLoadsItUnlessItHasGone)
     EXPECT_EQ(quote("500", 1).text("KESTQuoteNo"), "repaired");
 }
 
-TEST_F(Utilities, OnlySaveStoresWhatWasTypedAndItOpensTheHostsQuoteAnew)
+TEST_F(Utilities, OnlySaveStoresWhatWasTyped)
 {
     quote("500").quoteNumber("HOST");
     quote("500", 1).set("AuthDate", QDate(2008, 3, 21)).remarks("one\r\ntwo\u00a0three");
@@ -137,7 +137,7 @@ TEST_F(Utilities, ARowOfLongTextsThatIsMissingIsMadeWhereThereIsSomethingToStore
     }
 }
 
-TEST_F(Utilities, AStatusButtonRewritesTickNumberAndNotes)
+TEST_F(Utilities, AStatusButtonRewritesTheNotes)
 {
     const QString old = u"01/02/2008 : "_s;
     const QString whole =
@@ -154,7 +154,7 @@ TEST_F(Utilities, AStatusButtonRewritesTickNumberAndNotes)
     }
 }
 
-TEST_F(Utilities, ASaveThatFailsIsReportedAndTheWindowStays)
+TEST_F(Utilities, TheWindowStaysAfterASaveThatFails)
 {
     const std::tuple<const char*, QString, int, std::string> cases[] = {
         {"UPDATE QUOTE1 SET KESTQuoteNo='host' WHERE QTNNO='500'", u""_s, RowChanged, "host|before"},

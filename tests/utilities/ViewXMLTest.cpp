@@ -41,7 +41,7 @@ const std::string readText = R"(, {"read": "txtXML"})";
 const QString overwrite = u"Are you sure you want to OVERWRITE this message?"_s;
 const QString leave = u"Are you sure you want to exit without saving this message?"_s;
 
-TEST_F(Viewer, ASaveWritesTheTextWithoutTheWrapperAndWithTheCharactersThemselves)
+TEST_F(Viewer, ASaveWritesTheTextWithoutTheWrapper)
 {
     const QByteArray longValue(3'000'000, 'Q');  // a base64 document
     struct {
@@ -83,7 +83,7 @@ TEST_F(Viewer, LeavingWithUnsavedTypingIsAskedAbout)
     EXPECT_EQ(written(), "<a/>");
 }
 
-TEST_F(Viewer, AFindGoesRoundTheTextAndIsNoTyping)
+TEST_F(Viewer, AFindGoesRoundTheText)
 {
     const std::tuple<std::string, std::string, QString> cases[] = {
         {"<b>", R"("Return", "Return", "Return")", u"Line 2, column 5"_s},
@@ -98,7 +98,7 @@ TEST_F(Viewer, AFindGoesRoundTheTextAndIsNoTyping)
     }
 }
 
-TEST(ExactText, ComesBackAsItWasGivenAndAsItWasEdited)
+TEST(ExactText, ComesBackToTheCharacter)
 {
     const QString longLine(10'000, u'Q');
     ExactTextEdit edit;

@@ -77,7 +77,7 @@ TEST_F(EveryWindow, HasEachAccessKeyOnce)
     });
 }
 
-TEST_F(EveryWindow, IsLeftByEscapeAsByItsCloseBoxAndTakesEnterWhereItHasADefault)
+TEST_F(EveryWindow, IsLeftByEscapeAsByItsCloseBox)
 {
     const QMap<QString, QString> defaults{
         {u"frmKEST"_s, u"cmdOK"_s}, {u"frmSubletAuth"_s, u"Command1"_s}, {u"frmLogin"_s, u"cmdOK"_s}};
@@ -165,7 +165,7 @@ TEST_F(EveryWindow, ShowsItsTextsWholeAtAnySizeOfTheFont)
 
 // --- Names ---
 
-TEST_F(EveryWindow, TellsNameAndRoleOfEveryControl)
+TEST_F(EveryWindow, NamesEveryControlForAScreenReader)
 {
     each([](QDialog& window) {
         QList<QWidget*> all = controlsOf(window);
