@@ -199,7 +199,7 @@ void AssessedBody::writeTo(const Branch& body) const
 
 AssessedBody sameBody(const QuoteDocument& quote)
 {
-    AssessedBody body{quote.reference(), quote.type, {}};
+    AssessedBody body{quote.key.fullReference(), quote.type, {}};
     std::copy(std::begin(quote.lines), std::end(quote.lines), body.lines);
     return body;
 }

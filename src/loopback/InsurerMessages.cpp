@@ -186,7 +186,7 @@ AssessedBody manualBodyOf(const Step& step, const Matter& matter, Dice& dice)
     const int counts[] = {step.number(u"labour"_s, 2), step.number(u"paint"_s, 1), step.number(u"parts"_s, 1),
                           step.number(u"sublet"_s)};
     const QString reference =
-        matter.quote.isEmpty() ? u"MANQ"_s : matter.quote + u'/' + matter.subquote;  // any word that is not a number
+        matter.quote.number.isEmpty() ? u"MANQ"_s : matter.quote.fullReference();  // any word that is not a number
     return manualBody(reference, step.parameters.value(u"type"_s, u"R"_s), counts, dice);
 }
 
@@ -195,12 +195,12 @@ void writeMarker(const Branch& mail, const Step& step, const Matter& matter)
     mail.add(
         {{"mailtype", always, u"MDMSG"_s},
          {"action", always, step.parameters.value(u"action"_s, u"DELDUPE"_s)},
-         {"qtnno", always, matter.quote},
-         {"subquote", always, matter.subquote},
+         {"qtnno", always, matter.quote.number},
+         {"subquote", always, matter.quote.subquote},
          {"rego", always, matter.rego},
          {"body", always,
           step.parameters.value(u"text"_s, u"Quote %1 was sent twice. The second document was not passed on."_s.arg(
-                                               matter.reference()))}});
+                                               matter.quote.reference()))}});
 }
 
 void write(const Branch& root, const Step& step, const Matter& matter, Dice& dice, const QDate& today)

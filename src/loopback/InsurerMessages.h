@@ -13,8 +13,7 @@ namespace kest::app {
 
 /// What the insurer knows about the quote or request of a message.
 struct Matter {
-    QString quote;
-    QString subquote;
+    QuoteKey quote{{}, {}};  // empty if the message is about a request
     QString request;
     QString version;
     QString claim;
@@ -23,8 +22,6 @@ struct Matter {
     QString network;     // the network's number of the sent quote
     QString authorised;  // the network's number of the authorised or adjusted quote
     QuoteDocument document;
-
-    QString reference() const { return subquote == u"0" ? quote : quote + u'/' + subquote; }
 };
 
 /// Returns the code of a step's message, such as "AUQT" or "MDMSG", or an empty text for an answer to a sent quote.

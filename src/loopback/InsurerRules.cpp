@@ -162,10 +162,11 @@ Rule occasionIn(QStringList words)
             u"an occasion is: on start, on quote NUMBER[/SUBQUOTE], on quote *, on quote */*, on request NUMBER[/SUBQUOTE]"_s);
     rule.occasion = occasion == "quote"_L1 ? Occasion::Quote : Occasion::Request;
     const QString reference = words.takeFirst();
-    const auto named = reference == "*/*"_L1 ? std::pair(u"*"_s, u"*"_s) : quoteNamed(reference);
+    const auto named = reference == "*/*"_L1 ? std::optional<QuoteKey>({u"*"_s, u"*"_s}) : quoteNamed(reference);
     if (!named)
         fail(u"\"%1\" is not NUMBER or NUMBER/SUBQUOTE with a subquote of one digit"_s.arg(reference));
-    std::tie(rule.number, rule.subquote) = *named;
+    rule.number = named->number;
+    rule.subquote = named->subquote;
     if (rule.number == "*"_L1 && rule.occasion == Occasion::Request)
         fail(u"on request takes the number of a request"_s);
     rule.parameters = parametersIn(words, u"on "_s + occasion, {});
@@ -266,7 +267,7 @@ QString Rule::text() const
     return lines.join(u'\n');
 }
 
-const Rule* InsurerRules::ruleFor(const QString& quote, const QString& subquote, const QString& request, int time) const
+const Rule* InsurerRules::ruleFor(const QuoteKey& quote, const QString& request, int time) const
 {
     const auto nth = [&](auto&& fits) {
         const Rule* found = nullptr;
@@ -279,13 +280,13 @@ const Rule* InsurerRules::ruleFor(const QString& quote, const QString& subquote,
         return found;
     };
     const auto same = [](const QString& a, const QString& b) { return a.compare(b, Qt::CaseInsensitive) == 0; };
-    const QString any = subquote == "0"_L1 ? u"0"_s : u"*"_s;
+    const QString any = quote.isMain() ? u"0"_s : u"*"_s;
     if (const Rule* rule = nth([&](const Rule& r) {
-            return r.occasion == Occasion::Quote && same(r.number, quote) && r.subquote == subquote;
+            return r.occasion == Occasion::Quote && same(r.number, quote.number) && r.subquote == quote.subquote;
         }))
         return rule;
     if (const Rule* rule = nth([&](const Rule& r) {
-            return r.occasion == Occasion::Request && same(r.number, request) && r.subquote == subquote;
+            return r.occasion == Occasion::Request && same(r.number, request) && r.subquote == quote.subquote;
         }))
         return rule;
     return nth([&](const Rule& r) { return r.occasion == Occasion::Quote && r.number == "*"_L1 && r.subquote == any; });
@@ -312,13 +313,13 @@ InsurerRules parsedRules(const QString& text)
     return parser.result;
 }
 
-std::optional<std::pair<QString, QString>> quoteNamed(const QString& reference)
+std::optional<QuoteKey> quoteNamed(const QString& reference)
 {
     const QString number = reference.section(u'/', 0, 0);
     const QString subquote = reference.contains(u'/') ? reference.section(u'/', 1) : u"0"_s;
     if (number.isEmpty() || subquote.size() != 1 || !subquote[0].isDigit())
         return {};
-    return std::pair(number, subquote);
+    return QuoteKey{number, subquote};
 }
 
 }  // namespace kest::app

@@ -1,6 +1,8 @@
 // The rules of the loopback transport's insurer, read from a text that a person writes, one step on each line.
 #pragma once
 
+#include "base/QuoteKey.h"
+
 #include <QList>
 #include <QMap>
 #include <QString>
@@ -38,6 +40,8 @@ struct Step {
     int line = 0;  // in the rules, from 1; 0 for a step that is not from the rules
     QString text;  // the line without its comment; parsedStep() returns the same step for it
 
+    /// Returns true if its message says which request the quote answers.
+    bool namesRequest() const { return act == Act::Request || act == Act::Match || act == Act::Manual; }
     /// Returns a parameter as a number, or `otherwise` if the step does not have it.
     int number(const QString& name, int otherwise = 0) const;
 };
@@ -66,7 +70,7 @@ struct InsurerRules {
     /// Returns the rule for a quote's document: one for that quote, or else for its request, or else for any quote. If
     /// several rules are for the same, the n-th applies to the n-th document (`time`, from 0) and the last one to all
     /// further documents. Returns null if there is none.
-    const Rule* ruleFor(const QString& quote, const QString& subquote, const QString& request, int time) const;
+    const Rule* ruleFor(const QuoteKey& quote, const QString& request, int time) const;
 };
 
 /// Returns the rules in a text. Throws TypeMismatch with all errors of the text, one on each line with its line number.
@@ -74,7 +78,7 @@ InsurerRules parsedRules(const QString& text);
 /// Returns the step in a line. Throws TypeMismatch if it is not a step.
 Step parsedStep(const QString& text);
 
-/// Returns the number and subquote of "1004" or "1004/1", or nothing if the subquote is not a single digit.
-std::optional<std::pair<QString, QString>> quoteNamed(const QString& reference);
+/// Returns the quote of "1004" or "1004/1", or nothing if the subquote is not a single digit.
+std::optional<QuoteKey> quoteNamed(const QString& reference);
 
 }  // namespace kest::app

@@ -75,10 +75,10 @@ QuoteDocument quoteDocument(const QString& text)
         throw RuntimeError(TypeMismatch,
                            u"its quote reference \"%1\" is not NUMBER/SUBQUOTE with a subquote of one digit"_s.arg(
                                reference.left(40)));
-    checkNumber(named->first);
+    checkNumber(named->number);
 
     QuoteDocument quote;
-    std::tie(quote.quote, quote.subquote) = *named;
+    quote.key = *named;
     quote.request = document.textOrEmptyOf(u"quoteRequestNumber"_s);
     quote.version = document.textOrEmptyOf(u"quoteRequestVersionNumber"_s);
     quote.claim = document.textOrEmptyOf(u"claimNumber"_s);

@@ -28,8 +28,7 @@ struct BodyLine {
 
 /// What the insurer reads from a quote document.
 struct QuoteDocument {
-    QString quote;
-    QString subquote;
+    QuoteKey key{{}, {}};
     QString request;  // empty if the quote does not answer a request
     QString version;
     QString claim;
@@ -39,7 +38,6 @@ struct QuoteDocument {
     Parameters customer;  // companyName, or title, firstName, surname
     QList<BodyLine> lines[SectionCount];
 
-    QString reference() const { return quote + u'/' + subquote; }
     /// The highest line number, including those of report items.
     int highestLine = 0;
 };

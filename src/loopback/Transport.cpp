@@ -1,9 +1,12 @@
 #include "loopback/Transport.h"
 
 #include "base/Helpers.h"
+#include "messages/Envelope.h"
+#include "messages/MessageTypes.h"
 #include "platform/RuntimeError.h"
 #include "platform/files/files.h"
 #include "platform/xml/xml.h"
+#include "setup/DemoShop.h"
 
 #include <QDateTime>
 #include <QFileInfo>
@@ -35,6 +38,46 @@ QString nameOf(const Dealing& dealing)
     parts.append(dealing.steps.first());
     parts.removeAll({});
     return parts.join(u", "_s);
+}
+
+/// Returns the characters of a number that a file name may contain. Numbers come from documents and rules.
+QString nameable(const QString& text)
+{
+    QString result;
+    for (const QChar c : text.left(20))
+        result += c.isLetterOrNumber() || c == u'-' ? c : u'.';
+    return result;
+}
+
+/// Returns true if the old answer to the quote must be removed first, because the step returns the quote to the shop or
+/// answers it again. At every fill, the component applies all answers in the folder and would lock the quote again.
+bool takesAnswersAway(const Step& step, const Matter& matter)
+{
+    switch (step.act) {
+        case Act::Respond:
+        case Act::Revise:
+        case Act::Delete:
+        case Act::Reinstate:
+        case Act::BackOut:
+            return true;
+        case Act::Reject:
+            return !matter.quote.isMain();  // after a rejection, a main quote is closed
+        default:
+            return false;
+    }
+}
+
+bool concernsWholeRequest(Act act)
+{
+    return act == Act::Revise || act == Act::Reinstate || act == Act::BackOut;
+}
+
+Photograph photographOf(const Matter& matter, int id, Dice& dice)
+{
+    static const std::array colours{QColor(52, 86, 160), QColor(190, 194, 200), QColor(150, 40, 44)};
+    static const std::array views{u"whole side"_s, u"damage from the left"_s, u"damage from above"_s};
+    return {matter.rego + u"  "_s + views[size_t(id - 1) % views.size()],
+            colours[size_t(matter.request.right(1).toInt()) % colours.size()], (10 + dice.below(80)) / 100.0};
 }
 
 }  // namespace
@@ -146,28 +189,23 @@ void Transport::takeQuote(const QString& name)
         save();  // before the document moves: if the program stops in between, the answer must not be lost
     }
     files::move(folders.unsent + name, folders.sent + name);
-    result.carried.append({Carried::Direction::Out, name, u"Quote "_s + NormaliseQuoteRef(quote.reference())});
+    result.carried.append({Carried::Direction::Out, name, u"Quote "_s + quote.key.reference()});
 }
 
 void Transport::begin(const QuoteDocument& quote, const QString& name)
 {
     // the new document replaces the steps that remain for an earlier one of the quote
     known->dealings.removeIf([&](const Dealing& dealing) {
-        return dealing.document.isEmpty() && dealing.facts.value(u"quote"_s) == quote.reference();
+        return dealing.document.isEmpty() && dealing.facts.value(u"quote"_s) == quote.key.fullReference();
     });
 
-    Parameters& memory = known->quotes[quote.reference()];
-    const int time = memory.value(u"documents"_s).toInt() + 1;
-    memory[u"documents"_s] = QString::number(time);
-    if (!quote.request.isEmpty())
-        memory[u"request"_s] = quote.request;
-
-    const QString request = quote.request.isEmpty() ? requestOf(quote.quote) : quote.request;
-    const Rule* rule = rules.ruleFor(quote.quote, quote.subquote, request, time);
+    const int time = known->insurer.documentArrived(quote);
+    const QString request = quote.request.isEmpty() ? requestOf(quote.key.number) : quote.request;
+    const Rule* rule = rules.ruleFor(quote.key, request, time);
     Dealing dealing = rule ? dealingOf(*rule) : Dealing();
     if (dealing.facts.contains(u"claim"_s))
-        memory[u"claim"_s] = dealing.facts[u"claim"_s];
-    dealing.facts[u"quote"_s] = quote.reference();
+        known->insurer.setClaim(quote.key, dealing.facts[u"claim"_s]);
+    dealing.facts[u"quote"_s] = quote.key.fullReference();
     dealing.document = name;
     if (dealing.steps.isEmpty() || parsedStep(dealing.steps.first()).act != Act::Respond)
         dealing.steps.prepend(u"respond wait=0"_s);  // the answer does not wait, even if the rule does
@@ -204,6 +242,144 @@ void Transport::finishMoving()
         if (moved)
             known->moving.removeAll(name);
     }
+}
+
+void Transport::advance(qsizetype index)
+{
+    Dealing dealing = known->dealings[index];
+    if (!dealing.document.isEmpty() && !files::exists(folders.sent + dealing.document))
+        return;  // it has not been sent yet
+    if (!dealing.message.isEmpty() && files::exists(folders.unread + dealing.message))
+        return;  // the shop has not dealt with it
+    dealing.document.clear();
+
+    Step step = parsedStep(dealing.steps.first());
+    Parameters parameters = dealing.facts;
+    parameters.insert(step.parameters);
+    step.parameters = parameters;
+
+    const TransportState before = *known;
+    try {
+        if (dealing.waited++ >= step.number(u"wait"_s)) {
+            perform(step, dealing);
+            dealing.steps.removeFirst();
+            dealing.waited = 0;
+        }
+        known->dealings[index] = dealing;
+        save();
+    } catch (const RuntimeError&) {
+        *known = before;  // so that the next attempt uses the same numbers
+        throw;
+    }
+}
+
+void Transport::perform(const Step& step, Dealing& dealing)
+{
+    InsurerMemory& insurer = known->insurer;
+    Matter matter = insurer.matterOf(step, documents());
+    insurer.complete(step, matter, rules.seed);
+    if (takesAnswersAway(step, matter))
+        removeAnswers(step, matter);
+    if (step.act == Act::Request)
+        putPictures(step, matter);
+    dealing.message = sendMessage(step, matter);
+    insurer.remember(step, matter);
+    if (step.namesRequest())
+        dealing.facts[u"request"_s] = matter.request;
+}
+
+void Transport::put(const QString& name, const QByteArray& bytes, const QString& what)
+{
+    files::writeBytes(files::pathForWriting(folders.unread, name), bytes);
+    result.carried.append({Carried::Direction::In, name, what});
+}
+
+void Transport::putPictures(const Step& step, const Matter& matter)
+{
+    Dice chance = known->insurer.dice(rules.seed);
+    for (int id = 1; id <= step.number(u"pictures"_s); ++id) {
+        const QString stem = matter.request + u'_' + PadZeroLeft(QString::number(id), 3);
+        const Photograph photograph = photographOf(matter, id, chance);
+        put(stem + u".jpg"_s, jpegOf(photograph), u"Picture"_s);
+        put(stem + u".txt"_s, files::toCodePage(photograph.caption), u"Description of a picture"_s);
+    }
+}
+
+/// Sends the message of a step. Returns its file name, or an empty text for an answer, which the shop leaves in the
+/// folder.
+QString Transport::sendMessage(const Step& step, const Matter& matter)
+{
+    Dice chance = known->insurer.dice(rules.seed);
+    const QByteArray bytes = files::toCodePage(messageText(step, matter, chance, today));
+    if (step.act == Act::Respond) {
+        const QString name =
+            u"R_%1_%2_%3.xml"_s.arg(matter.quote.number, matter.quote.subquote, nameable(matter.network));
+        put(name, bytes, u"Answer to quote "_s + matter.quote.reference());
+        return {};
+    }
+    const QString code = messageCode(step.act);
+    const QString about =
+        matter.quote.number.isEmpty() ? u"request "_s + matter.request : u"quote "_s + matter.quote.reference();
+    const QString type = step.act == Act::Marker ? u"Marker"_s : messageTypeName(code);
+    QString name;
+    do {
+        // the list shows them in the order of sending, after messages whose names begin with a type
+        name = u"WEB_%1_%2_%3.xml"_s.arg(++known->insurer.messages, 6, 10, QChar(u'0'))
+                   .arg(code, nameable(about.section(u' ', 1)));
+    } while (files::exists(folders.unread + name) && files::readBytes(folders.unread + name) != bytes);
+    put(name, bytes, type + u", "_s + about);
+    return name;
+}
+
+/// Remembers the network's numbers in answers that this transport has not sent, such as those of a new demo shop.
+void Transport::rememberAnswers()
+{
+    for (const QString& file : files::list(folders.unread, u"R_*.xml"_s)) {
+        const QuoteKey quote = QuoteKey::fromResponseName(file);
+        if (quote.number.isEmpty() || quote.subquote.isEmpty() || known->insurer.knowsNetworkNumber(quote))
+            continue;
+        tried(file, stampOf(folders.unread + file), [&] {
+            QString text = files::read(folders.unread + file);
+            known->insurer.setNetworkNumber(quote, parsedMessage(text).textOf(u"rootns:kestQuoteNumber"_s));
+        });
+    }
+}
+
+void Transport::removeAnswers(const Step& step, const Matter& matter)
+{
+    for (const QString& file : files::list(folders.unread, u"R_*.xml"_s)) {
+        const QuoteKey answered = QuoteKey::fromResponseName(file);
+        if (answered == matter.quote ||
+            (concernsWholeRequest(step.act) && requestOf(answered.number) == matter.request))
+            files::remove(folders.unread + file);
+    }
+}
+
+QString Transport::requestOf(const QString& quoteNumber) const
+{
+    return known->insurer.requestOf(quoteNumber, documents());
+}
+
+InsurerMemory::Documents Transport::documents() const
+{
+    return [this](const QuoteKey& quote) { return newestDocument(quote); };
+}
+
+std::optional<QuoteDocument> Transport::newestDocument(const QuoteKey& quote) const
+{
+    const QString start = quote.filePrefix();
+    QString newest;
+    int highest = -1;
+    for (const QString& file : files::list(folders.sent, u"*.xml"_s)) {
+        const int number = file.sliced(0, file.size() - 4).mid(start.size()).toInt();
+        if (file.startsWith(start, Qt::CaseInsensitive) && number > highest) {
+            highest = number;
+            newest = file;
+        }
+    }
+    if (newest.isEmpty())
+        return {};
+    return quoteDocument(files::read(folders.sent + newest));
 }
 
 }  // namespace kest::app

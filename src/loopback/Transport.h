@@ -1,7 +1,6 @@
 // The loopback transport, which carries files between the message folders and an insurer that follows rules.
 #pragma once
 
-#include "loopback/InsurerMessages.h"
 #include "loopback/InsurerRules.h"
 #include "loopback/TransportState.h"
 
@@ -60,7 +59,6 @@ private:
     void readRules();
     void readState();
     void save();
-    QString draw();
 
     // from the shop
     void takeDocuments();
@@ -74,18 +72,14 @@ private:
     void rememberAnswers();
     void advance(qsizetype index);
     void perform(const Step& step, Dealing& dealing);
-    Matter matterOf(const Step& step) const;
-    void complete(const Step& step, Matter& matter);
-    void remember(const Step& step, const Matter& matter, Dealing& dealing);
     void putPictures(const Step& step, const Matter& matter);
     QString sendMessage(const Step& step, const Matter& matter);
     void removeAnswers(const Step& step, const Matter& matter);
     void put(const QString& name, const QByteArray& bytes, const QString& what);
-    Dice dice() const;
 
-    QStringList answersOf(const QString& quote, const QString& subquote) const;
-    QString requestOf(const QString& quote) const;
-    std::optional<QuoteDocument> newestDocument(const QString& quote, const QString& subquote) const;
+    QString requestOf(const QString& quoteNumber) const;
+    InsurerMemory::Documents documents() const;
+    std::optional<QuoteDocument> newestDocument(const QuoteKey& quote) const;
 
     TransportFolders folders;
     InsurerRules rules;

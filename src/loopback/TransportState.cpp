@@ -75,12 +75,12 @@ TransportState TransportState::parsed(const QByteArray& text)
     if (!document.isObject())
         throw RuntimeError(TypeMismatch, u"it can't be read; delete it to start again"_s);
     TransportState state;
-    state.numbers = document[u"numbers"].toInteger();
-    state.messages = document[u"messages"].toInteger();
+    state.insurer.numbers = document[u"numbers"].toInteger();
+    state.insurer.messages = document[u"messages"].toInteger();
     state.moving = textsOf(document[u"moving"]);
     state.started = textsOf(document[u"started"]);
-    state.quotes = entriesOf(document[u"quotes"]);
-    state.requests = entriesOf(document[u"requests"]);
+    state.insurer.quotes = entriesOf(document[u"quotes"]);
+    state.insurer.requests = entriesOf(document[u"requests"]);
     for (const QJsonValue& dealing : document[u"dealings"].toArray())
         state.dealings.append(dealingOf(dealing));
     return state;
@@ -91,12 +91,12 @@ QByteArray TransportState::text() const
     QJsonArray ahead;
     for (const Dealing& dealing : dealings)
         ahead.append(toJson(dealing));
-    const QJsonObject object{{u"numbers"_s, numbers},
-                             {u"messages"_s, messages},
+    const QJsonObject object{{u"numbers"_s, insurer.numbers},
+                             {u"messages"_s, insurer.messages},
                              {u"moving"_s, QJsonArray::fromStringList(moving)},
                              {u"started"_s, QJsonArray::fromStringList(started)},
-                             {u"quotes"_s, toJson(quotes)},
-                             {u"requests"_s, toJson(requests)},
+                             {u"quotes"_s, toJson(insurer.quotes)},
+                             {u"requests"_s, toJson(insurer.requests)},
                              {u"dealings"_s, ahead}};
     return QJsonDocument(object).toJson();
 }

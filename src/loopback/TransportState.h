@@ -1,10 +1,9 @@
-// What the insurer remembers between two runs of the transport, stored in a file.
+// What the transport and its insurer remember between two runs, stored in a file.
 #pragma once
 
-#include "loopback/InsurerRules.h"
+#include "loopback/InsurerMemory.h"
 
 #include <QList>
-#include <QMap>
 #include <QString>
 #include <QStringList>
 
@@ -22,12 +21,9 @@ struct Dealing {
 
 /// The state of a transport.
 struct TransportState {
-    qint64 numbers = 0;                  // how many numbers were given to quotes, authorities, requests and claims
-    qint64 messages = 0;                 // how many messages were sent
-    QStringList moving;                  // files that are being sent together
-    QStringList started;                 // the texts of the "on start" rules that have begun
-    QMap<QString, Parameters> quotes;    // by "1004/0": documents, network, authorised, request, claim
-    QMap<QString, Parameters> requests;  // by number: claim, rego, vehicle, version
+    InsurerMemory insurer;
+    QStringList moving;   // files that are being sent together
+    QStringList started;  // the texts of the "on start" rules that have begun
     QList<Dealing> dealings;
 
     /// Reads the content of a state file. Throws TypeMismatch if it is not one.

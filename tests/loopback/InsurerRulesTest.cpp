@@ -41,9 +41,9 @@ TEST(InsurerRules, TheRuleThatNamesTheQuoteGoesFirst)
         u"on quote *\non request 20\non quote A1\non quote A1\n"
         "on quote */*\non request 20/1\non request 20\n"_s);
     for (const auto& [quote, subquote, request, time, line] : casesIn<5>("loopback/rule-choice.txt")) {
-        const app::Rule* rule = rules.ruleFor(quote, subquote, request, time.toInt());
+        const app::Rule* rule = rules.ruleFor({quote, subquote}, request, time.toInt());
         ASSERT_NE(rule, nullptr);
         EXPECT_EQ(rule->line, line.toInt()) << quote << '/' << subquote;
     }
-    EXPECT_EQ(app::parsedRules(u"on quote 1"_s).ruleFor(u"2"_s, u"0"_s, {}, 1), nullptr);
+    EXPECT_EQ(app::parsedRules(u"on quote 1"_s).ruleFor({u"2"_s}, {}, 1), nullptr);
 }
