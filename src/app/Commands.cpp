@@ -164,7 +164,7 @@ Outcome setting(const QStringList& arguments)
     if (what == u"list"_s && arguments.size() == 1) {
         const QJsonArray all = settingsAsJson();
         QString text;
-        for (const QJsonValue& entry : all)
+        for (const QJsonValue entry : all)
             text += entry[u"hive"].toString() + u'\\' + entry[u"key"].toString() + u'\t' + entry[u"name"].toString() +
                     u'\t' + entry[u"value"].toString() + u'\n';
         return {.fields = {{u"settings"_s, all}}, .text = text};

@@ -26,8 +26,8 @@ QByteArray authorityDocument(const QStringList& lines)
     const QByteArray text = pageText(lines);
     const QByteArray objects[] = {
         "<< /Type /Catalog /Pages 2 0 R >>", "<< /Type /Pages /Kids [3 0 R] /Count 1 >>",
-        "<< /Type /Page /Parent 2 0 R /MediaBox [0 0 595 842] /Resources << /Font << /F1 5 0 R >> >> /Contents 4 0 R "
-        ">>",
+        ("<< /Type /Page /Parent 2 0 R /MediaBox [0 0 595 842] "
+         "/Resources << /Font << /F1 5 0 R >> >> /Contents 4 0 R >>"),
         "<< /Length " + QByteArray::number(text.size()) + " >>\nstream\n" + text + "endstream",
         "<< /Type /Font /Subtype /Type1 /BaseFont /Helvetica /Encoding /WinAnsiEncoding >>"};
 

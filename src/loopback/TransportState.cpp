@@ -49,7 +49,7 @@ QMap<QString, Parameters> entriesOf(const QJsonValue& value)
 QStringList textsOf(const QJsonValue& value)
 {
     QStringList texts;
-    for (const QJsonValue& text : value.toArray())
+    for (const QJsonValue text : value.toArray())
         texts.append(text.toString());
     return texts;
 }
@@ -81,7 +81,7 @@ TransportState TransportState::parsed(const QByteArray& text)
     state.started = textsOf(document[u"started"]);
     state.insurer.quotes = entriesOf(document[u"quotes"]);
     state.insurer.requests = entriesOf(document[u"requests"]);
-    for (const QJsonValue& dealing : document[u"dealings"].toArray())
+    for (const QJsonValue dealing : document[u"dealings"].toArray())
         state.dealings.append(dealingOf(dealing));
     return state;
 }

@@ -4,6 +4,7 @@
 #include <QObject>
 
 class QAbstractItemView;
+class QKeyEvent;
 class QLineEdit;
 
 namespace kest {

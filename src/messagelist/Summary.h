@@ -40,8 +40,8 @@ QList<ListedMessage> BuildMessageList(MessageFolder folder, const FillHooks& hoo
 
 /// Returns false if a picture that the request names is not yet in the unread folder.
 bool AllImagesPresent(const xml::Document& message);
-/// Returns true if this fill has already listed an earlier message of the same request, or if the message can't be read.
-/// A manual quote replaces the earlier message in `listed` instead.
+/// Returns true if this fill has already listed an earlier message of the same request, or if the message can't be
+/// read. A manual quote replaces the earlier message in `listed` instead.
 bool IsHeldBehindEarlier(const xml::Document& message, QList<ListedMessage>& listed, const QString& file);
 /// Returns the row of a network message or, if `typeName` is "SENT", of a wrapped outbound document. Never throws: a
 /// value that can't be read stays empty or becomes "-".

@@ -139,16 +139,16 @@ TakenIn takeInFiles(const QList<QUrl>& urls, const std::function<void(qint64 don
     std::ranges::stable_sort(brought, {}, &Brought::kind);
 
     qint64 done = 0;
-    for (const auto& [path, name, kind] : std::as_const(brought)) {
-        unlessRefused(name, [&] {
-            if (!mayBeWritten(name))
+    for (const Brought& file : std::as_const(brought)) {
+        unlessRefused(file.name, [&] {
+            if (!mayBeWritten(file.name))
                 return;
-            files::copy(path, files::pathForWriting(gsUnreadPath, name));
-            ++(kind == FileKind::Message   ? result.messages
-               : kind == FileKind::Picture ? result.pictures
-                                           : result.descriptions);
-            if (kind == FileKind::Message && !name.startsWith("R_"_L1))
-                result.toList.append(name);
+            files::copy(file.path, files::pathForWriting(gsUnreadPath, file.name));
+            ++(file.kind == FileKind::Message   ? result.messages
+               : file.kind == FileKind::Picture ? result.pictures
+                                                : result.descriptions);
+            if (file.kind == FileKind::Message && !file.name.startsWith("R_"_L1))
+                result.toList.append(file.name);
         });
         if (progress)
             progress(++done, brought.size());

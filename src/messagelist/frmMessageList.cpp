@@ -19,6 +19,7 @@
 
 #include <QClipboard>
 #include <QDropEvent>
+#include <QGroupBox>
 #include <QGuiApplication>
 #include <QLabel>
 #include <QLineEdit>

@@ -15,6 +15,7 @@
 #include "reports/ReportTable.h"
 
 #include <QGuiApplication>
+#include <QJsonArray>
 #include <QPrintDialog>
 #include <QPrinter>
 #include <QPushButton>

@@ -7,6 +7,7 @@
 
 #include <QHBoxLayout>
 #include <QHeaderView>
+#include <QJsonArray>
 #include <QPushButton>
 #include <QTreeWidget>
 #include <QVBoxLayout>

@@ -103,7 +103,7 @@ const Index& Recordset::Data::indexOf(int column)
         if (const auto key = equalityKey(at(row, column), columns[column].kind))
             index[*key].push_back(row);
     }
-    return *indexes.insert(column, std::move(index));
+    return *indexes.insert(column, index);
 }
 
 /// Changes a value and updates the indexes. All changes are made here.

@@ -47,9 +47,7 @@ private:
             if (depth == 0 && !inList && token.is(u"(") && isPlaceOfTable(tokens.previous(i)))
                 isComplete = false;
             depth += int(token.is(u"(")) - int(token.is(u")"));
-            if (depth > 0)
-                item.last = i;
-            else if (inList && (token.is(u",") || token.is(u"FROM"))) {
+            if (depth <= 0 && inList && (token.is(u",") || token.is(u"FROM"))) {
                 items.append(item);
                 item = {tokens.next(i), Tokens::none};
                 inList = token.is(u",");

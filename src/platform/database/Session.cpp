@@ -150,7 +150,7 @@ const TableInfo* Session::table(const QString& name)
     std::shared_ptr<TableInfo> read = spelling.isEmpty() ? nullptr : engine_->readTable(spelling);
     if (!read || read->columns.isEmpty())
         return nullptr;
-    return tables.insert(key, std::move(read))->get();
+    return tables.insert(key, read)->get();
 }
 
 QString Session::tableSpelling(const QString& name)

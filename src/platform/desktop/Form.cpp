@@ -29,7 +29,7 @@ QIcon drawn(const QPalette& palette, const QList<QPolygonF>& lines)
 QIcon exitPicture(const QPalette& palette)
 {
     return drawn(palette, {QPolygonF({{13, 7}, {13, 3}, {3, 3}, {3, 21}, {13, 21}, {13, 17}}),
-                           QPolygonF({{8, 12}, {21, 12}}), QPolygonF({{17, 8}, {21, 12}, {17, 16}})});
+                           QPolygonF(QList<QPointF>{{8, 12}, {21, 12}}), QPolygonF({{17, 8}, {21, 12}, {17, 16}})});
 }
 
 }  // namespace

@@ -43,17 +43,21 @@ void guarded(const QString& source, const std::function<void()>& event);
 /// Throws the exception that guarded() has kept, if any. For code that operates controls without showing their window.
 void throwKept();
 
+/// Calls a routine with these arguments, or without any if it takes none.
+template <class Routine, class... Arguments>
+void callWith(const Routine& routine, const Arguments&... arguments)
+{
+    if constexpr (requires { routine(arguments...); })
+        routine(arguments...);
+    else
+        routine();
+}
 /// Connects a signal to an event routine, which runs through guarded().
 template <class Sender, class Signal, class Routine>
 void onEvent(Sender* sender, Signal signal, QObject* window, const QString& source, Routine routine)
 {
     QObject::connect(sender, signal, window, [source, routine](auto&&... arguments) {
-        guarded(source, [&] {
-            if constexpr (requires { routine(arguments...); })
-                routine(arguments...);
-            else
-                routine();
-        });
+        guarded(source, [&] { callWith(routine, arguments...); });
     });
 }
 

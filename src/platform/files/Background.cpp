@@ -41,7 +41,7 @@ QStringList remembered()
 {
     QStringList files;
     attempt([&] {
-        for (const QJsonValue& entry : QJsonDocument::fromJson(readBytes(listOfRemovals())).array())
+        for (const QJsonValue entry : QJsonDocument::fromJson(readBytes(listOfRemovals())).array())
             if (const QString file = entry.toArray().at(0).toString(); isFile(file) && entry == stateOf(file))
                 files.append(file);
     });

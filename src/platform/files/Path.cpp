@@ -214,7 +214,7 @@ QStringList list(const QString& folder, const QString& pattern)
 
 void removeLeftOvers(const QString& folder)
 {
-    constexpr qint64 day = 24 * 60 * 60;  // seconds
+    constexpr qint64 day = 24LL * 60 * 60;  // seconds
     const QString place = systemPath(folder);
     const Folder open = openFolder(place);
     if (!open)

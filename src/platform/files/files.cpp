@@ -89,7 +89,7 @@ void append(const QString& path, const QString& text)
 
 void copy(const QString& from, const QString& to)
 {
-    constexpr qsizetype piece = 1024 * 1024;
+    constexpr qsizetype piece = 1024LL * 1024;
     failOnRequest(from);
     const QString source = systemPath(from);
     checkReadable(source);

@@ -209,7 +209,7 @@ void Script::carryOut(QDialog& window, const Visit& visit)
 void useScript(std::shared_ptr<Script> script)
 {
     setAnswerer(script);
-    setWindowDriver(script);
+    setWindowDriver(std::move(script));
 }
 
 Script* currentScript()
