@@ -1,21 +1,15 @@
 #include "shell/com.h"
 
+#include <QUuid>
+
 namespace kest::com {
 
 QString text(const Guid& id)
 {
-    QString tail;
-    for (int i = 0; i < 8; ++i) {
-        if (i == 2)
-            tail += u'-';
-        tail += QStringLiteral("%1").arg(id.data4[i], 2, 16, QLatin1Char('0'));
-    }
-    return QStringLiteral("{%1-%2-%3-%4}")
-        .arg(id.data1, 8, 16, QLatin1Char('0'))
-        .arg(id.data2, 4, 16, QLatin1Char('0'))
-        .arg(id.data3, 4, 16, QLatin1Char('0'))
-        .arg(tail)
-        .toUpper();
+    const auto& tail = id.data4;
+    const QUuid uuid(id.data1, id.data2, id.data3, tail[0], tail[1], tail[2], tail[3], tail[4], tail[5], tail[6],
+                     tail[7]);
+    return uuid.toString().toUpper();
 }
 
 std::atomic<long>& serverReferences()
