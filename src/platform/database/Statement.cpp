@@ -187,14 +187,15 @@ private:
                                u'\'';
             return;
         }
-        if (text.isEmpty())
+        const auto isFlag = [&](QStringView word) {
+            return column->kind == Kind::Flag && text.compare(word, Qt::CaseInsensitive) == 0;
+        };
+        if (text.isEmpty() || isFlag(u"false"))
             literal = {Part::Number, u"0"_s};
         else if (const auto number = numberIn(text))
             literal = {Part::Number, exactNumber(text, *number)};
-        else if (column->kind == Kind::Flag && text.compare(u"true", Qt::CaseInsensitive) == 0)
+        else if (isFlag(u"true"))
             literal = {Part::Number, u"1"_s};
-        else if (column->kind == Kind::Flag && text.compare(u"false", Qt::CaseInsensitive) == 0)
-            literal = {Part::Number, u"0"_s};
         else if (!assigned)  // every number is unequal to it, and none is equal, less or greater
             literal = {Part::Number, comparison == u"<>" || comparison == u"!=" ? u"1.7e308"_s : u"NULL"_s};
     }
@@ -300,9 +301,8 @@ private:
                     chain = chain || !plus || isText(previous(i), true) || isText(next(i), false);
                     if (chain && plus)
                         at(i).text = u"||"_s;
-                } else if (token.part == Part::Symbol && !token.is(u".")) {
-                    chain = false;
-                } else if (token.part == Part::Word && isClauseWord(token)) {
+                } else if ((token.part == Part::Symbol && !token.is(u".")) ||
+                           (token.part == Part::Word && isClauseWord(token))) {
                     chain = false;
                 }
             }
