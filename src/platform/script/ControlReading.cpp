@@ -1,3 +1,5 @@
+#include "platform/script/ControlReading.h"
+
 #include "platform/script/Controls.h"
 #include "platform/script/Refusal.h"
 

@@ -1,10 +1,8 @@
-// Finds a window's controls by name, operates them as a person would, and reads them.
+// Finds a window's controls by name and operates them as a person would.
 #pragma once
 
-#include <QJsonObject>
 #include <QJsonValue>
 #include <QString>
-#include <QStringList>
 
 class QDialog;
 class QWidget;
@@ -27,9 +25,5 @@ void set(QWidget& control, const QString& text);
 void select(QWidget& control, const QJsonValue& item);
 /// Clicks the tab with that key or caption.
 void chooseTab(QWidget& control, const QString& key);
-
-/// Returns text, enabled, visible, checked and rows of each named control, as far as it has them. Without names, reads
-/// all controls.
-QJsonObject read(QDialog& window, const QStringList& names);
 
 }  // namespace kest::desktop::controls

@@ -2,6 +2,7 @@
 
 #include "platform/RuntimeError.h"
 #include "platform/desktop/Window.h"
+#include "platform/script/ControlReading.h"
 #include "platform/script/Controls.h"
 #include "platform/script/Gestures.h"
 #include "platform/script/Refusal.h"
