@@ -1,5 +1,6 @@
 #include "app/Commands.h"
 
+#include "app/HistoryCommands.h"
 #include "app/MessageCommands.h"
 #include "app/Outcome.h"
 #include "app/TransportCommand.h"
@@ -255,7 +256,7 @@ const std::map<QString, Command> commands{
     {u"load"_s, {Needs::Connection, 1, 1, with(load)}},       {u"send"_s, {Needs::Connection, 1, 2, with(send)}},
     {u"reprint"_s, {Needs::Connection, 1, 1, with(reprint)}}, {u"view"_s, {Needs::Connection, 2, 2, with(view)}},
     {u"setting"_s, {Needs::Profile, 1, 5, with(setting)}},    {u"joblink"_s, {Needs::Connection, 1, 9, with(jobLink)}},
-    {u"transport"_s, {Needs::Profile, 0, 1, transport}},
+    {u"history"_s, {Needs::Connection, 1, 2, with(history)}}, {u"transport"_s, {Needs::Profile, 0, 1, transport}},
 };
 
 bool showsTransport(const CommandLine& line)

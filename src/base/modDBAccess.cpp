@@ -1,5 +1,6 @@
 #include "base/modDBAccess.h"
 
+#include "base/Journal.h"
 #include "base/SharedVariables.h"
 #include "base/modLoggerEx.h"
 #include "platform/Prompt.h"
@@ -126,6 +127,7 @@ void OpenDatabase()
         }
     });
     silence = QDeadlineTimer(lastFailure && time.hasExpired(slowMilliseconds) ? pauseMilliseconds : 0);
+    attempt([] { journal::watch(gcnDB); });
 }
 
 QString connectionFailure()

@@ -1,4 +1,5 @@
 // Loads the answers to a sent quote: submission responses, adjustments, assessment results and their back-outs.
+#include "base/Journal.h"
 #include "base/modDBAccess.h"
 #include "inbound/Loading.h"
 #include "inbound/modLoadXML.h"
@@ -108,8 +109,10 @@ void LoadSubmissionResponse(QString& text, const QString& fileName)
     quote.header().set(u"KESTQuoteNo"_s, root.textOf(u"rootns:kestQuoteNumber"_s));
     if (root.textOf(u"rootns:quoteSubmissionStatus"_s) == u"Submitted"_s)
         applyTransition(quoteSubmitted, quote);
+    journal::Operation operation(journal::Kind::Response, fileName, journal::hashOf(text));
     quote.header().update();
     quote.notes().update();
+    operation.end(journal::State::Done);
 }
 
 }  // namespace kest

@@ -1,5 +1,6 @@
 #include "messagelist/frmMessageList.h"
 
+#include "base/Journal.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "base/modLoggerEx.h"
@@ -196,13 +197,16 @@ bool frmMessageList::load(const QString& file)
             desktop::msgBox(u"Message %1 is being loaded on another workstation."_s.arg(file),
                             desktop::Icon::Information);
         QString text = alone.isHeld() ? files::read(gsCurFolder + file) : QString();
+        journal::Operation operation(journal::Kind::Load, file, journal::hashOf(text));
         if (!alone.isHeld() || !LoadXML(text, file)) {
+            operation.end(journal::State::Failed);
             RefreshList();
             tmrRefresh->start();
             return false;
         }
         text.clear();  // otherwise a large text would be in memory twice
         MoveMessage(file, u"read"_s);
+        operation.end(journal::State::Done);
         RefreshList();
         if (files::exists(gsCurFolder + file))
             lblStatus->setText(

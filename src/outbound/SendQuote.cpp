@@ -1,6 +1,7 @@
 #include "outbound/SendQuote.h"
 
 #include "base/Helpers.h"
+#include "base/Journal.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "outbound/modCreateXML.h"
@@ -93,12 +94,14 @@ double SendQuote(db::Recordset& quote, bool* sent)
     if (const QString refusal = refusalOf(quote, key); !refusal.isEmpty())
         return refuse(refusal);
 
+    journal::Operation operation(journal::Kind::Send);
     RoundQuoteLines(quote);
     const double total = CreateQuoteXML(quote);
     if (sent)
         *sent = total != 0;
     if (total != 0)
         CreateImageXML(gsImagesPath, quote);
+    operation.end(total != 0 ? journal::State::Done : journal::State::Failed);
     return total;
 }
 

@@ -104,7 +104,12 @@ void repairDatabases()
 {
     const QString folder = profile::root() + u"/databases"_s;
     for (const QString& file : files::list(folder, u"*.db"_s))
-        attempt([&] { repairIndexes(*openEmbedded(file.chopped(3))); });  // a file may not be a quote database
+        attempt([&] {  // a file may not be a quote database
+            const db::ConnectionPtr database = openEmbedded(file.chopped(3));
+            repairIndexes(*database);
+            if (!database->hasTable(u"KESTOperation"_s))
+                createJournal(*database, Dialect::Embedded);
+        });
 }
 
 void installTemplates()

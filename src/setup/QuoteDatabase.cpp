@@ -47,6 +47,7 @@ void createTables(db::Connection& database, Dialect dialect)
     run(database, script(dialect == Dialect::Embedded ? u"quote-embedded.sql"_s : u"quote-mariadb.sql"_s));
     for (const Index& index : quoteIndexes())
         database.execute(index.statement);
+    createJournal(database, dialect);
 }
 
 QList<Index> quoteIndexes()
@@ -65,6 +66,11 @@ void repairIndexes(db::Connection& database)
     database.rebuildIndexes();
     for (const Index& index : quoteIndexes())
         database.execute(QString(index.statement).replace("INDEX "_L1, "INDEX IF NOT EXISTS "_L1));
+}
+
+void createJournal(db::Connection& database, Dialect dialect)
+{
+    run(database, script(dialect == Dialect::Embedded ? u"journal-embedded.sql"_s : u"journal-mariadb.sql"_s));
 }
 
 void fillNewShop(db::Connection& database)

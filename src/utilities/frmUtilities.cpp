@@ -1,6 +1,7 @@
 #include "utilities/frmUtilities.h"
 
 #include "base/Helpers.h"
+#include "base/Journal.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "platform/Prompt.h"
@@ -262,8 +263,10 @@ void frmUtilities::Command1_Click()
     }
     WriteQuote();
     WriteRemarks();
+    journal::Operation operation(journal::Kind::Save);
     quote.update();
     remarks.update();
+    operation.end(journal::State::Done);
     CloseRows();
     close();  // first: the changes are saved even if the host's quote can't be opened
 

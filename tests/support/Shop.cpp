@@ -1,5 +1,6 @@
 #include "support/Shop.h"
 
+#include "base/Journal.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Folders.h"
 #include "platform/database/Sql.h"
@@ -101,10 +102,12 @@ bool loadAsTheWindow(const QString& fileName)
     bool taken = false;
     attempt([&] {
         QString text = files::read(gsUnreadPath + fileName);
+        journal::Operation operation(journal::Kind::Load, fileName, journal::hashOf(text));
         taken = LoadXML(text, fileName);
+        if (taken)
+            MoveMessage(fileName, u"read"_s);
+        operation.end(taken ? journal::State::Done : journal::State::Failed);
     });
-    if (taken)
-        MoveMessage(fileName, u"read"_s);
     return taken;
 }
 

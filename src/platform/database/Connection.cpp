@@ -1,6 +1,7 @@
 #include "platform/database/Connection.h"
 
 #include "platform/RuntimeError.h"
+#include "platform/database/Change.h"
 #include "platform/database/ConnectionText.h"
 #include "platform/database/OdbcDrivers.h"
 #include "platform/database/Session.h"
@@ -110,7 +111,26 @@ void Connection::setCommandTimeout(int seconds)
 
 qint64 Connection::execute(const QString& statement)
 {
+    if (const std::optional<PastedChange> pasted = observer_ && !inChange_ ? pastedChange(statement) : std::nullopt;
+        pasted && observerOf(pasted->table))
+        return executeObserved(*this, *pasted, statement);
     return session().execute(statement);
+}
+
+QString Connection::serverSession() const
+{
+    const QString question = session().dialect().sessionNumber;
+    return question.isEmpty() ? QString() : session().engine().run(question).values.front().toString();
+}
+
+bool Connection::hasTable(const QString& name) const
+{
+    return session().table(name) != nullptr;
+}
+
+ChangeObserver* Connection::observerOf(const QString& table) const
+{
+    return observer_ && !inChange_ && observer_->observes(table) ? observer_.get() : nullptr;
 }
 
 void Connection::rebuildIndexes()

@@ -8,6 +8,7 @@
 
 namespace kest::db {
 
+class ChangeObserver;
 class Session;
 
 /// A connection to a database. Statements are written in the dialect of SQL Server and translated for other engines.
@@ -44,10 +45,21 @@ public:
     /// Rebuilds the indexes of the embedded database, which another tool may have left in another order.
     void rebuildIndexes();
 
+    /// Returns the server's own number of this connection, or an empty text for the embedded engine.
+    QString serverSession() const;
+    bool hasTable(const QString& name) const;
+    /// Shows every change of a row to an observer from now on. Null ends this.
+    void setObserver(std::shared_ptr<ChangeObserver> observer) { observer_ = std::move(observer); }
+
     /// Used by Recordset.
     Session& session() const;
+    /// Returns who sees changes of the table, or null: also while a change is recorded. Used by Change.
+    ChangeObserver* observerOf(const QString& table) const;
+    void setInChange(bool inChange) { inChange_ = inChange; }
 
 private:
+    std::shared_ptr<ChangeObserver> observer_;
+    bool inChange_ = false;
     std::unique_ptr<Session> session_;
     int commandTimeout_ = 30;
     QString odbcOptions_;

@@ -68,6 +68,7 @@ const Dialect& embeddedDialect()
         // another tool may have written only the day, or the time after a "T"
         .sameDate = u"datetime(%1)=datetime(%2)"_s,
         .sameLongText = u"%1=%2 COLLATE BINARY"_s,
+        .begin = u"BEGIN IMMEDIATE"_s,
     };
     return dialect;
 }
@@ -80,6 +81,8 @@ const Dialect& mySqlDialect()
         .closeQuote = u'`',
         .defaultsOnly = u"() VALUES ()"_s,
         .sameLongText = u"CONVERT(%1 USING utf8mb4)=%2 COLLATE utf8mb4_bin"_s,
+        .lockedEnd = u" FOR UPDATE"_s,
+        .sessionNumber = u"SELECT CONNECTION_ID()"_s,
     };
     return dialect;
 }
@@ -92,6 +95,8 @@ const Dialect& mySqlOverOdbcDialect()
         .openQuote = u'`',
         .closeQuote = u'`',
         .defaultsOnly = u"() VALUES ()"_s,
+        .lockedEnd = u" FOR UPDATE"_s,
+        .sessionNumber = u"SELECT CONNECTION_ID()"_s,
     };
     return dialect;
 }
@@ -105,6 +110,9 @@ const Dialect& sqlServerDialect()
         .isoDates = true,
         .openQuote = u'[',
         .closeQuote = u']',
+        .begin = u"BEGIN TRANSACTION"_s,
+        .lockedTable = u"%1 WITH (UPDLOCK, HOLDLOCK)"_s,
+        .sessionNumber = u"SELECT @@SPID"_s,
     };
     return dialect;
 }

@@ -22,6 +22,10 @@ struct Dialect {
     QString defaultsOnly = QStringLiteral("DEFAULT VALUES");
     QString sameDate = QStringLiteral("%1=%2");  // the condition that a date column equals a literal
     QString sameLongText = QString();            // the same for a long text; empty if the database can't compare it
+    QString begin = QStringLiteral("BEGIN");     // begins a transaction
+    QString lockedTable = QStringLiteral("%1");  // a table in a SELECT that locks its rows until the commit
+    QString lockedEnd = QString();               // the end of such a SELECT
+    QString sessionNumber = QString();           // asks for the server's number of the connection
 
     /// Returns a quoted identifier.
     QString quoted(const QString& identifier) const;

@@ -2,6 +2,7 @@
 #pragma once
 
 #include "platform/RuntimeError.h"
+#include "platform/database/Change.h"
 #include "platform/database/Criterion.h"
 #include "platform/database/Recordset.h"
 #include "platform/database/Session.h"
@@ -101,6 +102,7 @@ struct Recordset::Data {
     void checkLongTexts(const TableInfo& table, const QString& key);
     void writeChange(const QString& table);
     void writeInsert(const QString& table);
+    RowChange rowChange(const TableInfo& table, ChangeKind kind, const QStringList& wanted);
     void readBack(const TableInfo& table, const QVariant& identity);
     QString insertedRow(const TableInfo& table);
 };

@@ -1,4 +1,5 @@
 // Writes the pending change of a recordset to the base tables of its columns.
+#include "platform/database/Change.h"
 #include "platform/database/RecordsetData.h"
 
 #include <algorithm>
@@ -157,10 +158,13 @@ void Recordset::Data::writeChange(const QString& tableName)
         written.append(column);
     }
     checkLongTexts(*table, key);
+    Change change(*connection, tableName);
     const qint64 hit = session().executeNative(u"UPDATE "_s + dialect().quoted(tableName) + u" SET "_s +
                                                assignments.join(u", "_s) + u" WHERE "_s + condition);
     if (hit == 0)
         failRowChanged();
+    if (change.isObserved())
+        change.commit({rowChange(*table, ChangeKind::Update, change.wantedColumns())});
     for (const int column : written)
         original[size_t(column)] = at(row(), column);
 }
@@ -178,7 +182,40 @@ void Recordset::Data::writeInsert(const QString& tableName)
         names.append(dialect().quoted(columns[column].name));
         literals.append(dialect().literal(at(row(), column)));
     }
-    readBack(*table, session().insert(*table, names, literals));
+    Change change(*connection, tableName);
+    const QVariant identity = session().insert(*table, names, literals);
+    for (int column = 0; column < columns.size(); ++column) {
+        if (table->identity() && columns[column].table == tableName && columns[column].name == table->identity()->name)
+            store(row(), column, identity);
+    }
+    if (change.isObserved())
+        change.commit({rowChange(*table, ChangeKind::Insert, {})});
+    readBack(*table, identity);
+}
+
+/// The current row as it is recorded, its identity filled in.
+RowChange Recordset::Data::rowChange(const TableInfo& table, ChangeKind kind, const QStringList& wanted)
+{
+    const bool hasKey = !table.key.isEmpty() && std::ranges::all_of(table.key, [&](const QString& name) {
+        return resultColumn(table.name, name) >= 0;
+    });
+    RowChange change{kind, table.name, hasKey ? table.key : QStringList(), {}};
+    for (int column = 0; column < columns.size(); ++column) {
+        const ResultColumn& described = columns[column];
+        if (described.table != table.name)
+            continue;
+        const TableColumn* base = table.column(described.name);
+        const bool isIdentity = base && base->identity;
+        const bool isKey = hasKey ? table.key.contains(described.name, Qt::CaseInsensitive)
+                                  : isExact(described.kind) && (kind == ChangeKind::Update || assigned[size_t(column)]);
+        if (!isKey && !isIdentity && !isChanged(column) && !wanted.contains(described.name, Qt::CaseInsensitive))
+            continue;
+        if (isKey && !hasKey)
+            change.key.append(described.name);
+        change.columns.append({described.name, described.kind,
+                               kind == ChangeKind::Insert ? QVariant() : original[size_t(column)], at(row(), column)});
+    }
+    return change;
 }
 
 /// Reads what the database has set in the new row: its identity, and the defaults of the columns without a value.
@@ -274,8 +311,7 @@ void Recordset::remove()
         if (!table)
             throw RuntimeError(StatementFailed, u"The query has no base table to delete from."_s);
         const QString condition = data->keyCondition(*table);
-        if (data->session().executeNative(u"DELETE FROM "_s + data->dialect().quoted(table->name) + u" WHERE "_s +
-                                          condition) == 0)
+        if (deleteRows(*data->connection, table->name, condition) == 0)
             failRowChanged();
     }
     Q_UNUSED(row);

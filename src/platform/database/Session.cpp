@@ -131,6 +131,43 @@ QVariant Session::insert(const TableInfo& info, const QStringList& columns, cons
     return identity.isNull() ? QVariant() : QVariant(identity.toLongLong());
 }
 
+QString Session::translatedCondition(const QString& table, const QString& condition)
+{
+    const QString head = u"SELECT * FROM "_s + table + u" WHERE "_s;
+    const QString text = translated(head + condition, dialect(), *this).text;
+    return text.sliced(text.indexOf(u" WHERE "_s) + 7);
+}
+
+Rows Session::selectLocked(const TableInfo& info, const QString& condition)
+{
+    QList<ResultColumn> columns;
+    QStringList names;
+    for (const TableColumn& column : info.columns) {
+        columns.append({column.name, info.name, column.kind, column.size, column.scale});
+        names.append(dialect().quoted(column.name));
+    }
+    return selectNative(u"SELECT "_s + names.join(u", "_s) + u" FROM "_s +
+                            QString(dialect().lockedTable).replace(u"%1"_s, dialect().quoted(info.name)) +
+                            u" WHERE "_s + condition + dialect().lockedEnd,
+                        columns);
+}
+
+void Session::begin()
+{
+    engine_->run(dialect().begin);
+}
+
+void Session::commit()
+{
+    checkFault();
+    engine_->run(u"COMMIT"_s);
+}
+
+void Session::rollback()
+{
+    engine_->run(u"ROLLBACK"_s);
+}
+
 void Session::checkFault()
 {
     if (!statementFault || !statementFault())

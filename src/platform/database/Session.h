@@ -57,6 +57,14 @@ public:
     qint64 executeNative(const QString& statement);
     /// Inserts a row and returns its identity, or Null if the table has none.
     QVariant insert(const TableInfo& table, const QStringList& columns, const QStringList& literals);
+    /// Whole rows that nobody else may change until the transaction ends.
+    /// A condition on a table, from the dialect of SQL Server into the engine's own.
+    QString translatedCondition(const QString& table, const QString& condition);
+    Rows selectLocked(const TableInfo& table, const QString& condition);
+
+    void begin();
+    void commit();
+    void rollback();
 
     /// Returns a table, or null if the database does not have it. Asks the database only once. The result is valid
     /// until a definition changes.

@@ -1,0 +1,78 @@
+#include "app/HistoryCommands.h"
+
+#include "base/History.h"
+#include "platform/values.h"
+
+#include <QJsonArray>
+#include <QJsonObject>
+
+namespace kest::app {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+QJsonValue jsonOf(const QVariant& value)
+{
+    return value.isNull() ? QJsonValue(QJsonValue::Null) : QJsonValue(toText(value));
+}
+
+QString wordOf(db::ChangeKind kind)
+{
+    return kind == db::ChangeKind::Insert ? u"insert"_s : kind == db::ChangeKind::Delete ? u"delete"_s : u"update"_s;
+}
+
+QJsonObject jsonOf(const journal::RecordedChange& change)
+{
+    QJsonArray columns;
+    for (const db::RowChange::Column& column : change.row.columns)
+        columns.append(QJsonObject{
+            {u"name"_s, column.name}, {u"before"_s, jsonOf(column.before)}, {u"after"_s, jsonOf(column.after)}});
+    return {{u"table"_s, change.row.table},
+            {u"change"_s, wordOf(change.row.kind)},
+            {u"quote"_s, change.number},
+            {u"subquote"_s, change.subquote},
+            {u"columns"_s, columns}};
+}
+
+QString textOf(const journal::RecordedChange& change)
+{
+    QString text = u"  %1 %2"_s.arg(wordOf(change.row.kind), change.row.table);
+    if (!change.number.isEmpty())
+        text += u" (quote %1/%2)"_s.arg(change.number, change.subquote);
+    text += u'\n';
+    for (const QString& line : journal::linesOf(change.row))
+        text += u"    "_s + line + u'\n';
+    return text;
+}
+
+}  // namespace
+
+Outcome history(const QStringList& arguments)
+{
+    QJsonArray operations;
+    QString text;
+    for (const journal::Entry& entry : journal::historyOf(arguments[0], arguments.value(1))) {
+        text += u"%1  %2  %3  %4 (%5)\n"_s.arg(entry.started.toString(u"dd/MM/yyyy HH:mm:ss"_s))
+                    .arg(entry.id)
+                    .arg(entry.workstation, journal::titleOf(entry), entry.state);
+        QJsonArray changes;
+        for (const journal::RecordedChange& change : journal::changesOf(entry.id)) {
+            changes.append(jsonOf(change));
+            text += textOf(change);
+        }
+        operations.append(QJsonObject{{u"operation"_s, entry.id},
+                                      {u"kind"_s, entry.kind},
+                                      {u"state"_s, entry.state},
+                                      {u"file"_s, entry.file},
+                                      {u"workstation"_s, entry.workstation},
+                                      {u"time"_s, entry.started.toString(Qt::ISODate)},
+                                      {u"changes"_s, changes}});
+    }
+    if (operations.isEmpty())
+        text = journal::isKept() ? u"Nothing is recorded for quote %1.\n"_s.arg(arguments[0])
+                                 : u"This database keeps no journal.\n"_s;
+    return {.fields = {{u"operations"_s, operations}}, .text = text};
+}
+
+}  // namespace kest::app

@@ -1,0 +1,151 @@
+#include "base/History.h"
+
+#include "base/JournalRecord.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
+#include "platform/RuntimeError.h"
+#include "platform/database/Sql.h"
+#include "platform/values.h"
+
+#include <algorithm>
+
+namespace kest::journal {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+constexpr int prunedAtOnce = 1000;  // rows
+
+Entry entryAt(const db::Recordset& row)
+{
+    Entry entry;
+    entry.id = toLong(row.value(u"Operation"_s));
+    entry.kind = row.text(u"Kind"_s);
+    entry.state = row.text(u"State"_s);
+    entry.file = row.text(u"FileName"_s);
+    entry.hash = row.text(u"FileHash"_s);
+    entry.number = row.text(u"QTNNO"_s);
+    entry.subquote = row.text(u"Subquote"_s);
+    entry.workstation = row.text(u"Workstation"_s);
+    entry.started = row.value(u"StartedAt"_s).toDateTime();
+    return entry;
+}
+
+QList<Entry> entries(const QString& select)
+{
+    QList<Entry> found;
+    if (!isKept())
+        return found;
+    for (db::Recordset rows = opened(select); !rows.eof(); rows.moveNext())
+        found.append(entryAt(rows));
+    return found;
+}
+
+QString shown(const QVariant& value)
+{
+    return value.isNull() ? u"(empty)"_s : u'"' + toText(value).replace(u"\r\n"_s, u" "_s) + u'"';
+}
+
+/// The part of a long text in which it differs from the other, with the start and the end that both share left out.
+QString difference(const QString& text, const QString& other)
+{
+    constexpr qsizetype shortText = 80;  // characters
+    if (text.size() <= shortText && other.size() <= shortText)
+        return text;
+    const auto [left, otherLeft] = std::mismatch(text.begin(), text.end(), other.begin(), other.end());
+    const qsizetype start = left - text.begin();
+    qsizetype end = 0;
+    const qsizetype most = std::min(text.size(), other.size()) - start;
+    while (end < most && text[text.size() - 1 - end] == other[other.size() - 1 - end])
+        ++end;
+    QString part = text.mid(start, text.size() - start - end);
+    if (start > 0)
+        part.prepend(u"..."_s);
+    if (end > 0)
+        part.append(u"..."_s);
+    return part;
+}
+
+}  // namespace
+
+QList<Entry> historyOf(const QString& number, const QString& subquote)
+{
+    return entries(
+        subquote.isEmpty()
+            ? sql("SELECT * FROM KESTOperation WHERE Operation IN (SELECT Operation FROM KESTJournal WHERE QTNNO='{}') "
+                  "ORDER BY Operation DESC",
+                  number)
+            : sql("SELECT * FROM KESTOperation WHERE Operation IN (SELECT Operation FROM KESTJournal WHERE QTNNO='{}' "
+                  "AND Subquote='{}') ORDER BY Operation DESC",
+                  number, subquote));
+}
+
+QList<RecordedChange> changesOf(qint64 operation)
+{
+    QList<RecordedChange> changes;
+    if (!isKept())
+        return changes;
+    for (db::Recordset rows = opened(sql("SELECT * FROM KESTJournal WHERE Operation={} ORDER BY Entry", operation));
+         !rows.eof(); rows.moveNext())
+        changes.append({toLong(rows.value(u"Entry"_s)), rows.value(u"ChangedAt"_s).toDateTime(), rows.text(u"QTNNO"_s),
+                        rows.text(u"Subquote"_s), changeIn(rows.text(u"RowData"_s))});
+    return changes;
+}
+
+QStringList linesOf(const db::RowChange& row)
+{
+    QStringList lines;
+    for (const db::RowChange::Column& column : row.columns) {
+        const bool differs = column.before.isNull() != column.after.isNull() || column.before != column.after;
+        if (!differs)
+            continue;
+        if (row.kind == db::ChangeKind::Insert)
+            lines.append(column.name + u": "_s + shown(column.after));
+        else if (row.kind == db::ChangeKind::Delete)
+            lines.append(column.name + u": "_s + shown(column.before));
+        else if (column.kind == db::Kind::LongText && !column.before.isNull() && !column.after.isNull())
+            lines.append(u"%1: \"%2\" -> \"%3\""_s.arg(column.name,
+                                                       difference(toText(column.before), toText(column.after)),
+                                                       difference(toText(column.after), toText(column.before))));
+        else
+            lines.append(column.name + u": "_s + shown(column.before) + u" -> "_s + shown(column.after));
+    }
+    return lines;
+}
+
+QString titleOf(const Entry& entry)
+{
+    if (entry.kind == wordOf(Kind::Load))
+        return u"load of "_s + entry.file;
+    if (entry.kind == wordOf(Kind::Save))
+        return u"save in the utilities"_s;
+    if (entry.kind == wordOf(Kind::Response))
+        return u"response "_s + entry.file;
+    return entry.kind;
+}
+
+void prune(int days)
+{
+    if (!isKept())
+        return;
+    const QString limit = QDateTime::currentDateTime().addDays(-days).toString(u"yyyy-MM-ddTHH:mm:ss"_s);
+    const db::Recordset oldest =
+        opened(sql("SELECT TOP 1 * FROM KESTOperation WHERE StartedAt<'{}' AND State<>'open' ORDER BY "
+                   "Operation",
+                   limit));
+    if (oldest.eof())
+        return;
+    const qint64 operation = toLong(oldest.value(u"Operation"_s));
+    db::Recordset rows =
+        opened(sql("SELECT TOP {} Entry FROM KESTJournal WHERE Operation={} ORDER BY Entry", prunedAtOnce, operation));
+    if (!rows.eof()) {
+        rows.moveLast();
+        gConn->execute(
+            sql("DELETE FROM KESTJournal WHERE Operation={} AND Entry<={}", operation, rows.value(u"Entry"_s)));
+    }
+    if (rows.recordCount() < prunedAtOnce)
+        gConn->execute(sql("DELETE FROM KESTOperation WHERE Operation={}", operation));
+}
+
+}  // namespace kest::journal

@@ -1,0 +1,35 @@
+// What happened to a quote: the operations that changed it, and what each changed from what to what.
+#pragma once
+
+#include "base/Journal.h"
+#include "platform/database/Change.h"
+
+#include <QList>
+#include <QString>
+
+namespace kest::journal {
+
+struct RecordedChange {
+    qint64 entry = 0;
+    QDateTime moment;
+    QString number;  // of the quote that the row belongs to; empty for a car, a customer, a vendor
+    QString subquote;
+    db::RowChange row;
+};
+
+/// The operations that changed rows of a quote, newest first; of all its subquotes if `subquote` is empty.
+QList<Entry> historyOf(const QString& number, const QString& subquote);
+/// All that an operation changed, in the order of the changes.
+QList<RecordedChange> changesOf(qint64 operation);
+
+/// The columns of a change as a person reads them: "excess: 250 -> 300". A new row shows what was filled in, a deleted
+/// one what was lost; long texts are shortened to their difference.
+QStringList linesOf(const db::RowChange& row);
+
+/// "load of AUQT_1007.xml", "send", "save in the utilities".
+QString titleOf(const Entry& entry);
+
+/// Removes operations that ended more than `days` ago, at most 1,000 rows at a time.
+void prune(int days);
+
+}  // namespace kest::journal

@@ -1,0 +1,156 @@
+#include "platform/database/Change.h"
+
+#include "platform/RuntimeError.h"
+#include "platform/database/ColumnValues.h"
+#include "platform/database/Dialect.h"
+#include "platform/database/Session.h"
+
+#include <QRegularExpression>
+
+#include <algorithm>
+
+namespace kest::db {
+
+using namespace Qt::StringLiterals;
+
+const RowChange::Column* RowChange::column(const QString& name) const
+{
+    const auto found = std::ranges::find_if(
+        columns, [&](const Column& column) { return column.name.compare(name, Qt::CaseInsensitive) == 0; });
+    return found == columns.end() ? nullptr : &*found;
+}
+
+Change::Change(Connection& connection, const QString& table) : connection_(connection), table_(table)
+{
+    observer_ = connection.observerOf(table);
+    if (!observer_)
+        return;
+    connection_.session().begin();
+    isOpen_ = true;
+    connection_.setInChange(true);
+}
+
+Change::~Change()
+{
+    if (!isOpen_)
+        return;
+    connection_.setInChange(false);
+    if (connection_.state() == 1)
+        attempt([&] { connection_.session().rollback(); });
+    observer_->takenBack();
+}
+
+void Change::commit(const QList<RowChange>& rows)
+{
+    if (!isOpen_)
+        return;
+    observer_->changed(connection_, rows);
+    connection_.session().commit();
+    isOpen_ = false;
+    connection_.setInChange(false);
+    observer_->committed();
+}
+
+namespace {
+
+QList<RowChange> rowsOf(ChangeKind kind, const TableInfo& table, const Rows& rows)
+{
+    QList<RowChange> changes;
+    const size_t width = size_t(rows.columns.size());
+    for (int row = 0; row < rows.count(); ++row) {
+        RowChange change{kind, table.name, table.key, {}};
+        for (size_t i = 0; i < width; ++i) {
+            const ResultColumn& column = rows.columns[qsizetype(i)];
+            change.columns.append({column.name, column.kind, rows.values[size_t(row) * width + i], QVariant()});
+            if (table.key.isEmpty() && column.kind != Kind::Number && column.kind != Kind::LongText)
+                change.key.append(column.name);
+        }
+        changes.append(change);
+    }
+    return changes;
+}
+
+/// Puts the literals of "A='x', B=1" into the values after the change; the columns that stay have their values before.
+void assign(QList<RowChange>& rows, const QString& assignments)
+{
+    static const QRegularExpression assignment(u"\\G\\s*(\\w+)\\s*=\\s*('(?:[^']|'')*'|[^,']+)\\s*(?:,|$)"_s);
+    for (RowChange& row : rows)
+        for (RowChange::Column& column : row.columns)
+            column.after = column.before;
+    qsizetype end = 0;
+    for (const QRegularExpressionMatch& match : assignment.globalMatch(assignments)) {
+        end = match.capturedEnd();
+        const QString literal = match.captured(2).trimmed();
+        const bool isText = literal.startsWith(u'\'');
+        const bool isNull = literal.compare("NULL"_L1, Qt::CaseInsensitive) == 0;
+        const QString text = isText ? literal.sliced(1, literal.size() - 2).replace(u"''"_s, u"'"_s) : literal;
+        for (RowChange& row : rows)
+            for (RowChange::Column& column : row.columns)
+                if (column.name.compare(match.captured(1), Qt::CaseInsensitive) == 0)
+                    column.after = isNull ? QVariant() : normalised(text, column.kind);
+    }
+    if (end != assignments.size())
+        throw RuntimeError(StatementFailed, u"What this statement assigns can't be recorded: "_s + assignments);
+}
+
+/// The first place of a word outside literals; -1 if there is none.
+qsizetype wordAt(const QString& statement, QLatin1StringView word)
+{
+    static const QRegularExpression token(u"'(?:[^']|'')*'|\\w+|."_s, QRegularExpression::DotMatchesEverythingOption);
+    for (const QRegularExpressionMatch& match : token.globalMatch(statement))
+        if (match.capturedView().compare(word, Qt::CaseInsensitive) == 0)
+            return match.capturedStart();
+    return -1;
+}
+
+}  // namespace
+
+qint64 deleteRows(Connection& connection, const QString& table, const QString& condition)
+{
+    Change change(connection, table);
+    Session& session = connection.session();
+    const TableInfo* info = session.table(table);
+    QList<RowChange> rows;
+    if (change.isObserved() && info)
+        rows = rowsOf(ChangeKind::Delete, *info, session.selectLocked(*info, condition));
+    const qint64 hit =
+        session.executeNative(u"DELETE FROM "_s + session.dialect().quoted(table) + u" WHERE "_s + condition);
+    if (hit > 0)
+        change.commit(rows);
+    return hit;
+}
+
+std::optional<PastedChange> pastedChange(const QString& statement)
+{
+    static const QRegularExpression head(u"\\A\\s*(?:(DELETE)\\s+FROM|UPDATE)\\s+(\\w+)\\s*(SET\\s)?"_s,
+                                         QRegularExpression::CaseInsensitiveOption);
+    const QRegularExpressionMatch match = head.match(statement);
+    const qsizetype where = match.hasMatch() ? wordAt(statement, "WHERE"_L1) : -1;
+    if (where < 0)
+        return {};
+    PastedChange pasted;
+    pasted.kind = match.captured(1).isEmpty() ? ChangeKind::Update : ChangeKind::Delete;
+    pasted.table = match.captured(2);
+    pasted.assignments = statement.sliced(match.capturedEnd(), where - match.capturedEnd()).trimmed();
+    pasted.condition = statement.sliced(where + 5).trimmed();
+    return pasted;
+}
+
+qint64 executeObserved(Connection& connection, const PastedChange& pasted, const QString& statement)
+{
+    Change change(connection, pasted.table);
+    Session& session = connection.session();
+    const TableInfo* info = session.table(pasted.table);
+    if (!info)
+        throw RuntimeError(StatementFailed, u"There is no table "_s + pasted.table);
+    const QString condition = session.translatedCondition(pasted.table, pasted.condition);
+    QList<RowChange> rows = rowsOf(pasted.kind, *info, session.selectLocked(*info, condition));
+    if (pasted.kind == ChangeKind::Update)
+        assign(rows, pasted.assignments);
+    const qint64 hit = session.execute(statement);
+    if (hit > 0)
+        change.commit(rows);
+    return hit;
+}
+
+}  // namespace kest::db

@@ -1,0 +1,85 @@
+// Changes of rows that someone keeps a record of: the change and its record commit together, or neither does.
+#pragma once
+
+#include "platform/database/Recordset.h"
+
+#include <QList>
+#include <QString>
+#include <QStringList>
+#include <QVariant>
+
+#include <optional>
+
+namespace kest::db {
+
+enum class ChangeKind { Insert, Update, Delete };
+
+/// One row that a statement changed. Null values are null QVariants.
+struct RowChange {
+    struct Column {
+        QString name;
+        Kind kind = Kind::Text;
+        QVariant before;  // null in an insert
+        QVariant after;   // null in a deletion
+    };
+
+    ChangeKind kind = ChangeKind::Update;
+    QString table;
+    QStringList key;        // the names of the columns that tell the row from others
+    QList<Column> columns;  // the key's, those that changed and those that the observer asked for; all of a deleted row
+
+    const Column* column(const QString& name) const;
+};
+
+/// Sees every row that a connection inserts, updates or deletes.
+class ChangeObserver {
+public:
+    virtual ~ChangeObserver() = default;
+    /// False if changes of the table need no record.
+    virtual bool observes(const QString& table) const = 0;
+    /// Columns whose values it wants to see with every change, if the row has them.
+    virtual QStringList wantedColumns() const { return {}; }
+    /// Called in the change's transaction, after the change. What it writes on the connection commits with the change
+    /// and is not observed itself; what it throws takes the change back.
+    virtual void changed(Connection& connection, const QList<RowChange>& rows) = 0;
+    /// The change that `changed` saw was committed, or taken back.
+    virtual void committed() {}
+    virtual void takenBack() {}
+};
+
+/// The transaction around one change. Without an observer of the table there is none, and the change commits alone.
+class Change {
+public:
+    Change(Connection& connection, const QString& table);
+    /// Takes the change back if it was not committed.
+    ~Change();
+    Change(const Change&) = delete;
+    Change& operator=(const Change&) = delete;
+
+    bool isObserved() const { return observer_ != nullptr; }
+    QStringList wantedColumns() const { return observer_->wantedColumns(); }
+    void commit(const QList<RowChange>& rows);
+
+private:
+    Connection& connection_;
+    QString table_;
+    ChangeObserver* observer_ = nullptr;
+    bool isOpen_ = false;
+};
+
+/// Deletes the rows that a native condition tells; the number of rows.
+qint64 deleteRows(Connection& connection, const QString& table, const QString& condition);
+
+/// A pasted statement that changes rows of one table.
+struct PastedChange {
+    ChangeKind kind = ChangeKind::Update;
+    QString table;
+    QString assignments;  // of an UPDATE, each a column and a literal
+    QString condition;
+};
+/// Empty for every other statement.
+std::optional<PastedChange> pastedChange(const QString& statement);
+/// Runs it with the rows that it changes read first, whole, and kept from others.
+qint64 executeObserved(Connection& connection, const PastedChange& pasted, const QString& statement);
+
+}  // namespace kest::db

@@ -1,0 +1,145 @@
+// The journal records every change of an operation together with the change, and nothing else.
+#include "base/History.h"
+#include "base/Journal.h"
+#include "base/JournalRecord.h"
+#include "base/SharedVariables.h"
+#include "platform/RuntimeError.h"
+#include "platform/database/Sql.h"
+#include "support/Failure.h"
+#include "support/Shop.h"
+#include "support/Snapshot.h"
+
+namespace kest::test {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+class JournalOfAShop : public Shop {
+protected:
+    /// Returns the operations on quote 500, newest first, such as "load of m.xml: done".
+    static QString operations()
+    {
+        QStringList told;
+        for (const journal::Entry& entry : journal::historyOf(u"500"_s, {}))
+            told += journal::titleOf(entry) + u": "_s + entry.state;
+        return told.join(u", "_s);
+    }
+    /// Returns the changes of the newest operation on quote 500, each as "QUOTE1 CLAIM: ...".
+    static QStringList changes()
+    {
+        QStringList told;
+        for (const journal::RecordedChange& change : journal::changesOf(journal::historyOf(u"500"_s, {}).front().id))
+            for (const QString& line : journal::linesOf(change.row))
+                told += (change.row.table + u' ' + line).toUpper();
+        return told;
+    }
+    static int records() { return rowCount("KESTOperation") + rowCount("KESTJournal"); }
+};
+
+/// Hides one of the two tables, on a server that keeps them for the next test.
+class NoJournalTable {
+public:
+    NoJournalTable() { gConn->execute(u"ALTER TABLE KESTJournal RENAME TO KESTHidden"_s); }
+    ~NoJournalTable() { gConn->execute(u"ALTER TABLE KESTHidden RENAME TO KESTJournal"_s); }
+    Q_DISABLE_COPY_MOVE(NoJournalTable)
+};
+
+}  // namespace
+
+TEST_F(JournalOfAShop, TellsWhatALoadChangedFromWhatToWhat)
+{
+    quote("500").request("QR1").set("excess", 500).note("Responded Quote Request");
+    quote("500").line(1).set("rrhour", 2);
+    quote("500").line(2, "MIS").set("unitcost", 12);
+    arrive("m.xml", authorisedQuote("500").set("excess", "400").labour(1, "C").sublet(2, "D"));
+
+    ASSERT_TRUE(loadAsTheWindow(u"m.xml"_s)) << shown();
+
+    EXPECT_EQ(operations(), u"load of m.xml: done"_s);
+    const QStringList told = changes();
+    EXPECT_TRUE(told.contains(uR"(QUOTE1 EXCESS: "500" -> "400")"_s)) << told.join(u'\n').toStdString();
+    EXPECT_TRUE(told.filter(u"QUOTE2 RRHOUR: \"2\" ->"_s).size() == 1) << told.join(u'\n').toStdString();
+    EXPECT_EQ(told.filter(u"QUOTE2 UNITCOST: \"12\""_s).size(), 1) << "the deleted line";
+}
+
+TEST_F(JournalOfAShop, RecordsNothingForALoadThatChangesNothing)
+{
+    quote("500").request("QR1");
+    arrive("m.xml", authorisedQuote("501"));
+    EXPECT_FALSE(loadAsTheWindow(u"m.xml"_s));
+    EXPECT_EQ(listed().size(), 1);
+    EXPECT_EQ(records(), 0);
+}
+
+TEST_F(JournalOfAShop, KeepsTheChangesOfALoadThatFailed)
+{
+    quote("500").claim("C0");
+    {
+        const journal::Operation operation(journal::Kind::Load, u"m.xml"_s);
+        const journal::Operation nested(journal::Kind::Send);
+        gConn->execute(sql("UPDATE QUOTE1 SET CLAIM='{}' WHERE QTNNO='{}'", u"C'1"_s, u"500"_s));
+    }
+    EXPECT_EQ(operations(), u"load of m.xml: failed"_s);
+    EXPECT_EQ(changes(), QStringList(uR"(QUOTE1 CLAIM: "C0" -> "C'1")"_s));
+    EXPECT_EQ(quote("500").text("CLAIM"), "C'1");
+}
+
+TEST_F(JournalOfAShop, WritesAChangeAndItsRecordTogetherOrNeither)
+{
+    quote("500").claim("C1");
+    db::Recordset row(gConn);
+    row.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}'", u"500"_s));
+    quote("500").claim("C2");
+    const journal::Operation operation(journal::Kind::Save);
+
+    row.set(u"CLAIM"_s, u"C3"_s);
+    EXPECT_EQ(failureOf([&] { row.update(); }), RowChanged);
+    EXPECT_EQ(records(), 0) << "the row was changed by someone else, so nothing was changed";
+
+    row.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}'", u"500"_s));
+    row.set(u"CLAIM"_s, u"C3"_s);
+    const NoJournalTable none;
+    EXPECT_EQ(failureOf([&] { row.update(); }), StatementFailed);
+    EXPECT_EQ(failureOf([&] { gConn->execute(u"DELETE FROM QUOTE1 WHERE QTNNO='500'"_s); }), StatementFailed);
+    EXPECT_EQ(quote("500").text("CLAIM"), "C2");
+    EXPECT_EQ(rowCount("KESTOperation"), 0);
+}
+
+TEST_F(JournalOfAShop, IsNotNeededForALoad)
+{
+    const NoJournalTable none;
+    journal::watch(gConn);
+    quote("500").request("QR1").note("Active Quote Request");
+    arrive("m.xml", cancellation("QR1"));
+    EXPECT_TRUE(loadAsTheWindow(u"m.xml"_s)) << shown();
+    EXPECT_EQ(quote("500").stage(), 9);
+    EXPECT_EQ(operations(), QString());
+}
+
+TEST(JournalRecord, GivesEachValueBackBitForBit)
+{
+    const QVariant values[] = {
+        QVariant(),
+        QString(u""_s),
+        u"O'Brien \\ \"x\" \r\n\t \u20ac \u0131 %1"_s,
+        qint64(9007199254740993),
+        0.1 + 0.2,
+        -1e308,
+        true,
+        false,
+        QDateTime(QDate(2026, 10, 25), QTime(2, 30, 0, 7)),
+    };
+    for (const QVariant& value : values) {
+        const db::RowChange stored{
+            db::ChangeKind::Update, u"T"_s, {u"k"_s}, {{u"k"_s, db::Kind::Text, value, QVariant()}}};
+        const db::RowChange read = journal::changeIn(journal::textOf(stored));
+        const QVariant found = read.columns.front().before;
+        EXPECT_EQ(found, value);
+        EXPECT_EQ(found.isNull(), value.isNull());
+        EXPECT_EQ(found.typeId(), value.typeId());
+        EXPECT_EQ(read.key, stored.key);
+    }
+}
+
+}  // namespace kest::test
