@@ -1,6 +1,7 @@
 #include "base/History.h"
 
 #include "base/JournalRecord.h"
+#include "base/ModRegistry.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "platform/RuntimeError.h"
@@ -40,6 +41,18 @@ QList<Entry> entries(const QString& select)
     for (db::Recordset rows = opened(select); !rows.eof(); rows.moveNext())
         found.append(entryAt(rows));
     return found;
+}
+
+/// Returns for how many days operations are kept.
+int daysKept()
+{
+    constexpr int usual = 90;
+    double days = 0;
+    attempt([&] {
+        days =
+            toDouble(GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"JournalDays"_s, QString::number(usual), CopyUp::No));
+    });
+    return days >= 1 && days < 36500 ? int(days) : usual;
 }
 
 QString shown(const QVariant& value)
@@ -125,27 +138,31 @@ QString titleOf(const Entry& entry)
     return entry.kind;
 }
 
-void prune(int days)
+void prune()
 {
     if (!isKept())
         return;
-    const QString limit = QDateTime::currentDateTime().addDays(-days).toString(u"yyyy-MM-ddTHH:mm:ss"_s);
-    const db::Recordset oldest =
-        opened(sql("SELECT TOP 1 * FROM KESTOperation WHERE StartedAt<'{}' AND State<>'open' ORDER BY "
-                   "Operation",
-                   limit));
-    if (oldest.eof())
-        return;
-    const qint64 operation = toLong(oldest.value(u"Operation"_s));
-    db::Recordset rows =
-        opened(sql("SELECT TOP {} Entry FROM KESTJournal WHERE Operation={} ORDER BY Entry", prunedAtOnce, operation));
-    if (!rows.eof()) {
-        rows.moveLast();
-        gConn->execute(
-            sql("DELETE FROM KESTJournal WHERE Operation={} AND Entry<={}", operation, rows.value(u"Entry"_s)));
+    const QDateTime limit = QDateTime::currentDateTime().addDays(-daysKept());
+    for (qint64 room = prunedAtOnce; room > 0;) {
+        const db::Recordset oldest =
+            opened(sql("SELECT TOP 1 Operation FROM KESTOperation WHERE StartedAt<'{}' AND State<>'open' ORDER BY "
+                       "Operation",
+                       limit.toString(u"yyyy-MM-ddTHH:mm:ss"_s)));
+        if (oldest.eof())
+            return;
+        const QVariant operation = oldest.value(u"Operation"_s);
+        db::Recordset rows =
+            opened(sql("SELECT TOP {} Entry FROM KESTJournal WHERE Operation={} ORDER BY Entry", room, operation));
+        if (!rows.eof()) {
+            rows.moveLast();
+            gConn->execute(
+                sql("DELETE FROM KESTJournal WHERE Operation={} AND Entry<={}", operation, rows.value(u"Entry"_s)));
+        }
+        room -= rows.recordCount();
+        if (room > 0)  // all of its records are gone
+            gConn->execute(sql("DELETE FROM KESTOperation WHERE Operation={}", operation));
+        --room;
     }
-    if (rows.recordCount() < prunedAtOnce)
-        gConn->execute(sql("DELETE FROM KESTOperation WHERE Operation={}", operation));
 }
 
 }  // namespace kest::journal

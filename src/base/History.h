@@ -29,7 +29,8 @@ QStringList linesOf(const db::RowChange& row);
 /// "load of AUQT_1007.xml", "send", "save in the utilities".
 QString titleOf(const Entry& entry);
 
-/// Removes operations that ended more than `days` ago, at most 1,000 rows at a time.
-void prune(int days);
+/// Deletes operations that are older than the setting "JournalDays", but none that is still open. Deletes at most 1,000
+/// rows at a time, the oldest first.
+void prune();
 
 }  // namespace kest::journal

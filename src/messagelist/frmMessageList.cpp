@@ -1,5 +1,6 @@
 #include "messagelist/frmMessageList.h"
 
+#include "base/History.h"
 #include "base/Journal.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
@@ -70,6 +71,7 @@ void frmMessageList::open()
     iFolder = MessageFolder::Unread;
     optionOf(MessageFolder::Unread)->setChecked(true);
     RefreshList();
+    attempt([] { journal::prune(); });  // if it fails, the next opening does it
 }
 
 void frmMessageList::chooseFolder(MessageFolder folder)

@@ -117,6 +117,34 @@ TEST_F(JournalOfAShop, IsNotNeededForALoad)
     EXPECT_EQ(operations(), QString());
 }
 
+TEST_F(JournalOfAShop, ForgetsOldOperationsSomeRowsAtATimeButNoOpenOne)
+{
+    const auto operation = [](int number, const char* state, int daysAgo) {
+        gConn->execute(
+            sql("INSERT INTO KESTOperation (Operation, Kind, State, StartedAt) VALUES ({}, 'load', '{}', '{}')", number,
+                QString::fromLatin1(state),
+                QDateTime::currentDateTime().addDays(-daysAgo).toString(u"yyyy-MM-ddTHH:mm:ss"_s)));
+    };
+    operation(1, "open", 200);
+    operation(2, "done", 100);
+    operation(3, "failed", 91);
+    operation(4, "done", 89);
+    QStringList records;
+    for (int i = 0; i < 1200; ++i)
+        records += u"(%1, 'T', 0)"_s.arg(i < 1100 ? 3 : 4);
+    gConn->execute(u"INSERT INTO KESTJournal (Operation, TableName, Settled) VALUES "_s + records.join(u','));
+
+    journal::prune();
+    EXPECT_EQ(rowCount("KESTOperation", "Operation IN (1, 3, 4)"), 3);
+    EXPECT_EQ(rowCount("KESTOperation"), 3);
+    EXPECT_EQ(rowCount("KESTJournal", "Operation=3"), 101);
+
+    journal::prune();
+    EXPECT_EQ(rowCount("KESTOperation", "Operation IN (1, 4)"), 2);
+    EXPECT_EQ(rowCount("KESTOperation"), 2);
+    EXPECT_EQ(rowCount("KESTJournal"), 100);
+}
+
 TEST(JournalRecord, GivesEachValueBackBitForBit)
 {
     const QVariant values[] = {
