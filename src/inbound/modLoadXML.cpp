@@ -81,8 +81,15 @@ void takeNotice(const xml::Node& root, const QString& fileName)
     }
 }
 
+bool isPicture(const QString& path)
+{
+    return files::readStart(path, 1) == "\xFF";
+}
+
 void withdrawIfRequest(const QString& path, const QString& requestNumber)
 {
+    if (isPicture(path))
+        return;
     QString text = files::read(path);
     const xml::Document waiting = parsedMessage(text);
     if (waiting.parseError().errorCode != 0)

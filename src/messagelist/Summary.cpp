@@ -42,9 +42,14 @@ void reportUnreadable(const QString& file)
 // Fills the list once. All files share one document, so that memory holds only one parsed file at a time.
 class Fill {
 public:
-    Fill(MessageFolder chosenFolder, const FillHooks& fillHooks) : folder(chosenFolder), hooks(fillHooks)
+    Fill(MessageFolder chosenFolder, const QStringList& files, const FillHooks& fillHooks)
+        : folder(chosenFolder), hooks(fillHooks)
     {
         SetupDocument(document);
+        if (folder == MessageFolder::Unread) {
+            for (const QString& file : files)
+                unread.insert(file.toCaseFolded());
+        }
     }
 
     void take(const QString& file);
@@ -59,6 +64,7 @@ private:
     xml::Document document;  // the parsed text
     xml::Document reparsed;
     MessageFolder folder;
+    QSet<QString> unread;  // names with their case folded; empty in other folders
     const FillHooks& hooks;
 };
 
@@ -76,7 +82,7 @@ void Fill::take(const QString& file)
             listed.append({file, GetMarkerRow(marker, GetMarkerTypeName(marker))});
         }
     } else {
-        const bool held = (folder == MessageFolder::Unread && !AllImagesPresent(document)) ||
+        const bool held = (folder == MessageFolder::Unread && !AllImagesPresent(document, unread)) ||
                           (IsHeldBehindEarlier(document, listed, file) && folder == MessageFolder::Unread);
         if (!held) {
             const xml::Document& message = prepared();
@@ -87,9 +93,10 @@ void Fill::take(const QString& file)
 
 bool Fill::parse(const QString& path)
 {
-    if (files::size(path) > xml::Document::maximumBytes)
+    const QByteArray bytes = files::readStart(path, xml::Document::maximumBytes + 1);
+    if (bytes.size() > xml::Document::maximumBytes)
         return false;
-    text = files::read(path);
+    text = files::fromCodePage(bytes);
     if (folder != MessageFolder::Sent)
         return parseWithRepairs(document, text);
     if (!escapeAmpersands(text))
@@ -120,7 +127,7 @@ QList<ListedMessage> BuildMessageList(MessageFolder folder, const FillHooks& hoo
     const QStringList names = files::list(gsCurFolder);
     settleFilter(folder, names.size(), hooks);
 
-    Fill fill(folder, hooks);
+    Fill fill(folder, names, hooks);
     qint64 done = 0;
     for (const QString& file : names) {
         if (file.endsWith("xml"_L1) && file.contains(gsListFilter) && isBareName(file)) {
@@ -136,7 +143,7 @@ QList<ListedMessage> BuildMessageList(MessageFolder folder, const FillHooks& hoo
     return std::move(fill.listed);
 }
 
-bool AllImagesPresent(const xml::Document& message)
+bool AllImagesPresent(const xml::Document& message, const QSet<QString>& unread)
 {
     const xml::Node root = message.documentElement();
     const QList<xml::Node> ids = root.selectNodes(u"rootns:quoteRequestImageIds/*"_s);
@@ -147,7 +154,7 @@ bool AllImagesPresent(const xml::Document& message)
             continue;
         const QString name =
             root.textOrEmptyOf(u"rootns:quoteRequestNumber"_s) + u'_' + PadZeroLeft(number, 3) + ".jpg"_L1;
-        present = files::isPlainName(name) && files::exists(gsUnreadPath + name);
+        present = unread.contains(name.toCaseFolded());
         if (!present)
             return false;
     }

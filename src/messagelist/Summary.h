@@ -5,6 +5,7 @@
 #include "platform/xml/xml.h"
 
 #include <QList>
+#include <QSet>
 #include <QString>
 
 #include <array>
@@ -38,8 +39,9 @@ struct FillHooks {
 /// description begins with the name of the file.
 QList<ListedMessage> BuildMessageList(MessageFolder folder, const FillHooks& hooks);
 
-/// Returns false if a picture that the request names is not yet in the unread folder.
-bool AllImagesPresent(const xml::Document& message);
+/// Returns false if a picture that the request names is not among the files of the unread folder, whose names are given
+/// with their case folded.
+bool AllImagesPresent(const xml::Document& message, const QSet<QString>& unread);
 /// Returns true if this fill has already listed an earlier message of the same request, or if the message can't be
 /// read. A manual quote replaces the earlier message in `listed` instead.
 bool IsHeldBehindEarlier(const xml::Document& message, QList<ListedMessage>& listed, const QString& file);

@@ -68,7 +68,7 @@ qint64 runningNumber(const QuoteKey& quote)
 {
     constexpr qsizetype extension = 4;  // ".xml"
     qint64 largest = 0;
-    for (const QString& name : files::list(gsReadPath)) {
+    for (const QString& name : files::list(gsReadPath, quote.number + u'*')) {
         if (quote.begins(name))
             largest =
                 qMax(largest, toInteger(name.chopped(qMin(extension, name.size())).mid(quote.filePrefix().size())));

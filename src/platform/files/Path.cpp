@@ -153,10 +153,11 @@ QString pathForWriting(const QString& folder, const QString& name)
     return separated ? folder + name : folder + u'\\' + name;
 }
 
-bool matches(const QString& name, const QString& pattern)
+namespace {
+
+/// Both are in upper case.
+bool matchesMask(QStringView text, QStringView mask)
 {
-    const QString text = name.toUpper();
-    const QString mask = pattern.toUpper();
     qsizetype at = 0;
     qsizetype maskAt = 0;
     qsizetype star = -1;  // the last "*" and where its text begins; only this one is ever extended
@@ -180,6 +181,13 @@ bool matches(const QString& name, const QString& pattern)
     return maskAt == mask.size();
 }
 
+}  // namespace
+
+bool matches(const QString& name, const QString& pattern)
+{
+    return matchesMask(name.toUpper(), pattern.toUpper());
+}
+
 QStringList list(const QString& folder, const QString& pattern)
 {
     const QString place = systemPath(folder);
@@ -193,15 +201,17 @@ QStringList list(const QString& folder, const QString& pattern)
         QString upper;
         QString name;
     };
+    const QString mask = pattern.toUpper();
     std::vector<Found> files;
     while (const dirent* entry = ::readdir(open.get())) {
         if (entry->d_type == DT_DIR)
             continue;
         const QString name = decodedName(entry->d_name);
-        if (isTemporaryName(name) || !matches(name, pattern))
+        const QString upper = name.toUpper();
+        if (isTemporaryName(name) || !matchesMask(upper, mask))
             continue;
         if (entry->d_type == DT_REG || isFile(place + u'/' + name))
-            files.push_back({name.toUpper(), name});
+            files.push_back({upper, name});
     }
     std::sort(files.begin(), files.end(),
               [](const Found& a, const Found& b) { return a.upper != b.upper ? a.upper < b.upper : a.name < b.name; });

@@ -46,6 +46,15 @@ QByteArray readBytes(const QString& path)
     return file.read(bytes);
 }
 
+QByteArray readStart(const QString& path, qint64 most)
+{
+    failOnRequest(path);
+    const QString place = systemPath(path);
+    checkReadable(place);
+    SystemFile file(place, O_RDONLY);
+    return file.read(qMin(file.size(), most));
+}
+
 QString read(const QString& path)
 {
     return fromCodePage(readBytes(path));

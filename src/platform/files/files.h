@@ -28,6 +28,8 @@ qint64 size(const QString& path);
 QString read(const QString& path);
 /// Reads a file as it is.
 QByteArray readBytes(const QString& path);
+/// Reads at most that many bytes from the beginning of a file, as they are.
+QByteArray readStart(const QString& path, qint64 most);
 
 /// Writes a file in Windows-1252; other characters become "?". Writes to a temporary name first, which list() never
 /// returns, and then renames it, so that no reader sees part of a file. A file in another case is replaced and gets the
