@@ -65,6 +65,7 @@ const Dialect& embeddedDialect()
 {
     static const Dialect dialect{
         .patternSets = true,
+        .likeHasNoIndex = true,
         // another tool may have written only the day, or the time after a "T"
         .sameDate = u"datetime(%1)=datetime(%2)"_s,
         .sameLongText = u"%1=%2 COLLATE BINARY"_s,

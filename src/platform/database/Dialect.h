@@ -14,6 +14,7 @@ struct Dialect {
     bool top = false;               // uses "TOP n" instead of "LIMIT n" at the end
     bool plusJoinsTexts = false;    // uses "+" instead of "||"
     bool patternSets = false;       // LIKE supports "[...]" and ignores trailing blanks
+    bool likeHasNoIndex = false;    // LIKE 'x%' searches all rows unless the range of 'x' is given, too
     bool caseOfTables = false;      // the names of tables are case-sensitive
     bool backslashEscapes = false;  // a backslash in a literal is doubled
     bool isoDates = false;          // "T" between date and time in a literal

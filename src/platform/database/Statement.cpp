@@ -32,6 +32,8 @@ public:
         writeFlags();
         writeComparedLiterals();
         writePatterns();
+        if (dialect.likeHasNoIndex)
+            writeRanges();
         if (!dialect.plusJoinsTexts)
             joinTexts();
         if (!dialect.top)
@@ -252,6 +254,29 @@ private:
             at(last).text.append(u')');
         }
         return pattern;
+    }
+
+    /// Adds to a comparison with a plain beginning, LIKE 'x%', the range of the texts that begin so. An index serves
+    /// it.
+    void writeRanges()
+    {
+        static const QRegularExpression plainBeginning(u"^[^%_[]+%$"_s);
+        const QString afterAllCharacters = QString::fromUcs4(U"\U0010FFFF");
+        for (Index i = 0; i < count(); ++i) {
+            const Index pattern = at(i).is(u"LIKE") ? next(i) : none;
+            Index first = none;
+            const TableColumn* column = pattern == none ? nullptr : columnEndingAt(previous(i), &first);
+            if (!column || column->kind != Kind::Text || at(pattern).part != Part::Literal ||
+                !plainBeginning.match(at(pattern).value()).hasMatch())
+                continue;
+            QString name;
+            for (Index part = first; part <= previous(i); ++part)
+                name += at(part).text;
+            const QString beginning = at(pattern).value().chopped(1);
+            at(pattern).text += u" AND %1>=%2 AND %1<%3)"_s.arg(name, dialect.literal(beginning),
+                                                                dialect.literal(beginning + afterAllCharacters));
+            at(first).text.prepend(u'(');
+        }
     }
 
     static QString asRegularExpression(const QString& pattern)
