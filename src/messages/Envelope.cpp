@@ -19,6 +19,17 @@ struct LastMessage {
 LastMessage lastMessage;
 int keepers = 0;
 
+/// Looks only at the quotation marks: a search of the whole text that ignores case is slower than the parser.
+bool declaresSchemaInstance(QStringView text)
+{
+    const qsizetype toMark = schemaInstance.indexOf(u'"');
+    for (qsizetype mark = text.indexOf(u'"', toMark); mark >= 0; mark = text.indexOf(u'"', mark + 1)) {
+        if (text.sliced(mark - toMark).startsWith(schemaInstance, Qt::CaseInsensitive))
+            return true;
+    }
+    return false;
+}
+
 }  // namespace
 
 QString GetNamespaceURI()
@@ -41,7 +52,7 @@ void SetupDocument(xml::Document& document)
 QString AddXsiDeclaration(QString text)
 {
     const qsizetype first = text.indexOf("xmlns"_L1);
-    if (first < 0 || text.contains(schemaInstance, Qt::CaseInsensitive))
+    if (first < 0 || declaresSchemaInstance(text))
         return text;
     text.insert(first, schemaInstance);
     return text;
@@ -50,7 +61,7 @@ QString AddXsiDeclaration(QString text)
 bool isSameWhenPrepared(const QString& text)
 {
     const qsizetype first = text.indexOf("xmlns"_L1);
-    if (first < 0 || text.contains(schemaInstance, Qt::CaseInsensitive))
+    if (first < 0 || declaresSchemaInstance(text))
         return true;
     if (text.contains("xmlns:xsi"_L1))
         return false;  // the element that gets the declaration may already have one

@@ -54,11 +54,16 @@ QByteArray toCodePage(const QString& text)
 
 QString fromCodePage(const QByteArray& bytes)
 {
-    QString text(bytes.size(), Qt::Uninitialized);
-    std::transform(bytes.begin(), bytes.end(), text.begin(), [](char c) {
-        const auto byte = static_cast<unsigned char>(c);
-        return QChar(byte >= 0x80 && byte < 0xA0 ? upperControls[byte - 0x80] : char16_t(byte));
-    });
+    if (bytes.isValidUtf8()) {
+        const QString ascii = QString::fromUtf8(bytes);
+        if (ascii.size() == bytes.size())
+            return ascii;  // nearly all texts
+    }
+    QString text = QString::fromLatin1(bytes);
+    for (QChar& c : text) {
+        if (c >= QChar(0x80) && c < QChar(0xA0))
+            c = upperControls[c.unicode() - 0x80];
+    }
     return text;
 }
 

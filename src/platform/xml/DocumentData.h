@@ -35,7 +35,8 @@ struct DocumentData {
     /// Removes a node from the tree. It lives as long as the document.
     void unlink(xmlNodePtr node);
 
-    QList<Node> select(xmlNodePtr from, const QString& path, bool firstOnly);
+    QList<Node> select(xmlNodePtr from, const QString& path);
+    Node selectFirst(xmlNodePtr from, const QString& path);
 
     xmlDocPtr document = nullptr;
     ParseError error;

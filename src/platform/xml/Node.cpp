@@ -270,13 +270,12 @@ void Node::removeChild(Node child) const
 
 Node Node::selectSingleNode(const QString& path) const
 {
-    const QList<Node> found = document->select(required(), path, true);
-    return found.isEmpty() ? Node() : found.first();
+    return document->selectFirst(required(), path);
 }
 
 QList<Node> Node::selectNodes(const QString& path) const
 {
-    return document->select(required(), path, false);
+    return document->select(required(), path);
 }
 
 QString Node::textOf(const QString& path) const

@@ -1,5 +1,7 @@
 #include "platform/xml/DocumentData.h"
 
+#include <QStringEncoder>
+
 #include <libxml/SAX2.h>
 #include <libxml/parser.h>
 #include <libxml/parserInternals.h>
@@ -35,6 +37,7 @@ constexpr qsizetype longestSource = 10000;  // the most characters of a line to 
 struct Progress {
     const QString& text;
     xmlParserCtxtPtr parser = nullptr;
+    QStringEncoder encoder{QStringEncoder::Utf8, QStringEncoder::Flag::Stateless};
     qsizetype fed = 0;  // how many characters libxml2 has been given
     int nodes = 0;
     std::optional<ParseError> failure = {};
@@ -154,10 +157,10 @@ int feed(void* userData, char* buffer, int length)
     qsizetype count = qMin<qsizetype>(length / longestCharacter, progress.text.size() - progress.fed);
     if (count > 1 && progress.text[progress.fed + count - 1].isHighSurrogate())
         --count;
-    const QByteArray bytes = QStringView(progress.text).sliced(progress.fed, count).toUtf8();
-    std::memcpy(buffer, bytes.constData(), static_cast<size_t>(bytes.size()));
+    const char* const end =
+        progress.encoder.appendToBuffer(buffer, QStringView(progress.text).sliced(progress.fed, count));
     progress.fed += count;
-    return static_cast<int>(bytes.size());
+    return static_cast<int>(end - buffer);
 }
 
 void countNodes(xmlParserCtxtPtr parser, int count)

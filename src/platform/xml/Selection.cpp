@@ -1,6 +1,8 @@
 #include "platform/RuntimeError.h"
 #include "platform/xml/DocumentData.h"
 
+#include <QRegularExpression>
+
 #include <libxml/xpathInternals.h>
 
 #include <memory>
@@ -24,15 +26,106 @@ void passOver(void*, xmlErrorPtr) {}
     throw RuntimeError(TypeMismatch, u"The path can't be evaluated: "_s + path);
 }
 
-/// Returns a compiled path. Each thread keeps its compiled paths, but not without limit, because paths can contain
-/// values.
-xmlXPathCompExprPtr compiled(const QString& path)
+struct Step {
+    QString prefix;
+    QByteArray name;
+};
+
+/// The steps of a path that consists of names only, such as "//p:a/p:b" or "a". A walk that ends at the first match
+/// finds its node faster than libxml2, which looks at the whole document.
+struct PlainPath {
+    explicit PlainPath(const QString& path)
+    {
+        static const QRegularExpression form(u"^(//)?(?:\\w+:)?[A-Za-z]\\w*(?:/(?:\\w+:)?[A-Za-z]\\w*)*$"_s);
+        const auto match = form.match(path);
+        anywhere = !match.capturedView(1).isEmpty();
+        for (const QString& step : match.captured().sliced(anywhere ? 2 : 0).split(u'/', Qt::SkipEmptyParts)) {
+            const qsizetype colon = step.indexOf(u':');
+            steps.push_back({step.left(qMax(colon, 0)), step.sliced(colon + 1).toUtf8()});
+        }
+    }
+
+    bool anywhere = false;    // the first step may be at any depth
+    std::vector<Step> steps;  // none if there is something else in the path
+};
+
+/// Finds the first node of a plain path.
+class Walk {
+public:
+    Walk(const PlainPath& path, const QMap<QString, QString>& prefixes) : steps(path.steps)
+    {
+        for (const Step& step : steps) {
+            const auto uri = prefixes.constFind(step.prefix);
+            isPossible = isPossible && (step.prefix.isEmpty() || uri != prefixes.cend());
+            uris.push_back(step.prefix.isEmpty() || !isPossible ? QByteArray() : uri->toUtf8());
+        }
+    }
+
+    /// Returns true if the path is plain and all its prefixes are known.
+    bool canBeWalked() const { return !steps.empty() && isPossible; }
+
+    xmlNodePtr firstIn(const xmlDoc* document) const
+    {
+        xmlNodePtr at = document->children;
+        while (at && !endsAt(at)) {
+            xmlNodePtr next = at->type == XML_ELEMENT_NODE ? at->children : nullptr;
+            for (xmlNodePtr from = at; !next && from; from = from->parent)
+                next = from->next;
+            at = next;
+        }
+        return at;
+    }
+
+    xmlNodePtr firstBelow(const xmlNode* parent, size_t step = 0) const
+    {
+        for (xmlNodePtr child = parent->children; child; child = child->next) {
+            if (!fits(child, step))
+                continue;
+            const xmlNodePtr found = step + 1 == steps.size() ? child : firstBelow(child, step + 1);
+            if (found)
+                return found;
+        }
+        return nullptr;
+    }
+
+private:
+    bool fits(const xmlNode* node, size_t step) const
+    {
+        if (node->type != XML_ELEMENT_NODE || !xmlStrEqual(node->name, toXml(steps[step].name)))
+            return false;
+        const bool named = !steps[step].prefix.isEmpty();
+        return node->ns ? named && xmlStrEqual(node->ns->href, toXml(uris[step])) : !named;
+    }
+
+    /// Returns true if the last step is at this node, and those before it are at its parents.
+    bool endsAt(const xmlNode* node) const
+    {
+        for (size_t step = steps.size(); step-- > 0; node = node->parent) {
+            if (!fits(node, step))
+                return false;
+        }
+        return true;
+    }
+
+    const std::vector<Step>& steps;
+    std::vector<QByteArray> uris;
+    bool isPossible = true;
+};
+
+struct KnownPath {
+    PlainPath plain;
+    Expression compiled;
+};
+
+/// Returns what there is to know of a path. Each thread keeps its paths, but not without limit, because paths can
+/// contain values.
+const KnownPath& knownPath(const QString& path)
 {
     constexpr size_t mostKept = 2000;
-    thread_local std::unordered_map<QString, Expression> kept;
+    thread_local std::unordered_map<QString, KnownPath> kept;
     const auto known = kept.find(path);
     if (known != kept.end())
-        return known->second.get();
+        return known->second;
 
     const Context context(xmlXPathNewContext(nullptr), &xmlXPathFreeContext);
     context->error = passOver;
@@ -41,7 +134,7 @@ xmlXPathCompExprPtr compiled(const QString& path)
         failAsExpression(path);
     if (kept.size() >= mostKept)
         kept.clear();
-    return kept.emplace(path, std::move(made)).first->second.get();
+    return kept.emplace(path, KnownPath{PlainPath(path), std::move(made)}).first->second;
 }
 
 }  // namespace
@@ -72,12 +165,20 @@ xmlXPathContextPtr DocumentData::selectionContext()
     return context;
 }
 
-QList<Node> DocumentData::select(xmlNodePtr from, const QString& path, bool firstOnly)
+Node DocumentData::selectFirst(xmlNodePtr from, const QString& path)
 {
-    const xmlXPathCompExprPtr expression = compiled(path);
+    const PlainPath& plain = knownPath(path).plain;
+    if (const Walk walk(plain, prefixes); walk.canBeWalked())
+        return wrap(plain.anywhere ? walk.firstIn(document) : walk.firstBelow(from));
+    const QList<Node> found = select(from, path);
+    return found.isEmpty() ? Node() : found.first();
+}
+
+QList<Node> DocumentData::select(xmlNodePtr from, const QString& path)
+{
     const xmlXPathContextPtr here = selectionContext();
     here->node = from;
-    const Result result(xmlXPathCompiledEval(expression, here), &xmlXPathFreeObject);
+    const Result result(xmlXPathCompiledEval(knownPath(path).compiled.get(), here), &xmlXPathFreeObject);
     if (!result || result->type != XPATH_NODESET)
         failAsExpression(path);
     QList<Node> nodes;
@@ -87,8 +188,6 @@ QList<Node> DocumentData::select(xmlNodePtr from, const QString& path, bool firs
         if (node->type == XML_NAMESPACE_DECL || node->type == XML_DOCUMENT_NODE)
             continue;  // this layer has no such nodes
         nodes.append(wrap(node));
-        if (firstOnly)
-            break;
     }
     return nodes;
 }
