@@ -1,0 +1,165 @@
+// Does one operation of the shop once, in a shop of a chosen size, for `count`, which counts its instructions. Prints
+// how many statements and how many calls for files it has made: operations NAME SIZE.
+#include "base/SharedVariables.h"
+#include "messages/Folders.h"
+#include "outbound/SendQuote.h"
+#include "platform/database/FaultInjection.h"
+#include "platform/database/Sql.h"
+#include "platform/files/FaultInjection.h"
+#include "support/OdbcDrivers.h"
+#include "support/Shop.h"
+
+#include <QApplication>
+
+#include <cstdio>
+#include <cstdlib>
+#include <functional>
+#include <map>
+#include <string>
+
+using namespace Qt::StringLiterals;
+using namespace kest;
+using namespace kest::test;
+
+/// What is counted. The name is not mangled, so that `count` can give it to valgrind.
+extern "C" __attribute__((noinline)) void measured(const std::function<void()>& operation)
+{
+    int statements = 0;
+    int fileCalls = 0;
+    db::setStatementFault([&] { return ++statements == 0; });
+    files::setFault([&] { return ++fileCalls == 0; });
+    operation();
+    db::setStatementFault({});
+    files::setFault({});
+    std::printf("%d %d\n", statements, fileCalls);
+}
+
+namespace {
+
+struct Bench : Shop {
+    using Shop::arrive;
+    void TestBody() override {}
+};
+
+/// Adds rows to a table. In `values`, i is the number of the row.
+void addRows(const char* table, const char* columns, const char* values, int rows)
+{
+    gConn->execute(
+        u"WITH RECURSIVE n(i) AS (SELECT 1 UNION ALL SELECT i + 1 FROM n WHERE i < %1) INSERT INTO %2 (%3) SELECT %4 "
+        "FROM n"_s.arg(rows)
+            .arg(QLatin1StringView(table), QLatin1StringView(columns), QLatin1StringView(values)));
+}
+
+void addQuotes(int quotes)
+{
+    addRows("CAR", "REGO, CUST_ID, MODEL_ID", "'R' || i, 100 + i, 'C120'", quotes);
+    addRows("CUSTOMER", "CUST_ID, NAME, FIRSTNAME", "100 + i, 'Name' || i, 'Kim'", quotes);
+    addRows("QUOTE1", "QTNNO, Subquote, REGO, INSURER_ID, KESTQRNo, KESTQRVer, KESTQuoteNo",
+            "'Q' || i, 0, 'R' || i, 1, 'QR' || i, '1', 'KQ' || i", quotes);
+    addRows("QUOTE3", "QTNNO, Subquote, remarks", "'Q' || i, 0, ''", quotes);
+}
+
+void addLines(int lines)
+{
+    quote("500").request("QR1").quoteNumber("KQ1");
+    addRows("QUOTE2", "QTNNO, Subquote, SEQ_NO, category, script, rrhour, rr_rate2, qty, PartNo, itemno, MARK",
+            "'500', 0, i, CASE i % 3 WHEN 0 THEN 'R&R' WHEN 1 THEN 'RA' ELSE 'MIS' END, 'Front guard', 1, 38.5, 1, '', "
+            "'137', ''",
+            lines);
+}
+
+void expect(bool happened)
+{
+    if (!happened) {
+        std::fputs("The operation did not do its work.\n", stderr);
+        std::exit(1);
+    }
+}
+
+void measureFill(qsizetype rows)
+{
+    measured([&] { expect(listed().size() == rows); });
+}
+
+void fill(Bench& shop, int messages)
+{
+    for (int i = 0; i < messages; ++i)
+        shop.arrive(u"%1.xml"_s.arg(i), quoteRequest(u"QR%1"_s.arg(i)));
+    measureFill(messages);
+}
+
+void waiting(Bench& shop, int messages)
+{
+    for (int i = 0; i < messages; ++i)
+        shop.arrive(u"%1.xml"_s.arg(i), quoteRequest(u"QR%1"_s.arg(i)).images({"1", "2"}));
+    measureFill(0);
+}
+
+void fillFromTables(Bench& shop, int quotes)
+{
+    constexpr int messages = 20;
+    addQuotes(quotes);
+    for (int i = 1; i <= messages; ++i)
+        shop.arrive(u"%1.xml"_s.arg(i), cancellation(u"QR%1"_s.arg(i)));
+    measureFill(messages);
+}
+
+void loadRequest(Bench&, int quotes)
+{
+    addQuotes(quotes);
+    measured([] { expect(load(quoteRequest("QRNEW"))); });
+}
+
+void loadAuthorised(Bench&, int lines)
+{
+    addLines(lines);
+    Message message = authorisedQuote("500").rego("ABC123");
+    for (int line = 1; line <= lines; ++line)
+        message.labour(line, "C");
+    measured([&] { expect(load(message)); });
+}
+
+void send(Bench&, int lines)
+{
+    addLines(lines);
+    db::Recordset panel(gConn);
+    panel.open(u"SELECT * FROM QUOTE1 WHERE QTNNO='500'"_s);
+    measured([&] { expect(SendQuote(panel) > 0); });
+}
+
+void moveLoaded(Bench&, int readFiles)
+{
+    quote("500").request("QR1");
+    for (int i = 0; i < readFiles; ++i)
+        files::write(gsReadPath + u"%1.0_1.xml"_s.arg(1000 + i), {});
+    files::write(gsUnreadPath + u"in.xml"_s, cancellation("QR1").text());
+    measured([] { MoveMessage(u"in.xml"_s, u"read"_s); });
+    expect(files::exists(gsReadPath + u"500.0_1.xml"_s));
+}
+
+const std::map<std::string, void (*)(Bench&, int)> operations{
+    {"fill", fill},
+    {"waiting", waiting},
+    {"fill-from-tables", fillFromTables},
+    {"load-request", loadRequest},
+    {"load-authorised", loadAuthorised},
+    {"send", send},
+    {"move-loaded", moveLoaded},
+};
+
+}  // namespace
+
+int main(int argc, char** argv)
+{
+    qputenv("QT_QPA_PLATFORM", "offscreen");
+    const OdbcDrivers drivers(OdbcDrivers::Own);
+    const QApplication application(argc, argv);
+    if (argc != 3 || !operations.contains(argv[1])) {
+        for (const auto& [name, operation] : operations)
+            std::puts(name.c_str());
+        return 2;
+    }
+    Bench shop;
+    operations.at(argv[1])(shop, std::atoi(argv[2]));
+    return 0;
+}
