@@ -158,6 +158,11 @@ static ServerShop& serverShop()
     return *made;
 }
 
+bool shopIsOnServer()
+{
+    return engine() != Engine::Embedded;
+}
+
 void dropConnection()
 {
     if (engine() == Engine::Embedded)
@@ -229,7 +234,7 @@ static void closeFile()
 
 SavedShopDatabase::SavedShopDatabase()
 {
-    if (engine() != Engine::Embedded) {
+    if (shopIsOnServer()) {
         serverShop().copy(serverShop().shop, serverShop().saved);
         return;
     }
@@ -240,7 +245,7 @@ SavedShopDatabase::SavedShopDatabase()
 
 void SavedShopDatabase::restore() const
 {
-    if (engine() != Engine::Embedded) {
+    if (shopIsOnServer()) {
         serverShop().copy(serverShop().saved, serverShop().shop);
         return;
     }

@@ -8,6 +8,8 @@
 
 namespace kest::test {
 
+/// Returns false for the embedded database.
+bool shopIsOnServer();
 /// Drops the component's connection, as a restart of the server would.
 void dropConnection();
 
