@@ -1,5 +1,6 @@
 #include "app/Commands.h"
 
+#include "app/DatabaseCommand.h"
 #include "app/HistoryCommands.h"
 #include "app/MessageCommands.h"
 #include "app/Outcome.h"
@@ -251,12 +252,19 @@ Outcome transport(const CommandLine& line)
 }
 
 const std::map<QString, Command> commands{
-    {u"init"_s, {Needs::Nothing, 0, 1, with(init)}},          {u"where"_s, {Needs::Nothing, 0, 0, with(showWhere)}},
-    {u"open"_s, {Needs::Profile, 0, 2, with(open)}},          {u"list"_s, {Needs::Connection, 1, 3, with(list)}},
-    {u"load"_s, {Needs::Connection, 1, 1, with(load)}},       {u"send"_s, {Needs::Connection, 1, 2, with(send)}},
-    {u"reprint"_s, {Needs::Connection, 1, 1, with(reprint)}}, {u"view"_s, {Needs::Connection, 2, 2, with(view)}},
-    {u"setting"_s, {Needs::Profile, 1, 5, with(setting)}},    {u"joblink"_s, {Needs::Connection, 1, 9, with(jobLink)}},
-    {u"history"_s, {Needs::Connection, 1, 2, with(history)}}, {u"transport"_s, {Needs::Profile, 0, 1, transport}},
+    {u"init"_s, {Needs::Nothing, 0, 1, with(init)}},
+    {u"where"_s, {Needs::Nothing, 0, 0, with(showWhere)}},
+    {u"open"_s, {Needs::Profile, 0, 2, with(open)}},
+    {u"list"_s, {Needs::Connection, 1, 3, with(list)}},
+    {u"load"_s, {Needs::Connection, 1, 1, with(load)}},
+    {u"send"_s, {Needs::Connection, 1, 2, with(send)}},
+    {u"reprint"_s, {Needs::Connection, 1, 1, with(reprint)}},
+    {u"view"_s, {Needs::Connection, 2, 2, with(view)}},
+    {u"setting"_s, {Needs::Profile, 1, 5, with(setting)}},
+    {u"joblink"_s, {Needs::Connection, 1, 9, with(jobLink)}},
+    {u"history"_s, {Needs::Connection, 1, 2, with(history)}},
+    {u"transport"_s, {Needs::Profile, 0, 1, transport}},
+    {u"check-database"_s, {Needs::Connection, 0, 0, with(checkDatabase)}},
 };
 
 bool showsTransport(const CommandLine& line)

@@ -172,6 +172,14 @@ std::optional<db::Recordset> OpenRecordset(const QString& select, bool disconnec
     return rows;
 }
 
+db::ConnectionPtr anotherConnection()
+{
+    auto connection = std::make_shared<db::Connection>();
+    connection->open(connectionText(driverNumber(CopyUp::No)));
+    connection->setCommandTimeout(commandTimeout);
+    return connection;
+}
+
 db::Recordset opened(const QString& select)
 {
     db::Recordset rows(gConn);

@@ -35,6 +35,8 @@ QString connectionText(int driverNumber);
 int driverNumber(CopyUp copyUp = CopyUp::Yes);
 /// Opens a query on a new recordset. If there is no connection, shows a critical box and returns nothing.
 std::optional<db::Recordset> OpenRecordset(const QString& select, bool disconnect = false, bool reconnect = false);
+/// Opens one more connection to the same database. Throws RuntimeError if that fails.
+db::ConnectionPtr anotherConnection();
 /// Opens a query on the shared connection `gConn`. Throws RuntimeError if it fails.
 db::Recordset opened(const QString& select);
 /// Returns the text, cut to the size of the column.

@@ -42,9 +42,15 @@ void registerResources()
     registerFiles();
 }
 
+QStringList schemaStatements(Dialect dialect)
+{
+    return statementsIn(script(dialect == Dialect::Embedded ? u"quote-embedded.sql"_s : u"quote-mariadb.sql"_s));
+}
+
 void createTables(db::Connection& database, Dialect dialect)
 {
-    run(database, script(dialect == Dialect::Embedded ? u"quote-embedded.sql"_s : u"quote-mariadb.sql"_s));
+    for (const QString& statement : schemaStatements(dialect))
+        database.execute(statement);
     for (const Index& index : quoteIndexes())
         database.execute(index.statement);
     createJournal(database, dialect);

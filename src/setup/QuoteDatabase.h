@@ -28,6 +28,8 @@ void repairIndexes(db::Connection& database);
 /// Creates the tables of the journal.
 void createJournal(db::Connection& database, Dialect dialect);
 
+/// Returns the statements that create all tables.
+QStringList schemaStatements(Dialect dialect);
 /// Creates all tables and indexes in an empty database.
 void createTables(db::Connection& database, Dialect dialect);
 /// Adds what a host stores before the first quote: settings, stages, colours and the network's insurer.

@@ -11,7 +11,15 @@ from wire import Type
 
 SYSTEM = """
 CREATE TABLE sys_of_columns (table_name, ordinal, name, type, size, scale, nullable, fallback, is_identity, key_place);
-CREATE TABLE sys_triggers (name, parent, events, body);
+CREATE TABLE sys_of_triggers (name, parent, events, body);
+CREATE VIEW sys_triggers AS SELECT name, OBJECT_ID(parent) AS parent_id FROM sys_of_triggers;
+CREATE VIEW sys_indexes AS
+    SELECT name, OBJECT_ID(tbl_name) AS object_id, rowid AS index_id FROM sqlite_master WHERE type='index';
+CREATE VIEW sys_index_columns AS
+    SELECT OBJECT_ID(m.tbl_name) AS object_id, m.rowid AS index_id, i.cid + 1 AS column_id, i.seqno + 1 AS key_ordinal
+    FROM sqlite_master m, pragma_index_info(m.name) i WHERE m.type='index';
+CREATE VIEW sys_databases AS SELECT DB_NAME() AS name, 150 AS compatibility_level;
+CREATE VIEW sys_dm_exec_sessions AS SELECT SPID() AS session_id, 'mdy' AS date_format;
 CREATE VIEW information_schema_tables AS
     SELECT DISTINCT 'standin' AS TABLE_CATALOG, 'dbo' AS TABLE_SCHEMA, table_name AS TABLE_NAME,
            'BASE TABLE' AS TABLE_TYPE FROM sys_of_columns;
@@ -30,7 +38,8 @@ CREATE VIEW information_schema_table_constraints AS
     SELECT DISTINCT TABLE_CATALOG, TABLE_SCHEMA, TABLE_NAME, CONSTRAINT_NAME, CONSTRAINT_SCHEMA,
            'PRIMARY KEY' AS CONSTRAINT_TYPE FROM information_schema_key_column_usage;
 """
-NUMBERS_OF_VIEWS = ("ordinal_position", "character_maximum_length", "numeric_precision", "numeric_scale")
+NUMBERS_OF_VIEWS = ("ordinal_position", "character_maximum_length", "numeric_precision", "numeric_scale", "parent_id",
+                    "compatibility_level", "session_id", "object_id", "index_id", "column_id", "key_ordinal")
 
 
 def key_of(text):
@@ -119,7 +128,11 @@ class Database:
         for function in (as_number, as_bit, as_datetime, as_code_page):
             add(function.__name__, 1, functools.partial(failing(function), self))
         add("OBJECT_ID", -1, lambda name, *_: self.object_id(name))
+        add("OBJECT_NAME", 1, self.object_name)
+        add("COL_NAME", 2, self.column_name)
         add("COLUMNPROPERTY", 3, self.column_property)
+        add("DATABASEPROPERTYEX", 2, lambda *_: "Latin1_General_CI_AS")
+        add("SESSIONPROPERTY", 1, lambda _: 1)
         add("DB_NAME", 0, lambda: "standin")
         add("SCHEMA_NAME", 0, lambda: "dbo")
         add("DATALENGTH", 1, lambda value: None if value is None else len(str(value).encode("cp1252", "replace")))
@@ -141,6 +154,15 @@ class Database:
         table = re.sub(r"[\[\]]", "", name).split(".")[-1]
         row = self.lite.execute("SELECT MIN(rowid) FROM sys_of_columns WHERE table_name=? COLLATE NOCASE", (table, ))
         return row.fetchone()[0]
+
+    def object_name(self, number):
+        row = self.lite.execute("SELECT table_name FROM sys_of_columns WHERE rowid=?", (number, )).fetchone()
+        return row and row[0]
+
+    def column_name(self, table, ordinal):
+        row = self.lite.execute("SELECT name FROM sys_of_columns WHERE table_name=? AND ordinal=?",
+                                (self.object_name(table), ordinal)).fetchone()
+        return row and row[0]
 
     def column_property(self, table, column, wanted):
         if wanted.lower() != "isidentity":
@@ -180,11 +202,11 @@ class Database:
             raise ServerError(3701, "Cannot drop the table '%s', because it does not exist." % name, 11)
         self.lite.execute('DROP TABLE "%s"' % name)
         self.lite.execute("DELETE FROM sys_of_columns WHERE table_name=? COLLATE NOCASE", (name, ))
-        self.lite.execute("DELETE FROM sys_triggers WHERE parent=? COLLATE NOCASE", (name, ))
+        self.lite.execute("DELETE FROM sys_of_triggers WHERE parent=? COLLATE NOCASE", (name, ))
 
     def triggers(self, table, verb):
         return [body for events, body in self.lite.execute(
-            "SELECT events, body FROM sys_triggers WHERE parent=? COLLATE NOCASE", (table, )) if verb in events]
+            "SELECT events, body FROM sys_of_triggers WHERE parent=? COLLATE NOCASE", (table, )) if verb in events]
 
 
 def column_of(declaration):

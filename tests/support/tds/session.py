@@ -74,6 +74,7 @@ class Session:
         self.identity = self.scope_identity = None
         self.row_count, self.variables = 0, {}
         self.database.lite.create_function("SCOPE_IDENTITY", 0, lambda: self.scope_identity)
+        self.database.lite.create_function("SPID", 0, lambda: self.number)
         self.database.lite.execute("PRAGMA busy_timeout=30000")
 
     def close(self):
@@ -248,9 +249,9 @@ class Session:
             match = re.match(r"CREATE\s+TRIGGER\s+\[?(\w+)\]?\s+ON\s+\[?(\w+)\]?\s+(?:AFTER|FOR)\s+([\w\s,]+?)\s+AS\s+"
                              r"(.*)", text, re.I | re.S)
             name, table, events, body = match.groups()
-            self.execute("INSERT INTO sys_triggers VALUES (?,?,?,?)", (name, table, events.upper(), body))
+            self.execute("INSERT INTO sys_of_triggers VALUES (?,?,?,?)", (name, table, events.upper(), body))
         elif what == "TRIGGER":
-            self.execute("DELETE FROM sys_triggers WHERE name=? COLLATE NOCASE", (text.split()[2].strip("[]"), ))
+            self.execute("DELETE FROM sys_of_triggers WHERE name=? COLLATE NOCASE", (text.split()[2].strip("[]"), ))
         else:
             self.execute(text)  # an index
         return wire.done()
@@ -260,7 +261,8 @@ class Session:
         return wire.done()
 
     STEPS = {"SET": set_option, "WAITFOR DELAY": wait_for, "BEGIN TRAN": transaction, "BEGIN TRANSACTION": transaction,
-             "COMMIT": transaction, "ROLLBACK": transaction, "CREATE": define, "ALTER": define, "DROP": define, "KILL": kill}
+             "COMMIT": transaction, "ROLLBACK": transaction, "CREATE": define, "ALTER": define,
+             "DROP": define, "KILL": kill}
     PROCEDURES = {"sp_getapplock": get_lock, "sp_releaseapplock": release_lock, "standin_silence": fall_silent,
                   "standin_copy": copy_database}
 

@@ -40,6 +40,7 @@ class Client(threading.Thread):
     def __init__(self, server, number, connection):
         super().__init__(daemon=True)
         self.server, self.number, self.connection, self.session = server, number, connection, None
+        self.stream = connection.makefile("rb")
 
     def run(self):
         try:
@@ -67,19 +68,17 @@ class Client(threading.Thread):
             self.connection.close()
 
     def receive(self):
-        message, last = b"", False
+        parts, last = [], False
         while not last:
             kind, status, length = struct.unpack(">BBH", self.read(8)[:4])
-            message, last = message + self.read(length - 8), status & 1
-        return kind, message
+            parts.append(self.read(length - 8))
+            last = status & 1
+        return kind, b"".join(parts)
 
     def read(self, length):
-        data = b""
-        while len(data) < length:
-            part = self.connection.recv(length - len(data))
-            if not part:
-                raise OSError("closed")
-            data += part
+        data = self.stream.read(length)
+        if len(data) < length:
+            raise OSError("closed")
         return data
 
     def send(self, tokens):

@@ -1,0 +1,46 @@
+#include "app/DatabaseCommand.h"
+
+#include "base/modDBAccess.h"
+#include "setup/CheckDatabase.h"
+
+#include <QJsonArray>
+
+namespace kest::app {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+QString wordFor(CheckedPoint::Result result)
+{
+    return result == CheckedPoint::Holds ? u"holds"_s : result == CheckedPoint::Fails ? u"fails"_s : u"skipped"_s;
+}
+
+}  // namespace
+
+Outcome checkDatabase(const QStringList&)
+{
+    const DatabaseCheck check = checkDatabase(anotherConnection);
+    QString text;
+    QJsonObject facts;
+    for (const auto& [name, value] : check.facts) {
+        facts[name] = value;
+        text += name + u": "_s + value + u'\n';
+    }
+    QJsonArray points;
+    text += u'\n';
+    for (const CheckedPoint& point : check.points) {
+        const QString result = wordFor(point.result);
+        points += QJsonObject{{u"point"_s, point.what}, {u"result"_s, result}, {u"why"_s, point.why}};
+        text += result.leftJustified(9) + point.what + (point.why.isEmpty() ? u"\n"_s : u": "_s + point.why + u'\n');
+    }
+    for (const QString& note : check.notes)
+        text += u"note     "_s + note + u'\n';
+    text += check.holds() ? u"\nThe database can be used.\n"_s : u"\nThe database can't be used as it is.\n"_s;
+    return {
+        .exitCode = check.holds() ? Done : Refused,
+        .fields = {{u"facts"_s, facts}, {u"points"_s, points}, {u"notes"_s, QJsonArray::fromStringList(check.notes)}},
+        .text = text};
+}
+
+}  // namespace kest::app

@@ -1,0 +1,13 @@
+// The command `check-database`.
+#pragma once
+
+#include "app/Outcome.h"
+
+#include <QStringList>
+
+namespace kest::app {
+
+/// Tries everything that the component relies on; a connection must be open. Refused if anything does not hold.
+Outcome checkDatabase(const QStringList& arguments);
+
+}  // namespace kest::app

@@ -1,0 +1,495 @@
+#include "setup/CheckDatabase.h"
+
+#include "platform/RuntimeError.h"
+#include "platform/database/Recordset.h"
+#include "platform/database/Sql.h"
+#include "platform/values.h"
+#include "setup/HostTables.h"
+
+#include <QElapsedTimer>
+#include <QRandomGenerator>
+
+#include <algorithm>
+#include <memory>
+
+namespace kest::app {
+
+using namespace Qt::StringLiterals;
+using db::Kind;
+using db::Recordset;
+
+namespace {
+
+constexpr int timeLimit = 2;         // seconds, for the statement that takes longer
+constexpr int givenUpWithin = 6000;  // milliseconds, of that statement
+
+/// What is different from server to server.
+struct Words {
+    QString identity;
+    QString text;      // of 20 characters
+    QString national;  // the same, with any letter
+    QString number;    // with 15 digits
+    QString flag;
+    QString longText;
+    QString olderLongText;
+    QString trigger;    // of the table %1, which counts in the table %2; empty if nobody else can make one
+    QString slow;       // takes longer than anyone waits
+    QString ownNumber;  // of a connection, for KILL; empty if there is no server
+    QList<std::pair<QString, QString>> facts;
+};
+
+const Words& wordsOf(Server server)
+{
+    static const Words embedded{.identity = u"INTEGER PRIMARY KEY AUTOINCREMENT"_s,
+                                .text = u"VARCHAR(20) COLLATE NOCASE"_s,
+                                .national = u"VARCHAR(20) COLLATE NOCASE"_s,
+                                .number = u"DOUBLE"_s,
+                                .flag = u"BOOLEAN"_s,
+                                .longText = u"LONGTEXT COLLATE NOCASE"_s,
+                                .olderLongText = u"LONGTEXT COLLATE NOCASE"_s,
+                                .trigger = {},
+                                .slow =
+                                    u"WITH RECURSIVE n(i) AS (SELECT 1 UNION ALL SELECT i + 1 FROM n) "
+                                    "SELECT COUNT(*) FROM n"_s,
+                                .ownNumber = {},
+                                .facts = {{u"server"_s, u"'SQLite ' + sqlite_version()"_s}}};
+    static const Words mySql{
+        .identity = u"INTEGER NOT NULL AUTO_INCREMENT PRIMARY KEY"_s,
+        .text = u"VARCHAR(20)"_s,
+        .national = u"VARCHAR(20)"_s,
+        .number = u"DOUBLE"_s,
+        .flag = u"BOOLEAN"_s,
+        .longText = u"LONGTEXT"_s,
+        .olderLongText = u"LONGTEXT"_s,
+        .trigger = u"CREATE TRIGGER %1_T AFTER INSERT ON %1 FOR EACH ROW INSERT INTO %2 (what) VALUES ('x')"_s,
+        .slow =
+            u"SELECT COUNT(*) FROM INFORMATION_SCHEMA.COLLATIONS a, INFORMATION_SCHEMA.COLLATIONS b, "
+            "INFORMATION_SCHEMA.COLLATIONS c, INFORMATION_SCHEMA.COLLATIONS d WHERE a.ID+b.ID+c.ID+d.ID=0"_s,
+        .ownNumber = u"CONNECTION_ID()"_s,
+        .facts = {
+            {u"server"_s, u"VERSION()"_s}, {u"collation"_s, u"@@collation_database"_s}, {u"mode"_s, u"@@sql_mode"_s}}};
+    static const Words sqlServer{
+        .identity = u"INT IDENTITY(1,1) NOT NULL PRIMARY KEY"_s,
+        .text = u"VARCHAR(20)"_s,
+        .national = u"NVARCHAR(20)"_s,
+        .number = u"FLOAT"_s,
+        .flag = u"BIT"_s,
+        .longText = u"VARCHAR(MAX)"_s,
+        .olderLongText = u"TEXT"_s,
+        .trigger = u"CREATE TRIGGER %1_T ON %1 AFTER INSERT, UPDATE AS INSERT INTO %2 (what) VALUES ('x')"_s,
+        .slow = u"WAITFOR DELAY '00:00:20'"_s,
+        .ownNumber = u"@@SPID"_s,
+        .facts = {{u"server"_s, u"@@VERSION"_s},
+                  {u"collation"_s, u"DATABASEPROPERTYEX(DB_NAME(), 'Collation')"_s},
+                  {u"compatibility level"_s, u"compatibility_level FROM sys.databases WHERE name=DB_NAME()"_s},
+                  {u"language"_s, u"@@LANGUAGE"_s},
+                  {u"date format"_s, u"date_format FROM sys.dm_exec_sessions WHERE session_id=@@SPID"_s},
+                  {u"ANSI nulls"_s, u"SESSIONPROPERTY('ANSI_NULLS')"_s}}};
+    return server == Server::Embedded ? embedded : server == Server::MySql ? mySql : sqlServer;
+}
+
+/// Why a point can't be tried here.
+struct Skip {
+    QString why;
+};
+
+class Check {
+public:
+    explicit Check(const std::function<db::ConnectionPtr()>& connect)
+        : connect_(connect),
+          ours_(connect()),
+          others_(connect()),
+          server_(serverOf(ours_)),
+          words_(wordsOf(server_)),
+          table_(u"KEST2_CHECK_%1"_s.arg(QRandomGenerator::global()->generate(), 8, 16, QChar(u'0')).toUpper()),
+          log_(table_ + u"_LOG"_s)
+    {
+    }
+    ~Check()
+    {
+        for (const QString& table : {table_, log_}) {
+            if (made_)
+                attempt([&] { others_->execute(u"DROP TABLE "_s + table); });
+        }
+    }
+    Check(const Check&) = delete;
+    Check& operator=(const Check&) = delete;
+
+    DatabaseCheck run();
+
+private:
+    // The points. Each notes what it finds wrong.
+    void makesTables();
+    void knowsColumns();
+    void numbersRows();
+    void bearsTriggers();
+    void writesChanges();
+    void noticesOthers();
+    void keepsTexts();
+    void keepsDatesAndNumbers();
+    void compares();
+    void keepsVersions();
+    void locks();
+    void givesUp();
+    void noticesLostConnections();
+
+    void point(const QString& what, const std::function<void()>& step);
+    void expect(bool holds, const QString& otherwise)
+    {
+        if (!holds)
+            wrong_ += otherwise;
+    }
+    Recordset rows(const QString& condition = u"1=1"_s) const;
+    void clear() const { ours_->execute(u"DELETE FROM "_s + table_); }
+    QString fact(const QString& expression) const;
+    void lookAtHost();
+
+    const std::function<db::ConnectionPtr()>& connect_;
+    db::ConnectionPtr ours_;
+    db::ConnectionPtr others_;  // of another workstation
+    const Server server_;
+    const Words& words_;
+    const QString table_;
+    const QString log_;
+    bool made_ = false;
+    QStringList wrong_;  // about the point in hand
+    DatabaseCheck check_;
+};
+
+DatabaseCheck Check::run()
+{
+    for (const auto& [name, expression] : words_.facts)
+        check_.facts.append({name, fact(expression)});
+
+    point(u"a table can be made"_s, [this] { makesTables(); });
+    const std::pair<QString, void (Check::*)()> points[] = {
+        {u"the columns of a query are known, in a join too"_s, &Check::knowsColumns},
+        {u"a new row gets its number and its defaults"_s, &Check::numbersRows},
+        {u"triggers change neither the number of a new row nor the count of changed rows"_s, &Check::bearsTriggers},
+        {u"a change is written, also one to the same value"_s, &Check::writesChanges},
+        {u"what someone else has changed is not overwritten"_s, &Check::noticesOthers},
+        {u"texts of any length come back letter by letter"_s, &Check::keepsTexts},
+        {u"dates and numbers come back as they were"_s, &Check::keepsDatesAndNumbers},
+        {u"a comparison means what it means on other databases"_s, &Check::compares},
+        {u"a row with a version column can be changed"_s, &Check::keepsVersions},
+        {u"a named lock keeps others out"_s, &Check::locks},
+        {u"a statement that takes too long is given up"_s, &Check::givesUp},
+        {u"a lost connection is noticed and can be opened again"_s, &Check::noticesLostConnections}};
+    for (const auto& [what, step] : points) {
+        point(what, [&] {
+            if (!made_)
+                throw Skip{u"there is no table to try it in"_s};
+            clear();
+            (this->*step)();
+        });
+    }
+    lookAtHost();
+    return check_;
+}
+
+void Check::point(const QString& what, const std::function<void()>& step)
+{
+    wrong_.clear();
+    CheckedPoint checked{.what = what, .result = CheckedPoint::Holds, .why = {}};
+    try {
+        step();
+    } catch (const Skip& skip) {
+        checked.result = CheckedPoint::Skipped;
+        checked.why = skip.why;
+    } catch (const RuntimeError& error) {
+        wrong_ += u"%1 %2"_s.arg(error.number()).arg(error.description());
+    }
+    if (!wrong_.isEmpty()) {
+        checked.result = CheckedPoint::Fails;
+        checked.why = wrong_.join(u"; "_s);
+    }
+    check_.points += checked;
+}
+
+Recordset Check::rows(const QString& condition) const
+{
+    Recordset rows(ours_);
+    rows.open(u"SELECT * FROM %1 WHERE %2 ORDER BY number"_s.arg(table_, condition));
+    return rows;
+}
+
+QString Check::fact(const QString& expression) const
+{
+    QString found;
+    try {
+        Recordset row(ours_);
+        row.open(u"SELECT "_s + expression);
+        found = row.eof() ? QString() : row.text(row.columns().constFirst());
+    } catch (const RuntimeError& error) {
+        found = u"not told: "_s + error.description();
+    }
+    return found.simplified();
+}
+
+void Check::makesTables()
+{
+    const QStringList columns{u"number "_s + words_.identity,
+                              u"code "_s + words_.text,
+                              u"local "_s + words_.national,
+                              u"seq INTEGER"_s,
+                              u"amount %1 DEFAULT 0"_s.arg(words_.number),
+                              u"price DECIMAL(10,2)"_s,
+                              u"flag %1 DEFAULT 0"_s.arg(words_.flag),
+                              u"day DATETIME"_s,
+                              u"notes "_s + words_.longText,
+                              u"remarks "_s + words_.olderLongText};
+    ours_->execute(u"CREATE TABLE %1 (%2)"_s.arg(table_, columns.join(u", "_s)));
+    made_ = true;
+    ours_->execute(u"CREATE TABLE %1 (number %2, what VARCHAR(20))"_s.arg(log_, words_.identity));
+    for (int i = 0; i < 5; ++i)  // so that its numbers are not those of the other table
+        ours_->execute(u"INSERT INTO %1 (what) VALUES ('x')"_s.arg(log_));
+}
+
+void Check::knowsColumns()
+{
+    const std::tuple<QString, Kind, int> expected[] = {
+        {u"number"_s, Kind::WholeNumber, 0}, {u"code"_s, Kind::Text, 20},    {u"local"_s, Kind::Text, 20},
+        {u"seq"_s, Kind::WholeNumber, 0},    {u"amount"_s, Kind::Number, 0}, {u"price"_s, Kind::Number, 0},
+        {u"flag"_s, Kind::Flag, 0},          {u"day"_s, Kind::Date, 0},      {u"notes"_s, Kind::LongText, 0},
+        {u"remarks"_s, Kind::LongText, 0}};
+    const Recordset all = rows();
+    for (const auto& [name, kind, size] : expected) {
+        expect(all.hasColumn(name) && all.kind(name) == kind, name + u" is taken for another kind"_s);
+        expect(all.hasColumn(name) && all.size(name) == size, u"the size of %1 is not known"_s.arg(name));
+    }
+    ours_->execute(u"INSERT INTO %1 (code, seq) VALUES ('a', 1)"_s.arg(table_));
+    Recordset joined(ours_);
+    joined.open(u"SELECT L.*, T.code FROM %1 T INNER JOIN %2 L ON L.number=T.seq"_s.arg(table_, log_));
+    joined.set(u"what"_s, u"y"_s);
+    joined.set(u"code"_s, u"b"_s);
+    joined.update();
+    expect(rows(u"code='b'"_s).recordCount() == 1, u"a change in a join did not reach its table"_s);
+}
+
+void Check::numbersRows()
+{
+    Recordset all = rows();
+    all.addNew();
+    all.set(u"code"_s, u"a"_s);
+    all.update();
+    const Recordset stored = rows(u"code='a'"_s);
+    expect(stored.value(u"number"_s) == all.value(u"number"_s), u"the number is another one"_s);
+    expect(all.value(u"amount"_s) == QVariant(0.0) && all.value(u"flag"_s) == QVariant(false),
+           u"the defaults are not read back"_s);
+    all.addNew();  // nothing set
+    all.update();
+    expect(rows().recordCount() == 2, u"a row of defaults is not written"_s);
+}
+
+void Check::bearsTriggers()
+{
+    if (words_.trigger.isEmpty())
+        throw Skip{u"nobody else has triggers in this database"_s};
+    try {
+        ours_->execute(words_.trigger.arg(table_, log_));
+    } catch (const RuntimeError& error) {
+        throw Skip{u"no trigger can be made: "_s + error.description()};
+    }
+    Recordset all = rows();
+    all.addNew();
+    all.set(u"code"_s, u"a"_s);
+    all.update();
+    const Recordset stored = rows(u"code='a'"_s);
+    expect(stored.value(u"number"_s) == all.value(u"number"_s), u"a new row gets the number of the trigger's row"_s);
+    all.set(u"seq"_s, 5);
+    all.update();
+    const qint64 none = ours_->execute(u"UPDATE %1 SET seq=1 WHERE code='nothing'"_s.arg(table_));
+    expect(none == 0, u"an update that hits no row counts as %1"_s.arg(none));
+    attempt([&] { ours_->execute(u"DROP TRIGGER %1_T"_s.arg(table_)); });
+}
+
+void Check::writesChanges()
+{
+    ours_->execute(u"INSERT INTO %1 (code, seq) VALUES ('a', 1)"_s.arg(table_));
+    for (const int seq : {1, 1, 2}) {
+        const qint64 hit = ours_->execute(u"UPDATE %1 SET seq=%2"_s.arg(table_).arg(seq));
+        expect(hit == 1, u"an update of one row counts as %1"_s.arg(hit));
+    }
+    expect(ours_->execute(u"DELETE FROM "_s + table_) == 1, u"a deletion of one row does not count as one"_s);
+}
+
+void Check::noticesOthers()
+{
+    const std::tuple<QString, QString, QString, QVariant> changes[] = {
+        {u"code"_s, u"'a'"_s, u"'b'"_s, u"c"_s},
+        {u"local"_s, u"NULL"_s, u"'b'"_s, u"c"_s},
+        {u"seq"_s, u"1"_s, u"2"_s, 3},
+        {u"flag"_s, u"0"_s, u"1"_s, QVariant()},
+        {u"day"_s, u"'2026-02-28T13:05:59'"_s, u"NULL"_s, columnDate(QDate(2026, 3, 1), {})},
+        {u"notes"_s, u"'a'"_s, u"'A'"_s, u"c"_s},
+        {u"remarks"_s, u"'a'"_s, u"NULL"_s, u"c"_s}};
+    for (const auto& [column, before, theirs, own] : changes) {
+        clear();
+        ours_->execute(u"INSERT INTO %1 (%2) VALUES (%3)"_s.arg(table_, column, before));
+        Recordset row = rows();
+        row.set(column, own);
+        others_->execute(u"UPDATE %1 SET %2=%3"_s.arg(table_, column, theirs));
+        int failure = 0;
+        try {
+            row.update();
+        } catch (const RuntimeError& error) {
+            failure = error.number();
+        }
+        row.cancelUpdate();
+        expect(failure == RowChanged, u"%1 is overwritten (%2)"_s.arg(column).arg(failure));
+    }
+}
+
+void Check::keepsTexts()
+{
+    const QString letters = u"Zoë's \"50 % [off]\" {}; \\ € ´"_s.left(20);
+    Recordset row = rows();
+    row.addNew();
+    for (const QString& text : {letters, u"x"_s, u""_s}) {
+        row.set(u"code"_s, text);
+        row.set(u"local"_s, text);
+        row.update();
+        expect(rows().text(u"code"_s) == text && rows().text(u"local"_s) == text,
+               u"\"%1\" came back as \"%2\""_s.arg(text, rows().text(u"code"_s)));
+    }
+    for (const int length : {254, 255, 256, 4001, 8001, 65'536, 65'537, 200'000}) {
+        const QString text = QString(length - 3, u'x') + u"é€\n"_s;
+        row.set(u"notes"_s, text);
+        row.set(u"remarks"_s, text);
+        row.update();
+        const Recordset stored = rows();
+        for (const QString& column : {u"notes"_s, u"remarks"_s}) {
+            expect(!stored.isNull(column) && stored.text(column) == text,
+                   stored.isNull(column) ? u"%1 letters came back as Null"_s.arg(length)
+                                         : u"of %1 letters %2 came back"_s.arg(length).arg(stored.text(column).size()));
+        }
+    }
+}
+
+void Check::keepsDatesAndNumbers()
+{
+    Recordset row = rows();
+    row.addNew();
+    const QDateTime moments[] = {columnDate(QDate(2026, 12, 1), QTime(0, 0)),
+                                 columnDate(QDate(2026, 1, 12), QTime(13, 45, 7)),
+                                 columnDate(QDate(1999, 12, 31), QTime(23, 59, 59))};
+    for (const QDateTime& moment : moments) {
+        row.set(u"day"_s, moment);
+        row.update();
+        expect(rows().value(u"day"_s) == QVariant(moment),
+               u"%1 came back as %2"_s.arg(toText(moment), rows().text(u"day"_s)));
+        expect(rows(sql("day='{}'", moment)).recordCount() == 1, toText(moment) + u" is not found"_s);
+    }
+    for (const double number : {0.1, -1234567.89, 0.0}) {
+        row.set(u"amount"_s, number);
+        row.set(u"price"_s, number);
+        row.update();
+        expect(
+            rows().value(u"amount"_s) == QVariant(number) && rows().text(u"price"_s) == numberText(number),
+            u"%1 came back as %2 and %3"_s.arg(numberText(number), rows().text(u"amount"_s), rows().text(u"price"_s)));
+    }
+}
+
+void Check::compares()
+{
+    for (const QString& values :
+         {u"'Red', 0, 1"_s, u"'red  ', 5, 0"_s, u"'a[b', NULL, 0"_s, u"'', 7, 0"_s, u"'it''s', 10, 0"_s})
+        ours_->execute(u"INSERT INTO %1 (code, seq, flag) VALUES (%2)"_s.arg(table_, values));
+    const std::pair<QString, int> conditions[] = {
+        {u"code='RED'"_s, 2},     {u"code='red '"_s, 2},       {u"code LIKE 'RE_'"_s, 2},
+        {u"code LIKE '%D'"_s, 2}, {u"code LIKE 'a[[]b'"_s, 1}, {u"code=''"_s, 1},
+        {u"code='it''s'"_s, 1},   {u"code<>'red'"_s, 3},       {u"seq=''"_s, 1},
+        {u"seq='5'"_s, 1},        {u"seq='5x'"_s, 0},          {u"seq<>'x'"_s, 4},
+        {u"seq IS NULL"_s, 1},    {u"flag=TRUE"_s, 1},         {u"code IN ('RED', 'IT''S')"_s, 3}};
+    for (const auto& [condition, expected] : conditions) {
+        const int found = rows(condition).recordCount();
+        expect(found == expected, u"%1 finds %2 rows, not %3"_s.arg(condition).arg(found).arg(expected));
+    }
+    Recordset newest(ours_);
+    newest.open(u"SELECT TOP 1 code + ' and ' + code AS joined FROM %1 WHERE seq=10"_s.arg(table_));
+    expect(newest.text(u"joined"_s) == u"it's and it's"_s, u"texts are not joined"_s);
+}
+
+void Check::keepsVersions()
+{
+    if (server_ != Server::SqlServer)
+        throw Skip{u"only SQL Server has such columns"_s};
+    const QString versioned = table_ + u"_V"_s;
+    ours_->execute(u"CREATE TABLE %1 (code VARCHAR(20), version TIMESTAMP)"_s.arg(versioned));
+    try {
+        ours_->execute(u"INSERT INTO %1 (code) VALUES ('a')"_s.arg(versioned));
+        Recordset row(ours_);
+        row.open(u"SELECT * FROM "_s + versioned);
+        row.set(u"code"_s, u"b"_s);
+        row.update();
+    } catch (const RuntimeError& error) {
+        expect(false, error.description());
+    }
+    ours_->execute(u"DROP TABLE "_s + versioned);
+}
+
+void Check::locks()
+{
+    {
+        const db::Lock held(ours_, table_);
+        expect(held.isHeld(), u"a lock is refused that nobody holds"_s);
+        expect(!db::Lock(others_, table_).isHeld(), u"two connections hold one lock"_s);
+    }
+    expect(db::Lock(others_, table_).isHeld(), u"a lock stays when its holder lets go"_s);
+}
+
+void Check::givesUp()
+{
+    ours_->setCommandTimeout(timeLimit);
+    QElapsedTimer time;
+    time.start();
+    const bool isGivenUp = !attempt([&] {
+        if (words_.slow.contains(u"SELECT"_s))
+            Recordset(ours_).open(words_.slow);
+        else
+            ours_->execute(words_.slow);
+    });
+    expect(isGivenUp && time.elapsed() < givenUpWithin,
+           u"with a limit of %1 seconds it took %2 milliseconds"_s.arg(timeLimit).arg(time.elapsed()));
+    expect(ours_->state() == 1, u"the connection was lost with it"_s);
+    ours_ = connect_();
+}
+
+void Check::noticesLostConnections()
+{
+    if (words_.ownNumber.isEmpty())
+        throw Skip{u"there is no server that could drop it"_s};
+    const QString number = fact(words_.ownNumber);
+    try {
+        others_->execute(u"KILL "_s + number);
+    } catch (const RuntimeError& error) {
+        throw Skip{u"this user may end no connection: "_s + error.description()};
+    }
+    expect(!ours_->answers(), u"a connection that the server has dropped counts as open"_s);
+    ours_ = connect_();
+    expect(ours_->answers(), u"it can't be opened again"_s);
+}
+
+void Check::lookAtHost()
+{
+    point(u"the quote tables have every column that is used"_s, [this] {
+        const HostTables host = lookAtHostTables(ours_);
+        wrong_ = host.missing;
+        check_.notes = host.notes;
+    });
+}
+
+}  // namespace
+
+bool DatabaseCheck::holds() const
+{
+    return std::none_of(points.begin(), points.end(),
+                        [](const CheckedPoint& point) { return point.result == CheckedPoint::Fails; });
+}
+
+DatabaseCheck checkDatabase(const std::function<db::ConnectionPtr()>& connect)
+{
+    return Check(connect).run();
+}
+
+}  // namespace kest::app

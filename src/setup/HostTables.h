@@ -1,0 +1,22 @@
+// Compares the quote tables that a host made with those that the component uses. Reads only.
+#pragma once
+
+#include "platform/database/Connection.h"
+
+#include <QStringList>
+
+namespace kest::app {
+
+/// A kind of server. MySql is also MariaDB, and either of them through ODBC.
+enum class Server { Embedded, MySql, SqlServer };
+
+Server serverOf(const db::ConnectionPtr& connection);
+
+struct HostTables {
+    QStringList missing;  // tables and columns that are not there, or hold another kind of value
+    QStringList notes;    // what works, but is worth knowing: no key, triggers, shorter columns
+};
+
+HostTables lookAtHostTables(const db::ConnectionPtr& connection);
+
+}  // namespace kest::app

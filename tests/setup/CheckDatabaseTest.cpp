@@ -1,0 +1,76 @@
+// The check of a database: it tells what does not hold, changes nothing, and leaves nothing behind.
+#include "base/modDBAccess.h"
+#include "platform/database/FaultInjection.h"
+#include "platform/database/Session.h"
+#include "setup/CheckDatabase.h"
+#include "setup/QuoteDatabase.h"
+#include "support/Shop.h"
+#include "support/Snapshot.h"
+
+namespace kest::test {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+/// What failed, and why.
+std::string failures(const std::function<db::ConnectionPtr()>& connect = anotherConnection)
+{
+    QStringList texts;
+    for (const app::CheckedPoint& point : app::checkDatabase(connect).points) {
+        if (point.result == app::CheckedPoint::Fails)
+            texts += point.what + u": "_s + point.why;
+    }
+    return texts.join(u'\n').toStdString();
+}
+
+class CheckedDatabase : public Shop {
+protected:
+    ~CheckedDatabase() override { db::setStatementFault({}); }
+
+    static QStringList tables()
+    {
+        QStringList names = anotherConnection()->session().engine().tableNames();
+        names.sort();
+        return names;
+    }
+};
+
+}  // namespace
+
+TEST_F(CheckedDatabase, HoldsAndIsLeftAsItWas)
+{
+    quote("500").line(1);
+    const QStringList before = tables();
+    const std::string held = holdings();
+    EXPECT_EQ(failures(), "");
+    EXPECT_EQ(tables(), before);
+    EXPECT_EQ(holdings(), held);
+}
+
+TEST_F(CheckedDatabase, AFailureOnTheWayIsToldAndLeavesNoTable)
+{
+    const QStringList before = tables();
+    int count = 0;
+    db::setStatementFault([&] { return ++count == 20; });
+    EXPECT_NE(failures(), "");
+    db::setStatementFault({});
+    EXPECT_GT(count, 20);
+    EXPECT_EQ(tables(), before);
+}
+
+TEST(IncompleteDatabase, EachMissingTableAndColumnIsNamed)
+{
+    const TestProfile profile;
+    const auto connect = [] { return app::openEmbedded(u"incomplete"_s); };
+    const db::ConnectionPtr database = connect();
+    app::createTables(*database, app::Dialect::Embedded);
+    database->execute(u"DROP TABLE SUBLET"_s);
+    database->execute(u"DROP TABLE KESTColours"_s);
+    database->execute(u"CREATE TABLE KESTColours (Code VARCHAR(10), Script DATETIME)"_s);
+    EXPECT_EQ(failures(connect),
+              "the quote tables have every column that is used: there is no column KESTColours.id; KESTColours.Script "
+              "holds another kind of value; there is no table SUBLET");
+}
+
+}  // namespace kest::test
