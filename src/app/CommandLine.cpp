@@ -62,7 +62,8 @@ QString usage()
   joblink set --server S --port N --database D --user U     the password is read from standard input
   view unread|read|sent FILE    the indented text of a message
   history QTNNO [SUBQUOTE]      what changed a quote: when, by which message, and from what to what
-  check-database                try on the quote database everything that is relied on, in scratch tables
+  check-database [--prepare]    try on the quote database everything that is relied on, in scratch tables;
+                                --prepare first creates missing indexes
   setting list | get APP SECTION KEY | set APP SECTION KEY VALUE     a password is read from standard input
   transport [--once|--window]   carry files between the message folders and an insurer that follows insurer.rules
 

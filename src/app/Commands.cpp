@@ -264,7 +264,7 @@ const std::map<QString, Command> commands{
     {u"joblink"_s, {Needs::Connection, 1, 9, with(jobLink)}},
     {u"history"_s, {Needs::Connection, 1, 2, with(history)}},
     {u"transport"_s, {Needs::Profile, 0, 1, transport}},
-    {u"check-database"_s, {Needs::Connection, 0, 0, with(checkDatabase)}},
+    {u"check-database"_s, {Needs::Connection, 0, 1, with(checkDatabase)}},
 };
 
 bool showsTransport(const CommandLine& line)

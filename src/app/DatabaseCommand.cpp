@@ -1,7 +1,9 @@
 #include "app/DatabaseCommand.h"
 
 #include "base/modDBAccess.h"
+#include "platform/Prompt.h"
 #include "setup/CheckDatabase.h"
+#include "setup/PrepareDatabase.h"
 
 #include <QJsonArray>
 
@@ -16,10 +18,29 @@ QString wordFor(CheckedPoint::Result result)
     return result == CheckedPoint::Holds ? u"holds"_s : result == CheckedPoint::Fails ? u"fails"_s : u"skipped"_s;
 }
 
+/// Shows the statements that create what the database lacks, and executes them unless the answer is No.
+void prepare(const db::ConnectionPtr& connection)
+{
+    const QList<MissingPart> parts = missingParts(connection);
+    if (parts.isEmpty())
+        return;
+    QString statements;
+    for (const MissingPart& part : parts)
+        statements += part.statements.join(u";\n"_s) + u";\n"_s;
+    if (desktop::ask(u"These statements create what the database lacks:\n\n"_s + statements + u"\nExecute them?"_s,
+                     desktop::Icon::Question, u"check-database"_s))
+        createParts(connection, parts);
+}
+
 }  // namespace
 
-Outcome checkDatabase(const QStringList&)
+Outcome checkDatabase(const QStringList& arguments)
 {
+    if (!arguments.isEmpty()) {
+        if (arguments[0] != u"--prepare"_s)
+            return refused(u"check-database takes only --prepare"_s, Usage);
+        prepare(gcnDB);
+    }
     const DatabaseCheck check = checkDatabase(anotherConnection);
     QString text;
     QJsonObject facts;

@@ -51,6 +51,13 @@ QString odbcOptions()
     return qEnvironmentVariable("KEST2_ODBC_OPTIONS", splashSetting(prefix + u"OdbcOptions"_s));
 }
 
+void open(db::Connection& connection, int driverNumber)
+{
+    connection.setCommandTimeout(commandTimeout());
+    connection.setOdbcOptions(odbcOptions());
+    connection.open(connectionText(driverNumber));
+}
+
 }  // namespace
 
 void readConnectionSettings()
@@ -117,9 +124,7 @@ void OpenDatabase()
             readConnectionSettings();
             settings::check();  // a damaged file must not open the database of the default settings
             gcnDB->close();
-            gcnDB->setCommandTimeout(commandTimeout());
-            gcnDB->setOdbcOptions(odbcOptions());
-            gcnDB->open(connectionText(driverNumber()));
+            open(*gcnDB, driverNumber());
         } catch (const RuntimeError& error) {
             lastFailure = error;
             if (error.description() != failureBefore)  // only once, because each event of an open window tries again
@@ -175,8 +180,7 @@ std::optional<db::Recordset> OpenRecordset(const QString& select, bool disconnec
 db::ConnectionPtr anotherConnection()
 {
     auto connection = std::make_shared<db::Connection>();
-    connection->open(connectionText(driverNumber(CopyUp::No)));
-    connection->setCommandTimeout(commandTimeout);
+    open(*connection, driverNumber(CopyUp::No));
     return connection;
 }
 

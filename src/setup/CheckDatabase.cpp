@@ -5,6 +5,7 @@
 #include "platform/database/Sql.h"
 #include "platform/values.h"
 #include "setup/HostTables.h"
+#include "setup/PrepareDatabase.h"
 
 #include <QElapsedTimer>
 #include <QRandomGenerator>
@@ -476,6 +477,8 @@ void Check::lookAtHost()
         const HostTables host = lookAtHostTables(ours_);
         wrong_ = host.missing;
         check_.notes = host.notes;
+        for (const MissingPart& part : missingParts(ours_))
+            check_.notes += u"there is no %1; --prepare creates it"_s.arg(part.what);
     });
 }
 

@@ -3,6 +3,8 @@
 #include "platform/database/FaultInjection.h"
 #include "platform/database/Session.h"
 #include "setup/CheckDatabase.h"
+#include "setup/HostTables.h"
+#include "setup/PrepareDatabase.h"
 #include "setup/QuoteDatabase.h"
 #include "support/Shop.h"
 #include "support/Snapshot.h"
@@ -46,6 +48,25 @@ TEST_F(CheckedDatabase, HoldsAndIsLeftAsItWas)
     EXPECT_EQ(failures(), "");
     EXPECT_EQ(tables(), before);
     EXPECT_EQ(holdings(), held);
+}
+
+TEST_F(CheckedDatabase, GetsTheIndexesThatItLacksAndKeepsThoseThatServe)
+{
+    const db::ConnectionPtr database = anotherConnection();
+    app::createParts(database, app::missingParts(database));  // a server's may lack them, as a host's
+    const bool isEmbedded = app::serverOf(database) == app::Server::Embedded;
+    database->execute(isEmbedded ? u"DROP INDEX QUOTE2_QUOTE"_s : u"DROP INDEX QUOTE2_QUOTE ON QUOTE2"_s);
+    database->execute(isEmbedded ? u"DROP INDEX QUOTE1_QTNNO"_s : u"DROP INDEX QUOTE1_QTNNO ON QUOTE1"_s);
+    database->execute(u"CREATE INDEX OTHER ON QUOTE1 (QTNNO, REGO)"_s);
+
+    const QList<app::MissingPart> missing = app::missingParts(database);
+    ASSERT_EQ(missing.size(), 1);
+    EXPECT_EQ(missing[0].what, u"index of QUOTE2 by QTNNO, Subquote"_s);
+    app::createParts(database, missing);
+    EXPECT_TRUE(app::missingParts(database).isEmpty());
+
+    database->execute(isEmbedded ? u"DROP INDEX OTHER"_s : u"DROP INDEX OTHER ON QUOTE1"_s);
+    app::createParts(database, app::missingParts(database));
 }
 
 TEST_F(CheckedDatabase, AFailureOnTheWayIsToldAndLeavesNoTable)
