@@ -252,6 +252,8 @@ class Session:
             self.execute("INSERT INTO sys_of_triggers VALUES (?,?,?,?)", (name, table, events.upper(), body))
         elif what == "TRIGGER":
             self.execute("DELETE FROM sys_of_triggers WHERE name=? COLLATE NOCASE", (text.split()[2].strip("[]"), ))
+        elif (verb, what) == ("DROP", "INDEX"):
+            self.execute(re.sub(r"\s+ON\s.*", "", text, flags=re.I))
         else:
             self.execute(text)  # an index
         return wire.done()
