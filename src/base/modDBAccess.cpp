@@ -160,6 +160,12 @@ QString connectionText(int driverNumber)
     }
 }
 
+QString databaseDescription()
+{
+    const QString embedded = db::embeddedName(connectionText(driverNumber(CopyUp::No)));
+    return embedded.isEmpty() ? gsDatabase + u" on "_s + gsServer + u' ' + gsInstance : embedded + u" (embedded)"_s;
+}
+
 std::optional<db::Recordset> OpenRecordset(const QString& select, bool disconnect, bool reconnect)
 {
     if (reconnect)

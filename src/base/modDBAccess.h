@@ -31,6 +31,8 @@ void readConnectionSettings();
 /// Returns the connection text for a driver, made from the variables above, or an empty text if there is no such
 /// driver.
 QString connectionText(int driverNumber);
+/// Returns which database the settings choose and how it is reached, without its password.
+QString databaseDescription();
 /// Returns the number of the driver that the settings choose.
 int driverNumber(CopyUp copyUp = CopyUp::Yes);
 /// Opens a query on a new recordset. If there is no connection, shows a critical box and returns nothing.

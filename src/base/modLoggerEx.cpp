@@ -79,6 +79,15 @@ QString errorLogPath()
     return profile::componentFolder() + u"/kest2error.log"_s;
 }
 
+QString lastLogRecord()
+{
+    if (!files::exists(errorLogPath()))
+        return {};
+    const QString log = files::read(errorLogPath());
+    const qsizetype mark = log.lastIndexOf(u": Line No: "_s);
+    return mark < 0 ? QString() : log.mid(log.lastIndexOf(u'\n', mark) + 1).trimmed();
+}
+
 QString QuoteClean(const QString& text)
 {
     qsizetype first = 0;

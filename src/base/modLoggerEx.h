@@ -23,6 +23,8 @@ void logFailure(const RuntimeError& error, const QString& source);
 bool LogIsFull(const QString& path);
 /// Returns the path of the error log.
 QString errorLogPath();
+/// Returns the last record of the error log, or an empty text if there is none.
+QString lastLogRecord();
 
 /// Removes blanks at both ends and replaces double quotes by single ones.
 QString QuoteClean(const QString& text);

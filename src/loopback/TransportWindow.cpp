@@ -1,9 +1,9 @@
 #include "loopback/TransportWindow.h"
 
+#include "platform/desktop/Lists.h"
 #include "platform/desktop/Window.h"
 
 #include <QHBoxLayout>
-#include <QHeaderView>
 #include <QLabel>
 #include <QPushButton>
 #include <QTime>
@@ -26,13 +26,10 @@ TransportWindow::TransportWindow(const TransportFolders& folders)
     carriedList->setObjectName(u"carriedList"_s);
     carriedList->setAccessibleName(u"Carried files"_s);
     carriedList->setHeaderLabels({u"Time"_s, u"Direction"_s, u"File"_s, u"What it is"_s});
-    carriedList->setRootIsDecorated(false);
-    carriedList->setUniformRowHeights(true);
+    desktop::prepareList(*carriedList, objectName());
     carriedList->setColumnWidth(0, desktop::pixels(1200));
     carriedList->setColumnWidth(1, desktop::pixels(1400));
     carriedList->setColumnWidth(2, desktop::pixels(3900));
-    carriedList->setColumnWidth(3, desktop::pixels(4600));
-    carriedList->header()->setStretchLastSection(false);
     heading->setBuddy(carriedList);
 
     status = new QLabel(this);

@@ -85,6 +85,7 @@ void frmMessageList::buildControls()
     ListView1->setAccessibleName(u"Messages"_s);
     messages = new MessageListModel(this);
     ListView1->setModel(messages);
+    ListView1->setSelectionMode(QAbstractItemView::ExtendedSelection);  // for copying; the buttons use the current row
     desktop::prepareList(*ListView1, objectName());
     ListView1->header()->setSortIndicatorClearable(true);  // back to the order of the folder
     for (size_t i = 0; i < columnWidths.size(); ++i)
@@ -104,6 +105,7 @@ void frmMessageList::buildControls()
     cmdView = named(new QPushButton(u"&View"_s), u"cmdView"_s, u"Show the message's text"_s);
     Command6 = named(new QPushButton(u"&Delete"_s), u"Command6"_s, u"Remove the message's file (Del)"_s);
     cmdExit = desktop::exitButton(this, u"cmdExit"_s, u"Close (Esc)"_s);
+    desktop::addListMenu(*ListView1, objectName(), {cmdProcess, cmdPrint, cmdView, Command6});
 
     tmrRefresh = new QTimer(this);
     tmrRefresh->setObjectName(u"tmrRefresh"_s);

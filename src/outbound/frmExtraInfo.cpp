@@ -101,6 +101,7 @@ void frmExtraInfo::build()
     buttons->addStretch();
     buttons->addWidget(Command1);
     layout->addRow(buttons);
+    fixSize();
 
     lvColour = new QTreeWidget(this);
     lvColour->setObjectName("lvColour"_L1);

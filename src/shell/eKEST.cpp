@@ -31,11 +31,19 @@ void reportUntrapped(const RuntimeError& error, const QString& source)
     LogError(error, source, source.mid(source.indexOf(u'.') + 1));
 }
 
+QString about()
+{
+    const QString lastError = lastLogRecord();
+    return u"KEST2 " KEST_VERSION "\nProfile: "_s + profile::root() + u"\nDatabase: "_s + databaseDescription() +
+           u"\nError log: "_s + errorLogPath() + u"\nLast error: "_s + (lastError.isEmpty() ? u"none"_s : lastError);
+}
+
 }  // namespace
 
 eKEST::eKEST()
 {
     ++objects;
+    desktop::setAbout(about);
     desktop::setFailureReporter(reportUntrapped);
     gConn = GetConnection();
     gsUnreadPath = homeFolder() + u"AUnread\\"_s;

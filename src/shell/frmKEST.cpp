@@ -13,6 +13,7 @@
 #include "utilities/frmLogin.h"
 #include "utilities/frmUtilities.h"
 
+#include <QAction>
 #include <QEvent>
 #include <QFrame>
 #include <QHBoxLayout>
@@ -70,7 +71,14 @@ frmKEST::frmKEST() : Form(u"frmKEST"_s, u"ORLA Partner Network"_s)
     layout->addWidget(lblQuote);
     layout->addWidget(frame);
     layout->addLayout(buttons);
-    setMinimumWidth(desktop::pixels(4200));
+    frame->setMinimumWidth(desktop::pixels(4200) - layout->contentsMargins().left() -
+                           layout->contentsMargins().right());
+    fixSize();
+
+    auto* about = new QAction(u"&About KEST2\tF1"_s, this);
+    desktop::onEvent(about, &QAction::triggered, this, u"frmKEST.mnuAbout_Click"_s, desktop::showAbout);
+    addAction(about);
+    setContextMenuPolicy(Qt::ActionsContextMenu);
 
     Form_Load();
 }

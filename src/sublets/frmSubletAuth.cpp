@@ -37,7 +37,6 @@ frmSubletAuth::frmSubletAuth(const QList<SubletDocument>& documents)
     ListView1->setHeaderLabels({u"Description"_s, u"Vendor"_s});
     desktop::prepareList(*ListView1, objectName());
     ListView1->header()->resizeSection(0, desktop::pixels(5000));
-    ListView1->header()->setStretchLastSection(true);
     for (const SubletDocument& document : documents) {
         auto* item = new QTreeWidgetItem(ListView1, {document.description, document.vendor});
         item->setData(0, keyRole, u'K' + document.lineNumber);
@@ -52,6 +51,8 @@ frmSubletAuth::frmSubletAuth(const QList<SubletDocument>& documents)
     Command1->setDefault(true);
     Command2->setObjectName("Command2"_L1);
     Command2->setText(u"&Close"_s);
+
+    desktop::addListMenu(*ListView1, objectName(), {Command1});
 
     auto* buttons = new QHBoxLayout;
     buttons->addStretch();

@@ -84,6 +84,7 @@ frmLogin::frmLogin()
     layout->addLayout(question);
     layout->addStretch();
     layout->addLayout(buttons);
+    fixSize();
 
     desktop::onEvent(txtPassword, &QLineEdit::textChanged, this, u"frmLogin.txtPassword_Change"_s,
                      [this] { txtPassword_Change(); });

@@ -28,6 +28,7 @@ public:
                     window.close();
                 return true;
             }
+            bool isLikeAPerson() const override { return true; }
             std::map<QString, Work> works;
         };
         const auto driver = std::make_shared<Driver>();

@@ -1,5 +1,7 @@
 // Tests what a person can expect of every window: a key for everything, readable texts at any size, and names for
 // screen readers.
+#include "base/modLoggerEx.h"
+#include "platform/profile.h"
 #include "platform/script/Gestures.h"
 #include "windows/EveryWindow.h"
 
@@ -95,7 +97,77 @@ TEST_F(EveryWindow, IsLeftByEscapeAsByItsCloseBox)
     });
 }
 
+TEST_F(EveryWindow, PressesTheButtonThatHasTheFocusByEnter)
+{
+    each([](QDialog& window) {
+        for (QWidget* control : controlsOf(window)) {
+            auto* button = qobject_cast<QAbstractButton*>(control);
+            if (!button || button->isCheckable())
+                continue;
+            const auto* expected = window.objectName() == "frmKEST"_L1 ? "cmdOK" : nullptr;  // everywhere in the panel
+            QStringList pressed;
+            for (QAbstractButton* any : window.findChildren<QAbstractButton*>()) {
+                any->disconnect(SIGNAL(clicked(bool)));
+                QObject::connect(any, &QAbstractButton::clicked, any, [&, any] { pressed.append(any->text()); });
+            }
+            button->setFocus();
+            gestures::press(window, Qt::Key_Return);
+            for (QAbstractButton* any : window.findChildren<QAbstractButton*>())
+                any->disconnect(SIGNAL(clicked(bool)));
+            const auto* taker = expected ? window.findChild<QAbstractButton*>(QLatin1StringView(expected)) : button;
+            EXPECT_EQ(pressed, QStringList(taker->text())) << nameOf(*button);
+        }
+    });
+}
+
+TEST_F(EveryWindow, TellsVersionProfileDatabaseAndLastErrorByF1)
+{
+    logFailure(RuntimeError(FileNotFound, u"the last straw"_s), u"a test"_s);
+    each([&](QDialog& window) {
+        if (!window.objectName().startsWith("frm"_L1))
+            return;
+        gestures::press(window, Qt::Key_F1);
+        const QString about = desktop->boxes().last();
+        for (const QString& part : {u"KEST2 " KEST_VERSION ""_s, profile::root(), u"WirSql (embedded)"_s, u"straw"_s})
+            EXPECT_TRUE(about.contains(part)) << about.toStdString();
+    });
+}
+
+TEST_F(EveryWindow, HasTextsAndRowsThatCanBeCopied)
+{
+    each([](QDialog& window) {
+        const bool isBox = !window.findChild<QTreeView*>();
+        for (auto* list : window.findChildren<QTreeView*>())
+            if (list->isVisible()) {
+                EXPECT_TRUE(list->header()->stretchLastSection());
+                list->setFocus();
+            }
+        if (window.objectName().startsWith("frm"_L1) && isBox)
+            return;
+        QGuiApplication::clipboard()->clear();
+        gestures::press(window, Qt::CTRL | Qt::Key_C);
+        const QString copied = QGuiApplication::clipboard()->text();
+        const auto* list = window.findChild<QTreeView*>();
+        if (list && list->currentIndex().isValid()) {
+            EXPECT_EQ(copied.count(u'\t'), list->header()->count() - 1) << copied.toStdString();
+        } else if (!list) {
+            EXPECT_TRUE(copied.startsWith(window.windowTitle() + u'\n')) << copied.toStdString();
+        }
+        for (const QLabel* label : window.findChildren<QLabel*>())
+            EXPECT_TRUE(list || label->text().isEmpty() || label->textInteractionFlags() & Qt::TextSelectableByMouse);
+    });
+}
+
 // --- Sizes ---
+
+TEST_F(EveryWindow, HasAnIconAndIsStretchedOnlyIfItProfits)
+{
+    const QStringList fixed{u"frmKEST"_s, u"frmLogin"_s, u"frmExtraInfo"_s};
+    each([&](QDialog& window) {
+        EXPECT_FALSE(window.windowIcon().pixmap(16).isNull());
+        EXPECT_TRUE(!fixed.contains(window.objectName()) || window.minimumSize() == window.maximumSize());
+    });
+}
 
 /// Returns true for widgets whose whole text must be visible: captions and items. Values can be scrolled, so only their
 /// height and their placeholder matter.

@@ -1,12 +1,20 @@
 #include "platform/desktop/Form.h"
 
+#include "platform/Prompt.h"
+#include "platform/desktop/Window.h"
+
 #include <QKeyEvent>
+#include <QLayout>
 #include <QPainter>
 #include <QPushButton>
 
 namespace kest::desktop {
 
+using namespace Qt::StringLiterals;
+
 namespace {
+
+std::function<QString()> aboutText;
 
 constexpr int pictureSize = 24;  // pixels
 
@@ -32,6 +40,11 @@ QIcon exitPicture(const QPalette& palette)
                            QPolygonF(QList<QPointF>{{8, 12}, {21, 12}}), QPolygonF({{17, 8}, {21, 12}, {17, 16}})});
 }
 
+bool isPlainEnter(const QKeyEvent& key)
+{
+    return (key.key() == Qt::Key_Return || key.key() == Qt::Key_Enter) && !(key.modifiers() & ~Qt::KeypadModifier);
+}
+
 }  // namespace
 
 Form::Form(const QString& name, const QString& caption) : QDialog(nullptr)
@@ -47,14 +60,34 @@ void Form::showEvent(QShowEvent* event)
     QDialog::showEvent(event);
 }
 
+void Form::fixSize()
+{
+    layout()->setSizeConstraint(QLayout::SetFixedSize);
+}
+
 void Form::keyPressEvent(QKeyEvent* event)
 {
+    auto* button = qobject_cast<QAbstractButton*>(focusWidget());
     if (event->matches(QKeySequence::Cancel))
         close();
     else if (event->key() == Qt::Key_Tab && event->modifiers() == Qt::ControlModifier)
         focusNextChild();  // leaves a text editor, in which Tab is a character
+    else if (event->key() == Qt::Key_F1)
+        guarded(objectName() + u".Form_KeyHelp"_s, showAbout);
+    else if (isPlainEnter(*event) && button && button->isEnabled() && !button->isCheckable())
+        button->click();
     else
         QDialog::keyPressEvent(event);
+}
+
+void setAbout(std::function<QString()> text)
+{
+    aboutText = std::move(text);
+}
+
+void showAbout()
+{
+    msgBox(aboutText ? aboutText() : u"KEST2 " KEST_VERSION ""_s, Icon::Information, u"About KEST2"_s);
 }
 
 QIcon dropArrow(const QPalette& palette)

@@ -2,9 +2,15 @@
 
 #include "platform/desktop/Window.h"
 
+#include <QClipboard>
+#include <QGuiApplication>
 #include <QHeaderView>
+#include <QMenu>
+#include <QPushButton>
 #include <QShortcut>
 #include <QTreeView>
+
+#include <algorithm>
 
 namespace kest::desktop {
 
@@ -25,6 +31,21 @@ void sortBy(QHeaderView& header, int column)
         header.setSortIndicator(column, isSorted && !isDescending ? Qt::DescendingOrder : Qt::AscendingOrder);
 }
 
+void copyRows(const QTreeView& list)
+{
+    QModelIndexList rows = list.selectionModel()->selectedRows();
+    std::sort(rows.begin(), rows.end());
+    QStringList lines;
+    for (const QModelIndex& row : std::as_const(rows)) {
+        QStringList cells;
+        for (int column = 0; column < row.model()->columnCount(); ++column)
+            cells.append(row.siblingAtColumn(column).data().toString());
+        lines.append(cells.join(u'\t'));
+    }
+    if (!lines.isEmpty())
+        QGuiApplication::clipboard()->setText(lines.join(u'\n'));
+}
+
 }  // namespace
 
 void prepareList(QTreeView& list, const QString& window)
@@ -34,7 +55,8 @@ void prepareList(QTreeView& list, const QString& window)
     list.setAllColumnsShowFocus(true);
     list.setAlternatingRowColors(true);
     QHeaderView* header = list.header();
-    header->setStretchLastSection(false);
+    header->setMinimumSectionSize(header->sectionSizeHint(header->count() - 1));
+    header->setStretchLastSection(true);
     header->setSortIndicator(-1, Qt::AscendingOrder);
     list.setSortingEnabled(true);
 
@@ -48,11 +70,32 @@ void prepareList(QTreeView& list, const QString& window)
         onEvent(new QShortcut(keys, &list, nullptr, nullptr, Qt::WindowShortcut), &QShortcut::activated, &list, source,
                 [header, column] { sortBy(*header, column); });
     }
+    auto* copy = new QShortcut(QKeySequence::Copy, &list, nullptr, nullptr, Qt::WidgetShortcut);
+    onEvent(copy, &QShortcut::activated, &list, window + u'.' + list.objectName() + u"_Copy"_s,
+            [&list] { copyRows(list); });
     auto* widen = new QShortcut(&list);
     widen->setKeys({Qt::CTRL | Qt::Key_Plus, Qt::CTRL | Qt::Key_Equal});  // "+" with and without Shift
     onEvent(widen, &QShortcut::activated, &list, source, [&list, header] {
         for (int column = 0; column < header->count(); ++column)
             list.resizeColumnToContents(column);
+    });
+}
+
+void addListMenu(QTreeView& list, const QString& window, const QList<QPushButton*>& buttons)
+{
+    list.setContextMenuPolicy(Qt::CustomContextMenu);
+    const QString source = window + u'.' + list.objectName() + u"_MouseUp"_s;
+    onEvent(&list, &QTreeView::customContextMenuRequested, &list, source, [&list, buttons](const QPoint& place) {
+        auto* menu = new QMenu(&list);
+        menu->setAttribute(Qt::WA_DeleteOnClose);
+        for (QPushButton* button : buttons) {
+            if (!button->isVisible())
+                continue;
+            QAction* action = menu->addAction(button->text(), button, &QPushButton::click);
+            action->setEnabled(button->isEnabled() && list.currentIndex().isValid());
+        }
+        menu->addAction(u"&Copy\tCtrl+C"_s, &list, [&list] { copyRows(list); });
+        menu->popup(list.viewport()->mapToGlobal(place));
     });
 }
 

@@ -3,9 +3,11 @@
 #include "platform/desktop/Window.h"
 
 #include <QApplication>
+#include <QClipboard>
 #include <QInputDialog>
 #include <QLabel>
 #include <QMessageBox>
+#include <QShortcut>
 
 namespace kest::desktop {
 
@@ -67,6 +69,25 @@ public:
     void start(const QString& path) override { startDetached(path); }
 };
 
+/// Lets the user select and copy the texts of a box. Without a selection, Ctrl+C copies the whole box.
+void makeCopyable(QDialog& window, const QString& text)
+{
+    for (QLabel* label : window.findChildren<QLabel*>())
+        if (!label->text().isEmpty())
+            label->setTextInteractionFlags(Qt::TextSelectableByMouse);
+    QObject::connect(new QShortcut(QKeySequence::Copy, &window), &QShortcut::activated, &window,
+                     [&window, text] { QGuiApplication::clipboard()->setText(window.windowTitle() + u'\n' + text); });
+}
+
+/// Runs the box, and repaints what was below it: a long operation that follows would leave it on the screen.
+int shown(QDialog& window)
+{
+    giveIcon(window);
+    const int result = window.exec();
+    QCoreApplication::processEvents(QEventLoop::ExcludeUserInputEvents);
+    return result;
+}
+
 Answer PersonAnswerer::box(const Box& box)
 {
     const OrdinaryPointer pointer;
@@ -75,15 +96,16 @@ Answer PersonAnswerer::box(const Box& box)
     window.setTextFormat(Qt::PlainText);
     window.setText(box.text);
     window.setIcon(pictureOf(box.icon));
+    makeCopyable(window, box.text);
     if (box.buttons == Buttons::Ok) {
         window.setStandardButtons(QMessageBox::Ok);
-        window.exec();
+        shown(window);
         return Answer::Ok;
     }
     window.setStandardButtons(QMessageBox::Yes | QMessageBox::No);
     window.setDefaultButton(box.defaultAnswer == Answer::No ? QMessageBox::No : QMessageBox::Yes);
     window.setEscapeButton(QMessageBox::No);
-    return window.exec() == QMessageBox::Yes ? Answer::Yes : Answer::No;
+    return shown(window) == QMessageBox::Yes ? Answer::Yes : Answer::No;
 }
 
 QString PersonAnswerer::input(const Input& input)
@@ -95,7 +117,8 @@ QString PersonAnswerer::input(const Input& input)
     window.setLabelText(input.prompt);
     for (QLabel* label : window.findChildren<QLabel*>())
         label->setTextFormat(Qt::PlainText);
-    return window.exec() == QDialog::Accepted ? window.textValue() : QString();
+    makeCopyable(window, input.prompt);
+    return shown(window) == QDialog::Accepted ? window.textValue() : QString();
 }
 
 }  // namespace

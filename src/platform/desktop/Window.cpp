@@ -4,6 +4,7 @@
 
 #include <QApplication>
 #include <QFontMetricsF>
+#include <QIcon>
 #include <QPointer>
 #include <QScreen>
 #include <QWindow>
@@ -71,14 +72,17 @@ void showModal(QDialog& window)
         window.adjustSize();
     window.resize(window.size().boundedTo(window.screen()->availableSize() - pixels(0, titleBar)));
     WindowLayout layout(window);
+    giveIcon(window);
     centre(window);
     {
         const Shown shown(window);
         const std::shared_ptr<WindowDriver> driver = windowDriver;
-        if (!driver || !driver->drive(window))
+        const bool isDriven = driver && driver->drive(window);
+        if (!isDriven)
             window.exec();
+        if (!isDriven || driver->isLikeAPerson())
+            layout.remember();
     }
-    layout.remember();
     throwKept();
 }
 
@@ -128,6 +132,11 @@ QSize pixels(int widthTwips, int heightTwips)
 int twips(int pixels)
 {
     return qRound(pixels / scale());
+}
+
+void giveIcon(QWidget& window)
+{
+    window.setWindowIcon(QIcon(QStringLiteral(":/kest2.png")));
 }
 
 void centre(QWidget& window)

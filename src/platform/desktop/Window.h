@@ -14,7 +14,8 @@
 namespace kest::desktop {
 
 /// Shows the window modally, centred on the screen, and returns when it has been closed. If a window driver is set, it
-/// operates the window. The size of the window and the column widths of its lists are saved in the profile.
+/// operates the window. The size of the window and the column widths of its lists are saved in the profile, unless a
+/// script has operated it.
 void showModal(QDialog& window);
 
 /// Operates windows in place of a person.
@@ -23,6 +24,8 @@ public:
     virtual ~WindowDriver() = default;
     /// Operates the shown window. Returns false if a person should do it instead.
     virtual bool drive(QDialog& window) = 0;
+    /// Returns true if the layout of a window that it has operated is saved, as that of a person is.
+    virtual bool isLikeAPerson() const { return false; }
 };
 /// Sets the driver of all windows; null leaves them to a person.
 void setWindowDriver(std::shared_ptr<WindowDriver> driver);
@@ -66,6 +69,9 @@ void onEvent(Sender* sender, Signal signal, QObject* window, const QString& sour
 int pixels(int twips);
 QSize pixels(int widthTwips, int heightTwips);
 int twips(int pixels);
+
+/// Gives the window the icon of the application.
+void giveIcon(QWidget& window);
 
 /// Moves the window to the centre of its screen.
 void centre(QWidget& window);
