@@ -56,6 +56,7 @@ QString usage()
   where                         where everything lies
   open [QTNNO [SUBQUOTE]]       the panel, on that quote
   list unread|read|sent [--filter TEXT]
+  held                          the unread messages that are not listed yet, and what each waits for
   load FILE                     load a message of the unread folder
   send QTNNO [SUBQUOTE]         send a quote
   reprint FILE                  print a message of the read folder again

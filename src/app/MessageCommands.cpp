@@ -81,6 +81,16 @@ int notDone(const frmMessageList& window, const QString& buttonName, const QStri
     return refused(caption + u" does nothing with "_s + file, Refused).exitCode;
 }
 
+/// Adds why the fill of the list has ended early, if it has.
+Outcome unlessFailed(const frmMessageList& window, Outcome outcome)
+{
+    if (!window.failure().isEmpty()) {
+        outcome.exitCode = refused(window.failure(), Refused).exitCode;
+        outcome.fields[u"failure"_s] = window.failure();
+    }
+    return outcome;
+}
+
 }  // namespace
 
 Outcome list(const QStringList& arguments)
@@ -99,12 +109,24 @@ Outcome list(const QStringList& arguments)
         if (filtered && gsListFilter != arguments[2])
             window.updateFilter(arguments[2]);
     }
-    Outcome outcome{.fields = {{u"rows"_s, rowsAsJson(window.rows())}}, .text = rowsAsText(window.rows())};
-    if (!window.failure().isEmpty()) {
-        outcome.exitCode = refused(window.failure(), Refused).exitCode;
-        outcome.fields[u"failure"_s] = window.failure();
+    return unlessFailed(window,
+                        {.fields = {{u"rows"_s, rowsAsJson(window.rows())}}, .text = rowsAsText(window.rows())});
+}
+
+Outcome held(const QStringList&)
+{
+    frmMessageList window;
+    window.open();
+    QJsonArray messages;
+    QString text;
+    for (const HeldMessage& message : window.heldMessages()) {
+        messages.append(QJsonObject{{u"file"_s, message.file},
+                                    {u"type"_s, message.type},
+                                    {u"waitsFor"_s, message.waitsFor},
+                                    {u"since"_s, message.since.toString(Qt::ISODate)}});
+        text += message.file + u'\t' + message.type + u'\t' + message.sinceText() + u'\t' + message.waitsFor + u'\n';
     }
-    return outcome;
+    return unlessFailed(window, {.fields = {{u"held"_s, messages}}, .text = text});
 }
 
 Outcome load(const QStringList& arguments)

@@ -28,7 +28,7 @@ TransportWindow::TransportWindow(const TransportFolders& folders)
     carriedList->setHeaderLabels({u"Time"_s, u"Direction"_s, u"File"_s, u"What it is"_s});
     desktop::prepareList(*carriedList, objectName());
     carriedList->setColumnWidth(0, desktop::pixels(1200));
-    carriedList->setColumnWidth(1, desktop::pixels(1400));
+    carriedList->setColumnWidth(1, desktop::pixels(2000));
     carriedList->setColumnWidth(2, desktop::pixels(3900));
     heading->setBuddy(carriedList);
 

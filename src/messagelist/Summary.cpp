@@ -8,6 +8,9 @@
 #include "platform/RuntimeError.h"
 #include "platform/files/files.h"
 
+#include <QFileInfo>
+
+#include <algorithm>
 #include <utility>
 
 using namespace Qt::StringLiterals;
@@ -39,6 +42,34 @@ void reportUnreadable(const QString& file)
                     desktop::Icon::Critical);
 }
 
+// Returns the number by which only one message of a request is listed, or null if the message has none.
+xml::Node requestNumberOf(const xml::Node& root)
+{
+    const xml::Node number = root.selectSingleNode(u"rootns:quoteRequestNumber"_s);
+    return number ? number : root.selectSingleNode(u"rootns:kestQuoteRequestNumber"_s);
+}
+
+// Returns the names of the pictures that a request names, without the ids that are empty.
+QStringList picturesOf(const xml::Document& message)
+{
+    const xml::Node root = message.documentElement();
+    QStringList names;
+    for (const xml::Node& id : root.selectNodes(u"rootns:quoteRequestImageIds/*"_s))
+        if (const QString number = id.text(); !number.isEmpty())
+            names.append(root.textOrEmptyOf(u"rootns:quoteRequestNumber"_s) + u'_' + PadZeroLeft(number, 3) +
+                         ".jpg"_L1);
+    return names;
+}
+
+QString missingPictures(const xml::Document& message, const QSet<QString>& unread)
+{
+    QStringList names = picturesOf(message);
+    const bool isNamed = !names.isEmpty();
+    names.removeIf([&](const QString& name) { return unread.contains(name.toCaseFolded()); });
+    return isNamed ? (names.size() == 1 ? u"the picture "_s : u"the pictures "_s) + names.join(u", "_s)
+                   : u"pictures that the request does not name"_s;
+}
+
 // Fills the list once. All files share one document, so that memory holds only one parsed file at a time.
 class Fill {
 public:
@@ -59,6 +90,9 @@ public:
 private:
     bool parse(const QString& path);
     const xml::Document& prepared();
+    bool isHeldUnread(const QString& file);
+    QString typeListedAs(const QString& file) const;
+    void hold(const QString& file, const QString& type, const QString& waitsFor) const;
 
     QString text;            // of the current file
     xml::Document document;  // the parsed text
@@ -80,15 +114,47 @@ void Fill::take(const QString& file)
         if (isMarker(document)) {
             const xml::Document& marker = prepared();
             listed.append({file, GetMarkerRow(marker, GetMarkerTypeName(marker))});
+        } else {
+            hold(file, u"Note"_s, u"nothing: it is a note, which is never listed"_s);
         }
-    } else {
-        const bool held = (folder == MessageFolder::Unread && !AllImagesPresent(document, unread)) ||
-                          (IsHeldBehindEarlier(document, listed, file) && folder == MessageFolder::Unread);
-        if (!held) {
-            const xml::Document& message = prepared();
-            listed.append({file, GetMessageRow(message, GetMessageTypeName(message))});
-        }
+    } else if (!isHeldUnread(file)) {
+        const xml::Document& message = prepared();
+        listed.append({file, GetMessageRow(message, GetMessageTypeName(message))});
     }
+}
+
+bool Fill::isHeldUnread(const QString& file)
+{
+    if (folder != MessageFolder::Unread) {
+        IsHeldBehindEarlier(document, listed, file);
+        return false;
+    }
+    if (!AllImagesPresent(document, unread)) {
+        hold(file, GetMessageTypeName(document), missingPictures(document, unread));
+        return true;
+    }
+    const xml::Node number = requestNumberOf(document.documentElement());
+    const QString earlier = number ? gdicQuoteRequests.value(number.text()) : QString();
+    const QString displaced = typeListedAs(earlier);
+    const bool held = IsHeldBehindEarlier(document, listed, file);
+    if (held)
+        hold(file, GetMessageTypeName(document),
+             earlier.isEmpty() ? u"a request number that can be read"_s : earlier + u", which must be loaded first"_s);
+    else if (!earlier.isEmpty())  // a manual quote takes its place
+        hold(earlier, displaced, file + u", which must be loaded first"_s);
+    return held;
+}
+
+QString Fill::typeListedAs(const QString& file) const
+{
+    const auto found = std::ranges::find(listed, file, &ListedMessage::file);
+    return found == listed.end() ? QString() : found->row[0];
+}
+
+void Fill::hold(const QString& file, const QString& type, const QString& waitsFor) const
+{
+    if (hooks.held && folder == MessageFolder::Unread)
+        hooks.held({file, type, waitsFor, QFileInfo(files::systemPath(gsCurFolder + file)).lastModified()});
 }
 
 bool Fill::parse(const QString& path)
@@ -145,30 +211,17 @@ QList<ListedMessage> BuildMessageList(MessageFolder folder, const FillHooks& hoo
 
 bool AllImagesPresent(const xml::Document& message, const QSet<QString>& unread)
 {
-    const xml::Node root = message.documentElement();
-    const QList<xml::Node> ids = root.selectNodes(u"rootns:quoteRequestImageIds/*"_s);
-    bool present = ids.isEmpty();
-    for (const xml::Node& id : ids) {
-        const QString number = id.text();
-        if (number.isEmpty())
-            continue;
-        const QString name =
-            root.textOrEmptyOf(u"rootns:quoteRequestNumber"_s) + u'_' + PadZeroLeft(number, 3) + ".jpg"_L1;
-        present = unread.contains(name.toCaseFolded());
-        if (!present)
-            return false;
-    }
-    return present;
+    const QStringList names = picturesOf(message);
+    if (names.isEmpty())  // a list of empty ids is never complete
+        return !message.documentElement().selectSingleNode(u"rootns:quoteRequestImageIds/*"_s);
+    return std::ranges::all_of(names, [&](const QString& name) { return unread.contains(name.toCaseFolded()); });
 }
 
 bool IsHeldBehindEarlier(const xml::Document& message, QList<ListedMessage>& listed, const QString& file)
 {
     bool held = true;  // and stays so if something fails
     attempt([&] {
-        const xml::Node root = message.documentElement();
-        xml::Node number = root.selectSingleNode(u"rootns:quoteRequestNumber"_s);
-        if (!number)
-            number = root.selectSingleNode(u"rootns:kestQuoteRequestNumber"_s);
+        const xml::Node number = requestNumberOf(message.documentElement());
         if (!number) {
             held = false;
             return;

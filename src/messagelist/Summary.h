@@ -4,6 +4,7 @@
 #include "messages/Folders.h"
 #include "platform/xml/xml.h"
 
+#include <QDateTime>
 #include <QList>
 #include <QSet>
 #include <QString>
@@ -22,6 +23,17 @@ struct ListedMessage {
     MessageRow row;
 };
 
+/// A message of the unread folder that is not listed yet.
+struct HeldMessage {
+    QString file;
+    QString type;
+    QString waitsFor;
+    QDateTime since;  // when the file was written
+
+    /// Returns `since` as the windows show it.
+    QString sinceText() const { return since.toString(QStringLiteral("dd/MM/yyyy HH:mm")); }
+};
+
 /// Callbacks of a fill.
 struct FillHooks {
     /// Applies a submission response to its quote. Required if the folder contains such a file.
@@ -30,6 +42,8 @@ struct FillHooks {
     std::function<void(const QString& filter)> filterAsked;
     /// Called after each file.
     std::function<void(qint64 done, qint64 total)> progress;
+    /// Called with each unread message that is held back.
+    std::function<void(const HeldMessage& message)> held = {};
 };
 
 /// Returns the messages of a folder in the order of their file names. Sets gsCurFolder, gsListFolder, gsListFilter and

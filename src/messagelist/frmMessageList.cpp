@@ -8,6 +8,7 @@
 #include "inbound/modLoadXML.h"
 #include "messagelist/MessageListModel.h"
 #include "messagelist/TakeIn.h"
+#include "messagelist/frmHeld.h"
 #include "messages/Envelope.h"
 #include "messages/Folders.h"
 #include "messages/MessageTypes.h"
@@ -33,6 +34,7 @@
 #include <QScopedValueRollback>
 #include <QThread>
 #include <QTimer>
+#include <QToolButton>
 #include <QTreeView>
 
 #include <algorithm>
@@ -118,11 +120,13 @@ void frmMessageList::fill()
     const QScopedValueRollback filling(busy, busy + 1);
     QList<ListedMessage> listed;
     fillFailure.clear();
+    heldBack.clear();
     {
         desktop::Progress progress(windowTitle(), u"Reading the messages..."_s, prgFill);
         FillHooks hooks;
         hooks.submissionResponse = LoadSubmissionResponse;
         hooks.filterAsked = [this](const QString& filter) { txtFilter->setText(filter); };
+        hooks.held = [this](const HeldMessage& message) { heldBack.append(message); };
         hooks.progress = [&](qint64 done, qint64 total) { progress.step(done, total); };
         try {
             EnsureConnection();
@@ -134,6 +138,9 @@ void frmMessageList::fill()
     messages->setMessages(std::move(listed));
     choose(0);
     lblStatus->setText(status());
+    cmdHeld->setText(u"%1 held back (F4)"_s.arg(heldBack.size()));
+    cmdHeld->setShortcut(Qt::Key_F4);  // a new text takes the key away
+    cmdHeld->setVisible(!heldBack.isEmpty());
 }
 
 const QList<ListedMessage>& frmMessageList::rows() const
@@ -219,6 +226,11 @@ bool frmMessageList::load(const QString& file)
         LogError(error, u"frmMessageList.cmdProcess_Click"_s, u"cmdProcess_Click"_s);
         return false;
     }
+}
+
+void frmMessageList::cmdHeld_Click()
+{
+    frmHeld::ShowForm(heldBack);
 }
 
 void frmMessageList::tmrRefresh_Timer()

@@ -13,6 +13,7 @@ class QProgressBar;
 class QPushButton;
 class QRadioButton;
 class QTimer;
+class QToolButton;
 class QTreeView;
 
 namespace kest {
@@ -51,6 +52,8 @@ public:
     const QList<ListedMessage>& rows() const;
     /// Returns why the last fill ended early, or an empty text if it did not.
     const QString& failure() const { return fillFailure; }
+    /// Returns the messages that the last fill of the unread folder held back.
+    const QList<HeldMessage>& heldMessages() const { return heldBack; }
 
 protected:
     void showEvent(QShowEvent* event) override;
@@ -67,6 +70,7 @@ private:
     bool cmdPrint_Click();
     void Command1_Click();
     void Command6_Click();
+    void cmdHeld_Click();
     void tmrRefresh_Timer();
     void txtFind_Change();
     void Form_KeyRefresh();
@@ -95,6 +99,7 @@ private:
     QTreeView* ListView1;
     MessageListModel* messages;
     QLabel* lblStatus;
+    QToolButton* cmdHeld;
     QProgressBar* prgFill;
     QPushButton* cmdProcess;
     QPushButton* cmdView;
@@ -106,6 +111,7 @@ private:
     QString sCurFile;  // the file clicked last
     MessageFolder iFolder = MessageFolder::Unread;
     QString fillFailure;
+    QList<HeldMessage> heldBack;
     int busy = 0;  // how many fills and loads are running; a delayed refresh waits until they end
 };
 

@@ -17,6 +17,7 @@
 #include <QScrollBar>
 #include <QShortcut>
 #include <QTimer>
+#include <QToolButton>
 #include <QTreeView>
 #include <QVBoxLayout>
 
@@ -95,6 +96,9 @@ void frmMessageList::buildControls()
     lblStatus = named(new QLabel, u"lblStatus"_s);
     lblStatus->setTextFormat(Qt::PlainText);  // it shows file names
     lblStatus->setWordWrap(true);
+    cmdHeld = named(new QToolButton, u"cmdHeld"_s, u"Show the messages that are not listed yet (F4)"_s);
+    cmdHeld->setAutoRaise(true);
+    cmdHeld->setVisible(false);
     prgFill = named(new QProgressBar, u"prgFill"_s);
     prgFill->setAccessibleName(u"Progress"_s);
     prgFill->setVisible(false);
@@ -131,6 +135,7 @@ void frmMessageList::arrange()
 
     auto* line = new QHBoxLayout;
     line->addWidget(lblStatus, 1);
+    line->addWidget(cmdHeld);
     line->addWidget(prgFill);
     line->addWidget(txtFind);
 
@@ -149,7 +154,7 @@ void frmMessageList::arrange()
     all->addLayout(line);
     all->addLayout(bottom);
 
-    const QList<QWidget*> order{Option1[0], Option1[1], Option1[2], txtFilter, Command1, ListView1,
+    const QList<QWidget*> order{Option1[0], Option1[1], Option1[2], txtFilter, Command1, ListView1, cmdHeld,
                                 txtFind,    cmdProcess, cmdPrint,   cmdView,   Command6, cmdExit};
     for (qsizetype i = 1; i < order.size(); ++i)
         setTabOrder(order[i - 1], order[i]);
@@ -177,6 +182,7 @@ void frmMessageList::connectControls()
     on(cmdProcess, &QPushButton::clicked, u"cmdProcess_Click"_s, [this] { cmdProcess_Click(); });
     on(cmdView, &QPushButton::clicked, u"cmdView_Click"_s, [this] { cmdView_Click(); });
     on(cmdPrint, &QPushButton::clicked, u"cmdPrint_Click"_s, [this] { cmdPrint_Click(); });
+    on(cmdHeld, &QToolButton::clicked, u"cmdHeld_Click"_s, [this] { cmdHeld_Click(); });
     on(Command1, &QPushButton::clicked, u"Command1_Click"_s, [this] { Command1_Click(); });
     on(txtFilter, &QLineEdit::returnPressed, u"txtFilter_KeyDown"_s, [this] { Command1_Click(); });
     on(Command6, &QPushButton::clicked, u"Command6_Click"_s, [this] { Command6_Click(); });

@@ -77,6 +77,10 @@ TEST_F(Command, AListGivesWhatItsWindowShows)
     EXPECT_EQ(list[u"rows"][0].toObject().keys().join(u' '), u"claim customer file quote rego type vehicle"_s);
     EXPECT_EQ(list[u"boxes"][0][u"icon"].toString() + list[u"boxes"][0][u"title"].toString(), u"critical"_s);
 
+    const QJsonValue held = kest2(u"held"_s).json[u"held"_s][0];
+    EXPECT_EQ(held.toObject().keys().join(u' '), u"file since type waitsFor"_s);
+    EXPECT_TRUE(held[u"waitsFor"].toString().startsWith(u"QREQ_20551_1.xml"_s));
+
     const auto expectSent = [this](const QString& words, int rows, const QString& answer) {
         const QJsonObject json = kest2(u"list sent"_s + words).json;
         EXPECT_EQ(json[u"rows"].toArray().size(), rows);

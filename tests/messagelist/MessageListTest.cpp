@@ -36,7 +36,8 @@ struct MessageListWindow : Shop {
 };
 
 // Steps of visits.
-const QString readAll = uR"({"read": ["ListView1", "cmdProcess", "cmdPrint", "Frame2", "txtFilter", "lblStatus"]})"_s;
+const QString readAll =
+    uR"({"read": ["ListView1", "cmdProcess", "cmdPrint", "Frame2", "txtFilter", "lblStatus", "cmdHeld"]})"_s;
 
 static QString click(const char* control)
 {
@@ -62,6 +63,23 @@ TEST_F(MessageListWindow, ALoadedMessageMakesRoomForTheNextOfItsRequest)
     visit({readAll, click("cmdProcess"), readAll});
     EXPECT_EQ(listed(0) + ", " + listed(1) + ", " + shown(),
               "a.xml: 1 message, b.xml: 1 message, [none] Message Loaded");
+}
+
+TEST_F(MessageListWindow, F4ShowsTheMessagesThatAreHeldBack)
+{
+    arrive("a.xml", cancellation("QR1"));
+    visit({readAll});
+    EXPECT_EQ(desktop->record().reads.last()[u"values"][u"cmdHeld"][u"visible"].toBool(), false);
+    arrive("b.xml", cancellation("QR1"));
+    desktop.emplace(R"json({"windows": {"frmMessageList": [[{"key": "ListView1", "keys": ["F4"]}]],
+                                        "frmHeld": [[{"read": ["ListView1"]}, {"click": "cmdView"}]],
+                                        "frmViewXML": [[{"read": ["txtXML"]}]]}})json");
+    frmMessageList::ShowForm();
+    const QJsonArray reads = desktop->record().reads;
+    ASSERT_EQ(reads.size(), 2);
+    const QJsonArray row = reads[0][u"values"][u"ListView1"][u"rows"][0].toArray();
+    EXPECT_EQ(row[0].toString() + row[3].toString(), u"b.xmla.xml, which must be loaded first"_s);
+    EXPECT_TRUE(reads[1][u"values"][u"txtXML"][u"text"].toString().contains(u"QR1"_s));
 }
 
 TEST_F(MessageListWindow, TheListIsFilledTwiceMoreAfterARefusal)

@@ -159,6 +159,30 @@ TEST_F(MessageList, ARequestWaitsUnreadForAllItsPictures)
     EXPECT_EQ(listedFiles(MessageFolder::Read), "in.xml");
 }
 
+TEST_F(MessageList, WhatIsHeldBackTellsWhatItWaitsFor)
+{
+    arrive("a.xml", quoteRequest("QR1").images({"1", "2", "3"}));
+    arrive("b.xml", quoteRequest("QR2").images({" ", ""}));
+    arrive("c.xml", quoteRequest("QR3"));
+    arrive("d.xml", cancellation("QR3"));
+    arrive("e.xml", manualQuote("500").request("QR3"));
+    arrive("MDMSG1.xml", "<note><subject>Hello</subject></note>");
+    arrive("QR1_002.jpg", "picture");
+    FillHooks hooks;
+    QStringList held;
+    hooks.held = [&](const HeldMessage& message) {
+        held << message.file + u" ("_s + message.type + u"): "_s + message.waitsFor;
+        EXPECT_LT(qAbs(message.since.secsTo(QDateTime::currentDateTime())), 60);
+    };
+    BuildMessageList(MessageFolder::Unread, hooks);
+    EXPECT_EQ(held.join(u'\n').toStdString(),
+              "a.xml (Quote Request): the pictures QR1_001.jpg, QR1_003.jpg\n"
+              "b.xml (Quote Request): pictures that the request does not name\n"
+              "d.xml (Quote Request Cancellation): c.xml, which must be loaded first\n"
+              "c.xml (Quote Request): e.xml, which must be loaded first\n"
+              "MDMSG1.xml (Note): nothing: it is a note, which is never listed");
+}
+
 TEST_F(MessageList, OneMessageOfARequestIsShownAtATime)
 {
     arrive("b.xml", cancellation("QR1"));

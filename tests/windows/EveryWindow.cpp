@@ -2,6 +2,7 @@
 
 #include "base/SharedVariables.h"
 #include "loopback/TransportWindow.h"
+#include "messagelist/frmHeld.h"
 #include "messagelist/frmMessageList.h"
 #include "outbound/frmExtraInfo.h"
 #include "platform/script/Gestures.h"
@@ -48,6 +49,7 @@ EveryWindow::EveryWindow()
     files::writeBytes(u"c:\\wirra32\\report\\710.html"_s, files::readBytes(checkoutFile(u"templates/710.html"_s)));
     arrive("a.xml", quoteRequest("QR1"));
     arrive("b.xml", cancellation("QR2"));
+    arrive("c.xml", cancellation("QR2"));
     files::write(gsReadPath + u"500.xml"_s, quoteRequest("QR1").text());
     auto row = quote("500");
     quote("500", 1);
@@ -89,6 +91,10 @@ void EveryWindow::each(const Check& check)
         {"frmKEST", check, [] { eKEST().ShowKESTWindow(u"500"_s, u"0"_s); }},
         {"frmMessageList", check, [] { frmMessageList::ShowForm(); }},
         {"frmMessageList", readFolder, [] { frmMessageList::ShowForm(); }},
+        {"frmHeld", check,
+         [] {
+             frmHeld::ShowForm({{u"b.xml"_s, u"Quote Request"_s, u"a.xml"_s, {}}});
+         }},
         {"frmExtraInfo", check, [] { frmExtraInfo::ShowForm(u"500"_s, u"0"_s); }},
         {"frmSubletAuth", check, [] { frmSubletAuth::ShowForm(u"500"_s, u"0"_s); }},
         {"frmViewPDF", check, [] { frmViewPDF::ShowForm(document); }},

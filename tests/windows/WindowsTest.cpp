@@ -150,7 +150,7 @@ TEST_F(EveryWindow, HasTextsAndRowsThatCanBeCopied)
         const auto* list = window.findChild<QTreeView*>();
         if (list && list->currentIndex().isValid()) {
             EXPECT_EQ(copied.count(u'\t'), list->header()->count() - 1) << copied.toStdString();
-        } else if (!list) {
+        } else if (qobject_cast<QMessageBox*>(&window)) {
             EXPECT_TRUE(copied.startsWith(window.windowTitle() + u'\n')) << copied.toStdString();
         }
         for (const QLabel* label : window.findChildren<QLabel*>())
@@ -199,8 +199,11 @@ static void expectToFit(const QWidget& widget)
     }
     if (const auto* list = qobject_cast<const QTreeView*>(&widget)) {
         const QHeaderView& header = *list->header();
-        for (int column = 0; column < header.count(); ++column)
+        const int last = header.count() - 1;  // takes the space that is left
+        for (int column = 0; column < last; ++column)
             EXPECT_GE(header.sectionSize(column), header.sectionSizeHint(column)) << column;
+        const QString caption = list->model()->headerData(last, Qt::Horizontal).toString();
+        EXPECT_GE(header.sectionSize(last), header.fontMetrics().horizontalAdvance(caption));
     }
 }
 

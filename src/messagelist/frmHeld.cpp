@@ -1,0 +1,69 @@
+#include "messagelist/frmHeld.h"
+
+#include "platform/desktop/Lists.h"
+#include "platform/desktop/Window.h"
+#include "utilities/frmViewXML.h"
+
+#include <QHBoxLayout>
+#include <QHeaderView>
+#include <QPushButton>
+#include <QTreeWidget>
+#include <QVBoxLayout>
+
+using namespace Qt::StringLiterals;
+
+namespace kest {
+
+frmHeld::frmHeld(const QList<HeldMessage>& messages)
+    : Form(u"frmHeld"_s, u"Held Messages"_s),
+      ListView1(new QTreeWidget),
+      cmdView(new QPushButton(u"&View"_s)),
+      cmdClose(new QPushButton(u"&Close"_s))
+{
+    ListView1->setObjectName("ListView1"_L1);
+    ListView1->setAccessibleName(u"Held messages"_s);
+    ListView1->setHeaderLabels({u"Filename"_s, u"Message Type"_s, u"Since"_s, u"Waits For"_s});
+    desktop::prepareList(*ListView1, objectName());
+    constexpr std::array widths{2600, 2600, 2100};  // twips
+    for (size_t column = 0; column < widths.size(); ++column)
+        ListView1->setColumnWidth(static_cast<int>(column), desktop::pixels(widths[column]));
+    for (const HeldMessage& message : messages) {
+        auto* row = new QTreeWidgetItem(ListView1, {message.file, message.type, message.sinceText(), message.waitsFor});
+        for (int column = 0; column < row->columnCount(); ++column)
+            row->setToolTip(column, row->text(column));
+    }
+    ListView1->setCurrentItem(ListView1->topLevelItem(0));
+    cmdView->setObjectName("cmdView"_L1);
+    cmdClose->setObjectName("cmdClose"_L1);
+    desktop::addListMenu(*ListView1, objectName(), {cmdView});
+
+    auto* buttons = new QHBoxLayout;
+    buttons->addWidget(cmdView);
+    buttons->addStretch();
+    buttons->addWidget(cmdClose);
+    auto* layout = new QVBoxLayout(this);
+    layout->addWidget(ListView1);
+    layout->addLayout(buttons);
+    resize(desktop::pixels(12000, 4800));
+
+    const auto on = [this](auto* sender, auto signal, const QString& event, auto routine) {
+        desktop::onEvent(sender, signal, this, "frmHeld."_L1 + event, routine);
+    };
+    on(cmdView, &QPushButton::clicked, u"cmdView_Click"_s, [this] { cmdView_Click(); });
+    on(ListView1, &QTreeWidget::itemDoubleClicked, u"ListView1_DblClick"_s, [this] { cmdView_Click(); });
+    on(cmdClose, &QPushButton::clicked, u"cmdClose_Click"_s, [this] { close(); });
+}
+
+void frmHeld::ShowForm(const QList<HeldMessage>& messages)
+{
+    frmHeld form(messages);
+    desktop::showModal(form);
+}
+
+void frmHeld::cmdView_Click()
+{
+    if (const QTreeWidgetItem* row = ListView1->currentItem())
+        frmViewXML::ShowForm(row->text(0));
+}
+
+}  // namespace kest
