@@ -85,7 +85,7 @@ std::optional<QuoteKey> matchSupplementary(const ManualQuote& manual, const db::
 /// Returns a registration that no car has: the given one, if necessary with dots after it.
 QString freeRego(const QString& rego)
 {
-    db::Recordset cars = opened(sql("SELECT REGO FROM CAR WHERE REGO LIKE '{}%' ORDER BY REGO", rego));
+    db::Recordset cars = opened(sql("SELECT REGO FROM CAR WHERE REGO LIKE '{}%' ORDER BY REGO", likeText(rego)));
     QString free = rego;
     for (cars.find(sql("REGO='{}'", free)); !cars.eof(); cars.find(sql("REGO='{}'", free)))
         free += u'.';

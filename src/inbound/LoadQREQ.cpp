@@ -115,7 +115,7 @@ db::Recordset openCustomer(const db::Recordset& car, const Request& request)
     } else if (!request.firstName.trimmed().isEmpty()) {
         const QString firstWord = request.firstName.split(u' ', Qt::SkipEmptyParts).value(0);
         customer.open(sql("SELECT * FROM CUSTOMER WHERE NAME='{}' AND FIRSTNAME LIKE '{}%'", request.surname.trimmed(),
-                          firstWord));
+                          likeText(firstWord)));
     } else {
         customer.open(sql("SELECT * FROM CUSTOMER WHERE NAME='{}' AND FIRSTNAME = ''", request.companyName.trimmed()));
     }

@@ -19,7 +19,7 @@ QVariant findOrAddVendor(const QString& name, const QString& street, const QStri
 {
     if (name.trimmed().isEmpty())
         return 0;
-    db::Recordset vendor = opened(sql("SELECT * FROM VENDOR WHERE NAME LIKE '%{}%'", name));
+    db::Recordset vendor = opened(sql("SELECT * FROM VENDOR WHERE NAME LIKE '%{}%'", likeText(name)));
     if (vendor.eof()) {
         vendor.addNew();
         // cut, because a long address must not make an authorisation fail

@@ -131,6 +131,22 @@ TEST_F(QuoteBody, TheRepairerOfANewSubletLineIsFoundOrAdded)
     EXPECT_EQ(rowCount("VENDOR", "NAME='Nobody'"), 0);
 }
 
+TEST_F(QuoteBody, ARepairerIsFoundAgainWhateverItsNameContains)
+{
+    vendor("Glass 1000 Co");
+    vendor("Glass X Co");
+    const std::string cut(48, 'n');
+    int number = 0;
+    for (const std::string& name : {std::string("Track "), cut + " & Sons", std::string("[GT] Repairs"),
+                                    std::string("100% Co"), std::string("Glass _ Co"), std::string("O'Hara [%_]")}) {
+        number += 2;
+        EXPECT_TRUE(apply(body().sublet(number, "I", {{"subletRepairer", name}})));
+        EXPECT_TRUE(apply(body().sublet(number + 1, "I", {{"subletRepairer", name}})));
+        EXPECT_EQ(line(number).text("VENDOR"), line(number + 1).text("VENDOR")) << name;
+        EXPECT_EQ(Row("VENDOR", "VENDOR_ID=" + line(number).text("VENDOR")).text("NAME"), name.substr(0, 49)) << name;
+    }
+}
+
 TEST_F(QuoteBody, ASubletElementThatIsMissingKeepsTheOneOfTheLineBefore)
 {
     EXPECT_TRUE(apply(body()

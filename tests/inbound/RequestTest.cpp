@@ -88,7 +88,7 @@ TEST_F(Requests, TheCustomerIsFoundByNameOrMade)
         }
     }
     // texts are cut to the size of the host's columns
-    EXPECT_TRUE(load(quoteRequest("QR9").rego("CAR9").set("claimCustomer/surname", std::string(1000000, 's'))));
+    EXPECT_TRUE(load(quoteRequest("QR9").rego("SSS999").set("claimCustomer/surname", std::string(1000000, 's'))));
     EXPECT_EQ(Row("CUSTOMER", "NAME LIKE 'sss%'").text("NAME"), std::string(35, 's'));
 }
 

@@ -11,6 +11,15 @@ QStringView withoutTrailingBlanks(QStringView text)
     return text;
 }
 
+/// Folds character by character, like compareTexts(), so that the text keeps its length.
+QString caseFolded(QStringView text)
+{
+    QString folded = text.toString();
+    for (QChar& c : folded)
+        c = c.toCaseFolded();
+    return folded;
+}
+
 /// Returns true if a character matches the set between brackets.
 bool isInSet(char16_t c, QStringView set)
 {
@@ -48,11 +57,7 @@ bool elementMatches(QStringView element, QChar c)
 
 QString comparisonKey(QStringView text)
 {
-    // character by character, like compareTexts(), so that the text keeps its length
-    QString key = withoutTrailingBlanks(text).toString();
-    for (QChar& c : key)
-        c = c.toCaseFolded();
-    return key;
+    return caseFolded(withoutTrailingBlanks(text));
 }
 
 int compareTexts(QStringView left, QStringView right)
@@ -62,7 +67,8 @@ int compareTexts(QStringView left, QStringView right)
 
 bool isLike(QStringView rawText, QStringView rawPattern)
 {
-    const QString foldedText = comparisonKey(rawText);
+    // "%a %" must find "a ", so a "%" at the end needs the trailing blanks
+    const QString foldedText = rawPattern.endsWith(u'%') ? caseFolded(rawText) : comparisonKey(rawText);
     const QString foldedPattern = comparisonKey(rawPattern);
     const QStringView text = foldedText;
     const QStringView pattern = foldedPattern;

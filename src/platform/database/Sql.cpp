@@ -70,3 +70,17 @@ QString pasted(const QString& statement, std::initializer_list<QVariant> values)
 }
 
 }  // namespace kest::db
+
+namespace kest {
+
+QString likeText(const QString& text)
+{
+    QString pattern;
+    for (const QChar c : text) {
+        const bool isWildcard = c == u'[' || c == u'%' || c == u'_';
+        pattern += isWildcard ? u'[' + QString(c) + u']' : QString(c);
+    }
+    return pattern;
+}
+
+}  // namespace kest

@@ -17,6 +17,10 @@ QString pasted(const QString& statement, std::initializer_list<QVariant> values)
 
 namespace kest {
 
+/// Returns a text as part of a pattern of LIKE that matches only itself: its "[", "%" and "_" are no wildcards, on any
+/// engine. sql() doubles its quotes as in any other text.
+QString likeText(const QString& text);
+
 /// For example sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE={}", number, subquote).
 template <class... Values>
 QString sql(const char* statement, const Values&... values)
