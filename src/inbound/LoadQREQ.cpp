@@ -6,6 +6,7 @@
 #include "inbound/NextNumbers.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
+#include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
@@ -288,6 +289,8 @@ bool LoadQREQ(QString& text, const QString& fileName)
         respellColour(car, colours);
     else
         fillNewCar(car, request, model, colours);
+    if (car.isNull(u"PAINT_GP"_s))
+        throw RuntimeError(NullValue, u"The column PAINT_GP of the car %1 is Null."_s.arg(request.rego));
     quote.set(u"paint_rate"_s, insurer.value(car.text(u"PAINT_GP"_s) + u"_RATE"_s));
 
     customer.update();

@@ -112,6 +112,14 @@ TEST_F(Requests, AKnownCarKeepsEverythingButItsColoursSpelling)
     EXPECT_EQ(car("GONE01").number("CUST_ID"), customer("Tarrant").id());
 }
 
+TEST_F(Requests, ACarWithoutAPaintGroupIsNamedWithTheColumn)
+{
+    car("ABC123").set("PAINT_GP", nullptr);
+    EXPECT_FALSE(load(quoteRequest("QR1").rego("ABC123")));
+    EXPECT_NE(shown().find("The column PAINT_GP of the car ABC123 is Null."), std::string::npos);
+    EXPECT_EQ(rowCount("QUOTE1"), 0);
+}
+
 TEST_F(Requests, ANewCarTakesWhatTheMessageTells)
 {
     for (const auto& [elements, columns] : casesIn<2>("inbound/new-cars.txt")) {
