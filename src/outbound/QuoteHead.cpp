@@ -87,8 +87,9 @@ InsurerReference referenceOf(const QuoteRows& rows)
 {
     InsurerReference reference;
     if (!rows.key.isMain()) {
-        const QString authorised = trimmed(rows.quote, "KESTAuthNo");
-        reference.authorisedQuoteNumber = authorised.isEmpty() ? text(rows.mainQuote, "KESTQuoteNo") : authorised;
+        const QString authorised = text(rows.quote, "KESTAuthNo");  // even a blank one, which then points nowhere
+        reference.authorisedQuoteNumber =
+            authorised.isEmpty() ? text(rows.mainQuote, "KESTQuoteNo") : authorised.trimmed();
     } else if (text(rows.quote, "KESTQRNo").isEmpty()) {
         reference.claimNumber = trimmed(rows.quote, "Claim");
     } else {

@@ -28,16 +28,20 @@ QuoteRows::QuoteRows(db::Recordset& quoteRecord) : quote(quoteRecord), key(Quote
     customer =
         opened(sql("SELECT CUST_ID, SALUTATION, FIRSTNAME, NAME, PHONE_P, PHONE_B FROM CUSTOMER WHERE CUST_ID='{}'",
                    car.value(u"CUST_ID"_s)));
-    require(customer, u"customer"_s, *this);
     model = opened(
         sql("SELECT MODEL_ID, MAKE, MODEL, SCHEDULE FROM ALLMODEL WHERE MODEL_ID='{}'", car.value(u"MODEL_ID"_s)));
     body = opened(sql("SELECT body_id2, body_desc2 FROM BODY2 WHERE BODY2.body_id2='{}'", car.value(u"BODY_ID2"_s)));
     notes = opened(
         sql("SELECT QTNNO, SUBQUOTE, REMARKS, P_REMARKS, INCIDENT_NOTES FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'",
             key.number, key.subquote));
-    require(notes, u"notes row"_s, *this);
     if (!key.isMain())
         mainQuote = opened(sql("select * from quote1 where qtnno = '{}' and subquote = '0'", key.number));
+}
+
+void QuoteRows::requireAll() const
+{
+    require(customer, u"customer"_s, *this);
+    require(notes, u"notes row"_s, *this);
 }
 
 QString text(const db::Recordset& record, const char* column)

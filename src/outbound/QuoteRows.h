@@ -10,8 +10,10 @@ namespace kest {
 
 /// The records of a quote, read once.
 struct QuoteRows {
-    /// Reads the records. Throws RuntimeError if a required one is missing.
+    /// Reads the records. Throws RuntimeError if there is no car.
     explicit QuoteRows(db::Recordset& quoteRecord);
+    /// Throws RuntimeError if the customer or the notes row is missing.
+    void requireAll() const;
 
     db::Recordset& quote;
     QuoteKey key;

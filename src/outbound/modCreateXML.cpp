@@ -87,6 +87,7 @@ double CreateQuoteXML(db::Recordset& quote)
 
     if (rows.model.eof() || text(rows.model, "MAKE").toUpper().contains("UNIVERSAL"_L1))
         return refuse(u"Please Select a Make and Model for this car"_s);
+    rows.requireAll();
     const InsurerReference reference = referenceOf(rows);
     if (!rows.key.isMain() && reference.authorisedQuoteNumber.trimmed().isEmpty())
         return refuse(u"The main quote has no ORLA quote number yet, this additional cannot be sent."_s);

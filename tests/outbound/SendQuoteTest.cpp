@@ -22,6 +22,11 @@ TEST_F(Sending, ARefusalChangesNothing)
         empty({"QUOTE1", "QUOTE2", "QUOTE3", "CAR", "CUSTOMER"});
         gConn->execute(u"UPDATE INSURER SET KEST=1"_s);
     }
+    sendable();
+    gConn->execute(u"UPDATE CAR SET MODEL_ID='Z000'"_s);
+    empty({"QUOTE3"});
+    EXPECT_EQ(send("500"), 0);
+    EXPECT_EQ(shown(), "[critical] Please Select a Make and Model for this car");
 }
 
 TEST_F(Sending, AMainQuoteOfARequestIsLocked)
@@ -53,6 +58,9 @@ TEST_F(Sending, ASupplementaryQuoteGoesInPlaceOfItsMainQuote)
               "[information] Quote Sent.\n"
               "[critical] This additional has already been submitted to ORLA, you cannot send a quote twice.\n"
               "[critical] The main quote has no ORLA quote number yet, this additional cannot be sent.");
+    quote("500").quoteNumber("KQ1");
+    quote("500", 1).authorised("  ");  // not empty, so the main quote's number does not take its place
+    EXPECT_EQ(send("500"), 0);
     quote("500", 1).authorised(" A9 ");
     EXPECT_EQ(send("500"), 110);
     EXPECT_EQ(element(u"kestAuthorisedQuoteNumber"_s) + element(u"quoteBody/quoteType"_s), "A9S");
