@@ -136,7 +136,8 @@ std::optional<QString> passwordFromInput()
     QString password = QString::fromLocal8Bit(input.readLine());
     while (password.endsWith(u'\n') || password.endsWith(u'\r'))
         password.chop(1);
-    if (password.contains(u';') || password.trimmed() != password ||
+    // a driver takes a leading "{" as the beginning of a quoted value
+    if (password.contains(u';') || password.startsWith(u'{') || password.trimmed() != password ||
         files::fromCodePage(files::toCodePage(password)) != password)
         return {};
     return password;
@@ -145,8 +146,9 @@ std::optional<QString> passwordFromInput()
 Outcome badPassword()
 {
     return refused(
-        u"the password is read from standard input, and must not contain \";\", blanks at its ends or characters "
-        "outside of code page 1252"_s,
+        u"the password is read from standard input, and must not contain \";\", begin with \"{\", have blanks at its "
+        u"ends or "
+        "contain characters outside of code page 1252"_s,
         Refused);
 }
 

@@ -168,7 +168,7 @@ void writeHeader(Export& job)
     const db::Recordset& insurer = job.insurer;
     const db::Recordset& customer = job.customer;
     const db::Recordset& car = job.car;
-    const QVariant invoiced = job.debtor.eof() ? QVariant() : toText(job.debtor.value(u"INVDATE"_s));
+    const QVariant invoiced = job.debtor.eof() ? QVariant() : job.debtor.text(u"INVDATE"_s);
     const Address insurerAddress = addressOf(insurer, 0);
     const Address customerAddress = addressOf(customer, QString(u""_s));
     const joblink::BuildDate built = joblink::buildDate(car.value(u"Year"_s));
@@ -177,7 +177,7 @@ void writeHeader(Export& job)
         {u"nJobID_FK", job.jobId},
         {u"JobNr", q.value(u"QTNNO"_s)},
         {u"estNr", q.value(u"QTNNO"_s)},
-        {u"estimateDate", toText(main.value(u"qtndate"_s))},
+        {u"estimateDate", main.text(u"qtndate"_s)},
         {u"startDate", main.value(u"CAR_IN"_s)},
         {u"endDate", main.value(u"targetdate"_s)},
         {u"invoiceDate", invoiced},

@@ -119,6 +119,7 @@ TEST_F(Command, NoSettingShowsAPassword)
     EXPECT_TRUE(files::readBytes(profile.root() + u"/registry.ini"_s).contains("SAPwd=text:s3cret\n")) << "as the host";
 
     const QString words = u"joblink set --server localhost --port 3306 --database jobs --user shop"_s;
+    EXPECT_EQ(kest2(words, {}, "{s3cret}\n").exitCode, app::Refused);
     EXPECT_EQ(kest2(words, {}, "s3cret-pass\n").exitCode, app::Done);
     EXPECT_FALSE(files::readBytes(app::where()[u"database"_s].toString()).contains("s3cret"));
 }

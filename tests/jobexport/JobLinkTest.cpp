@@ -105,16 +105,23 @@ TEST_F(JobLink, ALineThatAMarkerPointsAtIsLeftOut)
     EXPECT_EQ(details("lineDescn"), "new");
 }
 
-TEST_F(JobLink, AHeaderThatLacksSomethingIsTold)
+TEST_F(JobLink, AMissingDateIsAnEmptyText)
 {
     quote("500").set("qtndate", nullptr);
+    addRow("DEBTOR", {{"QTNNO", "500"}});
     exportQuote();
-    EXPECT_EQ(statusOfTheJob(), 0);
-    quote("500").set("qtndate", QDate(2008, 3, 21));
+    EXPECT_EQ(statusOfTheJob(), 1);
+    const auto written = rows("SELECT estimateDate, invoiceDate FROM newJobHdr");
+    for (const QString& column : written.columns())
+        EXPECT_TRUE(!written.isNull(column) && written.text(column).isEmpty()) << column.toStdString();
+}
+
+TEST_F(JobLink, AHeaderThatLacksSomethingIsTold)
+{
     car("ABC123").set("MODEL_ID", nullptr);
     exportQuote();
     EXPECT_TRUE(rows("SELECT * FROM newJobHdr").eof());
-    EXPECT_EQ(QString::fromStdString(shown()).count(u"Wirra32.KEST2.modLoadXML.WriteQuote"_s), 2);
+    EXPECT_EQ(QString::fromStdString(shown()).count(u"Wirra32.KEST2.modLoadXML.WriteQuote"_s), 1);
 
     car("ABC123").set("CUST_ID", nullptr);
     exportQuote();
