@@ -187,7 +187,7 @@ void frmUtilities::AddTabs()
     };
     add(u"Quote"_s, u"0"_s);
     db::Recordset subquotes(gConn);
-    subquotes.open(sql("SELECT SUBQUOTE FROM QUOTE1 WHERE QTNNO='{}'", shown.number));
+    subquotes.open(sql("SELECT SUBQUOTE FROM QUOTE1 WHERE QTNNO='{}' ORDER BY SUBQUOTE", shown.number));
     if (subquotes.recordCount() > 1) {
         for (subquotes.moveNext(); !subquotes.eof(); subquotes.moveNext())
             add(u"Add.-"_s + subquotes.text(u"SUBQUOTE"_s), subquotes.text(u"SUBQUOTE"_s));
