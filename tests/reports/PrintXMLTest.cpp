@@ -132,11 +132,12 @@ TEST_F(Printing, EachChangedLineStandsInItsSection)
     quote("500").request("QR1").line(1, "R&R", "Labour deleted").set("qty", 1.0);
     quote("500").line(2, "MIS", "Labour other").set("qty", 1.0);
     Message message = authorisedQuote("500");
-    message.labour(1, "D").labour(2, "D");
+    message.labour(1, "D").labour(2, "D").labour(88, "D").paint(89, "D");
     message.labour(90, "C", {{"labourType", "OTH"}, {"labourGroup", ""}, {"labourDescription", "Labour kept"}});
     message.labour(91, "I", {{"labourType", ""}, {"labourGroup", "1"}, {"labourDescription", "Labour unknown"}});
     message.part(92, "I", {{"partDescription", "Parts unknown"}});
     message.paint(93, "I", {{"paintWorkType", ""}, {"paintGroup", "1"}, {"paintDescription", "Paint unknown"}});
+    message.paint(96, "C", {{"paintWorkType", "BLND"}, {"paintGroup", ""}, {"paintDescription", "Paint bare"}});
     message.sublet(94, "C", {{"subletType", "OTH"}, {"subletDescription", "Sublet other"}});
     message.sublet(95, "I", {{"subletType", ""}, {"subletDescription", "Sublet bare"}});
     report::setOutputFolder(root() + u"/out"_s);
@@ -154,7 +155,9 @@ TEST_F(Printing, EachChangedLineStandsInItsSection)
         count += found.hasMatch() ? 1 : 0;
         EXPECT_TRUE(!found.hasMatch() || found.captured(1) == section) << line;
     }
-    EXPECT_EQ(count, 8);
+    EXPECT_EQ(count, 9);
+    const QString gone = pdfText(root() + u"/out/1-730.pdf"_s).section(u"Deleted, not in this quote"_s, 1);
+    EXPECT_EQ(gone.count(u"This quote has no line of that number."_s), 2) << "88 and 89";
     const QString unchanged = pdfText(root() + u"/out/2-730.pdf"_s);
     EXPECT_TRUE(unchanged.contains(u"No line of this quote was changed"_s));
     EXPECT_FALSE(unchanged.contains(u"Authorised"_s));
