@@ -5,6 +5,7 @@
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
 #include "platform/Prompt.h"
+#include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "quotedata/NetworkCodes.h"
 #include "quotedata/NoteChain.h"
@@ -103,9 +104,23 @@ bool LoadBACA(QString& text, const QString& fileName)
 
 void LoadSubmissionResponse(QString& text, const QString& fileName)
 {
-    Quote quote(QuoteKey::fromResponseName(fileName));
+    const auto fail = [&](int number, const QString& what) {
+        throw RuntimeError(number, fileName + u' ' + what +
+                                       u". Move the file out of the folder; until then no messages are listed."_s);
+    };
+    const QuoteKey key = QuoteKey::fromResponseName(fileName);
+    if (key.number.isEmpty() || key.subquote.isEmpty())
+        fail(NoCurrentRow, u"does not name the quote that it answers"_s);
+    Quote quote(key);
+    if (!quote.exists())
+        fail(NoCurrentRow, u"answers quote %1, which is no longer there"_s.arg(key.reference()));
+    if (quote.notes().eof())
+        fail(NoCurrentRow, u"answers quote %1, which has no notes row"_s.arg(key.reference()));
     const SharedMessage message = sharedMessage(text);
     const xml::Node root = message->documentElement();
+    if (!root.selectSingleNode(u"rootns:kestQuoteNumber"_s) ||
+        !root.selectSingleNode(u"rootns:quoteSubmissionStatus"_s))
+        fail(NoObject, u"contains no complete answer to quote %1"_s.arg(key.reference()));
     quote.header().set(u"KESTQuoteNo"_s, root.textOf(u"rootns:kestQuoteNumber"_s));
     if (root.textOf(u"rootns:quoteSubmissionStatus"_s) == u"Submitted"_s)
         applyTransition(quoteSubmitted, quote);

@@ -200,7 +200,11 @@ QList<ListedMessage> BuildMessageList(MessageFolder folder, const FillHooks& hoo
             try {
                 fill.take(file);
             } catch (const RuntimeError& error) {
-                throw RuntimeError(error.number(), file + ": "_L1 + error.description(), error.source());
+                const bool isNamed = error.description().startsWith(file);
+                // the transport or another workstation may have taken the file since the folder was listed
+                if (files::exists(gsCurFolder + file))
+                    throw RuntimeError(error.number(), (isNamed ? QString() : file + ": "_L1) + error.description(),
+                                       error.source());
             }
         }
         if (hooks.progress)

@@ -1,3 +1,4 @@
+#include "base/modDBAccess.h"
 #include "messagelist/frmMessageList.h"
 #include "platform/script/Gestures.h"
 #include "support/Hands.h"
@@ -53,6 +54,33 @@ static QString key(const char* control, const QString& names)
 {
     return u"{\"key\": \"%1\", \"keys\": [\"%2\"]}"_s.arg(QLatin1StringView(control),
                                                           QString(names).replace(u" "_s, u"\", \""_s));
+}
+
+TEST_F(MessageListWindow, AnAnswerThatCannotBeAppliedIsToldUnderTheList)
+{
+    quote("500");
+    quote("501");
+    gConn->execute(u"DELETE FROM QUOTE3 WHERE QTNNO='501'"_s);
+    const QString answer = submissionResponse("KQ1").text();
+    const std::tuple<QString, QString, QString> cases[] = {
+        {u"R_502_1.xml"_s, answer, u"answers quote 502/1, which is no longer there"_s},
+        {u"R_501_0.xml"_s, answer, u"answers quote 501, which has no notes row"_s},
+        {u"R_500.xml"_s, answer, u"does not name the quote that it answers"_s},
+        {u"R_500_0.xml"_s, answer + u"<more/>"_s, u"contains no complete answer to quote 500"_s},
+    };
+    arrive("m.xml", cancellation("QR1"));
+    for (const auto& [file, text, reason] : cases) {
+        arrive(file, text);
+        frmMessageList window;
+        window.open();
+        EXPECT_EQ(window.findChild<QLabel*>(u"lblStatus"_s)->text(),
+                  u"The list could not be filled: %1 %2. Move the file out of the folder; until then no messages are "
+                  "listed."_s.arg(file, reason));
+        EXPECT_TRUE(window.rows().isEmpty());
+        files::remove(gsUnreadPath + file);
+    }
+    EXPECT_EQ(shown(), "");
+    EXPECT_EQ(quote("500").text("KESTQuoteNo"), "");
 }
 
 TEST_F(MessageListWindow, ALoadedMessageMakesRoomForTheNextOfItsRequest)

@@ -141,6 +141,22 @@ TEST_F(MessageList, WhatCannotBeReadHidesNothingElse)
     EXPECT_EQ(desktop->boxTexts(), expected);
 }
 
+TEST_F(MessageList, AFileThatHasGoneSinceTheListingIsPassedOver)
+{
+    for (const char* name : {"a", "b", "c"})
+        arrive(std::string(name) + ".xml", cancellation(name));
+    FillHooks hooks;
+    hooks.progress = [](qint64 done, qint64) {
+        if (done == 1)
+            files::remove(gsUnreadPath + u"b.xml"_s);
+    };
+    QStringList names;
+    for (const ListedMessage& one : BuildMessageList(MessageFolder::Unread, hooks))
+        names += one.file;
+    EXPECT_EQ(names.join(u' '), u"a.xml c.xml"_s);
+    EXPECT_EQ(shown(), "");
+}
+
 TEST_F(MessageList, ARequestWaitsUnreadForAllItsPictures)
 {
     arrive("in.xml", quoteRequest("QR1").images({"1", " ", "22"}));
