@@ -16,7 +16,6 @@
 
 #include <QStringList>
 
-#include <algorithm>
 #include <utility>
 
 namespace kest {
@@ -234,6 +233,23 @@ void takePhotographs(const xml::Node& root, const QString& requestNumber, const 
     }
 }
 
+/// Moves the shop's counter to a free number. Ignores failures: the load is complete, and the counter only shortens the
+/// search for the next number.
+void countOn(db::Recordset& cinfo)
+{
+    attempt([] { EnsureConnection(); });  // the server may have dropped it while the report was open
+    const auto moveOn = [&] {
+        cinfo.cancelUpdate();
+        cinfo.requery();
+        db::Recordset tried(gConn);
+        cinfo.set(u"QUOTE_VAL"_s, NextQuoteNumber({}, cinfo, tried, true));
+        cinfo.update();  // fails if another workstation has moved it meanwhile, perhaps to a number now taken
+    };
+    bool moved = false;
+    for (int tries = 0; tries < 5 && !moved; ++tries)
+        moved = attempt(moveOn);
+}
+
 }  // namespace
 
 bool LoadQREQ(QString& text, const QString& fileName)
@@ -247,7 +263,6 @@ bool LoadQREQ(QString& text, const QString& fileName)
 
     std::unique_ptr<db::Lock> newQuotes = lockNewQuotes();
     cinfo.requery();  // another workstation may have changed the counter before this one got the lock
-    const QVariant counter = cinfo.value(u"QUOTE_VAL"_s);
     db::Recordset quote(gConn);
     const QString quoteNumber = NextQuoteNumber({}, cinfo, quote, false);
     db::Recordset notes = opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}'", quoteNumber));
@@ -303,18 +318,7 @@ bool LoadQREQ(QString& text, const QString& fileName)
     PrintXML(fileName, false);
     takePhotographs(message->documentElement(), request.number, quoteNumber);
 
-    newQuotes = lockNewQuotes();
-    cinfo.requery();
-    if (cinfo.value(u"QUOTE_VAL"_s) != counter)
-        return true;  // another workstation has changed the counter while the report was open
-    db::Recordset tried(gConn);
-    const QString next = NextQuoteNumber(quoteNumber, cinfo, tried, true);
-    // with a prefix of letters the counter stays as it is, and the search skips numbers that are taken
-    const bool isCount = std::ranges::all_of(next, [](QChar c) { return c.isDigit(); });
-    if (isCount) {
-        cinfo.set(u"QUOTE_VAL"_s, next);
-        cinfo.update();
-    }
+    countOn(cinfo);
     return true;
 }
 

@@ -214,6 +214,8 @@ bool frmMessageList::load(const QString& file)
             return false;
         }
         text.clear();  // otherwise a large text would be in memory twice
+        // a report may have been open for hours, and the file's new name comes from the database
+        attempt([] { EnsureConnection(); });
         MoveMessage(file, u"read"_s);
         operation.end(journal::State::Done);
         RefreshList();

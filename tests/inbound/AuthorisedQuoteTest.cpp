@@ -10,15 +10,6 @@ struct AuthorisedQuotes : Shop {
     }
 };
 
-static void putTemplate()
-{
-    const QString name = opened(u"SELECT * FROM ReportDefinition WHERE ReportID=730"_s).text(u"ReportName"_s);
-    files::makeFolder(u"c:\\wirra32\\report"_s);
-    QFile shipped(u":/templates/730.html"_s);
-    ASSERT_TRUE(shipped.open(QIODevice::ReadOnly));
-    files::writeBytes(u"c:\\wirra32\\report\\"_s + name, shipped.readAll());
-}
-
 TEST_F(AuthorisedQuotes, TheHeaderIsWritten)
 {
     quote("500").set("RR_TOTAL", 44).set("override", 5).set("CONTACTID", 3).set("invoiced", true).set("Type", "OLD");
@@ -90,7 +81,7 @@ TEST_F(AuthorisedQuotes, TotalsFollowTheMergedLines)
     quote("500").line(1).set("rrhour", 2).set("rr_rate2", 38);
     quote("500").line(2, "RA").set("rahour", 1).set("rr_rate2", 50);
     quote("500").line(3, "PRT").set("qty", 1).set("rrhour", 80);
-    putTemplate();
+    putTemplate(730);
     EXPECT_TRUE(load(authorisedQuote("500")
                          .labour(1, "N")
                          .labour(2, "D")

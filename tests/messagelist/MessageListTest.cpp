@@ -56,6 +56,26 @@ static QString key(const char* control, const QString& names)
                                                           QString(names).replace(u" "_s, u"\", \""_s));
 }
 
+TEST_F(MessageListWindow, ALoadIsCompleteWhateverHappensWhileItsReportIsOpen)
+{
+    putTemplate(710);
+    arrive("m.xml", quoteRequest("QR1"));
+    const auto other = std::make_shared<db::Connection>();
+    other->open(connectionText(driverNumber()));
+    std::optional<db::Lock> creating;
+    const auto whileOpen = [&](QDialog&) {
+        creating.emplace(other, u"new quote"_s);
+        gConn->close();
+    };
+    const Hands hands({{u"frmPrintPreview"_s, whileOpen}});
+    frmMessageList window;
+    window.open();
+    EXPECT_TRUE(window.loadFile(u"m.xml"_s)) << shown();
+    ASSERT_TRUE(creating && creating->isHeld());
+    EXPECT_EQ(filesIn(gsReadPath).join(u' '), u"1001.xml"_s);
+    EXPECT_EQ(Row("CINFO", "1=1").text("QUOTE_VAL"), "1002");
+}
+
 TEST_F(MessageListWindow, AnAnswerThatCannotBeAppliedIsToldUnderTheList)
 {
     quote("500");

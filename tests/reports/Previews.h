@@ -9,9 +9,8 @@ class Previews : public Shop {
 protected:
     Previews()
     {
-        files::makeFolder(u"c:\\wirra32\\report"_s);
-        for (const char* name : {"710.html", "720.html", "730.html"})
-            putTemplate(name, files::readBytes(checkoutFile(u"templates/"_s + QLatin1String(name))));
+        for (const int report : {710, 720, 730})
+            Shop::putTemplate(report);
     }
 
     /// Writes the template of a report.

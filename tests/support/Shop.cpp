@@ -4,6 +4,7 @@
 #include "inbound/modLoadXML.h"
 #include "messages/Folders.h"
 #include "platform/database/Sql.h"
+#include "support/Places.h"
 #include "support/ShopDatabase.h"
 
 namespace kest::test {
@@ -140,6 +141,13 @@ Shop::~Shop()
 void Shop::arrive(const Text& name, const Text& content)
 {
     files::write(gsUnreadPath + name, content);
+}
+
+void Shop::putTemplate(int report)
+{
+    const QString name = QString::number(report) + u".html"_s;
+    files::makeFolder(u"c:\\wirra32\\report"_s);
+    files::writeBytes(u"c:\\wirra32\\report\\"_s + name, files::readBytes(checkoutFile(u"templates/"_s + name)));
 }
 
 QUrl Shop::bring(const QString& name, const QString& content)

@@ -50,6 +50,8 @@ protected:
 
     /// Puts a file into the unread folder, as the transport does.
     void arrive(const Text& name, const Text& content);
+    /// Puts the template of a report where the shop has its templates.
+    static void putTemplate(int report);
     /// Creates a file outside of the folders, as on a stick that a person brings.
     QUrl bring(const QString& name, const QString& content);
     /// Returns the names of the files in a folder such as `gsReadPath`.

@@ -45,8 +45,7 @@ bool isControl(const QWidget& widget)
 
 EveryWindow::EveryWindow()
 {
-    files::makeFolder(u"c:\\wirra32\\report"_s);
-    files::writeBytes(u"c:\\wirra32\\report\\710.html"_s, files::readBytes(checkoutFile(u"templates/710.html"_s)));
+    putTemplate(710);
     arrive("a.xml", quoteRequest("QR1"));
     arrive("b.xml", cancellation("QR2"));
     arrive("c.xml", cancellation("QR2"));
