@@ -99,6 +99,7 @@ bool LoadEWAP(QString& text, const QString& fileName)
         u"ORLA has removed the excess from this quote due to a special arrangement, "
         "Please update your invoices accordingly.\r\nQuote: "_s +
         reference);
+    EnsureConnection();  // the box may have been open for hours
     quote.header().update();
     quote.notes().update();
     PrintXML(fileName, false);
@@ -125,6 +126,7 @@ bool LoadQTDL(QString& text, const QString&)
         quote.header().update();
         notes.update();
     } else if ((taken = agreesToDeletion())) {
+        EnsureConnection();  // the question may have been open for hours
         // first, because after the deletion the message finds no quote, and a failure here could not be repaired
         applyTransition(supplementaryDeleted, quote.header(), notes, quote.key().reference());
         notes.update();

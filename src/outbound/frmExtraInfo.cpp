@@ -209,6 +209,7 @@ std::pair<QWidget*, QString> frmExtraInfo::complaint() const
         return {txtCylinders, u"Number of Cylinders must be entered."_s};
     if (txtColour->text().isEmpty())
         return {txtColour, u"Colour must be entered."_s};
+    EnsureConnection();  // it may have been lost while the window was open
     if (opened(sql("SELECT Script from KESTColours WHERE Script='{}'", txtColour->text())).eof())
         return {txtColour, u"You must select a valid KEST Colour"_s};
     return {};

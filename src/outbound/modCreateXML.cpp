@@ -2,6 +2,7 @@
 
 #include "base/ModRegistry.h"
 #include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 #include "messages/Envelope.h"
 #include "outbound/QuoteBody.h"
 #include "outbound/QuoteHead.h"
@@ -95,6 +96,7 @@ double CreateQuoteXML(db::Recordset& quote)
     const bool asked = isTrue(quote.value(u"ExtraInfo"_s));
     const ExtraInfoResult answer =
         asked ? frmExtraInfo::ShowForm(number, subquote) : BuildArrayFromDB(number, subquote);
+    EnsureConnection();  // it may have been lost while the window was open
     if (asked && std::holds_alternative<QString>(answer))
         return refuse(std::get<QString>(answer));
     std::optional<ExtraValues> extra;

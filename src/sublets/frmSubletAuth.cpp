@@ -1,5 +1,6 @@
 #include "sublets/frmSubletAuth.h"
 
+#include "base/modDBAccess.h"
 #include "platform/Prompt.h"
 #include "platform/desktop/Lists.h"
 #include "platform/desktop/Window.h"
@@ -72,6 +73,7 @@ frmSubletAuth::frmSubletAuth(const QList<SubletDocument>& documents)
 
 void frmSubletAuth::ShowForm(const QString& QTNNO, const QString& Subquote)
 {
+    EnsureConnection();  // it may have been lost while the report was open
     const QuoteKey quote{QTNNO, Subquote};
     const QStringList numbers = subletDocumentNumbers(quote);
     if (numbers.isEmpty())

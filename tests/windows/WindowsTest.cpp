@@ -1,8 +1,17 @@
 // Tests what a person can expect of every window: a key for everything, readable texts at any size, and names for
 // screen readers.
+#include "base/SharedVariables.h"
 #include "base/modLoggerEx.h"
+#include "messagelist/frmMessageList.h"
+#include "outbound/frmExtraInfo.h"
+#include "platform/files/files.h"
 #include "platform/profile.h"
 #include "platform/script/Gestures.h"
+#include "reports/PrintXML.h"
+#include "shell/eKEST.h"
+#include "support/Hands.h"
+#include "support/ShopDatabase.h"
+#include "utilities/frmUtilities.h"
 #include "windows/EveryWindow.h"
 
 namespace gestures = desktop::gestures;
@@ -258,4 +267,68 @@ TEST_F(EveryWindow, NamesEveryControlForAScreenReader)
         }
         EXPECT_FALSE(window.windowTitle().isEmpty());
     });
+}
+
+// --- Connection ---
+
+TEST_F(EveryWindow, GoesOnAfterTheServerHasDroppedTheConnection)
+{
+    quote("500").request("QR1");
+    putTemplate(730);
+    files::write(gsReadPath + u"501.xml"_s, authorisedQuote("500").text());
+    gsListFolder = gsReadPath;
+    const auto click = [](QDialog& window, const char* name) { control<QAbstractButton>(window, name).click(); };
+    int documents = 0;
+    const Hands hands({
+        {u"frmExtraInfo"_s,
+         [&](QDialog& window) {
+             for (const auto& [name, text] : {std::pair("txtDamageDesc", "dent"),
+                                              {"txtBuildMonth", "3"},
+                                              {"txtBuildYear", "2004"},
+                                              {"txtVIN", "V1"},
+                                              {"txtCylinders", "6"}})
+                 control<QLineEdit>(window, name).setText(QString::fromLatin1(text));
+             dropConnection();
+             click(window, "Command1");
+             EXPECT_FALSE(window.isVisible());
+         }},
+        {u"frmUtilities"_s,
+         [&](QDialog& window) {
+             dropConnection();
+             control<QTabBar>(window, "TabStrip1").setCurrentIndex(1);
+             EXPECT_EQ(control<QLineEdit>(window, "txtQTNNO").text(), u"500/1"_s);
+             dropConnection();
+             click(window, "Command9");
+             dropConnection();
+             click(window, "Command1");
+             EXPECT_FALSE(window.isVisible());
+         }},
+        {u"frmMessageList"_s,
+         [&](QDialog& window) {
+             dropConnection();
+             click(window, "Option1(1)");
+             EXPECT_EQ(control<QLabel>(window, "lblStatus").text(), u"2 messages"_s);
+         }},
+        {u"frmKEST"_s,
+         [&](QDialog& window) {
+             dropConnection();
+             click(window, "Option1(2)");
+             click(window, "cmdOK");
+         }},
+        {u"frmPrintPreview"_s, [](QDialog&) { dropConnection(); }},
+        {u"frmSubletAuth"_s,
+         [&](QDialog& window) { documents = control<QTreeWidget>(window, "ListView1").topLevelItemCount(); }},
+    });
+    frmExtraInfo::ShowForm(u"500"_s, u"0"_s);
+    PrintXML(u"501.xml"_s, true);
+    EXPECT_EQ(documents, 1);
+    frmMessageList::ShowForm();
+    EXPECT_EQ(shown(), "");
+    eKEST().ShowKESTWindow(u"500"_s, u"0"_s);
+    EXPECT_EQ(shown(), "[critical] The main quote has no ORLA quote number yet, this additional cannot be sent.");
+    quote("500").claim("7700001");
+    gsQTNNO = u"500"_s;
+    gsSubQuote = u"0"_s;
+    frmUtilities::ShowForm(u"500"_s, u"0"_s);
+    EXPECT_EQ(shown(), "");
 }
