@@ -202,7 +202,8 @@ bool authorise(QString& text)
     notes.update();
     if (lines.recordCount() > 0)
         lines.moveFirst();  // a search without a match has left them at their end, and the totals would be 0
-    CalcAuthorisedTotals(quote, lines);
+    if (!CalcAuthorisedTotals(quote, lines))
+        tellOldTotals(quote);
     if (comparison)
         finishAuthReport(*comparison, quote, lines);
     showResults(quote, comparison, key);

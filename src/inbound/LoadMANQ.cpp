@@ -223,7 +223,8 @@ bool LoadMANQ(QString& text, const QString& fileName)
     newQuotes.reset();
     if (!LoadQuoteBody(quote, lines, *message))
         return refuseLines();
-    CalcQuoteTotals(quote, lines);
+    if (!CalcQuoteTotals(quote, lines))
+        tellOldTotals(quote);
     quote.update();
 
     setColumns(notes, {{"QTNNO"_L1, quote.value(u"QTNNO"_s)}, {"Subquote"_L1, quote.value(u"Subquote"_s)}});

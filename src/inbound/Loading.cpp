@@ -1,5 +1,6 @@
 #include "inbound/Loading.h"
 
+#include "base/QuoteKey.h"
 #include "platform/Prompt.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
@@ -34,6 +35,15 @@ void respellColour(db::Recordset& car, db::Recordset& colours)
 bool isUnknown(const QString& number, const db::Recordset& quote)
 {
     return number.trimmed().isEmpty() || quote.eof();
+}
+
+void tellOldTotals(const db::Recordset& quote)
+{
+    desktop::msgBox(
+        u"The lines of quote %1 are loaded, but its totals could not be stored. Open the quote in the "
+        "estimating program and save it there, so that its totals are calculated again."_s.arg(
+            QuoteKey::fromRow(quote).reference()),
+        desktop::Icon::Exclamation);
 }
 
 bool refuse(const QString& text)

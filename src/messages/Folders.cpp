@@ -2,6 +2,7 @@
 
 #include "base/Helpers.h"
 #include "base/SharedVariables.h"
+#include "base/modLoggerEx.h"
 #include "messages/Envelope.h"
 #include "messages/MessageTypes.h"
 #include "platform/RuntimeError.h"
@@ -9,6 +10,7 @@
 #include "platform/files/files.h"
 #include "platform/values.h"
 
+#include <functional>
 #include <limits>
 
 using namespace Qt::StringLiterals;
@@ -89,6 +91,19 @@ QString plainOrNone(const QString& name)
     return files::isPlainName(name) ? name : QString();
 }
 
+/// Ignores a failure like attempt(), but writes it to the error log.
+bool attemptLogged(const std::function<void()>& step)
+{
+    return attempt([&] {
+        try {
+            step();
+        } catch (const RuntimeError& error) {
+            attempt([&] { logFailure(error, u"Folders.MoveMessage"_s); });
+            throw;
+        }
+    });
+}
+
 }  // namespace
 
 QString wordOf(MessageFolder folder)
@@ -130,9 +145,9 @@ void MoveMessage(const QString& file, const QString& action)
         if (name.isEmpty())
             name = file;
         // replace an older message of that name only after the copy exists, because the disk may be full
-        const bool copied = attempt([&] { files::copy(gsUnreadPath + file, gsReadPath + name); });
+        const bool copied = attemptLogged([&] { files::copy(gsUnreadPath + file, gsReadPath + name); });
         if (copied && files::exists(gsReadPath + name))
-            attempt([&] { files::remove(gsUnreadPath + file); });
+            attemptLogged([&] { files::remove(gsUnreadPath + file); });
     }
     gsMatchedQTNNO.clear();
 }

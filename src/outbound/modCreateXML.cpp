@@ -3,6 +3,7 @@
 #include "base/ModRegistry.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
+#include "base/modLoggerEx.h"
 #include "messages/Envelope.h"
 #include "outbound/QuoteBody.h"
 #include "outbound/QuoteHead.h"
@@ -59,6 +60,13 @@ QString withoutRoot(const QString& text)
 void addImages(const Branch& request, const QuoteRows& rows)
 {
     const QString folder = GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"ImagesPath"_s, u"c:\\wirimg\\"_s);
+    if (!files::folderExists(folder)) {
+        const QString lost = u"The pictures' folder %1 was not found, so quote %2 is sent without pictures."_s.arg(
+            folder, rows.key.reference());
+        attempt([&] { logFailure(RuntimeError(PathNotFound, lost), u"modCreateXML.addImages"_s); });
+        desktop::msgBox(lost + u" Check the drive, and send the pictures to the insurer in another way."_s,
+                        desktop::Icon::Exclamation);
+    }
     const QList<QuoteImage> images = quoteImages(folder, rows.key);
     request.add("imageCount", QString::number(images.size()));
     if (images.isEmpty())

@@ -1,5 +1,6 @@
 #include "quotedata/QuoteTotals.h"
 
+#include "base/modLoggerEx.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
@@ -103,10 +104,21 @@ double roundedColumn(const db::Recordset& line, const QString& column)
     }
 }
 
+void storeTotals(db::Recordset& quote)
+{
+    try {
+        quote.update();
+    } catch (const RuntimeError& error) {
+        attempt([&] { logFailure(error, u"QuoteTotals.storeTotals"_s); });
+        throw;
+    }
+}
+
 }  // namespace
 
-void CalcQuoteTotals(db::Recordset& quote, db::Recordset& lines)
+bool CalcQuoteTotals(db::Recordset& quote, db::Recordset& lines)
 {
+    bool stored = true;
     attempt([&] {
         if (lines.recordCount() > 0)
             lines.moveFirst();
@@ -118,13 +130,16 @@ void CalcQuoteTotals(db::Recordset& quote, db::Recordset& lines)
         quote.set(u"RA_TOTAL"_s, totals.repair);
         quote.set(u"PAINT_TOTAL"_s, totals.paint);
         quote.set(u"quotechanged"_s, true);
-        if (!attempt([&] { quote.update(); }))
+        stored = attempt([&] { storeTotals(quote); });
+        if (!stored)
             quote.cancelUpdate();  // totals that could not be stored must not go with a later change
     });
+    return stored;
 }
 
-void CalcAuthorisedTotals(db::Recordset& quote, db::Recordset& lines)
+bool CalcAuthorisedTotals(db::Recordset& quote, db::Recordset& lines)
 {
+    bool stored = true;
     attempt([&] {
         if (!lines.eof())
             lines.moveFirst();
@@ -133,9 +148,11 @@ void CalcAuthorisedTotals(db::Recordset& quote, db::Recordset& lines)
         quote.set(u"PRTTOTAL"_s, totals.parts);
         quote.set(u"MISTOTAL"_s, totals.miscellaneous);
         quote.set(u"quotechanged"_s, true);
-        if (!attempt([&] { quote.update(); }))
+        stored = attempt([&] { storeTotals(quote); });
+        if (!stored)
             quote.cancelUpdate();  // totals that could not be stored must not go with a later change
     });
+    return stored;
 }
 
 void RoundQuoteLines(db::Recordset& quote)

@@ -7,13 +7,14 @@ namespace kest {
 
 /// Stores the six totals and the change mark of a quote, calculated from all its lines. Deleted lines, lines that
 /// another line replaces, and report items do not count. `lines` is at its end afterwards. If anything fails, such as a
-/// Null quantity or rate, the quote keeps its totals and no error is reported.
-void CalcQuoteTotals(db::Recordset& quote, db::Recordset& lines);
+/// Null quantity or rate, the quote keeps its totals and no error is reported. Returns false if the totals are known
+/// but could not be stored; the reason is in the error log.
+bool CalcQuoteTotals(db::Recordset& quote, db::Recordset& lines);
 
 /// Does the same for a quote whose lines have authorised amounts: adds all labour to `TOTAL`, leaves the totals of the
 /// single labour sections alone, and also fails if the hours are Null. Counts the lines from the current one on, so the
 /// caller must move `lines` to the first.
-void CalcAuthorisedTotals(db::Recordset& quote, db::Recordset& lines);
+bool CalcAuthorisedTotals(db::Recordset& quote, db::Recordset& lines);
 
 /// Rounds the money and hours of all lines of a quote, then calls CalcQuoteTotals(). Throws RuntimeError if rounding
 /// fails.

@@ -151,6 +151,10 @@ TEST_F(Sending, ImagesGoOutWithTheirDocuments)
 
     QDir(files::systemPath(gsImagesPath)).removeRecursively();
     sendable("600");
+    shown();
     send("600");
     EXPECT_EQ(sent(u"imageCount"_s, u"600.0_1.xml"_s) + sent(u"quoteImageIds"_s, u"600.0_1.xml"_s), "0(none)");
+    EXPECT_EQ(shown(),
+              "[exclamation] The pictures' folder c:\\wirimg\\ was not found, so quote 600 is sent without pictures. "
+              "Check the drive, and send the pictures to the insurer in another way.\n[information] Quote Sent.");
 }
