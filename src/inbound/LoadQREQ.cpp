@@ -274,7 +274,7 @@ bool LoadQREQ(QString& text, const QString& fileName)
 
     const db::Recordset known = opened(sql("SELECT * FROM QUOTE1 WHERE SUBQUOTE=0 AND KESTQRNO='{}' AND KESTQRVER='{}'",
                                            request.number, request.version));
-    if (!known.eof()) {
+    if (!isUnknown(request.number, known)) {
         newQuotes.reset();  // a box may stay open for hours
         return refuse(u"Quote Request already exists as quote number "_s + known.text(u"QTNNO"_s) + u'!');
     }

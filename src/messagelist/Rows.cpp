@@ -118,8 +118,11 @@ void drawFromQuote(MessageRow& row, const db::Recordset& quote)
 void drawThroughKey(MessageRow& row, const xml::Document& message, const MessageType& type)
 {
     attempt([&] {
+        const QString key = message.textOf(type.rowKey);
+        if (key.trimmed().isEmpty())
+            return;  // quotes of the host may have an empty number too
         db::Recordset quote(gConn);
-        quote.open(sql(queryOf(type.rowSource), message.textOf(type.rowKey)));
+        quote.open(sql(queryOf(type.rowSource), key));
         if (!suffices(quote, type.rowsNeeded))
             return;
         draw(row[RegoField], [&] { return toText(quote.value(u"REGO"_s)); });

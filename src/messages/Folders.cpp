@@ -20,7 +20,7 @@ namespace {
 
 QuoteKey newestOfRequest(const QString& request, const QString& version)
 {
-    if (request.isEmpty())
+    if (request.trimmed().isEmpty())
         return {};
     db::Recordset quote(gConn);
     quote.open(version.isEmpty()
@@ -32,7 +32,7 @@ QuoteKey newestOfRequest(const QString& request, const QString& version)
 
 QuoteKey lastOfNetworkNumber(const QString& number)
 {
-    if (number.isEmpty())
+    if (number.trimmed().isEmpty())
         return {};
     db::Recordset quote(gConn);
     quote.open(sql("SELECT * FROM QUOTE1 WHERE KESTQuoteNo='{}'", number));

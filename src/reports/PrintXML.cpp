@@ -136,7 +136,7 @@ bool printRequest(const xml::Document& message)
     db::Recordset quote(gConn);
     quote.open(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' AND KESTQRVer='{}' ORDER BY rec_id DESC", requestNumber,
                    message.textOf(u"//rootns:quoteRequestVersionNumber"_s)));
-    if (quote.eof()) {
+    if (quote.eof() || requestNumber.trimmed().isEmpty()) {
         desktop::msgBox(u"Quote does not exist in database, please contact MarlinDesk Support."_s,
                         desktop::Icon::Critical);
         return false;
@@ -159,7 +159,7 @@ bool printResult(const xml::Document& message)
     const QString requestNumber = message.textOf(u"//rootns:kestQuoteRequestNumber"_s);
     db::Recordset quote(gConn);
     quote.open(sql("SELECT * FROM QUOTE1 WHERE KESTQRNo='{}' ORDER BY rec_id DESC", requestNumber));
-    if (quote.recordCount() != 1) {
+    if (quote.recordCount() != 1 || requestNumber.trimmed().isEmpty()) {
         desktop::msgBox(u"Failed Matching Quote. Please contact MarlinDesk Support"_s, desktop::Icon::Critical);
         return false;
     }

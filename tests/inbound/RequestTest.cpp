@@ -112,6 +112,13 @@ TEST_F(Requests, AKnownCarKeepsEverythingButItsColoursSpelling)
     EXPECT_EQ(car("GONE01").number("CUST_ID"), customer("Tarrant").id());
 }
 
+TEST_F(Requests, AnEmptyRequestNumberIsNotKnown)
+{
+    quote("500").request("", "");
+    EXPECT_TRUE(load(quoteRequest("").set("quoteRequestVersionNumber", "")));
+    EXPECT_EQ(rowCount("QUOTE1", "KESTQRNo=''"), 2);
+}
+
 TEST_F(Requests, ACarWithoutAPaintGroupIsNamedWithTheColumn)
 {
     car("ABC123").set("PAINT_GP", nullptr);

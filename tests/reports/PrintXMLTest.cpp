@@ -127,6 +127,16 @@ TEST_F(Printing, AnAuthorisationAlsoShowsItsSubletDocuments)
     EXPECT_EQ(shownReports(), "frmPrintPreview730 frmSubletAuth");
 }
 
+TEST_F(Printing, AnEmptyNumberMatchesNoQuote)
+{
+    quote("500").request("", "");
+    print(quoteRequest("").set("quoteRequestVersionNumber", ""));
+    print(assessmentResult("KQ1").set("kestQuoteRequestNumber", ""));
+    EXPECT_EQ(shown(),
+              "[critical] Quote does not exist in database, please contact MarlinDesk Support.\n"
+              "[critical] Failed Matching Quote. Please contact MarlinDesk Support");
+}
+
 TEST_F(Printing, EachChangedLineStandsInItsSection)
 {
     quote("500").request("QR1").line(1, "R&R", "Labour deleted").set("qty", 1.0);

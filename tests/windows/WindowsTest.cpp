@@ -286,7 +286,8 @@ TEST_F(EveryWindow, GoesOnAfterTheServerHasDroppedTheConnection)
                                               {"txtBuildMonth", "3"},
                                               {"txtBuildYear", "2004"},
                                               {"txtVIN", "V1"},
-                                              {"txtCylinders", "6"}})
+                                              {"txtCylinders", "6"},
+                                              {"txtColour", "Red"}})
                  control<QLineEdit>(window, name).setText(QString::fromLatin1(text));
              dropConnection();
              click(window, "Command1");
