@@ -10,7 +10,7 @@ struct Opened {
     db::Recordset lines = kest::opened(u"SELECT * FROM QUOTE2 WHERE QTNNO='500'"_s);
 };
 
-static void calc(void (*routine)(db::Recordset& quote, db::Recordset& lines))
+static void calc(bool (*routine)(db::Recordset& quote, db::Recordset& lines))
 {
     Opened opened;
     routine(opened.header, opened.lines);
