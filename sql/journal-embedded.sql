@@ -3,7 +3,7 @@
 -- one row for each load, send, save or response that changed something
 CREATE TABLE KESTOperation (
     Operation     INTEGER PRIMARY KEY AUTOINCREMENT,
-    Kind          VARCHAR(10) COLLATE NOCASE NOT NULL,
+    OperationKind VARCHAR(10) COLLATE NOCASE NOT NULL,
     State         VARCHAR(12) COLLATE NOCASE NOT NULL,
     FileName      VARCHAR(255) COLLATE NOCASE,
     FileHash      VARCHAR(64) COLLATE NOCASE,

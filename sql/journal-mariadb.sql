@@ -3,7 +3,7 @@
 -- one row for each load, send, save or response that changed something
 CREATE TABLE KESTOperation (
     Operation     INTEGER NOT NULL AUTO_INCREMENT PRIMARY KEY,
-    Kind          VARCHAR(10) NOT NULL,
+    OperationKind VARCHAR(10) NOT NULL,
     State         VARCHAR(12) NOT NULL,
     FileName      VARCHAR(255),
     FileHash      VARCHAR(64),

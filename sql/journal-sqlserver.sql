@@ -3,7 +3,7 @@
 -- one row for each load, send, save or response that changed something
 CREATE TABLE KESTOperation (
     Operation     INT IDENTITY(1,1) NOT NULL PRIMARY KEY,
-    Kind          NVARCHAR(10) NOT NULL,
+    OperationKind NVARCHAR(10) NOT NULL,
     State         NVARCHAR(12) NOT NULL,
     FileName      NVARCHAR(255),
     FileHash      NVARCHAR(64),

@@ -22,7 +22,7 @@ Entry entryAt(const db::Recordset& row)
 {
     Entry entry;
     entry.id = toLong(row.value(u"Operation"_s));
-    entry.kind = row.text(u"Kind"_s);
+    entry.kind = row.text(u"OperationKind"_s);
     entry.state = row.text(u"State"_s);
     entry.file = row.text(u"FileName"_s);
     entry.hash = row.text(u"FileHash"_s);

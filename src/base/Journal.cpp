@@ -79,7 +79,7 @@ void Recorder::openOperation(db::Connection& connection)
     db::Recordset row(gConn);
     row.open(u"SELECT * FROM KESTOperation WHERE Operation=0"_s);
     row.addNew();
-    row.set(u"Kind"_s, wordOf(work->kind));
+    row.set(u"OperationKind"_s, wordOf(work->kind));
     row.set(u"State"_s, wordOf(State::Open));
     row.set(u"FileName"_s, work->file);
     row.set(u"FileHash"_s, work->hash);

@@ -120,10 +120,10 @@ TEST_F(JournalOfAShop, IsNotNeededForALoad)
 TEST_F(JournalOfAShop, ForgetsOldOperationsSomeRowsAtATimeButNoOpenOne)
 {
     const auto operation = [](int number, const char* state, int daysAgo) {
-        gConn->execute(
-            sql("INSERT INTO KESTOperation (Operation, Kind, State, StartedAt) VALUES ({}, 'load', '{}', '{}')", number,
-                QString::fromLatin1(state),
-                QDateTime::currentDateTime().addDays(-daysAgo).toString(u"yyyy-MM-ddTHH:mm:ss"_s)));
+        gConn->execute(sql(
+            "INSERT INTO KESTOperation (Operation, OperationKind, State, StartedAt) VALUES ({}, 'load', '{}', '{}')",
+            number, QString::fromLatin1(state),
+            QDateTime::currentDateTime().addDays(-daysAgo).toString(u"yyyy-MM-ddTHH:mm:ss"_s)));
     };
     operation(1, "open", 200);
     operation(2, "done", 100);

@@ -138,7 +138,7 @@ TEST_F(Profile, ItsTablesTakeWhatAHostWrites)
 }
 
 // A host's own profile, or one from before there were indexes.
-TEST_F(Profile, GetsTheIndexesThatItLacks)
+TEST_F(Profile, GetsTheIndexesAndTablesThatItLacks)
 {
     ASSERT_TRUE(app::initProfile(registerClass, false));
     const QString ours = u"SELECT name FROM sqlite_master WHERE type='index' AND sql<>'' ORDER BY name"_s;
@@ -146,6 +146,8 @@ TEST_F(Profile, GetsTheIndexesThatItLacks)
     ASSERT_EQ(all.find("CUSTOMER_NAME"), 0U);
     for (const app::Index& index : app::quoteIndexes())
         app::openEmbedded(u"WirSql"_s)->execute(u"DROP INDEX "_s + index.name);
+    for (const QString& table : {u"KESTOperation"_s, u"KESTJournal"_s})
+        app::openEmbedded(u"WirSql"_s)->execute(u"DROP TABLE "_s + table);
     ASSERT_EQ(column(ours), "");
     EXPECT_FALSE(app::initProfile(registerClass, false));
     EXPECT_EQ(column(ours), all);
