@@ -6,6 +6,7 @@
 #include "app/Outcome.h"
 #include "app/TransportCommand.h"
 #include "base/CredentialCipher.h"
+#include "base/Interruptions.h"
 #include "base/ModRegistry.h"
 #include "base/SharedVariables.h"
 #include "jobexport/JobLinkSettings.h"
@@ -294,7 +295,14 @@ Outcome runConnected(const Command& command, const CommandLine& line)
     if (!hasConnection())
         return {.exitCode = NoConnection};
     InitCipherKey();  // as the panel does, because a load may export to JobLink
-    return command.run(line);
+    attempt([] { journal::findInterrupted(); });
+    const QList<journal::Entry> interrupted = journal::takeInterrupted();
+    for (const journal::Entry& entry : interrupted)
+        say(u"kest2: "_s + journal::interruptionOf(entry) + u'\n', stderr);
+    Outcome outcome = command.run(line);
+    if (!interrupted.isEmpty())
+        outcome.fields[u"recovered"_s] = jsonOf(interrupted);
+    return outcome;
 }
 
 Outcome runChecked(const CommandLine& line)

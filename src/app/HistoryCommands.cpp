@@ -75,4 +75,16 @@ Outcome history(const QStringList& arguments)
     return {.fields = {{u"operations"_s, operations}}, .text = text};
 }
 
+QJsonArray jsonOf(const QList<journal::Entry>& interrupted)
+{
+    QJsonArray told;
+    for (const journal::Entry& entry : interrupted)
+        told.append(QJsonObject{{u"operation"_s, entry.id},
+                                {u"kind"_s, entry.kind},
+                                {u"file"_s, entry.file},
+                                {u"outcome"_s, u"left"_s},
+                                {u"left"_s, QJsonArray{journal::interruptionOf(entry)}}});
+    return told;
+}
+
 }  // namespace kest::app

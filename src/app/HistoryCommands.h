@@ -2,12 +2,17 @@
 #pragma once
 
 #include "app/Outcome.h"
+#include "base/Interruptions.h"
 
+#include <QJsonArray>
 #include <QStringList>
 
 namespace kest::app {
 
 /// `history QTNNO [SUBQUOTE]`
 Outcome history(const QStringList& arguments);
+
+/// Returns interrupted operations for the JSON object of a command.
+QJsonArray jsonOf(const QList<journal::Entry>& interrupted);
 
 }  // namespace kest::app

@@ -29,6 +29,7 @@ Entry entryAt(const db::Recordset& row)
     entry.number = row.text(u"QTNNO"_s);
     entry.subquote = row.text(u"Subquote"_s);
     entry.workstation = row.text(u"Workstation"_s);
+    entry.lock = row.text(u"LockName"_s);
     entry.started = row.value(u"StartedAt"_s).toDateTime();
     return entry;
 }
@@ -92,6 +93,11 @@ QList<Entry> historyOf(const QString& number, const QString& subquote)
             : sql("SELECT * FROM KESTOperation WHERE Operation IN (SELECT Operation FROM KESTJournal WHERE QTNNO='{}' "
                   "AND Subquote='{}') ORDER BY Operation DESC",
                   number, subquote));
+}
+
+QList<Entry> openOperations()
+{
+    return entries(u"SELECT * FROM KESTOperation WHERE State='open' ORDER BY Operation"_s);
 }
 
 QList<RecordedChange> changesOf(qint64 operation)

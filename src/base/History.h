@@ -19,6 +19,8 @@ struct RecordedChange {
 
 /// The operations that changed rows of a quote, newest first; of all its subquotes if `subquote` is empty.
 QList<Entry> historyOf(const QString& number, const QString& subquote);
+/// The operations that are at work or were interrupted.
+QList<Entry> openOperations();
 /// All that an operation changed, in the order of the changes.
 QList<RecordedChange> changesOf(qint64 operation);
 

@@ -22,7 +22,7 @@ using namespace Qt::StringLiterals;
 namespace {
 
 constexpr std::array kindWords{"load"_L1, "send"_L1, "save"_L1, "response"_L1};
-constexpr std::array stateWords{"open"_L1, "done"_L1, "failed"_L1};
+constexpr std::array stateWords{"open"_L1, "done"_L1, "failed"_L1, "interrupted"_L1};
 
 /// The operation at work.
 struct Work {
@@ -162,6 +162,11 @@ void watch(const db::ConnectionPtr& connection)
 bool isKept()
 {
     return recorder->isKept;
+}
+
+bool isAtWork()
+{
+    return work != nullptr;
 }
 
 Operation::Operation(Kind kind, const QString& file, const QString& hash)

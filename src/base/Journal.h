@@ -22,6 +22,7 @@ enum class State {
     Open,    // at work, or interrupted
     Done,    //
     Failed,  // refused, or ended by a failure; what it wrote stays
+    Interrupted,
 };
 
 QString wordOf(Kind kind);
@@ -37,6 +38,7 @@ struct Entry {
     QString number;  // of the quote, with its subquote; empty if none was changed
     QString subquote;
     QString workstation;
+    QString lock;  // the name of the lock that its owner has
     QDateTime started;
 };
 
@@ -48,6 +50,9 @@ void watch(const db::ConnectionPtr& connection);
 
 /// True if the connection's database keeps a journal.
 bool isKept();
+
+/// True while an operation is at work here.
+bool isAtWork();
 
 /// One operation, for as long as the object lives. Inside another one it belongs to that one and does nothing itself.
 /// Its row is written with its first change; an operation that changes nothing writes nothing. An object that is

@@ -1,6 +1,7 @@
 #include "messagelist/frmMessageList.h"
 
 #include "base/History.h"
+#include "base/Interruptions.h"
 #include "base/Journal.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
@@ -130,6 +131,7 @@ void frmMessageList::fill()
         hooks.progress = [&](qint64 done, qint64 total) { progress.step(done, total); };
         try {
             EnsureConnection();
+            attempt([] { journal::findInterrupted(); });
             listed = BuildMessageList(iFolder, hooks);
         } catch (const RuntimeError& error) {
             fillFailure = error.description();
@@ -137,7 +139,10 @@ void frmMessageList::fill()
     }
     messages->setMessages(std::move(listed));
     choose(0);
-    lblStatus->setText(status());
+    QStringList interruptions;
+    for (const journal::Entry& entry : journal::takeInterrupted())
+        interruptions.append(journal::interruptionOf(entry));
+    lblStatus->setText(interruptions.isEmpty() ? status() : interruptions.join(u' '));
     cmdHeld->setText(u"%1 held back (F4)"_s.arg(heldBack.size()));
     cmdHeld->setShortcut(Qt::Key_F4);  // a new text takes the key away
     cmdHeld->setVisible(!heldBack.isEmpty());

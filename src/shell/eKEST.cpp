@@ -1,10 +1,12 @@
 #include "shell/eKEST.h"
 
+#include "base/Interruptions.h"
 #include "base/ModRegistry.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "base/modLoggerEx.h"
 #include "platform/Prompt.h"
+#include "platform/RuntimeError.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
@@ -72,6 +74,9 @@ void eKEST::ShowKESTWindow(const QString& sQTNNO, const QString& sSubQuote)
         frmKEST panel;
         if (!openHostQuote(sQTNNO, sSubQuote))
             return;
+        attempt([] { journal::findInterrupted(); });
+        for (const journal::Entry& entry : journal::takeInterrupted())
+            desktop::msgBox(journal::interruptionOf(entry), desktop::Icon::Exclamation);
         desktop::showModal(panel);
     });
     files::waitForBackground(closingWait);

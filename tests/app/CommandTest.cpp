@@ -1,6 +1,7 @@
 #include "app/CommandLine.h"
 #include "platform/settings/registry.h"
 #include "setup/Profile.h"
+#include "setup/QuoteDatabase.h"
 #include "shell/component.h"
 #include "support/Test.h"
 
@@ -68,6 +69,22 @@ TEST_F(Command, AFillThatEndedEarlyIsRefusedWithItsReason)
     EXPECT_EQ(ended.json[u"rows"].toArray(), QJsonArray());
     EXPECT_EQ(ended.json[u"failure"].toString(), u"c:\\gone\\AUnread\\: the folder does not exist"_s);
     EXPECT_TRUE(ended.errors.contains(ended.json[u"failure"].toString()));
+}
+
+TEST_F(Command, AnInterruptedLoadIsToldOnce)
+{
+    app::openEmbedded(u"WirSql"_s)
+        ->execute(
+            u"INSERT INTO KESTOperation (Operation, OperationKind, State, FileName, QTNNO, LockName, StartedAt) VALUES "
+            "(17, 'load', 'open', 'm.xml', '1007', 'operation x', '2026-11-23T10:31:00')"_s);
+    const QString told =
+        u"The load of m.xml was interrupted on 23/11/2026 at 10:31. Check quote 1007 before you load "
+        "the message again."_s;
+    const Ended first = kest2(u"list unread"_s);
+    EXPECT_TRUE(first.errors.contains(told)) << first.errors.toStdString();
+    EXPECT_EQ(first.json[u"recovered"][0][u"operation"].toInt(), 17);
+    EXPECT_EQ(first.json[u"recovered"][0][u"left"][0].toString(), told);
+    EXPECT_FALSE(kest2(u"list unread"_s).json.contains(u"recovered"_s));
 }
 
 TEST_F(Command, AListGivesWhatItsWindowShows)

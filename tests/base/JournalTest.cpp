@@ -1,8 +1,10 @@
 // The journal records every change of an operation together with the change, and nothing else.
 #include "base/History.h"
+#include "base/Interruptions.h"
 #include "base/Journal.h"
 #include "base/JournalRecord.h"
 #include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "support/Failure.h"
@@ -115,6 +117,28 @@ TEST_F(JournalOfAShop, IsNotNeededForALoad)
     EXPECT_TRUE(loadAsTheWindow(u"m.xml"_s)) << shown();
     EXPECT_EQ(quote("500").stage(), 9);
     EXPECT_EQ(operations(), QString());
+}
+
+TEST_F(JournalOfAShop, FindsAnInterruptedOperationOnlyWhenItsOwnerIsGone)
+{
+    gConn->execute(
+        u"INSERT INTO KESTOperation (Operation, OperationKind, State, QTNNO, LockName, StartedAt) VALUES (17, 'send', "
+        "'open', '500', 'operation x', '2026-11-23T10:31:00')"_s);
+    {
+        const auto owner = std::make_shared<db::Connection>();
+        owner->open(connectionText(driverNumber()));
+        const db::Lock alive(owner, u"operation x"_s);
+        journal::findInterrupted();
+        EXPECT_TRUE(journal::takeInterrupted().isEmpty());
+    }
+    journal::findInterrupted();
+    const QList<journal::Entry> found = journal::takeInterrupted();
+    ASSERT_EQ(found.size(), 1);
+    EXPECT_EQ(journal::interruptionOf(found[0]),
+              u"The send was interrupted on 23/11/2026 at 10:31. Check quote 500 before you send it again."_s);
+    EXPECT_EQ(rowCount("KESTOperation", "State='interrupted'"), 1);
+    journal::findInterrupted();
+    EXPECT_TRUE(journal::takeInterrupted().isEmpty());
 }
 
 TEST_F(JournalOfAShop, ForgetsOldOperationsSomeRowsAtATimeButNoOpenOne)
