@@ -64,7 +64,7 @@ QString usage()
   view unread|read|sent FILE    the indented text of a message
   history QTNNO [SUBQUOTE]      what changed a quote: when, by which message, and from what to what
   check-database [--prepare]    try on the quote database everything that is relied on, in scratch tables;
-                                --prepare first creates missing indexes
+                                --prepare first creates missing indexes and the journal
   setting list | get APP SECTION KEY | set APP SECTION KEY VALUE     a password is read from standard input
   transport [--once|--window]   carry files between the message folders and an insurer that follows insurer.rules
 

@@ -231,7 +231,7 @@ void Check::makesTables()
 {
     const QStringList columns{u"number "_s + words_.identity,
                               u"code "_s + words_.text,
-                              u"local "_s + words_.national,
+                              u"wide "_s + words_.national,
                               u"seq INTEGER"_s,
                               u"amount %1 DEFAULT 0"_s.arg(words_.number),
                               u"price DECIMAL(10,2)"_s,
@@ -249,7 +249,7 @@ void Check::makesTables()
 void Check::knowsColumns()
 {
     const std::tuple<QString, Kind, int> expected[] = {
-        {u"number"_s, Kind::WholeNumber, 0}, {u"code"_s, Kind::Text, 20},    {u"local"_s, Kind::Text, 20},
+        {u"number"_s, Kind::WholeNumber, 0}, {u"code"_s, Kind::Text, 20},    {u"wide"_s, Kind::Text, 20},
         {u"seq"_s, Kind::WholeNumber, 0},    {u"amount"_s, Kind::Number, 0}, {u"price"_s, Kind::Number, 0},
         {u"flag"_s, Kind::Flag, 0},          {u"day"_s, Kind::Date, 0},      {u"notes"_s, Kind::LongText, 0},
         {u"remarks"_s, Kind::LongText, 0}};
@@ -318,7 +318,7 @@ void Check::noticesOthers()
 {
     const std::tuple<QString, QString, QString, QVariant> changes[] = {
         {u"code"_s, u"'a'"_s, u"'b'"_s, u"c"_s},
-        {u"local"_s, u"NULL"_s, u"'b'"_s, u"c"_s},
+        {u"wide"_s, u"NULL"_s, u"'b'"_s, u"c"_s},
         {u"seq"_s, u"1"_s, u"2"_s, 3},
         {u"flag"_s, u"0"_s, u"1"_s, QVariant()},
         {u"day"_s, u"'2026-02-28T13:05:59'"_s, u"NULL"_s, columnDate(QDate(2026, 3, 1), {})},
@@ -348,9 +348,9 @@ void Check::keepsTexts()
     row.addNew();
     for (const QString& text : {letters, u"x"_s, u""_s}) {
         row.set(u"code"_s, text);
-        row.set(u"local"_s, text);
+        row.set(u"wide"_s, text);
         row.update();
-        expect(rows().text(u"code"_s) == text && rows().text(u"local"_s) == text,
+        expect(rows().text(u"code"_s) == text && rows().text(u"wide"_s) == text,
                u"\"%1\" came back as \"%2\""_s.arg(text, rows().text(u"code"_s)));
     }
     for (const int length : {254, 255, 256, 4001, 8001, 65'536, 65'537, 200'000}) {

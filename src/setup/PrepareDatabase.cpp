@@ -82,6 +82,12 @@ QList<MissingPart> missingParts(const db::ConnectionPtr& connection)
         if (!isServed && hasColumns(connection, index))
             missing.append({u"index of %1 by %2"_s.arg(index.table, index.columns.join(u", "_s)), {index.statement}});
     }
+    const Server server = serverOf(connection);
+    if (!connection->hasTable(u"KESTOperation"_s))
+        missing.append({u"journal (KESTOperation, KESTJournal)"_s,
+                        journalStatements(server == Server::Embedded ? Dialect::Embedded
+                                          : server == Server::MySql  ? Dialect::MariaDb
+                                                                     : Dialect::SqlServer)});
     return missing;
 }
 

@@ -74,9 +74,17 @@ void repairIndexes(db::Connection& database)
         database.execute(QString(index.statement).replace("INDEX "_L1, "INDEX IF NOT EXISTS "_L1));
 }
 
+QStringList journalStatements(Dialect dialect)
+{
+    return statementsIn(script(dialect == Dialect::Embedded  ? u"journal-embedded.sql"_s
+                               : dialect == Dialect::MariaDb ? u"journal-mariadb.sql"_s
+                                                             : u"journal-sqlserver.sql"_s));
+}
+
 void createJournal(db::Connection& database, Dialect dialect)
 {
-    run(database, script(dialect == Dialect::Embedded ? u"journal-embedded.sql"_s : u"journal-mariadb.sql"_s));
+    for (const QString& statement : journalStatements(dialect))
+        database.execute(statement);
 }
 
 void fillNewShop(db::Connection& database)

@@ -10,7 +10,7 @@
 
 namespace kest::app {
 
-enum class Dialect { Embedded, MariaDb };
+enum class Dialect { Embedded, MariaDb, SqlServer };
 
 /// An index of the quote database.
 struct Index {
@@ -25,10 +25,12 @@ QList<Index> quoteIndexes();
 /// creates those that it lacks.
 void repairIndexes(db::Connection& database);
 
-/// Creates the tables of the journal.
+/// Returns the statements that create the tables of the journal.
+QStringList journalStatements(Dialect dialect);
+/// Creates them.
 void createJournal(db::Connection& database, Dialect dialect);
 
-/// Returns the statements that create all tables.
+/// Returns the statements that create all tables of a quote database, which on SQL Server only the host creates.
 QStringList schemaStatements(Dialect dialect);
 /// Creates all tables and indexes in an empty database.
 void createTables(db::Connection& database, Dialect dialect);

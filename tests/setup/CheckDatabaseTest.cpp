@@ -9,14 +9,8 @@
 #include "support/Shop.h"
 #include "support/Snapshot.h"
 
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
-
-namespace {
-
 /// What failed, and why.
-std::string failures(const std::function<db::ConnectionPtr()>& connect = anotherConnection)
+static std::string failures(const std::function<db::ConnectionPtr()>& connect = anotherConnection)
 {
     QStringList texts;
     for (const app::CheckedPoint& point : app::checkDatabase(connect).points) {
@@ -26,8 +20,7 @@ std::string failures(const std::function<db::ConnectionPtr()>& connect = another
     return texts.join(u'\n').toStdString();
 }
 
-class CheckedDatabase : public Shop {
-protected:
+struct CheckedDatabase : Shop {
     ~CheckedDatabase() override { db::setStatementFault({}); }
 
     static QStringList tables()
@@ -37,8 +30,6 @@ protected:
         return names;
     }
 };
-
-}  // namespace
 
 TEST_F(CheckedDatabase, HoldsAndIsLeftAsItWas)
 {
@@ -93,5 +84,3 @@ TEST(IncompleteDatabase, EachMissingTableAndColumnIsNamed)
               "the quote tables have every column that is used: there is no column KESTColours.id; KESTColours.Script "
               "holds another kind of value; there is no table SUBLET");
 }
-
-}  // namespace kest::test

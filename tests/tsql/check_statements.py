@@ -44,7 +44,7 @@ def broken_rule(statement):
         if kind == "word" and word in ("TRUE", "FALSE", "COLLATE", "REGEXP"):
             return "the server knows no " + word
         if kind == "word" and after == "(" and place and not part.startswith("@"):
-            is_table = tokens[place - 1][1].upper() == "INTO" or tokens[0][1].upper() == "CREATE"
+            is_table = tokens[place - 1][1].upper() == "INTO" or tokens[0][1].upper() in ("CREATE", "ALTER")
             if word not in FUNCTIONS | BEFORE_PARENTHESIS and not is_table:
                 return "the function %s is not among those that we use" % part
     return None
