@@ -61,7 +61,7 @@ void addQuotes(int quotes)
 
 void addLines(int lines)
 {
-    quote("500").request("QR1").quoteNumber("KQ1");
+    quote("500").quoteNumber("KQ1");
     addRows("QUOTE2", "QTNNO, Subquote, SEQ_NO, category, script, rrhour, rr_rate2, qty, PartNo, itemno, MARK",
             "'500', 0, i, CASE i % 3 WHEN 0 THEN 'R&R' WHEN 1 THEN 'RA' ELSE 'MIS' END, 'Front guard', 1, 38.5, 1, '', "
             "'137', ''",
