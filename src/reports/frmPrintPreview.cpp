@@ -139,11 +139,13 @@ void frmPrintPreview::crvPreview_PrintButtonClicked()
     report::setPaper(printer);
     QPrintDialog setup(&printer, this);
     setup.setObjectName(u"PrintDialog"_s);
+    setup.setMinMax(1, crvPreview->pageCount());
     desktop::showModal(setup);
     if (setup.result() != QDialog::Accepted)
         return;
     const bool isRange = printer.printRange() == QPrinter::PageRange;
-    report::paint(crvPreview->report(), printer, isRange ? printer.fromPage() : 1, isRange ? printer.toPage() : 0);
+    report::paint(crvPreview->report(), printer, isRange ? printer.fromPage() : 1, isRange ? printer.toPage() : 0,
+                  printer.supportsMultipleCopies() ? 1 : printer.copyCount());
 }
 
 void frmPrintPreview::resizeEvent(QResizeEvent* event)

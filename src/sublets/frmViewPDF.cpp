@@ -1,12 +1,11 @@
 #include "sublets/frmViewPDF.h"
 
 #include "platform/Prompt.h"
+#include "platform/desktop/PageTools.h"
 #include "platform/desktop/Progress.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
 
-#include <QHBoxLayout>
-#include <QLabel>
 #include <QPainter>
 #include <QPdfDocument>
 #include <QPdfPageNavigator>
@@ -15,8 +14,8 @@
 #include <QPrinter>
 #include <QScreen>
 #include <QScrollBar>
-#include <QShortcut>
-#include <QToolButton>
+
+#include <algorithm>
 
 using namespace Qt::StringLiterals;
 
@@ -30,7 +29,6 @@ constexpr double largestZoom = 8;
 constexpr int printResolution = 300;  // dots per inch
 constexpr double pointsPerInch = 72;
 constexpr int rightMargin = 150;  // twips
-constexpr int stripMargin = 75;   // twips
 
 QString whyNotOpened(QPdfDocument::Error error)
 {
@@ -53,8 +51,15 @@ frmViewPDF::frmViewPDF(QPdfDocument& document, const QString& caption)
     : Form(u"frmViewPDF"_s, caption),
       pdf(document),
       AcroPDF1(new QPdfView(this)),
-      toolStrip(tools()),
-      lblPage(new QLabel)
+      tools(new desktop::PageTools(this, u"frmViewPDF"_s,
+                                   {.print = [this] { print(); },
+                                    .save = {},
+                                    .goTo = [this](int page) { goTo(page - 1); },
+                                    .enlarge = [this] { zoom(zoomStep); },
+                                    .reduce = [this] { zoom(1 / zoomStep); },
+                                    .fitWidth = [this] { AcroPDF1->setZoomMode(QPdfView::ZoomMode::FitToWidth); },
+                                    .fitPage = [this] { AcroPDF1->setZoomMode(QPdfView::ZoomMode::FitInView); },
+                                    .view = AcroPDF1}))
 {
     setWindowFlag(Qt::WindowMaximizeButtonHint);
     resize(desktop::pixels(12000, 10500));
@@ -65,13 +70,10 @@ frmViewPDF::frmViewPDF(QPdfDocument& document, const QString& caption)
     AcroPDF1->setPageMode(QPdfView::PageMode::MultiPage);
     AcroPDF1->setZoomMode(QPdfView::ZoomMode::FitToWidth);
     AcroPDF1->setFocus();
-    lblPage->setObjectName("lblPage"_L1);
-    toolStrip->layout()->addWidget(lblPage);
-    showPage(pdf.pageCount());  // the longest text determines the minimum width
-    setMinimumSize(toolStrip->sizeHint().width() + desktop::pixels(rightMargin), desktop::pixels(4500));
-    showPage(1);
+    setMinimumSize(tools->sizeHint().width() + desktop::pixels(rightMargin), desktop::pixels(4500));
+    tools->showPage(1, pdf.pageCount());
     desktop::onEvent(AcroPDF1->pageNavigator(), &QPdfPageNavigator::currentPageChanged, this,
-                     u"frmViewPDF.AcroPDF1_Page"_s, [this](int page) { showPage(page + 1); });
+                     u"frmViewPDF.AcroPDF1_Page"_s, [this](int page) { tools->showPage(page + 1, pdf.pageCount()); });
 }
 
 void frmViewPDF::ShowForm(const QString& fileName)
@@ -88,56 +90,13 @@ void frmViewPDF::ShowForm(const QString& fileName)
     desktop::showModal(form);
 }
 
-QWidget* frmViewPDF::tools()
-{
-    auto* strip = new QWidget(this);
-    auto* row = new QHBoxLayout(strip);
-    row->setContentsMargins({desktop::pixels(stripMargin), 0, desktop::pixels(stripMargin), 0});
-    row->setSpacing(0);
-    const auto turn = [this](int pages) {
-        return [this, pages] { goTo(AcroPDF1->pageNavigator()->currentPage() + pages); };
-    };
-    const auto enlarge = [this](double factor) { return [this, factor] { zoom(factor); }; };
-    const auto fitWidth = [this] { AcroPDF1->setZoomMode(QPdfView::ZoomMode::FitToWidth); };
-    const QList<QKeySequence> zoomIn{QKeySequence::ZoomIn, Qt::CTRL | Qt::Key_Equal};  // "+" without Shift
-    const struct {
-        QLatin1StringView name, caption, hint;
-        QList<QKeySequence> keys;
-        std::function<void()> action;
-    } list[] = {
-        {"cmdFirst"_L1, "First"_L1, "First page"_L1, {Qt::Key_Home}, [this] { goTo(0); }},
-        {"cmdPrevious"_L1, "Previous"_L1, "Previous page"_L1, {Qt::CTRL | Qt::Key_PageUp}, turn(-1)},
-        {"cmdNext"_L1, "Next"_L1, "Next page"_L1, {Qt::CTRL | Qt::Key_PageDown}, turn(1)},
-        {"cmdLast"_L1, "Last"_L1, "Last page"_L1, {Qt::Key_End}, [this] { goTo(pdf.pageCount() - 1); }},
-        {"cmdZoomIn"_L1, "Zoom in"_L1, "Larger"_L1, zoomIn, enlarge(zoomStep)},
-        {"cmdZoomOut"_L1, "Zoom out"_L1, "Smaller"_L1, {QKeySequence::ZoomOut}, enlarge(1 / zoomStep)},
-        {"cmdFitWidth"_L1, "Fit width"_L1, "As wide as the window"_L1, {Qt::CTRL | Qt::Key_0}, fitWidth},
-        {"cmdPrint"_L1, "Print..."_L1, "Print"_L1, {QKeySequence::Print}, [this] { print(); }},
-    };
-    for (const auto& [name, caption, hint, keys, action] : list) {
-        auto* tool = new QToolButton;
-        tool->setObjectName(name);
-        tool->setText(caption);
-        tool->setAutoRaise(true);
-        tool->setToolTip(u"%1 (%2)"_s.arg(hint, keys.first().toString(QKeySequence::NativeText)));
-        row->addWidget(tool);
-        auto* shortcut = new QShortcut(this);
-        shortcut->setKeys(keys);
-        const QString source = u"frmViewPDF.%1_Click"_s.arg(name);
-        desktop::onEvent(tool, &QToolButton::clicked, this, source, action);
-        desktop::onEvent(shortcut, &QShortcut::activated, this, source, action);
-    }
-    row->addStretch();
-    return strip;
-}
-
 void frmViewPDF::resizeEvent(QResizeEvent* event)
 {
     Form::resizeEvent(event);
     const int right = desktop::pixels(rightMargin);
     const int bottom = desktop::pixels(400);
     AcroPDF1->setGeometry(0, 0, width() - right, height() - bottom);
-    toolStrip->setGeometry(0, height() - bottom, width() - right, bottom);
+    tools->setGeometry(0, height() - bottom, width() - right, bottom);
 }
 
 void frmViewPDF::goTo(int page)
@@ -149,11 +108,14 @@ void frmViewPDF::goTo(int page)
 void frmViewPDF::zoom(double factor)
 {
     double now = AcroPDF1->zoomFactor();
-    if (AcroPDF1->zoomMode() == QPdfView::ZoomMode::FitToWidth) {
+    if (AcroPDF1->zoomMode() != QPdfView::ZoomMode::Custom) {
         const QMargins margins = AcroPDF1->documentMargins();
-        const double pageWidth = pdf.pagePointSize(AcroPDF1->pageNavigator()->currentPage()).width();
-        const double dots = AcroPDF1->viewport()->width() - margins.left() - margins.right();
-        now = dots / (pageWidth * screen()->logicalDotsPerInch() / pointsPerInch);
+        const QSizeF page = pdf.pagePointSize(AcroPDF1->pageNavigator()->currentPage()) *
+                            (screen()->logicalDotsPerInch() / pointsPerInch);
+        const QSizeF room = AcroPDF1->viewport()->rect().marginsRemoved(margins).size();
+        now = room.width() / page.width();
+        if (AcroPDF1->zoomMode() == QPdfView::ZoomMode::FitInView)
+            now = std::min(now, room.height() / page.height());
     }
     const double next = qBound(smallestZoom, now * factor, largestZoom);
     QScrollBar* const bar = AcroPDF1->verticalScrollBar();
@@ -182,19 +144,17 @@ void frmViewPDF::print()
         return;
     }
     desktop::Progress progress(windowTitle(), u"Printing the document..."_s);
-    for (int page = first; page <= last; ++page) {
-        progress.step(page - first, last - first + 1);
-        if (page > first)
+    const int perCopy = last - first + 1;
+    const int pages = perCopy * (printer.supportsMultipleCopies() ? 1 : printer.copyCount());
+    for (int printed = 0; printed < pages; ++printed) {
+        progress.step(printed, pages);
+        if (printed > 0)
             printer.newPage();
+        const int page = first + printed % perCopy;
         const QRect sheet = painter.viewport();
         const QSize size = pdf.pagePointSize(page).scaled(sheet.size(), Qt::KeepAspectRatio).toSize();
         painter.drawImage(QRect(QPoint((sheet.width() - size.width()) / 2, 0), size), pdf.render(page, size));
     }
-}
-
-void frmViewPDF::showPage(int page)
-{
-    lblPage->setText(u"Page %1 of %2"_s.arg(page).arg(pdf.pageCount()));
 }
 
 }  // namespace kest

@@ -3,9 +3,12 @@
 
 #include "platform/desktop/Form.h"
 
-class QLabel;
 class QPdfDocument;
 class QPdfView;
+
+namespace kest::desktop {
+class PageTools;
+}
 
 namespace kest {
 
@@ -24,16 +27,13 @@ protected:
 private:
     frmViewPDF(QPdfDocument& document, const QString& caption);
 
-    QWidget* tools();
     void goTo(int page);
     void zoom(double factor);
     void print();
-    void showPage(int page);
 
     QPdfDocument& pdf;
     QPdfView* AcroPDF1;
-    QWidget* toolStrip;
-    QLabel* lblPage;
+    desktop::PageTools* tools;
 };
 
 }  // namespace kest

@@ -200,11 +200,44 @@ TEST_F(Preview, TheViewerFillsTheWindowAboveItsButton)
         EXPECT_EQ(page.text(), u"Page 1 of 5"_s);
         desktop::gestures::press(control<QWidget>(window, "crvPages"), Qt::Key_End);
         EXPECT_EQ(page.text(), u"Page 5 of 5"_s);
+        EXPECT_FALSE(control<QToolButton>(window, "cmdNext").isEnabled()) << "there is no such page";
+        control<QPushButton>(window, "cmdExit").setFocus();
+        desktop::gestures::press(window, Qt::Key_Home);
+        EXPECT_EQ(page.text(), u"Page 1 of 5"_s) << "wherever the focus is";
+        desktop::gestures::press(window, Qt::Key_End);
         control<QToolButton>(window, "cmdPrevious").click();
         EXPECT_EQ(page.text(), u"Page 4 of 5"_s);
     };
     const Hands hands({{u"frmPrintPreview"_s, look}});
     show(730, &rows);
+}
+
+TEST_F(Preview, ASaveOffersTheReportsNameAndTheLastFolderAndSaysWhatCannotBeWritten)
+{
+    db::Recordset rows = table(u"quote_ref=500/1 quote_type=AUTR comment=x"_s);
+    const QString folder = root() + u"/chosen"_s;
+    QDir().mkpath(folder + u"/folder.pdf"_s);
+    QStringList offered;
+    const auto saveAs = [&](const QString& path) {
+        const auto click = [](QDialog& window) { control<QToolButton>(window, "cmdSave").click(); };
+        const auto choose = [&](QDialog& dialog) {
+            offered << static_cast<QFileDialog&>(dialog).selectedFiles().first();
+            dialog.hide();  // while it is shown, the field that has the focus keeps its text
+            static_cast<QFileDialog&>(dialog).selectFile(path);
+            dialog.setResult(QDialog::Accepted);
+        };
+        const Hands hands({{u"frmPrintPreview"_s, click}, {u"SaveDialog"_s, choose}});
+        show(730, &rows);
+    };
+    desktop::usePerson();
+    saveAs(folder + u"/out.pdf"_s);
+    desktop.emplace();
+    saveAs(folder + u"/folder.pdf"_s);
+    EXPECT_TRUE(pdfText(folder + u"/out.pdf"_s).contains(u"Authorised quote 500/1"_s));
+    EXPECT_TRUE(offered[0].endsWith(u"/Authorised quote 500-1.pdf"_s)) << offered[0].toStdString();
+    EXPECT_EQ(offered[1], folder + u"/Authorised quote 500-1.pdf"_s);
+    EXPECT_EQ(desktop->boxTexts().size(), 1);
+    EXPECT_TRUE(desktop->boxTexts().value(0).startsWith(u"The report can't be saved as %1/folder.pdf: "_s.arg(folder)));
 }
 
 TEST_F(Preview, ThePrintButtonPrintsWhatWasChosen)

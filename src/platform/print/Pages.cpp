@@ -235,7 +235,7 @@ void setPaper(QPagedPaintDevice& device)
                                      QMarginsF(margin, margin, margin, margin), QPageLayout::Millimeter));
 }
 
-void paint(const Report& report, QPagedPaintDevice& device, int firstPage, int lastPage)
+void paint(const Report& report, QPagedPaintDevice& device, int firstPage, int lastPage, int copies)
 {
     const Pages pages(report, device);
     const int last = lastPage > 0 ? std::min(lastPage, pages.count()) : pages.count();
@@ -245,11 +245,12 @@ void paint(const Report& report, QPagedPaintDevice& device, int firstPage, int l
     if (!painter.begin(&device))
         throw RuntimeError(FileInputOutput, u"The report can't be painted."_s);
     desktop::Progress progress(report.title(), u"Laying out the pages..."_s);
-    for (int page = firstPage; page <= last; ++page) {
-        if (page > firstPage)
+    const int perCopy = last - firstPage + 1;
+    for (int painted = 0; painted < perCopy * copies; ++painted) {
+        if (painted > 0)
             device.newPage();
-        pages.paint(painter, page - 1);
-        progress.step(page - firstPage + 1, last - firstPage + 1);
+        pages.paint(painter, firstPage - 1 + painted % perCopy);
+        progress.step(painted + 1, perCopy * copies);
     }
 }
 
@@ -260,7 +261,7 @@ void writePdf(const Report& report, const QString& systemPath)
     buffer.open(QIODevice::WriteOnly);
     QPdfWriter writer(&buffer);
     writer.setResolution(pdfResolution);
-    writer.setTitle(report.title());
+    writer.setTitle(report.heading());
     setPaper(writer);
     paint(report, writer);
     files::writeBytes(systemPath, pdf);

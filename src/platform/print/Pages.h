@@ -68,8 +68,8 @@ private:
     QList<Slice> slices;
 };
 
-/// Paints the pages from `firstPage` to `lastPage`, counted from 1. A `lastPage` of 0 means all pages.
-void paint(const Report& report, QPagedPaintDevice& device, int firstPage = 1, int lastPage = 0);
+/// Paints the pages from `firstPage` to `lastPage`, counted from 1, so many times. A `lastPage` of 0 means all pages.
+void paint(const Report& report, QPagedPaintDevice& device, int firstPage = 1, int lastPage = 0, int copies = 1);
 /// Sets the device to A4 with the margins of a report.
 void setPaper(QPagedPaintDevice& device);
 /// Writes the report as a PDF file, whole or not at all. Throws RuntimeError if the file can't be written.

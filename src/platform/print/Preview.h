@@ -10,11 +10,12 @@
 #include <optional>
 
 class QAbstractScrollArea;
-class QHBoxLayout;
-class QKeySequence;
-class QLabel;
 class QPrintPreviewWidget;
 class QPrinter;
+
+namespace kest::desktop {
+class PageTools;
+}
 
 namespace kest::report {
 
@@ -30,15 +31,9 @@ public:
     void setReport(Report report);
     /// Returns the report that was set last.
     const Report& report() const { return shown.value(); }
-
-protected:
-    bool eventFilter(QObject* watched, QEvent* event) override;
+    int pageCount() const;
 
 private:
-    void addTools(QHBoxLayout& row, const std::function<void()>& print);
-    void addTool(QHBoxLayout& row, const QString& name, const QString& caption, const QString& hint,
-                 const QKeySequence& keys, const std::function<void()>& action);
-    void goTo(int page);
     void saveAsPdf();
     void showPage();
 
@@ -46,7 +41,7 @@ private:
     std::unique_ptr<QPrinter> paper;
     QPrintPreviewWidget* view;
     QAbstractScrollArea* sheet;
-    QLabel* lblPage;
+    desktop::PageTools* tools;
 };
 
 }  // namespace kest::report

@@ -9,6 +9,7 @@
 #include <QJsonDocument>
 #include <QJsonObject>
 #include <QRegularExpression>
+#include <QTextDocumentFragment>
 
 #include <algorithm>
 #include <kainjow/mustache.hpp>
@@ -223,6 +224,14 @@ void Report::readSaved(const QString& json)
 QString Report::body() const
 {
     return filled(body_, 0, 0);
+}
+
+QString Report::heading() const
+{
+    static const QRegularExpression heading(u"<h1[^>]*>(.*?)</h1>"_s, QRegularExpression::DotMatchesEverythingOption);
+    const QString html = heading.match(body()).captured(1);
+    const QString text = QTextDocumentFragment::fromHtml(html).toPlainText().simplified();
+    return text.isEmpty() ? title_ : text;
 }
 
 QString Report::filled(const QString& part, int page, int pages) const

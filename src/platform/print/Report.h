@@ -48,6 +48,8 @@ public:
     explicit Report(const QString& path);
 
     const QString& title() const { return title_; }
+    /// Returns the first heading of the report, such as "Authorised quote 1007", or its title if it has none.
+    QString heading() const;
     const QList<Parameter>& parameters() const { return parameters_; }
     void setParameter(qsizetype index, const QString& value) { parameters_[index].value = value; }
 
