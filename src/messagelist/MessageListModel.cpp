@@ -1,6 +1,11 @@
 #include "messagelist/MessageListModel.h"
 
+#include "base/SharedVariables.h"
+#include "platform/files/files.h"
+
 #include <QCollator>
+#include <QDateTime>
+#include <QFileInfo>
 #include <QLocale>
 
 #include <algorithm>
@@ -119,14 +124,18 @@ int MessageListModel::columnCount(const QModelIndex& parent) const
 QString MessageListModel::cell(qsizetype message, int column) const
 {
     const ListedMessage& listed = all[message];
-    return column == 0 ? listed.file : listed.row[static_cast<size_t>(column) - 1];
+    return column == 0 ? listed.file : listed.row[static_cast<size_t>(column) - 1].trimmed();
 }
 
 QVariant MessageListModel::data(const QModelIndex& index, int role) const
 {
     if (!index.isValid() || (role != Qt::DisplayRole && role != Qt::ToolTipRole))
         return {};
-    return cell(shown[index.row()], index.column());
+    const QString text = cell(shown[index.row()], index.column());
+    if (role == Qt::DisplayRole || index.column() > 0)
+        return text;
+    const QDateTime arrived = QFileInfo(files::systemPath(gsCurFolder + text)).lastModified();
+    return arrived.isValid() ? text + u"\nArrived "_s + arrived.toString(u"dd/MM/yyyy HH:mm"_s) : text;
 }
 
 QVariant MessageListModel::headerData(int section, Qt::Orientation orientation, int role) const

@@ -73,6 +73,9 @@ void frmMessageList::buildControls()
     txtFilter->setMinimumWidth(desktop::pixels(filterWidth));
     Label1->setBuddy(txtFilter);
     Command1 = named(new QPushButton(u"&Update"_s), u"Command1"_s, u"Fill the list by the filter"_s);
+    QSizePolicy place = Frame2->sizePolicy();
+    place.setRetainSizeWhenHidden(true);  // so that nothing moves when it appears
+    Frame2->setSizePolicy(place);
     Frame2->setVisible(false);
 
     txtFind =

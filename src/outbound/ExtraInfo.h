@@ -41,6 +41,10 @@ public:
     QString rego() const;
     QString model() const;
 
+    // The size of the columns in characters. 0 if it is not limited.
+    int longestVin() const { return carRow.size(QStringLiteral("VIN")); }
+    int longestOdometer() const { return quoteRow.size(QStringLiteral("kms")); }
+
     /// Returns the stored values. Fuel and damage are empty, because they are asked for each time.
     ExtraValues values() const;
 

@@ -68,6 +68,7 @@ ExtraInfoResult frmExtraInfo::ShowForm(const QString& quoteNumber, const QString
 frmExtraInfo::frmExtraInfo(const ExtraInfo& info)
     : Form(u"frmExtraInfo"_s, u"Extra Information Requested"_s), cmbTransmission(new QComboBox)
 {
+    setWindowFlags(Qt::Dialog | Qt::CustomizeWindowHint | Qt::WindowTitleHint);  // without the close box
     auto* layout = new QFormLayout(this);
     addDisplay(layout, "lblQTNNO", u"Quote No:"_s, info.quoteNumber());
     addDisplay(layout, "lblCustomer", u"Customer:"_s, info.customer());
@@ -118,7 +119,7 @@ void frmExtraInfo::build()
     lvColour->installEventFilter(this);
 
     QAction* drop = txtColour->addAction(desktop::dropArrow(palette()), QLineEdit::TrailingPosition);
-    drop->setToolTip(u"Show the colours (F4)"_s);
+    drop->setToolTip(u"Show the colours (F4, Alt+Down)"_s);
     drop->setShortcut(Qt::Key_F4);
     drop->setShortcutContext(Qt::WidgetShortcut);
     auto* cmdColour = txtColour->findChild<QToolButton*>();
@@ -158,6 +159,10 @@ void frmExtraInfo::fillColours()
 void frmExtraInfo::fill(const ExtraInfo& info)
 {
     const ExtraValues found = info.values();
+    const std::pair<QLineEdit*, int> longest[] = {{txtVIN, info.longestVin()}, {txtOdometer, info.longestOdometer()}};
+    for (const auto& [field, size] : longest)
+        if (size > 0)
+            field->setMaxLength(size);
     cmbTransmission->setCurrentText(found.transmission);
     txtBuildMonth->setText(found.buildMonth);
     txtBuildYear->setText(found.buildYear);
@@ -217,6 +222,7 @@ std::pair<QWidget*, QString> frmExtraInfo::complaint() const
 
 void frmExtraInfo::Command1_Click()
 {
+    txtBuildYear_LostFocus();  // its access key leaves the focus in the field
     const auto [field, message] = complaint();
     if (!field) {
         hide();
@@ -244,6 +250,11 @@ bool frmExtraInfo::eventFilter(QObject* watched, QEvent* event)
         if (watched == lvColour || watched == txtColour)
             hideColoursUnlessUsed();
     } else if (watched == txtColour) {
+        const bool isAltDown = key == Qt::Key_Down && static_cast<QKeyEvent*>(event)->modifiers() & Qt::AltModifier;
+        if (keyDown && isAltDown) {
+            txtColour_ButtonClick();
+            return true;
+        }
         if (keyDown && txtColour_KeyDown(key))
             return true;
         if (event->type() == QEvent::KeyRelease)

@@ -86,6 +86,10 @@ bool loadRepaired(xml::Document& document, QString text)
 
 QString FormatXML(const QString& fileName)
 {
+    if (!files::exists(fileName)) {
+        desktop::msgBox(u"The file %1 is no longer there."_s.arg(fileName), desktop::Icon::Critical);
+        return {};
+    }
     xml::Document document;
     bool loaded = false;
     attempt([&] { loaded = loadRepaired(document, textOfFile(fileName)); });

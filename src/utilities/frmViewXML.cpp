@@ -25,7 +25,8 @@ namespace kest {
 
 namespace {
 
-constexpr int tabWidth = 4;  // characters
+constexpr int tabWidth = 4;    // characters
+constexpr int titleBar = 405;  // twips; the places of the controls are counted from the height with the title bar
 
 /// Returns true for keys that change the text: not for cursor keys and shortcuts, nor for Escape, which closes the
 /// window.
@@ -65,6 +66,8 @@ frmViewXML::frmViewXML(const QString& file)
                      [this] { Command1_Click(); });
     desktop::onEvent(Command2, &QPushButton::clicked, this, u"frmViewXML.Command2_Click"_s,
                      [this] { Command2_Click(); });
+    desktop::onEvent(new QShortcut(QKeySequence::Save, this), &QShortcut::activated, this,
+                     u"frmViewXML.Command2_Click"_s, [this] { Command2_Click(); });
     desktop::onEvent(txtXML, &QPlainTextEdit::cursorPositionChanged, this, u"frmViewXML.txtXML_SelChange"_s,
                      [this] { showPosition(); });
     desktop::onEvent(txtXML, &QPlainTextEdit::updateRequest, this, u"frmViewXML.txtXML_Paint"_s,
@@ -76,6 +79,7 @@ void frmViewXML::fillFindBar()
     txtFind->setAccessibleName(u"Find"_s);
     txtFind->setPlaceholderText(u"Find (Ctrl+F)"_s);
     txtFind->setClearButtonEnabled(true);
+    txtFind->installEventFilter(this);
     auto* previous = new QPushButton(u"&Previous"_s);
     auto* next = new QPushButton(u"&Next"_s);
     txtFind->setObjectName("txtFind"_L1);
@@ -121,6 +125,11 @@ bool frmViewXML::eventFilter(QObject* watched, QEvent* event)
 {
     if (watched == txtXML && event->type() == QEvent::KeyPress && isTyping(*static_cast<QKeyEvent*>(event)))
         unchanged = false;
+    if (watched == txtFind && event->type() == QEvent::KeyPress && !txtFind->text().isEmpty() &&
+        static_cast<QKeyEvent*>(event)->key() == Qt::Key_Escape) {
+        txtFind->clear();
+        return true;
+    }
     return Form::eventFilter(watched, event);
 }
 
@@ -128,7 +137,7 @@ void frmViewXML::resizeEvent(QResizeEvent* event)
 {
     Form::resizeEvent(event);
     const int formWidth = desktop::twips(width());
-    const int formHeight = desktop::twips(height());
+    const int formHeight = desktop::twips(height()) + titleBar;
     if (formWidth <= 600 || formHeight <= 2000)
         return;
     const auto place = [](QWidget* control, int left, int top, int controlWidth, int controlHeight) {
@@ -149,7 +158,8 @@ void frmViewXML::closeEvent(QCloseEvent* event)
     bool leaves = !typed;
     desktop::guarded(u"frmViewXML.QueryUnload"_s, [&] {
         if (typed)
-            leaves = desktop::ask(u"Are you sure you want to exit without saving this message?"_s);
+            leaves = desktop::ask(u"Are you sure you want to exit without saving this message?"_s,
+                                  desktop::Icon::Question, {}, desktop::Answer::No);
     });
     if (leaves)
         Form::closeEvent(event);

@@ -1,4 +1,5 @@
 #include "base/modDBAccess.h"
+#include "messagelist/MessageListModel.h"
 #include "messagelist/frmMessageList.h"
 #include "platform/script/Gestures.h"
 #include "support/Hands.h"
@@ -233,6 +234,14 @@ TEST_F(MessageListWindow, TheLineUnderTheListNamesTheFileThatEndedTheFill)
     visit({readAll});
     EXPECT_NE(listed().find("c:\\gone\\"), std::string::npos);
     EXPECT_EQ(desktop->boxes(), QStringList());
+}
+
+TEST(MessageListModel, NeitherSortsNorShowsLeadingBlanks)
+{
+    MessageListModel model;
+    model.setMessages({{u"a.xml"_s, {u"Type"_s, {}, {}, u"  Zeta"_s}}, {u"b.xml"_s, {u"Type"_s, {}, {}, u" Alpha"_s}}});
+    model.sort(4);
+    EXPECT_EQ(model.data(model.index(0, 4)).toString() + model.data(model.index(1, 4)).toString(), u"AlphaZeta"_s);
 }
 
 // Three messages that the search distinguishes by every column.

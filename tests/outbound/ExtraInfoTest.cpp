@@ -63,6 +63,10 @@ TEST_F(ExtraInformation, AYearOfTwoDigitsIsWidenedWhenItIsLeft)
         show(typed(u"txtBuildYear"_s, year) +
              u"{'key': 'txtBuildYear', 'keys': ['Tab']}, {'read': 'txtBuildYear'}, "_s + completeAndDone);
         EXPECT_EQ(desktop->read(u"txtBuildYear"_s), expected);
+        if (expected.size() == 4) {
+            show(complete + typed(u"txtBuildYear"_s, year) + u"{'key': 'txtBuildYear', 'keys': ['Alt+N']}"_s);
+            EXPECT_EQ(desktop->boxTexts(), QStringList()) << "the key of \"Done\" leaves the focus in the field";
+        }
     }
 }
 
@@ -73,6 +77,14 @@ TEST_F(ExtraInformation, ColoursCompleteThemselves)
         EXPECT_EQ(desktop->read(u"txtColour"_s), colour) << steps;
         EXPECT_EQ(desktop->read(u"lvColour"_s, u"visible"_s), false) << steps;
     }
+}
+
+TEST_F(ExtraInformation, AltAndDownShowsTheColoursAndNoTextIsLongerThanItsColumn)
+{
+    show(u"{'key': 'txtColour', 'keys': ['Alt+Down']}, {'read': 'lvColour'}, "_s +
+         typed(u"txtVIN"_s, u"V"_s.repeated(300)) + u"{'read': 'txtVIN'}, "_s + completeAndDone);
+    EXPECT_TRUE(desktop->read(u"lvColour"_s, u"visible"_s).toBool());
+    EXPECT_LT(desktop->read(u"txtVIN"_s).toString().size(), 300);
 }
 
 TEST_F(ExtraInformation, AMissingRecordStopsIt)

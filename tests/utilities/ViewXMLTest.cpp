@@ -74,13 +74,22 @@ TEST_F(Viewer, LeavingWithUnsavedTypingIsAskedAbout)
 {
     QGuiApplication::clipboard()->setText(u"pasted"_s);
     const auto press = [](const char* key) { return R"({"key": "txtXML", "keys": ")" + std::string(key) + "\"}"; };
+    const char* yes = R"({"text": "exit without saving", "answer": "yes"})";
     for (const char* key : {"x", "Return", "Ctrl+V"})
-        EXPECT_EQ(view("<a/>", press(key)), QStringList(leave)) << key;
+        EXPECT_EQ(view("<a/>", press(key), yes), QStringList(leave)) << key;
     for (const char* key : {"Ctrl+C", "PgDown", "Escape"})
         EXPECT_EQ(view("<a/>", press(key)), QStringList()) << key;
-    EXPECT_THROW(view("<a/>", press("x"), R"({"text": "exit without saving", "answer": "no"})"), desktop::NeedsAnswer)
-        << "No keeps the window, which the end of the script then can't close";
+    EXPECT_THROW(view("<a/>", press("x")), desktop::NeedsAnswer)
+        << "No, the default, keeps the window, which the end of the script then can't close";
     EXPECT_EQ(written(), "<a/>");
+    EXPECT_EQ(view("<a>1</a>", press("Ctrl+S")), QStringList(overwrite)) << "as the button does";
+}
+
+TEST_F(Viewer, AFileThatIsGoneIsNotCalledCorrupt)
+{
+    ScriptedDesktop desk(R"({"windows": {"frmViewXML": [[]]}})");
+    frmViewXML::ShowForm(u"gone.xml"_s);
+    EXPECT_EQ(desk.boxTexts(), QStringList(u"The file c:\\wirdoc\\AUnread\\gone.xml is no longer there."_s));
 }
 
 TEST_F(Viewer, AFindGoesRoundTheText)
@@ -89,6 +98,7 @@ TEST_F(Viewer, AFindGoesRoundTheText)
         {"<b>", R"("Return", "Return", "Return")", u"Line 2, column 5"_s},
         {"<b>", R"("Return", "F3")", u"Line 3, column 5"_s},
         {"<b>", R"("Shift+F3")", u"Line 3, column 5"_s},
+        {"<b>", R"("Escape", "Return")", u"Line 1, column 1"_s},  // it clears the field and leaves the window
         {"x", R"("Return")", u"Not found"_s}};
     for (const auto& [wanted, keys, place] : cases) {
         const std::string find = R"({"key": "txtXML", "keys": "Ctrl+F"}, {"set": "txtFind", "text": ")" + wanted +

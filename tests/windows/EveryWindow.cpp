@@ -100,7 +100,11 @@ void EveryWindow::each(const Check& check)
         {"frmPrintPreview", check, [] { frmPrintPreview::ShowForm(710, QString(), nullptr); }},
         {"frmLogin", check, [&] { frmLogin::ShowForm(passed); }},
         {"frmUtilities", check, [] { frmUtilities::ShowForm(u"500"_s, u"0"_s); }},
-        {"frmViewXML", check, [] { frmViewXML::ShowForm(u"a.xml"_s); }},
+        {"frmViewXML", check,
+         [] {
+             gsCurFolder = gsUnreadPath;  // the list has left it in another folder
+             frmViewXML::ShowForm(u"a.xml"_s);
+         }},
         {"KESTWeb", check, [] { app::TransportWindow(app::transportFolders()).run(); }},
     };
     gsCurFolder = gsUnreadPath;

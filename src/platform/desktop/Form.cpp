@@ -3,10 +3,12 @@
 #include "platform/Prompt.h"
 #include "platform/desktop/Window.h"
 
+#include <QApplication>
 #include <QKeyEvent>
 #include <QLayout>
 #include <QPainter>
 #include <QPushButton>
+#include <QStyleOption>
 
 namespace kest::desktop {
 
@@ -92,7 +94,17 @@ void showAbout()
 
 QIcon dropArrow(const QPalette& palette)
 {
-    return drawn(palette, {QPolygonF({{6, 9}, {12, 15}, {18, 9}})});
+    constexpr qreal sharpness = 2;
+    QPixmap picture(QSize(pictureSize, pictureSize) * sharpness);
+    picture.setDevicePixelRatio(sharpness);
+    picture.fill(Qt::transparent);
+    QPainter painter(&picture);
+    QStyleOption arrow;
+    arrow.rect = QRect(0, 0, pictureSize, pictureSize);
+    arrow.palette = palette;
+    arrow.state = QStyle::State_Enabled;
+    QApplication::style()->drawPrimitive(QStyle::PE_IndicatorArrowDown, &arrow, &painter);
+    return picture;
 }
 
 QPushButton* exitButton(QWidget* parent, const QString& name, const QString& tip)

@@ -35,7 +35,7 @@ void showAbout();
 /// Creates a button with an exit picture and the shortcut Alt+X. `tip` is its tool tip and its accessible name.
 QPushButton* exitButton(QWidget* parent, const QString& name, const QString& tip = QStringLiteral("Close"));
 
-/// Returns the arrow of a combo box in the colour of the text.
+/// Returns the arrow of a combo box, as the style draws it.
 QIcon dropArrow(const QPalette& palette);
 
 }  // namespace kest::desktop
