@@ -1,11 +1,13 @@
 // The command kest2-day plays the working day on a new demo shop, to its end or until the given step has been played.
 #include "day/Day.h"
+#include "day/DayPage.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
 
 #include <QApplication>
+#include <QDir>
 
 #include <cstdio>
 
@@ -18,10 +20,11 @@ int play(const QStringList& words)
     using namespace kest;
     profile::setRoot(words[1]);
     app::Day day(words[2]);
+    app::DayPage page(QDir(words[2]).absolutePath());
     for (const QString& step : app::Day::steps()) {
         std::puts(qUtf8Printable(step));
         std::fflush(stdout);
-        day.play(step);
+        page.add(step, day.play(step));
         if (step.section(u'.', 0, 0) == words.value(3))
             break;
     }

@@ -2,6 +2,7 @@
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "day/Day.h"
+#include "day/DayPage.h"
 #include "jobexport/JobLinkSettings.h"
 #include "setup/Profile.h"
 #include "shell/component.h"
@@ -108,7 +109,10 @@ static void checkPictures(const QDir& pictures)
                               u"utilities"_s,  u"report-1-710"_s,      u"report-1-720"_s, u"report-1-730"_s};
     for (const QString& window : windows)
         EXPECT_FALSE(pictures.entryList({u"*-"_s + window + u".png"_s}).isEmpty()) << window;
-    for (const QString& file : pictures.entryList(QDir::Files)) {
+    const QString page = QString::fromUtf8(files::readBytes(pictures.filePath(u"index.html"_s)));
+    EXPECT_TRUE(page.contains(u"Damage Description must be entered."_s)) << "the page shows the boxes";
+    for (const QString& file : pictures.entryList({u"*.png"_s})) {
+        EXPECT_TRUE(page.contains(u"<img src=\"%1\""_s.arg(file))) << file;
         const QImage picture(pictures.filePath(file));
         QImage blank = picture;
         blank.fill(picture.pixelColor(0, 0));
@@ -126,11 +130,14 @@ TEST(Day, LeavesAfterEachStepWhatItShould)
     const QDir pictures(profile.root() + u"/pictures"_s);
     app::initProfile(registerClass, true);
     app::Day day(pictures.path());
+    app::DayPage page(pictures.path());
     InitCipherKey();
     storeJobLinkSettings({u"127.0.0.1"_s, server.port(), u"jobs"_s, server.user(), server.password()});
     Holdings before;
     for (const QString& step : app::Day::steps()) {
-        QStringList lines = told(day.play(step));
+        const desktop::Record shown = day.play(step);
+        page.add(step, shown);
+        QStringList lines = told(shown);
         files::waitForBackground(backgroundWait);
         const Holdings after = found(server);
         if (!before.isEmpty() && !step.endsWith(u".sql"_s))
