@@ -276,10 +276,23 @@ bool showsTransport(const CommandLine& line)
     return line.command == u"transport"_s && line.arguments.contains(u"--window"_s);
 }
 
+bool hasProfile()
+{
+    return QFileInfo::exists(profile::root() + u"/registry.ini"_s);
+}
+
+/// Asks the user, who may have started the program from the menu, if the profile is to be created.
+bool offersProfile()
+{
+    return desktop::ask(
+        u"There is no shop on this computer yet. Create its folder, with an empty quote database?\n\n"_s +
+        profile::root());
+}
+
 /// Returns why there is no usable profile, or an empty text if there is one.
 QString profileFault()
 {
-    if (!QFileInfo::exists(profile::root() + u"/registry.ini"_s))
+    if (!hasProfile())
         return u"no profile at "_s + profile::root() + u"; create one with: kest2 init"_s;
     try {
         settings::check();
@@ -313,6 +326,8 @@ Outcome runChecked(const CommandLine& line)
     const Command& command = found->second;
     if (line.arguments.size() < command.fewest || line.arguments.size() > command.most)
         return refused(u"wrong number of arguments for "_s + line.command, Usage);
+    if (command.needs != Needs::Nothing && isInteractive(line) && !hasProfile() && offersProfile())
+        initProfile(registerClass, false);
     if (const QString why = command.needs == Needs::Nothing ? QString() : profileFault(); !why.isEmpty()) {
         if (isInteractive(line))
             desktop::msgBox(why, desktop::Icon::Critical);  // a program started from the menu has no visible output

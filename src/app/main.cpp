@@ -17,6 +17,15 @@ QStringList words(int argc, char** argv)
     return list;
 }
 
+QtMessageHandler usualHandler = nullptr;
+
+/// Drops a remark that Qt makes for each window without a display, so that standard error has only what the user needs.
+void withoutRemarks(QtMsgType type, const QMessageLogContext& context, const QString& message)
+{
+    if (!message.contains(QLatin1String("propagateSizeHints")))
+        usualHandler(type, context, message);
+}
+
 }  // namespace
 
 int main(int argc, char** argv)
@@ -41,6 +50,7 @@ int main(int argc, char** argv)
             NeedsAPerson);
     if (!isInteractive(line) && !qEnvironmentVariableIsSet("QT_QPA_PLATFORM"))
         qputenv("QT_QPA_PLATFORM", "offscreen");
+    usualHandler = qInstallMessageHandler(withoutRemarks);
 
     QApplication application(argc, argv);
     application.setApplicationName(QStringLiteral("kest2"));

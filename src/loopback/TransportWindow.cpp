@@ -34,7 +34,6 @@ TransportWindow::TransportWindow(const TransportFolders& folders)
 
     status = new QLabel(this);
     status->setObjectName(u"status"_s);
-    status->setAccessibleName(u"Status"_s);
     status->setWordWrap(true);
 
     carryButton = new QPushButton(u"&Carry Now"_s, this);

@@ -203,6 +203,7 @@ void frmMessageList::cmdProcess_Click()
 bool frmMessageList::load(const QString& file)
 {
     const QScopedValueRollback loading(busy, busy + 1);
+    const desktop::WaitPointer pointer;
     const KeptMessage kept;
     try {
         EnsureConnection();

@@ -7,6 +7,7 @@
 #include "messagelist/frmMessageList.h"
 #include "outbound/SendQuote.h"
 #include "platform/Prompt.h"
+#include "platform/desktop/Progress.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
@@ -143,7 +144,7 @@ void frmKEST::cmdOK_Click()
             frmMessageList::ShowForm();
             break;
         case SendQuoteOption:
-            SendQuote(*grsQuote);
+            sendQuote();
             break;
         case Utilities:
             openUtilities();
@@ -151,6 +152,12 @@ void frmKEST::cmdOK_Click()
         default:
             break;
     }
+}
+
+void frmKEST::sendQuote()
+{
+    const desktop::WaitPointer pointer;
+    SendQuote(*grsQuote);
 }
 
 void frmKEST::startTransport()

@@ -28,6 +28,7 @@ private:
     void Option1_Click(int index);
     void cmdOK_Click();
 
+    void sendQuote();
     void startTransport();
     void openUtilities();
 

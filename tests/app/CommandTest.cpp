@@ -43,6 +43,7 @@ TEST_F(Command, TheExitCodeTellsWhatBecameOfIt)
         const Ended ended = kest2(words);
         EXPECT_EQ(ended.exitCode, code.toInt()) << words;
         EXPECT_TRUE(ended.errors.contains(line)) << ended.errors;
+        EXPECT_FALSE(ended.errors.contains(u"propagateSizeHints"_s)) << words;
     }
     files::remove(profile.root() + u"/databases/WirSql.db"_s);
     const Ended ended = kest2(u"list unread"_s);

@@ -1,5 +1,6 @@
 #include "platform/Prompt.h"
 #include "platform/desktop/Programs.h"
+#include "platform/desktop/Progress.h"
 #include "platform/desktop/Window.h"
 
 #include <QApplication>
@@ -41,25 +42,6 @@ QWidget* topWindow()
     QWidget* modal = QApplication::activeModalWidget();
     return modal ? modal : QApplication::activeWindow();
 }
-
-/// Shows the normal cursor while a box is up: a long operation that asks a question is itself waiting for the user.
-class OrdinaryPointer {
-public:
-    OrdinaryPointer() : wasOther(QGuiApplication::overrideCursor())
-    {
-        if (wasOther)
-            QGuiApplication::setOverrideCursor(Qt::ArrowCursor);
-    }
-    ~OrdinaryPointer()
-    {
-        if (wasOther)
-            QGuiApplication::restoreOverrideCursor();
-    }
-    Q_DISABLE_COPY_MOVE(OrdinaryPointer)
-
-private:
-    bool wasOther;
-};
 
 /// Shows boxes and input boxes as windows on top of the active one.
 class PersonAnswerer final : public Answerer {

@@ -52,6 +52,28 @@ void putOnScreen(QWidget& window)
 
 }  // namespace
 
+WaitPointer::WaitPointer()
+{
+    QGuiApplication::setOverrideCursor(Qt::WaitCursor);
+}
+
+WaitPointer::~WaitPointer()
+{
+    QGuiApplication::restoreOverrideCursor();
+}
+
+OrdinaryPointer::OrdinaryPointer() : wasOther(QGuiApplication::overrideCursor())
+{
+    if (wasOther)
+        QGuiApplication::setOverrideCursor(Qt::ArrowCursor);
+}
+
+OrdinaryPointer::~OrdinaryPointer()
+{
+    if (wasOther)
+        QGuiApplication::restoreOverrideCursor();
+}
+
 Progress::Progress(const QString& windowCaption, const QString& work, QProgressBar* windowBar)
     : caption(windowCaption), what(work), bar(windowBar)
 {

@@ -12,6 +12,26 @@ class QWidget;
 
 namespace kest::desktop {
 
+/// Shows the wait cursor until the object is destroyed.
+class WaitPointer {
+public:
+    WaitPointer();
+    ~WaitPointer();
+    Q_DISABLE_COPY_MOVE(WaitPointer)
+};
+
+/// Shows the normal cursor while a box or a window is up: a long operation that opens one is itself waiting for the
+/// user.
+class OrdinaryPointer {
+public:
+    OrdinaryPointer();
+    ~OrdinaryPointer();
+    Q_DISABLE_COPY_MOVE(OrdinaryPointer)
+
+private:
+    bool wasOther;
+};
+
 /// Shows a progress bar and the wait cursor after half a second, until the object is destroyed.
 ///
 /// Uses `bar` if it is visible, and otherwise a small window of its own. With a script no window is shown. The bar is

@@ -1,5 +1,6 @@
 #include "platform/desktop/Window.h"
 
+#include "platform/desktop/Progress.h"
 #include "platform/desktop/WindowLayout.h"
 
 #include <QApplication>
@@ -76,6 +77,7 @@ void showModal(QDialog& window)
     centre(window);
     {
         const Shown shown(window);
+        const OrdinaryPointer pointer;
         const std::shared_ptr<WindowDriver> driver = windowDriver;
         const bool isDriven = driver && driver->drive(window);
         if (!isDriven)
