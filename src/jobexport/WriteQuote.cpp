@@ -346,7 +346,7 @@ void WriteQuote(const QString& quoteNumber, const QString& subquote)
     settings.close();
     openTarget(job);
     openSource(job);
-    if (!job.customer.isOpen() || job.customer.eof()) {
+    if (job.jobId == 0 || !job.customer.isOpen() || job.customer.eof()) {
         desktop::msgBox(u"Quote could not be exported to JobLink."_s, desktop::Icon::Critical);
         return;
     }

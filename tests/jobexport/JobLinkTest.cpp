@@ -175,6 +175,7 @@ TEST_F(JobLink, AFailureAtAnyStatementLeavesNoHalfJobThatLooksWhole)
         if (statusOfTheJob() == 1) {
             EXPECT_EQ(details("lineNr"), "1|2|900") << failing;
         }
+        EXPECT_TRUE(rows("SELECT * FROM newJobHdr WHERE nJobID_FK=0").eof()) << failing << ": a header of no job";
     }
 }
 
