@@ -9,6 +9,7 @@
 #include "support/Test.h"
 
 #include <QSqlDatabase>
+#include <QSqlError>
 #include <QSqlQuery>
 
 namespace kest::test {
@@ -146,7 +147,7 @@ public:
 
     void open(QSqlDatabase& plain) const override
     {
-        plain.setDatabaseName(tdsServer().connectionText(shop).chopped(1));
+        plain.setDatabaseName(tdsServer().connectionText(shop) + u"ClientCharset=UTF-8"_s);  // in any locale
         EXPECT_TRUE(plain.open());
     }
 };
@@ -189,7 +190,8 @@ QList<QSqlRecord> plainRows(const QString& select)
         isFile ? void(database.open()) : serverShop().open(database);
     }
     QSqlQuery query(database);
-    EXPECT_TRUE(query.exec(select)) << select.toStdString();
+    query.setForwardOnly(true);  // otherwise QODBC asks for a cursor on the server
+    EXPECT_TRUE(query.exec(select)) << select.toStdString() << ": " << query.lastError().text().toStdString();
     QList<QSqlRecord> rows;
     while (query.next())
         rows.append(query.record());
