@@ -2,6 +2,9 @@
 #include "base/modLoggerEx.h"
 #include "support/Shop.h"
 
+#include <QElapsedTimer>
+#include <QTcpServer>
+
 static void setSetting(const QString& key, const QString& value, const QString& section = u"wirra32\\frmsplash"_s)
 {
     RegCreateSubKey(settings::Hive::LocalMachine, u"SOFTWARE\\"_s + section);
@@ -72,6 +75,33 @@ TEST_F(ShopConnection, WhyItFailedIsTold)
     gcnDB->close();
     EXPECT_FALSE(EnsureConnection()) << "not to the database of the defaults";
     EXPECT_TRUE(connectionFailure().contains(u"damaged"_s));
+}
+
+TEST_F(ShopConnection, ASilentServerCostsFiveSecondsForAllStepsTogether)
+{
+    QTcpServer silent;  // the system accepts connections for it, and nobody answers
+    ASSERT_TRUE(silent.listen(QHostAddress::LocalHost));
+    setSetting(u"ServerName"_s, u"mysql:127.0.0.1:%1"_s.arg(silent.serverPort()));
+    gcnDB->close();
+    QElapsedTimer time;
+    time.start();
+    for (int step = 0; step < 3; ++step)
+        EXPECT_EQ(GetConnection(), nullptr);
+    EXPECT_LT(time.elapsed(), 5000);
+    setSetting(u"ServerName"_s, u"(local)"_s);
+    OpenDatabase();
+    EXPECT_TRUE(EnsureConnection());
+}
+
+TEST_F(ShopConnection, ASettingLowersTheTimeOfAStatement)
+{
+    setSetting(u"CommandTimeout"_s, u"1"_s);
+    OpenDatabase();
+    QElapsedTimer time;
+    time.start();
+    EXPECT_THROW(opened(u"WITH RECURSIVE n(i) AS (SELECT 1 UNION ALL SELECT i + 1 FROM n) SELECT COUNT(*) FROM n"_s),
+                 RuntimeError);
+    EXPECT_LT(time.elapsed(), 10000);
 }
 
 TEST_F(ShopConnection, AMissingDatabaseIsTold)
