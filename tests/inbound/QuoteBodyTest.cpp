@@ -126,6 +126,12 @@ TEST_F(QuoteBody, TheRepairerOfANewSubletLineIsFoundOrAdded)
     // the line before it has "I", and the address is cut to the size of the column
     EXPECT_EQ(Row("VENDOR", "NAME='kept'").text("STREET"), std::string(100, 's'));
 
+    vendor("Glass [North");
+    EXPECT_TRUE(
+        apply(body().sublet(4, "I", {{"subletRepairer", "glass [n"}}).sublet(5, "I", {{"subletRepairer", "O_Hara"}})));
+    EXPECT_EQ(line(4).number("VENDOR"), vendor("Glass [North").id());
+    EXPECT_EQ(rowCount("VENDOR", "NAME='O_Hara'"), 1) << "another name than O'Hara";
+
     EXPECT_TRUE(apply(body().sublet(1, "", {{"subletRepairer", "Nobody"}}), "501"));
     EXPECT_TRUE(quote("501").line(1).shows("category=MIS tosend=- directbill=-"));
     EXPECT_EQ(rowCount("VENDOR", "NAME='Nobody'"), 0);

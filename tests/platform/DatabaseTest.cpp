@@ -114,9 +114,29 @@ TEST_P(Database, AStatementThatTakesTooLongIsGivenUp)
     connection->setCommandTimeout(1);
     QElapsedTimer time;
     time.start();
-    EXPECT_EQ(failure(slow).number(), StatementFailed);
+    const RuntimeError thrown = failure(slow);
+    EXPECT_EQ(thrown.number(), StatementFailed);
+    if (GetParam() == On::Tds) {
+        EXPECT_EQ(thrown.sqlState(), u"HYT00"_s) << thrown.what();
+    }
     EXPECT_LT(time.elapsed(), 10000);
     EXPECT_EQ(query(u"SELECT 1 AS one"_s).value(u"one"_s).toInt(), 1) << "the connection lives on";
+}
+
+TEST_P(Database, ANamedLockKeepsEverybodyElseOut)
+{
+    const QString name = u"1006.XML of "_s + QString(300, u'é');
+    const db::ConnectionPtr other = connect();
+    std::optional<db::Lock> held(std::in_place, connection, name);
+    EXPECT_TRUE(held->isHeld());
+    EXPECT_FALSE(db::Lock(connection, name).isHeld()) << "a second time";
+    EXPECT_FALSE(db::Lock(other, name).isHeld());
+    EXPECT_TRUE(db::Lock(other, name + u'2').isHeld());
+    held.reset();
+    EXPECT_TRUE(db::Lock(other, name).isHeld());
+    const db::Lock lost(other, name);
+    other->close();
+    EXPECT_TRUE(db::Lock(connection, name, 5).isHeld()) << "the lock of a connection that is gone";
 }
 
 TEST_P(Database, AConnectionThatHasGoneIsNoticed)

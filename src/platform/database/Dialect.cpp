@@ -5,6 +5,7 @@
 #include <QDateTime>
 #include <QLocale>
 
+#include <algorithm>
 #include <cmath>
 
 namespace kest::db {
@@ -16,6 +17,12 @@ QString Dialect::quoted(const QString& identifier) const
     QString inner = identifier;
     inner.replace(closeQuote, QString(2, closeQuote));
     return openQuote + inner + closeQuote;
+}
+
+QString Dialect::withPrefix(const QString& literal) const
+{
+    const bool isAscii = std::all_of(literal.begin(), literal.end(), [](QChar c) { return c.unicode() < 0x80; });
+    return nationalTexts && !isAscii ? u'N' + literal : literal;
 }
 
 QString Dialect::literal(const QVariant& value) const
@@ -42,7 +49,7 @@ QString Dialect::literal(const QVariant& value) const
             text.replace(u'\'', u"''"_s);
             if (backslashEscapes)
                 text.replace(u'\\', u"\\\\"_s);
-            return u'\'' + text + u'\'';
+            return withPrefix(u'\'' + text + u'\'');
         }
     }
 }
@@ -109,6 +116,7 @@ const Dialect& sqlServerDialect()
         .plusJoinsTexts = true,
         .patternSets = true,
         .isoDates = true,
+        .nationalTexts = true,
         .openQuote = u'[',
         .closeQuote = u']',
         .begin = u"BEGIN TRANSACTION"_s,

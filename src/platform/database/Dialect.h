@@ -18,6 +18,7 @@ struct Dialect {
     bool caseOfTables = false;      // the names of tables are case-sensitive
     bool backslashEscapes = false;  // a backslash in a literal is doubled
     bool isoDates = false;          // "T" between date and time in a literal
+    bool nationalTexts = false;     // only N'...' keeps letters outside of ASCII
     QChar openQuote = u'"';
     QChar closeQuote = u'"';
     QString defaultsOnly = QStringLiteral("DEFAULT VALUES");
@@ -28,6 +29,8 @@ struct Dialect {
     QString lockedEnd = QString();               // the end of such a SELECT
     QString sessionNumber = QString();           // asks for the server's number of the connection
 
+    /// Returns a literal with the prefix that its letters need. An index on a text column serves only one without.
+    QString withPrefix(const QString& literal) const;
     /// Returns a quoted identifier.
     QString quoted(const QString& identifier) const;
     /// Returns a value as a literal, in which the value is escaped. Null is NULL. Throws Overflow for infinity and NaN.

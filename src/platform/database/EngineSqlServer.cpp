@@ -112,9 +112,12 @@ private:
     static const InformationSchemaTerms& terms()
     {
         static const InformationSchemaTerms terms{
-            u"TABLE_CATALOG=DB_NAME()"_s,
-            u"CASE WHEN CHARACTER_MAXIMUM_LENGTH=-1 OR DATA_TYPE IN ('text', 'ntext') THEN 'longtext' "
-            "ELSE DATA_TYPE END"_s,
+            u"TABLE_CATALOG=DB_NAME() AND TABLE_SCHEMA=SCHEMA_NAME()"_s,
+            u"CASE WHEN DATA_TYPE IN ('timestamp', 'rowversion', 'image', 'binary', 'varbinary', 'xml', 'sql_variant', "
+            "'geometry', 'geography', 'hierarchyid') THEN '"_s +
+                InformationSchemaTerms::readOnly +
+                u"' WHEN CHARACTER_MAXIMUM_LENGTH=-1 OR DATA_TYPE IN ('text', 'ntext') THEN 'longtext' "
+                "ELSE DATA_TYPE END"_s,
             u"COLUMNPROPERTY(OBJECT_ID(TABLE_SCHEMA + '.' + TABLE_NAME), COLUMN_NAME, 'IsIdentity')"_s};
         return terms;
     }

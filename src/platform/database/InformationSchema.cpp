@@ -18,11 +18,16 @@ QString textOf(const QVariant& value)
 TableColumn columnOf(const QVariant* row)
 {
     TableColumn column;
+    const QString type = textOf(row[1]);
     column.name = textOf(row[0]);
-    column.kind = kindOfType(textOf(row[1]));
+    column.kind = kindOfType(type);
+    column.readOnly = type == InformationSchemaTerms::readOnly;
     column.size = column.kind == Kind::Text && row[2].toLongLong() <= longestText ? row[2].toInt() : 0;
     column.hasDefault = !row[3].isNull() && textOf(row[3]) != u"NULL"_s;
     column.identity = row[4].toInt() == 1;
+    static const QStringList exactTypes{u"decimal"_s, u"numeric"_s, u"money"_s, u"smallmoney"_s};
+    if (exactTypes.contains(type, Qt::CaseInsensitive) && !row[5].isNull())
+        column.scale = row[5].toInt();
     return column;
 }
 
@@ -44,7 +49,7 @@ std::unique_ptr<TableInfo> tableOf(Engine& engine, const InformationSchemaTerms&
     const QString ofTable = u"TABLE_NAME="_s + engine.dialect().literal(name) + u" AND "_s + terms.ofDatabase;
     const Answer columns = engine.run(
         u"SELECT COLUMN_NAME, "_s + terms.type + u", CHARACTER_MAXIMUM_LENGTH, COLUMN_DEFAULT, "_s + terms.identity +
-        u" FROM INFORMATION_SCHEMA.COLUMNS WHERE "_s + ofTable + u" ORDER BY ORDINAL_POSITION"_s);
+        u", NUMERIC_SCALE FROM INFORMATION_SCHEMA.COLUMNS WHERE "_s + ofTable + u" ORDER BY ORDINAL_POSITION"_s);
     for (size_t i = 0; i < columns.values.size(); i += size_t(columns.names.size()))
         info->columns.append(columnOf(&columns.values[i]));
     const Answer key = engine.run(

@@ -10,8 +10,10 @@ namespace kest::db {
 /// The parts of the queries that differ between servers.
 struct InformationSchemaTerms {
     QString ofDatabase;  // the condition for the database of the connection
-    QString type;        // the declared type of a column
+    QString type;        // the declared type of a column, or `readOnly`
     QString identity;    // 1 if the column is an identity
+
+    static constexpr QLatin1StringView readOnly{"readonly"};  // see TableColumn
 };
 
 /// Returns the names of all tables.

@@ -18,7 +18,7 @@ namespace {
 constexpr int defaultPort = 1433;
 constexpr int connectSeconds = 4;
 constexpr int networkSeconds = 125;  // a little more than the longest statement
-constexpr int instanceMilliseconds = 1000;
+constexpr int instanceMilliseconds = 900;
 
 enum class Family { FreeTds, Microsoft, MySql, Other };
 

@@ -322,7 +322,7 @@ void Recordset::set(const QString& name, const QVariant& value)
     const int column = data->columnNumber(name);
     const ResultColumn& described = data->columns[column];
     if (!data->declared && described.table.isEmpty())
-        throw RuntimeError(StatementFailed, u"The column "_s + name + u" is calculated and can't be changed."_s);
+        throw RuntimeError(StatementFailed, u"The column "_s + name + u" can't be changed."_s);
     const QVariant stored = converted(value, described.kind, data->declared ? described.size : 0);
     if (!data->declared && described.kind == Kind::Text && described.size > 0 &&
         stored.toString().size() > described.size)

@@ -3,6 +3,7 @@
 #include "platform/database/RecordsetData.h"
 
 #include <algorithm>
+#include <cmath>
 
 namespace kest::db {
 
@@ -17,9 +18,17 @@ namespace {
                        "last read."_s);
 }
 
-bool isExact(Kind kind)
+/// Returns the condition that a column still has a value, or an empty text for a floating-point number, and for an
+/// exact number with more digits than a double holds.
+QString held(const Dialect& dialect, const ResultColumn& column, const QVariant& value)
 {
-    return kind != Kind::Number && kind != Kind::LongText;
+    constexpr double exactDigits = 1e15;
+    if (column.kind != Kind::Number || (column.scale >= 0 && value.isNull()))
+        return dialect.holds(column.name, column.kind, value);
+    if (column.scale < 0 || value.typeId() != QMetaType::Double ||
+        std::abs(value.toDouble()) * std::pow(10, column.scale) >= exactDigits)
+        return {};
+    return dialect.quoted(column.name) + u'=' + QString::number(value.toDouble(), 'f', column.scale);
 }
 
 }  // namespace
@@ -98,9 +107,10 @@ QString Recordset::Data::keyCondition(const TableInfo& table)
     }
     if (conditions.isEmpty()) {
         for (int column = 0; column < columns.size(); ++column) {
-            if (columns[column].table == table.name && isExact(columns[column].kind))
-                conditions.append(dialect().holds(columns[column].name, columns[column].kind, before(column)));
+            if (columns[column].table == table.name && columns[column].kind != Kind::LongText)
+                conditions.append(held(dialect(), columns[column], before(column)));
         }
+        conditions.removeAll(QString());
     }
     if (conditions.isEmpty())
         throw RuntimeError(StatementFailed, u"The columns of the query don't identify a row of "_s + table.name);
@@ -151,10 +161,8 @@ void Recordset::Data::writeChange(const QString& tableName)
         const QString& name = columns[column].name;
         const QVariant& before = original[size_t(column)];
         assignments.append(dialect().quoted(name) + u'=' + dialect().literal(at(row(), column)));
-        const Kind kind = columns[column].kind;
-        const QString held = kind == Kind::Number ? QString() : dialect().holds(name, kind, before);
-        if (!held.isEmpty())
-            condition += u" AND "_s + held;
+        if (const QString same = held(dialect(), columns[column], before); !same.isEmpty())
+            condition += u" AND "_s + same;
         written.append(column);
     }
     checkLongTexts(*table, key);
@@ -252,9 +260,10 @@ QString Recordset::Data::insertedRow(const TableInfo& table)
 {
     QStringList conditions{u"1=1"_s};
     for (int column = 0; column < columns.size(); ++column) {
-        if (columns[column].table == table.name && assigned[size_t(column)] && isExact(columns[column].kind))
-            conditions.append(dialect().holds(columns[column].name, columns[column].kind, at(row(), column)));
+        if (columns[column].table == table.name && assigned[size_t(column)] && columns[column].kind != Kind::LongText)
+            conditions.append(held(dialect(), columns[column], at(row(), column)));
     }
+    conditions.removeAll(QString());
     return conditions.join(u" AND "_s);
 }
 

@@ -39,7 +39,7 @@ QList<ResultColumn> described(const std::optional<QList<SelectedColumn>>& select
     for (qsizetype i = 0; i < answer.names.size(); ++i) {
         ResultColumn column;
         column.name = answer.names[i];
-        if (known && isNamed((*selected)[i], column.name) && (*selected)[i].base) {
+        if (known && isNamed((*selected)[i], column.name) && (*selected)[i].base && !(*selected)[i].base->readOnly) {
             const TableColumn& base = *(*selected)[i].base;
             column.table = (*selected)[i].table;
             column.kind = base.kind;

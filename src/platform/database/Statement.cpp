@@ -40,6 +40,7 @@ public:
             writeLimit();
         if (dialect.backslashEscapes)
             doubleBackslashes();
+        prefixLiterals();
         result.text = tokens.text();
         return result;
     }
@@ -375,6 +376,14 @@ private:
         for (Token& token : tokens) {
             if (token.part == Part::Literal)
                 token.text.replace(u'\\', u"\\\\"_s);
+        }
+    }
+
+    void prefixLiterals()
+    {
+        for (Token& token : tokens) {
+            if (token.part == Part::Literal)
+                token.text = dialect.withPrefix(token.text);
         }
     }
 

@@ -24,7 +24,7 @@ int portOfInstance(const QString& host, const QString& instance, int millisecond
     if (!browser.waitForConnected(milliseconds))
         return 0;
     browser.write('\x04' + instance.toLatin1() + '\0');  // asks for a single instance
-    if (!browser.waitForReadyRead(milliseconds))
+    if (!browser.waitForReadyRead(milliseconds) || !browser.hasPendingDatagrams())
         return 0;
     // three bytes, then "ServerName;HOST;InstanceName;NAME;IsClustered;No;Version;15.0.2000.5;tcp;49172;;"
     const QList<QByteArray> words = browser.read(browser.pendingDatagramSize()).mid(3).split(';');

@@ -28,7 +28,8 @@ CREATE VIEW information_schema_columns AS
            ordinal AS ORDINAL_POSITION, fallback AS COLUMN_DEFAULT, nullable AS IS_NULLABLE, type AS DATA_TYPE,
            CASE WHEN type='text' THEN 2147483647 WHEN type='ntext' THEN 1073741823
                 WHEN type LIKE '%char' OR type='varbinary' THEN size END AS CHARACTER_MAXIMUM_LENGTH,
-           CASE WHEN type IN ('decimal', 'numeric') THEN size END AS NUMERIC_PRECISION, scale AS NUMERIC_SCALE
+           CASE WHEN type IN ('decimal', 'numeric') THEN size END AS NUMERIC_PRECISION,
+           CASE WHEN type='money' THEN 4 WHEN type IN ('decimal', 'numeric') THEN scale END AS NUMERIC_SCALE
     FROM sys_of_columns;
 CREATE VIEW information_schema_key_column_usage AS
     SELECT 'standin' AS TABLE_CATALOG, 'dbo' AS TABLE_SCHEMA, table_name AS TABLE_NAME, name AS COLUMN_NAME,

@@ -1,0 +1,166 @@
+// Tests what only SQL Server and its drivers do, over its protocol.
+#include "platform/Databases.h"
+#include "platform/database/Dialect.h"
+#include "platform/database/OdbcDrivers.h"
+
+#include <QTcpServer>
+
+#include <clocale>
+
+using db::Recordset;
+
+/// The locale of the process, "C" until the end of the test, as in a service.
+class ServiceLocale {
+public:
+    ServiceLocale() { std::setlocale(LC_ALL, "C"); }
+    ~ServiceLocale() { std::setlocale(LC_ALL, before.c_str()); }
+    Q_DISABLE_COPY_MOVE(ServiceLocale)
+
+private:
+    std::string before = std::setlocale(LC_ALL, nullptr);
+};
+
+class SqlServer : public Databases {
+protected:
+    void elsewhere(const QString& statement) const { connect()->execute(statement); }
+};
+
+TEST_P(SqlServer, TextsOfAnyLengthAndLetterComeBackWhole)
+{
+    const ServiceLocale locale;
+    connection = connect();
+    connection->execute(
+        u"CREATE TABLE TEXTS (id INT IDENTITY(1,1) PRIMARY KEY, old TEXT, long VARCHAR(MAX), wide NVARCHAR(MAX), "
+        "short NVARCHAR(20))"_s);
+    Recordset texts = query(u"SELECT * FROM TEXTS"_s);
+    for (const int length : {0, 255, 256, 4095, 4096, 8001, 65536, 65537, 200000}) {
+        const QString text = QString(length, u'x') + u"Zoë €5"_s;
+        texts.addNew();
+        for (const QString& column : {u"old"_s, u"long"_s, u"wide"_s})
+            texts.set(column, text);
+        texts.set(u"wide"_s, text + u"Żółw"_s);
+        texts.set(u"short"_s, u"Żółw 😀"_s);
+        texts.update();
+        texts.requery();
+        texts.moveLast();
+        EXPECT_EQ(texts.text(u"old"_s), text) << length;
+        EXPECT_EQ(texts.text(u"long"_s), text) << length;
+        EXPECT_EQ(texts.text(u"wide"_s), text + u"Żółw"_s) << length;
+        EXPECT_EQ(texts.text(u"short"_s), u"Żółw 😀"_s) << length;
+        texts.set(u"old"_s, text + u'.');
+        EXPECT_EQ(failure([&] { texts.update(); }).number(), 0) << length;
+    }
+    EXPECT_EQ(query(u"SELECT * FROM TEXTS WHERE short='żółw 😀'"_s).recordCount(), 9);
+    EXPECT_EQ(db::sqlServerDialect().literal(u"O'Brien"_s), u"'O''Brien'"_s) << "an index needs it without N";
+}
+
+TEST_P(SqlServer, TriggersChangeNeitherCountsNorIdentities)
+{
+    for (const QString& statement :
+         {u"CREATE TABLE AUDIT (id INT IDENTITY(1,1) PRIMARY KEY, what VARCHAR(20))"_s,
+          u"INSERT INTO AUDIT (what) VALUES ('first')"_s, u"INSERT INTO AUDIT (what) VALUES ('second')"_s,
+          u"CREATE TRIGGER Audited ON LINE AFTER INSERT, UPDATE AS INSERT INTO AUDIT (what) SELECT what FROM AUDIT"_s})
+        connection->execute(statement);
+    Recordset lines = query(u"SELECT * FROM LINE"_s);
+    lines.addNew();
+    lines.set(u"CODE"_s, u"A"_s);
+    lines.update();
+    EXPECT_EQ(lines.value(u"id"_s), QVariant(qint64(1)));
+    lines.set(u"SEQ"_s, 5);
+    EXPECT_EQ(failure([&] { lines.update(); }).number(), 0);
+    EXPECT_EQ(connection->execute(u"UPDATE LINE SET SEQ=6 WHERE CODE='A'"_s), 1);
+    lines.set(u"SEQ"_s, 7);
+    EXPECT_EQ(failure([&] { lines.update(); }).number(), RowChanged) << "only the trigger has changed rows";
+}
+
+TEST_P(SqlServer, ExactNumbersTellARowAndVersionsDoNot)
+{
+    connection->execute(
+        u"CREATE TABLE PRICES (name VARCHAR(20), price MONEY, hours DECIMAL(9,2), weight FLOAT, picture VARBINARY(20), "
+        "version TIMESTAMP)"_s);
+    connection->execute(u"INSERT INTO PRICES (name, price, hours, weight) VALUES ('door', 12.35, 0.1, 0.1)"_s);
+    Recordset prices = query(u"SELECT * FROM PRICES"_s);
+    for (const auto& [column, value, theirs] :
+         {std::tuple(u"price"_s, 99.9, u"12.36"_s), {u"hours"_s, 7.25, u"0.2"_s}}) {
+        prices.set(column, value);
+        prices.update();
+        prices.set(column, 1);
+        elsewhere(u"UPDATE PRICES SET %1=%2"_s.arg(column, theirs));
+        EXPECT_EQ(failure([&] { prices.update(); }).number(), RowChanged) << column.toStdString();
+        prices.cancelUpdate();
+        prices.requery();
+        EXPECT_EQ(prices.text(column), theirs);
+    }
+    prices.set(u"weight"_s, 2.5);
+    EXPECT_EQ(failure([&] { prices.update(); }).number(), 0) << "no key, so all other columns tell the row";
+    for (const QString& column : {u"version"_s, u"picture"_s})
+        EXPECT_EQ(failure([&] { prices.set(column, u"x"_s); }).number(), StatementFailed) << column.toStdString();
+    prices.remove();
+    EXPECT_TRUE(query(u"SELECT * FROM PRICES"_s).eof());
+}
+
+TEST_P(SqlServer, AServerThatFallsSilentIsToldWithinSeconds)
+{
+    const auto milliseconds = [](auto&& step) {
+        QElapsedTimer time;
+        time.start();
+        step();
+        return time.elapsed();
+    };
+    connection->execute(u"EXEC standin_silence"_s);
+    EXPECT_LT(milliseconds([&] { EXPECT_FALSE(connection->answers()); }), 5000);
+
+    QTcpServer silent;  // the system accepts connections for it, and nobody answers
+    ASSERT_TRUE(silent.listen(QHostAddress::LocalHost));
+    const QString port = u"127.0.0.1,%1"_s.arg(silent.serverPort());
+    db::Connection other;
+    const RuntimeError thrown = failure([&] {
+        EXPECT_LT(
+            milliseconds([&] {
+                EXPECT_THROW(
+                    other.open(QString(connectionText).replace(tdsServer().address(), port).remove(u"Port=1433;"_s)),
+                    RuntimeError);
+            }),
+            5000);
+        other.open(
+            QString(connectionText).replace(tdsServer().address(), u"127.0.0.1\\NOSUCH"_s).remove(u"Port=1433;"_s));
+    });
+    EXPECT_EQ(thrown.number(), CannotOpen);
+    EXPECT_TRUE(thrown.description().contains(u"NOSUCH"_s)) << thrown.what();
+}
+
+TEST_P(SqlServer, EachDriverGetsTheServerInItsOwnForm)
+{
+    QTemporaryDir folder;
+    QFile list(folder.filePath(u"odbcinst.ini"_s));
+    ASSERT_TRUE(list.open(QIODevice::WriteOnly));
+    list.write(
+        "[FreeTDS]\nDriver=libtdsodbc.so\n[ODBC Driver 18 for SQL Server]\nDriver=libmsodbcsql-18.3.so\n"
+        "[Odd]\nDriver=libodd.so\n");
+    list.close();
+    const QByteArray before = qgetenv("ODBCSYSINI");
+    qputenv("ODBCSYSINI", QFile::encodeName(folder.path()));
+    EXPECT_EQ(db::sqlServerDriver(), u"ODBC Driver 18 for SQL Server"_s);
+    for (auto [driver, server, options, expected] : casesIn<4>("odbc-texts.txt")) {
+        server.replace(u"STANDIN"_s, tdsServer().address());
+        expected.replace(u"STANDIN"_s, tdsServer().address());
+        const db::ConnectionText given(u"Driver={SQL Server};Server=%1;Database=WirSql;Uid=sa;Pwd=p;"_s.arg(server));
+        EXPECT_EQ(db::odbcTarget(given, driver, db::ConnectionText(options)).connectionText, expected);
+    }
+    qputenv("ODBCSYSINI", before);
+}
+
+TEST_P(SqlServer, TheTextsOfTheHostConnect)
+{
+    const QString host = u"Driver={TDS Server};Server=%1;Database=shop;Uid=sa;Pwd=;"_s;
+    for (const QString& server :
+         {tdsServer().address() + u'\\', tdsServer().address() + u"\\shop"_s, tdsServer().address() + u",1433\\"_s}) {
+        db::Connection made;
+        EXPECT_EQ(failure([&] { made.open(host.arg(server)); }).number(), 0) << server.toStdString();
+    }
+    db::Connection made;
+    made.setOdbcOptions(u"Server=%1"_s.arg(tdsServer().address()));
+    EXPECT_EQ(failure([&] { made.open(host.arg(u"127.0.0.1,1\\"_s)); }).number(), 0);
+}
+
+INSTANTIATE_TEST_SUITE_P(Alone, SqlServer, ::testing::Values(On::Tds));
