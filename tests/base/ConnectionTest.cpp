@@ -15,17 +15,11 @@ TEST(connectionText, NamesTheServerAsItsDriverExpects)
 {
     gsDatabase = u"WirSql"_s;
     gsSAPwd = u"secret"_s;
-    const auto login = u"Database=WirSql;Uid=sa;Pwd=secret;"_s;
-    const std::tuple<int, QString, QString, QString> cases[] = {
-        {0, u"(local)"_s, u""_s, u"Driver={SQL Server};Server=(local)\\;"_s + login},
-        {1, u"SHOP\\"_s, u"A"_s, u"Driver={SQL Native Client};Server=SHOP\\A;"_s + login},
-        {0, u"SHOP"_s, u"A"_s, u"Driver={SQL Server};Server=SHOP\\A;"_s + login},
-        {2, u"SHOP"_s, u"A"_s, u""_s},
-        {1, u"mysql:db.shop:3307"_s, u"A"_s, u"Driver={MySQL};Server=db.shop;Port=3307;"_s + login}};
-    for (const auto& [driver, server, instance, expected] : cases) {
+    for (const auto& [driver, server, instance, text] : casesIn<4>("connection-servers.txt")) {
         gsServer = server;
         gsInstance = instance;
-        EXPECT_EQ(connectionText(driver), expected);
+        const QString login = text.isEmpty() ? QString() : u"Database=WirSql;Uid=sa;Pwd=secret;"_s;
+        EXPECT_EQ(connectionText(driver.toInt()), text + login);
     }
 }
 

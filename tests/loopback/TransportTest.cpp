@@ -83,21 +83,19 @@ TEST_F(Loopback, OneLivingTransportWorksOnTheFolders)
     }
 }
 
-TEST_F(Loopback, EachMessageHasTheEffectThatItsTypeTells)
+TEST_F(Loopback, EachMessageLoads)
 {
     ASSERT_TRUE(send());
     carried();
     const QString answer = files::list(gsUnreadPath).value(0);
     const QString text = files::read(gsUnreadPath + answer);
-    for (const auto& [step, type, stage, note] : casesIn<4>("loopback/effects.txt")) {
+    for (const auto& [step, type] : casesIn<2>("loopback/steps.txt")) {
         files::write(gsUnreadPath + answer, text);
         listed();
         rules(u"on start quote=1004 claim=7701004\n  "_s + step);
         carried();
         EXPECT_EQ(loadOne(), type.toStdString());
         listed();  // because an old answer would lock the quote again
-        const QString state = QString::fromStdString(quote("1004").state());
-        EXPECT_TRUE(state.startsWith(stage + u' ') && state.contains(u" : %1)"_s.arg(note))) << state;
     }
     EXPECT_EQ(desktop->boxes().filter(u"critical|"_s), QStringList());
 }

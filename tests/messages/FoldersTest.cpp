@@ -21,25 +21,8 @@ TEST_F(MessageFolders, ALoadedMessageIsNamedAfterItsQuote)
     quote("500").request("QR1", "1").quoteNumber("KQ1");
     quote("500", 2).request("QR1", "2").quoteNumber("KQ1");
 
-    EXPECT_EQ(moved(quoteRequest("QR1").version("1")), "500.xml");
-    EXPECT_EQ(moved(revisionRequest("QR1").version("2")), "500.2_1.xml");
-    for (const Message& ofTheNewestQuote : {cancellation("QR1"), cancellationBackout("QR1"), assessmentBackout("QR1"),
-                                            assessmentResult("KQ1"), quoteDeletion("KQ1")})
-        EXPECT_EQ(moved(ofTheNewestQuote), "500.2_1.xml") << ofTheNewestQuote.text();
-    for (const Message& message :
-         {quoteMatch("123/2"), manualQuote("123/2"), adjustedQuote("123/2"), authorisedQuote("123/2")})
-        EXPECT_EQ(moved(message), "123.2_1.xml");
-    EXPECT_EQ(moved(quoteMatch("123")), "123.0_1.xml");
-}
-
-TEST_F(MessageFolders, AMessageThatReachesNoQuoteKeepsItsName)
-{
-    quote("500").request("QR1", "1");
-    for (const Message& message :
-         {quoteRequest("QR1").version("2"), quoteRequest("QR9"), cancellation("Q'; DROP TABLE QUOTE1; --"),
-          quoteRequest("QR1").without("quoteRequestVersionNumber"), assessmentResult("KQ9"), quoteMatch(""),
-          excessWaiver("500"), quoteMatch("..\\..\\x"), quoteMatch("5/../../x"), quoteMatch("c:5")})
-        EXPECT_EQ(moved(message), "in.xml") << message.text();
+    for (const auto& [message, name] : casesIn<2>("messages/read-names.txt"))
+        EXPECT_EQ(moved(Message::told(message)), name.toStdString()) << message;
     EXPECT_EQ(moved("no message"), "in.xml");
     EXPECT_EQ(moved(quoteMatch("a\tb"), "..two dots.xml"), "..two dots.xml");
     EXPECT_TRUE(quoteExists("500"));

@@ -3,19 +3,10 @@
 
 TEST(NetworkCodes, WhatGoesOutComesBackAsTheFirstOfItsCode)
 {
-    const std::tuple<QString, QString, QString> paint[] = {
-        {u"m2"_s, u"PEAR"_s, u"M2"_s}, {u"S3"_s, u"CLER"_s, u"S2"_s}, {u"Q"_s, u""_s, u"S3"_s}};
-    for (const auto& [group, code, comesBack] : paint) {
-        EXPECT_EQ(codeOfPaintGroup(group), code);
-        EXPECT_EQ(paintGroupOfCode(code), comesBack);
-    }
-    const std::tuple<QString, QString, QString> parts[] = {{u""_s, u"NEW"_s, u" "_s},
-                                                           {u"R"_s, u"RECY"_s, u"U"_s},
-                                                           {u"X"_s, u"EXCH"_s, u"X"_s},
-                                                           {u"x"_s, u"NEW"_s, u" "_s}};
-    for (const auto& [mark, type, comesBack] : parts) {
-        EXPECT_EQ(partTypeOfMark(mark), type);
-        EXPECT_EQ(markOfPartType(type), comesBack);
+    for (const auto& [kind, ours, code, comesBack] : casesIn<4>("quotedata/network-codes.txt")) {
+        const bool isPaint = kind == u"paint"_s;
+        EXPECT_EQ(isPaint ? codeOfPaintGroup(ours) : partTypeOfMark(ours), code) << ours;
+        EXPECT_EQ(isPaint ? paintGroupOfCode(code) : markOfPartType(code), comesBack) << code;
     }
     EXPECT_EQ(markOfPartType(u"recy"_s), std::nullopt);
     EXPECT_EQ(colourOfCode(codeOfColour(u" cHAMPAGNE"_s)), u"Champagne"_s);

@@ -164,18 +164,8 @@ TEST_F(Profile, LeavesRowsOfOneKeyInTheOrderInWhichTheyWereAdded)
             database->execute(u"INSERT INTO "_s + table + u' ' + row);
     }
     database->execute(u"UPDATE QUOTE1 SET KESTQRNo='Q', KESTQuoteNo='N'"_s);
-    const std::pair<QString, std::string> cases[] = {
-        {u"SELECT rec_id FROM QUOTE1 WHERE QTNNO='9'"_s, "1 2 3 4"},
-        {u"SELECT rec_id FROM QUOTE1 WHERE QTNNO='9' ORDER BY Subquote"_s, "2 4 1 3"},
-        {u"SELECT rec_id FROM QUOTE1 WHERE QTNNO='9' ORDER BY Subquote DESC"_s, "1 3 2 4"},
-        {u"SELECT rec_id FROM QUOTE1 WHERE QTNNO='9' AND Subquote='1'"_s, "1 3"},
-        {u"SELECT rec_id FROM QUOTE1 WHERE KESTQRNo='q' ORDER BY Subquote DESC"_s, "1 3 2 4"},
-        {u"SELECT rec_id FROM QUOTE1 WHERE KESTQuoteNo='N '"_s, "1 2 3 4"},
-        {u"SELECT itemid FROM QUOTE2 WHERE QTNNO='9' AND Subquote='0'"_s, "2 4"},
-        {u"SELECT Subquote FROM QUOTE3 WHERE QTNNO='9'"_s, "1 0 1 0"},
-    };
-    for (const auto& [select, expected] : cases)
-        EXPECT_EQ(column(select), expected) << select;
+    for (const auto& [select, expected] : casesIn<2>("row-order.txt"))
+        EXPECT_EQ(column(select), expected.toStdString()) << select;
 }
 
 TEST_F(DemoShop, HoldsTogether)
