@@ -214,8 +214,9 @@ RowChange Recordset::Data::rowChange(const TableInfo& table, ChangeKind kind, co
             continue;
         const TableColumn* base = table.column(described.name);
         const bool isIdentity = base && base->identity;
+        const bool isExact = described.kind != Kind::Number && described.kind != Kind::LongText;
         const bool isKey = hasKey ? table.key.contains(described.name, Qt::CaseInsensitive)
-                                  : isExact(described.kind) && (kind == ChangeKind::Update || assigned[size_t(column)]);
+                                  : isExact && (kind == ChangeKind::Update || assigned[size_t(column)]);
         if (!isKey && !isIdentity && !isChanged(column) && !wanted.contains(described.name, Qt::CaseInsensitive))
             continue;
         if (isKey && !hasKey)
