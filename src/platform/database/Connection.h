@@ -56,6 +56,8 @@ public:
     /// Returns who sees changes of the table, or null: also while a change is recorded. Used by Change.
     ChangeObserver* observerOf(const QString& table) const;
     void setInChange(bool inChange) { inChange_ = inChange; }
+    /// Returns true while a change and its record are written, so that others who write must wait.
+    bool isInChange() const { return inChange_; }
 
 private:
     std::shared_ptr<ChangeObserver> observer_;
