@@ -44,7 +44,7 @@ QString storyOf(const QString& step)
 QString boxesOf(const desktop::Record& shown)
 {
     QString html;
-    for (const QJsonValue& box : shown.boxes)
+    for (const QJsonValue box : shown.boxes)
         html +=
             u"<p class=\"box\">"_s + box[u"text"].toString().toHtmlEscaped().replace(u'\n', u"<br>"_s) + u"</p>\n"_s;
     return html;

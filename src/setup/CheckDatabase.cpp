@@ -177,7 +177,7 @@ DatabaseCheck Check::run()
         {u"a statement that takes too long is given up"_s, &Check::givesUp},
         {u"a lost connection is noticed and can be opened again"_s, &Check::noticesLostConnections}};
     for (const auto& [what, step] : points) {
-        point(what, [&] {
+        point(what, [this, step = step] {
             if (!made_)
                 throw Skip{u"there is no table to try it in"_s};
             clear();

@@ -246,11 +246,12 @@ void paint(const Report& report, QPagedPaintDevice& device, int firstPage, int l
         throw RuntimeError(FileInputOutput, u"The report can't be painted."_s);
     desktop::Progress progress(report.title(), u"Laying out the pages..."_s);
     const int perCopy = last - firstPage + 1;
-    for (int painted = 0; painted < perCopy * copies; ++painted) {
+    const int total = perCopy * copies;
+    for (int painted = 0; painted < total; ++painted) {
         if (painted > 0)
             device.newPage();
         pages.paint(painter, firstPage - 1 + painted % perCopy);
-        progress.step(painted + 1, perCopy * copies);
+        progress.step(painted + 1, total);
     }
 }
 
