@@ -18,7 +18,6 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-constexpr int descriptionLength = 39;
 constexpr int repairerLength = 49;
 
 constexpr ReportField fields[] = {
