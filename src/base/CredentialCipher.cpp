@@ -1,6 +1,7 @@
 #include "base/CredentialCipher.h"
 
 #include "platform/RuntimeError.h"
+#include "platform/files/CodePage.h"
 #include "platform/files/files.h"
 
 #include <nettle/blowfish.h>

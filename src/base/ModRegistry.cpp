@@ -1,6 +1,7 @@
 #include "base/ModRegistry.h"
 
 #include "platform/RuntimeError.h"
+#include "platform/files/CodePage.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
 

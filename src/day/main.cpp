@@ -3,6 +3,7 @@
 #include "day/DayPage.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
+#include "platform/files/Background.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
 

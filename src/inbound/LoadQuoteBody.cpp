@@ -8,6 +8,7 @@
 #include "messages/MessageLines.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
+#include "platform/files/CodePage.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
 #include "quotedata/NetworkCodes.h"

@@ -1,5 +1,6 @@
 #include "loopback/AuthorityDocument.h"
 
+#include "platform/files/CodePage.h"
 #include "platform/files/files.h"
 
 namespace kest::app {

@@ -4,6 +4,7 @@
 #include "messages/Envelope.h"
 #include "messages/MessageTypes.h"
 #include "platform/RuntimeError.h"
+#include "platform/files/CodePage.h"
 #include "platform/files/files.h"
 #include "platform/xml/xml.h"
 #include "setup/DemoShop.h"

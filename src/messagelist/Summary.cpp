@@ -6,6 +6,7 @@
 #include "messages/Folders.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
+#include "platform/files/CodePage.h"
 #include "platform/files/files.h"
 
 #include <QFileInfo>

@@ -7,6 +7,7 @@
 #include "messages/MessageTypes.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
+#include "platform/files/Background.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
 

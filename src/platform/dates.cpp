@@ -1,4 +1,4 @@
-#include "platform/values.h"
+#include "platform/dates.h"
 
 #include <QRegularExpression>
 

@@ -145,13 +145,6 @@ std::optional<double> numberIn(const QString& text)
     return number && std::isfinite(*number) ? number : std::nullopt;
 }
 
-bool isNumeric(const QVariant& value)
-{
-    if (value.userType() == QMetaType::QString)
-        return numberIn(value.toString()).has_value();
-    return !value.isNull() && value.canConvert<double>();
-}
-
 double leadingNumber(const QString& text)
 {
     static const QRegularExpression blanks(u"[ \\t\\r\\n]"_s);

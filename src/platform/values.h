@@ -1,6 +1,8 @@
 // Converts column values and message texts to numbers, flags, dates and texts. All conversions are made here.
 #pragma once
 
+#include "platform/dates.h"
+
 #include <QDateTime>
 #include <QString>
 #include <QVariant>
@@ -32,15 +34,9 @@ inline bool isTrue(const QVariant& flag)
 }
 /// Returns a date.
 QDateTime toDate(const QVariant& value);
-/// Returns a date as columns store it. It has no time zone, so the hour that a clock change skips is a normal hour.
-QDateTime columnDate(const QDate& date, const QTime& time);
 
 /// Returns the number in a text, or nothing if the text is not a number.
 std::optional<double> numberIn(const QString& text);
-/// Returns the date in a text, or nothing if the text is not a date.
-std::optional<QDateTime> dateIn(const QString& text);
-/// Returns true if the value is a number or a text that is one.
-bool isNumeric(const QVariant& value);
 
 /// Returns the number at the start of a text, or 0 if there is none. Skips blanks, even between digits, and ignores the
 /// rest.
@@ -54,7 +50,5 @@ QString textOrEmpty(const QVariant& value);
 
 /// Returns a number with up to 15 significant digits, without exponent from 1e-10 to below 1e16, and never "-0".
 QString numberText(double value);
-/// Returns a date as dd/MM/yyyy, always ten characters.
-QString shortDate(const QDate& date);
 
 }  // namespace kest

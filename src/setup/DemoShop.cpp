@@ -1,5 +1,6 @@
 #include "setup/DemoShop.h"
 
+#include "platform/files/CodePage.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
 #include "setup/QuoteDatabase.h"

@@ -2,6 +2,7 @@
 
 #include "platform/Prompt.h"
 #include "platform/desktop/Display.h"
+#include "platform/desktop/Person.h"
 #include "platform/desktop/Window.h"
 #include "platform/settings/registry.h"
 #include "shell/eKEST.h"

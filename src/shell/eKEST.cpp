@@ -8,6 +8,7 @@
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
 #include "platform/desktop/Window.h"
+#include "platform/files/Background.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
 #include "quotedata/Quote.h"

@@ -3,6 +3,7 @@
 #include "messages/Envelope.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
+#include "platform/files/CodePage.h"
 #include "platform/files/files.h"
 #include "platform/xml/xml.h"
 

@@ -4,6 +4,7 @@
 #include "day/Day.h"
 #include "day/DayPage.h"
 #include "jobexport/JobLinkSettings.h"
+#include "platform/files/Background.h"
 #include "setup/Profile.h"
 #include "shell/component.h"
 #include "support/MariaDbServer.h"

@@ -1,5 +1,6 @@
 #include "base/modLoggerEx.h"
 #include "inbound/modLoadXML.h"
+#include "platform/files/Background.h"
 #include "support/Shop.h"
 
 using Dispatcher = Shop;

@@ -1,6 +1,7 @@
 // Tests boxes, input boxes, starting programs, the guard of window events, and the remembered window layout.
 #include "platform/Prompt.h"
 #include "platform/desktop/Form.h"
+#include "platform/desktop/Person.h"
 #include "platform/desktop/Progress.h"
 #include "platform/script/Gestures.h"
 #include "support/ScriptedDesktop.h"

@@ -1,4 +1,6 @@
 // Tests files with the host's names: where they are, what remains after an error, and which names are valid.
+#include "platform/files/Background.h"
+#include "platform/files/CodePage.h"
 #include "platform/files/Lock.h"
 #include "support/FullDisk.h"
 #include "support/Test.h"

@@ -1,9 +1,8 @@
 // Tests the preview: which template it opens, which values it fills in, its window, and the pages.
-#include "platform/database/Recordset.h"
+#include "platform/desktop/Person.h"
 #include "platform/print/OutputFolder.h"
 #include "platform/print/Pages.h"
 #include "platform/script/Gestures.h"
-#include "platform/settings/registry.h"
 #include "reports/BuildAuthReport.h"
 #include "reports/Previews.h"
 #include "reports/frmPrintPreview.h"

@@ -5,6 +5,7 @@
 #include "messagelist/frmHeld.h"
 #include "messagelist/frmMessageList.h"
 #include "outbound/frmExtraInfo.h"
+#include "platform/desktop/Person.h"
 #include "platform/script/Gestures.h"
 #include "reports/frmPrintPreview.h"
 #include "sublets/frmSubletAuth.h"

@@ -1,3 +1,5 @@
+#include "platform/desktop/Person.h"
+
 #include "platform/Prompt.h"
 #include "platform/desktop/Programs.h"
 #include "platform/desktop/Progress.h"

@@ -30,9 +30,6 @@ public:
 /// Sets the driver of all windows; null leaves them to a person.
 void setWindowDriver(std::shared_ptr<WindowDriver> driver);
 
-/// Lets a person answer: boxes and input boxes are real windows, and windows wait for their user.
-void usePerson();
-
 /// Reports an error that no routine has caught; `source` is "window.control_event".
 using FailureReporter = std::function<void(const RuntimeError&, const QString& source)>;
 /// Sets the function that guarded() reports errors with.

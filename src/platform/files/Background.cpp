@@ -1,3 +1,5 @@
+#include "platform/files/Background.h"
+
 #include "platform/RuntimeError.h"
 #include "platform/files/SystemFile.h"
 #include "platform/files/files.h"

@@ -1,5 +1,6 @@
+#include "platform/files/CodePage.h"
+
 #include "platform/RuntimeError.h"
-#include "platform/files/files.h"
 
 #include <algorithm>
 #include <iterator>
@@ -29,11 +30,6 @@ char byteOf(char16_t c)
 bool isWhiteSpace(char c)
 {
     return c == ' ' || c == '\t' || c == '\r' || c == '\n' || c == '\f' || c == '\v';
-}
-
-bool isBase64Letter(char c)
-{
-    return (c >= 'A' && c <= 'Z') || (c >= 'a' && c <= 'z') || (c >= '0' && c <= '9') || c == '+' || c == '/';
 }
 
 }  // namespace
@@ -69,13 +65,14 @@ QString fromCodePage(const QByteArray& bytes)
 
 QByteArray fromBase64(QByteArrayView text)
 {
-    QByteArray letters;
-    letters.reserve(text.size());
-    std::copy_if(text.begin(), text.end(), std::back_inserter(letters), [](char c) { return !isWhiteSpace(c); });
-    const qsizetype padding = letters.endsWith("==") ? 2 : letters.endsWith('=') ? 1 : 0;
-    if (letters.size() % 4 != 0 || !std::all_of(letters.begin(), letters.end() - padding, isBase64Letter))
+    QByteArray letters = text.toByteArray();
+    letters.removeIf(isWhiteSpace);
+    const bool isWhole = letters.size() % 4 == 0;  // which Qt checks only if there is padding
+    const auto result = QByteArray::fromBase64Encoding(
+        std::move(letters), QByteArray::Base64Encoding | QByteArray::AbortOnBase64DecodingErrors);
+    if (!isWhole || !result)
         throw RuntimeError(TypeMismatch, u"The text is not base64"_s);
-    return QByteArray::fromBase64Encoding(std::move(letters)).decoded;
+    return *result;
 }
 
 }  // namespace kest::files

@@ -1,6 +1,7 @@
 #include "platform/files/files.h"
 
 #include "platform/RuntimeError.h"
+#include "platform/files/CodePage.h"
 #include "platform/files/SystemFile.h"
 
 #include <QDir>

@@ -70,18 +70,4 @@ bool isPlainName(const QString& name);
 /// Returns `folder` + `name` for a file that will be written. Throws PathNotFound if the name is not plain.
 QString pathForWriting(const QString& folder, const QString& name);
 
-/// Deletes a file that another process may still have open. If that fails, retries every 100 ms while a window is open.
-void removeInBackground(const QString& path);
-/// Waits for these deletions. Returns true if all files are gone. The profile remembers those that still exist.
-bool waitForBackground(int milliseconds);
-/// Continues the deletions that an earlier process has left, except for files that have changed since.
-void resumeRemovals();
-
-/// Encodes a text in Windows-1252. Other characters become "?".
-QByteArray toCodePage(const QString& text);
-/// Decodes Windows-1252. All 256 bytes are characters.
-QString fromCodePage(const QByteArray& bytes);
-/// Decodes base64 and ignores white space. Throws TypeMismatch for any other character or a wrong length.
-QByteArray fromBase64(QByteArrayView text);
-
 }  // namespace kest::files

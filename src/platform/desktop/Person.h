@@ -1,0 +1,9 @@
+// Shows boxes and windows to a person.
+#pragma once
+
+namespace kest::desktop {
+
+/// Lets a person answer: boxes and input boxes are real windows, and windows wait for their user.
+void usePerson();
+
+}  // namespace kest::desktop

@@ -1,0 +1,16 @@
+// Converts between texts and the bytes of files.
+#pragma once
+
+#include <QByteArray>
+#include <QString>
+
+namespace kest::files {
+
+/// Encodes a text in Windows-1252. Other characters become "?".
+QByteArray toCodePage(const QString& text);
+/// Decodes Windows-1252. All 256 bytes are characters.
+QString fromCodePage(const QByteArray& bytes);
+/// Decodes base64 and ignores white space. Throws TypeMismatch for any other character or a wrong length.
+QByteArray fromBase64(QByteArrayView text);
+
+}  // namespace kest::files
