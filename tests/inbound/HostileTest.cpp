@@ -41,7 +41,9 @@ static QStringList variantsOf(QString text)
     for (qsizetype leaf = 0; leaf < count; ++leaf) {
         changed(leaf, [](xml::Document&, xml::Node element) { element.parentNode().removeChild(element); });
         changed(leaf, [](xml::Document& message, xml::Node element) {
-            xml::Node twin = message.createNode(element.nodeType(), element.nodeName(), element.namespaceURI());
+            const QString name = element.nodeName();
+            const QString space = name.contains(u':') ? GetNamespaceURI() : QString();
+            xml::Node twin = message.createNode(element.nodeType(), name, space);
             twin.setText(u"2"_s);
             element.parentNode().insertBefore(twin, element);
         });

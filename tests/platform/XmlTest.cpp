@@ -177,13 +177,13 @@ TEST(XmlNodes, OnlyBlankTextIsNoNode)
 TEST(XmlNodes, AttributesStandInDocumentOrder)
 {
     const QString text =
-        u"<q:a one = '1' xmlns:q='urn:quote'\n xmlns='d' q:two='a&amp;\"' xmlns:z=\">z'\" three=''><b x='1'/></q:a>"_s;
+        u"<q:a one = '1' xmlns:q='urn:quote'\n xmlns='d' q:two='a&amp;&#10;\"' xmlns:z=\">z'\" three=''><b x='1'/></q:a>"_s;
     for (const QString& written : {text, parsed(text).xml()}) {
         const Document document = parsed(written);
         QStringList all;
         for (const Attribute& attribute : document.documentElement().attributes())
             all.append(attribute.name + u'=' + attribute.value);
-        EXPECT_EQ(all.join(u' '), u"one=1 xmlns:q=urn:quote xmlns=d q:two=a&\" xmlns:z=>z' three="_s);
+        EXPECT_EQ(all.join(u' '), u"one=1 xmlns:q=urn:quote xmlns=d q:two=a&\n\" xmlns:z=>z' three="_s);
     }
 }
 
@@ -244,8 +244,6 @@ TEST(XmlBuilding, TextIsWrittenAsItselfWithoutForbiddenCharacters)
     Node root = document.appendChild(document.createNode(NodeType::Element, u"a"_s));
     root.setText(u"x\u0001\u001f<&>\"'\u00e9\u20ac\t\r\n\ufffe]]>\U0001F697"_s + QChar(0xD800));
     EXPECT_EQ(document.xml(), u"<a>x&lt;&amp;&gt;\"'\u00e9\u20ac\t\r\n]]&gt;\U0001F697</a>"_s);
-    root.setAttribute(u"b"_s, u"<\"\n\u0003>'"_s);
-    EXPECT_EQ(parsed(document.xml()).documentElement().attributes().first().value, u"<\"\n>'"_s);
     root.setText(u"  "_s);
     EXPECT_TRUE(document.xml().endsWith(u">  </a>"_s));
 }

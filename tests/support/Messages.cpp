@@ -105,7 +105,7 @@ Message& Message::line(const Text& kind, int number, const Text& change, const F
     add(line, u"quoteLineNumber"_s).setText(QString::number(number));
     if (QString(change) != u"D"_s)
         for (const xml::Node& usual : lines.document.selectNodes(pathTo(kind) + u"/*"_s))
-            add(line, usual.localName()).setText(usual.text());
+            add(line, usual.nodeName().section(u':', -1)).setText(usual.text());
     for (const auto& [name, value] : fields) {
         xml::Node usual = line.selectSingleNode(pathTo(name));
         (usual ? usual : add(line, name)).setText(value);

@@ -197,12 +197,6 @@ bool Recordset::eof() const
     return data->position >= int(data->visible.size());
 }
 
-bool Recordset::bof() const
-{
-    data->requireOpen();
-    return data->visible.empty() || data->position < 0;
-}
-
 int Recordset::recordCount() const
 {
     data->requireOpen();
@@ -237,14 +231,6 @@ void Recordset::moveNext()
     if (eof())
         failNoCurrentRow();
     ++data->position;
-}
-
-void Recordset::movePrevious()
-{
-    update();
-    if (bof())
-        failNoCurrentRow();
-    --data->position;
 }
 
 void Recordset::moveLast()

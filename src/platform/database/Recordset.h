@@ -45,8 +45,6 @@ public:
 
     /// Returns true after the last row, and in an empty recordset.
     bool eof() const;
-    /// Returns true before the first row, and in an empty recordset.
-    bool bof() const;
     /// Returns the number of rows that the filter shows, including a pending new row.
     int recordCount() const;
     /// Returns the number of the current row, counted from 1 among the rows that the filter shows, or -1 if there is
@@ -56,7 +54,6 @@ public:
     void setAbsolutePosition(int position);
     void moveFirst();
     void moveNext();  // throws NoCurrentRow at eof
-    void movePrevious();
     void moveLast();
 
     /// Moves forward to the next row that matches, starting with the current row. If there is none, or if the recordset

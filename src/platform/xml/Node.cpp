@@ -144,16 +144,6 @@ QString Node::nodeName() const
     }
 }
 
-QString Node::localName() const
-{
-    return hasContentOfItsOwn(required()) ? QString() : fromXml(node->name);
-}
-
-QString Node::namespaceURI() const
-{
-    return !hasContentOfItsOwn(required()) && node->ns ? fromXml(node->ns->href) : QString();
-}
-
 QString Node::text() const
 {
     return textOfNode(required());
@@ -193,26 +183,6 @@ QList<Attribute> Node::attributes() const
     return attributesOf(*document, node);
 }
 
-void Node::setAttribute(const QString& name, const QString& value)
-{
-    const QByteArray whole = name.toUtf8();
-    if (required()->type != XML_ELEMENT_NODE || xmlValidateQName(toXml(whole), 0) != 0)
-        throw RuntimeError(TypeMismatch, u"No attribute can be created with the name "_s + name);
-    const QByteArray text = allowedText(value).toUtf8();
-    const qsizetype colon = name.indexOf(u':');
-    const QString prefix = colon < 0 ? QString() : name.first(colon);
-    const QByteArray local = name.sliced(colon + 1).toUtf8();
-    if (name == "xmlns"_L1 || prefix == "xmlns"_L1) {
-        if (!xmlNewNs(node, toXml(text), prefix.isEmpty() ? nullptr : toXml(local)))
-            throw RuntimeError(TypeMismatch, u"The namespace is already declared: "_s + name);
-        return;
-    }
-    xmlNsPtr space = prefix.isEmpty() ? nullptr : xmlSearchNs(node->doc, node, toXml(prefix.toUtf8()));
-    if (!prefix.isEmpty() && !space)
-        throw RuntimeError(TypeMismatch, u"The prefix has no namespace: "_s + name);
-    xmlSetNsProp(node, space, toXml(local), toXml(text));
-}
-
 Node Node::parentNode() const
 {
     const xmlNodePtr parent = required()->parent;
@@ -222,16 +192,6 @@ Node Node::parentNode() const
 Node Node::firstChild() const
 {
     return hasContentOfItsOwn(required()) ? Node() : document->wrap(counting(node->children));
-}
-
-Node Node::lastChild() const
-{
-    if (hasContentOfItsOwn(required()))
-        return {};
-    xmlNodePtr last = node->last;
-    while (last && isBlankText(last))
-        last = last->prev;
-    return document->wrap(last);
 }
 
 Node Node::nextSibling() const

@@ -47,8 +47,6 @@ public:
     NodeType nodeType() const;
     /// The name with its prefix, or "#text", "#cdata-section" or "#comment".
     QString nodeName() const;
-    QString localName() const;
-    QString namespaceURI() const;
     /// The joined text of all descendants. Text nodes with only white space are ignored.
     QString text() const;
     /// The text as UTF-8. If an element contains a single text, the result refers to the memory of the document and is
@@ -60,12 +58,9 @@ public:
     QString xml() const;
     /// All attributes and namespace declarations in document order.
     QList<Attribute> attributes() const;
-    /// Sets an attribute or declares a namespace. Throws TypeMismatch for an invalid name or an unknown prefix.
-    void setAttribute(const QString& name, const QString& value);
 
     Node parentNode() const;
     Node firstChild() const;
-    Node lastChild() const;
     Node nextSibling() const;
     /// All children except texts with only white space.
     QList<Node> childNodes() const;
