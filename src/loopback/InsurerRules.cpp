@@ -3,6 +3,8 @@
 #include "platform/RuntimeError.h"
 #include "platform/values.h"
 
+#include <QRegularExpression>
+
 #include <algorithm>
 #include <array>
 
@@ -49,47 +51,25 @@ constexpr int largestNumber = 999;  // limits the numbers of lines, pictures and
     throw RuntimeError(TypeMismatch, why);
 }
 
-/// Splits a line into words. Blanks in double quotes belong to the word, and "#" begins a comment.
-QStringList wordsOf(const QString& line)
-{
-    QStringList words;
-    QString word;
-    bool quoted = false;
-    bool inWord = false;
-    for (const QChar c : line) {
-        if (c == u'"') {
-            quoted = !quoted;
-            inWord = true;
-        } else if (!quoted && (c.isSpace() || c == u'#')) {
-            if (inWord)
-                words.append(word);
-            word.clear();
-            inWord = false;
-            if (c == u'#')
-                return words;
-        } else {
-            word += c;
-            inWord = true;
-        }
-    }
-    if (quoted)
-        fail(u"a double quote is not closed"_s);
-    if (inWord)
-        words.append(word);
-    return words;
-}
-
-/// Returns the line without its comment and the blanks at its ends.
+/// Returns the line without its comment and the blanks at its ends. "#" begins a comment if it is not in double quotes.
 QString bare(const QString& line)
 {
-    bool quoted = false;
-    for (qsizetype i = 0; i < line.size(); ++i) {
-        if (line[i] == u'"')
-            quoted = !quoted;
-        else if (line[i] == u'#' && !quoted)
-            return line.first(i).trimmed();
-    }
-    return line.trimmed();
+    static const QRegularExpression rule(u"^(?:\"[^\"]*\"|[^\"#]++)*+"_s);
+    const QString text = rule.match(line).captured();
+    if (line.sliced(text.size()).startsWith(u'"'))
+        fail(u"a double quote is not closed"_s);
+    return text.trimmed();
+}
+
+/// Splits a line into words. Blanks in double quotes belong to the word.
+QStringList wordsOf(const QString& line)
+{
+    static const QRegularExpression word(u"(?:\"[^\"]*\"|[^\\s\"]++)++"_s,
+                                         QRegularExpression::UseUnicodePropertiesOption);
+    QStringList words;
+    for (const QRegularExpressionMatch& match : word.globalMatch(bare(line)))
+        words.append(match.captured().remove(u'"'));
+    return words;
 }
 
 bool lists(QLatin1StringView names, const QString& name)

@@ -4,6 +4,7 @@
 #include "platform/database/ColumnValues.h"
 #include "platform/database/Dialect.h"
 #include "platform/database/Session.h"
+#include "platform/database/Tokens.h"
 
 #include <QRegularExpression>
 
@@ -93,13 +94,15 @@ void assign(QList<RowChange>& rows, const QString& assignments)
         throw RuntimeError(StatementFailed, u"What this statement assigns can't be recorded: "_s + assignments);
 }
 
-/// The first place of a word outside literals; -1 if there is none.
-qsizetype wordAt(const QString& statement, QLatin1StringView word)
+/// Returns the first place of a word outside literals, or -1 if there is none.
+qsizetype wordAt(const QString& statement, QStringView word)
 {
-    static const QRegularExpression token(u"'(?:[^']|'')*'|\\w+|."_s, QRegularExpression::DotMatchesEverythingOption);
-    for (const QRegularExpressionMatch& match : token.globalMatch(statement))
-        if (match.capturedView().compare(word, Qt::CaseInsensitive) == 0)
-            return match.capturedStart();
+    qsizetype place = 0;
+    for (const Token& token : Tokens(statement)) {
+        if (token.is(word))
+            return place;
+        place += token.text.size();
+    }
     return -1;
 }
 
@@ -125,7 +128,7 @@ std::optional<PastedChange> pastedChange(const QString& statement)
     static const QRegularExpression head(u"\\A\\s*(?:(DELETE)\\s+FROM|UPDATE)\\s+(\\w+)\\s*(SET\\s)?"_s,
                                          QRegularExpression::CaseInsensitiveOption);
     const QRegularExpressionMatch match = head.match(statement);
-    const qsizetype where = match.hasMatch() ? wordAt(statement, "WHERE"_L1) : -1;
+    const qsizetype where = match.hasMatch() ? wordAt(statement, u"WHERE") : -1;
     if (where < 0)
         return {};
     PastedChange pasted;

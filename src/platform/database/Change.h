@@ -25,7 +25,7 @@ struct RowChange {
 
     ChangeKind kind = ChangeKind::Update;
     QString table;
-    QStringList key;        // the names of the columns that tell the row from others
+    QStringList key;        // the names of the columns that identify the row
     QList<Column> columns;  // the key's, those that changed and those that the observer asked for; all of a deleted row
 
     const Column* column(const QString& name) const;
@@ -35,23 +35,24 @@ struct RowChange {
 class ChangeObserver {
 public:
     virtual ~ChangeObserver() = default;
-    /// False if changes of the table need no record.
+    /// Returns false if changes of the table need no record.
     virtual bool observes(const QString& table) const = 0;
-    /// Columns whose values it wants to see with every change, if the row has them.
+    /// Returns the columns whose values it wants to see with every change, if the row has them.
     virtual QStringList wantedColumns() const { return {}; }
-    /// Called in the change's transaction, after the change. What it writes on the connection commits with the change
-    /// and is not observed itself; what it throws takes the change back.
+    /// Called in the transaction of the change, after it. What it writes on the connection is committed with the change
+    /// and is not observed itself. If it throws, the change is rolled back.
     virtual void changed(Connection& connection, const QList<RowChange>& rows) = 0;
-    /// The change that `changed` saw was committed, or taken back.
+    /// Called after the change was committed or rolled back.
     virtual void committed() {}
     virtual void takenBack() {}
 };
 
-/// The transaction around one change. Without an observer of the table there is none, and the change commits alone.
+/// The transaction around one change. If nothing observes the table, there is no transaction, and the change commits
+/// alone.
 class Change {
 public:
     Change(Connection& connection, const QString& table);
-    /// Takes the change back if it was not committed.
+    /// Rolls the change back if it was not committed.
     ~Change();
     Change(const Change&) = delete;
     Change& operator=(const Change&) = delete;
@@ -67,19 +68,19 @@ private:
     bool isOpen_ = false;
 };
 
-/// Deletes the rows that a native condition tells; the number of rows.
+/// Deletes the rows that meet a native condition. Returns their number.
 qint64 deleteRows(Connection& connection, const QString& table, const QString& condition);
 
-/// A pasted statement that changes rows of one table.
+/// A statement of text that changes rows of one table.
 struct PastedChange {
     ChangeKind kind = ChangeKind::Update;
     QString table;
     QString assignments;  // of an UPDATE, each a column and a literal
     QString condition;
 };
-/// Empty for every other statement.
+/// Returns nothing for any other statement.
 std::optional<PastedChange> pastedChange(const QString& statement);
-/// Runs it with the rows that it changes read first, whole, and kept from others.
+/// Runs the statement. Reads the rows that it changes first, and locks them.
 qint64 executeObserved(Connection& connection, const PastedChange& pasted, const QString& statement);
 
 }  // namespace kest::db

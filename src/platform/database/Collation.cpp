@@ -1,5 +1,7 @@
 #include "platform/database/Collation.h"
 
+#include "platform/wildcards.h"
+
 namespace kest::db {
 
 namespace {
@@ -37,11 +39,9 @@ bool isInSet(char16_t c, QStringView set)
     return found != excludes;
 }
 
-/// Returns the length of the pattern's first element, which is a set in brackets or a character, or 0 at the end.
+/// Returns the length of the pattern's first element, which is a set in brackets or a character.
 qsizetype elementLength(QStringView pattern)
 {
-    if (pattern.isEmpty())
-        return 0;
     const qsizetype close = pattern.startsWith(u'[') ? pattern.indexOf(u']', 1) : -1;
     return close < 0 ? 1 : close + 1;
 }
@@ -70,33 +70,7 @@ bool isLike(QStringView rawText, QStringView rawPattern)
     // "%a %" must find "a ", so a "%" at the end needs the trailing blanks
     const QString foldedText = rawPattern.endsWith(u'%') ? caseFolded(rawText) : comparisonKey(rawText);
     const QString foldedPattern = comparisonKey(rawPattern);
-    const QStringView text = foldedText;
-    const QStringView pattern = foldedPattern;
-
-    // After a mismatch, it is enough to extend the match of the last "%" by a character, so the time is limited by the
-    // product of the lengths.
-    qsizetype t = 0;
-    qsizetype p = 0;
-    qsizetype retryText = -1;
-    qsizetype retryPattern = -1;
-    while (t < text.size()) {
-        const qsizetype length = elementLength(pattern.sliced(p));
-        if (length > 0 && pattern[p] == u'%') {
-            retryPattern = ++p;
-            retryText = t;
-        } else if (length > 0 && elementMatches(pattern.sliced(p, length), text[t])) {
-            p += length;
-            ++t;
-        } else if (retryPattern >= 0) {
-            p = retryPattern;
-            t = ++retryText;
-        } else {
-            return false;
-        }
-    }
-    while (p < pattern.size() && pattern[p] == u'%')
-        ++p;
-    return p == pattern.size();
+    return matchesWildcards(foldedText, foldedPattern, u'%', elementLength, elementMatches);
 }
 
 }  // namespace kest::db

@@ -2,6 +2,7 @@
 #include "platform/files/SystemFile.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
+#include "platform/wildcards.h"
 
 #include <dirent.h>
 #include <strings.h>
@@ -158,27 +159,9 @@ namespace {
 /// Both are in upper case.
 bool matchesMask(QStringView text, QStringView mask)
 {
-    qsizetype at = 0;
-    qsizetype maskAt = 0;
-    qsizetype star = -1;  // the last "*" and where its text begins; only this one is ever extended
-    qsizetype starText = -1;
-    while (at < text.size()) {
-        if (maskAt < mask.size() && mask[maskAt] == u'*') {
-            star = maskAt++;
-            starText = at;
-        } else if (maskAt < mask.size() && (mask[maskAt] == u'?' || mask[maskAt] == text[at])) {
-            ++maskAt;
-            ++at;
-        } else if (star >= 0) {
-            maskAt = star + 1;
-            at = ++starText;
-        } else {
-            return false;
-        }
-    }
-    while (maskAt < mask.size() && mask[maskAt] == u'*')
-        ++maskAt;
-    return maskAt == mask.size();
+    return matchesWildcards(
+        text, mask, u'*', [](QStringView) { return 1; },
+        [](QStringView element, QChar c) { return element[0] == u'?' || element[0] == c; });
 }
 
 }  // namespace
