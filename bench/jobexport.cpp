@@ -29,7 +29,7 @@ public:
     Shop()
     {
         profile::setRoot(folder.filePath(u"shop"_s));
-        app::initProfile(registerClass, true);
+        app::initProfile(registerClass, app::Shop::Demo);
         host = std::make_unique<eKEST>();
         QFile tables(QStringLiteral(KEST_SOURCE_DIR "/sql/joblink.sql"));
         if (!tables.open(QIODevice::ReadOnly))

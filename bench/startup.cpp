@@ -75,7 +75,7 @@ int main(int argc, char** argv)
     qputenv("QT_QPA_PLATFORM", "offscreen");
     QApplication application(argc, argv);
     kest::profile::setRoot(folder().path() + QStringLiteral("/shop"));
-    kest::app::initProfile(kest::registerClass, false);
+    kest::app::initProfile(kest::registerClass, kest::app::Shop::New);
     QFile script(folder().path() + QStringLiteral("/close.json"));
     if (!script.open(QIODevice::WriteOnly) || script.write(R"({"windows": {"frmKEST": [[{"click": "cmdExit"}]]}})") < 0)
         return 1;

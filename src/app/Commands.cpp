@@ -69,7 +69,7 @@ Outcome init(const QStringList& arguments)
     const bool demo = arguments.contains(u"--demo"_s);
     if (arguments.size() > (demo ? 1 : 0))
         return refused(u"init takes --demo and nothing else"_s, Usage);
-    if (!initProfile(registerClass, demo)) {
+    if (!initProfile(registerClass, demo ? Shop::Demo : Shop::New)) {
         if (const QString database = where()[u"database"_s].toString(); isMissing(database))
             return refused(u"the profile exists, but its database does not: "_s + database, Refused);
         return {.text = u"The profile already exists: "_s + profile::root() + u'\n'};
@@ -330,7 +330,7 @@ Outcome runChecked(const CommandLine& line)
     if (line.arguments.size() < command.fewest || line.arguments.size() > command.most)
         return refused(u"wrong number of arguments for "_s + line.command, Usage);
     if (command.needs != Needs::Nothing && isInteractive(line) && !hasProfile() && offersProfile())
-        initProfile(registerClass, false);
+        initProfile(registerClass, Shop::New);
     if (const QString why = command.needs == Needs::Nothing ? QString() : profileFault(); !why.isEmpty()) {
         if (isInteractive(line))
             desktop::msgBox(why, desktop::Icon::Critical);  // a program started from the menu has no visible output

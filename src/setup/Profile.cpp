@@ -83,7 +83,7 @@ void makeFolders()
         files::makeFolder(folder);
 }
 
-void makeDatabase(bool demo, const QDate& today)
+void makeDatabase(Shop shop, const QDate& today)
 {
     // under another name until it is complete, so that no one opens an unfinished database
     const QString unfinished = u"unfinished"_s;
@@ -93,7 +93,7 @@ void makeDatabase(bool demo, const QDate& today)
     database->execute(u"BEGIN"_s);  // one write to the disk instead of hundreds
     createTables(*database, Dialect::Embedded);
     fillNewShop(*database);
-    if (demo)
+    if (shop == Shop::Demo)
         fillDemoShop(*database, today);
     database->execute(u"COMMIT"_s);
     database->close();
@@ -127,7 +127,7 @@ void installTemplates()
 
 }  // namespace
 
-bool initProfile(const std::function<bool()>& registerClass, bool demo, const QDate& today)
+bool initProfile(const std::function<bool()>& registerClass, Shop shop, const QDate& today)
 {
     settings::check();
     if (isWhole()) {
@@ -146,8 +146,8 @@ bool initProfile(const std::function<bool()>& registerClass, bool demo, const QD
     files::makeFolder(profile::root() + u"/databases"_s);
     installTemplates();
     if (!files::exists(embeddedFile(databaseName)))
-        makeDatabase(demo, today);
-    if (demo)
+        makeDatabase(shop, today);
+    if (shop == Shop::Demo)
         putDemoFiles(hostSetting(u"EcomHome"_s), hostSetting(u"ImagesPath"_s), today);
     if (!registerClass())
         throw RuntimeError(FileInputOutput, u"The class can't be registered in the settings."_s);

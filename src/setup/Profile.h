@@ -8,13 +8,16 @@
 
 namespace kest::app {
 
+/// What a new profile contains. The demo shop has quotes, messages and photographs.
+enum class Shop { New, Demo };
+
 /// Creates the profile: folders, quote database, settings and the class registration. `registerClass` registers the
-/// class and returns false if it fails. If `demo` is true, adds a shop with quotes, messages and photographs.
+/// class and returns false if it fails.
 ///
 /// Keeps what a host has stored before and adds what is missing. If the profile is complete, only rebuilds the indexes
 /// of its databases, because another tool may have left them in another order. Returns true if the profile was created.
 /// Throws RuntimeError if a file can't be written.
-bool initProfile(const std::function<bool()>& registerClass, bool demo, const QDate& today = QDate::currentDate());
+bool initProfile(const std::function<bool()>& registerClass, Shop shop, const QDate& today = QDate::currentDate());
 
 /// Returns absolute paths of this system: `profile`, `database`, `unread`, `read`, `unsent`, `sent`, `images`, `pdf`,
 /// `reports`, `log`, `component`. Reads the settings without copying them to the machine-wide place.

@@ -13,7 +13,7 @@ struct Ended {
 
 /// Runs the command as a service person would, in a demo shop.
 struct Command : ::testing::Test {
-    Command() { app::initProfile(registerClass, true); }
+    Command() { app::initProfile(registerClass, app::Shop::Demo); }
 
     Ended kest2(const QString& words, const QByteArray& script = {}, const QByteArray& input = {}) const
     {

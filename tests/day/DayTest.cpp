@@ -129,7 +129,7 @@ TEST(Day, LeavesAfterEachStepWhatItShould)
     server.createDatabase(u"jobs"_s, files::read(checkoutFile(u"sql/joblink.sql"_s)));
     const TestProfile profile;
     const QDir pictures(profile.root() + u"/pictures"_s);
-    app::initProfile(registerClass, true);
+    app::initProfile(registerClass, app::Shop::Demo);
     app::Day day(pictures.path());
     app::DayPage page(pictures.path());
     InitCipherKey();

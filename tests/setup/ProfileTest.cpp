@@ -1,5 +1,3 @@
-#include "base/ModRegistry.h"
-#include "platform/settings/registry.h"
 #include "setup/Profile.h"
 #include "setup/QuoteDatabase.h"
 #include "shell/component.h"
@@ -28,7 +26,7 @@ struct Profile : ::testing::Test {
 struct DemoShop : Profile {
     DemoShop()
     {
-        app::initProfile(registerClass, true, today);
+        app::initProfile(registerClass, app::Shop::Demo, today);
         host.emplace();
     }
     ScriptedDesktop desktop{R"({"boxes":[{"text":"DELETED","answer":"yes"}]})"};
@@ -37,7 +35,7 @@ struct DemoShop : Profile {
 
 TEST_F(Profile, IsMadeWhole)
 {
-    EXPECT_TRUE(app::initProfile(registerClass, false));
+    EXPECT_TRUE(app::initProfile(registerClass, app::Shop::New));
 
     const QJsonObject where = app::where();
     EXPECT_EQ(where.keys().join(u' '), u"component database images log pdf profile read reports sent unread unsent"_s);
@@ -55,11 +53,11 @@ TEST_F(Profile, IsMadeWhole)
 
 TEST_F(Profile, IsNotTouchedOnceItExists)
 {
-    EXPECT_TRUE(app::initProfile(registerClass, false, today));
+    EXPECT_TRUE(app::initProfile(registerClass, app::Shop::New, today));
     EXPECT_TRUE(settings::setValue(settings::Hive::LocalMachine, u"SOFTWARE\\wirra32\\frmsplash"_s, u"ImagesPath"_s,
                                    {settings::Type::Text, u"d:\\pictures\\"_s}));
     const QByteArray registry = files::readBytes(profile.root() + u"/registry.ini"_s);
-    EXPECT_FALSE(app::initProfile(registerClass, true, today));
+    EXPECT_FALSE(app::initProfile(registerClass, app::Shop::Demo, today));
     EXPECT_EQ(files::readBytes(profile.root() + u"/registry.ini"_s), registry);
     EXPECT_EQ(files::list(app::where()[u"unread"_s].toString()), QStringList());
     EXPECT_EQ(column(u"SELECT QTNNO FROM QUOTE1"_s), "");
@@ -72,12 +70,12 @@ TEST_F(Profile, IsCompletedAfterAnInterruptedStart)
     files::writeBytes(app::embeddedFile(u"unfinished"_s), "half a file");
     // the first start of a host, which copies the settings that it reads
     GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"EcomHome"_s, u"d:\\mail\\"_s);
-    EXPECT_TRUE(app::initProfile(registerClass, false));
+    EXPECT_TRUE(app::initProfile(registerClass, app::Shop::New));
     EXPECT_NE(column(u"SELECT QUOTE_VAL FROM CINFO"_s), "");
     EXPECT_FALSE(QFileInfo::exists(app::embeddedFile(u"unfinished"_s)));
     EXPECT_EQ(app::where()[u"unread"_s].toString(), profile.root() + u"/drive_d/mail/AUnread"_s);
     EXPECT_TRUE(QFileInfo::exists(app::where()[u"unread"_s].toString()));
-    EXPECT_FALSE(app::initProfile(registerClass, false));
+    EXPECT_FALSE(app::initProfile(registerClass, app::Shop::New));
 }
 
 TEST_F(Profile, IsToldWhereTheComponentLooks)
@@ -96,7 +94,7 @@ TEST_F(Profile, IsToldWhereTheComponentLooks)
 // Other tools ignore the case only of ASCII letters, so they leave other letters in another order.
 TEST_F(Profile, FindsWhatAnotherToolWroteOnceInitHasRebuiltTheIndexes)
 {
-    ASSERT_TRUE(app::initProfile(registerClass, false));
+    ASSERT_TRUE(app::initProfile(registerClass, app::Shop::New));
     {
         QSqlDatabase tool = QSqlDatabase::addDatabase(u"QSQLITE"_s, u"tool"_s);
         tool.setDatabaseName(app::embeddedFile(u"WirSql"_s));
@@ -113,14 +111,14 @@ TEST_F(Profile, FindsWhatAnotherToolWroteOnceInitHasRebuiltTheIndexes)
         return count;
     };
     ASSERT_LT(found(), 40);
-    EXPECT_FALSE(app::initProfile(registerClass, false));
+    EXPECT_FALSE(app::initProfile(registerClass, app::Shop::New));
     EXPECT_EQ(found(), 40);
 }
 
 // A line that a load adds counts in totals and documents. A value that was never set is not 0.
 TEST_F(Profile, ItsTablesTakeWhatAHostWrites)
 {
-    ASSERT_TRUE(app::initProfile(registerClass, false));
+    ASSERT_TRUE(app::initProfile(registerClass, app::Shop::New));
     db::ConnectionPtr database = app::openEmbedded(u"WirSql"_s);
     database->execute(u"INSERT INTO QUOTE2 (QTNNO) VALUES ('9')"_s);
     EXPECT_EQ(column(u"SELECT rrhour+rahour+pthour+rr_rate2+opg_rate+qty+unitcost+VENDOR+blend+delitem+DELETEDITEM+"
@@ -140,7 +138,7 @@ TEST_F(Profile, ItsTablesTakeWhatAHostWrites)
 // A host's own profile, or one from before there were indexes.
 TEST_F(Profile, GetsTheIndexesAndTablesThatItLacks)
 {
-    ASSERT_TRUE(app::initProfile(registerClass, false));
+    ASSERT_TRUE(app::initProfile(registerClass, app::Shop::New));
     const QString ours = u"SELECT name FROM sqlite_master WHERE type='index' AND sql<>'' ORDER BY name"_s;
     const std::string all = column(ours);
     ASSERT_EQ(all.find("CUSTOMER_NAME"), 0U);
@@ -149,14 +147,14 @@ TEST_F(Profile, GetsTheIndexesAndTablesThatItLacks)
     for (const QString& table : {u"KESTOperation"_s, u"KESTJournal"_s})
         app::openEmbedded(u"WirSql"_s)->execute(u"DROP TABLE "_s + table);
     ASSERT_EQ(column(ours), "");
-    EXPECT_FALSE(app::initProfile(registerClass, false));
+    EXPECT_FALSE(app::initProfile(registerClass, app::Shop::New));
     EXPECT_EQ(column(ours), all);
 }
 
 // The statements that take the first or the last of several rows count on this order.
 TEST_F(Profile, LeavesRowsOfOneKeyInTheOrderInWhichTheyWereAdded)
 {
-    ASSERT_TRUE(app::initProfile(registerClass, false));
+    ASSERT_TRUE(app::initProfile(registerClass, app::Shop::New));
     db::ConnectionPtr database = app::openEmbedded(u"WirSql"_s);
     for (const int subquote : {1, 0, 1, 0}) {
         const QString row = u"(QTNNO, Subquote) VALUES ('9', %1)"_s.arg(subquote);

@@ -97,15 +97,12 @@ const Dialect& mySqlDialect()
 
 const Dialect& mySqlOverOdbcDialect()
 {
-    static const Dialect dialect{
-        .caseOfTables = true,
-        .backslashEscapes = true,
-        .openQuote = u'`',
-        .closeQuote = u'`',
-        .defaultsOnly = u"() VALUES ()"_s,
-        .lockedEnd = u" FOR UPDATE"_s,
-        .sessionNumber = u"SELECT CONNECTION_ID()"_s,
-    };
+    static const Dialect dialect = [] {
+        Dialect other = mySqlDialect();
+        other.backslashEscapes = true;
+        other.sameLongText.clear();
+        return other;
+    }();
     return dialect;
 }
 

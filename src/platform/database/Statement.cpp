@@ -142,13 +142,13 @@ private:
     void writeComparedLiterals()
     {
         static const QStringList comparisons{u"="_s, u"<>"_s, u"!="_s, u"<"_s, u">"_s, u"<="_s, u">="_s};
-        bool assigning = false;
+        Use use = Use::Compared;
         for (Index i = 0; i < count(); ++i) {
             const Token& token = at(i);
             if (token.is(u"SET"))
-                assigning = true;
+                use = Use::Assigned;
             else if (token.is(u"WHERE"))
-                assigning = false;
+                use = Use::Compared;
             else if (token.is(u"IN") && isAt(next(i), u"("))
                 writeList(i);
             if (token.part != Part::Symbol || !comparisons.contains(token.text))
@@ -158,9 +158,9 @@ private:
             if (left == none || right == none)
                 continue;
             if (at(right).part == Part::Literal)
-                writeLiteral(at(right), columnEndingAt(left), token.text, assigning);
+                writeLiteral(at(right), columnEndingAt(left), token.text, use);
             else if (at(left).part == Part::Literal)
-                writeLiteral(at(left), columnStartingAt(right), token.text, assigning);
+                writeLiteral(at(left), columnStartingAt(right), token.text, use);
         }
     }
 
@@ -173,12 +173,14 @@ private:
             return;  // the literals of an inner query are compared with its own columns
         for (Index i = start; column && i != none && !isAt(i, u")"); i = next(i)) {
             if (at(i).part == Part::Literal)
-                writeLiteral(at(i), column, u"="_s, false);
+                writeLiteral(at(i), column, u"="_s, Use::Compared);
         }
     }
 
-    /// Writes a literal that is compared with a number, flag or date column as a value of that kind.
-    void writeLiteral(Token& literal, const TableColumn* column, const QString& comparison, bool assigned)
+    enum class Use { Compared, Assigned };
+
+    /// Writes a literal that is compared with or assigned to a number, flag or date column as a value of that kind.
+    void writeLiteral(Token& literal, const TableColumn* column, const QString& comparison, Use use)
     {
         if (!column || column->kind == Kind::Text || column->kind == Kind::LongText)
             return;
@@ -199,7 +201,7 @@ private:
             literal = {Part::Number, exactNumber(text, *number)};
         else if (isFlag(u"true"))
             literal = {Part::Number, u"1"_s};
-        else if (!assigned)  // every number is unequal to it, and none is equal, less or greater
+        else if (use == Use::Compared)  // every number is unequal to it, and none is equal, less or greater
             literal = {Part::Number, comparison == u"<>" || comparison == u"!=" ? u"1.7e308"_s : u"NULL"_s};
     }
 
@@ -302,15 +304,13 @@ private:
         return result + u" *\\z"_s;
     }
 
-    bool isText(Index i, bool endsThere)
+    bool isText(Index i, const TableColumn* column) const
     {
-        if (i == none)
-            return false;
-        if (at(i).part == Part::Literal)
-            return true;
-        const TableColumn* column = endsThere ? columnEndingAt(i) : columnStartingAt(i);
-        return column && (column->kind == Kind::Text || column->kind == Kind::LongText);
+        const bool isLiteral = i != none && tokens.at(i).part == Part::Literal;
+        return isLiteral || (column && (column->kind == Kind::Text || column->kind == Kind::LongText));
     }
+    bool endsText(Index i) { return isText(i, columnEndingAt(i)); }
+    bool startsText(Index i) { return isText(i, columnStartingAt(i)); }
 
     /// A "+" next to a text joins texts, and so do all "+" of the same chain.
     void joinTexts()
@@ -324,7 +324,7 @@ private:
                 const Token& token = at(i);
                 const bool plus = token.is(u"+");
                 if (plus || token.is(u"||")) {
-                    chain = chain || !plus || isText(previous(i), true) || isText(next(i), false);
+                    chain = chain || !plus || endsText(previous(i)) || startsText(next(i));
                     if (chain && plus)
                         at(i).text = u"||"_s;
                 } else if ((token.part == Part::Symbol && !token.is(u".")) ||

@@ -113,9 +113,10 @@ private:
             bindings.append({fromXml(declared->prefix), fromXml(declared->href)});
 
         out += u'<' + qualifiedName(element);
-        declare(element->ns, true);
+        declare(element->ns);
         for (const xmlAttr* attribute = element->properties; attribute; attribute = attribute->next)
-            declare(attribute->ns, false);
+            if (attribute->ns)  // only an element can need the declaration of no namespace
+                declare(attribute->ns);
         for (const Attribute& attribute : attributes)
             appendAttribute(attribute.name, attribute.value);
         if (element->children) {
@@ -126,13 +127,12 @@ private:
         }
     }
 
-    /// Declares the namespace of an element or attribute if it is not in scope. Only an element can need the
-    /// declaration of no namespace.
-    void declare(const xmlNs* needed, bool ofElement)
+    /// Declares a namespace if it is not in scope. Null is no namespace.
+    void declare(const xmlNs* needed)
     {
         const QString prefix = needed ? fromXml(needed->prefix) : QString();
         const QString uri = needed ? fromXml(needed->href) : QString();
-        if ((!needed && !ofElement) || prefix == "xml"_L1 || inForce(prefix) == uri)
+        if (prefix == "xml"_L1 || inForce(prefix) == uri)
             return;
         bindings.append({prefix, uri});
         appendAttribute(prefix.isEmpty() ? u"xmlns"_s : u"xmlns:"_s + prefix, uri);
