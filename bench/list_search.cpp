@@ -43,7 +43,7 @@ void searchKey(benchmark::State& state)
         files::write(gsUnreadPath + u"%1.xml"_s.arg(i, 6, 10, QChar(u'0')), request(i));
     gcnDB = gConn = app::openEmbedded(u"WirSql"_s);
     frmMessageList window;
-    window.open();
+    window.openUnread();
     window.show();
     QCoreApplication::processEvents();
     auto& list = *window.findChild<QTreeView*>(u"ListView1"_s);

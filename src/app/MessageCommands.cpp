@@ -101,7 +101,7 @@ Outcome list(const QStringList& arguments)
         return refused(u"list takes unread, read or sent, and --filter TEXT"_s, Usage);
 
     frmMessageList window;
-    window.open();
+    window.openUnread();
     if (*folder != MessageFolder::Unread) {
         if (filtered)
             desktop::currentScript()->answerInputs(arguments[2]);
@@ -116,7 +116,7 @@ Outcome list(const QStringList& arguments)
 Outcome held(const QStringList&)
 {
     frmMessageList window;
-    window.open();
+    window.openUnread();
     QJsonArray messages;
     QString text;
     for (const HeldMessage& message : window.heldMessages()) {
@@ -132,7 +132,7 @@ Outcome held(const QStringList&)
 Outcome load(const QStringList& arguments)
 {
     frmMessageList window;
-    window.open();
+    window.openUnread();
     const QJsonArray boxes = boxesShown();
     const bool loaded = window.loadFile(arguments[0]);
     if (loaded && files::exists(gsUnreadPath + arguments[0]))
@@ -144,7 +144,7 @@ Outcome load(const QStringList& arguments)
 Outcome reprint(const QStringList& arguments)
 {
     frmMessageList window;
-    window.open();
+    window.openUnread();
     window.chooseFolder(MessageFolder::Read);
     const QJsonArray boxes = boxesShown();
     const bool printed = window.reprintFile(arguments[0]);

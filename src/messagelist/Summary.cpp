@@ -71,6 +71,33 @@ QString missingPictures(const xml::Document& message, const QSet<QString>& unrea
                    : u"pictures that the request does not name"_s;
 }
 
+// Whether a message waits for an earlier one of its request.
+struct Precedence {
+    bool isHeld = true;     // and stays so if something fails
+    QString earlier;        // the file of the earlier message, or empty if there is none
+    QString displacedType;  // the type of the earlier message, if this one, a manual quote, has taken its place
+};
+
+Precedence precedenceOf(const xml::Document& message, QList<ListedMessage>& listed, const QString& file)
+{
+    Precedence result;
+    attempt([&] {
+        const xml::Node number = requestNumberOf(message.documentElement());
+        const QString request = number ? number.text() : QString();
+        result.earlier = number ? gdicQuoteRequests.value(request) : QString();
+        result.isHeld = number && gdicQuoteRequests.contains(request) && message.textOf(u"messageType"_s) != "MANQ"_L1;
+        if (!number || result.isHeld)
+            return;
+        const auto displaced = std::ranges::find(listed, result.earlier, &ListedMessage::file);
+        if (displaced != listed.end()) {
+            result.displacedType = displaced->row[0];
+            listed.erase(displaced);
+        }
+        gdicQuoteRequests.insert(request, file);
+    });
+    return result;
+}
+
 // Fills the list once. All files share one document, so that memory holds only one parsed file at a time.
 class Fill {
 public:
@@ -92,7 +119,6 @@ private:
     bool parse(const QString& path);
     const xml::Document& prepared();
     bool isHeldUnread(const QString& file);
-    QString typeListedAs(const QString& file) const;
     void hold(const QString& file, const QString& type, const QString& waitsFor) const;
 
     QString text;            // of the current file
@@ -134,22 +160,14 @@ bool Fill::isHeldUnread(const QString& file)
         hold(file, GetMessageTypeName(document), missingPictures(document, unread));
         return true;
     }
-    const xml::Node number = requestNumberOf(document.documentElement());
-    const QString earlier = number ? gdicQuoteRequests.value(number.text()) : QString();
-    const QString displaced = typeListedAs(earlier);
-    const bool held = IsHeldBehindEarlier(document, listed, file);
-    if (held)
+    const Precedence precedence = precedenceOf(document, listed, file);
+    const QString& earlier = precedence.earlier;
+    if (precedence.isHeld)
         hold(file, GetMessageTypeName(document),
              earlier.isEmpty() ? u"a request number that can be read"_s : earlier + u", which must be loaded first"_s);
-    else if (!earlier.isEmpty())  // a manual quote takes its place
-        hold(earlier, displaced, file + u", which must be loaded first"_s);
-    return held;
-}
-
-QString Fill::typeListedAs(const QString& file) const
-{
-    const auto found = std::ranges::find(listed, file, &ListedMessage::file);
-    return found == listed.end() ? QString() : found->row[0];
+    else if (!earlier.isEmpty())
+        hold(earlier, precedence.displacedType, file + u", which must be loaded first"_s);
+    return precedence.isHeld;
 }
 
 void Fill::hold(const QString& file, const QString& type, const QString& waitsFor) const
@@ -224,23 +242,7 @@ bool AllImagesPresent(const xml::Document& message, const QSet<QString>& unread)
 
 bool IsHeldBehindEarlier(const xml::Document& message, QList<ListedMessage>& listed, const QString& file)
 {
-    bool held = true;  // and stays so if something fails
-    attempt([&] {
-        const xml::Node number = requestNumberOf(message.documentElement());
-        if (!number) {
-            held = false;
-            return;
-        }
-        const QString request = number.text();
-        if (gdicQuoteRequests.contains(request) && message.textOf(u"messageType"_s) == "MANQ"_L1) {
-            const QString earlier = gdicQuoteRequests.take(request);
-            listed.removeIf([&](const ListedMessage& one) { return one.file == earlier; });
-        }
-        held = gdicQuoteRequests.contains(request);
-        if (!held)
-            gdicQuoteRequests.insert(request, file);
-    });
-    return held;
+    return precedenceOf(message, listed, file).isHeld;
 }
 
 }  // namespace kest

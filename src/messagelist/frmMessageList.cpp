@@ -65,11 +65,11 @@ frmMessageList::frmMessageList() : Form(u"frmMessageList"_s, u"KEST Messages"_s)
 void frmMessageList::ShowForm()
 {
     frmMessageList window;
-    window.open();
+    window.openUnread();
     desktop::showModal(window);
 }
 
-void frmMessageList::open()
+void frmMessageList::openUnread()
 {
     iFolder = MessageFolder::Unread;
     optionOf(MessageFolder::Unread)->setChecked(true);

@@ -32,7 +32,7 @@ public:
     // The actions of the window, for callers that don't show it. Boxes and prompts appear as they do for a user.
 
     /// Fills the list from the unread folder.
-    void open() override;
+    void openUnread();
     /// Acts as a click on the option of a folder.
     void chooseFolder(MessageFolder folder);
     /// Acts as typing the filter and clicking "Update".

@@ -1,7 +1,6 @@
 // Tests two workstations with the same database and message folders. The second one is the command `kest2`.
 #include "messagelist/frmMessageList.h"
 #include "outbound/SendQuote.h"
-#include "platform/settings/registry.h"
 #include "support/Shop.h"
 
 struct Workstations : Shop {
@@ -115,7 +114,7 @@ TEST_F(Workstations, ALoadGoesOverANewConnectionWhereTheOldOneHasGone)
     quote("500").request("QR1");
     arrive("m.xml", cancellation("QR1"));
     frmMessageList window;
-    window.open();
+    window.openUnread();
     dropConnection();
     EXPECT_TRUE(window.loadFile(u"m.xml"_s)) << shown();
 }

@@ -26,7 +26,7 @@ TEST_F(ParseCount, ALoadParsesItsMessageOnce)
         quote("500").request("QR1").quoteNumber("KQ1").line(1).set("qty", 1.0);
         arrive("m.xml", Message::told(told));
         frmMessageList window;
-        window.open();
+        window.openUnread();
         parses = 0;
         EXPECT_TRUE(window.loadFile(u"m.xml"_s)) << told << shown();
         EXPECT_EQ(parses, 1) << told;

@@ -1,4 +1,3 @@
-#include "base/modDBAccess.h"
 #include "messagelist/MessageListModel.h"
 #include "messagelist/frmMessageList.h"
 #include "platform/script/Gestures.h"
@@ -70,14 +69,14 @@ TEST_F(MessageListWindow, ALoadIsCompleteWhateverHappensWhileItsReportIsOpen)
     };
     const Hands hands({{u"frmPrintPreview"_s, whileOpen}});
     frmMessageList window;
-    window.open();
+    window.openUnread();
     EXPECT_TRUE(window.loadFile(u"m.xml"_s)) << shown();
     ASSERT_TRUE(creating && creating->isHeld());
     EXPECT_EQ(filesIn(gsReadPath).join(u' '), u"1001.xml"_s);
     EXPECT_EQ(Row("CINFO", "1=1").text("QUOTE_VAL"), "1002");
 }
 
-TEST_F(MessageListWindow, AnAnswerThatCannotBeAppliedIsToldUnderTheList)
+TEST_F(MessageListWindow, TheLineUnderTheListNamesTheFileThatEndedTheFill)
 {
     quote("500");
     quote("501");
@@ -93,7 +92,7 @@ TEST_F(MessageListWindow, AnAnswerThatCannotBeAppliedIsToldUnderTheList)
     for (const auto& [file, text, reason] : cases) {
         arrive(file, text);
         frmMessageList window;
-        window.open();
+        window.openUnread();
         EXPECT_EQ(window.findChild<QLabel*>(u"lblStatus"_s)->text(),
                   u"The list could not be filled: %1 %2. Move the file out of the folder; until then no messages are "
                   "listed."_s.arg(file, reason));
@@ -102,6 +101,14 @@ TEST_F(MessageListWindow, AnAnswerThatCannotBeAppliedIsToldUnderTheList)
     }
     EXPECT_EQ(shown(), "");
     EXPECT_EQ(quote("500").text("KESTQuoteNo"), "");
+    arrive("R_500_0.xml", answer);
+    visit({readAll});
+    EXPECT_EQ(listed(), "m.xml: 1 message");
+    EXPECT_EQ(quote("500").text("KESTQuoteNo"), "KQ1");
+    gsUnreadPath = u"c:\\gone\\"_s;
+    visit({readAll});
+    EXPECT_EQ(listed().find(": The list could not be filled: c:\\gone\\"), 0U) << listed();
+    EXPECT_EQ(desktop->boxes(), QStringList());
 }
 
 TEST_F(MessageListWindow, ALoadedMessageMakesRoomForTheNextOfItsRequest)
@@ -191,7 +198,7 @@ TEST_F(MessageListWindow, ATabletOnItsOwnDatabaseLoadsRequestsOnly)
     for (int reading = 0; reading < 3; ++reading)
         EXPECT_EQ(seen(reading, u"cmdProcess"_s, u"enabled"_s).toBool(), reading != 1);
     frmMessageList window;
-    window.open();
+    window.openUnread();
     EXPECT_FALSE(window.loadFile(u"b.xml"_s)) << "its button is disabled";
     EXPECT_EQ(desktop->boxes(), QStringList());
 }
@@ -218,22 +225,6 @@ TEST_F(MessageListWindow, ADoubleClickShowsOnlyASentMessage)
     EXPECT_EQ(desktop->record().reads.size(), 0);
     visit({click("Option1(2)"), doubleClick});
     EXPECT_TRUE(text(0, u"txtXML"_s).starts_with("<request>"));
-}
-
-TEST_F(MessageListWindow, TheLineUnderTheListNamesTheFileThatEndedTheFill)
-{
-    arrive("a.xml", quoteRequest("QR1"));
-    arrive("R_500_0.xml", submissionResponse("KQ1"));
-    visit({readAll});
-    EXPECT_TRUE(listed().starts_with(": ") && listed().find("R_500_0.xml") != std::string::npos) << listed();
-    quote("500");
-    visit({readAll});
-    EXPECT_EQ(listed(), "a.xml: 1 message");
-    EXPECT_EQ(quote("500").text("KESTQuoteNo"), "KQ1");
-    gsUnreadPath = u"c:\\gone\\"_s;
-    visit({readAll});
-    EXPECT_NE(listed().find("c:\\gone\\"), std::string::npos);
-    EXPECT_EQ(desktop->boxes(), QStringList());
 }
 
 TEST(MessageListModel, NeitherSortsNorShowsLeadingBlanks)

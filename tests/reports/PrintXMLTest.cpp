@@ -113,7 +113,7 @@ TEST_F(Printing, TheListWindowReprintsItsReadMessages)
     quote("500").request("QR1").line(1, "PRT").set("qty", 1.0);
     files::write(gsReadPath + u"a.xml"_s, authorisedQuote("500").part(1, "D").text());
     frmMessageList window;
-    window.open();
+    window.openUnread();
     window.chooseFolder(MessageFolder::Read);
     EXPECT_TRUE(window.reprintFile(u"a.xml"_s));
     EXPECT_EQ(cells(onlyWindow(), 0, "action"), "N") << "the deleted line is left out";
