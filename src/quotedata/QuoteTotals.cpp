@@ -7,6 +7,8 @@
 #include "quotedata/Quote.h"
 #include "quotedata/Rounding.h"
 
+#include <functional>
+
 using namespace Qt::StringLiterals;
 
 namespace kest {
@@ -114,12 +116,26 @@ void storeTotals(db::Recordset& quote)
     }
 }
 
+/// Stores the totals that `set` puts into the quote. If it fails to work them out, the quote stays as it is. Returns
+/// false if the totals could not be stored.
+bool storeTotals(db::Recordset& quote, const std::function<void()>& set)
+{
+    bool stored = true;
+    attempt([&] {
+        set();
+        quote.set(u"quotechanged"_s, true);
+        stored = attempt([&] { storeTotals(quote); });
+        if (!stored)
+            quote.cancelUpdate();  // totals that could not be stored must not go with a later change
+    });
+    return stored;
+}
+
 }  // namespace
 
 bool CalcQuoteTotals(db::Recordset& quote, db::Recordset& lines)
 {
-    bool stored = true;
-    attempt([&] {
+    return storeTotals(quote, [&] {
         if (lines.recordCount() > 0)
             lines.moveFirst();
         const SectionTotals totals = totalsOf(lines, EmptyHours::CountAsZero);
@@ -129,30 +145,19 @@ bool CalcQuoteTotals(db::Recordset& quote, db::Recordset& lines)
         quote.set(u"RR_TOTAL"_s, totals.removeAndReplace);
         quote.set(u"RA_TOTAL"_s, totals.repair);
         quote.set(u"PAINT_TOTAL"_s, totals.paint);
-        quote.set(u"quotechanged"_s, true);
-        stored = attempt([&] { storeTotals(quote); });
-        if (!stored)
-            quote.cancelUpdate();  // totals that could not be stored must not go with a later change
     });
-    return stored;
 }
 
 bool CalcAuthorisedTotals(db::Recordset& quote, db::Recordset& lines)
 {
-    bool stored = true;
-    attempt([&] {
+    return storeTotals(quote, [&] {
         if (!lines.eof())
             lines.moveFirst();
         const SectionTotals totals = totalsOf(lines, EmptyHours::Fail);
         quote.set(u"TOTAL"_s, totals.inOrder);
         quote.set(u"PRTTOTAL"_s, totals.parts);
         quote.set(u"MISTOTAL"_s, totals.miscellaneous);
-        quote.set(u"quotechanged"_s, true);
-        stored = attempt([&] { storeTotals(quote); });
-        if (!stored)
-            quote.cancelUpdate();  // totals that could not be stored must not go with a later change
     });
-    return stored;
 }
 
 void RoundQuoteLines(db::Recordset& quote)
