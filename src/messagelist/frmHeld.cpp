@@ -17,8 +17,8 @@ namespace kest {
 frmHeld::frmHeld(const QList<HeldMessage>& messages)
     : Form(u"frmHeld"_s, u"Held Messages"_s),
       ListView1(new QTreeWidget),
-      cmdView(new QPushButton(u"&View"_s)),
-      cmdClose(new QPushButton(u"&Close"_s))
+      cmdView(button(u"cmdView"_s, u"&View"_s, [this] { cmdView_Click(); })),
+      cmdClose(button(u"cmdClose"_s, u"&Close"_s, [this] { close(); }))
 {
     ListView1->setObjectName("ListView1"_L1);
     ListView1->setAccessibleName(u"Held messages"_s);
@@ -33,8 +33,6 @@ frmHeld::frmHeld(const QList<HeldMessage>& messages)
             row->setToolTip(column, row->text(column));
     }
     ListView1->setCurrentItem(ListView1->topLevelItem(0));
-    cmdView->setObjectName("cmdView"_L1);
-    cmdClose->setObjectName("cmdClose"_L1);
     desktop::addListMenu(*ListView1, objectName(), {cmdView});
 
     auto* buttons = new QHBoxLayout;
@@ -46,12 +44,7 @@ frmHeld::frmHeld(const QList<HeldMessage>& messages)
     layout->addLayout(buttons);
     resize(desktop::pixels(12000, 4800));
 
-    const auto on = [this](auto* sender, auto signal, const QString& event, auto routine) {
-        desktop::onEvent(sender, signal, this, "frmHeld."_L1 + event, routine);
-    };
-    on(cmdView, &QPushButton::clicked, u"cmdView_Click"_s, [this] { cmdView_Click(); });
     on(ListView1, &QTreeWidget::itemDoubleClicked, u"ListView1_DblClick"_s, [this] { cmdView_Click(); });
-    on(cmdClose, &QPushButton::clicked, u"cmdClose_Click"_s, [this] { close(); });
 }
 
 void frmHeld::ShowForm(const QList<HeldMessage>& messages)

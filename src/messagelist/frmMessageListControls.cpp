@@ -171,9 +171,6 @@ void frmMessageList::arrange()
 
 void frmMessageList::connectControls()
 {
-    const auto on = [this](auto* sender, auto signal, const QString& event, auto routine) {
-        desktop::onEvent(sender, signal, this, "frmMessageList."_L1 + event, routine);
-    };
     for (const MessageFolder folder : messageFolders)
         on(optionOf(folder), &QRadioButton::clicked, u"Option1_Click"_s, [this, folder] { Option1_Click(folder); });
     on(ListView1->selectionModel(), &QItemSelectionModel::currentRowChanged, u"ListView1_ItemClick"_s,

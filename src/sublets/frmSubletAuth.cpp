@@ -28,8 +28,8 @@ frmSubletAuth::frmSubletAuth(const QList<SubletDocument>& documents)
     : Form(u"frmSubletAuth"_s, u"Sublet Authority Documents"_s),
       folder(subletFolder()),
       ListView1(new QTreeWidget),
-      Command1(new QPushButton),
-      Command2(new QPushButton)
+      Command1(button(u"Command1"_s, u"&Open"_s, [this] { Command1_Click(); })),
+      Command2(button(u"Command2"_s, u"&Close"_s, [this] { Command2_Click(); }))
 {
     resize(desktop::pixels(9000, 4800));
 
@@ -47,11 +47,7 @@ frmSubletAuth::frmSubletAuth(const QList<SubletDocument>& documents)
     }
     ListView1->setCurrentItem(ListView1->topLevelItem(0));
 
-    Command1->setObjectName("Command1"_L1);
-    Command1->setText(u"&Open"_s);
     Command1->setDefault(true);
-    Command2->setObjectName("Command2"_L1);
-    Command2->setText(u"&Close"_s);
 
     desktop::addListMenu(*ListView1, objectName(), {Command1});
 
@@ -63,12 +59,7 @@ frmSubletAuth::frmSubletAuth(const QList<SubletDocument>& documents)
     layout->addWidget(ListView1);
     layout->addLayout(buttons);
 
-    desktop::onEvent(Command1, &QPushButton::clicked, this, u"frmSubletAuth.Command1_Click"_s,
-                     [this] { Command1_Click(); });
-    desktop::onEvent(Command2, &QPushButton::clicked, this, u"frmSubletAuth.Command2_Click"_s,
-                     [this] { Command2_Click(); });
-    desktop::onEvent(ListView1, &QTreeWidget::itemDoubleClicked, this, u"frmSubletAuth.ListView1_DblClick"_s,
-                     [this] { Command1_Click(); });
+    on(ListView1, &QTreeWidget::itemDoubleClicked, u"ListView1_DblClick"_s, [this] { Command1_Click(); });
 }
 
 void frmSubletAuth::ShowForm(const QString& QTNNO, const QString& Subquote)

@@ -57,8 +57,8 @@ qint64 dayPassword(const QDate& day)
 frmLogin::frmLogin()
     : Form(u"frmLogin"_s, u"Utilities Login"_s),
       txtPassword(new FocusColouredEdit),
-      cmdOK(new QPushButton),
-      cmdCancel(new QPushButton)
+      cmdOK(button(u"cmdOK"_s, u"OK"_s, [this] { cmdOK_Click(); })),
+      cmdCancel(button(u"cmdCancel"_s, u"Cancel"_s, [this] { cmdCancel_Click(); }))
 {
     txtPassword->setObjectName("txtPassword"_L1);
     txtPassword->setEchoMode(QLineEdit::Password);
@@ -66,12 +66,8 @@ frmLogin::frmLogin()
     auto* label = new QLabel(u"&Password:"_s);
     label->setBuddy(txtPassword);
 
-    cmdOK->setObjectName("cmdOK"_L1);
-    cmdOK->setText(u"OK"_s);
     cmdOK->setDefault(true);
     cmdOK->setEnabled(false);
-    cmdCancel->setObjectName("cmdCancel"_L1);
-    cmdCancel->setText(u"Cancel"_s);
 
     auto* question = new QHBoxLayout;
     question->addWidget(label);
@@ -86,11 +82,7 @@ frmLogin::frmLogin()
     layout->addLayout(buttons);
     fixSize();
 
-    desktop::onEvent(txtPassword, &QLineEdit::textChanged, this, u"frmLogin.txtPassword_Change"_s,
-                     [this] { txtPassword_Change(); });
-    desktop::onEvent(cmdOK, &QPushButton::clicked, this, u"frmLogin.cmdOK_Click"_s, [this] { cmdOK_Click(); });
-    desktop::onEvent(cmdCancel, &QPushButton::clicked, this, u"frmLogin.cmdCancel_Click"_s,
-                     [this] { cmdCancel_Click(); });
+    on(txtPassword, &QLineEdit::textChanged, u"txtPassword_Change"_s, [this] { txtPassword_Change(); });
 }
 
 void frmLogin::ShowForm(bool& ok)

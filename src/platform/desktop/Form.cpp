@@ -62,6 +62,14 @@ void Form::showEvent(QShowEvent* event)
     QDialog::showEvent(event);
 }
 
+QPushButton* Form::button(const QString& name, const QString& caption, const std::function<void()>& click)
+{
+    auto* made = new QPushButton(caption);
+    made->setObjectName(name);
+    on(made, &QPushButton::clicked, name + u"_Click"_s, click);
+    return made;
+}
+
 void Form::fixSize()
 {
     layout()->setSizeConstraint(QLayout::SetFixedSize);

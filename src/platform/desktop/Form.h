@@ -1,6 +1,8 @@
 // The base class of all windows.
 #pragma once
 
+#include "platform/desktop/Window.h"
+
 #include <QDialog>
 #include <QString>
 
@@ -25,6 +27,15 @@ protected:
 
     /// Fits the window to its layout, so that it can't be stretched.
     void fixSize();
+
+    /// Connects a signal to an event routine. An error in it is reported with the source "WINDOW.EVENT".
+    template <class Sender, class Signal, class Routine>
+    void on(Sender* sender, Signal signal, const QString& event, Routine routine)
+    {
+        onEvent(sender, signal, this, objectName() + u'.' + event, routine);
+    }
+    /// Creates a button. A click on it is the event "NAME_Click".
+    QPushButton* button(const QString& name, const QString& caption, const std::function<void()>& click);
 };
 
 /// Sets the function that returns the text of the box "About KEST2".
