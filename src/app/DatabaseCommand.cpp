@@ -15,7 +15,9 @@ namespace {
 
 QString wordFor(CheckedPoint::Result result)
 {
-    return result == CheckedPoint::Holds ? u"holds"_s : result == CheckedPoint::Fails ? u"fails"_s : u"skipped"_s;
+    return result == CheckedPoint::Result::Holds   ? u"holds"_s
+           : result == CheckedPoint::Result::Fails ? u"fails"_s
+                                                   : u"skipped"_s;
 }
 
 /// Shows the statements that create what the database lacks, and executes them unless the answer is No.

@@ -17,18 +17,18 @@ struct RecordedChange {
     db::RowChange row;
 };
 
-/// The operations that changed rows of a quote, newest first; of all its subquotes if `subquote` is empty.
+/// Returns the operations that changed rows of a quote, newest first. An empty subquote means all subquotes.
 QList<Entry> historyOf(const QString& number, const QString& subquote);
-/// The operations that are at work or were interrupted.
+/// Returns the operations that are running or were interrupted.
 QList<Entry> openOperations();
-/// All that an operation changed, in the order of the changes.
+/// Returns what an operation changed, in the order of the changes.
 QList<RecordedChange> changesOf(qint64 operation);
 
-/// The columns of a change as a person reads them: "excess: 250 -> 300". A new row shows what was filled in, a deleted
-/// one what was lost; long texts are shortened to their difference.
+/// Returns the columns of a change as a person reads them: "excess: 250 -> 300". A new row shows what was filled in, a
+/// deleted one what was lost. Long texts are shortened to their difference.
 QStringList linesOf(const db::RowChange& row);
 
-/// "load of AUQT_1007.xml", "send", "save in the utilities".
+/// Returns a title such as "load of AUQT_1007.xml", "send" or "save in the utilities".
 QString titleOf(const Entry& entry);
 
 /// Deletes operations that are older than the setting "JournalDays", but none that is still open. Deletes at most 1,000

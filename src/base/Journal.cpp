@@ -75,7 +75,7 @@ QVariant valueOf(const db::RowChange& row, const QString& name)
 void Recorder::openOperation(db::Connection& connection)
 {
     work->lockName = u"operation "_s + QUuid::createUuid().toString(QUuid::WithoutBraces);
-    work->lock = std::make_unique<db::Lock>(gConn, work->lockName);  // tells others that its owner lives
+    work->lock = std::make_unique<db::Lock>(gConn, work->lockName);  // shows others that its owner is running
     db::Recordset row(gConn);
     row.open(u"SELECT * FROM KESTOperation WHERE Operation=0"_s);
     row.addNew();

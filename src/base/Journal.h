@@ -42,21 +42,21 @@ struct Entry {
     QDateTime started;
 };
 
-/// The hash by which a message or a document is known again.
+/// Returns a hash that identifies the text of a message or document.
 QString hashOf(const QString& text);
 
 /// Makes the journal see the changes on the connection. Call it once the connection is open.
 void watch(const db::ConnectionPtr& connection);
 
-/// True if the connection's database keeps a journal.
+/// Returns true if the connection's database keeps a journal.
 bool isKept();
 
-/// True while an operation is at work here.
+/// Returns true while this process works on an operation.
 bool isAtWork();
 
-/// One operation, for as long as the object lives. Inside another one it belongs to that one and does nothing itself.
-/// Its row is written with its first change; an operation that changes nothing writes nothing. An object that is
-/// destroyed before it was ended closes as failed.
+/// An operation, which lasts as long as the object. Within another operation it belongs to that one and does nothing
+/// itself. Its row is written with its first change, so an operation that changes nothing writes nothing. If the object
+/// is destroyed before end() was called, the operation has failed.
 class Operation {
 public:
     explicit Operation(Kind kind, const QString& file = {}, const QString& hash = {});

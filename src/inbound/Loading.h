@@ -24,7 +24,7 @@ void respellColour(db::Recordset& car, db::Recordset& colours);
 /// Returns true if a number in a message leads to no quote. An empty number is always unknown, because quotes of the
 /// host may have an empty number too.
 bool isUnknown(const QString& number, const db::Recordset& quote);
-/// Tells that the totals of a loaded quote could not be stored.
+/// Shows a box that says that the totals of a loaded quote could not be stored.
 void tellOldTotals(const db::Recordset& quote);
 /// Shows a critical box that says why a message is refused. Returns false.
 bool refuse(const QString& text);

@@ -191,17 +191,17 @@ DatabaseCheck Check::run()
 void Check::point(const QString& what, const std::function<void()>& step)
 {
     wrong_.clear();
-    CheckedPoint checked{.what = what, .result = CheckedPoint::Holds, .why = {}};
+    CheckedPoint checked{.what = what, .result = CheckedPoint::Result::Holds, .why = {}};
     try {
         step();
     } catch (const Skip& skip) {
-        checked.result = CheckedPoint::Skipped;
+        checked.result = CheckedPoint::Result::Skipped;
         checked.why = skip.why;
     } catch (const RuntimeError& error) {
         wrong_ += u"%1 %2"_s.arg(error.number()).arg(error.description());
     }
     if (!wrong_.isEmpty()) {
-        checked.result = CheckedPoint::Fails;
+        checked.result = CheckedPoint::Result::Fails;
         checked.why = wrong_.join(u"; "_s);
     }
     check_.points += checked;
@@ -487,7 +487,7 @@ void Check::lookAtHost()
 bool DatabaseCheck::holds() const
 {
     return std::none_of(points.begin(), points.end(),
-                        [](const CheckedPoint& point) { return point.result == CheckedPoint::Fails; });
+                        [](const CheckedPoint& point) { return point.result == CheckedPoint::Result::Fails; });
 }
 
 DatabaseCheck checkDatabase(const std::function<db::ConnectionPtr()>& connect)

@@ -14,9 +14,9 @@ namespace kest::app {
 
 /// Something that the component relies on, and whether the database does it.
 struct CheckedPoint {
-    enum Result { Holds, Fails, Skipped };
+    enum class Result { Holds, Fails, Skipped };
     QString what;
-    Result result = Holds;
+    Result result = Result::Holds;
     QString why;  // what was found instead, or why it could not be tried
 };
 
@@ -25,7 +25,7 @@ struct DatabaseCheck {
     QList<CheckedPoint> points;
     QStringList notes;  // what is worth knowing about the host's tables
 
-    /// False if any point fails.
+    /// Returns false if any point fails.
     bool holds() const;
 };
 

@@ -1,20 +1,17 @@
 // The check of a database: it tells what does not hold, changes nothing, and leaves nothing behind.
-#include "base/modDBAccess.h"
-#include "platform/database/FaultInjection.h"
 #include "platform/database/Session.h"
 #include "setup/CheckDatabase.h"
 #include "setup/HostTables.h"
 #include "setup/PrepareDatabase.h"
 #include "setup/QuoteDatabase.h"
 #include "support/Shop.h"
-#include "support/Snapshot.h"
 
 /// What failed, and why.
 static std::string failures(const std::function<db::ConnectionPtr()>& connect = anotherConnection)
 {
     QStringList texts;
     for (const app::CheckedPoint& point : app::checkDatabase(connect).points) {
-        if (point.result == app::CheckedPoint::Fails)
+        if (point.result == app::CheckedPoint::Result::Fails)
             texts += point.what + u": "_s + point.why;
     }
     return texts.join(u'\n').toStdString();
