@@ -1,4 +1,3 @@
-#include "base/ModRegistry.h"
 #include "base/modLoggerEx.h"
 #include "support/Shop.h"
 
@@ -61,6 +60,8 @@ TEST_F(ShopConnection, WhyItFailedIsTold)
         desktop->boxTexts(),
         QStringList{u"Could not connect to the quote database, Please contact MarlinDesk Support.\r\n\r\n"_s + reason});
     EXPECT_EQ(files::read(errorLogPath()).count(u"Description: "_s + reason), 1);
+    EXPECT_FALSE(OpenRecordset(u"SELECT * FROM CINFO"_s, false, true));
+    EXPECT_TRUE(desktop->boxTexts().last().startsWith(u"-2147467259: Could not Initialize Database! - "_s));
 
     setSetting(u"DatabaseName"_s, u"WirSql"_s);
     EXPECT_TRUE(EnsureConnection());
@@ -96,11 +97,4 @@ TEST_F(ShopConnection, ASettingLowersTheTimeOfAStatement)
     EXPECT_THROW(opened(u"WITH RECURSIVE n(i) AS (SELECT 1 UNION ALL SELECT i + 1 FROM n) SELECT COUNT(*) FROM n"_s),
                  RuntimeError);
     EXPECT_LT(time.elapsed(), 10000);
-}
-
-TEST_F(ShopConnection, AMissingDatabaseIsTold)
-{
-    setSetting(u"DatabaseName"_s, u"Nowhere"_s);
-    EXPECT_FALSE(OpenRecordset(u"SELECT * FROM CINFO"_s, false, true));
-    EXPECT_TRUE(desktop->boxTexts().value(0).startsWith(u"-2147467259: Could not Initialize Database! - "_s));
 }

@@ -3,22 +3,9 @@
 #include "base/Interruptions.h"
 #include "base/Journal.h"
 #include "base/JournalRecord.h"
-#include "base/SharedVariables.h"
-#include "base/modDBAccess.h"
-#include "platform/RuntimeError.h"
-#include "platform/database/Sql.h"
-#include "support/Failure.h"
 #include "support/Shop.h"
-#include "support/Snapshot.h"
 
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
-
-namespace {
-
-class JournalOfAShop : public Shop {
-protected:
+struct JournalOfAShop : Shop {
     /// Returns the operations on quote 500, newest first, such as "load of m.xml: done".
     static QString operations()
     {
@@ -46,8 +33,6 @@ public:
     ~NoJournalTable() { gConn->execute(u"ALTER TABLE KESTHidden RENAME TO KESTJournal"_s); }
     Q_DISABLE_COPY_MOVE(NoJournalTable)
 };
-
-}  // namespace
 
 TEST_F(JournalOfAShop, TellsWhatALoadChangedFromWhatToWhat)
 {
@@ -193,5 +178,3 @@ TEST(JournalRecord, GivesEachValueBackBitForBit)
         EXPECT_EQ(read.key, stored.key);
     }
 }
-
-}  // namespace kest::test

@@ -1,10 +1,7 @@
 // Tests the load of authorised quotes: which quote they find, what is refused, and what is stored.
-#include "base/modDBAccess.h"
 #include "base/modLoggerEx.h"
 #include "inbound/LoadQuoteBody.h"
-#include "platform/database/FaultInjection.h"
 #include "support/Shop.h"
-#include "support/Snapshot.h"
 
 struct AuthorisedQuotes : Shop {
     AuthorisedQuotes()

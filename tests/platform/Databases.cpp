@@ -3,13 +3,6 @@
 #include "setup/QuoteDatabase.h"
 #include "support/OdbcDrivers.h"
 
-const auto embeddedSchema =
-    uR"(
-CREATE TABLE LINE (id INTEGER PRIMARY KEY AUTOINCREMENT, CODE VARCHAR(20) COLLATE NOCASE, SEQ INTEGER,
-    amount REAL DEFAULT 0, flag BIT DEFAULT 0, day DATETIME, notes LONGTEXT COLLATE NOCASE);
-CREATE TABLE CAR (REGO VARCHAR(20) COLLATE NOCASE NOT NULL PRIMARY KEY, owner VARCHAR(30) COLLATE NOCASE, CODE VARCHAR(20) COLLATE NOCASE);
-CREATE TABLE Tints (Code VARCHAR(20) COLLATE NOCASE, Script VARCHAR(30) COLLATE NOCASE DEFAULT 'none');)"_s;
-
 const auto mariaDbSchema =
     uR"(
 CREATE TABLE LINE (id INTEGER NOT NULL AUTO_INCREMENT PRIMARY KEY, CODE VARCHAR(20), SEQ INTEGER,
@@ -17,22 +10,24 @@ CREATE TABLE LINE (id INTEGER NOT NULL AUTO_INCREMENT PRIMARY KEY, CODE VARCHAR(
 CREATE TABLE CAR (REGO VARCHAR(20) NOT NULL PRIMARY KEY, owner VARCHAR(30), CODE VARCHAR(20));
 CREATE TABLE Tints (Code VARCHAR(20), Script VARCHAR(30) DEFAULT 'none');)"_s;
 
-const auto tdsSchema =
-    uR"(
-CREATE TABLE LINE (id INT IDENTITY(1,1) NOT NULL PRIMARY KEY, CODE VARCHAR(20), SEQ INT,
-    amount FLOAT DEFAULT 0, flag BIT DEFAULT 0, day DATETIME, notes TEXT);
-CREATE TABLE CAR (REGO VARCHAR(20) NOT NULL PRIMARY KEY, owner VARCHAR(30), CODE VARCHAR(20));
-CREATE TABLE Tints (Code VARCHAR(20), Script VARCHAR(30) DEFAULT 'none');)"_s;
+static QString embeddedSchema()
+{
+    static const QRegularExpression text(u"(VARCHAR\\(\\d+\\)|LONGTEXT)"_s);
+    return QString(mariaDbSchema)
+        .replace(u"NOT NULL AUTO_INCREMENT PRIMARY KEY"_s, u"PRIMARY KEY AUTOINCREMENT"_s)
+        .replace(u"FLOAT"_s, u"REAL"_s)
+        .replace(text, u"\\1 COLLATE NOCASE"_s);
+}
 
 Databases::Databases()
 {
     if (GetParam() == On::Embedded) {
         connectionText = u"Driver={SQL Server};Server=(local)\\;Database=shop;Uid=sa;Pwd=x;"_s;
         const db::ConnectionPtr made = app::openEmbedded(u"shop"_s);
-        for (const QString& statement : app::statementsIn(embeddedSchema))
+        for (const QString& statement : app::statementsIn(embeddedSchema()))
             made->execute(statement);
     } else if (GetParam() == On::Tds) {
-        tdsServer().createDatabase(u"shop"_s, tdsSchema);
+        tdsServer().createDatabase(u"shop"_s, TdsServer::schemaOf(mariaDbSchema));
         connectionText = tdsServer().connectionText(u"shop"_s);
     } else {
         mariaDb().createDatabase(u"shop"_s, mariaDbSchema);

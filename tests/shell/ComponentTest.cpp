@@ -1,4 +1,3 @@
-#include "platform/settings/registry.h"
 #include "shell/component.h"
 #include "support/Shop.h"
 

@@ -2,10 +2,6 @@
 
 #include "base/Journal.h"
 #include "inbound/modLoadXML.h"
-#include "messages/Folders.h"
-#include "platform/database/Sql.h"
-#include "support/Places.h"
-#include "support/ShopDatabase.h"
 
 namespace kest::test {
 

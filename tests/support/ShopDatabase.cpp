@@ -53,24 +53,6 @@ static Engine engine()
     return name == u"mariadb"_s ? Engine::MariaDb : name == u"tds"_s ? Engine::Tds : Engine::Embedded;
 }
 
-/// Returns the script for the tables that a host has on SQL Server.
-static QString tdsSchema()
-{
-    app::registerResources();
-    QFile file(u":/sql/quote-mariadb.sql"_s);
-    EXPECT_TRUE(file.open(QIODevice::ReadOnly));
-    QString script = QString::fromUtf8(file.readAll());
-    const std::pair<QString, QString> words[] = {
-        {u"INTEGER NOT NULL AUTO_INCREMENT"_s, u"INT IDENTITY(1,1) NOT NULL"_s},
-        {u"INTEGER"_s, u"INT"_s},
-        {u"DOUBLE"_s, u"FLOAT"_s},
-        {u"BOOLEAN"_s, u"BIT"_s},
-        {u"LONGTEXT"_s, u"TEXT"_s}};
-    for (const auto& [theirs, ours] : words)
-        script.replace(theirs, ours);
-    return script.remove(QRegularExpression(u" DEFAULT CHARACTER SET [^;]*"_s));
-}
-
 /// The shop's database on a server. Keeps copies of it, because creating tables would be the slowest part of a test.
 class ServerShop {
 public:
@@ -135,7 +117,8 @@ public:
     {
         for (const QString& name : {shop, saved})
             tdsServer().createDatabase(name);
-        tdsServer().createDatabase(fresh, tdsSchema());
+        tdsServer().createDatabase(fresh,
+                                   TdsServer::schemaOf(app::schemaStatements(app::Dialect::MariaDb).join(u";\n"_s)));
         administrator->open(tdsServer().connectionText(fresh));
         fillShop(*administrator);
     }

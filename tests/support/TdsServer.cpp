@@ -61,6 +61,19 @@ QString TdsServer::connectionText(const QString& database) const
                                                                                       address_, database, user());
 }
 
+QString TdsServer::schemaOf(QString mariaDbScript)
+{
+    const std::pair<QString, QString> words[] = {
+        {u"INTEGER NOT NULL AUTO_INCREMENT"_s, u"INT IDENTITY(1,1) NOT NULL"_s},
+        {u"INTEGER"_s, u"INT"_s},
+        {u"DOUBLE"_s, u"FLOAT"_s},
+        {u"BOOLEAN"_s, u"BIT"_s},
+        {u"LONGTEXT"_s, u"TEXT"_s}};
+    for (const auto& [theirs, ours] : words)
+        mariaDbScript.replace(theirs, ours);
+    return mariaDbScript.remove(QRegularExpression(u" DEFAULT CHARACTER SET [^;]*"_s));
+}
+
 TdsServer& tdsServer()
 {
     if (!shared)

@@ -24,6 +24,8 @@ public:
     /// Creates an empty database, after dropping one of the same name, and runs a script in it.
     void createDatabase(const QString& name, const QString& script = {});
     QString connectionText(const QString& database) const;
+    /// Returns a script for MariaDB that creates tables with the types that a host's tables have on SQL Server.
+    static QString schemaOf(QString mariaDbScript);
 
 private:
     QTemporaryDir folder_;
