@@ -141,34 +141,43 @@ TEST_F(Printing, EachChangedLineStandsInItsSection)
 {
     quote("500").request("QR1").line(1, "R&R", "Labour deleted").set("qty", 1.0);
     quote("500").line(2, "MIS", "Labour other").set("qty", 1.0);
-    Message message = authorisedQuote("500");
-    message.labour(1, "D").labour(2, "D").labour(88, "D").paint(89, "D");
-    message.labour(90, "C", {{"labourType", "OTH"}, {"labourGroup", ""}, {"labourDescription", "Labour kept"}});
-    message.labour(91, "I", {{"labourType", ""}, {"labourGroup", "1"}, {"labourDescription", "Labour unknown"}});
-    message.part(92, "I", {{"partDescription", "Parts unknown"}});
-    message.paint(93, "I", {{"paintWorkType", ""}, {"paintGroup", "1"}, {"paintDescription", "Paint unknown"}});
-    message.paint(96, "C", {{"paintWorkType", "BLND"}, {"paintGroup", ""}, {"paintDescription", "Paint bare"}});
-    message.sublet(94, "C", {{"subletType", "OTH"}, {"subletDescription", "Sublet other"}});
-    message.sublet(95, "I", {{"subletType", ""}, {"subletDescription", "Sublet bare"}});
+    quote("500").line(3, "MIS", "Sublet deleted").set("PartNo", "OTH").set("unitcost", 5.0).set("qty", 1.0);
+    quote("500").line(4, "PRT", "Parts deleted").set("qty", 0.0).set("itemno", "780");
+    quote("500").line(5, "PAINT", "Paint deleted").set("qty", 1.0);
+    quote("500").line(6, "PRT", "").set("qty", 2.0).set("unitcost", nullptr);
+    addRow("SUBLET", {{"Sublet", 1}, {"Type", "OTH"}});
     report::setOutputFolder(root() + u"/out"_s);
-    print(message, false);
+    for (Message message : {authorisedQuote("500"), adjustedQuote("500")}) {
+        message.labour(1, "D").labour(2, "D").sublet(3, "D").part(4, "D").paint(5, "D").part(6, "D");
+        message.labour(86, "D").part(87, "D").paint(88, "D").sublet(89, "D");
+        message.labour(90, "C", {{"labourType", "OTH"}, {"labourGroup", ""}, {"labourDescription", "Labour kept"}});
+        message.labour(91, "I", {{"labourType", ""}, {"labourGroup", "1"}, {"labourDescription", "Labour unknown"}});
+        message.part(92, "I", {{"partDescription", "Parts unknown"}});
+        message.paint(93, "I", {{"paintWorkType", ""}, {"paintGroup", "1"}, {"paintDescription", "Paint unknown"}});
+        message.paint(96, "C", {{"paintWorkType", "BLND"}, {"paintGroup", ""}, {"paintDescription", "Paint bare"}});
+        message.sublet(94, "C", {{"subletType", "OTH"}, {"subletDescription", "Sublet other"}});
+        message.sublet(95, "I", {{"subletType", ""}, {"subletDescription", "Sublet bare"}});
+        print(message, false);
+    }
     print(adjustedQuote("500"));
     report::setOutputFolder({});
-    QString section;
-    int count = 0;
-    for (const QString& line : pdfText(root() + u"/out/1-730.pdf"_s).split(u'\n')) {
-        const QString heading = line.section(u' ', 0, 0).trimmed();
-        if (!heading.isEmpty() && heading != "Line"_L1)
-            section = heading;
-        static const QRegularExpression script(u"(Labour|Parts|Paint|Sublet) (deleted|other|unknown|bare|kept)"_s);
-        const auto found = script.match(line);
-        count += found.hasMatch() ? 1 : 0;
-        EXPECT_TRUE(!found.hasMatch() || found.captured(1) == section) << line;
+    for (const QString& file : {u"/out/1-730.pdf"_s, u"/out/2-730.pdf"_s}) {
+        QString section;
+        int count = 0;
+        for (const QString& line : pdfText(root() + file).split(u'\n')) {
+            const QString heading = line.section(u' ', 0, 0).trimmed();
+            if (!heading.isEmpty() && heading != "Line"_L1)
+                section = heading;
+            static const QRegularExpression script(u"(Labour|Parts|Paint|Sublet) (deleted|other|unknown|bare|kept)"_s);
+            const auto found = script.match(line);
+            count += found.hasMatch() ? 1 : 0;
+            EXPECT_TRUE(!found.hasMatch() || found.captured(1) == section) << file << line;
+        }
+        EXPECT_EQ(count, 12) << file;
+        const QString gone = pdfText(root() + file).section(u"Deleted, not in this quote"_s, 1);
+        EXPECT_EQ(gone.count(u"This quote has no line of that number."_s), 4) << "86 to 89 of " << file;
     }
-    EXPECT_EQ(count, 9);
-    const QString gone = pdfText(root() + u"/out/1-730.pdf"_s).section(u"Deleted, not in this quote"_s, 1);
-    EXPECT_EQ(gone.count(u"This quote has no line of that number."_s), 2) << "88 and 89";
-    const QString unchanged = pdfText(root() + u"/out/2-730.pdf"_s);
+    const QString unchanged = pdfText(root() + u"/out/3-730.pdf"_s);
     EXPECT_TRUE(unchanged.contains(u"No line of this quote was changed"_s));
     EXPECT_FALSE(unchanged.contains(u"Authorised"_s));
 }
