@@ -95,6 +95,11 @@ QList<Entry> historyOf(const QString& number, const QString& subquote)
                   number, subquote));
 }
 
+Entry entryOf(qint64 operation)
+{
+    return entries(sql("SELECT * FROM KESTOperation WHERE Operation={}", operation)).value(0);
+}
+
 QList<Entry> openOperations()
 {
     return entries(u"SELECT * FROM KESTOperation WHERE State='open' ORDER BY Operation"_s);
@@ -108,7 +113,8 @@ QList<RecordedChange> changesOf(qint64 operation)
     for (db::Recordset rows = opened(sql("SELECT * FROM KESTJournal WHERE Operation={} ORDER BY Entry", operation));
          !rows.eof(); rows.moveNext())
         changes.append({toLong(rows.value(u"Entry"_s)), rows.value(u"ChangedAt"_s).toDateTime(), rows.text(u"QTNNO"_s),
-                        rows.text(u"Subquote"_s), changeIn(rows.text(u"RowData"_s))});
+                        rows.text(u"Subquote"_s), changeIn(rows.text(u"RowData"_s)),
+                        toLong(rows.value(u"Settled"_s)) != 0});
     return changes;
 }
 

@@ -15,10 +15,13 @@ struct RecordedChange {
     QString number;  // of the quote that the row belongs to; empty for a car, a customer, a vendor
     QString subquote;
     db::RowChange row;
+    bool isTakenBack = false;
 };
 
 /// Returns the operations that changed rows of a quote, newest first. An empty subquote means all subquotes.
 QList<Entry> historyOf(const QString& number, const QString& subquote);
+/// Returns an operation as it is now. Its id is 0 if there is none.
+Entry entryOf(qint64 operation);
 /// Returns the operations that are running or were interrupted.
 QList<Entry> openOperations();
 /// Returns what an operation changed, in the order of the changes.

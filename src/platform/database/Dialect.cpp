@@ -119,6 +119,7 @@ const Dialect& sqlServerDialect()
         .begin = u"BEGIN TRANSACTION"_s,
         .lockedTable = u"%1 WITH (UPDLOCK, HOLDLOCK)"_s,
         .sessionNumber = u"SELECT @@SPID"_s,
+        .identityInsert = u"SET IDENTITY_INSERT %1 "_s,
     };
     return dialect;
 }

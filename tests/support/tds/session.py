@@ -73,6 +73,7 @@ class Session:
         self.no_count, self.lock_timeout, self.silent = False, -1, False
         self.identity = self.scope_identity = None
         self.row_count, self.variables = 0, {}
+        self.identity_insert = None  # the table whose identities an INSERT must give
         self.database.lite.create_function("SCOPE_IDENTITY", 0, lambda: self.scope_identity)
         self.database.lite.create_function("SPID", 0, lambda: self.number)
         self.database.lite.execute("PRAGMA busy_timeout=30000")
@@ -116,10 +117,10 @@ class Session:
         shape, values = shape_of(statement)
         if match := re.fullmatch(r"\s*INSERT\s+INTO\s+(\S+)\s+DEFAULT\s+VALUES\s*", shape, re.I):
             return self.change("INSERT", match.group(1).strip("[]"), shape, {})
-        key = (self.database.schema_version(), self.database.name, shape)
+        key = (self.database.schema_version(), self.database.name, self.identity_insert, shape)
         plan = plans.get(key)
         if plan is None:
-            plan = plans[key] = Translator(shape, self.database.columns).plan()
+            plan = plans[key] = Translator(shape, self.database.columns, self.identity_insert).plan()
         values.update(v_identity=self.identity, v_rowcount=self.row_count, v_spid=self.number, v_version=VERSION,
                       v_language="us_english", v_trancount=int(self.database.lite.in_transaction),
                       v_lock_timeout=self.lock_timeout, v_error=0, **self.variables)
@@ -213,6 +214,8 @@ class Session:
         option = re.sub(r"\s+", " ", text).upper().split(" ")[1:]
         if option[0] == "NOCOUNT":
             self.no_count = option[1] == "ON"
+        elif option[0] == "IDENTITY_INSERT":
+            self.identity_insert = option[1].strip("[]").lower() if option[2] == "ON" else None
         elif option[0] == "LOCK_TIMEOUT":
             self.lock_timeout = int(option[1])
             milliseconds = self.lock_timeout if self.lock_timeout >= 0 else 30000

@@ -94,10 +94,13 @@ class Column(NamedTuple):
 
 
 class Translator:
-    """One statement; `schema` gives the columns of a table by its name, or None."""
+    """One statement; `schema` gives the columns of a table by its name, or None.
 
-    def __init__(self, shape, schema):
-        self.schema = schema
+    An INSERT into the table `identity_insert` must give the identity, and no other may.
+    """
+
+    def __init__(self, shape, schema, identity_insert=None):
+        self.schema, self.identity_insert = schema, identity_insert
         try:
             parsed = sqlglot.parse(shape, read="tsql")
             if len(parsed) != 1:
@@ -129,6 +132,7 @@ class Translator:
         if qualifier != "dbo":
             table.set("this", exp.to_identifier(qualifier + "_" + table.name.lower(), quoted=True))
         table.set("db", None)
+        table.set("hints", None)  # about locks, which a change here has of its whole database
         if self.schema(table.name) is None:
             raise ServerError(208, "Invalid object name '%s'." % table.name)
 
@@ -247,11 +251,15 @@ class Translator:
             rows = values.expressions if isinstance(values, exp.Values) else []
             pairs = [(name, value) for row in rows for name, value in zip(names, row.expressions)]
             pairs += [] if rows else [(name, None) for name in names]
+            if table.lower() == self.identity_insert:
+                identity = next(column.name.lower() for column in columns if column.identity)
+                if identity not in [name.lower() for name in names]:
+                    raise ServerError(545, "Explicit value must be specified for identity column in table '%s'." % table)
         for name, value in pairs:
             column = next((column for column in columns if column.name.lower() == name.lower()), None)
             if column is None:
                 raise ServerError(207, "Invalid column name '%s'." % name)
-            if column.identity:
+            if column.identity and (verb == "UPDATE" or table.lower() != self.identity_insert):
                 raise ServerError(*((8102, "Cannot update identity column '%s'." % name) if verb == "UPDATE" else
                                     (544, "Cannot insert explicit value for identity column in table '%s'." % table)))
             if column.kind.name in ("timestamp", "rowversion"):

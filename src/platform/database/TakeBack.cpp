@@ -1,0 +1,176 @@
+#include "platform/database/TakeBack.h"
+
+#include "platform/RuntimeError.h"
+#include "platform/database/Dialect.h"
+#include "platform/database/Session.h"
+
+#include <QScopeGuard>
+
+#include <cmath>
+
+namespace kest::db {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+/// The condition for the row that a change left, or took away.
+QString rowCondition(const Dialect& dialect, const RowChange& change)
+{
+    QStringList conditions;
+    for (const RowChange::Column& column : change.columns) {
+        if (!change.key.contains(column.name, Qt::CaseInsensitive))
+            continue;
+        const QVariant& value = change.kind == ChangeKind::Delete ? column.before : column.after;
+        const QString held = dialect.holds(column.name, column.kind, value);
+        if (!held.isEmpty())
+            conditions.append(held);
+    }
+    if (conditions.isEmpty())
+        throw RuntimeError(StatementFailed, u"What is recorded does not identify a row of "_s + change.table);
+    return conditions.join(u" AND "_s);
+}
+
+QString withoutBlanksAtEnd(QString text)
+{
+    while (text.endsWith(u' '))
+        text.chop(1);
+    return text;
+}
+
+/// Returns true if the database has stored one value as the other: it may round a number or a time, and pad a text.
+bool isStoredAs(const QVariant& now, const QVariant& written, const ResultColumn& column)
+{
+    if (now.isNull() || written.isNull())
+        return now.isNull() && written.isNull();
+    switch (column.kind) {
+        case Kind::Number:
+            if (column.scale >= 0)
+                return std::abs(now.toDouble() - written.toDouble()) <= 0.51 * std::pow(10, -column.scale);
+            return float(now.toDouble()) == float(written.toDouble());
+        case Kind::Date:
+            if (now.typeId() != QMetaType::QDateTime || written.typeId() != QMetaType::QDateTime)
+                return now == written;
+            return std::abs(now.toDateTime().msecsTo(written.toDateTime())) < 1000;
+        case Kind::Text:
+            return withoutBlanksAtEnd(now.toString()) == withoutBlanksAtEnd(written.toString());
+        default:
+            return now == written;
+    }
+}
+
+bool holds(const TableInfo& table, const RowChange& change, const Rows& rows)
+{
+    if (change.kind == ChangeKind::Delete)
+        return rows.count() == 0;
+    if (rows.count() != 1)
+        return false;
+    for (qsizetype i = 0; i < rows.columns.size(); ++i) {
+        const TableColumn& base = table.columns[i];
+        const QVariant& now = rows.values[size_t(i)];
+        if (const RowChange::Column* column = change.column(base.name)) {
+            if (!isStoredAs(now, column->after, rows.columns[i]))
+                return false;
+        } else if (change.kind == ChangeKind::Insert && !base.hasDefault && !base.readOnly && !now.isNull()) {
+            return false;  // a column that the new row left empty has been filled since
+        }
+    }
+    return true;
+}
+
+QString tableOf(const Session& session, const RowChange& change)
+{
+    return session.dialect().quoted(change.table);
+}
+
+qint64 restoreValues(Session& session, const RowChange& change)
+{
+    const Dialect& dialect = session.dialect();
+    QStringList assignments;
+    for (const RowChange::Column& column : change.columns)
+        if (column.before != column.after || column.before.isNull() != column.after.isNull())
+            assignments.append(dialect.quoted(column.name) + u'=' + dialect.literal(column.before));
+    if (assignments.isEmpty())
+        return 1;
+    return session.executeNative(u"UPDATE "_s + tableOf(session, change) + u" SET "_s + assignments.join(u", "_s) +
+                                 u" WHERE "_s + rowCondition(dialect, change));
+}
+
+qint64 restoreRow(Session& session, const TableInfo& table, const RowChange& change)
+{
+    const Dialect& dialect = session.dialect();
+    QStringList names;
+    QStringList literals;
+    for (const RowChange::Column& column : change.columns) {
+        const TableColumn* base = table.column(column.name);
+        if (!base || base->readOnly)
+            continue;
+        names.append(dialect.quoted(column.name));
+        literals.append(dialect.literal(column.before));
+    }
+    const bool isSwitched = table.identity() && !dialect.identityInsert.isEmpty();
+    const auto allowIdentity = [&](const QString& onOrOff) {
+        session.executeNative(QString(dialect.identityInsert).replace(u"%1"_s, tableOf(session, change)) + onOrOff);
+    };
+    if (isSwitched)
+        allowIdentity(u"ON"_s);
+    const auto off = qScopeGuard([&] {  // after a failure too: with it on, other inserts into the table fail
+        if (isSwitched)
+            attempt([&] { allowIdentity(u"OFF"_s); });
+    });
+    return session.executeNative(u"INSERT INTO "_s + tableOf(session, change) + u" ("_s + names.join(u", "_s) +
+                                 u") VALUES ("_s + literals.join(u", "_s) + u')');
+}
+
+void restore(Session& session, const TableInfo& table, const RowChange& change)
+{
+    qint64 hit = 0;
+    switch (change.kind) {
+        case ChangeKind::Insert:
+            hit = session.executeNative(u"DELETE FROM "_s + tableOf(session, change) + u" WHERE "_s +
+                                        rowCondition(session.dialect(), change));
+            break;
+        case ChangeKind::Update:
+            hit = restoreValues(session, change);
+            break;
+        case ChangeKind::Delete:
+            hit = restoreRow(session, table, change);
+            break;
+    }
+    if (hit != 1)
+        throw RuntimeError(RowChanged, u"A row of %1 could not be restored."_s.arg(change.table));
+}
+
+}  // namespace
+
+bool stillHolds(Connection& connection, const RowChange& change)
+{
+    Session& session = connection.session();
+    const TableInfo* table = session.table(change.table);
+    return table && holds(*table, change, session.selectLocked(*table, rowCondition(session.dialect(), change)));
+}
+
+bool takeBack(Connection& connection, const RowChange& change, const std::function<void()>& record)
+{
+    Session& session = connection.session();
+    const TableInfo* table = session.table(change.table);
+    if (!table)
+        return false;
+    session.begin();
+    connection.setInChange(true);  // so that neither this nor the record is observed
+    bool isCommitted = false;
+    const auto end = qScopeGuard([&] {
+        connection.setInChange(false);
+        if (!isCommitted && connection.state() == 1)
+            attempt([&] { session.rollback(); });
+    });
+    if (!stillHolds(connection, change))
+        return false;
+    restore(session, *table, change);
+    record();
+    session.commit();
+    isCommitted = true;
+    return true;
+}
+
+}  // namespace kest::db

@@ -1,0 +1,192 @@
+#include "recovery/TakeBack.h"
+
+#include "base/History.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
+#include "platform/RuntimeError.h"
+#include "platform/database/Sql.h"
+#include "platform/database/TakeBack.h"
+#include "platform/values.h"
+
+#include <QHash>
+#include <QSet>
+
+#include <algorithm>
+
+namespace kest::recovery {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+/// All that an operation did to one row, as one change.
+struct RowHistory {
+    db::RowChange net;
+    QString number;  // of its quote
+    QString subquote;
+    QList<qint64> entries;  // of the journal
+    bool isGone = false;    // inserted and deleted again
+
+    QString quote() const { return number + u'/' + subquote; }
+    bool isNew() const { return net.kind == db::ChangeKind::Insert; }
+    bool isOf(QLatin1StringView table) const { return net.table.compare(table, Qt::CaseInsensitive) == 0; }
+};
+
+enum class Moment { Before, After };
+
+/// Returns a text that no other row has at that moment.
+QString identityOf(const db::RowChange& row, Moment moment)
+{
+    QStringList parts(row.table.toLower());
+    for (const QString& name : row.key) {
+        const db::RowChange::Column* column = row.column(name);
+        const QVariant value = !column ? QVariant() : moment == Moment::Before ? column->before : column->after;
+        parts.append(name.toLower() + u'=' + (value.isNull() ? u"NULL"_s : u'\'' + toText(value)));
+    }
+    return parts.join(u'\n');
+}
+
+/// Puts an older change of the same row in front.
+void putBefore(RowHistory& row, const db::RowChange& older)
+{
+    row.isGone = older.kind == db::ChangeKind::Insert && row.net.kind == db::ChangeKind::Delete;
+    if (older.kind == db::ChangeKind::Insert)
+        row.net.kind = db::ChangeKind::Insert;
+    for (const db::RowChange::Column& column : older.columns) {
+        const auto same = std::ranges::find_if(row.net.columns, [&](const db::RowChange::Column& known) {
+            return known.name.compare(column.name, Qt::CaseInsensitive) == 0;
+        });
+        if (same == row.net.columns.end())
+            row.net.columns.append(column);
+        else
+            same->before = column.before;
+    }
+}
+
+/// Returns the rows that an operation changed and that are not taken back yet, the one changed last first.
+QList<RowHistory> rowsOf(qint64 operation)
+{
+    QList<RowHistory> rows;
+    QHash<QString, qsizetype> known;  // by what the row was before the changes read so far
+    const QList<journal::RecordedChange> changes = journal::changesOf(operation);
+    for (auto change = changes.crbegin(); change != changes.crend(); ++change) {
+        if (change->isTakenBack)
+            continue;
+        qsizetype row =
+            change->row.kind == db::ChangeKind::Delete ? -1 : known.value(identityOf(change->row, Moment::After), -1);
+        if (row < 0) {
+            row = rows.size();
+            rows.append({change->row, change->number, change->subquote, {}});
+        } else {
+            known.remove(identityOf(change->row, Moment::After));
+            putBefore(rows[row], change->row);
+        }
+        rows[row].entries.append(change->entry);
+        if (change->row.kind != db::ChangeKind::Insert)
+            known.insert(identityOf(change->row, Moment::Before), row);
+    }
+    rows.removeIf([](const RowHistory& row) { return row.isGone; });
+    return rows;
+}
+
+/// Returns true for what others may use already.
+bool stays(const RowHistory& row)
+{
+    return row.isOf("CINFO"_L1) ||
+           (row.isNew() && (row.isOf("CAR"_L1) || row.isOf("CUSTOMER"_L1) || row.isOf("VENDOR"_L1)));
+}
+
+QString nameOf(const db::RowChange& row)
+{
+    QStringList key;
+    for (const QString& name : row.key)
+        if (const db::RowChange::Column* column = row.column(name))
+            key.append(name + u' ' + textOrEmpty(row.kind == db::ChangeKind::Delete ? column->before : column->after));
+    return u"The row of %1 with %2"_s.arg(row.table, key.join(u", "_s));
+}
+
+/// Returns true if a quote has more lines and notes than these, or an invoice.
+bool hasMore(const RowHistory& quote, qsizetype lines, qsizetype notes)
+{
+    const auto count = [&](const char* select) {
+        return opened(sql(select, quote.number, quote.subquote)).recordCount();
+    };
+    if (count("SELECT QTNNO FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'") > lines ||
+        count("SELECT QTNNO FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE='{}'") > notes)
+        return true;
+    const bool isMain = quote.subquote == "0"_L1;  // invoices name the main quote only
+    return isMain && gConn->hasTable(u"DEBTOR"_s) &&
+           !opened(sql("SELECT QTNNO FROM DEBTOR WHERE QTNNO='{}'", quote.number)).eof();
+}
+
+/// Returns the new quotes of the operation that someone else works on already.
+QSet<QString> quotesInUse(const QList<RowHistory>& rows)
+{
+    QSet<QString> inUse;
+    for (const RowHistory& quote : rows) {
+        if (!quote.isNew() || !quote.isOf("QUOTE1"_L1))
+            continue;
+        const auto own = [&](QLatin1StringView table) {
+            return std::ranges::count_if(rows, [&](const RowHistory& row) {
+                return row.isNew() && row.isOf(table) && row.quote() == quote.quote();
+            });
+        };
+        if (hasMore(quote, own("QUOTE2"_L1), own("QUOTE3"_L1)))
+            inUse.insert(quote.quote());
+    }
+    return inUse;
+}
+
+/// Goes through the rows that `undo` takes back. Returns a sentence for each that it refuses.
+template <class Undo>
+QStringList refused(qint64 operation, Undo&& undo)
+{
+    const QList<RowHistory> rows = rowsOf(operation);
+    const QSet<QString> inUse = quotesInUse(rows);
+    QStringList left;
+    for (const QString& quote : inUse)
+        left.append(u"Quote %1 has lines, notes or an invoice from elsewhere and stays."_s.arg(quote));
+    for (const RowHistory& row : rows)
+        if (!stays(row) && !inUse.contains(row.quote()) && !undo(row))
+            left.append(nameOf(row.net) + u" was changed by someone else and stays as it is."_s);
+    return left;
+}
+
+/// Throws RowChanged if another workstation has taken the row back meanwhile.
+void markTakenBack(const RowHistory& row)
+{
+    QStringList entries;
+    for (const qint64 entry : row.entries)
+        entries.append(sql("Entry={}", entry));
+    const qint64 hit =
+        gConn->execute(sql("UPDATE KESTJournal SET Settled=1 WHERE Settled=0 AND (") + entries.join(u" OR "_s) + u')');
+    if (hit != row.entries.size())
+        throw RuntimeError(RowChanged, u"Another workstation is taking this work back."_s);
+}
+
+bool undone(const RowHistory& row)
+{
+    if (row.isNew() && row.isOf("QUOTE1"_L1) && hasMore(row, 0, 0))
+        return false;
+    try {
+        return db::takeBack(*gConn, row.net, [&] { markTakenBack(row); });
+    } catch (const RuntimeError& error) {
+        if (error.sqlState().startsWith("23"_L1))  // another row has its key meanwhile
+            return false;
+        throw;
+    }
+}
+
+}  // namespace
+
+QStringList takeBack(qint64 operation)
+{
+    return refused(operation, undone);
+}
+
+QStringList obstaclesTo(qint64 operation)
+{
+    return refused(operation, [](const RowHistory& row) { return db::stillHolds(*gConn, row.net); });
+}
+
+}  // namespace kest::recovery

@@ -1,0 +1,17 @@
+// Takes back what an operation changed.
+#pragma once
+
+#include <QStringList>
+
+namespace kest::recovery {
+
+/// Takes the changes of an operation back, the newest row first. A row goes back whole, in a transaction of its own,
+/// and only if it still holds what the operation wrote last. New cars, customers and vendors and the counter of quotes
+/// stay, because other loads may use them. A new quote that has lines, notes or an invoice from elsewhere stays with
+/// all its rows. Can be interrupted and run again. Returns what could not be taken back, a sentence each.
+QStringList takeBack(qint64 operation);
+
+/// Returns what takeBack() could not take back, a sentence each, and changes nothing.
+QStringList obstaclesTo(qint64 operation);
+
+}  // namespace kest::recovery
