@@ -126,6 +126,7 @@ void frmPrintPreview::ShowForm(qint32 peReportType, const QVariant& pvValue, db:
             report.setTable(*rows);
         }
         setParameters(report, peReportType, pvValue);
+        report.setAuthor(GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"ShopName"_s, {}, CopyUp::No));
         recordPreview(peReportType, report, rows);
         frmPrintPreview form(report);
         desktop::showModal(form);

@@ -3,6 +3,7 @@
 #include "platform/RuntimeError.h"
 #include "platform/desktop/Progress.h"
 #include "platform/files/files.h"
+#include "platform/print/PdfAuthor.h"
 #include "platform/print/Report.h"
 
 #include <QAbstractTextDocumentLayout>
@@ -265,7 +266,7 @@ void writePdf(const Report& report, const QString& systemPath)
     writer.setTitle(report.heading());
     setPaper(writer);
     paint(report, writer);
-    files::writeBytes(systemPath, pdf);
+    files::writeBytes(systemPath, withAuthor(pdf, report.author()));
 }
 
 }  // namespace kest::report

@@ -50,6 +50,9 @@ public:
     const QString& title() const { return title_; }
     /// Returns the first heading of the report, such as "Authorised quote 1007", or its title if it has none.
     QString heading() const;
+    /// The author of its PDF file; none if empty.
+    const QString& author() const { return author_; }
+    void setAuthor(const QString& name) { author_ = name; }
     const QList<Parameter>& parameters() const { return parameters_; }
     void setParameter(qsizetype index, const QString& value) { parameters_[index].value = value; }
 
@@ -67,6 +70,7 @@ private:
     void readSaved(const QString& json);
 
     QString title_;
+    QString author_;
     QString styles;
     QString body_;
     QString header_;
