@@ -44,6 +44,7 @@ public:
     // The size of the columns in characters. 0 if it is not limited.
     int longestVin() const { return carRow.size(QStringLiteral("VIN")); }
     int longestOdometer() const { return quoteRow.size(QStringLiteral("kms")); }
+    int longestMonthAndYear() const { return carRow.size(QStringLiteral("Year")); }  // with the "/" between them
 
     /// Returns the stored values. Fuel and damage are empty, because they are asked for each time.
     ExtraValues values() const;

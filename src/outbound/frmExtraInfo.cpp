@@ -29,6 +29,8 @@ namespace kest {
 
 namespace {
 
+constexpr int digitsOfMonth = 2;
+constexpr int digitsOfYear = 4;
 constexpr int lastYearOfCentury = 29;  // years of two digits up to this belong to the 21st century
 
 QLabel* addDisplay(QFormLayout* layout, const char* name, const QString& label, const QString& text)
@@ -159,7 +161,11 @@ void frmExtraInfo::fillColours()
 void frmExtraInfo::fill(const ExtraInfo& info)
 {
     const ExtraValues found = info.values();
-    const std::pair<QLineEdit*, int> longest[] = {{txtVIN, info.longestVin()}, {txtOdometer, info.longestOdometer()}};
+    const int both = info.longestMonthAndYear() - 1;
+    const std::pair<QLineEdit*, int> longest[] = {{txtVIN, info.longestVin()},
+                                                  {txtOdometer, info.longestOdometer()},
+                                                  {txtBuildMonth, both - digitsOfYear},
+                                                  {txtBuildYear, both - digitsOfMonth}};
     for (const auto& [field, size] : longest)
         if (size > 0)
             field->setMaxLength(size);
