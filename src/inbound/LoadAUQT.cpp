@@ -76,17 +76,22 @@ Authorisation::Authorisation(const xml::Document& message)
 }
 
 /// Returns the quote with that key. If there is none, returns the quote with the message's request, network number and
-/// registration, and sets `key` to its key. If several match, the first is current and `key` stays as it is.
-Quote findQuote(const Authorisation& told, QuoteKey& key)
+/// registration, and sets `key` to its key. If several match, the first is current and `key` stays as it is. If none
+/// matches, returns nothing.
+std::optional<Quote> findQuote(const Authorisation& told, QuoteKey& key)
 {
     Quote named(key);
-    if (named.exists() || told.originalNumber.trimmed().isEmpty())
+    if (named.exists())
         return named;
+    if (isBlank(told.request) || isBlank(told.originalNumber))
+        return {};
     db::Recordset header = opened(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' AND KESTQuoteNo='{}' AND REGO = '{}'",
                                       told.request, told.originalNumber, told.rego));
+    if (header.eof())
+        return {};
     if (header.recordCount() == 1)
         key = QuoteKey::fromRow(header);
-    const QString subquote = header.eof() ? QString() : header.text(u"Subquote"_s);
+    const QString subquote = header.text(u"Subquote"_s);
     return Quote({key.number, subquote}, std::move(header));
 }
 
@@ -164,15 +169,15 @@ bool authorise(QString& text)
     const Authorisation told(*message);
     QuoteKey key = QuoteKey::fromReference(told.reference);
 
-    Quote found = findQuote(told, key);
-    db::Recordset& quote = found.header();
-    if (quote.eof())
+    std::optional<Quote> found = findQuote(told, key);
+    if (!found)
         return refuse(u"Couldn't Locate Matching KEST Quote, Please contact MarlinDesk Support."_s);
+    db::Recordset& quote = found->header();
     const QString rego = told.rego == unknownRego ? quote.text(u"REGO"_s) : told.rego;
-    db::Recordset& lines = found.lines();
+    db::Recordset& lines = found->lines();
     if (lines.eof())
         return refusePlainly(u"Error: Cannot load an Authorisation onto a blank quote!"_s);
-    db::Recordset& notes = found.notes();
+    db::Recordset& notes = found->notes();
     db::Recordset car = opened(sql("SELECT * FROM CAR WHERE REGO='{}'", rego));
     const db::Recordset insurer =
         opened(sql("SELECT * FROM INSURER WHERE INSURER_ID={}", quote.value(u"INSURER_ID"_s)));

@@ -13,6 +13,7 @@
 #include "quotedata/StateTable.h"
 #include "reports/PrintXML.h"
 
+#include <optional>
 #include <utility>
 
 namespace kest {
@@ -39,6 +40,24 @@ const Transition& backOutOf(Quote& quote)
     return rejected ? rejectionBackedOut : supplementaryBackedOut;
 }
 
+/// Returns the quote that the reference names if it is of the request, otherwise the newest quote of the request. If
+/// there is none, returns nothing.
+std::optional<Quote> findAdjusted(const QuoteKey& told, const QString& request)
+{
+    if (isBlank(request))
+        return {};
+    if (!isBlank(told.number)) {
+        db::Recordset named = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}' AND KESTQRNo='{}'",
+                                         told.number, told.subquote, request));
+        if (!named.eof())
+            return Quote(std::move(named));
+    }
+    db::Recordset newest = opened(sql("SELECT TOP 1 * FROM QUOTE1 WHERE KESTQRNo='{}' order by rec_id DESC", request));
+    if (newest.eof())
+        return {};
+    return Quote(std::move(newest));
+}
+
 }  // namespace
 
 bool LoadADQT(QString& text, const QString& fileName)
@@ -46,15 +65,10 @@ bool LoadADQT(QString& text, const QString& fileName)
     const SharedMessage message = sharedMessage(text);
     const QuoteKey key = QuoteKey::fromReference(
         message->textOf(u"//rootns:getAdjustedQuoteResponse/rootns:quoteBody/rootns:quoteReference"_s));
-    const QString request = message->textOf(u"//rootns:quoteRequestNumber"_s);
-
-    db::Recordset header = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}' AND KESTQRNo='{}'",
-                                      key.number, key.subquote, request));
-    if (header.eof() && !request.trimmed().isEmpty())
-        header = opened(sql("SELECT TOP 1 * FROM QUOTE1 WHERE KESTQRNo='{}' order by rec_id DESC", request));
-    if (header.eof())
+    std::optional<Quote> found = findAdjusted(key, message->textOf(u"//rootns:quoteRequestNumber"_s));
+    if (!found)
         return refuse(u"Error locating Quote in Database, Please contact Marlindesk Support."_s);
-    Quote quote(std::move(header));
+    Quote& quote = *found;
     if (quote.lines().eof()) {
         desktop::msgBox(u"Error: Cannot load an Adjustment onto a blank quote!"_s);
         return false;

@@ -69,7 +69,7 @@ std::optional<QuoteKey> matchSupplementary(const ManualQuote& manual, const db::
 
     db::Recordset quotes =
         opened(sql("SELECT QTNNO, subquote FROM QUOTE1 WHERE QTNNO = '{}' ORDER BY subquote", number));
-    if (!quotes.eof()) {
+    if (!isUnknown(number, quotes)) {
         quotes.moveLast();
         const bool isAbove = subquote > toLong(quotes.value(u"subquote"_s));
         return QuoteKey{number, isAbove ? manual.told.subquote : behind(quotes)};
@@ -111,7 +111,7 @@ QuoteKey matchMain(const ManualQuote& manual, const db::Recordset& cinfo)
 
     const db::Recordset numbered = opened(
         sql("SELECT QTNNO, subquote, Rego FROM QUOTE1 WHERE QTNNO = '{}' ORDER BY subquote", manual.told.number));
-    if (!numbered.eof()) {
+    if (!isUnknown(manual.told.number, numbered)) {
         const QString typed = numbered.text(u"Rego"_s);
         if (typed.trimmed().toUpper() == rego)
             return QuoteKey::fromRow(numbered);

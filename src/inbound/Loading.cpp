@@ -32,9 +32,14 @@ void respellColour(db::Recordset& car, db::Recordset& colours)
     car.set(u"COLOUR"_s, colours.eof() ? u""_s : colours.text(u"Script"_s).trimmed());
 }
 
+bool isBlank(const QString& number)
+{
+    return number.trimmed().isEmpty();
+}
+
 bool isUnknown(const QString& number, const db::Recordset& quote)
 {
-    return number.trimmed().isEmpty() || quote.eof();
+    return isBlank(number) || quote.eof();
 }
 
 void tellOldTotals(const db::Recordset& quote)

@@ -3,6 +3,7 @@
 #include "base/Helpers.h"
 #include "base/SharedVariables.h"
 #include "base/modLoggerEx.h"
+#include "inbound/Loading.h"
 #include "messages/Envelope.h"
 #include "messages/Folders.h"
 #include "messages/MessageTypes.h"
@@ -103,6 +104,8 @@ void withdrawIfRequest(const QString& path, const QString& requestNumber)
 /// Deletes unread quote requests that a manual quote has answered, so that they don't become a second quote.
 void withdrawWaitingRequests(const QString& requestNumber, const QString& fileName)
 {
+    if (isBlank(requestNumber))
+        return;
     for (const QString& name : files::list(gsUnreadPath)) {
         if (!isBareName(name) || name.compare(fileName, Qt::CaseInsensitive) == 0)
             continue;

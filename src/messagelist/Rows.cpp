@@ -132,10 +132,10 @@ void drawThroughKey(MessageRow& row, const xml::Document& message, const Message
 
 QString claimOfQuote(const QString& reference)
 {
-    const db::Recordset quote = Quote::openHeader(QuoteKey::fromReference(reference));
-    if (!suffices(quote, RowsNeeded::ExactlyOne))
+    Quote quote(QuoteKey::fromReference(reference));
+    if (!quote.exists() || !suffices(quote.header(), RowsNeeded::ExactlyOne))
         return {};
-    return quote.isNull(u"Claim"_s) ? u"-"_s : quote.text(u"Claim"_s);
+    return quote.header().isNull(u"Claim"_s) ? u"-"_s : quote.header().text(u"Claim"_s);
 }
 
 QString customerOfSentQuote(const xml::Document& document)
@@ -203,6 +203,8 @@ MessageRow GetMarkerRow(const xml::Document& marker, const QString& typeName)
     draw(subquote, [&] { return marker.textOf(u"subquote"_s); });
     draw(row[RegoField], [&] { return marker.textOf(u"rego"_s); });
     attempt([&] {
+        if (row[QuoteField].trimmed().isEmpty())
+            return;
         db::Recordset quote(gConn);
         quote.open(
             sql("SELECT * FROM QUOTE1, CAR WHERE QUOTE1.REGO=CAR.REGO AND QUOTE1.QTNNO='{}' AND "

@@ -84,9 +84,10 @@ Precedence precedenceOf(const xml::Document& message, QList<ListedMessage>& list
     attempt([&] {
         const xml::Node number = requestNumberOf(message.documentElement());
         const QString request = number ? number.text() : QString();
-        result.earlier = number ? gdicQuoteRequests.value(request) : QString();
-        result.isHeld = number && gdicQuoteRequests.contains(request) && message.textOf(u"messageType"_s) != "MANQ"_L1;
-        if (!number || result.isHeld)
+        const bool isNamed = !request.trimmed().isEmpty();
+        result.earlier = isNamed ? gdicQuoteRequests.value(request) : QString();
+        result.isHeld = isNamed && gdicQuoteRequests.contains(request) && message.textOf(u"messageType"_s) != "MANQ"_L1;
+        if (!isNamed || result.isHeld)
             return;
         const auto displaced = std::ranges::find(listed, result.earlier, &ListedMessage::file);
         if (displaced != listed.end()) {

@@ -32,7 +32,7 @@ void checkResponse(const xml::Document& document, const QString& name)
     if (document.textOrEmptyOf(u"rootns:kestQuoteNumber"_s).isEmpty() ||
         document.textOrEmptyOf(u"rootns:quoteSubmissionStatus"_s).isEmpty())
         throw NotTaken{u"it is not a response of the network"_s};
-    if (Quote::openHeader(QuoteKey::fromResponseName(name)).eof())
+    if (!Quote(QuoteKey::fromResponseName(name)).exists())
         throw NotTaken{u"the quote that it answers does not exist"_s};
 }
 

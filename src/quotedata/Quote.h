@@ -21,7 +21,8 @@ public:
     Quote(QuoteKey key, db::Recordset header);
 
     const QuoteKey& key() const { return quoteKey; }
-    bool exists() { return !header().eof(); }
+    /// A blank number names no quote, even if a quote of the host has none.
+    bool exists() { return !quoteKey.number.trimmed().isEmpty() && !header().eof(); }
     /// Returns true if the subquote is above 0.
     bool isSupplementary();
 

@@ -24,10 +24,11 @@ QuoteKey quoteOf(const xml::Document& document)
 /// Opens the quote of the message's request. If there is none, shows a box and returns a closed recordset.
 db::Recordset openQuote(const xml::Document& document, const QuoteKey& key, const QString& refusal)
 {
+    const QString request = document.textOf(u"//rootns:quoteRequestNumber"_s);
     db::Recordset quote(gConn);
     quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}' AND KESTQRNo='{}'", key.number,
-                   key.subquote, document.textOf(u"//rootns:quoteRequestNumber"_s)));
-    if (quote.eof()) {
+                   key.subquote, request));
+    if (quote.eof() || key.number.trimmed().isEmpty() || request.trimmed().isEmpty()) {
         desktop::msgBox(refusal, desktop::Icon::Critical);
         quote.close();
     }

@@ -88,6 +88,10 @@ TEST_F(Dispatcher, AManualQuoteWithdrawsTheRequestThatItAnswers)
     load(manualQuote("MANQ"));  // this test is not about the quote itself
     EXPECT_EQ(filesIn(gsUnreadPath).join(u' '), u"b.xml c.xml d.xml e\\f.xml message.xml QR1_001.jpg R_500_0.xml"_s);
 
+    arrive("b.xml", quoteRequest(" "));
+    load(manualQuote("MANQ").request(" "));
+    EXPECT_TRUE(filesIn(gsUnreadPath).contains(u"b.xml"_s)) << "an empty number matches nothing";
+
     // the clean-up compares the type in its exact case
     arriveAll();
     load(manualQuote("MANQ").text().replace(u">MANQ</messageType>"_s, u">manq</messageType>"_s));

@@ -20,6 +20,7 @@ TEST_F(ManualQuotes, EachHasItsQuoteAsTheTableSays)
     quote("502").rego("ABC-123").request("QR7");
     quote("600").request("QR8");
     quote("600", 2).request("QR8");
+    quote("").rego("ABC123");
     car(" ABC123");
     const Snapshot before;
     for (const auto& [elements, quote] : casesIn<2>("inbound/manual-quotes.txt")) {

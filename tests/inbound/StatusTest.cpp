@@ -78,7 +78,9 @@ TEST_F(StatusMessages, ASupplementaryQuoteStaysIfItsDeletionCannotBeNoted)
 
 TEST_F(StatusMessages, AMessageWhoseQuoteIsUnknownIsRefused)
 {
-    quote("500").request("").quoteNumber("").stage(7).line(1);  // an empty number does not match an empty number
+    // an empty number does not match an empty number
+    quote("500").request("").quoteNumber("").stage(7).line(1);
+    quote("").request("").quoteNumber("KQ9").line(1);
     for (const QString& unknown : {u"QR2"_s, u""_s}) {
         for (auto [message, box] : casesIn<2>("inbound/unknown-quotes.txt")) {
             EXPECT_FALSE(load(Message::told(message.replace(u'?', unknown))));
@@ -89,4 +91,5 @@ TEST_F(StatusMessages, AMessageWhoseQuoteIsUnknownIsRefused)
     EXPECT_TRUE(quoteExists("888"));
     EXPECT_EQ(quote("500").state(), "7 open - ");
     EXPECT_EQ(quote("500").lines(), 1);
+    EXPECT_EQ(quote("").state(), "1 open KQ9 ");
 }

@@ -182,6 +182,8 @@ TEST_F(MessageList, WhatIsHeldBackTellsWhatItWaitsFor)
     arrive("c.xml", quoteRequest("QR3"));
     arrive("d.xml", cancellation("QR3"));
     arrive("e.xml", manualQuote("500").request("QR3"));
+    arrive("f.xml", cancellation(""));
+    arrive("g.xml", cancellation(""));
     arrive("MDMSG1.xml", "<note><subject>Hello</subject></note>");
     arrive("QR1_002.jpg", "picture");
     FillHooks hooks;

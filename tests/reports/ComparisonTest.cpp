@@ -165,6 +165,8 @@ TEST_F(Comparison, TheReferencedQuoteMustBeOfTheRequest)
     EXPECT_FALSE(matches(authorisedQuote("500/2").without("authorityNumber")));
     EXPECT_EQ(shown(),
               "[critical] Matching quote was not found in database, Please contact MarlinDesk Support.\n[none] error");
+    quote("500", 2).request("");
+    EXPECT_FALSE(matches(authorisedQuote("500/2").request(""))) << "an empty number matches nothing";
     quote("500", 2).request("QR2");
     QString text = adjustedQuote("500/2").text();
     db::Recordset table = openComparison(ComparisonOf::AdjustedQuote);

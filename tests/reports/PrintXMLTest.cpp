@@ -132,9 +132,11 @@ TEST_F(Printing, AnEmptyNumberMatchesNoQuote)
     quote("500").request("", "");
     print(quoteRequest("").set("quoteRequestVersionNumber", ""));
     print(assessmentResult("KQ1").set("kestQuoteRequestNumber", ""));
+    print(adjustedQuote("500").request(""));
     EXPECT_EQ(shown(),
               "[critical] Quote does not exist in database, please contact MarlinDesk Support.\n"
-              "[critical] Failed Matching Quote. Please contact MarlinDesk Support");
+              "[critical] Failed Matching Quote. Please contact MarlinDesk Support\n"
+              "[critical] Quote not found in database. Please contact MarlinDesk Support.");
 }
 
 TEST_F(Printing, EachChangedLineStandsInItsSection)
