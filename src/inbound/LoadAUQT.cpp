@@ -125,7 +125,7 @@ QString surnameFirst(const QString& name)
     return given.isEmpty() ? surname : surname + u", "_s + given;
 }
 
-void fillHeader(db::Recordset& quote, const Authorisation& told, const QString& rego, const db::Recordset& insurer)
+void fillNumbers(db::Recordset& quote, const Authorisation& told, const QString& rego)
 {
     setColumns(quote, {
                           {"KESTQRNo"_L1, told.request},
@@ -133,6 +133,13 @@ void fillHeader(db::Recordset& quote, const Authorisation& told, const QString& 
                           {"KESTAuthNo"_L1, told.authorisedNumber},
                           {"Claim"_L1, told.claim},
                           {"REGO"_L1, rego},
+                      });
+}
+
+void fillHeader(db::Recordset& quote, const Authorisation& told, const QString& rego, const db::Recordset& insurer)
+{
+    fillNumbers(quote, told, rego);
+    setColumns(quote, {
                           {"assess"_L1, cutFor(quote, u"assess"_s, surnameFirst(told.assessor))},
                           {"AuthDate"_L1, shortDate(QDate::currentDate())},
                           {"targetdate"_L1, toDate(told.completionDate)},
@@ -183,6 +190,8 @@ bool authorise(QString& text)
         opened(sql("SELECT * FROM INSURER WHERE INSURER_ID={}", quote.value(u"INSURER_ID"_s)));
     if (car.eof())
         return refusePlainly(u"Could not locate Car listed on Authorisation. Please Contact MarlinDesk Support."_s);
+    fillNumbers(quote, told, rego);  // a number that is too long is refused before anything is stored
+    quote.cancelUpdate();
     car.set(u"KEST"_s, 1);
     car.update();
     if (insurer.eof())

@@ -128,14 +128,30 @@ QuoteKey matchMain(const ManualQuote& manual, const db::Recordset& cinfo)
     return {newNumber(manual.told.number, cinfo)};
 }
 
-void fillHeader(db::Recordset& quote, const ManualQuote& manual, const QuoteKey& key, const db::Recordset& insurer,
-                const db::Recordset& cinfo)
+void fillNumbers(db::Recordset& quote, const ManualQuote& manual)
 {
     setColumns(quote, {
                           {"KESTQRNo"_L1, manual.request},
                           {"KESTQuoteNo"_L1, manual.networkNumber},
                           {"Claim"_L1, manual.claim},
                           {"REGO"_L1, manual.rego},
+                      });
+}
+
+/// Throws ValueTooLong if a number does not fit, before the search for the quote, which may change a registration.
+void checkNumbers(const ManualQuote& manual)
+{
+    db::Recordset quote = opened(u"SELECT * FROM QUOTE1 WHERE rec_id=0"_s);
+    quote.addNew();
+    fillNumbers(quote, manual);
+    quote.cancelUpdate();
+}
+
+void fillHeader(db::Recordset& quote, const ManualQuote& manual, const QuoteKey& key, const db::Recordset& insurer,
+                const db::Recordset& cinfo)
+{
+    fillNumbers(quote, manual);
+    setColumns(quote, {
                           {"qtndate"_L1, shortDate(QDate::currentDate())},
                           {"INSURER_ID"_L1, insurer.value(u"INSURER_ID"_s)},
                           {"RR_RATE"_L1, 1},
@@ -176,6 +192,7 @@ bool LoadMANQ(QString& text, const QString& fileName)
         return refuse(u"Error locating a valid insurer, Please contact MarlinDesk Support."_s);
 
     const ManualQuote manual(*message);
+    checkNumbers(manual);
     const std::optional<QuoteKey> key =
         manual.isSupplementary ? matchSupplementary(manual, cinfo) : matchMain(manual, cinfo);
     if (!key)

@@ -280,6 +280,9 @@ bool LoadQREQ(QString& text, const QString& fileName)
     }
     request.readRest(*message);
 
+    quote.addNew();
+    // before the first update, so that a text that is too long is refused before anything is stored
+    fillQuote(quote, quoteNumber, request, insurer, cinfo);
     const bool carFound = !car.eof();
     if (carFound) {
         car.set(u"KEST"_s, 1);
@@ -291,11 +294,9 @@ bool LoadQREQ(QString& text, const QString& fileName)
         customer.addNew();
     if (!carFound)
         car.addNew();
-    quote.addNew();
     if (notes.eof())
         notes.addNew();
 
-    fillQuote(quote, quoteNumber, request, insurer, cinfo);
     setColumns(notes, {{"QTNNO"_L1, quoteNumber}, {"Subquote"_L1, 0}});
     applyTransition(quoteRequested, quote, notes);
     if (!customerFound)

@@ -97,3 +97,18 @@ TEST_F(Dispatcher, AManualQuoteWithdrawsTheRequestThatItAnswers)
     load(manualQuote("MANQ").text().replace(u">MANQ</messageType>"_s, u">manq</messageType>"_s));
     EXPECT_TRUE(filesIn(gsUnreadPath).contains(u"a.xml"_s));
 }
+
+TEST_F(Dispatcher, ATextLongerThanItsColumnIsRefusedBeforeAnythingIsStored)
+{
+    quote("500").request("QR1").set("excess", 400).line(1);
+    quote("502").rego("ABC-123");
+    car("ABC-123");
+    for (const Message& message :
+         {quoteRequest("QR2"), authorisedQuote("500").set("excess", "300"), manualQuote("502")}) {
+        arrive("m.xml", Message(message).claim(std::string(200, '7')));
+        const std::string held = holdings();
+        EXPECT_FALSE(loadAsTheWindow(u"m.xml"_s));
+        EXPECT_NE(shown().find("too long for the column Claim"), std::string::npos);
+        EXPECT_EQ(difference(held, holdings()), "\n");
+    }
+}
