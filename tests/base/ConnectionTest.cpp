@@ -1,5 +1,7 @@
 #include "base/modLoggerEx.h"
+#include "support/OdbcDrivers.h"
 #include "support/Shop.h"
+#include "support/TdsServer.h"
 
 #include <QElapsedTimer>
 #include <QTcpServer>
@@ -97,4 +99,22 @@ TEST_F(ShopConnection, ASettingLowersTheTimeOfAStatement)
     EXPECT_THROW(opened(u"WITH RECURSIVE n(i) AS (SELECT 1 UNION ALL SELECT i + 1 FROM n) SELECT COUNT(*) FROM n"_s),
                  RuntimeError);
     EXPECT_LT(time.elapsed(), 10000);
+}
+
+TEST_F(ShopConnection, TheOptionsOfTheSettingOrTheVariableReachTheDriver)
+{
+    const test::OdbcDrivers drivers(test::OdbcDrivers::WithSqlServer);
+    test::tdsServer().createDatabase(u"WirSql"_s);
+    const QString options = u"Server="_s + test::tdsServer().address();
+    setSetting(u"ServerName"_s, u"127.0.0.1,1"_s);
+    OpenDatabase();
+    EXPECT_FALSE(gcnDB->answers());
+    setSetting(u"OdbcOptions"_s, options);
+    OpenDatabase();
+    EXPECT_TRUE(gcnDB->answers()) << connectionFailure();
+    setSetting(u"OdbcOptions"_s, u""_s);
+    qputenv("KEST2_ODBC_OPTIONS", options.toUtf8());
+    OpenDatabase();
+    EXPECT_TRUE(gcnDB->answers()) << connectionFailure();
+    qunsetenv("KEST2_ODBC_OPTIONS");
 }
