@@ -126,4 +126,14 @@ TEST_P(TakeBackOn, NothingIsTakenBackIfThatCannotBeRecorded)
     EXPECT_TRUE(db::takeBack(*connection, seen->changes.front(), [] {})) << "it can be tried again";
 }
 
+TEST_P(TakeBackOn, AComputedColumnIsLeftToTheDatabase)
+{
+    if (GetParam() == On::Tds)  // the simulated server has none
+        return;
+    connection->execute(u"ALTER TABLE LINE ADD COLUMN twice INTEGER GENERATED ALWAYS AS (SEQ * 2) VIRTUAL"_s);
+    connection->execute(u"DELETE FROM LINE WHERE CODE='A'"_s);
+    EXPECT_TRUE(db::takeBack(*connection, seen->changes.front(), [] {}));
+    EXPECT_EQ(count(u"CODE='A' AND twice=2"_s), 1);
+}
+
 INSTANTIATE_TEST_SUITE_P(On, TakeBackOn, ::testing::Values(On::Embedded, On::MySql, On::Odbc, On::Tds));

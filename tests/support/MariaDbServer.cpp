@@ -104,7 +104,8 @@ void MariaDbServer::start()
     }
     // the component always logs in as "sa", and its password is empty by default
     for (const auto& [name, secret] : {std::pair(user(), password()), std::pair(u"sa"_s, QString())})
-        connection.execute(sql("GRANT ALL ON *.* TO '{}'@'127.0.0.1' IDENTIFIED BY '{}'", name, secret));
+        connection.execute(
+            sql("GRANT ALL ON *.* TO '{}'@'127.0.0.1' IDENTIFIED BY '{}' WITH GRANT OPTION", name, secret));
 }
 
 void MariaDbServer::createDatabase(const QString& name, const QString& script)

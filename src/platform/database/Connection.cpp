@@ -2,6 +2,7 @@
 
 #include "platform/RuntimeError.h"
 #include "platform/database/Change.h"
+#include "platform/database/ColumnValues.h"
 #include "platform/database/ConnectionText.h"
 #include "platform/database/OdbcDrivers.h"
 #include "platform/database/Session.h"
@@ -83,6 +84,7 @@ void Connection::open(const QString& connectionText)
     close();
     session_ = std::make_unique<Session>(openEngine(connectionText, ConnectionText(odbcOptions_), commandTimeout_));
     session_->engine().setTimeout(commandTimeout_);
+    ++generation_;
 }
 
 void Connection::close()
@@ -115,6 +117,21 @@ qint64 Connection::execute(const QString& statement)
         pasted && observerOf(pasted->table))
         return executeObserved(*this, *pasted, statement);
     return session().execute(statement);
+}
+
+QStringList Connection::tablesWithoutTransactions() const
+{
+    QStringList names;
+    const QString question = session().dialect().withoutTransactions;
+    if (!question.isEmpty())
+        for (const QVariant& name : session().engine().run(question).values)
+            names.append(normalised(name, Kind::Text).toString());
+    return names;
+}
+
+void Connection::endSession(const QString& serverSession, const QString& lock) const
+{
+    session().engine().endSession(serverSession, lock);
 }
 
 QString Connection::serverSession() const

@@ -2,6 +2,7 @@
 #pragma once
 
 #include <QString>
+#include <QStringList>
 #include <QVariant>
 
 #include <memory>
@@ -29,6 +30,9 @@ public:
     void close();
     /// Returns 1 if the connection is open, otherwise 0. A connection that the server has dropped is closed.
     int state() const;
+    /// Returns how often the connection has been opened. What belongs to a session of the server, such as a lock, ends
+    /// with the next opening.
+    int generation() const { return generation_; }
     /// Checks if the server still answers. If it does not, for whatever reason, the connection is closed afterwards.
     bool answers() const;
 
@@ -48,6 +52,10 @@ public:
     /// Returns the server's own number of this connection, or an empty text for the embedded engine.
     QString serverSession() const;
     bool hasTable(const QString& name) const;
+    /// Returns the tables whose changes can't be taken back, because they have no transactions.
+    QStringList tablesWithoutTransactions() const;
+    /// Ends another session of the server if it holds that lock.
+    void endSession(const QString& serverSession, const QString& lock) const;
     /// Shows every change of a row to an observer from now on. Null ends this.
     void setObserver(std::shared_ptr<ChangeObserver> observer) { observer_ = std::move(observer); }
 
@@ -63,6 +71,7 @@ private:
     std::shared_ptr<ChangeObserver> observer_;
     bool inChange_ = false;
     std::unique_ptr<Session> session_;
+    int generation_ = 0;
     int commandTimeout_ = 30;
     QString odbcOptions_;
 };

@@ -81,6 +81,10 @@ const Dialect& embeddedDialect()
     return dialect;
 }
 
+static const QString tablesWithoutTransactions =
+    u"SELECT TABLE_NAME FROM INFORMATION_SCHEMA.TABLES WHERE TABLE_SCHEMA=DATABASE() AND ENGINE IN (SELECT ENGINE FROM "
+    "INFORMATION_SCHEMA.ENGINES WHERE TRANSACTIONS='NO')"_s;
+
 const Dialect& mySqlDialect()
 {
     static const Dialect dialect{
@@ -91,6 +95,7 @@ const Dialect& mySqlDialect()
         .sameLongText = u"CONVERT(%1 USING utf8mb4)=%2 COLLATE utf8mb4_bin"_s,
         .lockedEnd = u" FOR UPDATE"_s,
         .sessionNumber = u"SELECT CONNECTION_ID()"_s,
+        .withoutTransactions = tablesWithoutTransactions,
     };
     return dialect;
 }

@@ -28,6 +28,7 @@ struct Dialect {
     QString lockedTable = QStringLiteral("%1");  // a table in a SELECT that locks its rows until the commit
     QString lockedEnd = QString();               // the end of such a SELECT
     QString sessionNumber = QString();           // asks for the server's number of the connection
+    QString withoutTransactions = QString();     // asks for the tables whose changes can't be taken back
     QString identityInsert = QString();          // with ON or OFF after it: lets an INSERT give the identity of its row
 
     /// Returns a literal with the prefix that its letters need. An index on a text column serves only one without.

@@ -59,6 +59,8 @@ public:
     /// Gets a named lock. Returns false if someone else, or this connection, still has it after that time.
     virtual bool lock(const QString& name, int seconds) = 0;
     virtual void unlock(const QString& name) = 0;
+    /// Ends another session if it has that lock. The embedded engine has no sessions.
+    virtual void endSession(const QString& /*session*/, const QString& /*lock*/) {}
 
     /// Rebuilds all indexes, if another program can have damaged them.
     virtual void rebuildIndexes() {}

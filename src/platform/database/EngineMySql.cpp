@@ -60,6 +60,7 @@ public:
 
     bool lock(const QString& name, int seconds) override { return server->lock(name, seconds); }
     void unlock(const QString& name) override { server->unlock(name); }
+    void endSession(const QString& session, const QString& lock) override { server->endSession(session, lock); }
 
 protected:
     bool meansConnectionLost(const QSqlError& error) const override
@@ -111,6 +112,7 @@ public:
 
     bool lock(const QString& name, int seconds) override { return server.lock(name, seconds); }
     void unlock(const QString& name) override { server.unlock(name); }
+    void endSession(const QString& session, const QString& lock) override { server.endSession(session, lock); }
 
 protected:
     int statementSeconds() const override { return 0; }

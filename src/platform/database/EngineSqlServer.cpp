@@ -73,6 +73,18 @@ public:
             run(u"EXEC sp_releaseapplock @Resource=%1, @LockOwner='Session'"_s.arg(resource(name)));
     }
 
+    void endSession(const QString& session, const QString& lock) override
+    {
+        // the server shows the first 32 characters of the lock's name
+        const QString owner = lastValue(run(u"SELECT request_session_id FROM sys.dm_tran_locks WHERE "
+                                            "resource_type='APPLICATION' AND request_session_id=%1 AND "
+                                            "CHARINDEX(LEFT(%2, 32), resource_description) > 0"_s.arg(session.toInt())
+                                                .arg(resource(lock))))
+                                  .toString();
+        if (!owner.isEmpty() && owner == session)
+            run(u"KILL "_s + QString::number(session.toInt()));
+    }
+
 protected:
     int statementSeconds() const override { return timeout; }
 
@@ -91,8 +103,9 @@ protected:
     QString sqlState(const OdbcMessage& message) const override
     {
         static const QHash<int, QString> states{{-2, u"HYT00"_s},   {1222, u"HYT00"_s}, {1205, u"40001"_s},
-                                                {207, u"42S22"_s},  {208, u"42S02"_s},  {2601, u"23000"_s},
-                                                {2627, u"23000"_s}, {4060, u"42000"_s}, {18456, u"28000"_s}};
+                                                {229, u"42501"_s},  {230, u"42501"_s},  {207, u"42S22"_s},
+                                                {208, u"42S02"_s},  {2601, u"23000"_s}, {2627, u"23000"_s},
+                                                {4060, u"42000"_s}, {18456, u"28000"_s}};
         return states.value(message.native, message.state);
     }
 
@@ -114,7 +127,8 @@ private:
         static const InformationSchemaTerms terms{
             u"TABLE_CATALOG=DB_NAME() AND TABLE_SCHEMA=SCHEMA_NAME()"_s,
             u"CASE WHEN DATA_TYPE IN ('timestamp', 'rowversion', 'image', 'binary', 'varbinary', 'xml', 'sql_variant', "
-            "'geometry', 'geography', 'hierarchyid') THEN '"_s +
+            "'geometry', 'geography', 'hierarchyid') OR COLUMNPROPERTY(OBJECT_ID(TABLE_SCHEMA + '.' + TABLE_NAME), "
+            "COLUMN_NAME, 'IsComputed')=1 THEN '"_s +
                 InformationSchemaTerms::readOnly +
                 u"' WHEN CHARACTER_MAXIMUM_LENGTH=-1 OR DATA_TYPE IN ('text', 'ntext') THEN 'longtext' "
                 "ELSE DATA_TYPE END"_s,

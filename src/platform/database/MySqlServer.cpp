@@ -14,9 +14,11 @@ MySqlServer::MySqlServer(Engine& engine) : engine_(engine)
 
 const InformationSchemaTerms& MySqlServer::informationSchema()
 {
-    static const InformationSchemaTerms terms{u"TABLE_SCHEMA=DATABASE()"_s,
-                                              u"CASE WHEN COLUMN_TYPE='tinyint(1)' THEN 'boolean' ELSE DATA_TYPE END"_s,
-                                              u"CASE WHEN EXTRA LIKE '%auto_increment%' THEN 1 ELSE 0 END"_s};
+    static const InformationSchemaTerms terms{
+        u"TABLE_SCHEMA=DATABASE()"_s,
+        u"CASE WHEN EXTRA LIKE '%GENERATED%' THEN '"_s + InformationSchemaTerms::readOnly +
+            u"' WHEN COLUMN_TYPE='tinyint(1)' THEN 'boolean' ELSE DATA_TYPE END"_s,
+        u"CASE WHEN EXTRA LIKE '%auto_increment%' THEN 1 ELSE 0 END"_s};
     return terms;
 }
 
@@ -49,6 +51,13 @@ void MySqlServer::unlock(const QString& name)
     engine_.run(u"DO RELEASE_LOCK(%1)"_s.arg(lockName(name)));
 }
 
+void MySqlServer::endSession(const QString& session, const QString& lock)
+{
+    const QVariant owner = engine_.run(u"SELECT IS_USED_LOCK(%1)"_s.arg(lockName(lock))).values.front();
+    if (!session.isEmpty() && owner.toString() == session)
+        engine_.run(u"KILL CONNECTION "_s + QString::number(owner.toLongLong()));
+}
+
 bool MySqlServer::meansConnectionLost(const QString& nativeCode)
 {
     static const QStringList lost{u"2002"_s, u"2003"_s, u"2006"_s, u"2013"_s,
@@ -60,9 +69,10 @@ QString MySqlServer::sqlState(const QString& nativeCode)
 {
     static const QHash<QString, QString> states{
         {u"1044"_s, u"42000"_s}, {u"1045"_s, u"28000"_s}, {u"1049"_s, u"42000"_s}, {u"1054"_s, u"42S22"_s},
-        {u"1062"_s, u"23000"_s}, {u"1064"_s, u"42000"_s}, {u"1146"_s, u"42S02"_s}, {u"1205"_s, u"HYT00"_s},
-        {u"1213"_s, u"40001"_s}, {u"1969"_s, u"70100"_s}, {u"2002"_s, u"08001"_s}, {u"2003"_s, u"08001"_s},
-        {u"2005"_s, u"08001"_s}, {u"2006"_s, u"08S01"_s}, {u"2013"_s, u"08S01"_s}};
+        {u"1062"_s, u"23000"_s}, {u"1142"_s, u"42501"_s}, {u"1143"_s, u"42501"_s}, {u"1064"_s, u"42000"_s},
+        {u"1146"_s, u"42S02"_s}, {u"1205"_s, u"HYT00"_s}, {u"1213"_s, u"40001"_s}, {u"1969"_s, u"70100"_s},
+        {u"2002"_s, u"08001"_s}, {u"2003"_s, u"08001"_s}, {u"2005"_s, u"08001"_s}, {u"2006"_s, u"08S01"_s},
+        {u"2013"_s, u"08S01"_s}};
     return states.value(nativeCode, u"HY000"_s);
 }
 

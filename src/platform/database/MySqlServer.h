@@ -22,6 +22,7 @@ public:
 
     bool lock(const QString& name, int seconds);
     void unlock(const QString& name);
+    void endSession(const QString& session, const QString& lock);
 
     /// Returns true if an error code of the server says that the connection is lost.
     static bool meansConnectionLost(const QString& nativeCode);

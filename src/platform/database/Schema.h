@@ -16,7 +16,7 @@ struct TableColumn {
     int size = 0;    // characters of a text; 0 means no limit
     int scale = -1;  // digits after the point of an exact number; -1 for a floating-point number
     bool identity = false;
-    bool readOnly = false;  // a version of the row, or a type that no statement compares or writes
+    bool readOnly = false;  // computed, a version of the row, or a type that no statement compares or writes
     bool hasDefault = false;
 };
 
