@@ -6,7 +6,6 @@
 #include "app/Outcome.h"
 #include "app/TransportCommand.h"
 #include "base/CredentialCipher.h"
-#include "base/Interruptions.h"
 #include "base/ModRegistry.h"
 #include "base/SharedVariables.h"
 #include "jobexport/JobLinkSettings.h"
@@ -20,6 +19,7 @@
 #include "platform/profile.h"
 #include "platform/script/Script.h"
 #include "platform/settings/registry.h"
+#include "recovery/Recovery.h"
 #include "setup/Profile.h"
 #include "shell/component.h"
 #include "shell/eKEST.h"
@@ -311,13 +311,14 @@ Outcome runConnected(const Command& command, const CommandLine& line)
     if (!hasConnection())
         return {.exitCode = NoConnection};
     InitCipherKey();  // as the panel does, because a load may export to JobLink
-    attempt([] { journal::findInterrupted(); });
-    const QList<journal::Entry> interrupted = journal::takeInterrupted();
-    for (const journal::Entry& entry : interrupted)
-        say(u"kest2: "_s + journal::interruptionOf(entry) + u'\n', stderr);
+    recovery::settle();
+    QList<recovery::Settled> settled = recovery::takeSettled();
     Outcome outcome = command.run(line);
-    if (!interrupted.isEmpty())
-        outcome.fields[u"recovered"_s] = jsonOf(interrupted);
+    settled += recovery::takeSettled();
+    for (const recovery::Settled& operation : settled)
+        say(u"kest2: "_s + operation.sentence() + u'\n', stderr);
+    if (!settled.isEmpty())
+        outcome.fields[u"recovered"_s] = jsonOf(settled);
     return outcome;
 }
 

@@ -75,15 +75,15 @@ Outcome history(const QStringList& arguments)
     return {.fields = {{u"operations"_s, operations}}, .text = text};
 }
 
-QJsonArray jsonOf(const QList<journal::Entry>& interrupted)
+QJsonArray jsonOf(const QList<recovery::Settled>& operations)
 {
     QJsonArray told;
-    for (const journal::Entry& entry : interrupted)
-        told.append(QJsonObject{{u"operation"_s, entry.id},
-                                {u"kind"_s, entry.kind},
-                                {u"file"_s, entry.file},
-                                {u"outcome"_s, u"left"_s},
-                                {u"left"_s, QJsonArray{journal::interruptionOf(entry)}}});
+    for (const recovery::Settled& settled : operations)
+        told.append(QJsonObject{{u"operation"_s, settled.operation.id},
+                                {u"kind"_s, settled.operation.kind},
+                                {u"file"_s, settled.operation.file},
+                                {u"outcome"_s, recovery::wordOf(settled.outcome)},
+                                {u"left"_s, QJsonArray::fromStringList(settled.left)}});
     return told;
 }
 

@@ -2,7 +2,7 @@
 #pragma once
 
 #include "app/Outcome.h"
-#include "base/Interruptions.h"
+#include "recovery/Recovery.h"
 
 #include <QJsonArray>
 #include <QStringList>
@@ -13,6 +13,6 @@ namespace kest::app {
 Outcome history(const QStringList& arguments);
 
 /// Returns interrupted operations for the JSON object of a command.
-QJsonArray jsonOf(const QList<journal::Entry>& interrupted);
+QJsonArray jsonOf(const QList<recovery::Settled>& operations);
 
 }  // namespace kest::app

@@ -8,6 +8,8 @@
 #include "platform/database/Sql.h"
 #include "platform/values.h"
 
+#include <QJsonDocument>
+
 #include <algorithm>
 
 namespace kest::journal {
@@ -30,7 +32,10 @@ Entry entryAt(const db::Recordset& row)
     entry.subquote = row.text(u"Subquote"_s);
     entry.workstation = row.text(u"Workstation"_s);
     entry.lock = row.text(u"LockName"_s);
+    entry.serverSession = row.text(u"ServerSession"_s);
     entry.started = row.value(u"StartedAt"_s).toDateTime();
+    entry.pastPoint = isTrue(row.value(u"PastPoint"_s));
+    entry.facts = QJsonDocument::fromJson(row.text(u"Facts"_s).toUtf8()).object();
     return entry;
 }
 
@@ -100,9 +105,9 @@ Entry entryOf(qint64 operation)
     return entries(sql("SELECT * FROM KESTOperation WHERE Operation={}", operation)).value(0);
 }
 
-QList<Entry> openOperations()
+QList<Entry> pendingOperations()
 {
-    return entries(u"SELECT * FROM KESTOperation WHERE State='open' ORDER BY Operation"_s);
+    return entries(u"SELECT * FROM KESTOperation WHERE State IN ('open', 'unfinished') ORDER BY Operation"_s);
 }
 
 QList<RecordedChange> changesOf(qint64 operation)
@@ -157,7 +162,8 @@ void prune()
     const QDateTime limit = QDateTime::currentDateTime().addDays(-daysKept());
     for (qint64 room = prunedAtOnce; room > 0;) {
         const db::Recordset oldest =
-            opened(sql("SELECT TOP 1 Operation FROM KESTOperation WHERE StartedAt<'{}' AND State<>'open' ORDER BY "
+            opened(sql("SELECT TOP 1 Operation FROM KESTOperation WHERE StartedAt<'{}' AND State<>'open' AND "
+                       "State<>'unfinished' ORDER BY "
                        "Operation",
                        limit.toString(u"yyyy-MM-ddTHH:mm:ss"_s)));
         if (oldest.eof())

@@ -22,8 +22,8 @@ struct RecordedChange {
 QList<Entry> historyOf(const QString& number, const QString& subquote);
 /// Returns an operation as it is now. Its id is 0 if there is none.
 Entry entryOf(qint64 operation);
-/// Returns the operations that are running or were interrupted.
-QList<Entry> openOperations();
+/// Returns the operations that are running, were interrupted, or have files that wait.
+QList<Entry> pendingOperations();
 /// Returns what an operation changed, in the order of the changes.
 QList<RecordedChange> changesOf(qint64 operation);
 
@@ -34,8 +34,8 @@ QStringList linesOf(const db::RowChange& row);
 /// Returns a title such as "load of AUQT_1007.xml", "send" or "save in the utilities".
 QString titleOf(const Entry& entry);
 
-/// Deletes operations that are older than the setting "JournalDays", but none that is still open. Deletes at most 1,000
-/// rows at a time, the oldest first.
+/// Deletes operations that are older than the setting "JournalDays", but none that is open or unfinished. Deletes at
+/// most 1,000 rows at a time, the oldest first.
 void prune();
 
 }  // namespace kest::journal

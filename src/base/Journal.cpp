@@ -1,5 +1,6 @@
 #include "base/Journal.h"
 
+#include "base/History.h"
 #include "base/JournalRecord.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
@@ -7,10 +8,15 @@
 #include "platform/RuntimeError.h"
 #include "platform/database/Change.h"
 #include "platform/database/Sql.h"
+#include "platform/files/Lock.h"
+#include "platform/profile.h"
 #include "platform/values.h"
 
 #include <QCoreApplication>
 #include <QCryptographicHash>
+#include <QScopeGuard>
+#include <QSet>
+#include <QSysInfo>
 #include <QUuid>
 
 #include <array>
@@ -22,7 +28,8 @@ using namespace Qt::StringLiterals;
 namespace {
 
 constexpr std::array kindWords{"load"_L1, "send"_L1, "save"_L1, "response"_L1};
-constexpr std::array stateWords{"open"_L1, "done"_L1, "failed"_L1, "interrupted"_L1};
+constexpr std::array stateWords{"open"_L1,       "unfinished"_L1,  "done"_L1,    "failed"_L1,
+                                "taken back"_L1, "interrupted"_L1, "finished"_L1};
 
 /// The operation at work.
 struct Work {
@@ -33,8 +40,15 @@ struct Work {
     QString subquote;
     QString lockName;
     std::unique_ptr<db::Lock> lock;
-    qint64 id = 0;             // 0 until its first change
-    bool isCommitted = false;  // with that change
+    std::unique_ptr<files::Lock> sign;  // of life, for other processes of the profile
+    int generation = 0;                 // of the connection that has the lock
+    QString serverSession;              // of that connection
+    bool isLost = false;                // to another workstation
+    qint64 id = 0;                      // 0 until its first change
+    bool isCommitted = false;           // with that change
+    State state = State::Open;
+    bool isPointAhead = false;  // the next change is the last
+    QJsonObject facts;
 };
 
 std::unique_ptr<Work> work;
@@ -42,6 +56,102 @@ std::unique_ptr<Work> work;
 QString now()
 {
     return QDateTime::currentDateTime().toString(u"yyyy-MM-ddTHH:mm:ss"_s);
+}
+
+/// Takes the lock that tells others that the owner of the work lives. Returns false if someone else has it.
+bool takeLock(int seconds)
+{
+    work->lock.reset();  // first, because it may be that of a lost connection
+    work->lock = std::make_unique<db::Lock>(gConn, work->lockName, seconds);
+    work->generation = gConn->generation();
+    work->serverSession = gConn->serverSession();
+    return work->lock->isHeld();
+}
+
+bool isStillOpen()
+{
+    constexpr int patience = 5;  // seconds, in which the server notices that the session is gone
+    attempt([] { gConn->endSession(work->serverSession, work->lockName); });  // or the server does so later
+    if (!takeLock(patience))
+        return false;
+    const db::Recordset row = opened(sql("SELECT State FROM KESTOperation WHERE Operation={}", work->id));
+    return !row.eof() && row.text(u"State"_s) == wordOf(work->state);
+}
+
+/// A lost connection has lost the lock, too, so that another workstation may have settled the work.
+void requireOwner()
+{
+    if (!work->isLost && gConn->generation() != work->generation) {
+        work->isLost = true;  // also if the question fails
+        work->isLost = !isStillOpen();
+    }
+    if (work->isLost)
+        throw RuntimeError(RowChanged, u"This work was interrupted, and another workstation has settled it."_s);
+}
+
+QString signFile()
+{
+    return profile::root() + u"/operations.lock"_s;
+}
+
+/// Returns a text that only processes of this profile on this machine have.
+QString place()
+{
+    return hashOf(QString::fromLatin1(QSysInfo::machineUniqueId()) + profile::root());
+}
+
+void openOperation()
+{
+    work->lockName = u"operation "_s + QUuid::createUuid().toString(QUuid::WithoutBraces);
+    takeLock(0);
+    if (!work->serverSession.isEmpty() &&
+        attempt([] { work->sign = std::make_unique<files::Lock>(signFile(), work->lockName); }))
+        work->facts[u"place"_s] = place();
+    db::Recordset row(gConn);
+    row.open(u"SELECT * FROM KESTOperation WHERE Operation=0"_s);
+    row.addNew();
+    row.set(u"OperationKind"_s, wordOf(work->kind));
+    row.set(u"State"_s, wordOf(State::Open));
+    row.set(u"FileName"_s, work->file);
+    row.set(u"FileHash"_s, work->hash);
+    row.set(u"QTNNO"_s, work->number);
+    row.set(u"Subquote"_s, work->subquote);
+    row.set(u"Workstation"_s, GetComputerName());
+    row.set(u"ProcessId"_s, QCoreApplication::applicationPid());
+    row.set(u"ServerSession"_s, work->serverSession);
+    row.set(u"LockName"_s, work->lockName);
+    row.set(u"StartedAt"_s, now());
+    row.set(u"PastPoint"_s, false);
+    row.set(u"Facts"_s, asciiJson(work->facts));
+    row.update();
+    work->id = toLong(row.value(u"Operation"_s));
+}
+
+void markPoint()
+{
+    gConn->execute(sql("UPDATE KESTOperation SET PastPoint=1, Facts='{}', QTNNO='{}', Subquote='{}' WHERE Operation={}",
+                       asciiJson(work->facts), work->number, work->subquote, work->id));
+}
+
+/// Returns why the changes of this database can't be taken back, or an empty text if they can.
+QString transactionFault(const db::Connection& connection)
+{
+    const QStringList without = connection.tablesWithoutTransactions();
+    for (const QString& table : u"KESTOperation KESTJournal QUOTE1 QUOTE2 QUOTE3 CAR"_s.split(u' '))
+        if (without.contains(table, Qt::CaseInsensitive))
+            return u"The table %1 has no transactions"_s.arg(table);
+    return {};
+}
+
+/// Writes to the error log why the database keeps no journal, once for each reason.
+void tellNoJournal(const QString& why)
+{
+    static QSet<QString> reasons;
+    if (reasons.contains(why))
+        return;
+    reasons.insert(why);
+    const QString told = why + u": what changes a quote is not recorded, and interrupted work is not taken back."_s;
+    attempt([&] { logFailure(RuntimeError(NoObject, told), u"Journal.watch"_s); });
 }
 
 class Recorder final : public db::ChangeObserver {
@@ -53,13 +163,17 @@ public:
     }
     QStringList wantedColumns() const override { return {u"QTNNO"_s, u"Subquote"_s}; }
     void changed(db::Connection& connection, const QList<db::RowChange>& rows) override;
-    void committed() override { work->isCommitted = true; }
+    void committed() override;
     void takenBack() override;
 
     bool isKept = false;
 
+    /// Runs the first record of an operation. If the database forbids it, there is no journal from now on.
+    template <class Step>
+    void unlessForbidden(Step&& step);
+
 private:
-    void openOperation(db::Connection& connection);
+    void record(const QList<db::RowChange>& rows);
 };
 
 std::shared_ptr<Recorder> recorder = std::make_shared<Recorder>();
@@ -72,26 +186,10 @@ QVariant valueOf(const db::RowChange& row, const QString& name)
     return row.kind == db::ChangeKind::Delete ? column->before : column->after;
 }
 
-void Recorder::openOperation(db::Connection& connection)
+void Recorder::committed()
 {
-    work->lockName = u"operation "_s + QUuid::createUuid().toString(QUuid::WithoutBraces);
-    work->lock = std::make_unique<db::Lock>(gConn, work->lockName);  // shows others that its owner is running
-    db::Recordset row(gConn);
-    row.open(u"SELECT * FROM KESTOperation WHERE Operation=0"_s);
-    row.addNew();
-    row.set(u"OperationKind"_s, wordOf(work->kind));
-    row.set(u"State"_s, wordOf(State::Open));
-    row.set(u"FileName"_s, work->file);
-    row.set(u"FileHash"_s, work->hash);
-    row.set(u"QTNNO"_s, work->number);
-    row.set(u"Subquote"_s, work->subquote);
-    row.set(u"Workstation"_s, GetComputerName());
-    row.set(u"ProcessId"_s, QCoreApplication::applicationPid());
-    row.set(u"ServerSession"_s, connection.serverSession());
-    row.set(u"LockName"_s, work->lockName);
-    row.set(u"StartedAt"_s, now());
-    row.update();
-    work->id = toLong(row.value(u"Operation"_s));
+    work->isCommitted = true;
+    work->isPointAhead = false;  // it was this change
 }
 
 /// The operation's own row has gone with its first change.
@@ -101,9 +199,31 @@ void Recorder::takenBack()
         return;
     work->id = 0;
     work->lock.reset();
+    work->sign.reset();
 }
 
-void Recorder::changed(db::Connection& connection, const QList<db::RowChange>& rows)
+template <class Step>
+void Recorder::unlessForbidden(Step&& step)
+{
+    try {
+        step();
+    } catch (const RuntimeError& error) {
+        if (work->isCommitted || error.sqlState() != "42501"_L1)
+            throw;
+        isKept = false;
+        tellNoJournal(error.description());
+        if (work->id != 0)  // only the other table is forbidden
+            gConn->execute(sql("DELETE FROM KESTOperation WHERE Operation={}", work->id));
+        takenBack();
+    }
+}
+
+void Recorder::changed(db::Connection&, const QList<db::RowChange>& rows)
+{
+    unlessForbidden([&] { record(rows); });
+}
+
+void Recorder::record(const QList<db::RowChange>& rows)
 {
     for (const db::RowChange& row : rows) {
         const QVariant number = valueOf(row, u"QTNNO"_s);
@@ -113,16 +233,20 @@ void Recorder::changed(db::Connection& connection, const QList<db::RowChange>& r
         }
     }
     if (work->id == 0)
-        openOperation(connection);
+        openOperation();
+    else
+        requireOwner();
     const QString moment = now();
     for (const db::RowChange& row : rows) {
         const QVariant number = valueOf(row, u"QTNNO"_s);
         const QVariant subquote = valueOf(row, u"Subquote"_s);
-        connection.execute(
+        gConn->execute(
             sql("INSERT INTO KESTJournal (Operation, ChangedAt, TableName, QTNNO, Subquote, RowData, "
                 "Settled) VALUES ({}, '{}', '{}', '{}', '{}', '{}', 0)",
                 work->id, moment, row.table, textOrEmpty(number), textOrEmpty(subquote), textOf(row)));
     }
+    if (work->isPointAhead)
+        markPoint();
 }
 
 }  // namespace
@@ -144,19 +268,21 @@ QString hashOf(const QString& text)
 
 void watch(const db::ConnectionPtr& connection)
 {
-    static bool isTold = false;
     recorder->isKept = false;  // until the database has answered
-    recorder->isKept = connection->hasTable(u"KESTOperation"_s) && connection->hasTable(u"KESTJournal"_s);
+    const bool hasTables = connection->hasTable(u"KESTOperation"_s) && connection->hasTable(u"KESTJournal"_s);
+    const QString fault = hasTables ? transactionFault(*connection) : u"The database has no tables for the journal"_s;
+    recorder->isKept = fault.isEmpty();
     connection->setObserver(recorder);
-    if (!recorder->isKept && !isTold) {
-        isTold = true;
-        attempt([] {
-            logFailure(
-                RuntimeError(NoObject,
-                             u"The database has no tables for the journal: what changes a quote is not recorded."_s),
-                u"Journal.watch"_s);
-        });
-    }
+    if (!recorder->isKept)
+        tellNoJournal(fault);
+}
+
+void endDeadSession(const Entry& entry)
+{
+    if (entry.serverSession.isEmpty() || entry.facts[u"place"_s] != place())
+        return;
+    if (files::Lock(signFile(), entry.lock).isHeld())
+        attempt([&] { gConn->endSession(entry.serverSession, entry.lock); });
 }
 
 bool isKept()
@@ -180,21 +306,95 @@ Operation::Operation(Kind kind, const QString& file, const QString& hash)
     work->hash = hash;
 }
 
+Operation::Operation(Entry& entry)
+{
+    if (work)
+        return;
+    auto lock = std::make_unique<db::Lock>(gConn, entry.lock);
+    const QString stateBefore = entry.state;
+    if (!lock->isHeld())
+        return;
+    entry = entryOf(entry.id);
+    if (entry.state != stateBefore)
+        return;
+    isOutermost = isResumed = true;
+    work = std::make_unique<Work>();
+    work->file = entry.file;
+    work->hash = entry.hash;
+    work->number = entry.number;
+    work->subquote = entry.subquote;
+    work->lockName = entry.lock;
+    work->lock = std::move(lock);
+    work->generation = gConn->generation();
+    work->serverSession = gConn->serverSession();
+    work->id = entry.id;
+    work->isCommitted = true;
+    work->state = entry.state == wordOf(State::Open) ? State::Open : State::Unfinished;
+    work->facts = entry.facts;
+}
+
 Operation::~Operation()
 {
-    end(State::Failed);
+    if (!isResumed)
+        end(State::Failed);
+    else if (isOutermost)
+        work.reset();
 }
 
 void Operation::end(State state)
 {
     if (!isOutermost || !work)
         return;
-    const std::unique_ptr<Work> ended = std::move(work);
-    if (ended->id == 0)
-        return;
     attempt([&] {  // without a connection it stays open
-        gConn->execute(sql("UPDATE KESTOperation SET State='{}', EndedAt='{}' WHERE Operation={} AND State='open'",
-                           wordOf(state), now(), ended->id));
+        if (work->id == 0)
+            return;
+        requireOwner();
+        gConn->execute(sql("UPDATE KESTOperation SET State='{}', EndedAt='{}' WHERE Operation={}", wordOf(state), now(),
+                           work->id));
+    });
+    work.reset();
+}
+
+void passPoint(const std::function<void()>& lastUpdate, const QJsonObject& facts)
+{
+    if (!work || !recorder->isKept)
+        return lastUpdate();
+    for (auto fact = facts.begin(); fact != facts.end(); ++fact)
+        work->facts[fact.key()] = fact.value();
+    work->isPointAhead = true;
+    const auto end = qScopeGuard([] { work->isPointAhead = false; });
+    lastUpdate();
+    if (!work->isPointAhead || work->id == 0)
+        return;
+    requireOwner();  // the last update has changed nothing, so that nothing was recorded
+    markPoint();
+}
+
+void keep(const QString& fact, const QJsonValue& value)
+{
+    if (!work || !recorder->isKept || work->facts.value(fact) == value)
+        return;
+    work->facts[fact] = value;
+    if (work->id == 0)
+        return;
+    requireOwner();
+    gConn->execute(sql("UPDATE KESTOperation SET Facts='{}' WHERE Operation={}", asciiJson(work->facts), work->id));
+}
+
+QJsonValue kept(const QString& fact)
+{
+    return work ? work->facts.value(fact) : QJsonValue(QJsonValue::Undefined);
+}
+
+void openNow(const QString& number, const QString& subquote)
+{
+    if (!work || !recorder->isKept || work->id != 0)
+        return;
+    work->number = number;
+    work->subquote = subquote;
+    recorder->unlessForbidden([] {
+        openOperation();
+        work->isCommitted = true;
     });
 }
 

@@ -1,4 +1,5 @@
-// The journal: what each operation changed in the quote database, so that every change of a quote can be explained.
+// The journal: what each operation changed in the quote database, so that every change of a quote can be explained, and
+// interrupted work can be taken back or finished.
 //
 // An operation is a load of a message, a send, a save in the utilities or a submission response. Its row in
 // KESTOperation and the record of each changed row in KESTJournal are written in the transaction of the change that
@@ -9,8 +10,10 @@
 #include "platform/database/Connection.h"
 
 #include <QDateTime>
+#include <QJsonObject>
 #include <QString>
 
+#include <functional>
 #include <memory>
 
 namespace kest::journal {
@@ -19,10 +22,13 @@ enum class Kind { Load, Send, Save, Response };
 
 /// What became of an operation.
 enum class State {
-    Open,    // at work, or interrupted
-    Done,    //
-    Failed,  // refused, or ended by a failure; what it wrote stays
-    Interrupted,
+    Open,        // at work, or interrupted
+    Unfinished,  // the tables are complete; a message waits to be moved, or pictures wait to be sent
+    Done,
+    Failed,       // refused, or ended by a failure; what it wrote stays
+    TakenBack,    // interrupted, and its changes taken back
+    Interrupted,  // interrupted, and not all of its changes could be taken back
+    Finished,     // interrupted, and finished later
 };
 
 QString wordOf(Kind kind);
@@ -38,8 +44,11 @@ struct Entry {
     QString number;  // of the quote, with its subquote; empty if none was changed
     QString subquote;
     QString workstation;
-    QString lock;  // the name of the lock that its owner has
+    QString lock;           // the name of the lock that its owner has
+    QString serverSession;  // of its owner; empty on the embedded engine
     QDateTime started;
+    bool pastPoint = false;  // its last update was committed, so it is finished and not taken back
+    QJsonObject facts;       // what finishing it needs
 };
 
 /// Returns a hash that identifies the text of a message or document.
@@ -47,6 +56,10 @@ QString hashOf(const QString& text);
 
 /// Makes the journal see the changes on the connection. Call it once the connection is open.
 void watch(const db::ConnectionPtr& connection);
+
+/// If the owner of an operation was a process of this profile that no longer lives, ends its session on the server,
+/// which could hold its locks for hours.
+void endDeadSession(const Entry& entry);
 
 /// Returns true if the connection's database keeps a journal.
 bool isKept();
@@ -60,15 +73,33 @@ bool isAtWork();
 class Operation {
 public:
     explicit Operation(Kind kind, const QString& file = {}, const QString& hash = {});
+    /// Goes on with interrupted work, which `entry` then describes as it is now. It stays open if it is not ended.
+    explicit Operation(Entry& entry);
     ~Operation();
     Operation(const Operation&) = delete;
     Operation& operator=(const Operation&) = delete;
 
+    /// Returns false if the interrupted work has an owner who is at work on it, or was settled meanwhile.
+    bool isOwner() const { return isOutermost; }
     /// Stores what became of it. If the connection is lost it stays open.
     void end(State state);
 
 private:
     bool isOutermost = false;
+    bool isResumed = false;
 };
+
+// These do nothing outside of an operation. They throw RowChanged if another workstation has settled this operation
+// after its connection was lost.
+
+/// Runs the last update of an operation. Once that is committed, an interrupted operation is finished and no longer
+/// taken back; the facts that finishing it needs are committed with it.
+void passPoint(const std::function<void()>& lastUpdate, const QJsonObject& facts = {});
+/// Commits a fact that finishing the operation needs, or leaves it to the first change.
+void keep(const QString& fact, const QJsonValue& value);
+/// Returns a fact that was kept, also before the operation was interrupted.
+QJsonValue kept(const QString& fact);
+/// Opens the operation without a change, for one that begins with a file.
+void openNow(const QString& number, const QString& subquote);
 
 }  // namespace kest::journal

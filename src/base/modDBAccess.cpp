@@ -12,6 +12,8 @@
 #include <QElapsedTimer>
 #include <QSysInfo>
 
+#include <utility>
+
 namespace kest {
 
 using namespace Qt::StringLiterals;
@@ -30,7 +32,8 @@ constexpr qint64 pauseMilliseconds = 5000;  // before a silent server is tried a
 constexpr auto mysqlServer = "mysql:"_L1;
 
 std::optional<RuntimeError> lastFailure;  // from the last attempt to open the connection
-QDeadlineTimer silence;                   // until then, a silent server is not tried again
+std::function<void()> afterOpening;
+QDeadlineTimer silence;  // until then, a silent server is not tried again
 
 QString splashSetting(const QString& key, const QString& fallback = {})
 {
@@ -108,7 +111,14 @@ bool EnsureConnection()
         return false;  // otherwise each of several steps would wait for the same server
     OpenDatabase();
     gConn = gcnDB;
+    if (isOpen() && afterOpening)
+        attempt(afterOpening);
     return isOpen();
+}
+
+void setAfterOpening(std::function<void()> step)
+{
+    afterOpening = std::move(step);
 }
 
 void OpenDatabase()

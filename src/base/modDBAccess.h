@@ -6,6 +6,7 @@
 
 #include <QString>
 
+#include <functional>
 #include <optional>
 
 namespace kest {
@@ -21,6 +22,8 @@ db::ConnectionPtr GetConnection();
 /// Opens the connection if it is closed or if the server has dropped it, and returns whether it is open. Every action
 /// of a user that needs the database calls this first.
 bool EnsureConnection();
+/// Sets what runs each time that EnsureConnection() has opened the connection.
+void setAfterOpening(std::function<void()> step);
 /// Reads the settings and opens the connection. If that fails, the connection is closed afterwards, and the reason is
 /// in the error log.
 void OpenDatabase();

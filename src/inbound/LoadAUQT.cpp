@@ -1,5 +1,6 @@
 // Loads an authorised quote: the insurer accepts a quote, unchanged or with changed lines, under an authority number.
 #include "base/Helpers.h"
+#include "base/Journal.h"
 #include "base/modDBAccess.h"
 #include "base/modLoggerEx.h"
 #include "inbound/LoadQuoteBody.h"
@@ -216,7 +217,9 @@ bool authorise(QString& text)
     notes.update();
     if (lines.recordCount() > 0)
         lines.moveFirst();  // a search without a match has left them at their end, and the totals would be 0
-    if (!CalcAuthorisedTotals(quote, lines))
+    bool isStored = false;
+    journal::passPoint([&] { isStored = CalcAuthorisedTotals(quote, lines); });
+    if (!isStored)
         tellOldTotals(quote);
     if (comparison)
         finishAuthReport(*comparison, quote, lines);

@@ -76,7 +76,7 @@ bool LoadADQT(QString& text, const QString& fileName)
 
     applyTransition(adjustmentSuggested, quote);
     quote.header().update();
-    quote.notes().update();
+    journal::passPoint([&] { quote.notes().update(); });
     PrintXML(fileName, false);
     return true;
 }
@@ -96,7 +96,7 @@ bool LoadARES(QString& text, const QString&)
     applyTransition(quote.isSupplementary() ? supplementaryRejected : lost, quote,
                     reasonOfCode(code).value_or(u"Unknown Reason Code - "_s + code));
     quote.header().update();
-    quote.notes().update();
+    journal::passPoint([&] { quote.notes().update(); });
     return true;
 }
 
@@ -111,7 +111,7 @@ bool LoadBACA(QString& text, const QString& fileName)
 
     applyTransition(backOutOf(quote), quote);
     quote.header().update();
-    quote.notes().update();
+    journal::passPoint([&] { quote.notes().update(); });
     PrintXML(fileName, false);
     return true;
 }
@@ -140,7 +140,7 @@ void LoadSubmissionResponse(QString& text, const QString& fileName)
         applyTransition(quoteSubmitted, quote);
     journal::Operation operation(journal::Kind::Response, fileName, journal::hashOf(text));
     quote.header().update();
-    quote.notes().update();
+    journal::passPoint([&] { quote.notes().update(); });
     operation.end(journal::State::Done);
 }
 

@@ -1,5 +1,6 @@
 // Loads a manual quote: a quote that was written outside the shop's system becomes one of its quotes, with all lines.
 #include "base/Helpers.h"
+#include "base/Journal.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "inbound/LoadQuoteBody.h"
@@ -245,7 +246,7 @@ bool LoadMANQ(QString& text, const QString& fileName)
     quote.update();
 
     setColumns(notes, {{"QTNNO"_L1, quote.value(u"QTNNO"_s)}, {"Subquote"_L1, quote.value(u"Subquote"_s)}});
-    notes.update();
+    journal::passPoint([&] { notes.update(); }, {{u"matched"_s, quote.text(u"QTNNO"_s)}});
     PrintXML(fileName, false);
     gsMatchedQTNNO = quote.text(u"QTNNO"_s);
     return true;

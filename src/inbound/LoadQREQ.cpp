@@ -1,7 +1,9 @@
 // Loads a quote request, which becomes a new quote without lines, with its car, customer, note and photographs.
 #include "base/Helpers.h"
+#include "base/Journal.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
+#include "inbound/Finishing.h"
 #include "inbound/Loading.h"
 #include "inbound/NextNumbers.h"
 #include "inbound/modLoadXML.h"
@@ -220,14 +222,28 @@ QString newImagePath(const QString& quoteNumber)
     }
 }
 
+/// Moves a picture to the host's images of the quote. The name is kept before, so that an interrupted move ends under
+/// it.
+void takePhotograph(const QString& arrived, const QString& path, const QString& quoteNumber)
+{
+    const QString begun = journal::kept(arrived).toString();
+    if (!begun.isEmpty() && files::exists(begun) && files::readBytes(begun) == files::readBytes(path))
+        return files::remove(path);
+    const QString target = begun.isEmpty() || files::exists(begun) ? newImagePath(quoteNumber) : begun;
+    journal::keep(arrived, target);
+    files::move(path, target);
+}
+
 /// Moves the pictures of the request that have arrived to the host's images of the quote.
 void takePhotographs(const xml::Node& root, const QString& requestNumber, const QString& quoteNumber)
 {
     for (const xml::Node& imageId : root.selectNodes(u"rootns:quoteRequestImageIds/*"_s)) {
         const QString arrived = requestNumber + u'_' + PadZeroLeft(imageId.text(), 3);
-        if (!files::isPlainName(arrived) || !files::exists(gsUnreadPath + arrived + u".jpg"_s))
+        const bool isHere = files::isPlainName(arrived) && files::exists(gsUnreadPath + arrived + u".jpg"_s);
+        if (isHere)
+            takePhotograph(arrived, gsUnreadPath + arrived + u".jpg"_s, quoteNumber);
+        else if (journal::kept(arrived).isUndefined())
             continue;
-        files::move(gsUnreadPath + arrived + u".jpg"_s, newImagePath(quoteNumber));
         if (files::exists(gsUnreadPath + arrived + u".txt"_s))
             files::remove(gsUnreadPath + arrived + u".txt"_s);
     }
@@ -314,13 +330,20 @@ bool LoadQREQ(QString& text, const QString& fileName)
     car.update();
     quote.update();
     newQuotes.reset();
-    notes.update();
+    journal::passPoint([&] { notes.update(); });
 
     PrintXML(fileName, false);
     takePhotographs(message->documentElement(), request.number, quoteNumber);
-
     countOn(cinfo);
     return true;
+}
+
+void finishRequest(QString& text, const QString& quoteNumber)
+{
+    const SharedMessage message = sharedMessage(text);
+    takePhotographs(message->documentElement(), message->textOf(u"//rootns:quoteRequestNumber"_s), quoteNumber);
+    db::Recordset cinfo = opened(u"SELECT * FROM CINFO"_s);
+    countOn(cinfo);
 }
 
 }  // namespace kest

@@ -1,5 +1,6 @@
 #include "inbound/LoadQuoteBody.h"
 
+#include "base/Journal.h"
 #include "base/QuoteKey.h"
 #include "base/modDBAccess.h"
 #include "base/modLoggerEx.h"
@@ -13,6 +14,8 @@
 #include "platform/values.h"
 #include "quotedata/NetworkCodes.h"
 #include "quotedata/Vendors.h"
+
+#include <QJsonArray>
 
 namespace kest {
 
@@ -235,7 +238,12 @@ qint64 takeDocument(const db::Recordset& quote, const MessageLine& line, qint64 
     if (number == 0)
         number = numberForDocument(key, before);
     const QString path = NextDocumentName(key.number, key.subquote, number);
-    files::writeBytes(path, files::fromBase64(document.utf8()));
+    const QByteArray bytes = files::fromBase64(document.utf8());
+    // first, so that taking an interrupted load back removes the document, too
+    QJsonArray written = journal::kept(u"documents"_s).toArray();
+    written.append(QJsonArray{path, journal::hashOf(QString::fromLatin1(bytes))});
+    journal::keep(u"documents"_s, written);
+    files::writeBytes(path, bytes);
     gbSubletDocumentArrived = true;
     return number;
 }

@@ -1,4 +1,5 @@
 // Loads the six messages that change the state of a quote but not its lines.
+#include "base/Journal.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "inbound/Loading.h"
@@ -53,12 +54,20 @@ bool agreesToDeletion()
     return desktop::ask(lines.join(u"\r\n"_s), desktop::Icon::None, {}, desktop::Answer::No);
 }
 
+/// What the file move needs.
+QJsonObject deletedKey()
+{
+    return {{u"deletedNumber"_s, gsDeletedQTNNO}, {u"deletedSubquote"_s, gsDeletedSubquote}};
+}
+
 void deleteQuoteRows(const QuoteKey& key)
 {
     const auto& [number, subquote] = key;
     gConn->execute(sql("DELETE FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE={}", number, subquote));
     gConn->execute(sql("DELETE FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE={}", number, subquote));
-    gConn->execute(sql("DELETE FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE={}", number, subquote));
+    journal::passPoint(
+        [&] { gConn->execute(sql("DELETE FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE={}", number, subquote)); },
+        deletedKey());
 }
 
 }  // namespace
@@ -80,7 +89,7 @@ bool LoadQMQR(QString& text, const QString& fileName)
                });
     applyTransition(quoteMatched, quote);
     quote.header().update();
-    quote.notes().update();
+    journal::passPoint([&] { quote.notes().update(); });
     PrintXML(fileName, false);
     return true;
 }
@@ -101,7 +110,7 @@ bool LoadEWAP(QString& text, const QString& fileName)
         reference);
     EnsureConnection();  // the box may have been open for hours
     quote.header().update();
-    quote.notes().update();
+    journal::passPoint([&] { quote.notes().update(); });
     PrintXML(fileName, false);
     return true;
 }
@@ -124,7 +133,7 @@ bool LoadQTDL(QString& text, const QString&)
     if (!quote.isSupplementary()) {
         applyTransition(quoteDeleted, quote.header(), notes, reason);
         quote.header().update();
-        notes.update();
+        journal::passPoint([&] { notes.update(); }, deletedKey());
     } else if ((taken = agreesToDeletion())) {
         EnsureConnection();  // the question may have been open for hours
         // first, because after the deletion the message finds no quote, and a failure here could not be repaired
@@ -151,7 +160,7 @@ bool LoadRRQT(QString& text, const QString&)
                        message->textOf(u"//rootns:getReqForRevQteResponse/rootns:quoteRequestVersionNumber"_s));
     applyTransition(revisionRequested, quote, comments);
     quote.header().update();
-    quote.notes().update();
+    journal::passPoint([&] { quote.notes().update(); });
 
     tell({u"ORLA has requested quote "_s + quote.key().reference() + u" be revised."_s, u"Reason: "_s + comments,
           u"Please re-open and edit the quote then re-send to the insurer."_s});
@@ -169,7 +178,7 @@ bool LoadQRCN(QString& text, const QString&)
     const QString reason = message->textOf(u"//rootns:getQRCancellationResponse/rootns:qrCancellationReason"_s);
     applyTransition(requestCancelled, quote, reason);
     quote.notes().update();
-    quote.header().update();
+    journal::passPoint([&] { quote.header().update(); });
     return true;
 }
 
@@ -183,7 +192,7 @@ bool LoadBCQR(QString& text, const QString&)
 
     applyTransition(requestReinstated, quote);
     quote.notes().update();
-    quote.header().update();
+    journal::passPoint([&] { quote.header().update(); });
     return true;
 }
 

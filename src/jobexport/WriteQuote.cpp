@@ -1,6 +1,7 @@
 #include "jobexport/WriteQuote.h"
 
 #include "base/CredentialCipher.h"
+#include "base/Journal.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "jobexport/Address.h"
@@ -69,6 +70,14 @@ void openRows(db::Recordset& rows, const QString& select)
     if (!opened)
         throw RuntimeError(CannotOpen, u"There is no connection to the quote database."_s);
     rows = std::move(*opened);
+}
+
+/// Returns the row with JobLink's address, closed if it can't be read.
+db::Recordset joblinkSettings()
+{
+    db::Recordset settings;
+    attempt([&] { openRows(settings, u"SELECT * FROM ExternalSettings WHERE TAG='JOBLINK'"_s); });
+    return settings;
 }
 
 QString connectionText(const db::Recordset& settings)
@@ -331,8 +340,7 @@ void finish(Export& job)
 void WriteQuote(const QString& quoteNumber, const QString& subquote)
 {
     Export job;
-    db::Recordset settings;
-    attempt([&] { openRows(settings, u"SELECT * FROM ExternalSettings WHERE TAG='JOBLINK'"_s); });
+    db::Recordset settings = joblinkSettings();
     if (!settings.isOpen() || settings.eof())
         return;
 
@@ -345,13 +353,14 @@ void WriteQuote(const QString& quoteNumber, const QString& subquote)
         return;
     settings.close();
     openTarget(job);
-    openSource(job);
-    if (job.jobId == 0 || !job.customer.isOpen() || job.customer.eof()) {
-        desktop::msgBox(u"Quote could not be exported to JobLink."_s, desktop::Icon::Critical);
-        return;
-    }
-
     try {
+        if (job.jobId != 0)  // as soon as it is known, so that the job of an interrupted load is not made again
+            journal::keep(u"job"_s, job.jobId);
+        openSource(job);
+        if (job.jobId == 0 || !job.customer.isOpen() || job.customer.eof()) {
+            desktop::msgBox(u"Quote could not be exported to JobLink."_s, desktop::Icon::Critical);
+            return;
+        }
         writeHeader(job);
         writeLines(job);
         writeAnnotations(job);
@@ -359,6 +368,20 @@ void WriteQuote(const QString& quoteNumber, const QString& subquote)
     } catch (const RuntimeError& error) {
         desktop::msgBox(u"Wirra32.KEST2.modLoadXML.WriteQuote"_s, desktop::Icon::None, error.description());
     }
+}
+
+bool isJobComplete(qint64 jobId)
+{
+    bool isComplete = false;
+    attempt([&] {
+        Export job;
+        if (!openJobLink(job, joblinkSettings()))
+            return;
+        db::Recordset row(job.jobLink);
+        row.open(sql("SELECT status FROM newJob WHERE nJobID_PK={}", jobId));
+        isComplete = !row.eof() && toLong(row.value(u"status"_s)) == 1;
+    });
+    return isComplete;
 }
 
 }  // namespace kest

@@ -10,4 +10,7 @@ namespace kest {
 /// does if the server can't be reached.
 void WriteQuote(const QString& quoteNumber, const QString& subquote);
 
+/// Returns true if JobLink has all of that job, and false if it does not or can't be asked.
+bool isJobComplete(qint64 jobId);
+
 }  // namespace kest

@@ -1,7 +1,6 @@
 #include "messagelist/frmMessageList.h"
 
 #include "base/History.h"
-#include "base/Interruptions.h"
 #include "base/Journal.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
@@ -18,6 +17,7 @@
 #include "platform/desktop/Progress.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
+#include "recovery/Recovery.h"
 #include "reports/PrintXML.h"
 #include "utilities/frmViewXML.h"
 
@@ -131,7 +131,7 @@ void frmMessageList::fill()
         hooks.progress = [&](qint64 done, qint64 total) { progress.step(done, total); };
         try {
             EnsureConnection();
-            attempt([] { journal::findInterrupted(); });
+            recovery::settle();
             listed = BuildMessageList(iFolder, hooks);
         } catch (const RuntimeError& error) {
             fillFailure = error.description();
@@ -139,10 +139,10 @@ void frmMessageList::fill()
     }
     messages->setMessages(std::move(listed));
     choose(0);
-    QStringList interruptions;
-    for (const journal::Entry& entry : journal::takeInterrupted())
-        interruptions.append(journal::interruptionOf(entry));
-    lblStatus->setText(interruptions.isEmpty() ? status() : interruptions.join(u' '));
+    QStringList settled;
+    for (const recovery::Settled& operation : recovery::takeSettled())
+        settled.append(operation.sentence());
+    lblStatus->setText(settled.isEmpty() ? status() : settled.join(u' '));
     cmdHeld->setText(u"%1 held back (F4)"_s.arg(heldBack.size()));
     cmdHeld->setShortcut(Qt::Key_F4);  // a new text takes the key away
     cmdHeld->setVisible(!heldBack.isEmpty());
@@ -200,6 +200,31 @@ void frmMessageList::cmdProcess_Click()
         load(selectedFile());
 }
 
+/// Loads a message and moves it, or only moves it if it was loaded before. Nobody else may load it meanwhile.
+bool frmMessageList::loadOnce(const QString& file)
+{
+    QString text = files::read(gsCurFolder + file);
+    const QString hash = journal::hashOf(text);
+    switch (recovery::settleLoadOf(file, hash)) {
+        case recovery::EarlierLoad::Complete:
+            return true;
+        case recovery::EarlierLoad::Pending:
+            throw RuntimeError(RowChanged,
+                               u"The last load of %1 was interrupted and could not be taken back yet."_s.arg(file));
+        case recovery::EarlierLoad::None:
+            break;
+    }
+    journal::Operation operation(journal::Kind::Load, file, hash);
+    if (!LoadXML(text, file))
+        return false;
+    text.clear();  // otherwise a large text would be in memory twice
+    // a report may have been open for hours, and the file's new name comes from the database
+    attempt([] { EnsureConnection(); });
+    MoveMessage(file, u"read"_s);
+    operation.end(files::exists(gsCurFolder + file) ? journal::State::Unfinished : journal::State::Done);
+    return true;
+}
+
 bool frmMessageList::load(const QString& file)
 {
     const QScopedValueRollback loading(busy, busy + 1);
@@ -207,27 +232,20 @@ bool frmMessageList::load(const QString& file)
     const KeptMessage kept;
     try {
         EnsureConnection();
-        const db::Lock alone(gConn, u"load "_s + file.toUpper());
+        const db::Lock alone(gConn, recovery::loadLock(file));
         if (!alone.isHeld())
             desktop::msgBox(u"Message %1 is being loaded on another workstation."_s.arg(file),
                             desktop::Icon::Information);
-        QString text = alone.isHeld() ? files::read(gsCurFolder + file) : QString();
-        journal::Operation operation(journal::Kind::Load, file, journal::hashOf(text));
-        if (!alone.isHeld() || !LoadXML(text, file)) {
-            operation.end(journal::State::Failed);
+        if (!alone.isHeld() || !loadOnce(file)) {
             RefreshList();
             tmrRefresh->start();
             return false;
         }
-        text.clear();  // otherwise a large text would be in memory twice
-        // a report may have been open for hours, and the file's new name comes from the database
-        attempt([] { EnsureConnection(); });
-        MoveMessage(file, u"read"_s);
-        operation.end(journal::State::Done);
         RefreshList();
         if (files::exists(gsCurFolder + file))
             lblStatus->setText(
-                u"%1 is loaded, but could not be moved to the read messages: do not load it again."_s.arg(file));
+                u"%1 is loaded, but could not be moved to the read messages: it is moved as soon as that "
+                "is possible."_s.arg(file));
         desktop::msgBox(u"Message Loaded"_s);
         return true;
     } catch (const RuntimeError& error) {

@@ -83,6 +83,7 @@ private:
     void fill();
     QString status() const;
     bool load(const QString& file);
+    bool loadOnce(const QString& file);
     void takeIn(const QList<QUrl>& brought);
     bool hasSelection() const;
     QString selectedFile() const;

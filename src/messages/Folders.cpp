@@ -1,6 +1,7 @@
 #include "messages/Folders.h"
 
 #include "base/Helpers.h"
+#include "base/Journal.h"
 #include "base/SharedVariables.h"
 #include "base/modLoggerEx.h"
 #include "messages/Envelope.h"
@@ -92,6 +93,26 @@ QString plainOrNone(const QString& name)
     return files::isPlainName(name) ? name : QString();
 }
 
+/// Returns true if a move of the file under that name may have begun.
+bool isFreeFor(const QString& file, const QString& name)
+{
+    return !files::exists(gsReadPath + name) ||
+           files::readBytes(gsReadPath + name) == files::readBytes(gsUnreadPath + file);
+}
+
+/// Returns the name under which an interrupted move began, or else a new one.
+QString nameInReadFolder(const QString& file)
+{
+    const QString begun = journal::kept(u"newName"_s).toString();
+    bool goesOn = false;
+    attempt([&] { goesOn = files::isPlainName(begun) && isFreeFor(file, begun); });
+    if (goesOn)
+        return begun;
+    const QString name =
+        gsMatchedQTNNO.isEmpty() ? GetReadFileName(gsUnreadPath + file) : GetMatchedFileName(gsMatchedQTNNO);
+    return name.isEmpty() ? file : name;
+}
+
 /// Ignores a failure like attempt(), but writes it to the error log.
 bool attemptLogged(const std::function<void()>& step)
 {
@@ -141,12 +162,12 @@ bool isBareName(const QString& file)
 void MoveMessage(const QString& file, const QString& action)
 {
     if (action == "read"_L1 && isBareName(file) && files::exists(gsUnreadPath + file)) {
-        QString name =
-            gsMatchedQTNNO.isEmpty() ? GetReadFileName(gsUnreadPath + file) : GetMatchedFileName(gsMatchedQTNNO);
-        if (name.isEmpty())
-            name = file;
+        const QString name = nameInReadFolder(file);
         // replace an older message of that name only after the copy exists, because the disk may be full
-        const bool copied = attemptLogged([&] { files::copy(gsUnreadPath + file, gsReadPath + name); });
+        const bool copied = attemptLogged([&] {
+            journal::keep(u"newName"_s, name);  // first, so that an interrupted move ends under this name
+            files::copy(gsUnreadPath + file, gsReadPath + name);
+        });
         if (copied && files::exists(gsReadPath + name))
             attemptLogged([&] { files::remove(gsUnreadPath + file); });
     }

@@ -1,5 +1,6 @@
 #include "outbound/QuoteImages.h"
 
+#include "base/Journal.h"
 #include "base/SharedVariables.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
@@ -38,6 +39,8 @@ QString imageId(const QString& file)
 void writeImageDocuments(const QString& folder, const QuoteKey& quote)
 {
     for (const QuoteImage& image : quoteImages(folder, quote)) {
+        if (journal::kept(image.file).toBool())
+            continue;
         xml::Document document;
         const Branch request(document, "request");
         request.add({
@@ -49,6 +52,7 @@ void writeImageDocuments(const QString& folder, const QuoteKey& quote)
         const QString name = u"I_"_s + image.file;
         files::write(gsUnsentPath + name.chopped(3) + u"xml"_s, request.xml());
         files::copy(files::pathForWriting(folder, image.file), gsUnsentPath + name);
+        journal::keep(image.file, true);
     }
 }
 

@@ -22,7 +22,8 @@ QList<QuoteImage> quoteImages(const QString& folder, const QuoteKey& quote);
 /// empty text if there is none.
 QString imageId(const QString& file);
 
-/// Writes a document and a copy of each image to the outgoing folder.
+/// Writes a document and a copy of each image to the outgoing folder. Leaves out those that the operation has written
+/// before it was interrupted.
 void writeImageDocuments(const QString& folder, const QuoteKey& quote);
 
 }  // namespace kest

@@ -6,6 +6,7 @@
 #include "base/modDBAccess.h"
 #include "outbound/modCreateXML.h"
 #include "platform/Prompt.h"
+#include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
 #include "quotedata/NoteChain.h"
@@ -77,6 +78,17 @@ double refuse(const QString& message)
     return 0;
 }
 
+/// Pictures that can't be written, for example because the disk is full, are written later.
+void sendPictures(journal::Operation& operation, db::Recordset& quote)
+{
+    try {
+        CreateImageXML(gsImagesPath, quote);
+    } catch (const RuntimeError&) {
+        operation.end(journal::State::Unfinished);
+        throw;
+    }
+}
+
 }  // namespace
 
 double SendQuote(db::Recordset& quote, bool* sent)
@@ -100,7 +112,7 @@ double SendQuote(db::Recordset& quote, bool* sent)
     if (sent)
         *sent = total != 0;
     if (total != 0)
-        CreateImageXML(gsImagesPath, quote);
+        sendPictures(operation, quote);
     operation.end(total != 0 ? journal::State::Done : journal::State::Failed);
     return total;
 }

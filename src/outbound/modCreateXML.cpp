@@ -1,5 +1,6 @@
 #include "outbound/modCreateXML.h"
 
+#include "base/Journal.h"
 #include "base/ModRegistry.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
@@ -11,11 +12,16 @@
 #include "outbound/frmExtraInfo.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
+#include "platform/files/CodePage.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
+#include "quotedata/NoteChain.h"
+#include "quotedata/Quote.h"
 #include "quotedata/StateTable.h"
 
 #include <QSet>
+
+#include <algorithm>
 
 using namespace Qt::StringLiterals;
 
@@ -76,13 +82,41 @@ void addImages(const Branch& request, const QuoteRows& rows)
         ids.add("quoteImageId", image.id);
 }
 
-void markAsSent(QuoteRows& rows)
+const QString submitted = u"Submitted"_s;
+
+QString quoteStatus(const db::Recordset& notes)
 {
-    if (rows.key.isMain() && !text(rows.quote, "KESTQRNo").isEmpty())
-        applyTransition(requestAnswered, rows.quote, rows.notes);
-    applyTransition(quoteSent, rows.quote, rows.notes);
-    rows.quote.update();
-    rows.notes.update();
+    return GetNoteStatus(u"KEST Quote"_s, text(notes, "remarks"));
+}
+
+void markAsSent(const QuoteKey& key, db::Recordset& quote, db::Recordset& notes, const Transition& sent)
+{
+    if (key.isMain() && !text(quote, "KESTQRNo").isEmpty())
+        applyTransition(requestAnswered, quote, notes);
+    applyTransition(sent, quote, notes);
+    quote.update();
+    journal::passPoint([&] { notes.update(); });
+}
+
+/// Keeps what finishing the send needs if it is interrupted after the document was written.
+void announceDocument(const QuoteRows& rows, const QString& name, const QString& content)
+{
+    journal::openNow(rows.key.number, rows.key.subquote);
+    journal::keep(u"document"_s,
+                  QJsonObject{{u"name"_s, name},
+                              {u"hash"_s, journal::hashOf(files::fromCodePage(files::toCodePage(content)))},
+                              {u"wasSubmitted"_s, quoteStatus(rows.notes) == submitted}});
+}
+
+/// Returns true if the document waits for the transport, or was sent.
+bool isThere(const QString& name, const QString& hash)
+{
+    if (!files::isPlainName(name))
+        return false;
+    const QString folders[] = {gsUnsentPath, gsSentPath};
+    return std::ranges::any_of(folders, [&](const QString& folder) {
+        return files::exists(folder + name) && journal::hashOf(files::read(folder + name)) == hash;
+    });
 }
 
 }  // namespace
@@ -125,8 +159,12 @@ double CreateQuoteXML(db::Recordset& quote)
     addImages(request, rows);
 
     // write the document before the quote is locked: a full disk must not lock it
-    files::write(files::pathForWriting(gsUnsentPath, documentName(rows)), withoutRoot(request.xml()));
-    markAsSent(rows);
+    const QString name = documentName(rows);
+    const QString content = withoutRoot(request.xml());
+    announceDocument(rows, name, content);
+    files::write(files::pathForWriting(gsUnsentPath, name), content);
+    journal::keep(u"written"_s, true);
+    markAsSent(rows.key, rows.quote, rows.notes, quoteSent);
     desktop::msgBox(u"Quote Sent."_s, desktop::Icon::Information);
     return total;
 }
@@ -134,6 +172,24 @@ double CreateQuoteXML(db::Recordset& quote)
 void CreateImageXML(const QString& imagesPath, db::Recordset& quote)
 {
     writeImageDocuments(imagesPath, QuoteKey::fromRow(quote));
+}
+
+bool finishSend(const QuoteKey& key, bool isMarked)
+{
+    const QJsonObject document = journal::kept(u"document"_s).toObject();
+    const bool isWritten =
+        journal::kept(u"written"_s).toBool() || isThere(document[u"name"_s].toString(), document[u"hash"_s].toString());
+    if (!isWritten)
+        return false;
+    Quote quote(key);
+    if (!isMarked && quote.exists() && !quote.notes().eof()) {
+        Transition sent = quoteSent;
+        if (quoteStatus(quote.notes()) == submitted && !document[u"wasSubmitted"_s].toBool())
+            sent.notes[0] = {};  // the network has received it meanwhile
+        markAsSent(key, quote.header(), quote.notes(), sent);
+    }
+    writeImageDocuments(gsImagesPath, key);
+    return true;
 }
 
 }  // namespace kest

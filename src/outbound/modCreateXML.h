@@ -1,6 +1,7 @@
 // Writes the documents of a quote to the outgoing folder, from which the transport program takes them.
 #pragma once
 
+#include "base/QuoteKey.h"
 #include "platform/database/Recordset.h"
 
 #include <QString>
@@ -14,5 +15,9 @@ double CreateQuoteXML(db::Recordset& quote);
 
 /// Writes a document and a copy of each photograph of the quote to the outgoing folder.
 void CreateImageXML(const QString& imagesPath, db::Recordset& quote);
+
+/// Goes on with the send of an interrupted operation: marks the quote as sent, unless `isMarked` says that this was
+/// done, and writes the pictures that are missing. Returns false and changes nothing if the document was not written.
+bool finishSend(const QuoteKey& key, bool isMarked);
 
 }  // namespace kest

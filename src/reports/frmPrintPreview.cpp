@@ -1,5 +1,6 @@
 #include "reports/frmPrintPreview.h"
 
+#include "base/Journal.h"
 #include "base/ModRegistry.h"
 #include "base/SharedVariables.h"
 #include "platform/Prompt.h"
@@ -130,6 +131,7 @@ void frmPrintPreview::ShowForm(qint32 peReportType, const QVariant& pvValue, db:
         recordPreview(peReportType, report, rows);
         frmPrintPreview form(report);
         desktop::showModal(form);
+        journal::keep(u"reportShown"_s, true);
     });
     setDefaultPointer();
 }

@@ -1,6 +1,5 @@
 #include "shell/eKEST.h"
 
-#include "base/Interruptions.h"
 #include "base/ModRegistry.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
@@ -12,6 +11,7 @@
 #include "platform/files/files.h"
 #include "platform/profile.h"
 #include "quotedata/Quote.h"
+#include "recovery/Recovery.h"
 #include "shell/frmKEST.h"
 
 namespace kest {
@@ -58,6 +58,7 @@ eKEST::eKEST()
                                   gsImagesPath, profile::root(), profile::componentFolder()})
         files::removeLeftOvers(folder);
     files::resumeRemovals();
+    setAfterOpening([] { recovery::settle(); });
 }
 
 eKEST::~eKEST()
@@ -73,11 +74,12 @@ void eKEST::ShowKESTWindow(const QString& sQTNNO, const QString& sSubQuote)
 {
     desktop::guarded(u"eKEST.ShowKESTWindow"_s, [&] {
         frmKEST panel;
+        EnsureConnection();
+        recovery::settle();  // first, because it may change the quote that the panel opens
         if (!openHostQuote(sQTNNO, sSubQuote))
             return;
-        attempt([] { journal::findInterrupted(); });
-        for (const journal::Entry& entry : journal::takeInterrupted())
-            desktop::msgBox(journal::interruptionOf(entry), desktop::Icon::Exclamation);
+        for (const recovery::Settled& operation : recovery::takeSettled())
+            desktop::msgBox(operation.sentence(), desktop::Icon::Exclamation);
         desktop::showModal(panel);
     });
     files::waitForBackground(closingWait);

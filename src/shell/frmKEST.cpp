@@ -11,6 +11,7 @@
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
+#include "recovery/Recovery.h"
 #include "utilities/frmLogin.h"
 #include "utilities/frmUtilities.h"
 
@@ -157,6 +158,8 @@ void frmKEST::cmdOK_Click()
 void frmKEST::sendQuote()
 {
     const desktop::WaitPointer pointer;
+    EnsureConnection();
+    recovery::settle();  // an interrupted send of this quote may have to be finished first
     SendQuote(*grsQuote);
 }
 

@@ -265,7 +265,7 @@ void frmUtilities::Command1_Click()
     WriteRemarks();
     journal::Operation operation(journal::Kind::Save);
     quote.update();
-    remarks.update();
+    journal::passPoint([&] { remarks.update(); });
     operation.end(journal::State::Done);
     CloseRows();
     close();  // first: the changes are saved even if the host's quote can't be opened

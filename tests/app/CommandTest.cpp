@@ -79,12 +79,13 @@ TEST_F(Command, AnInterruptedLoadIsToldOnce)
             u"INSERT INTO KESTOperation (Operation, OperationKind, State, FileName, QTNNO, LockName, StartedAt) VALUES "
             "(17, 'load', 'open', 'm.xml', '1007', 'operation x', '2026-11-23T10:31:00')"_s);
     const QString told =
-        u"The load of m.xml was interrupted on 23/11/2026 at 10:31. Check quote 1007 before you load "
-        "the message again."_s;
+        u"The load of m.xml was interrupted on 23/11/2026 at 10:31. It has been taken back; load the message again."_s;
     const Ended first = kest2(u"list unread"_s);
     EXPECT_TRUE(first.errors.contains(told)) << first.errors.toStdString();
     EXPECT_EQ(first.json[u"recovered"][0][u"operation"].toInt(), 17);
-    EXPECT_EQ(first.json[u"recovered"][0][u"left"][0].toString(), told);
+    EXPECT_EQ(first.json[u"recovered"][0][u"outcome"].toString(), u"taken back"_s);
+    EXPECT_EQ(first.json[u"recovered"][0][u"left"].toArray(), QJsonArray());
+    EXPECT_FALSE(QJsonDocument(first.json[u"boxes"].toArray()).toJson().contains("interrupted"));
     EXPECT_FALSE(kest2(u"list unread"_s).json.contains(u"recovered"_s));
 }
 

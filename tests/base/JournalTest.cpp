@@ -1,6 +1,5 @@
 // The journal records every change of an operation together with the change, and nothing else.
 #include "base/History.h"
-#include "base/Interruptions.h"
 #include "base/Journal.h"
 #include "base/JournalRecord.h"
 #include "support/Shop.h"
@@ -104,28 +103,6 @@ TEST_F(JournalOfAShop, IsNotNeededForALoad)
     EXPECT_EQ(operations(), QString());
 }
 
-TEST_F(JournalOfAShop, FindsAnInterruptedOperationOnlyWhenItsOwnerIsGone)
-{
-    gConn->execute(
-        u"INSERT INTO KESTOperation (Operation, OperationKind, State, QTNNO, LockName, StartedAt) VALUES (17, 'send', "
-        "'open', '500', 'operation x', '2026-11-23T10:31:00')"_s);
-    {
-        const auto owner = std::make_shared<db::Connection>();
-        owner->open(connectionText(driverNumber()));
-        const db::Lock alive(owner, u"operation x"_s);
-        journal::findInterrupted();
-        EXPECT_TRUE(journal::takeInterrupted().isEmpty());
-    }
-    journal::findInterrupted();
-    const QList<journal::Entry> found = journal::takeInterrupted();
-    ASSERT_EQ(found.size(), 1);
-    EXPECT_EQ(journal::interruptionOf(found[0]),
-              u"The send was interrupted on 23/11/2026 at 10:31. Check quote 500 before you send it again."_s);
-    EXPECT_EQ(rowCount("KESTOperation", "State='interrupted'"), 1);
-    journal::findInterrupted();
-    EXPECT_TRUE(journal::takeInterrupted().isEmpty());
-}
-
 TEST_F(JournalOfAShop, ForgetsOldOperationsSomeRowsAtATimeButNoOpenOne)
 {
     const auto operation = [](int number, const char* state, int daysAgo) {
@@ -138,19 +115,20 @@ TEST_F(JournalOfAShop, ForgetsOldOperationsSomeRowsAtATimeButNoOpenOne)
     operation(2, "done", 100);
     operation(3, "failed", 91);
     operation(4, "done", 89);
+    operation(5, "unfinished", 200);
     QStringList records;
     for (int i = 0; i < 1200; ++i)
         records += u"(%1, 'T', 0)"_s.arg(i < 1100 ? 3 : 4);
     gConn->execute(u"INSERT INTO KESTJournal (Operation, TableName, Settled) VALUES "_s + records.join(u','));
 
     journal::prune();
-    EXPECT_EQ(rowCount("KESTOperation", "Operation IN (1, 3, 4)"), 3);
-    EXPECT_EQ(rowCount("KESTOperation"), 3);
+    EXPECT_EQ(rowCount("KESTOperation", "Operation IN (1, 3, 4, 5)"), 4);
+    EXPECT_EQ(rowCount("KESTOperation"), 4);
     EXPECT_EQ(rowCount("KESTJournal", "Operation=3"), 101);
 
     journal::prune();
-    EXPECT_EQ(rowCount("KESTOperation", "Operation IN (1, 4)"), 2);
-    EXPECT_EQ(rowCount("KESTOperation"), 2);
+    EXPECT_EQ(rowCount("KESTOperation", "Operation IN (1, 4, 5)"), 3);
+    EXPECT_EQ(rowCount("KESTOperation"), 3);
     EXPECT_EQ(rowCount("KESTJournal"), 100);
 }
 

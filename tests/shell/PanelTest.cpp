@@ -28,7 +28,7 @@ TEST_F(Panel, AConnectionThatWasLostIsOpenedAgainByTheNextClick)
 {
     test::quote("500");
     int statements = 0;
-    db::setStatementFault([&] { return ++statements == 3; }, CannotOpen);  // the first two open the panel
+    db::setStatementFault([&] { return ++statements == 4; }, CannotOpen);  // the first of the send itself
     const QByteArray password = QByteArray::number(dayPassword(QDate::currentDate()));
     show("500", R"json({"click": "Option1(2)"}, {"click": "cmdOK"}, {"click": "Option1(3)"}, {"click": "cmdOK"},
                        {"click": "Option1(2)"}, {"click": "cmdOK"}]],

@@ -2,6 +2,7 @@
 
 #include "base/Journal.h"
 #include "inbound/modLoadXML.h"
+#include "recovery/Recovery.h"
 
 namespace kest::test {
 
@@ -99,11 +100,16 @@ bool loadAsTheWindow(const QString& fileName)
     bool taken = false;
     attempt([&] {
         QString text = files::read(gsUnreadPath + fileName);
-        journal::Operation operation(journal::Kind::Load, fileName, journal::hashOf(text));
+        const QString hash = journal::hashOf(text);
+        taken = recovery::settleLoadOf(fileName, hash) == recovery::EarlierLoad::Complete;
+        if (taken)
+            return;
+        journal::Operation operation(journal::Kind::Load, fileName, hash);
         taken = LoadXML(text, fileName);
         if (taken)
             MoveMessage(fileName, u"read"_s);
-        operation.end(taken ? journal::State::Done : journal::State::Failed);
+        const bool isMoved = !files::exists(gsUnreadPath + fileName);
+        operation.end(!taken ? journal::State::Failed : isMoved ? journal::State::Done : journal::State::Unfinished);
     });
     return taken;
 }

@@ -1,0 +1,100 @@
+#include "recovery/FinishLoad.h"
+
+#include "base/SharedVariables.h"
+#include "inbound/Finishing.h"
+#include "jobexport/WriteQuote.h"
+#include "messages/Envelope.h"
+#include "messages/Folders.h"
+#include "messages/MessageTypes.h"
+#include "platform/files/files.h"
+
+#include <QJsonArray>
+
+namespace kest::recovery {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+/// Returns the message if it still waits as it was when it was loaded, otherwise an empty text.
+QString waitingText(const journal::Entry& entry)
+{
+    if (!isBareName(entry.file) || !files::exists(gsUnreadPath + entry.file))
+        return {};
+    const QString text = files::read(gsUnreadPath + entry.file);
+    return journal::hashOf(text) == entry.hash ? text : QString();
+}
+
+const MessageType* typeOf(QString& text)
+{
+    SharedMessage message = sharedMessage(text);
+    if (message->parseError().errorCode == xml::BareAmpersand && escapeAmpersands(text))
+        message = sharedMessage(text);
+    return findMessageType(message->textOf(u"messageType"_s).toUpper());
+}
+
+/// Exports an authorised quote if that has not begun.
+QStringList finishExport(const journal::Entry& entry)
+{
+    const QJsonValue job = journal::kept(u"job"_s);
+    if (job.isUndefined())
+        WriteQuote(entry.number, entry.subquote);
+    else if (!isJobComplete(job.toInteger()))
+        return {u"JobLink may have only a part of job %1: check it there."_s.arg(job.toInteger())};
+    return {};
+}
+
+bool hasReport(MessageCode type)
+{
+    return type == MessageCode::QREQ || type == MessageCode::ADQT || type == MessageCode::AUQT;
+}
+
+void move(const journal::Entry& entry)
+{
+    gsMatchedQTNNO = entry.facts[u"matched"_s].toString();
+    gsDeletedQTNNO = entry.facts[u"deletedNumber"_s].toString();
+    gsDeletedSubquote = entry.facts[u"deletedSubquote"_s].toString();
+    MoveMessage(entry.file, u"read"_s);
+    gsDeletedQTNNO.clear();
+    gsDeletedSubquote.clear();
+}
+
+}  // namespace
+
+QStringList finishLoad(const journal::Entry& entry)
+{
+    QString text = waitingText(entry);
+    if (text.isEmpty())
+        return {};  // it was moved, which is the last step
+    QStringList left;
+    const MessageType* type = typeOf(text);
+    const bool isBegun = !journal::kept(u"newName"_s).isUndefined();  // the move, so all before it is done
+    if (type && !isBegun) {
+        if (type->code == MessageCode::QREQ)
+            finishRequest(text, entry.number);
+        if (type->code == MessageCode::AUQT)
+            left += finishExport(entry);
+    }
+    move(entry);
+    if (type && hasReport(type->code) && !journal::kept(u"reportShown"_s).toBool())
+        left += u"Its report was not shown: reprint %1 from the read messages."_s.arg(
+            journal::kept(u"newName"_s).toString());
+    return left;
+}
+
+bool stillWaits(const journal::Entry& entry)
+{
+    return !waitingText(entry).isEmpty();
+}
+
+void removeDocuments(const journal::Entry& entry)
+{
+    for (const QJsonValue written : entry.facts[u"documents"_s].toArray()) {
+        const QString path = written[0].toString();
+        if (files::exists(path) &&
+            journal::hashOf(QString::fromLatin1(files::readBytes(path))) == written[1].toString())
+            files::remove(path);
+    }
+}
+
+}  // namespace kest::recovery

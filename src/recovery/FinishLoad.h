@@ -1,0 +1,20 @@
+// Goes on with a load that was interrupted after its last update, and removes what one has left that is taken back.
+#pragma once
+
+#include "base/Journal.h"
+
+#include <QStringList>
+
+namespace kest::recovery {
+
+/// Does the rest of a load inside its operation: pictures, counter, export and file move. Returns what was not done, a
+/// sentence each: a report that was not shown, a job that JobLink has in part.
+QStringList finishLoad(const journal::Entry& entry);
+
+/// Returns true if the message is still in the unread folder, unchanged.
+bool stillWaits(const journal::Entry& entry);
+
+/// Removes the documents of sublet work that a load has written.
+void removeDocuments(const journal::Entry& entry);
+
+}  // namespace kest::recovery

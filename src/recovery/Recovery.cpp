@@ -1,0 +1,176 @@
+#include "recovery/Recovery.h"
+
+#include "base/History.h"
+#include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
+#include "base/modLoggerEx.h"
+#include "outbound/modCreateXML.h"
+#include "platform/RuntimeError.h"
+#include "recovery/FinishLoad.h"
+#include "recovery/TakeBack.h"
+
+#include <optional>
+#include <utility>
+
+namespace kest::recovery {
+
+using namespace Qt::StringLiterals;
+
+namespace {
+
+constexpr auto source = "Recovery.settle"_L1;
+
+QList<Settled> settledSince;
+
+bool isOf(const journal::Entry& entry, journal::Kind kind)
+{
+    return entry.kind == journal::wordOf(kind);
+}
+
+bool isLoadOf(const journal::Entry& entry, const QString& file)
+{
+    return isOf(entry, journal::Kind::Load) && entry.file.compare(file, Qt::CaseInsensitive) == 0;
+}
+
+bool isUnfinished(const journal::Entry& entry)
+{
+    return entry.state == journal::wordOf(journal::State::Unfinished);
+}
+
+void tell(Settled settled)
+{
+    attempt([&] { logFailure(RuntimeError(RowChanged, settled.sentence()), source); });
+    settledSince.append(std::move(settled));
+}
+
+void settleSend(const journal::Entry& entry, journal::Operation& operation)
+{
+    const bool isSent = finishSend({entry.number, entry.subquote}, entry.pastPoint);
+    if (isUnfinished(entry))  // the user has seen what could not be written
+        return operation.end(journal::State::Done);
+    operation.end(isSent ? journal::State::Finished : journal::State::Failed);
+    tell({entry, isSent ? Outcome::Finished : Outcome::TakenBack, {}});
+}
+
+void settleComplete(const journal::Entry& entry, journal::Operation& operation)
+{
+    const QStringList left = isOf(entry, journal::Kind::Load) ? finishLoad(entry) : QStringList();
+    const bool isMoved = !isOf(entry, journal::Kind::Load) || !stillWaits(entry);
+    if (isUnfinished(entry)) {
+        if (isMoved)
+            operation.end(journal::State::Done);
+        return;
+    }
+    operation.end(isMoved ? journal::State::Finished : journal::State::Unfinished);
+    tell({entry, Outcome::Finished, left});
+}
+
+void settleIncomplete(const journal::Entry& entry, journal::Operation& operation)
+{
+    const QStringList left = takeBack(entry.id);
+    removeDocuments(entry);
+    operation.end(left.isEmpty() ? journal::State::TakenBack : journal::State::Interrupted);
+    tell({entry, left.isEmpty() ? Outcome::TakenBack : Outcome::Left, left});
+}
+
+void settleAlone(journal::Entry entry, const QString& lockedFile)
+{
+    journal::endDeadSession(entry);
+    // nobody may load the message meanwhile
+    std::optional<db::Lock> load;
+    if (isOf(entry, journal::Kind::Load) && !isLoadOf(entry, lockedFile))
+        if (!load.emplace(gConn, loadLock(entry.file)).isHeld())
+            return;
+    journal::Operation operation(entry);
+    if (!operation.isOwner())
+        return;
+    if (isOf(entry, journal::Kind::Send))
+        settleSend(entry, operation);
+    else if (entry.pastPoint)
+        settleComplete(entry, operation);
+    else
+        settleIncomplete(entry, operation);
+}
+
+}  // namespace
+
+QString wordOf(Outcome outcome)
+{
+    switch (outcome) {
+        case Outcome::TakenBack:
+            return u"taken back"_s;
+        case Outcome::Finished:
+            return u"finished"_s;
+        case Outcome::Left:
+            break;
+    }
+    return u"left"_s;
+}
+
+QString Settled::sentence() const
+{
+    const QString ofQuote = operation.number.isEmpty() ? QString() : u" of quote %1"_s.arg(operation.number);
+    const bool isLoad = isOf(operation, journal::Kind::Load);
+    const bool isSend = isOf(operation, journal::Kind::Send);
+    const QString head = u"The %1 was interrupted on %2 at %3. "_s.arg(
+        journal::titleOf(operation) + (isSend ? ofQuote : QString()), operation.started.toString(u"dd/MM/yyyy"_s),
+        operation.started.toString(u"HH:mm"_s));
+    QString tail;
+    if (outcome == Outcome::Finished)
+        tail = u"It has been finished."_s;
+    else if (isSend)
+        tail = u"The quote was not sent; send it again."_s;
+    else if (outcome == Outcome::Left)
+        tail = u"Not all of it could be taken back; check the quote%1."_s.arg(
+            operation.number.isEmpty() ? QString() : u' ' + operation.number);
+    else
+        tail = isLoad ? u"It has been taken back; load the message again."_s : u"It has been taken back."_s;
+    return (QStringList(head + tail) + left).join(u' ');
+}
+
+void settle(const QString& lockedFile)
+{
+    if (journal::isAtWork() || !journal::isKept())
+        return;
+    QList<journal::Entry> pending;
+    attempt([&] { pending = journal::pendingOperations(); });
+    for (const journal::Entry& entry : pending) {
+        attempt([&] {
+            try {
+                settleAlone(entry, lockedFile);
+            } catch (const RuntimeError& error) {
+                const QString what = u"The %1 could not be settled yet: %2"_s;
+                logFailure(RuntimeError(error.number(), what.arg(journal::titleOf(entry), error.description())),
+                           source);
+                throw;
+            }
+        });
+    }
+}
+
+QList<Settled> takeSettled()
+{
+    return std::exchange(settledSince, {});
+}
+
+EarlierLoad settleLoadOf(const QString& file, const QString& hash)
+{
+    if (!journal::isKept())
+        return EarlierLoad::None;
+    bool isComplete = false;
+    for (const journal::Entry& entry : journal::pendingOperations())
+        isComplete =
+            isComplete || (isLoadOf(entry, file) && entry.hash == hash && (entry.pastPoint || isUnfinished(entry)));
+    settle(file);
+    for (const journal::Entry& entry : journal::pendingOperations())
+        if (isLoadOf(entry, file) && !isUnfinished(entry))
+            return EarlierLoad::Pending;
+    return isComplete ? EarlierLoad::Complete : EarlierLoad::None;
+}
+
+QString loadLock(const QString& file)
+{
+    return u"load "_s + file.toUpper();
+}
+
+}  // namespace kest::recovery
