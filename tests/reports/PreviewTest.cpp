@@ -205,6 +205,17 @@ TEST_F(Preview, TheViewerFillsTheWindowAboveItsButton)
         control<QPushButton>(window, "cmdExit").setFocus();
         desktop::gestures::press(window, Qt::Key_Home);
         EXPECT_EQ(page.text(), u"Page 1 of 5"_s) << "wherever the focus is";
+        const QScrollBar& scrolled = *control<QAbstractScrollArea>(window, "crvPages").verticalScrollBar();
+        const int before = scrolled.value();
+        desktop::gestures::press(window, Qt::Key_PageDown);
+        EXPECT_GT(scrolled.value(), before);
+        while (page.text() == u"Page 1 of 5"_s)
+            desktop::gestures::press(window, Qt::Key_PageDown);
+        EXPECT_EQ(page.text(), u"Page 2 of 5"_s);
+        desktop::gestures::press(window, Qt::Key_PageUp);
+        EXPECT_EQ(page.text(), u"Page 1 of 5"_s) << "back at its end";
+        EXPECT_GT(scrolled.value(), before);
+        desktop::gestures::press(window, Qt::Key_Home);
         desktop::gestures::press(window, Qt::Key_End);
         control<QToolButton>(window, "cmdPrevious").click();
         EXPECT_EQ(page.text(), u"Page 4 of 5"_s);
@@ -272,4 +283,11 @@ TEST_F(Preview, ThePrintButtonPrintsWhatWasChosen)
         EXPECT_TRUE(text.contains(u"Page 2 of 5"_s));
         EXPECT_EQ(text.count(u'\f'), only ? 1 : 5);
     }
+    const QString twice = root() + u"/twice.pdf"_s;
+    {
+        QPdfWriter printer(twice);
+        report::setPaper(printer);
+        report::paint(comparisonOf(1, u"line %1"_s), printer, 1, 0, 2);
+    }
+    EXPECT_EQ(pdfText(twice).count(u"Page 1 of 1"_s), 2) << "a printer that makes no copies itself";
 }

@@ -2,10 +2,10 @@
 
 #include "platform/desktop/Window.h"
 
-#include <QCoreApplication>
+#include <QAbstractScrollArea>
 #include <QHBoxLayout>
-#include <QKeyEvent>
 #include <QLabel>
+#include <QScrollBar>
 #include <QShortcut>
 #include <QToolButton>
 
@@ -32,12 +32,9 @@ PageTools::PageTools(QWidget* parent, const QString& window, const PageActions& 
     add("cmdFitWidth", "Fit width", "As wide as the window", {Qt::CTRL | Qt::Key_0}, actions.fitWidth);
     add("cmdFitPage", "Fit page", "The whole page", {Qt::CTRL | Qt::Key_1}, actions.fitPage);
 
-    for (const Qt::Key key : {Qt::Key_PageUp, Qt::Key_PageDown})
+    for (const auto& [key, direction] : {std::pair(Qt::Key_PageUp, -1), {Qt::Key_PageDown, 1}})
         onEvent(new QShortcut(key, this), &QShortcut::activated, this, source + u".View_Scroll"_s,
-                [key, view = actions.view] {
-                    QKeyEvent press(QEvent::KeyPress, key, Qt::NoModifier);
-                    QCoreApplication::sendEvent(view, &press);
-                });
+                [=, this, direction = direction] { scroll(actions, direction); });
     lblPage->setObjectName(u"lblPage"_s);
     lblPage->setContentsMargins({pixels(90), 0, pixels(90), 0});
     lblPage->setMinimumWidth(lblPage->fontMetrics().horizontalAdvance(u"Page 88 of 88"_s) + pixels(180));
@@ -62,6 +59,20 @@ QToolButton* PageTools::add(const char* name, const char* caption, const char* h
     onEvent(tool, &QToolButton::clicked, this, event, action);
     onEvent(shortcut, &QShortcut::activated, this, event, action);
     return tool;
+}
+
+// At the end of a page it goes on to the next one.
+void PageTools::scroll(const PageActions& actions, int direction)
+{
+    QScrollBar& bar = *actions.view->verticalScrollBar();
+    const int end = direction > 0 ? bar.maximum() : bar.minimum();
+    const int next = current + direction;
+    if (bar.value() != end) {
+        bar.triggerAction(direction > 0 ? QAbstractSlider::SliderPageStepAdd : QAbstractSlider::SliderPageStepSub);
+    } else if (next >= 1 && next <= count) {
+        actions.goTo(next);
+        bar.setValue(direction > 0 ? bar.minimum() : bar.maximum());
+    }
 }
 
 void PageTools::showPage(int page, int pages)

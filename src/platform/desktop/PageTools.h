@@ -6,6 +6,7 @@
 
 #include <functional>
 
+class QAbstractScrollArea;
 class QLabel;
 class QToolButton;
 
@@ -20,7 +21,7 @@ struct PageActions {
     std::function<void()> reduce;
     std::function<void()> fitWidth;
     std::function<void()> fitPage;
-    QWidget* view = nullptr;  // scrolled by PgUp and PgDn, wherever the focus is
+    QAbstractScrollArea* view = nullptr;  // scrolled by PgUp and PgDn, wherever the focus is
 };
 
 /// A row of buttons for printing, saving, pages and zoom, with the number of the page. All windows that show pages have
@@ -37,6 +38,7 @@ public:
 private:
     QToolButton* add(const char* name, const char* caption, const char* hint, const QList<QKeySequence>& keys,
                      const std::function<void()>& action);
+    void scroll(const PageActions& actions, int direction);
 
     QString source;
     QList<QToolButton*> back;
