@@ -19,10 +19,12 @@ QStringList words(int argc, char** argv)
 
 QtMessageHandler usualHandler = nullptr;
 
-/// Drops a remark that Qt makes for each window without a display, so that standard error has only what the user needs.
+/// Drops remarks that Qt makes for windows without a display and in a service or a scheduled job, so that standard
+/// error has only what the user needs.
 void withoutRemarks(QtMsgType type, const QMessageLogContext& context, const QString& message)
 {
-    if (!message.contains(QLatin1String("propagateSizeHints")))
+    const auto isRemark = [&](const char* part) { return message.contains(QLatin1String(part)); };
+    if (!isRemark("propagateSizeHints") && !isRemark("XDG_RUNTIME_DIR not set"))
         usualHandler(type, context, message);
 }
 
