@@ -227,8 +227,8 @@ QList<ListedMessage> BuildMessageList(MessageFolder folder, const FillHooks& hoo
                                        error.source());
             }
         }
-        if (hooks.progress)
-            hooks.progress(++done, names.size());
+        if (hooks.progress && !hooks.progress(++done, names.size()))
+            break;
     }
     return std::move(fill.listed);
 }

@@ -40,8 +40,8 @@ struct FillHooks {
     std::function<void(QString& text, const QString& file)> submissionResponse;
     /// Called with the filter that the user has just typed into the prompt.
     std::function<void(const QString& filter)> filterAsked;
-    /// Called after each file.
-    std::function<void(qint64 done, qint64 total)> progress;
+    /// Called after each file. The fill ends if it returns false.
+    std::function<bool(qint64 done, qint64 total)> progress;
     /// Called with each unread message that is held back.
     std::function<void(const HeldMessage& message)> held = {};
 };

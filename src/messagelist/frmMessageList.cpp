@@ -15,6 +15,7 @@
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
 #include "platform/desktop/Progress.h"
+#include "platform/desktop/StatusLine.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
 #include "recovery/Recovery.h"
@@ -121,14 +122,21 @@ void frmMessageList::fill()
     const QScopedValueRollback filling(busy, busy + 1);
     QList<ListedMessage> listed;
     fillFailure.clear();
+    isStopped = false;
     heldBack.clear();
     {
-        desktop::Progress progress(windowTitle(), u"Reading the messages..."_s, prgFill);
+        const QString what = u"Reading the messages... (Esc stops)"_s;
+        desktop::Progress progress(windowTitle(), what, prgFill, desktop::Stop::ByEscape);
         FillHooks hooks;
         hooks.submissionResponse = LoadSubmissionResponse;
         hooks.filterAsked = [this](const QString& filter) { txtFilter->setText(filter); };
         hooks.held = [this](const HeldMessage& message) { heldBack.append(message); };
-        hooks.progress = [&](qint64 done, qint64 total) { progress.step(done, total); };
+        hooks.progress = [&](qint64 done, qint64 total) {
+            if (progress.isShown())
+                lblStatus->tell(what);
+            isStopped = !progress.step(done, total);
+            return !isStopped;
+        };
         try {
             EnsureConnection();
             recovery::settle();
@@ -142,7 +150,7 @@ void frmMessageList::fill()
     QStringList settled;
     for (const recovery::Settled& operation : recovery::takeSettled())
         settled.append(operation.sentence());
-    lblStatus->setText(settled.isEmpty() ? status() : settled.join(u' '));
+    lblStatus->tell(settled.isEmpty() ? status() : settled.join(u' '));
     cmdHeld->setText(u"%1 held back (F4)"_s.arg(heldBack.size()));
     cmdHeld->setShortcut(Qt::Key_F4);  // a new text takes the key away
     cmdHeld->setVisible(!heldBack.isEmpty());
@@ -159,10 +167,12 @@ QString frmMessageList::status() const
         return "The list could not be filled: "_L1 + fillFailure;
     const QString matching = gsListFilter.isEmpty() ? QString() : u" with \"%1\" in their name"_s.arg(gsListFilter);
     const qsizetype all = rows().size();
-    if (all == 0)
+    if (all == 0 && !isStopped)
         return "No "_L1 + wordOf(iFolder) + " messages"_L1 + matching;
     const QString counted = written().toString(all) + (all == 1 ? " message"_L1 : " messages"_L1) + matching;
-    return txtFind->text().isEmpty() ? counted : written().toString(messages->rowCount()) + " of "_L1 + counted;
+    const QString found =
+        txtFind->text().isEmpty() ? counted : written().toString(messages->rowCount()) + " of "_L1 + counted;
+    return isStopped ? found + "; not all, because Esc has stopped the reading (F5 reads all)"_L1 : found;
 }
 
 void frmMessageList::Option1_Click(MessageFolder folder)
@@ -228,7 +238,7 @@ bool frmMessageList::loadOnce(const QString& file)
 bool frmMessageList::load(const QString& file)
 {
     const QScopedValueRollback loading(busy, busy + 1);
-    const desktop::WaitPointer pointer;
+    const desktop::WaitPointer pointer(u"Loading %1..."_s.arg(file));
     const KeptMessage kept;
     try {
         EnsureConnection();
@@ -243,7 +253,7 @@ bool frmMessageList::load(const QString& file)
         }
         RefreshList();
         if (files::exists(gsCurFolder + file))
-            lblStatus->setText(
+            lblStatus->tell(
                 u"%1 is loaded, but could not be moved to the read messages: it is moved as soon as that "
                 "is possible."_s.arg(file));
         desktop::msgBox(u"Message Loaded"_s);
@@ -306,7 +316,7 @@ void frmMessageList::txtFind_Change()
     if (messages->rowCount() == 0)
         sCurFile.clear();  // a hidden message can't be reprinted
     choose(qMax(messages->rowOf(chosen), 0));
-    lblStatus->setText(status());
+    lblStatus->tell(status());
 }
 
 // Keeps the selected message, unlike the refreshes after a load or a deletion.
@@ -321,9 +331,9 @@ void frmMessageList::Form_Paste()
 {
     const QMimeData* clipboard = QGuiApplication::clipboard()->mimeData();
     if (iFolder != MessageFolder::Unread)
-        lblStatus->setText(u"Files can be taken in only while the unread messages are shown."_s);
+        lblStatus->tell(u"Files can be taken in only while the unread messages are shown."_s);
     else if (!clipboard || !clipboard->hasUrls())
-        lblStatus->setText(u"The clipboard contains no files."_s);
+        lblStatus->tell(u"The clipboard contains no files."_s);
     else
         takeIn(clipboard->urls());
 }
@@ -334,12 +344,12 @@ void frmMessageList::dragEnterEvent(QDragEnterEvent* event)
         return;
     event->setDropAction(Qt::CopyAction);  // with a move, the source program would delete the files
     event->accept();
-    lblStatus->setText(u"Let go to take the files in."_s);
+    lblStatus->tell(u"Let go to take the files in."_s);
 }
 
 void frmMessageList::dragLeaveEvent(QDragLeaveEvent*)
 {
-    lblStatus->setText(status());
+    lblStatus->tell(status());
 }
 
 void frmMessageList::dropEvent(QDropEvent* event)
@@ -365,8 +375,8 @@ void frmMessageList::takeIn(const QList<QUrl>& brought)
                                   return taken.toList.contains(message.file);
                               });
     const QString held = u" %1 not listed yet: held back by missing pictures or an earlier message."_s;
-    lblStatus->setText(taken.summary() + (waiting > 0 && fillFailure.isEmpty() ? held.arg(waiting) : QString()) + u' ' +
-                       lblStatus->text());
+    lblStatus->tell(taken.summary() + (waiting > 0 && fillFailure.isEmpty() ? held.arg(waiting) : QString()) + u' ' +
+                    lblStatus->text());
     if (!taken.refused.isEmpty())
         desktop::msgBox(taken.refusals(), desktop::Icon::Exclamation);
 }

@@ -16,6 +16,10 @@ class QTimer;
 class QToolButton;
 class QTreeView;
 
+namespace kest::desktop {
+class StatusLine;
+}
+
 namespace kest {
 
 class MessageListModel;
@@ -79,6 +83,7 @@ private:
     QRadioButton* optionOf(MessageFolder folder) const { return Option1[static_cast<size_t>(folder)]; }
     void buildControls();
     void arrange();
+    void fitColumns(int around);
     void connectControls();
     void fill();
     QString status() const;
@@ -99,7 +104,7 @@ private:
     QLineEdit* txtFind;
     QTreeView* ListView1;
     MessageListModel* messages;
-    QLabel* lblStatus;
+    desktop::StatusLine* lblStatus;
     QToolButton* cmdHeld;
     QProgressBar* prgFill;
     QPushButton* cmdProcess;
@@ -112,6 +117,7 @@ private:
     QString sCurFile;  // the file clicked last
     MessageFolder iFolder = MessageFolder::Unread;
     QString fillFailure;
+    bool isStopped = false;  // the last fill was stopped by Esc
     QList<HeldMessage> heldBack;
     int busy = 0;  // how many fills and loads are running; a delayed refresh waits until they end
 };

@@ -3,6 +3,7 @@
 #include "messagelist/MessageListModel.h"
 #include "messagelist/frmMessageList.h"
 #include "platform/desktop/Lists.h"
+#include "platform/desktop/StatusLine.h"
 #include "platform/desktop/Window.h"
 
 #include <QGroupBox>
@@ -92,12 +93,9 @@ void frmMessageList::buildControls()
     ListView1->setSelectionMode(QAbstractItemView::ExtendedSelection);  // for copying; the buttons use the current row
     desktop::prepareList(*ListView1, objectName());
     ListView1->header()->setSortIndicatorClearable(true);  // back to the order of the folder
-    for (size_t i = 0; i < columnWidths.size(); ++i)
-        ListView1->header()->resizeSection(static_cast<int>(i), desktop::pixels(columnWidths[i]));
     new ListSearch(*ListView1, *txtFind);
 
-    lblStatus = named(new QLabel, u"lblStatus"_s);
-    lblStatus->setTextFormat(Qt::PlainText);  // it shows file names
+    lblStatus = new desktop::StatusLine(u"lblStatus"_s);
     lblStatus->setWordWrap(true);
     cmdHeld = named(new QToolButton, u"cmdHeld"_s, u"Show the messages that are not listed yet (F4)"_s);
     cmdHeld->setAutoRaise(true);
@@ -163,10 +161,22 @@ void frmMessageList::arrange()
         setTabOrder(order[i - 1], order[i]);
     ListView1->setFocus();
 
-    int width = 2 * margin + ListView1->verticalScrollBar()->sizeHint().width() + 2 * ListView1->frameWidth();
+    fitColumns(2 * margin + ListView1->verticalScrollBar()->sizeHint().width() + 2 * ListView1->frameWidth());
+}
+
+// On a screen that is too narrow for the columns, all of them get narrower: a long text has a tool tip.
+void frmMessageList::fitColumns(int around)
+{
+    int all = 0;
     for (const int column : columnWidths)
-        width += desktop::pixels(column);
-    resize(QSize(width, desktop::pixels(openingHeight)).boundedTo(screen()->availableSize()));
+        all += desktop::pixels(column);
+    const QSize opening = QSize(all + around, desktop::pixels(openingHeight)).boundedTo(screen()->availableSize());
+    QHeaderView* header = ListView1->header();
+    for (int i = 0; i < header->count(); ++i) {
+        const int share = desktop::pixels(columnWidths[static_cast<size_t>(i)]) * (opening.width() - around) / all;
+        header->resizeSection(i, qMax(share, header->sectionSizeHint(i)));
+    }
+    resize(opening);
 }
 
 void frmMessageList::connectControls()

@@ -6,6 +6,8 @@
 #include "base/modLoggerEx.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
+#include "platform/database/Waiting.h"
+#include "platform/desktop/Progress.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/Background.h"
 #include "platform/files/files.h"
@@ -48,6 +50,10 @@ eKEST::eKEST()
     ++objects;
     desktop::setAbout(about);
     desktop::setFailureReporter(reportUntrapped);
+    if (desktop::isPersonPresent()) {
+        db::setStatementStep(desktop::stillWaiting);
+        db::setWait(desktop::waitFor);
+    }
     gConn = GetConnection();
     gsUnreadPath = homeFolder() + u"AUnread\\"_s;
     gsReadPath = homeFolder() + u"ARead\\"_s;

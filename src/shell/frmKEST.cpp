@@ -157,7 +157,7 @@ void frmKEST::cmdOK_Click()
 
 void frmKEST::sendQuote()
 {
-    const desktop::WaitPointer pointer;
+    const desktop::WaitPointer pointer(u"Sending the quote..."_s);
     EnsureConnection();
     recovery::settle();  // an interrupted send of this quote may have to be finished first
     SendQuote(*grsQuote);

@@ -149,6 +149,7 @@ TEST_F(MessageList, AFileThatHasGoneSinceTheListingIsPassedOver)
     hooks.progress = [](qint64 done, qint64) {
         if (done == 1)
             files::remove(gsUnreadPath + u"b.xml"_s);
+        return true;
     };
     QStringList names;
     for (const ListedMessage& one : BuildMessageList(MessageFolder::Unread, hooks))

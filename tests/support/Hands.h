@@ -3,6 +3,7 @@
 
 #include "platform/desktop/Window.h"
 
+#include <QCoreApplication>
 #include <QPrintDialog>
 #include <QPrinter>
 #include <QToolButton>

@@ -6,10 +6,12 @@
 #include "platform/database/ConnectionText.h"
 #include "platform/database/OdbcDrivers.h"
 #include "platform/database/Session.h"
+#include "platform/database/Waiting.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
 
 #include <QSysInfo>
+#include <QThread>
 
 namespace kest::db {
 
@@ -82,7 +84,18 @@ Connection::~Connection() = default;
 void Connection::open(const QString& connectionText)
 {
     close();
-    session_ = std::make_unique<Session>(openEngine(connectionText, ConnectionText(odbcOptions_), commandTimeout_));
+    std::unique_ptr<Engine> engine;
+    const auto connect = [&] { engine = openEngine(connectionText, ConnectionText(odbcOptions_), commandTimeout_); };
+    if (embeddedName(connectionText).isEmpty()) {
+        patiently(u"Connecting to "_s + ConnectionText(connectionText).value(u"Server") + u"..."_s,
+                  [&, here = QThread::currentThread()] {
+                      connect();
+                      engine->moveTo(here);
+                  });
+    } else {
+        connect();
+    }
+    session_ = std::make_unique<Session>(std::move(engine));
     session_->engine().setTimeout(commandTimeout_);
     ++generation_;
 }

@@ -11,6 +11,8 @@
 #include <memory>
 #include <vector>
 
+class QThread;
+
 namespace kest::db {
 
 /// The result of a statement, with values in the types of the driver.
@@ -61,6 +63,10 @@ public:
     virtual void unlock(const QString& name) = 0;
     /// Ends another session if it has that lock. The embedded engine has no sessions.
     virtual void endSession(const QString& /*session*/, const QString& /*lock*/) {}
+
+    /// Hands the connection over to a thread, which alone uses it from then on. Called in the thread that has opened
+    /// it.
+    virtual void moveTo(QThread* /*thread*/) {}
 
     /// Rebuilds all indexes, if another program can have damaged them.
     virtual void rebuildIndexes() {}

@@ -2,6 +2,7 @@
 #include "platform/database/EngineOdbc.h"
 #include "platform/database/MySqlServer.h"
 #include "platform/database/QtSqlEngine.h"
+#include "platform/database/Waiting.h"
 
 #include <QSqlError>
 
@@ -74,12 +75,14 @@ private:
     {
         const QString name = database.connectionName() + u"-ping"_s;
         QSqlError error;
-        {
-            QSqlDatabase second = QSqlDatabase::cloneDatabase(database, name);
-            if (!second.open())
-                error = second.lastError();
-        }
-        QSqlDatabase::removeDatabase(name);
+        patiently(u"Waiting for "_s + database.hostName() + u"..."_s, [&] {
+            {
+                QSqlDatabase second = QSqlDatabase::cloneDatabase(database, name);
+                if (!second.open())
+                    error = second.lastError();
+            }
+            QSqlDatabase::removeDatabase(name);
+        });
         if (meansConnectionLost(error))  // any other error is an answer
             fail(error);
     }

@@ -3,6 +3,7 @@
 #include "platform/RuntimeError.h"
 #include "platform/database/OdbcDrivers.h"
 #include "platform/database/TdsServer.h"
+#include "platform/database/Waiting.h"
 
 #include <QRegularExpression>
 
@@ -39,7 +40,7 @@ QString plain(QString message)
 
 void EngineOdbc::ping()
 {
-    run(u"SELECT 1"_s, pingSeconds);
+    patiently(u"Waiting for the database..."_s, [&] { run(u"SELECT 1"_s, pingSeconds); });
 }
 
 Answer EngineOdbc::run(const QString& statement, int seconds)

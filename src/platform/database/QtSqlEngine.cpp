@@ -2,6 +2,7 @@
 
 #include "platform/RuntimeError.h"
 
+#include <QSqlDriver>
 #include <QSqlError>
 #include <QSqlQuery>
 #include <QSqlRecord>
@@ -45,6 +46,11 @@ void QtSqlEngine::openDatabase()
         return;
     const QSqlError error = database.lastError();
     throw RuntimeError(CannotOpen, descriptionOf(error)).withDatabaseCodes(error.nativeErrorCode(), sqlState(error));
+}
+
+void QtSqlEngine::moveTo(QThread* thread)
+{
+    database.driver()->moveToThread(thread);
 }
 
 Answer QtSqlEngine::run(const QString& statement)

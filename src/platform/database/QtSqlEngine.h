@@ -18,6 +18,7 @@ public:
 
     Answer run(const QString& statement) override;
     QVariant insert(const QString& statement) override;
+    void moveTo(QThread* thread) override;
 
 protected:
     explicit QtSqlEngine(const QString& driver);

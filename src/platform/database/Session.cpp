@@ -4,6 +4,7 @@
 #include "platform/database/ColumnValues.h"
 #include "platform/database/FaultInjection.h"
 #include "platform/database/Statement.h"
+#include "platform/database/Waiting.h"
 
 #include <QRegularExpression>
 
@@ -170,6 +171,7 @@ void Session::rollback()
 
 void Session::checkFault()
 {
+    statementStep();
     if (!statementFault || !statementFault())
         return;
     if (statementFaultNumber == CannotOpen)

@@ -1,9 +1,11 @@
 #include "platform/desktop/Progress.h"
 
 #include "platform/Prompt.h"
+#include "platform/desktop/InputBlock.h"
 #include "platform/desktop/Window.h"
 
 #include <QApplication>
+#include <QDeadlineTimer>
 #include <QLabel>
 #include <QLayout>
 #include <QProgressBar>
@@ -15,21 +17,56 @@ namespace kest::desktop {
 namespace {
 
 // Milliseconds.
-constexpr int quiet = 500;            // an operation shorter than this shows no progress
+constexpr int quiet = 500;       // an operation shorter than this shows no progress
+constexpr int explained = 1000;  // a longer one says what it does
+constexpr int repaintInterval = 50;
 constexpr int longestExposure = 200;  // how long to wait until the window is on the screen
 constexpr int pollInterval = 10;
 
 constexpr int steps = 100;
 
-std::unique_ptr<QWidget> makeWindow(const QString& caption, const QString& what)
+struct Wait {
+    QString what;  // empty while a box, a window or a progress bar is up
+    QElapsedTimer since;
+    int waited = 0;  // milliseconds, before `since`
+};
+QList<Wait> waits;  // the last one is the innermost
+std::unique_ptr<QWidget> notice;
+
+void beginWait(const QString& what, int waited)
+{
+    Wait wait{what, {}, waited};
+    wait.since.start();
+    waits.append(wait);
+}
+
+void endWait()
+{
+    waits.removeLast();
+}
+
+/// Removes a window from the screen at once: what follows may process no events for a while.
+void takeAway(std::unique_ptr<QWidget>& window)
+{
+    if (!window)
+        return;
+    window.reset();
+    QCoreApplication::processEvents(QEventLoop::ExcludeUserInputEvents);
+}
+
+std::unique_ptr<QWidget> makeWindow(const QString& caption, const QString& what, bool hasBar)
 {
     auto window = std::make_unique<QWidget>(nullptr, Qt::Dialog | Qt::CustomizeWindowHint | Qt::WindowTitleHint);
     window->setWindowTitle(caption);
     auto* layout = new QVBoxLayout(window.get());
-    layout->addWidget(new QLabel(what));
-    auto* bar = new QProgressBar;
-    bar->setAccessibleName(what);
-    layout->addWidget(bar);
+    auto* label = new QLabel(what);
+    label->setTextFormat(Qt::PlainText);
+    layout->addWidget(label);
+    if (hasBar) {
+        auto* bar = new QProgressBar;
+        bar->setAccessibleName(what);
+        layout->addWidget(bar);
+    }
     window->setMinimumWidth(pixels(4500));
     return window;
 }
@@ -40,6 +77,7 @@ void putOnScreen(QWidget& window)
     window.winId();
     if (caller && caller->windowHandle())
         window.windowHandle()->setTransientParent(caller->windowHandle());
+    giveIcon(window);
     window.adjustSize();
     centre(window);
     window.show();
@@ -52,61 +90,112 @@ void putOnScreen(QWidget& window)
 
 }  // namespace
 
-WaitPointer::WaitPointer()
+WaitPointer::WaitPointer(const QString& what, int waited)
 {
     QGuiApplication::setOverrideCursor(Qt::WaitCursor);
+    beginWait(what, waited);
 }
 
 WaitPointer::~WaitPointer()
 {
+    endWait();
+    takeAway(notice);
     QGuiApplication::restoreOverrideCursor();
+}
+
+void stillWaiting()
+{
+    if (notice || waits.isEmpty() || waits.last().what.isEmpty() || !isPersonPresent())
+        return;
+    const Wait& wait = waits.last();
+    if (wait.since.elapsed() + wait.waited < explained)
+        return;
+    notice = makeWindow(defaultTitle(), wait.what, false);
+    putOnScreen(*notice);
+}
+
+void waitFor(const QString& what, const std::function<bool()>& isDone)
+{
+    const QDeadlineTimer shortWait(quiet);  // in which what is typed stays for later
+    while (!shortWait.hasExpired()) {
+        if (isDone())
+            return;
+    }
+    const InputBlock block;
+    const WaitPointer pointer(what, quiet);
+    while (!isDone()) {
+        stillWaiting();
+        QCoreApplication::processEvents();
+    }
 }
 
 OrdinaryPointer::OrdinaryPointer() : wasOther(QGuiApplication::overrideCursor())
 {
+    beginWait({}, 0);
+    takeAway(notice);
     if (wasOther)
         QGuiApplication::setOverrideCursor(Qt::ArrowCursor);
 }
 
 OrdinaryPointer::~OrdinaryPointer()
 {
+    endWait();
+    for (Wait& wait : waits) {
+        wait.since.start();
+        wait.waited = 0;
+    }
     if (wasOther)
         QGuiApplication::restoreOverrideCursor();
 }
 
-Progress::Progress(const QString& windowCaption, const QString& work, QProgressBar* windowBar)
+Progress::Progress(const QString& windowCaption, const QString& work, QProgressBar* windowBar, Stop stop)
     : caption(windowCaption), what(work), bar(windowBar)
 {
     since.start();
+    canStop = stop == Stop::ByEscape && isPersonPresent();
 }
 
 Progress::~Progress()
 {
+    if (input)
+        QCoreApplication::processEvents();  // what was typed until now is lost, too
     if (!shown)
         return;
+    endWait();
     QGuiApplication::restoreOverrideCursor();
     if (bar && !ownWindow)
         bar->hide();
+    if (input)
+        takeAway(ownWindow);
 }
 
-void Progress::step(qint64 done, qint64 total)
+bool Progress::step(qint64 done, qint64 total)
 {
     if (!shown && since.elapsed() > quiet)
         show();
     if (bar && shown && total > 0)
         bar->setValue(static_cast<int>(done * steps / total));
+    if (shown && canStop && !input)
+        input = std::make_unique<InputBlock>();  // what is typed during a short fill stays for later
+    if (input && (!sinceEvents.isValid() || sinceEvents.hasExpired(repaintInterval))) {
+        QCoreApplication::processEvents();
+        sinceEvents.start();
+    }
+    return !input || !input->isEscaped();
 }
 
 void Progress::show()
 {
     shown = true;
+    beginWait({}, 0);  // it says itself what it does
+    takeAway(notice);
     QGuiApplication::setOverrideCursor(Qt::WaitCursor);
     if (bar && bar->window()->isVisible()) {
         bar->show();
         if (QLayout* layout = bar->window()->layout())
             layout->activate();
     } else if (isPersonPresent()) {
-        ownWindow = makeWindow(caption, what);
+        ownWindow = makeWindow(caption, what, true);
         bar = ownWindow->findChild<QProgressBar*>();
         putOnScreen(*ownWindow);
     } else {

@@ -80,8 +80,10 @@ void showModal(QDialog& window)
         const OrdinaryPointer pointer;
         const std::shared_ptr<WindowDriver> driver = windowDriver;
         const bool isDriven = driver && driver->drive(window);
-        if (!isDriven)
+        if (!isDriven) {
             window.exec();
+            QCoreApplication::processEvents(QEventLoop::ExcludeUserInputEvents);  // a long operation may follow
+        }
         if (!isDriven || driver->isLikeAPerson())
             layout.remember();
     }

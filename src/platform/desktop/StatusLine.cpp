@@ -1,0 +1,44 @@
+#include "platform/desktop/StatusLine.h"
+
+#include <QAccessibleWidget>
+
+namespace kest::desktop {
+
+namespace {
+
+class AccessibleStatusLine final : public QAccessibleWidget {
+public:
+    explicit AccessibleStatusLine(StatusLine* line) : QAccessibleWidget(line, QAccessible::StatusBar) {}
+
+    QString text(QAccessible::Text kind) const override
+    {
+        return kind == QAccessible::Name ? static_cast<QLabel*>(widget())->text() : QAccessibleWidget::text(kind);
+    }
+};
+
+QAccessibleInterface* accessible(const QString& /*className*/, QObject* object)
+{
+    auto* line = qobject_cast<StatusLine*>(object);
+    return line ? new AccessibleStatusLine(line) : nullptr;
+}
+
+}  // namespace
+
+StatusLine::StatusLine(const QString& name)
+{
+    QAccessible::installFactory(accessible);
+    setObjectName(name);
+    setTextFormat(Qt::PlainText);
+}
+
+void StatusLine::tell(const QString& text)
+{
+    if (text == this->text())
+        return;
+    setText(text);
+    QAccessibleEvent event(this, QAccessible::Alert);
+    QAccessible::updateAccessibility(&event);
+    emit told(text);
+}
+
+}  // namespace kest::desktop

@@ -1,0 +1,80 @@
+// Tests what the mouse and several selected rows do in the message list.
+#include "messagelist/frmMessageList.h"
+#include "platform/script/Gestures.h"
+#include "support/Hands.h"
+#include "support/Shop.h"
+
+namespace gestures = desktop::gestures;
+
+struct Handling : Shop {
+    void work(const Hands::Work& work)
+    {
+        for (const char* name : {"a", "b", "c"})
+            arrive(std::string(name) + ".xml", cancellation(name));
+        const Hands hands({{u"frmMessageList"_s, work}});
+        frmMessageList::ShowForm();
+    }
+};
+
+TEST_F(Handling, SeveralRowsAreCopiedButOneIsLoaded)
+{
+    work([](QDialog& window) {
+        gestures::press(window, Qt::CTRL | Qt::Key_A);
+        gestures::press(window, Qt::CTRL | Qt::Key_C);
+        EXPECT_EQ(QGuiApplication::clipboard()->text().count(u'\n'), 2);
+        control<QAbstractButton>(window, "cmdProcess").click();
+    });
+    EXPECT_EQ(desktop->boxTexts().size(), 1) << "the refusal of one message";
+}
+
+TEST_F(Handling, TheNameTellsWhenAFileArrived)
+{
+    work([](QDialog& window) {
+        const QModelIndex name = control<QTreeView>(window, "ListView1").model()->index(0, 0);
+        EXPECT_EQ(name.data(Qt::ToolTipRole).toString().section(u' ', 0, 1),
+                  u"a.xml\nArrived "_s + QDate::currentDate().toString(u"dd/MM/yyyy"_s));
+    });
+}
+
+TEST_F(Handling, AllColumnsAreInViewOnANarrowScreen)
+{
+    const QFont usual = QApplication::font();
+    QFont small = usual;
+    small.setPointSizeF(usual.pointSizeF() * 0.75);  // the screen of the tests is narrower than those of today
+    QApplication::setFont(small);
+    work([](QDialog& window) {
+        gestures::settle();
+        EXPECT_EQ(window.width(), window.screen()->availableSize().width());
+        EXPECT_EQ(control<QTreeView>(window, "ListView1").horizontalScrollBar()->maximum(), 0);
+    });
+    QApplication::setFont(usual);
+}
+
+TEST_F(Handling, NothingMovesWhenTheFilterAppears)
+{
+    work([](QDialog& window) {
+        const auto places = [&] {
+            gestures::settle();
+            QStringList all;
+            for (const char* name : {"ListView1", "Frame1", "Command6", "txtFind", "cmdExit"}) {
+                const auto& widget = control<QWidget>(window, name);
+                all << u"%1,%2"_s.arg(widget.x()).arg(widget.y());
+            }
+            return all.join(u' ');
+        };
+        const QString before = places();
+        control<QAbstractButton>(window, "Option1(1)").click();
+        EXPECT_TRUE(control<QWidget>(window, "Frame2").isVisible());
+        EXPECT_EQ(places(), before);
+    });
+}
+
+TEST_F(Handling, AScriptLeavesThePersonsLayoutAlone)
+{
+    desktop.emplace(R"json({"windows": {"frmMessageList": [[{"resize": [15000, 7000]},
+                            {"key": "ListView1", "keys": "Ctrl+1"}]]}})json");
+    frmMessageList::ShowForm();
+    EXPECT_FALSE(files::exists(root() + u"/windows.ini"_s));
+    work([](QDialog& window) { window.resize(900, 600); });
+    EXPECT_TRUE(files::exists(root() + u"/windows.ini"_s)) << "a person's layout is kept";
+}

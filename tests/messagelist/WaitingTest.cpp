@@ -1,0 +1,135 @@
+// Tests what a person sees and can do while a fill runs, and while a server does not answer.
+#include "messagelist/frmMessageList.h"
+#include "platform/Prompt.h"
+#include "platform/database/Connection.h"
+#include "platform/database/Waiting.h"
+#include "platform/desktop/Person.h"
+#include "platform/desktop/Progress.h"
+#include "platform/script/Gestures.h"
+#include "support/Hands.h"
+#include "support/Shop.h"
+
+#include <QTcpServer>
+#include <QTcpSocket>
+
+namespace gestures = desktop::gestures;
+
+struct Waiting : Shop {
+    ~Waiting() override
+    {
+        db::setWait({});
+        db::setStatementStep({});
+    }
+
+    /// Returns the text of the small window that says what is being waited for, or an empty text.
+    static QString notice()
+    {
+        for (const QWidget* window : QApplication::topLevelWidgets())
+            if (window->isVisible() && !qobject_cast<const QDialog*>(window) && window->findChild<QLabel*>())
+                return window->findChild<QLabel*>()->text();
+        return {};
+    }
+};
+
+TEST_F(Waiting, AFillTakesNoKeyButEscWhichStopsIt)
+{
+    for (const char* name : {"a", "b", "c"})
+        arrive(std::string(name) + ".xml", cancellation(name));
+    const QString stopped = u"1 message; not all, because Esc has stopped the reading (F5 reads all)"_s;
+    QStringList lines;
+    const auto work = [&](QDialog& window) {
+        auto& read = control<QAbstractButton>(window, "Option1(1)");
+        const auto fill = [&](const std::function<void()>& during) {
+            QTimer::singleShot(0, &window, during);
+            db::setStatementStep([] {
+                QThread::msleep(501);  // from then on it is a long one
+                db::setStatementStep({});
+            });
+            control<QAbstractButton>(window, "Option1(0)").click();
+            gestures::settle();
+            lines << control<QLabel>(window, "lblStatus").text();
+        };
+        fill([&] {
+            gestures::press(window, Qt::Key_Delete);
+            gestures::press(window, Qt::ALT | Qt::Key_L);
+            gestures::click(read, read.rect().center());
+        });
+        EXPECT_FALSE(read.isChecked());
+        fill([&] { gestures::press(window, Qt::Key_Escape); });
+        EXPECT_TRUE(window.isVisible()) << "Esc closes it only at rest";
+        gestures::press(window, Qt::Key_F5);
+        lines << control<QLabel>(window, "lblStatus").text();
+        gestures::click(read, read.rect().center());
+        EXPECT_TRUE(read.isChecked());
+    };
+    desktop::usePerson();
+    const Hands hands({{u"frmMessageList"_s, work}});
+    frmMessageList::ShowForm();
+    desktop.emplace();
+    EXPECT_EQ(lines, (QStringList{u"3 messages"_s, stopped, u"3 messages"_s}));
+    EXPECT_EQ(filesIn(gsUnreadPath).size(), 3);
+}
+
+TEST_F(Waiting, ASilentServerIsNamedAfterASecond)
+{
+    QTcpServer server;
+    ASSERT_TRUE(server.listen(QHostAddress::LocalHost));
+    QList<QTcpSocket*> callers;
+    QObject::connect(&server, &QTcpServer::newConnection, &server,
+                     [&] { callers.append(server.nextPendingConnection()); });
+    QString seen;
+    bool hadPointer = false;
+    QTimer look;
+    QObject::connect(&look, &QTimer::timeout, &look, [&] {
+        seen += notice();
+        hadPointer |= QGuiApplication::overrideCursor() != nullptr;
+        if (!seen.isEmpty())
+            for (QTcpSocket* caller : std::as_const(callers))
+                caller->abort();
+    });
+    look.start(10);
+    desktop::usePerson();
+    db::setWait(desktop::waitFor);
+    db::Connection connection;
+    EXPECT_EQ(failureOf([&] {
+                  connection.open(
+                      u"Driver={MySQL};Server=127.0.0.1;Port=%1;Database=x;Uid=sa;Pwd=;"_s.arg(server.serverPort()));
+              }),
+              CannotOpen);
+    EXPECT_TRUE(seen.startsWith(u"Connecting to 127.0.0.1..."_s)) << seen;
+    EXPECT_TRUE(hadPointer);
+    EXPECT_EQ(notice() + (QGuiApplication::overrideCursor() ? u"pointer"_s : QString()), QString());
+    desktop.emplace();
+}
+
+TEST_F(Waiting, ALongLoadSaysWhatItDoesButNotBesideABox)
+{
+    quote("500").request("QR1");
+    arrive("m.xml", cancellation("QR1"));
+    QString seen;
+    bool isSlow = false;
+    db::setStatementStep([&] {
+        if (std::exchange(isSlow, false))
+            QThread::msleep(1001);
+        desktop::stillWaiting();
+        seen += notice();
+    });
+    QTimer close;
+    QObject::connect(&close, &QTimer::timeout, &close, [&] {
+        if (auto* box = qobject_cast<QMessageBox*>(QApplication::activeModalWidget())) {
+            EXPECT_EQ(box->text() + notice(), u"Message Loaded"_s);
+            box->close();
+        }
+    });
+    close.start(1);
+    desktop::usePerson();
+    const Hands hands({{u"frmMessageList"_s, [&](QDialog& window) {
+                            isSlow = true;
+                            control<QAbstractButton>(window, "cmdProcess").click();
+                        }}});
+    frmMessageList::ShowForm();
+    EXPECT_TRUE(seen.startsWith(u"Loading m.xml..."_s)) << seen;
+    EXPECT_EQ(notice(), QString());
+    EXPECT_EQ(filesIn(gsUnreadPath), QStringList());
+    desktop.emplace();
+}
