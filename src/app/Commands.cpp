@@ -4,6 +4,7 @@
 #include "app/HistoryCommands.h"
 #include "app/MessageCommands.h"
 #include "app/Outcome.h"
+#include "app/ProfileWindow.h"
 #include "app/TransportCommand.h"
 #include "base/CredentialCipher.h"
 #include "base/ModRegistry.h"
@@ -284,14 +285,6 @@ bool hasProfile()
     return QFileInfo::exists(profile::root() + u"/registry.ini"_s);
 }
 
-/// Asks the user, who may have started the program from the menu, if the profile is to be created.
-bool offersProfile()
-{
-    return desktop::ask(
-        u"There is no shop on this computer yet. Create its folder, with an empty quote database?\n\n"_s +
-        profile::root());
-}
-
 /// Returns why there is no usable profile, or an empty text if there is one.
 QString profileFault()
 {
@@ -330,8 +323,11 @@ Outcome runChecked(const CommandLine& line)
     const Command& command = found->second;
     if (line.arguments.size() < command.fewest || line.arguments.size() > command.most)
         return refused(u"wrong number of arguments for "_s + line.command, Usage);
-    if (command.needs != Needs::Nothing && isInteractive(line) && !hasProfile() && offersProfile())
-        initProfile(registerClass, Shop::New);
+    if (command.needs != Needs::Nothing && isInteractive(line) && !hasProfile()) {
+        ProfileWindow::ShowForm();  // the program may have been started from the menu
+        if (!hasProfile())
+            return refused(u"no profile was created"_s, NoConnection);
+    }
     if (const QString why = command.needs == Needs::Nothing ? QString() : profileFault(); !why.isEmpty()) {
         if (isInteractive(line))
             desktop::msgBox(why, desktop::Icon::Critical);  // a program started from the menu has no visible output

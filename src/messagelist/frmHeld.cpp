@@ -33,11 +33,12 @@ frmHeld::frmHeld(const QList<HeldMessage>& messages)
             row->setToolTip(column, row->text(column));
     }
     ListView1->setCurrentItem(ListView1->topLevelItem(0));
+    cmdView->setDefault(true);
     desktop::addListMenu(*ListView1, objectName(), {cmdView});
 
     auto* buttons = new QHBoxLayout;
-    buttons->addWidget(cmdView);
     buttons->addStretch();
+    buttons->addWidget(cmdView);
     buttons->addWidget(cmdClose);
     auto* layout = new QVBoxLayout(this);
     layout->addWidget(ListView1);

@@ -12,6 +12,7 @@
 #include "setup/QuoteDatabase.h"
 
 #include <QDir>
+#include <QFileInfo>
 
 namespace kest::app {
 
@@ -153,6 +154,27 @@ bool initProfile(const std::function<bool()>& registerClass, Shop shop, const QD
         throw RuntimeError(FileInputOutput, u"The class can't be registered in the settings."_s);
     writeSettings();  // last, because they mark the profile as complete
     return true;
+}
+
+void placeProfile(const QString& folder)
+{
+    if (!QDir::isAbsolutePath(folder))
+        throw RuntimeError(PathNotFound, u"a whole path is needed, from the first \"/\" on"_s);
+    const QString place = profile::root();
+    const QString chosen = QDir::cleanPath(folder);
+    const QDir there(chosen);
+    const bool isEmpty = there.isEmpty(QDir::AllEntries | QDir::Hidden | QDir::NoDotAndDotDot);
+    if (there.exists() && !isEmpty && !there.exists(u"registry.ini"_s))
+        throw RuntimeError(FileExists, u"it contains other files"_s);
+    if (chosen == place)
+        return;
+    files::makeFolder(chosen);
+    if (QFileInfo(place).isSymLink())
+        QFile::remove(place);  // of an attempt that has failed
+    QDir().rmdir(place);       // which fails if anything is in it
+    files::makeFolder(QFileInfo(place).path());
+    if (!QFile::link(chosen, place))
+        throw RuntimeError(PermissionDenied, u"%1 can't become a link to it"_s.arg(place));
 }
 
 QJsonObject where()

@@ -19,6 +19,11 @@ enum class Shop { New, Demo };
 /// Throws RuntimeError if a file can't be written.
 bool initProfile(const std::function<bool()>& registerClass, Shop shop, const QDate& today = QDate::currentDate());
 
+/// Makes `folder`, an absolute path of this system, the place of the profile, before initProfile(): if it is another
+/// folder than profile::root(), that becomes a link to it. Throws RuntimeError if `folder` is no absolute path, if it
+/// has other files in it but no profile, or if the link can't be made.
+void placeProfile(const QString& folder);
+
 /// Returns absolute paths of this system: `profile`, `database`, `unread`, `read`, `unsent`, `sent`, `images`, `pdf`,
 /// `reports`, `log`, `component`. Reads the settings without copying them to the machine-wide place.
 QJsonObject where();

@@ -1,5 +1,6 @@
 #include "windows/EveryWindow.h"
 
+#include "app/ProfileWindow.h"
 #include "base/SharedVariables.h"
 #include "loopback/TransportWindow.h"
 #include "messagelist/frmHeld.h"
@@ -106,6 +107,7 @@ void EveryWindow::each(const Check& check)
              gsCurFolder = gsUnreadPath;  // the list has left it in another folder
              frmViewXML::ShowForm(u"a.xml"_s);
          }},
+        {"frmProfile", check, [] { app::ProfileWindow::ShowForm(); }},
         {"KESTWeb", check, [] { app::TransportWindow(app::transportFolders()).run(); }},
     };
     gsCurFolder = gsUnreadPath;

@@ -90,8 +90,11 @@ TEST_F(EveryWindow, HasEachAccessKeyOnce)
 
 TEST_F(EveryWindow, IsLeftByEscapeAsByItsCloseBox)
 {
-    const QMap<QString, QString> defaults{
-        {u"frmKEST"_s, u"cmdOK"_s}, {u"frmSubletAuth"_s, u"Command1"_s}, {u"frmLogin"_s, u"cmdOK"_s}};
+    const QMap<QString, QString> defaults{{u"frmKEST"_s, u"cmdOK"_s},
+                                          {u"frmSubletAuth"_s, u"Command1"_s},
+                                          {u"frmLogin"_s, u"cmdOK"_s},
+                                          {u"frmProfile"_s, u"cmdOK"_s},
+                                          {u"frmHeld"_s, u"cmdView"_s}};
     each([&](QDialog& window) {
         QString taker;
         for (const QPushButton* button : window.findChildren<QPushButton*>())
