@@ -19,6 +19,8 @@ bool showWindow()
 {
     TransportWindow window(transportFolders());
     if (!window.claim()) {
+        if (TransportWindow::raiseOther(transportFolders()))
+            return true;
         desktop::msgBox(u"KESTWeb is running already."_s, desktop::Icon::Information, u"KESTWeb"_s);
         return false;
     }

@@ -11,7 +11,8 @@ enum class TransportMode { Once, Watching, Window };
 
 /// Runs the transport once, or until the program receives SIGINT or SIGTERM or its window is closed. Calls `heard`
 /// after each run, except in the mode Window, in which the window shows it. Returns false if another transport is
-/// already running for this profile; in the mode Window a box says so.
+/// already running for this profile. In the mode Window, the window that is open comes to the front, and true is
+/// returned; if there is none, a box says that a transport is running.
 bool runTransport(TransportMode mode, const TransportRunner::Heard& heard);
 
 /// Writes a program to the component's folder that the panel can start as KESTWeb: a shell script that runs `command`

@@ -4,9 +4,12 @@
 #include "loopback/TransportRunner.h"
 #include "platform/desktop/Form.h"
 
-class QLabel;
 class QPushButton;
 class QTreeWidget;
+
+namespace kest::desktop {
+class StatusLine;
+}
 
 namespace kest::app {
 
@@ -18,19 +21,24 @@ public:
 
     /// Returns false if another transport is running on these folders.
     bool claim() { return runner.claim(); }
+    /// Lets the window that is open for these folders come to the front. Returns false if there is none.
+    static bool raiseOther(const TransportFolders& folders);
     /// Shows the window until the user closes it or the program receives SIGINT or SIGTERM.
     void run();
 
 private:
     void tell(const Carry& carry);
     void addRow(const QStringList& cells);
+    void comeIfCalled();
 
     TransportRunner runner;
+    QString call;  // a file with which another start calls this window
+    QFileSystemWatcher calls;
     QTreeWidget* carriedList;
-    QLabel* status;
+    desktop::StatusLine* status;
     QPushButton* carryButton;
     QPushButton* closeButton;
-    int files = 0;
+    int carriedFiles = 0;
 };
 
 }  // namespace kest::app

@@ -1,6 +1,9 @@
 #include "app/TransportCommand.h"
 #include "loopback/Transport.h"
+#include "loopback/TransportWindow.h"
 #include "outbound/SendQuote.h"
+#include "platform/script/Gestures.h"
+#include "support/Hands.h"
 #include "support/Shop.h"
 
 const QDate today(2008, 3, 21);
@@ -233,6 +236,25 @@ TEST_F(Loopback, TheWindowShowsWhatIsCarried)
     app::TransportRunner first(folders(), [](const app::Carry&) {});
     ASSERT_TRUE(first.claim());
     EXPECT_FALSE(app::runTransport(app::TransportMode::Window, {}));
-    EXPECT_EQ(desktop->boxTexts().last(), u"KESTWeb is running already."_s);
+    EXPECT_EQ(desktop->boxTexts().last(), u"KESTWeb is running already."_s) << "there is no window to show";
     EXPECT_FALSE(app::runTransport(app::TransportMode::Once, {}));
+}
+
+TEST_F(Loopback, ASecondStartShowsTheWindowThatIsOpen)
+{
+    const auto work = [&](QDialog& window) {
+        window.showMinimized();
+        std::atomic<bool> answered = false;
+        const std::unique_ptr<QThread> second(
+            QThread::create([&] { answered = app::TransportWindow::raiseOther(folders()); }));
+        second->start();
+        while (!second->isFinished())
+            desktop::gestures::settle();
+        EXPECT_TRUE(answered);
+        EXPECT_FALSE(window.isMinimized());
+        EXPECT_TRUE(window.isActiveWindow());
+    };
+    const Hands hands({{u"KESTWeb"_s, work}});
+    EXPECT_TRUE(app::runTransport(app::TransportMode::Window, {}));
+    EXPECT_EQ(desktop->boxTexts(), QStringList());
 }
