@@ -3,6 +3,7 @@
 #include "base/modDBAccess.h"
 #include "platform/Prompt.h"
 #include "platform/database/Sql.h"
+#include "platform/desktop/Colours.h"
 #include "platform/desktop/Window.h"
 #include "platform/values.h"
 
@@ -111,6 +112,7 @@ void frmExtraInfo::build()
     lvColour->setAccessibleName(u"Colours"_s);
     lvColour->setHeaderLabel(u"Colour"_s);
     lvColour->setRootIsDecorated(false);
+    desktop::showFocus(*lvColour);
     lvColour->hide();
 
     enterChain = {cmbTransmission, txtVIN,        txtOdometer,  txtColour,    txtCylinders,

@@ -1,6 +1,7 @@
 #include "sublets/frmViewPDF.h"
 
 #include "platform/Prompt.h"
+#include "platform/desktop/Colours.h"
 #include "platform/desktop/PageTools.h"
 #include "platform/desktop/Progress.h"
 #include "platform/desktop/Window.h"
@@ -69,6 +70,7 @@ frmViewPDF::frmViewPDF(QPdfDocument& document, const QString& caption)
     AcroPDF1->setDocument(&pdf);
     AcroPDF1->setPageMode(QPdfView::PageMode::MultiPage);
     AcroPDF1->setZoomMode(QPdfView::ZoomMode::FitToWidth);
+    desktop::showFocus(*AcroPDF1);
     AcroPDF1->setFocus();
     setMinimumSize(tools->sizeHint().width() + desktop::pixels(rightMargin), desktop::pixels(4500));
     tools->showPage(1, pdf.pageCount());

@@ -6,6 +6,7 @@
 #include "base/modDBAccess.h"
 #include "platform/Prompt.h"
 #include "platform/database/Sql.h"
+#include "platform/desktop/Colours.h"
 #include "platform/desktop/Window.h"
 #include "platform/values.h"
 #include "quotedata/NoteChain.h"
@@ -118,6 +119,7 @@ QWidget* frmUtilities::quoteInformation()
     grid->addWidget(chkExtraInfo, below, 3);
     txtRemarks->setObjectName("txtRemarks"_L1);
     txtRemarks->setTabChangesFocus(true);
+    desktop::showFocus(*txtRemarks);
     txtRemarks->setMinimumHeight(desktop::pixels(1500));
     grid->addWidget(labelOf(txtRemarks, "Re&marks"_L1), below + 1, 0, Qt::AlignTop);
     grid->addWidget(txtRemarks, below + 1, 1, 1, 3);

@@ -2,6 +2,8 @@
 
 #include "base/SharedVariables.h"
 #include "platform/Prompt.h"
+#include "platform/desktop/Colours.h"
+#include "platform/desktop/StatusLine.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
 #include "utilities/ExactTextEdit.h"
@@ -12,7 +14,6 @@
 #include <QFontDatabase>
 #include <QHBoxLayout>
 #include <QKeyEvent>
-#include <QLabel>
 #include <QLineEdit>
 #include <QPushButton>
 #include <QRegularExpression>
@@ -45,7 +46,7 @@ frmViewXML::frmViewXML(const QString& file)
       Command2(new QPushButton(this)),
       findBar(new QWidget(this)),
       txtFind(new QLineEdit(this)),
-      lblPosition(new QLabel(this))
+      lblPosition(new desktop::StatusLine(u"lblPosition"_s))
 {
     setWindowFlag(Qt::WindowMaximizeButtonHint);
     setMinimumSize(desktop::pixels(9000, 4500));
@@ -57,6 +58,7 @@ frmViewXML::frmViewXML(const QString& file)
     txtXML->setLineWrapMode(QPlainTextEdit::NoWrap);
     txtXML->setTabStopDistance(tabWidth * QFontMetricsF(txtXML->font()).horizontalAdvance(u' '));
     txtXML->installEventFilter(this);
+    desktop::showFocus(*txtXML);
     Command2->setObjectName("Command2"_L1);
     Command2->setText(u"&Save"_s);
 
@@ -85,7 +87,6 @@ void frmViewXML::fillFindBar()
     txtFind->setObjectName("txtFind"_L1);
     previous->setObjectName("cmdFindPrevious"_L1);
     next->setObjectName("cmdFindNext"_L1);
-    lblPosition->setObjectName("lblPosition"_L1);
     auto* row = new QHBoxLayout(findBar);
     row->setContentsMargins({});
     row->addWidget(txtFind, 1);
@@ -203,7 +204,7 @@ void frmViewXML::findNext(QTextDocument::FindFlags direction)
     if (txtXML->find(wanted, direction))
         return;
     txtXML->setTextCursor(here);
-    lblPosition->setText(u"Not found"_s);
+    lblPosition->tell(u"Not found"_s);
 }
 
 void frmViewXML::showPosition()
@@ -218,7 +219,7 @@ void frmViewXML::colourVisibleTags()
     // one match for a run of tags: Qt would colour only the first of two selections that touch
     static const QRegularExpression tag(u"(</?[^<>\\s/][^<>]*>)+"_s);
     QTextCharFormat colour;
-    colour.setForeground(palette().color(QPalette::Link));
+    colour.setForeground(desktop::markColour(palette()));
 
     QTextCursor cursor = txtXML->cursorForPosition({});
     const int last = txtXML->cursorForPosition(txtXML->viewport()->rect().bottomLeft()).blockNumber();

@@ -7,9 +7,12 @@
 
 #include <array>
 
-class QLabel;
 class QLineEdit;
 class QPushButton;
+
+namespace kest::desktop {
+class StatusLine;
+}
 
 namespace kest {
 
@@ -47,7 +50,7 @@ private:
     QPushButton* Command2;
     QWidget* findBar;
     QLineEdit* txtFind;
-    QLabel* lblPosition;
+    desktop::StatusLine* lblPosition;
 };
 
 }  // namespace kest

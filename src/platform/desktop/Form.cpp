@@ -1,6 +1,7 @@
 #include "platform/desktop/Form.h"
 
 #include "platform/Prompt.h"
+#include "platform/desktop/Colours.h"
 #include "platform/desktop/Window.h"
 
 #include <QApplication>
@@ -53,12 +54,14 @@ Form::Form(const QString& name, const QString& caption) : QDialog(nullptr)
 {
     setObjectName(name);
     setWindowTitle(caption);
+    showFocusOfButtons(*this);
 }
 
 void Form::showEvent(QShowEvent* event)
 {
     for (QPushButton* button : findChildren<QPushButton*>())
         button->setAutoDefault(false);
+    setAttribute(Qt::WA_KeyboardFocusChange);  // otherwise the focus is invisible until the first Tab
     QDialog::showEvent(event);
 }
 
@@ -103,12 +106,13 @@ void showAbout()
 QIcon dropArrow(const QPalette& palette)
 {
     constexpr qreal sharpness = 2;
-    QPixmap picture(QSize(pictureSize, pictureSize) * sharpness);
+    const int size = QApplication::style()->pixelMetric(QStyle::PM_SmallIconSize);  // as in a QLineEdit, so not shrunk
+    QPixmap picture(QSize(size, size) * sharpness);
     picture.setDevicePixelRatio(sharpness);
     picture.fill(Qt::transparent);
     QPainter painter(&picture);
     QStyleOption arrow;
-    arrow.rect = QRect(0, 0, pictureSize, pictureSize);
+    arrow.rect = QRect(0, 0, size, size);
     arrow.palette = palette;
     arrow.state = QStyle::State_Enabled;
     QApplication::style()->drawPrimitive(QStyle::PE_IndicatorArrowDown, &arrow, &painter);

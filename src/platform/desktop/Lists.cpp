@@ -1,5 +1,6 @@
 #include "platform/desktop/Lists.h"
 
+#include "platform/desktop/Colours.h"
 #include "platform/desktop/Window.h"
 
 #include <QClipboard>
@@ -50,6 +51,7 @@ void copyRows(const QTreeView& list)
 
 void prepareList(QTreeView& list, const QString& window)
 {
+    showFocus(list);
     list.setRootIsDecorated(false);
     list.setUniformRowHeights(true);
     list.setAllColumnsShowFocus(true);

@@ -1,6 +1,7 @@
 #include "platform/desktop/Person.h"
 
 #include "platform/Prompt.h"
+#include "platform/desktop/Colours.h"
 #include "platform/desktop/Programs.h"
 #include "platform/desktop/Progress.h"
 #include "platform/desktop/Window.h"
@@ -67,6 +68,7 @@ void makeCopyable(QDialog& window, const QString& text)
 int shown(QDialog& window)
 {
     giveIcon(window);
+    showFocusOfButtons(window);
     const int result = window.exec();
     QCoreApplication::processEvents(QEventLoop::ExcludeUserInputEvents);
     return result;

@@ -2,6 +2,7 @@
 
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
+#include "platform/desktop/Colours.h"
 #include "platform/desktop/PageTools.h"
 #include "platform/desktop/SaveDialog.h"
 #include "platform/desktop/Window.h"
@@ -54,6 +55,7 @@ Preview::Preview(QWidget* parent, const std::function<void()>& print)
     sheet->setObjectName(u"crvPages"_s);
     sheet->setAccessibleName(u"Report"_s);
     setFocusProxy(sheet);
+    desktop::showFocus(*sheet);
     const QString source = u"frmPrintPreview.crvPreview_View"_s;
     desktop::onEvent(view, &QPrintPreviewWidget::paintRequested, this, source, [this](QPrinter* printer) {
         if (shown)
