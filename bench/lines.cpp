@@ -1,4 +1,5 @@
 // Measures loads of authorised and manual quotes with many lines against the plain statements of the same load.
+#include "PlainStatements.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "inbound/modLoadXML.h"
@@ -10,10 +11,6 @@
 
 #include <QCoreApplication>
 #include <QElapsedTimer>
-#include <QSqlDatabase>
-#include <QSqlError>
-#include <QSqlQuery>
-#include <QSqlRecord>
 #include <QTemporaryDir>
 
 #include <benchmark/benchmark.h>
@@ -22,23 +19,6 @@ using namespace Qt::StringLiterals;
 
 namespace kest {
 namespace {
-
-/// Executes a query and returns all values of its first column.
-QList<qint64> run(const QString& statement)
-{
-    QSqlQuery query(QSqlDatabase::database(QSqlDatabase::connectionNames().constFirst(), false));
-    query.setForwardOnly(true);
-    if (!query.exec(statement))
-        qFatal("%s: %s", qPrintable(statement), qPrintable(query.lastError().text()));
-    const int columns = query.record().count();
-    QList<qint64> first;
-    while (query.next()) {
-        for (int column = 0; column < columns; ++column)
-            benchmark::DoNotOptimize(query.value(column));
-        first += query.value(0).toLongLong();
-    }
-    return first;
-}
 
 constexpr const char* categories[] = {"R&R", "RA", "MIS"};
 constexpr const char* labourTypes[] = {"RR", "REPR", "OTH"};
@@ -58,21 +38,21 @@ public:
         gcnDB = gConn = app::openEmbedded(u"WirSql"_s);
         app::createTables(*gConn, app::Dialect::Embedded);
         app::fillNewShop(*gConn);
-        run(u"INSERT INTO CAR (REGO, CUST_ID, KEST) VALUES ('ABC123', 1, 1)"_s);
-        run(u"BEGIN"_s);
+        runPlain(u"INSERT INTO CAR (REGO, CUST_ID, KEST) VALUES ('ABC123', 1, 1)"_s);
+        runPlain(u"BEGIN"_s);
         for (const int quote : {1, 2}) {
-            run(
+            runPlain(
                 sql("INSERT INTO QUOTE1 (QTNNO, Subquote, REGO, INSURER_ID, KESTQRNo, excess, contri) "
                     "VALUES ('{}', 0, 'ABC123', 1, 'QR1', 0, 0)",
                     quote));
-            run(sql("INSERT INTO QUOTE3 (QTNNO, Subquote, remarks) VALUES ('{}', 0, '')", quote));
+            runPlain(sql("INSERT INTO QUOTE3 (QTNNO, Subquote, remarks) VALUES ('{}', 0, '')", quote));
             for (qint64 line = 1; line <= lines; ++line)
-                run(
+                runPlain(
                     sql("INSERT INTO QUOTE2 (QTNNO, Subquote, SEQ_NO, category, script, rrhour, rr_rate2, PartNo, "
                         "itemno, allow_tick) VALUES ('{}', 0, {}, '{}', 'Left front guard', 1, 38, '', '137', 7)",
                         quote, line, QString::fromLatin1(categories[line % 3])));
         }
-        run(u"COMMIT"_s);
+        runPlain(u"COMMIT"_s);
     }
 
     ~BenchShop()
@@ -156,7 +136,7 @@ constexpr const char* selectsOfQuote[] = {
 
 void updateHeader(int round)
 {
-    run(
+    runPlain(
         sql("UPDATE QUOTE1 SET KESTQuoteNo='KQ1', Claim='7700001', RR_RATE=1, RA_RATE=1, paint_rate=1, QSENT='R', "
             "TOTAL=0, PRTTOTAL=0, MISTOTAL=0, Job_stage={} WHERE QTNNO='2' AND Subquote=0",
             round));
@@ -164,50 +144,51 @@ void updateHeader(int round)
 
 void updateTotals(int round)
 {
-    run(sql("UPDATE QUOTE1 SET TOTAL={}, PRTTOTAL={}, MISTOTAL={} WHERE QTNNO='2' AND Subquote=0", round, round,
-            round));
+    runPlain(sql("UPDATE QUOTE1 SET TOTAL={}, PRTTOTAL={}, MISTOTAL={} WHERE QTNNO='2' AND Subquote=0", round, round,
+                 round));
 }
 
 void statementsOfAuthorised(int64_t, int round)
 {
     for (const char* select : selectsOfQuote)
-        run(QString::fromLatin1(select));
-    const QList<qint64> lines = run(QString::fromLatin1(selectsOfQuote[1]));  // because the comparison reads them too
-    run(QString::fromLatin1(selectsOfQuote[0]));
+        runPlain(QString::fromLatin1(select));
+    const QList<qint64> lines =
+        runPlain(QString::fromLatin1(selectsOfQuote[1]));  // because the comparison reads them too
+    runPlain(QString::fromLatin1(selectsOfQuote[0]));
     updateTotals(-round);
     updateHeader(round);
     for (const qint64 line : lines)
-        run(
+        runPlain(
             sql("UPDATE QUOTE2 SET rrhour={}, rahour={}, unitcost={}, rr_rate2=1, opg_rate=0, Tag=1, tosend='A', "
                 "script='Left front guard' WHERE itemid={}",
                 10 + round, 10 + round, 10 + round, line));
-    run(sql("UPDATE QUOTE3 SET remarks='({} : Authorised Quote)' WHERE QTNNO='2' AND Subquote=0", round));
+    runPlain(sql("UPDATE QUOTE3 SET remarks='({} : Authorised Quote)' WHERE QTNNO='2' AND Subquote=0", round));
     updateTotals(round);
-    run(u"SELECT * FROM ExternalSettings WHERE TAG='JOBLINK'"_s);
+    runPlain(u"SELECT * FROM ExternalSettings WHERE TAG='JOBLINK'"_s);
 }
 
 void statementsOfManual(int64_t lines, int round)
 {
-    run(u"SELECT * FROM CINFO"_s);
-    run(u"SELECT * FROM KESTColours"_s);
+    runPlain(u"SELECT * FROM CINFO"_s);
+    runPlain(u"SELECT * FROM KESTColours"_s);
     for (const char* select : selectsOfQuote)
-        run(QString::fromLatin1(select));
-    for (const qint64 line : run(u"SELECT itemid FROM QUOTE2 WHERE QTNNO='2' AND SUBQUOTE='0'"_s))
-        run(sql("DELETE FROM QUOTE2 WHERE itemid={}", line));
+        runPlain(QString::fromLatin1(select));
+    for (const qint64 line : runPlain(u"SELECT itemid FROM QUOTE2 WHERE QTNNO='2' AND SUBQUOTE='0'"_s))
+        runPlain(sql("DELETE FROM QUOTE2 WHERE itemid={}", line));
     updateHeader(round);
     for (qint64 line = 1; line <= lines; ++line) {
-        run(
+        runPlain(
             sql("INSERT INTO QUOTE2 (QTNNO, Subquote, SEQ_NO, category, script, rrhour, rr_rate2, allow_tick, "
                 "opg_rate, Tag, delitem, VENDOR, tosend, PartNo, blend) "
                 "VALUES ('2', 0, {}, 'R&R', 'Left front guard', {}, 1, 7, 0, 1, 0, 0, 'A', '', 0)",
                 line, 10 + round));
-        const qint64 row = run(u"SELECT last_insert_rowid()"_s).constFirst();
-        run(sql("SELECT rahour, pthour, qty, unitcost, DELETEDITEM, Report, Report_on FROM QUOTE2 WHERE itemid={}",
-                row));
-        run(sql("UPDATE QUOTE2 SET itemno='137' WHERE itemid={}", row));
+        const qint64 row = runPlain(u"SELECT last_insert_rowid()"_s).constFirst();
+        runPlain(sql("SELECT rahour, pthour, qty, unitcost, DELETEDITEM, Report, Report_on FROM QUOTE2 WHERE itemid={}",
+                     row));
+        runPlain(sql("UPDATE QUOTE2 SET itemno='137' WHERE itemid={}", row));
     }
     updateTotals(round);
-    run(sql("UPDATE QUOTE3 SET remarks='({} : Manual Quote Loaded)' WHERE QTNNO='2' AND Subquote=0", round));
+    runPlain(sql("UPDATE QUOTE3 SET remarks='({} : Manual Quote Loaded)' WHERE QTNNO='2' AND Subquote=0", round));
 }
 
 /// Runs loads and statements in turn and reports the ratio of their times.

@@ -1,5 +1,6 @@
 // Measures the load of a message against the plain statements that it needs, on the same database. Also measures the
 // note chain.
+#include "PlainStatements.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "inbound/modLoadXML.h"
@@ -11,9 +12,6 @@
 
 #include <QCoreApplication>
 #include <QElapsedTimer>
-#include <QSqlDatabase>
-#include <QSqlError>
-#include <QSqlQuery>
 #include <QTemporaryDir>
 
 #include <benchmark/benchmark.h>
@@ -44,16 +42,6 @@ public:
         gConn.reset();
         gcnDB.reset();
         profile::setRoot({});
-    }
-
-    static void run(const QString& statement)
-    {
-        QSqlQuery query(QSqlDatabase::database(QSqlDatabase::connectionNames().constFirst(), false));
-        query.setForwardOnly(true);
-        if (!query.exec(statement))
-            qFatal("%s: %s", qPrintable(statement), qPrintable(query.lastError().text()));
-        while (query.next())
-            benchmark::DoNotOptimize(query.value(0));
     }
 
 private:
@@ -153,7 +141,7 @@ void loadRequest(benchmark::State& state)
         },
         [&](int number) {
             for (const QString& statement : statementsOfRequest(number))
-                shop.run(statement);
+                runPlain(statement);
         });
 }
 BENCHMARK(loadRequest)->UseManualTime()->Iterations(requests)->Unit(benchmark::kMillisecond);
@@ -162,9 +150,9 @@ void loadStatusMessage(benchmark::State& state)
 {
     BenchShop shop;
     for (int number = 0; number < 1000; ++number) {
-        shop.run(
+        runPlain(
             u"INSERT INTO QUOTE1 (QTNNO, Subquote, KESTQRNo, Job_stage) VALUES ('%1', 0, 'QR%1', 1)"_s.arg(number));
-        shop.run(u"INSERT INTO QUOTE3 (QTNNO, Subquote, remarks) VALUES ('%1', 0, '')"_s.arg(number));
+        runPlain(u"INSERT INTO QUOTE3 (QTNNO, Subquote, remarks) VALUES ('%1', 0, '')"_s.arg(number));
     }
     compare(
         state,
@@ -176,12 +164,12 @@ void loadStatusMessage(benchmark::State& state)
         },
         [&](int number) {
             const QString other = QString::number(500 + number % 500);
-            shop.run(u"SELECT * FROM QUOTE1 WHERE KESTQRNO='QR%1' ORDER BY rec_id DESC"_s.arg(other));
-            shop.run(u"SELECT * FROM QUOTE3 WHERE QTNNO='%1' AND SUBQUOTE='0'"_s.arg(other));
-            shop.run(
+            runPlain(u"SELECT * FROM QUOTE1 WHERE KESTQRNO='QR%1' ORDER BY rec_id DESC"_s.arg(other));
+            runPlain(u"SELECT * FROM QUOTE3 WHERE QTNNO='%1' AND SUBQUOTE='0'"_s.arg(other));
+            runPlain(
                 u"UPDATE QUOTE3 SET remarks='(22/11/2026 : QR Cancelled - sold) (22/11/2026 : Cancelled Quote "
                 "Request)' WHERE QTNNO='%1' AND Subquote=0"_s.arg(other));
-            shop.run(u"UPDATE QUOTE1 SET Job_stage=9, ReadOnly=1 WHERE rec_id=%1"_s.arg(other));
+            runPlain(u"UPDATE QUOTE1 SET Job_stage=9, ReadOnly=1 WHERE rec_id=%1"_s.arg(other));
         });
 }
 BENCHMARK(loadStatusMessage)->UseManualTime()->Iterations(490)->Unit(benchmark::kMillisecond);

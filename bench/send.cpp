@@ -1,5 +1,6 @@
 // Measures a send against the plain statements that it needs and the serialisation of the same tree. Also measures the
 // totals.
+#include "PlainStatements.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "outbound/SendQuote.h"
@@ -13,10 +14,6 @@
 
 #include <QCoreApplication>
 #include <QElapsedTimer>
-#include <QSqlDatabase>
-#include <QSqlError>
-#include <QSqlQuery>
-#include <QSqlRecord>
 #include <QTemporaryDir>
 
 #include <benchmark/benchmark.h>
@@ -31,18 +28,6 @@ class SaysYes final : public desktop::Answerer {
     QString input(const desktop::Input&) override { return {}; }
     void start(const QString&) override {}
 };
-
-void run(const QString& statement)
-{
-    QSqlQuery query(QSqlDatabase::database(QSqlDatabase::connectionNames().constFirst(), false));
-    query.setForwardOnly(true);
-    if (!query.exec(statement))
-        qFatal("%s: %s", qPrintable(statement), qPrintable(query.lastError().text()));
-    const int columns = query.record().count();
-    while (query.next())
-        for (int column = 0; column < columns; ++column)
-            benchmark::DoNotOptimize(query.value(column));
-}
 
 /// A new shop with the quote 1, which has `lines` lines of every kind.
 class BenchShop {
@@ -60,22 +45,24 @@ public:
         gcnDB = gConn = app::openEmbedded(u"WirSql"_s);
         app::createTables(*gConn, app::Dialect::Embedded);
         app::fillNewShop(*gConn);
-        run(u"INSERT INTO ALLMODEL (MODEL_ID, MAKE, MODEL) VALUES ('C120', 'CORELLA', 'MERIDIAN GL')"_s);
-        run(u"INSERT INTO CUSTOMER (CUST_ID, NAME, FIRSTNAME, SALUTATION) VALUES (1, 'Holloway', 'Kim', 'Ms')"_s);
-        run(u"INSERT INTO CAR (REGO, CUST_ID, MODEL_ID, BODY_ID2, Year, XMission, COLOUR) "
+        runPlain(u"INSERT INTO ALLMODEL (MODEL_ID, MAKE, MODEL) VALUES ('C120', 'CORELLA', 'MERIDIAN GL')"_s);
+        runPlain(u"INSERT INTO CUSTOMER (CUST_ID, NAME, FIRSTNAME, SALUTATION) VALUES (1, 'Holloway', 'Kim', 'Ms')"_s);
+        runPlain(
+            u"INSERT INTO CAR (REGO, CUST_ID, MODEL_ID, BODY_ID2, Year, XMission, COLOUR) "
             "VALUES ('ABC123', 1, 'C120', '4S', '03/2005', 'Manual', 'Silver')"_s);
-        run(u"INSERT INTO QUOTE1 (QTNNO, Subquote, REGO, INSURER_ID, Claim, ReadOnly) "
+        runPlain(
+            u"INSERT INTO QUOTE1 (QTNNO, Subquote, REGO, INSURER_ID, Claim, ReadOnly) "
             "VALUES ('1', 0, 'ABC123', 1, '7700001', 0)"_s);
-        run(u"INSERT INTO QUOTE3 (QTNNO, Subquote, remarks) VALUES ('1', 0, '')"_s);
+        runPlain(u"INSERT INTO QUOTE3 (QTNNO, Subquote, remarks) VALUES ('1', 0, '')"_s);
         const char* categories[] = {"R&R", "RA", "PAINT", "PRT", "MIS"};
-        run(u"BEGIN"_s);
+        runPlain(u"BEGIN"_s);
         for (int64_t i = 0; i < lines; ++i)
-            run(
+            runPlain(
                 sql("INSERT INTO QUOTE2 (QTNNO, Subquote, category, script, rrhour, rahour, pthour, rr_rate2, qty, "
                     "unitcost, PartNo, MARK) VALUES ('1', 0, '{}', 'Left front guard {}', 1.25, 1.5, 2, 38.5, 1, 20.5, "
                     "'P{}', '')",
                     QString::fromLatin1(categories[i % 5]), static_cast<qint64>(i), static_cast<qint64>(i)));
-        run(u"COMMIT"_s);
+        runPlain(u"COMMIT"_s);
     }
 
     ~BenchShop()
@@ -92,35 +79,35 @@ private:
 /// Restores the state before the first send: no line has a number.
 void takeBack()
 {
-    run(u"UPDATE QUOTE1 SET ReadOnly=0, Job_stage=1, quotechanged=0 WHERE QTNNO='1'"_s);
-    run(u"UPDATE QUOTE2 SET SEQ_NO=NULL WHERE QTNNO='1'"_s);
-    run(u"UPDATE QUOTE3 SET remarks='' WHERE QTNNO='1'"_s);
+    runPlain(u"UPDATE QUOTE1 SET ReadOnly=0, Job_stage=1, quotechanged=0 WHERE QTNNO='1'"_s);
+    runPlain(u"UPDATE QUOTE2 SET SEQ_NO=NULL WHERE QTNNO='1'"_s);
+    runPlain(u"UPDATE QUOTE3 SET remarks='' WHERE QTNNO='1'"_s);
 }
 
 void bareStatements(int64_t lines)
 {
     const QString ofQuote = u" WHERE QTNNO='1' AND SUBQUOTE=0"_s;
     for (int i = 0; i < 3; ++i)
-        run(u"SELECT * FROM QUOTE1"_s + ofQuote);
+        runPlain(u"SELECT * FROM QUOTE1"_s + ofQuote);
     for (int i = 0; i < 2; ++i) {
-        run(u"SELECT * FROM CUSTOMER WHERE CUST_ID=1"_s);
-        run(u"SELECT * FROM CAR WHERE REGO='ABC123'"_s);
-        run(u"SELECT * FROM ALLMODEL WHERE MODEL_ID='C120'"_s);
-        run(u"SELECT * FROM QUOTE3"_s + ofQuote);
-        run(u"SELECT * FROM QUOTE2"_s + ofQuote);  // once for rounding, once for the totals
+        runPlain(u"SELECT * FROM CUSTOMER WHERE CUST_ID=1"_s);
+        runPlain(u"SELECT * FROM CAR WHERE REGO='ABC123'"_s);
+        runPlain(u"SELECT * FROM ALLMODEL WHERE MODEL_ID='C120'"_s);
+        runPlain(u"SELECT * FROM QUOTE3"_s + ofQuote);
+        runPlain(u"SELECT * FROM QUOTE2"_s + ofQuote);  // once for rounding, once for the totals
     }
-    run(u"SELECT NAME, KEST FROM INSURER WHERE INSURER_ID=1"_s);
-    run(u"SELECT * FROM QUOTE2 WHERE QTNNO='1' AND SUBQUOTE=0 AND CATEGORY='PRT' AND QTY=0"_s);
+    runPlain(u"SELECT NAME, KEST FROM INSURER WHERE INSURER_ID=1"_s);
+    runPlain(u"SELECT * FROM QUOTE2 WHERE QTNNO='1' AND SUBQUOTE=0 AND CATEGORY='PRT' AND QTY=0"_s);
     for (const char* set :
          {"CATEGORY='R&R' AND PARTNO <> 'M'", "CATEGORY='RA'", "CATEGORY='R&R' AND PARTNO='M'", "CATEGORY='MIS'",
           "CATEGORY='PRT'", "CATEGORY='PAINT'", "CATEGORY='OPG'", "CATEGORY='MIS' AND VENDOR>0", "REPORT_ON=1"})
-        run(u"SELECT ITEMID, PARTNO, SCRIPT, RRHOUR, RR_RATE2, SEQ_NO FROM QUOTE2"_s + ofQuote + u" AND "_s +
-            QString::fromLatin1(set));
+        runPlain(u"SELECT ITEMID, PARTNO, SCRIPT, RRHOUR, RR_RATE2, SEQ_NO FROM QUOTE2"_s + ofQuote + u" AND "_s +
+                 QString::fromLatin1(set));
     for (int64_t i = 1; i <= lines; ++i)
-        run(u"UPDATE QUOTE2 SET SEQ_NO=%1 WHERE itemid=%1"_s.arg(i));
-    run(u"UPDATE QUOTE1 SET TOTAL=1, PRTTOTAL=1, quotechanged=1 WHERE QTNNO='1'"_s);
-    run(u"UPDATE QUOTE1 SET Job_stage=3, ReadOnly=1 WHERE QTNNO='1'"_s);
-    run(u"UPDATE QUOTE3 SET remarks='(22/11/2026 : Sending KEST Quote)' WHERE QTNNO='1'"_s);
+        runPlain(u"UPDATE QUOTE2 SET SEQ_NO=%1 WHERE itemid=%1"_s.arg(i));
+    runPlain(u"UPDATE QUOTE1 SET TOTAL=1, PRTTOTAL=1, quotechanged=1 WHERE QTNNO='1'"_s);
+    runPlain(u"UPDATE QUOTE1 SET Job_stage=3, ReadOnly=1 WHERE QTNNO='1'"_s);
+    runPlain(u"UPDATE QUOTE3 SET remarks='(22/11/2026 : Sending KEST Quote)' WHERE QTNNO='1'"_s);
 }
 
 void sendQuote(benchmark::State& state)

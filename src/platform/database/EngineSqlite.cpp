@@ -1,20 +1,20 @@
-// The embedded engine: a file of the profile, opened by QSQLITE, with our comparison of texts.
+// The embedded engine: a file of the profile, with our comparison of texts.
 #include "platform/RuntimeError.h"
 #include "platform/database/Collation.h"
-#include "platform/database/QtSqlEngine.h"
+#include "platform/database/Engine.h"
+#include "platform/database/Shape.h"
 #include "platform/files/Lock.h"
 #include "platform/values.h"
 
 #include <QDeadlineTimer>
 #include <QFileInfo>
-#include <QSqlDriver>
-#include <QSqlError>
 
 #include <sqlite3.h>
 
 #include <algorithm>
-#include <cstring>
 #include <map>
+#include <optional>
+#include <unordered_map>
 
 namespace kest::db {
 
@@ -69,16 +69,67 @@ void likeFunction(sqlite3_context* context, int, sqlite3_value** arguments)
     sqlite3_result_int(context, isLike(textOfValue(arguments[1]), pattern));
 }
 
-class EngineSqlite final : public QtSqlEngine {
+using Handle = std::unique_ptr<sqlite3, decltype([](sqlite3* handle) { sqlite3_close(handle); })>;
+
+/// A prepared statement. It can be executed any number of times.
+struct Prepared {
+    std::unique_ptr<sqlite3_stmt, decltype([](sqlite3_stmt* statement) { sqlite3_finalize(statement); })> statement;
+    QStringList names;  // of the columns
+    int times = -1;     // how often SQLite had prepared it again when the names were read
+};
+
+void bindValues(sqlite3_stmt* statement, const QList<QString>& values)
+{
+    int parameter = 0;
+    for (const QString& value : values) {
+        ++parameter;
+        bool isWhole = false;
+        const qint64 whole = value.toLongLong(&isWhole);
+        if (value.startsWith(u'\'')) {
+            const QString text = value.sliced(1, value.size() - 2).replace(u"''"_s, u"'"_s);
+            sqlite3_bind_text16(statement, parameter, text.utf16(), int(text.size() * 2), SQLITE_TRANSIENT);
+        } else if (isWhole) {
+            sqlite3_bind_int64(statement, parameter, whole);
+        } else {
+            sqlite3_bind_double(statement, parameter, value.toDouble());
+        }
+    }
+}
+
+QVariant valueOf(sqlite3_stmt* statement, int column)
+{
+    switch (sqlite3_column_type(statement, column)) {
+        case SQLITE_NULL:
+            return {};
+        case SQLITE_INTEGER:
+            return qint64(sqlite3_column_int64(statement, column));
+        case SQLITE_FLOAT:
+            return sqlite3_column_double(statement, column);
+        case SQLITE_BLOB:
+            return QByteArray(static_cast<const char*>(sqlite3_column_blob(statement, column)),
+                              sqlite3_column_bytes(statement, column));
+        default: {
+            const auto* text = reinterpret_cast<const char*>(sqlite3_column_text(statement, column));
+            return QString::fromUtf8(text, sqlite3_column_bytes(statement, column));
+        }
+    }
+}
+
+class EngineSqlite final : public Engine {
 public:
-    explicit EngineSqlite(const QString& file) : QtSqlEngine(u"QSQLITE"_s)
+    explicit EngineSqlite(const QString& file) : file_(file)
     {
         if (!QFileInfo(file).isFile())
             throw RuntimeError(CannotOpen, u"There is no database "_s + file)
                 .withDatabaseCodes(QString::number(SQLITE_CANTOPEN), u"08001"_s);
-        database.setDatabaseName(file);
-        database.setConnectOptions(u"QSQLITE_BUSY_TIMEOUT="_s + QString::number(busySeconds * 1000));
-        openDatabase();
+        sqlite3* opened = nullptr;
+        const int result =
+            sqlite3_open_v2(file.toUtf8().constData(), &opened, SQLITE_OPEN_READWRITE | SQLITE_OPEN_NOMUTEX, nullptr);
+        handle.reset(opened);
+        if (result != SQLITE_OK)
+            fail(CannotOpen);
+        sqlite3_extended_result_codes(opened, 1);
+        sqlite3_busy_timeout(opened, busySeconds * 1000);
         teachComparison();
         try {
             run(u"PRAGMA journal_mode=WAL"_s);
@@ -87,10 +138,30 @@ public:
         } catch (const RuntimeError& error) {
             throw RuntimeError(CannotOpen, error.description()).withDatabaseCodes(error.nativeCode(), error.sqlState());
         }
-        sqlite3_progress_handler(handle(), instructionsBetweenLooks, &isLate, this);
-        sqlite3_prepare_v2(handle(), "SELECT 1 FROM sqlite_master LIMIT 0", -1, &schemaReader, nullptr);
+        sqlite3_progress_handler(opened, instructionsBetweenLooks, &isLate, this);
     }
-    ~EngineSqlite() override { sqlite3_finalize(schemaReader); }
+
+    /// Prepares statements of one shape only once.
+    Answer run(const QString& statement) override
+    {
+        if (!isOpen())
+            throw RuntimeError(CannotOpen, u"The connection to the database is lost."_s);
+        deadline = timeout > 0 ? QDeadlineTimer(qint64(timeout) * 1000) : QDeadlineTimer(QDeadlineTimer::Forever);
+        const Shape shape = Shape::toPrepare(statement);
+        if (Prepared* known = preparedShape(shape)) {
+            bindValues(known->statement.get(), shape.values);
+            return rowsOf(*known);
+        }
+        Prepared once = prepared(statement);
+        if (!once.statement)
+            fail(StatementFailed);
+        return rowsOf(once);
+    }
+    QVariant insert(const QString& statement) override
+    {
+        run(statement);
+        return qint64(sqlite3_last_insert_rowid(handle.get()));
+    }
 
     void setTimeout(int seconds) override { timeout = seconds; }
 
@@ -99,9 +170,7 @@ public:
     bool lock(const QString& name, int seconds) override
     {
         std::unique_ptr<files::Lock> lock;
-        if (!attempt([&] {
-                lock = std::make_unique<files::Lock>(database.databaseName() + u"-locks"_s, name, seconds * 1000);
-            }))
+        if (!attempt([&] { lock = std::make_unique<files::Lock>(file_ + u"-locks"_s, name, seconds * 1000); }))
             return true;  // the folder can't be written, which the next statement will report
         if (!lock->isHeld())
             return false;
@@ -152,16 +221,85 @@ public:
         return info;
     }
 
-protected:
-    bool meansConnectionLost(const QSqlError& error) const override
+private:
+    /// Prepares a statement. The result has none if SQLite refuses it, or if a second one follows.
+    Prepared prepared(const QString& text)
     {
-        const int code = error.nativeErrorCode().toInt() & 0xff;
-        return code == SQLITE_CANTOPEN || code == SQLITE_NOTADB;
+        Prepared made;
+        sqlite3_stmt* statement = nullptr;
+        const void* rest = nullptr;
+        sqlite3_prepare16_v3(handle.get(), text.utf16(), int(text.size() * 2), SQLITE_PREPARE_PERSISTENT, &statement,
+                             &rest);
+        made.statement.reset(statement);
+        if (statement && !QStringView(static_cast<const QChar*>(rest), text.cend()).trimmed().isEmpty())
+            throw RuntimeError(StatementFailed, u"A second statement follows a semicolon."_s);
+        return made;
     }
 
-    QString sqlState(const QSqlError& error) const override
+    /// Returns null for a statement without a shape that can be prepared: it has a literal that is no value.
+    Prepared* preparedShape(const Shape& shape)
     {
-        switch (error.nativeErrorCode().toInt() & 0xff) {
+        constexpr size_t mostStatements = 300;
+        constexpr qsizetype mostValues = 300;
+        const auto found = statements.find(shape.text);
+        if (found != statements.end())
+            return &found->second;
+        if (shape.values.size() > mostValues)
+            return nullptr;
+        Prepared fresh = prepared(shape.text);
+        if (!fresh.statement)
+            return nullptr;
+        if (statements.size() >= mostStatements)
+            statements.clear();
+        return &(statements[shape.text] = std::move(fresh));
+    }
+
+    Answer rowsOf(Prepared& prepared)
+    {
+        sqlite3_stmt* const statement = prepared.statement.get();
+        const std::unique_ptr<sqlite3_stmt, decltype([](sqlite3_stmt* used) { sqlite3_reset(used); })> reset(statement);
+        Answer answer;
+        int result = sqlite3_step(statement);
+        const int width = sqlite3_column_count(statement);  // after the step, which prepares again if a table changed
+        for (; result == SQLITE_ROW; result = sqlite3_step(statement)) {
+            for (int column = 0; column < width; ++column)
+                answer.values.push_back(valueOf(statement, column));
+        }
+        if (result != SQLITE_DONE)
+            fail(StatementFailed);
+        answer.names = namesOf(prepared);
+        answer.hit = sqlite3_changes(handle.get());
+        return answer;
+    }
+
+    static const QStringList& namesOf(Prepared& prepared)
+    {
+        sqlite3_stmt* const statement = prepared.statement.get();
+        const int times = sqlite3_stmt_status(statement, SQLITE_STMTSTATUS_REPREPARE, 0);
+        if (times != prepared.times) {
+            prepared.names.clear();
+            for (int column = 0; column < sqlite3_column_count(statement); ++column)
+                prepared.names.append(QString::fromUtf8(sqlite3_column_name(statement, column)).remove(u'"'));
+            prepared.times = times;
+        }
+        return prepared.names;
+    }
+
+    [[noreturn]] void fail(int number)
+    {
+        const int code = sqlite3_extended_errcode(handle.get());
+        const int kind = code & 0xff;
+        if (kind == SQLITE_CANTOPEN || kind == SQLITE_NOTADB) {
+            drop();
+            number = CannotOpen;
+        }
+        throw RuntimeError(number, QString::fromUtf8(sqlite3_errmsg(handle.get())))
+            .withDatabaseCodes(QString::number(code), sqlState(kind));
+    }
+
+    static QString sqlState(int kind)
+    {
+        switch (kind) {
             case SQLITE_ERROR:
                 return u"42000"_s;
             case SQLITE_CONSTRAINT:
@@ -175,33 +313,23 @@ protected:
         }
     }
 
-    /// Makes SQLite read the current schema. Otherwise it may prepare a statement with an old schema, and again with
-    /// the new one, and the driver does not expect that the number of columns changes.
-    void beforeStatement() override
-    {
-        sqlite3_step(schemaReader);
-        sqlite3_reset(schemaReader);
-        deadline = timeout > 0 ? QDeadlineTimer(qint64(timeout) * 1000) : QDeadlineTimer(QDeadlineTimer::Forever);
-    }
-
-private:
-    sqlite3* handle() const { return *static_cast<sqlite3* const*>(database.driver()->handle().constData()); }
-
     /// Call this directly after opening: later, SQLite refuses to change a collation while a statement is active.
     void teachComparison()
     {
         const int collation =
-            sqlite3_create_collation_v2(handle(), "NOCASE", SQLITE_UTF8, nullptr, &compareWithoutCase, nullptr);
-        const int like = sqlite3_create_function_v2(handle(), "like", 2, SQLITE_UTF16 | SQLITE_DETERMINISTIC, nullptr,
-                                                    &likeFunction, nullptr, nullptr, nullptr);
+            sqlite3_create_collation_v2(handle.get(), "NOCASE", SQLITE_UTF8, nullptr, &compareWithoutCase, nullptr);
+        const int like = sqlite3_create_function_v2(handle.get(), "like", 2, SQLITE_UTF16 | SQLITE_DETERMINISTIC,
+                                                    nullptr, &likeFunction, nullptr, nullptr, nullptr);
         if (collation != SQLITE_OK || like != SQLITE_OK)
-            throw RuntimeError(CannotOpen, QString::fromUtf8(sqlite3_errmsg(handle())));
+            throw RuntimeError(CannotOpen, QString::fromUtf8(sqlite3_errmsg(handle.get())));
     }
 
     static int isLate(void* self) { return static_cast<EngineSqlite*>(self)->deadline.hasExpired(); }
 
+    QString file_;
+    Handle handle;
+    std::unordered_map<QString, Prepared> statements;  // by the text of their shape
     std::map<QString, std::unique_ptr<files::Lock>> locks;
-    sqlite3_stmt* schemaReader = nullptr;
     int timeout = 0;
     QDeadlineTimer deadline{QDeadlineTimer::Forever};
 };

@@ -55,20 +55,13 @@ QVariant converted(const QVariant& value, Kind kind, int cutAt)
 
 }  // namespace
 
-void Recordset::Data::numberColumns()
-{
-    columnNumbers.clear();
-    for (int i = int(columns.size()) - 1; i >= 0; --i)
-        columnNumbers.insert(columns[i].name.toLower(), i);
-}
-
 void Recordset::Data::fetch()
 {
     Rows result = session().select(select);
     const int count = result.count();
     columns = result.columns;
+    columnNumbers = result.columnNumbers;
     values = std::move(result.values);
-    numberColumns();
     forgetChange();
     indexes.clear();
     rows.resize(size_t(count));
@@ -183,7 +176,7 @@ void Recordset::declare(const QString& name, Kind kind, int size)
 {
     data->declared = true;
     data->columns.append({name, {}, kind, size});
-    data->numberColumns();
+    data->columnNumbers = columnNumbers(data->columns);
 }
 
 void Recordset::openDeclared()

@@ -30,7 +30,7 @@ struct Recordset::Data {
     bool disconnected = false;
 
     QList<ResultColumn> columns;
-    QHash<QString, int> columnNumbers;  // by the name in lower case; the first one of two with the same name
+    QHash<QString, int> columnNumbers;  // as columnNumbers() returns them
     std::vector<QVariant> values;       // all rows one after the other, including removed ones
     std::vector<int> rows;              // the rows that have not been removed
     std::vector<int> visible;           // the rows that the filter shows
@@ -84,7 +84,6 @@ struct Recordset::Data {
 
     const Dialect& dialect() const { return session().dialect(); }
 
-    void numberColumns();
     void fetch();
     void showFiltered();
     bool isShown(int row);

@@ -3,7 +3,6 @@
 #include "platform/RuntimeError.h"
 #include "platform/database/ColumnValues.h"
 #include "platform/database/FaultInjection.h"
-#include "platform/database/Statement.h"
 #include "platform/database/Waiting.h"
 
 #include <QRegularExpression>
@@ -32,37 +31,30 @@ bool fits(const std::optional<QList<SelectedColumn>>& selected, const QStringLis
     return std::equal(selected->begin(), selected->end(), names.begin(), names.end(), isNamed);
 }
 
-/// Returns the columns of a result. A column that the statement does not show, or shows differently, is read-only.
-QList<ResultColumn> described(const std::optional<QList<SelectedColumn>>& selected, const Answer& answer)
+/// Returns the column of the schema whose values a column of the result shows, or null if the statement does not tell.
+const TableColumn* baseOf(const std::optional<QList<SelectedColumn>>& selected, const Answer& answer, qsizetype column)
 {
-    const bool known = selected && selected->size() == answer.names.size();
-    QList<ResultColumn> columns;
-    for (qsizetype i = 0; i < answer.names.size(); ++i) {
-        ResultColumn column;
-        column.name = answer.names[i];
-        if (known && isNamed((*selected)[i], column.name) && (*selected)[i].base && !(*selected)[i].base->readOnly) {
-            const TableColumn& base = *(*selected)[i].base;
-            column.table = (*selected)[i].table;
-            column.kind = base.kind;
-            column.size = base.size;
-            column.scale = base.scale;
-        } else {  // the kind of its first value
-            const size_t width = size_t(answer.names.size());
-            for (size_t value = size_t(i); value < answer.values.size(); value += width) {
-                if (answer.values[value].isNull())
-                    continue;
-                column.kind = kindOfValue(answer.values[value]);
-                break;
-            }
-        }
-        columns.append(column);
-    }
-    return columns;
+    if (!selected || selected->size() != answer.names.size())
+        return nullptr;
+    const SelectedColumn& shown = (*selected)[column];
+    return isNamed(shown, answer.names[column]) && shown.base && !shown.base->readOnly ? &*shown.base : nullptr;
 }
 
-Rows rowsOf(Answer answer, const QList<ResultColumn>& columns)
+/// Returns the kind of the first value in a column of a result.
+Kind kindOfFirst(const Answer& answer, qsizetype column)
 {
-    Rows rows{columns, std::move(answer.values)};
+    const size_t width = size_t(answer.names.size());
+    for (size_t value = size_t(column); value < answer.values.size(); value += width) {
+        if (!answer.values[value].isNull())
+            return kindOfValue(answer.values[value]);
+    }
+    return Kind::Text;
+}
+
+/// Turns the values into those of the kinds of their columns.
+void normalise(Rows& rows)
+{
+    const QList<ResultColumn>& columns = rows.columns;
     const size_t width = size_t(columns.size());
     for (size_t column = 0; column < width; ++column) {
         const Kind kind = columns[qsizetype(column)].kind;
@@ -71,7 +63,6 @@ Rows rowsOf(Answer answer, const QList<ResultColumn>& columns)
                 rows.values[i] = normalised(rows.values[i], kind);
         }
     }
-    return rows;
 }
 
 }  // namespace
@@ -82,24 +73,71 @@ void setStatementFault(std::function<bool()> fault, int number)
     statementFaultNumber = number;
 }
 
+QHash<QString, int> columnNumbers(const QList<ResultColumn>& columns)
+{
+    QHash<QString, int> numbers;
+    for (int i = int(columns.size()) - 1; i >= 0; --i)
+        numbers.insert(columns[i].name.toLower(), i);
+    return numbers;
+}
+
 Rows Session::select(const QString& statement)
 {
-    Translated query = translated(statement, dialect(), *this);
+    const Shape shape = Shape::toTranslate(statement);
+    const QString text = translatedText(shape);
     checkFault();
-    Answer answer = engine_->run(query.text);
-    if (!fits(query.columns, answer.names)) {  // the host has changed the table
+    Answer answer = engine_->run(text);
+    if (!fits(known(shape).statement.columns, answer.names))  // the host has changed the table
         forgetSchema();
-        query = translated(statement, dialect(), *this);
+    Known& query = known(shape);
+    describe(query, answer);
+    Rows rows{query.columns, query.columnNumbers, std::move(answer.values)};
+    normalise(rows);
+    return rows;
+}
+
+Session::Known& Session::known(const Shape& shape)
+{
+    constexpr qsizetype mostShapes = 1000;
+    const auto found = knownShapes.find(shape.text);
+    if (found != knownShapes.end())
+        return *found;
+    Known fresh{translated(shape, dialect(), *this), {}, {}, false, {}};
+    if (knownShapes.size() >= mostShapes)
+        knownShapes.clear();
+    return *knownShapes.insert(shape.text, std::move(fresh));
+}
+
+/// Describes the columns of a result. A column that the statement does not show, or shows differently, is read-only.
+void Session::describe(Known& query, const Answer& answer)
+{
+    if (query.isDescribed && query.names == answer.names)
+        return;
+    query.names = answer.names;
+    query.columns.clear();
+    query.isDescribed = true;
+    for (qsizetype i = 0; i < answer.names.size(); ++i) {
+        ResultColumn column;
+        column.name = answer.names[i];
+        if (const TableColumn* base = baseOf(query.statement.columns, answer, i)) {
+            column.table = (*query.statement.columns)[i].table;
+            column.kind = base->kind;
+            column.size = base->size;
+            column.scale = base->scale;
+        } else {
+            column.kind = kindOfFirst(answer, i);
+            query.isDescribed = false;
+        }
+        query.columns.append(column);
     }
-    const QList<ResultColumn> columns = described(query.columns, answer);
-    return rowsOf(std::move(answer), columns);
+    query.columnNumbers = columnNumbers(query.columns);
 }
 
 qint64 Session::execute(const QString& statement)
 {
     static const QRegularExpression definition(u"\\A\\s*(CREATE|ALTER|DROP)\\b"_s,
                                                QRegularExpression::CaseInsensitiveOption);
-    const qint64 hit = executeNative(translated(statement, dialect(), *this).text);
+    const qint64 hit = executeNative(translatedText(Shape::toTranslate(statement)));
     if (definition.match(statement).hasMatch())
         forgetSchema();
     return hit;
@@ -108,7 +146,9 @@ qint64 Session::execute(const QString& statement)
 Rows Session::selectNative(const QString& statement, const QList<ResultColumn>& columns)
 {
     checkFault();
-    return rowsOf(engine_->run(statement), columns);
+    Rows rows{columns, {}, engine_->run(statement).values};
+    normalise(rows);
+    return rows;
 }
 
 qint64 Session::executeNative(const QString& statement)
@@ -135,7 +175,7 @@ QVariant Session::insert(const TableInfo& info, const QStringList& columns, cons
 QString Session::translatedCondition(const QString& table, const QString& condition)
 {
     const QString head = u"SELECT * FROM "_s + table + u" WHERE "_s;
-    const QString text = translated(head + condition, dialect(), *this).text;
+    const QString text = translatedText(Shape::toTranslate(head + condition));
     return text.sliced(text.indexOf(u" WHERE "_s) + 7);
 }
 
@@ -204,6 +244,7 @@ QString Session::tableSpelling(const QString& name)
 
 void Session::forgetSchema()
 {
+    knownShapes.clear();
     spellings.clear();
     tables.clear();
     spellingsKnown = false;

@@ -3,7 +3,7 @@
 
 #include "platform/database/Engine.h"
 #include "platform/database/Schema.h"
-#include "platform/database/SelectList.h"
+#include "platform/database/Statement.h"
 
 #include <QHash>
 #include <QList>
@@ -26,10 +26,14 @@ struct ResultColumn {
     int scale = -1;  // as in TableColumn
 };
 
+/// Returns the numbers of columns by their names in lower case; of two with the same name that of the first.
+QHash<QString, int> columnNumbers(const QList<ResultColumn>& columns);
+
 /// A completely fetched result, one row after the other.
 struct Rows {
     QList<ResultColumn> columns;
-    std::vector<QVariant> values;
+    QHash<QString, int> columnNumbers = {};
+    std::vector<QVariant> values = {};
 
     int count() const { return columns.isEmpty() ? 0 : int(values.size()) / int(columns.size()); }
 };
@@ -57,9 +61,9 @@ public:
     qint64 executeNative(const QString& statement);
     /// Inserts a row and returns its identity, or Null if the table has none.
     QVariant insert(const TableInfo& table, const QStringList& columns, const QStringList& literals);
-    /// Whole rows that nobody else may change until the transaction ends.
     /// A condition on a table, from the dialect of SQL Server into the engine's own.
     QString translatedCondition(const QString& table, const QString& condition);
+    /// Whole rows that nobody else may change until the transaction ends.
     Rows selectLocked(const TableInfo& table, const QString& condition);
 
     void begin();
@@ -71,7 +75,19 @@ public:
     const TableInfo* table(const QString& name) override;
 
 private:
+    /// What is known of all statements of one shape.
+    struct Known {
+        Translated statement;
+        QStringList names;            // of the last result
+        QList<ResultColumn> columns;  // of the last result
+        bool isDescribed = false;     // the columns don't depend on the values of the result
+        QHash<QString, int> columnNumbers;
+    };
+
     void checkFault();
+    Known& known(const Shape& shape);
+    void describe(Known& query, const Answer& answer);
+    QString translatedText(const Shape& shape) { return known(shape).statement.text(shape.values, dialect()); }
     QString tableSpelling(const QString& name) override;
     void forgetSchema();
 
@@ -79,6 +95,7 @@ private:
     QHash<QString, QString> spellings;  // from lower case to the schema's spelling
     QHash<QString, std::shared_ptr<TableInfo>> tables;
     bool spellingsKnown = false;
+    QHash<QString, Known> knownShapes;  // by the text of the shape
 };
 
 }  // namespace kest::db

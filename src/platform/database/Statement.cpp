@@ -14,23 +14,64 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-/// Translates a statement. Each step changes its tokens in place.
+/// Writes a literal so that its text comes to the database unchanged.
+QString escaped(QString literal, const Dialect& dialect)
+{
+    if (dialect.backslashEscapes)
+        literal.replace(u'\\', u"\\\\"_s);
+    return dialect.withPrefix(literal);
+}
+
+QString exactNumber(const QString& text, double number)
+{
+    static const QRegularExpression plain(u"\\A[+-]?[0-9]+(\\.[0-9]+)?\\z"_s);
+    return plain.match(text).hasMatch() ? text : QString::number(number, 'g', 17);
+}
+
+/// Writes a literal that is compared with a number, flag or date column as a value of that kind.
+QString written(const QString& literal, const Translated::Use& use, const Dialect& dialect)
+{
+    const Kind kind = use.comparedWith;
+    if (kind == Kind::Text || kind == Kind::LongText)
+        return escaped(literal, dialect);
+    const QString text = Token{Part::Literal, literal}.value().trimmed();
+    if (kind == Kind::Date) {
+        const auto date = dateIn(text);
+        const QString format = dialect.isoDates ? u"yyyy-MM-ddTHH:mm:ss"_s : u"yyyy-MM-dd HH:mm:ss"_s;
+        return date ? u'\'' + date->toString(format) + u'\'' : escaped(literal, dialect);
+    }
+    const auto isFlag = [&](QStringView word) {
+        return kind == Kind::Flag && text.compare(word, Qt::CaseInsensitive) == 0;
+    };
+    if (text.isEmpty() || isFlag(u"false"))
+        return u"0"_s;
+    if (const auto number = numberIn(text))
+        return exactNumber(text, *number);
+    if (isFlag(u"true"))
+        return u"1"_s;
+    if (use.isAssigned)
+        return escaped(literal, dialect);
+    return use.isUnequal ? u"1.7e308"_s : u"NULL"_s;  // every number is unequal to it, and none equal, less or greater
+}
+
+/// Translates a shape. Each step changes its tokens in place.
 class Translation {
 public:
-    Translation(const QString& statement, const Dialect& wanted, Schema& known)
-        : tokens(statement), dialect(wanted), schema(known)
+    Translation(const Shape& shape, const Dialect& wanted, Schema& known)
+        : tokens(shape.text), uses(size_t(shape.values.size())), dialect(wanted), schema(known)
     {
     }
 
     Translated run()
     {
         refuseSecondStatement();
+        numberValues();
         findTables();
         Translated result;
         result.columns = selectedColumns(tokens, schema);
         spellNames();
         writeFlags();
-        writeComparedLiterals();
+        findComparisons();
         writePatterns();
         if (dialect.likeHasNoIndex)
             writeRanges();
@@ -38,10 +79,14 @@ public:
             joinTexts();
         if (!dialect.top)
             writeLimit();
-        if (dialect.backslashEscapes)
-            doubleBackslashes();
-        prefixLiterals();
-        result.text = tokens.text();
+        result.pieces.append(QString());
+        for (const Token& token : tokens) {
+            if (token.valueNumber >= 0)
+                result.pieces.append(QString());
+            else
+                result.pieces.last() += token.part == Part::Literal ? escaped(token.text, dialect) : token.text;
+        }
+        result.uses = std::move(uses);
         return result;
     }
 
@@ -63,6 +108,19 @@ private:
         tokens.erase(end, count());
         if (std::any_of(tokens.begin(), tokens.end(), [](const Token& token) { return token.is(u";"); }))
             throw RuntimeError(StatementFailed, u"A second statement follows a semicolon."_s);
+    }
+
+    void numberValues()
+    {
+        int last = -1;
+        for (Index i = 0; i < count(); ++i) {
+            const Index before = previous(i);
+            const bool isPattern = before != none && at(before).text.endsWith(u"LIKE", Qt::CaseInsensitive);
+            const bool isLiteral = at(i).part == Part::Literal && at(i).text == Shape::literalMark && !isPattern;
+            const bool isNumber = at(i).part == Part::Number && at(i).text == Shape::numberMark;
+            if (isLiteral || isNumber)
+                at(i).valueNumber = ++last;
+        }
     }
 
     void findTables()
@@ -139,16 +197,16 @@ private:
         return columnEndingAt(isAt(point, u".") && next(point) != none ? next(point) : i);
     }
 
-    void writeComparedLiterals()
+    void findComparisons()
     {
         static const QStringList comparisons{u"="_s, u"<>"_s, u"!="_s, u"<"_s, u">"_s, u"<="_s, u">="_s};
-        Use use = Use::Compared;
+        bool isAssigned = false;
         for (Index i = 0; i < count(); ++i) {
             const Token& token = at(i);
             if (token.is(u"SET"))
-                use = Use::Assigned;
+                isAssigned = true;
             else if (token.is(u"WHERE"))
-                use = Use::Compared;
+                isAssigned = false;
             else if (token.is(u"IN") && isAt(next(i), u"("))
                 writeList(i);
             if (token.part != Part::Symbol || !comparisons.contains(token.text))
@@ -157,10 +215,11 @@ private:
             const Index right = next(i);
             if (left == none || right == none)
                 continue;
+            const bool isUnequal = token.is(u"<>") || token.is(u"!=");
             if (at(right).part == Part::Literal)
-                writeLiteral(at(right), columnEndingAt(left), token.text, use);
+                compare(at(right), columnEndingAt(left), {.isAssigned = isAssigned, .isUnequal = isUnequal});
             else if (at(left).part == Part::Literal)
-                writeLiteral(at(left), columnStartingAt(right), token.text, use);
+                compare(at(left), columnStartingAt(right), {.isAssigned = isAssigned, .isUnequal = isUnequal});
         }
     }
 
@@ -173,42 +232,19 @@ private:
             return;  // the literals of an inner query are compared with its own columns
         for (Index i = start; column && i != none && !isAt(i, u")"); i = next(i)) {
             if (at(i).part == Part::Literal)
-                writeLiteral(at(i), column, u"="_s, Use::Compared);
+                compare(at(i), column);
         }
     }
 
-    enum class Use { Compared, Assigned };
-
-    /// Writes a literal that is compared with or assigned to a number, flag or date column as a value of that kind.
-    void writeLiteral(Token& literal, const TableColumn* column, const QString& comparison, Use use)
+    /// Notes the column with which a literal is compared, or to which it is assigned.
+    void compare(Token& literal, const TableColumn* column, Translated::Use use = {})
     {
-        if (!column || column->kind == Kind::Text || column->kind == Kind::LongText)
+        if (!column || literal.valueNumber < 0 || size_t(literal.valueNumber) >= uses.size())
             return;
-        const QString text = literal.value().trimmed();
-        if (column->kind == Kind::Date) {
-            if (const auto date = dateIn(text))
-                literal.text = u'\'' +
-                               date->toString(dialect.isoDates ? u"yyyy-MM-ddTHH:mm:ss"_s : u"yyyy-MM-dd HH:mm:ss"_s) +
-                               u'\'';
-            return;
-        }
-        const auto isFlag = [&](QStringView word) {
-            return column->kind == Kind::Flag && text.compare(word, Qt::CaseInsensitive) == 0;
-        };
-        if (text.isEmpty() || isFlag(u"false"))
-            literal = {Part::Number, u"0"_s};
-        else if (const auto number = numberIn(text))
-            literal = {Part::Number, exactNumber(text, *number)};
-        else if (isFlag(u"true"))
-            literal = {Part::Number, u"1"_s};
-        else if (use == Use::Compared)  // every number is unequal to it, and none is equal, less or greater
-            literal = {Part::Number, comparison == u"<>" || comparison == u"!=" ? u"1.7e308"_s : u"NULL"_s};
-    }
-
-    static QString exactNumber(const QString& text, double number)
-    {
-        static const QRegularExpression plain(u"\\A[+-]?[0-9]+(\\.[0-9]+)?\\z"_s);
-        return plain.match(text).hasMatch() ? text : QString::number(number, 'g', 17);
+        use.comparedWith = column->kind;
+        uses[size_t(literal.valueNumber)] = use;
+        if (column->kind == Kind::WholeNumber || column->kind == Kind::Number || column->kind == Kind::Flag)
+            literal.part = Part::Number;
     }
 
     /// A pattern ignores trailing blanks, its own and those of the text, and a bracket without an end has no meaning.
@@ -371,23 +407,8 @@ private:
         return count();
     }
 
-    void doubleBackslashes()
-    {
-        for (Token& token : tokens) {
-            if (token.part == Part::Literal)
-                token.text.replace(u'\\', u"\\\\"_s);
-        }
-    }
-
-    void prefixLiterals()
-    {
-        for (Token& token : tokens) {
-            if (token.part == Part::Literal)
-                token.text = dialect.withPrefix(token.text);
-        }
-    }
-
     Tokens tokens;
+    std::vector<Translated::Use> uses;
     const Dialect& dialect;
     Schema& schema;
     QList<NamedTable> tables;
@@ -395,9 +416,20 @@ private:
 
 }  // namespace
 
-Translated translated(const QString& statement, const Dialect& dialect, Schema& schema)
+QString Translated::text(const QList<QString>& values, const Dialect& dialect) const
 {
-    return Translation(statement, dialect, schema).run();
+    QString text = pieces.first();
+    for (qsizetype i = 1; i < pieces.size(); ++i) {
+        const QString value = values.value(i - 1);
+        text += value.startsWith(u'\'') ? written(value, uses[size_t(i - 1)], dialect) : value;
+        text += pieces[i];
+    }
+    return text;
+}
+
+Translated translated(const Shape& shape, const Dialect& dialect, Schema& schema)
+{
+    return Translation(shape, dialect, schema).run();
 }
 
 }  // namespace kest::db

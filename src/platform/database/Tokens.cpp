@@ -17,7 +17,17 @@ bool startsWord(QChar c)
     return c.isLetter() || c == u'_' || c == u'@' || c == u'#' || c == u'$';
 }
 
-/// Returns the index after the closing quote. A doubled closing quote is a quote in the text.
+template <class Belongs>
+qsizetype endOfRun(const QString& statement, qsizetype start, Belongs&& belongs)
+{
+    qsizetype end = start + 1;
+    while (end < statement.size() && belongs(statement[end]))
+        ++end;
+    return end;
+}
+
+}  // namespace
+
 qsizetype endOfQuoted(const QString& statement, qsizetype start, QChar close)
 {
     for (qsizetype i = start + 1; i < statement.size(); ++i) {
@@ -30,17 +40,6 @@ qsizetype endOfQuoted(const QString& statement, qsizetype start, QChar close)
     }
     throw RuntimeError(StatementFailed, u"A quotation mark is not closed in the statement."_s);
 }
-
-template <class Belongs>
-qsizetype endOfRun(const QString& statement, qsizetype start, Belongs&& belongs)
-{
-    qsizetype end = start + 1;
-    while (end < statement.size() && belongs(statement[end]))
-        ++end;
-    return end;
-}
-
-}  // namespace
 
 QString Token::value() const
 {
@@ -93,14 +92,6 @@ Tokens::Index Tokens::previous(Index i) const
             return i;
     }
     return none;
-}
-
-QString Tokens::text() const
-{
-    QString result;
-    for (const Token& token : tokens)
-        result += token.text;
-    return result;
 }
 
 bool NamedTable::answersTo(QStringView qualifier) const

@@ -7,6 +7,10 @@
 
 namespace kest::db {
 
+/// Returns the index after the closing quote of a text that starts with a quote. A doubled closing quote is a quote in
+/// the text. Throws StatementFailed if there is no closing quote.
+qsizetype endOfQuoted(const QString& statement, qsizetype start, QChar close);
+
 /// The kind of a token.
 enum class Part { Blank, Word, Name, Literal, Number, Symbol };  // Name: an identifier in brackets or quotes
 
@@ -14,6 +18,7 @@ enum class Part { Blank, Word, Name, Literal, Number, Symbol };  // Name: an ide
 struct Token {
     Part part;
     QString text;
+    int valueNumber = -1;  // its number among the values of the statement's shape; -1 if it is none of them
 
     bool is(QStringView word) const { return part != Part::Literal && text.compare(word, Qt::CaseInsensitive) == 0; }
     bool isIdentifier() const { return part == Part::Word || part == Part::Name; }
@@ -46,7 +51,6 @@ public:
 
     auto begin() { return tokens.begin(); }
     auto end() { return tokens.end(); }
-    QString text() const;
 
 private:
     std::vector<Token> tokens;
