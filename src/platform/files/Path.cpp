@@ -100,13 +100,16 @@ bool isThere(const QString& systemPath)
 /// Returns the path with each name in its spelling on the disk, up to the first name that does not exist.
 QString found(const QString& start, const QStringList& names)
 {
-    const QString asAsked = names.isEmpty() ? start : start + u'/' + names.join(u'/');
-    if (isThere(asAsked))
-        return asAsked;
-    QString reached = start;
-    for (qsizetype i = 0; i < names.size(); ++i) {
+    const auto asAsked = [&](qsizetype count) {
+        return count == 0 ? start : start + u'/' + names.first(count).join(u'/');
+    };
+    qsizetype known = names.size();  // usually the whole path is there as asked, or all but the last name
+    while (known > 0 && !isThere(asAsked(known)))
+        --known;
+    QString reached = asAsked(known);
+    for (qsizetype i = known; i < names.size(); ++i) {
         QString next = reached + u'/' + names[i];
-        if (!isThere(next)) {
+        if (i == known || !isThere(next)) {
             const QString variant = variantIn(reached, names[i]);
             if (variant.isEmpty())
                 return reached + u'/' + names.sliced(i).join(u'/');
