@@ -1,11 +1,9 @@
-// Does one operation of the shop once, in a shop of a chosen size, for `count`, which counts its instructions. Prints
-// how many statements and how many calls for files it has made: operations NAME SIZE.
+// Does one operation of the shop once, in a shop of a chosen size, for `count`, which counts its instructions,
+// statements and calls for files: operations NAME SIZE.
 #include "base/SharedVariables.h"
 #include "messages/Folders.h"
 #include "outbound/SendQuote.h"
-#include "platform/database/FaultInjection.h"
 #include "platform/database/Sql.h"
-#include "platform/files/FaultInjection.h"
 #include "support/OdbcDrivers.h"
 #include "support/Shop.h"
 
@@ -24,14 +22,7 @@ using namespace kest::test;
 /// What is counted. The name is not mangled, so that `count` can give it to valgrind.
 extern "C" __attribute__((noinline)) void measured(const std::function<void()>& operation)
 {
-    int statements = 0;
-    int fileCalls = 0;
-    db::setStatementFault([&] { return ++statements == 0; });
-    files::setFault([&] { return ++fileCalls == 0; });
     operation();
-    db::setStatementFault({});
-    files::setFault({});
-    std::printf("%d %d\n", statements, fileCalls);
 }
 
 namespace {
@@ -107,7 +98,27 @@ void fillFromTables(Bench& shop, int quotes)
 void loadRequest(Bench&, int quotes)
 {
     addQuotes(quotes);
-    measured([] { expect(load(quoteRequest("QRNEW"))); });
+    const QString text = quoteRequest("QRNEW").text();
+    measured([&] { expect(load(text)); });
+}
+
+void loadManual(Bench&, int quotes)
+{
+    addQuotes(quotes);
+    car("ABC123");
+    addRows("CAR", "REGO, CUST_ID, MODEL_ID", "'XBC' || i, 100 + i, 'C120'", quotes);
+    const QString text = manualQuote("Q5").rego("ABC123").labour(1, "C").text();
+    measured([&] { expect(load(text)); });
+}
+
+void notes(Bench&, int notes)
+{
+    QString chain;
+    for (int i = 0; i < notes; ++i)
+        chain += u"(01/02/2026 : Note %1) "_s.arg(i);
+    quote("500").request("QR1").remarks(chain);
+    const QString text = cancellation("QR1").text();
+    measured([&] { expect(load(text)); });
 }
 
 void loadAuthorised(Bench&, int lines)
@@ -116,7 +127,8 @@ void loadAuthorised(Bench&, int lines)
     Message message = authorisedQuote("500").rego("ABC123");
     for (int line = 1; line <= lines; ++line)
         message.labour(line, "C");
-    measured([&] { expect(load(message)); });
+    const QString text = message.text();
+    measured([&] { expect(load(text)); });
 }
 
 void send(Bench&, int lines)
@@ -142,6 +154,8 @@ const std::map<std::string, void (*)(Bench&, int)> operations{
     {"waiting", waiting},
     {"fill-from-tables", fillFromTables},
     {"load-request", loadRequest},
+    {"load-manual", loadManual},
+    {"notes", notes},
     {"load-authorised", loadAuthorised},
     {"send", send},
     {"move-loaded", moveLoaded},
