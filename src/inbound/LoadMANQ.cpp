@@ -175,6 +175,24 @@ void fillHeader(db::Recordset& quote, const ManualQuote& manual, const QuoteKey&
     fillWithoutTotals(quote);
 }
 
+bool refuseWithoutCar(const QString& rego)
+{
+    desktop::msgBox(u"Could not find a car with registration number "_s + rego +
+                        u"\r\nPlease create the car and customer before loading this quote"_s,
+                    desktop::Icon::Information);
+    return false;
+}
+
+/// Lets no one else create a quote. Throws RowChanged if another workstation has meanwhile created this one.
+std::unique_ptr<db::Lock> lockNewQuote(const QuoteKey& key)
+{
+    std::unique_ptr<db::Lock> lock = lockNewQuotes();
+    if (Quote(key).exists())
+        throw RuntimeError(RowChanged,
+                           u"Another workstation has meanwhile created quote %1."_s.arg(key.fullReference()));
+    return lock;
+}
+
 bool refuseLines()
 {
     desktop::msgBox(u"Error processing Quote Items, Please contact MarlinDesk Support."_s);
@@ -205,12 +223,8 @@ bool LoadMANQ(QString& text, const QString& fileName)
     db::Recordset& lines = found.lines();
     db::Recordset& notes = found.notes();
     db::Recordset car = opened(sql("SELECT * FROM CAR WHERE REGO='{}'", manual.rego));
-    if (car.eof()) {
-        desktop::msgBox(u"Could not find a car with registration number "_s + manual.rego +
-                            u"\r\nPlease create the car and customer before loading this quote"_s,
-                        desktop::Icon::Information);
-        return false;
-    }
+    if (car.eof())
+        return refuseWithoutCar(manual.rego);
     car.set(u"KEST"_s, 1);
     car.update();
 
@@ -226,13 +240,7 @@ bool LoadMANQ(QString& text, const QString& fileName)
 
     if (!checkQuoteBody(*message))
         return refuseLines();
-    std::unique_ptr<db::Lock> newQuotes;
-    if (isNew) {
-        newQuotes = lockNewQuotes();
-        if (Quote(*key).exists())
-            throw RuntimeError(RowChanged,
-                               u"Another workstation has meanwhile created quote %1."_s.arg(key->fullReference()));
-    }
+    std::unique_ptr<db::Lock> newQuotes = isNew ? lockNewQuote(*key) : nullptr;
     // After this, a failure leaves the quote without lines until the message is loaded again.
     while (!lines.eof())
         lines.remove();
