@@ -9,6 +9,7 @@
 
 namespace kest::journal {
 
+/// A row of KESTJournal: the change of one row of a table.
 struct RecordedChange {
     qint64 entry = 0;
     QDateTime moment;

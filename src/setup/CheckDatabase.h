@@ -20,6 +20,7 @@ struct CheckedPoint {
     QString why;  // what was found instead, or why it could not be tried
 };
 
+/// The result of a check.
 struct DatabaseCheck {
     QList<std::pair<QString, QString>> facts;  // what the server, its driver and the database say of themselves
     QList<CheckedPoint> points;

@@ -10,13 +10,16 @@ namespace kest::app {
 /// A kind of server. MySql is also MariaDB, and either of them through ODBC.
 enum class Server { Embedded, MySql, SqlServer };
 
+/// Returns the kind of server at the other end of a connection.
 Server serverOf(const db::ConnectionPtr& connection);
 
+/// What was found in the tables of a host.
 struct HostTables {
     QStringList missing;  // tables and columns that are not there, or hold another kind of value
     QStringList notes;    // what works, but is worth knowing: no key, triggers, shorter columns
 };
 
+/// Compares the tables of a database with what the component needs. Only reads them.
 HostTables lookAtHostTables(const db::ConnectionPtr& connection);
 
 }  // namespace kest::app

@@ -23,6 +23,7 @@ struct OdbcFailure {
     bool connectionIsDead = false;  // as the driver says
 };
 
+/// A connection through ODBC's own calls, which lasts as long as the object.
 class OdbcConnection {
 public:
     /// Opens the connection. Throws OdbcFailure, after `seconds` at most if the driver observes that limit.
