@@ -3,12 +3,7 @@
 
 static QString faultsOf(const QString& rules)
 {
-    try {
-        app::parsedRules(rules);
-        return {};
-    } catch (const RuntimeError& error) {
-        return error.description();
-    }
+    return failure([&] { app::parsedRules(rules); }).description();
 }
 
 TEST(InsurerRules, AFaultIsToldWithItsLine)

@@ -11,18 +11,6 @@ namespace kest::test {
 
 enum class On { Embedded, MySql, Odbc, Tds };
 
-/// Returns the error that a step throws, with the number 0 if it does not throw.
-template <class Step>
-RuntimeError failure(Step&& step)
-{
-    try {
-        step();
-    } catch (const RuntimeError& error) {
-        return error;
-    }
-    return RuntimeError(0, QString());
-}
-
 /// The tables are LINE (id, the identity; CODE, SEQ, amount, flag, day, notes), CAR (REGO, the key; owner) and Tints
 /// (Code, Script; no key). They compare values and have defaults as in the quote database.
 class Databases : public ::testing::TestWithParam<On> {
