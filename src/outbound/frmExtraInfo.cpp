@@ -99,8 +99,7 @@ void frmExtraInfo::build()
     txtDamageDesc = addField("txtDamageDesc", u"&Damage Description:"_s);
     txtOldDamageDesc = addField("txtOldDamageDesc", u"O&ld Damage Description:"_s);
     txtDamageDesc->setMinimumWidth(desktop::pixels(5400));
-    Command1 = new QPushButton(u"Do&ne"_s);
-    Command1->setObjectName("Command1"_L1);
+    Command1 = button(u"Command1"_s, u"Do&ne"_s, [this] { Command1_Click(); });
     auto* buttons = new QHBoxLayout;
     buttons->addStretch();
     buttons->addWidget(Command1);
@@ -129,16 +128,10 @@ void frmExtraInfo::build()
     auto* cmdColour = txtColour->findChild<QToolButton*>();
     cmdColour->setObjectName("cmdColour"_L1);
     cmdColour->setAccessibleName(u"Show the colours"_s);
-    desktop::onEvent(drop, &QAction::triggered, this, u"frmExtraInfo.txtColour_ButtonClick"_s,
-                     [this] { txtColour_ButtonClick(); });
-    desktop::onEvent(txtColour, &QLineEdit::textEdited, this, u"frmExtraInfo.txtColour_Change"_s,
-                     [this] { txtColour_Change(); });
-    desktop::onEvent(lvColour, &QTreeWidget::currentItemChanged, this, u"frmExtraInfo.lvColour_ItemClick"_s,
-                     [this] { lvColour_ItemClick(); });
-    desktop::onEvent(lvColour, &QTreeWidget::itemClicked, this, u"frmExtraInfo.lvColour_ItemClick"_s,
-                     [this] { lvColour_ItemClick(); });
-    desktop::onEvent(Command1, &QPushButton::clicked, this, u"frmExtraInfo.Command1_Click"_s,
-                     [this] { Command1_Click(); });
+    on(drop, &QAction::triggered, u"txtColour_ButtonClick"_s, [this] { txtColour_ButtonClick(); });
+    on(txtColour, &QLineEdit::textEdited, u"txtColour_Change"_s, [this] { txtColour_Change(); });
+    on(lvColour, &QTreeWidget::currentItemChanged, u"lvColour_ItemClick"_s, [this] { lvColour_ItemClick(); });
+    on(lvColour, &QTreeWidget::itemClicked, u"lvColour_ItemClick"_s, [this] { lvColour_ItemClick(); });
 }
 
 QLineEdit* frmExtraInfo::addField(const char* name, const QString& label)

@@ -104,7 +104,7 @@ frmPrintPreview::frmPrintPreview(const report::Report& report)
     crvPreview->setObjectName(u"crvPreview"_s);
     cmdExit->setObjectName(u"cmdExit"_s);
     cmdExit->resize(cmdExit->sizeHint());
-    desktop::onEvent(cmdExit, &QPushButton::clicked, this, u"frmPrintPreview.cmdExit_Click"_s, [this] { close(); });
+    on(cmdExit, &QPushButton::clicked, u"cmdExit_Click"_s, [this] { close(); });
     resize(desktop::pixels(13500, 11250));
     crvPreview->hide();
     crvPreview->setReport(report);

@@ -48,8 +48,7 @@ frmKEST::frmKEST() : Form(u"frmKEST"_s, u"ORLA Partner Network"_s)
         Option1[i] = new QRadioButton(optionCaptions[i], frame);
         Option1[i]->setObjectName(u"Option1(%1)"_s.arg(i));
         options->addWidget(Option1[i]);
-        desktop::onEvent(Option1[i], &QRadioButton::clicked, this, u"frmKEST.Option1_Click"_s,
-                         [this, i] { Option1_Click(i); });
+        on(Option1[i], &QRadioButton::clicked, u"Option1_Click"_s, [this, i] { Option1_Click(i); });
     }
 
     lblQuote = new QLabel(this);
@@ -59,10 +58,10 @@ frmKEST::frmKEST() : Form(u"frmKEST"_s, u"ORLA Partner Network"_s)
     cmdOK->setObjectName(u"cmdOK"_s);
     cmdOK->setDefault(true);
     cmdOK->installEventFilter(this);
-    desktop::onEvent(cmdOK, &QPushButton::clicked, this, u"frmKEST.cmdOK_Click"_s, [this] { cmdOK_Click(); });
+    on(cmdOK, &QPushButton::clicked, u"cmdOK_Click"_s, [this] { cmdOK_Click(); });
 
     cmdExit = desktop::exitButton(this, u"cmdExit"_s, u"Close the panel"_s);
-    desktop::onEvent(cmdExit, &QPushButton::clicked, this, u"frmKEST.cmdExit_Click"_s, [this] { close(); });
+    on(cmdExit, &QPushButton::clicked, u"cmdExit_Click"_s, [this] { close(); });
 
     auto* buttons = new QHBoxLayout;
     buttons->addWidget(cmdOK);
@@ -78,7 +77,7 @@ frmKEST::frmKEST() : Form(u"frmKEST"_s, u"ORLA Partner Network"_s)
     fixSize();
 
     auto* about = new QAction(u"&About KEST2\tF1"_s, this);
-    desktop::onEvent(about, &QAction::triggered, this, u"frmKEST.mnuAbout_Click"_s, desktop::showAbout);
+    on(about, &QAction::triggered, u"mnuAbout_Click"_s, desktop::showAbout);
     addAction(about);
     setContextMenuPolicy(Qt::ActionsContextMenu);
 

@@ -74,8 +74,8 @@ frmViewPDF::frmViewPDF(QPdfDocument& document, const QString& caption)
     AcroPDF1->setFocus();
     setMinimumSize(tools->sizeHint().width() + desktop::pixels(rightMargin), desktop::pixels(4500));
     tools->showPage(1, pdf.pageCount());
-    desktop::onEvent(AcroPDF1->pageNavigator(), &QPdfPageNavigator::currentPageChanged, this,
-                     u"frmViewPDF.AcroPDF1_Page"_s, [this](int page) { tools->showPage(page + 1, pdf.pageCount()); });
+    on(AcroPDF1->pageNavigator(), &QPdfPageNavigator::currentPageChanged, u"AcroPDF1_Page"_s,
+       [this](int page) { tools->showPage(page + 1, pdf.pageCount()); });
 }
 
 void frmViewPDF::ShowForm(const QString& fileName)

@@ -134,11 +134,7 @@ QWidget* frmUtilities::setQuoteStatus()
     for (const StatusRepair& repair : statusRepairs()) {
         if (repair.startsGroup)
             row->addSpacing(desktop::pixels(600));
-        auto* start = new QPushButton(repair.caption);
-        start->setObjectName(repair.button);
-        row->addWidget(start);
-        desktop::onEvent(start, &QPushButton::clicked, this, u"frmUtilities.%1_Click"_s.arg(repair.button),
-                         [this, &repair] { SetStatus(repair); });
+        row->addWidget(Form::button(repair.button, repair.caption, [this, &repair] { SetStatus(repair); }));
     }
     row->addStretch();
     return frame;
@@ -158,13 +154,10 @@ QWidget* frmUtilities::closingButtons()
 
 QPushButton* frmUtilities::button(const QString& name, const QString& caption, void (frmUtilities::*click)())
 {
-    auto* made = new QPushButton(caption);
-    made->setObjectName(name);
-    desktop::onEvent(made, &QPushButton::clicked, this, u"frmUtilities.%1_Click"_s.arg(name), [this, click] {
+    return Form::button(name, caption, [this, click] {
         EnsureConnection();
         (this->*click)();
     });
-    return made;
 }
 
 QLineEdit* frmUtilities::box(QLatin1StringView name) const
@@ -199,8 +192,7 @@ void frmUtilities::AddTabs()
             TabStrip1->setCurrentIndex(tab);
     }
     shownTab = TabStrip1->currentIndex();
-    desktop::onEvent(TabStrip1, &QTabBar::currentChanged, this, u"frmUtilities.TabStrip1_Click"_s,
-                     [this] { TabStrip1_Click(); });
+    on(TabStrip1, &QTabBar::currentChanged, u"TabStrip1_Click"_s, [this] { TabStrip1_Click(); });
 }
 
 void frmUtilities::OpenRows()

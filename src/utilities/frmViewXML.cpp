@@ -64,16 +64,12 @@ frmViewXML::frmViewXML(const QString& file)
 
     fillFindBar();
 
-    desktop::onEvent(Command1, &QPushButton::clicked, this, u"frmViewXML.Command1_Click"_s,
-                     [this] { Command1_Click(); });
-    desktop::onEvent(Command2, &QPushButton::clicked, this, u"frmViewXML.Command2_Click"_s,
-                     [this] { Command2_Click(); });
-    desktop::onEvent(new QShortcut(QKeySequence::Save, this), &QShortcut::activated, this,
-                     u"frmViewXML.Command2_Click"_s, [this] { Command2_Click(); });
-    desktop::onEvent(txtXML, &QPlainTextEdit::cursorPositionChanged, this, u"frmViewXML.txtXML_SelChange"_s,
-                     [this] { showPosition(); });
-    desktop::onEvent(txtXML, &QPlainTextEdit::updateRequest, this, u"frmViewXML.txtXML_Paint"_s,
-                     [this] { colourVisibleTags(); });
+    on(Command1, &QPushButton::clicked, u"Command1_Click"_s, [this] { Command1_Click(); });
+    on(Command2, &QPushButton::clicked, u"Command2_Click"_s, [this] { Command2_Click(); });
+    on(new QShortcut(QKeySequence::Save, this), &QShortcut::activated, u"Command2_Click"_s,
+       [this] { Command2_Click(); });
+    on(txtXML, &QPlainTextEdit::cursorPositionChanged, u"txtXML_SelChange"_s, [this] { showPosition(); });
+    on(txtXML, &QPlainTextEdit::updateRequest, u"txtXML_Paint"_s, [this] { colourVisibleTags(); });
 }
 
 void frmViewXML::fillFindBar()
@@ -100,18 +96,17 @@ void frmViewXML::fillFindBar()
     }
 
     const auto find = [this](auto* sender, auto signal, QTextDocument::FindFlags direction) {
-        desktop::onEvent(sender, signal, this, u"frmViewXML.Find"_s, [this, direction] { findNext(direction); });
+        on(sender, signal, u"Find"_s, [this, direction] { findNext(direction); });
     };
     find(txtFind, &QLineEdit::returnPressed, {});
     find(next, &QPushButton::clicked, {});
     find(previous, &QPushButton::clicked, QTextDocument::FindBackward);
     find(new QShortcut(QKeySequence(Qt::Key_F3), this), &QShortcut::activated, {});
     find(new QShortcut(QKeySequence(Qt::SHIFT | Qt::Key_F3), this), &QShortcut::activated, QTextDocument::FindBackward);
-    desktop::onEvent(new QShortcut(QKeySequence::Find, this), &QShortcut::activated, this, u"frmViewXML.Find"_s,
-                     [this] {
-                         txtFind->setFocus();
-                         txtFind->selectAll();
-                     });
+    on(new QShortcut(QKeySequence::Find, this), &QShortcut::activated, u"Find"_s, [this] {
+        txtFind->setFocus();
+        txtFind->selectAll();
+    });
 }
 
 void frmViewXML::ShowForm(const QString& file)
