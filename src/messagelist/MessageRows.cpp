@@ -1,6 +1,7 @@
+#include "messagelist/MessageRows.h"
+
 #include "base/Helpers.h"
 #include "base/SharedVariables.h"
-#include "messagelist/Summary.h"
 #include "messages/Envelope.h"
 #include "messages/MessageTypes.h"
 #include "platform/RuntimeError.h"

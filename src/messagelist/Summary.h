@@ -1,6 +1,7 @@
 // Reads the messages of a folder into the rows of the list.
 #pragma once
 
+#include "messagelist/MessageRows.h"
 #include "messages/Folders.h"
 #include "platform/xml/xml.h"
 
@@ -9,13 +10,9 @@
 #include <QSet>
 #include <QString>
 
-#include <array>
 #include <functional>
 
 namespace kest {
-
-/// Message type, rego, claim number, customer, quote number, vehicle description.
-using MessageRow = std::array<QString, 6>;
 
 /// A message of the list: its file's name and its row.
 struct ListedMessage {
@@ -59,13 +56,5 @@ bool AllImagesPresent(const xml::Document& message, const QSet<QString>& unread)
 /// Returns true if this fill has already listed an earlier message of the same request, or if the message can't be
 /// read. A manual quote replaces the earlier message in `listed` instead.
 bool IsHeldBehindEarlier(const xml::Document& message, QList<ListedMessage>& listed, const QString& file);
-/// Returns the row of a network message or, if `typeName` is "SENT", of a wrapped outbound document. Never throws: a
-/// value that can't be read stays empty or becomes "-".
-MessageRow GetMessageRow(const QString& text, const QString& typeName);
-/// Returns the row of a marker, such as a notice that a quote was sent twice. Never throws.
-MessageRow GetMarkerRow(const QString& text, const QString& typeName);
-/// The same for a text that has already been prepared and parsed.
-MessageRow GetMessageRow(const xml::Document& message, const QString& typeName);
-MessageRow GetMarkerRow(const xml::Document& marker, const QString& typeName);
 
 }  // namespace kest

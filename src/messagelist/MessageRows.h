@@ -1,0 +1,24 @@
+// Makes the rows of the list from messages and the quotes that they belong to.
+#pragma once
+
+#include "platform/xml/xml.h"
+
+#include <QString>
+
+#include <array>
+
+namespace kest {
+
+/// Message type, rego, claim number, customer, quote number, vehicle description.
+using MessageRow = std::array<QString, 6>;
+
+/// Returns the row of a network message or, if `typeName` is "SENT", of a wrapped outbound document. Never throws: a
+/// value that can't be read stays empty or becomes "-".
+MessageRow GetMessageRow(const QString& text, const QString& typeName);
+/// Returns the row of a marker, such as a notice that a quote was sent twice. Never throws.
+MessageRow GetMarkerRow(const QString& text, const QString& typeName);
+/// The same for a text that has already been prepared and parsed.
+MessageRow GetMessageRow(const xml::Document& message, const QString& typeName);
+MessageRow GetMarkerRow(const xml::Document& marker, const QString& typeName);
+
+}  // namespace kest
