@@ -221,7 +221,7 @@ TEST_F(Interrupted, ALoadedMessageThatCouldNotBeMovedIsMovedLater)
         std::string loaded;
         {
             const ReadFolderAway away;
-            window.open();
+            window.openUnread();
             EXPECT_TRUE(window.loadFile(u"m.xml"_s));
             loaded = quote("500").notes();
             EXPECT_TRUE(window.loadFile(u"m.xml"_s)) << "it is not loaded twice";
@@ -242,7 +242,7 @@ TEST_F(Interrupted, ALoadedMessageThatCouldNotBeMovedIsMovedLater)
     const std::string loaded = quote("500").notes();
     arrive("m.xml", adjustedQuote("500"));
     frmMessageList window;
-    window.open();
+    window.openUnread();
     EXPECT_TRUE(window.loadFile(u"m.xml"_s));
     EXPECT_NE(quote("500").notes(), loaded);
 }
