@@ -1,5 +1,4 @@
 #include "Sending.h"
-#include "platform/database/FaultInjection.h"
 #include "platform/files/FaultInjection.h"
 
 static void empty(std::initializer_list<const char*> tables)
@@ -89,7 +88,9 @@ TEST_F(Sending, AQuoteIsLockedOnlyWhenItsDocumentStands)
         const QuoteRow row = sendable();
         if (!statement.isEmpty())
             gConn->execute(statement);
+        files::setFault([&] { return statement.isEmpty(); });  // a full disk
         EXPECT_EQ(failureOf([] { send("500"); }), number) << statement;
+        files::setFault({});
         EXPECT_FALSE(row.locked()) << statement;
         EXPECT_EQ(filesIn(gsUnsentPath), QStringList()) << statement;
         EXPECT_EQ(shown(), "");
@@ -97,31 +98,7 @@ TEST_F(Sending, AQuoteIsLockedOnlyWhenItsDocumentStands)
     };
     for (const auto& [statement, number] : casesIn<2>("outbound/failures.txt"))
         fails(statement, number.toInt());
-    files::setFault([] { return true; });  // a full disk
     fails({}, FileInputOutput);
-    files::setFault({});
-}
-
-TEST_F(Sending, AfterAFaultAtAnyStepTheQuoteCanBeSentAgain)
-{
-    sendable().request("QR1").note("Active Quote Request");
-    db::Recordset panel(gConn);
-    panel.open(u"SELECT * FROM QUOTE1 WHERE QTNNO='500'"_s);
-    int failing = 0;
-    for (bool reached = true; reached; ++failing) {
-        int statement = 0;
-        db::setStatementFault([&] { return statement++ == failing; });
-        attempt([&] { SendQuote(panel); });
-        db::setStatementFault({});
-        reached = statement > failing;
-        EXPECT_EQ(panel.text(u"QTNNO"_s), u"500"_s) << failing;
-        if (quote("500").locked()) {
-            EXPECT_EQ(filesIn(gsUnsentPath), QStringList(u"500.0_1.xml"_s)) << failing;
-            quote("500").locked(false).remarks("(01/02/2008 : Active Quote Request)");
-        }
-    }
-    EXPECT_GT(failing, 30) << "as many statements as a send has";
-    EXPECT_EQ(filesIn(gsUnsentPath), QStringList(u"500.0_1.xml"_s));
 }
 
 TEST_F(Sending, AQuoteNumberCannotLeaveTheOutgoingFolder)

@@ -4,6 +4,7 @@
 #include "platform/database/Change.h"
 #include "platform/database/ColumnValues.h"
 #include "platform/database/ConnectionText.h"
+#include "platform/database/FaultInjection.h"
 #include "platform/database/OdbcDrivers.h"
 #include "platform/database/Session.h"
 #include "platform/database/Waiting.h"
@@ -18,6 +19,14 @@ namespace kest::db {
 using namespace Qt::StringLiterals;
 
 namespace {
+
+std::function<bool()> connectionFault;
+
+void failOnRequest()
+{
+    if (connectionFault && connectionFault())
+        throw RuntimeError(CannotOpen, u"A fault set by a test."_s);
+}
 
 bool isMySql(const QString& driver)
 {
@@ -78,12 +87,18 @@ QString embeddedName(const QString& connectionText)
     return instance.isEmpty() ? database : instance + u'.' + database;
 }
 
+void setConnectionFault(std::function<bool()> fault)
+{
+    connectionFault = std::move(fault);
+}
+
 Connection::Connection() = default;
 Connection::~Connection() = default;
 
 void Connection::open(const QString& connectionText)
 {
     close();
+    failOnRequest();
     std::unique_ptr<Engine> engine;
     const auto connect = [&] { engine = openEngine(connectionText, ConnectionText(odbcOptions_), commandTimeout_); };
     if (embeddedName(connectionText).isEmpty()) {
@@ -112,7 +127,10 @@ int Connection::state() const
 
 bool Connection::answers() const
 {
-    if (state() == 1 && !attempt([&] { session_->engine().ping(); }))
+    if (state() == 1 && !attempt([&] {
+            failOnRequest();
+            session_->engine().ping();
+        }))
         session_->engine().drop();  // whatever the reason
     return state() == 1;
 }

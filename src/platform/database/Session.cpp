@@ -195,6 +195,7 @@ Rows Session::selectLocked(const TableInfo& info, const QString& condition)
 
 void Session::begin()
 {
+    checkFault();
     engine_->run(dialect().begin);
 }
 
@@ -206,6 +207,7 @@ void Session::commit()
 
 void Session::rollback()
 {
+    checkFault();
     engine_->run(u"ROLLBACK"_s);
 }
 

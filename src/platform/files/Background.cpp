@@ -68,10 +68,7 @@ void remember()
 void tryAll()
 {
     waiting.removeIf([](const QString& file) {
-        attempt([&] {
-            failOnRequest(file);
-            removeFile(file);
-        });
+        attempt([&] { removeFile(file); });
         return !isFile(file);
     });
 }

@@ -5,8 +5,9 @@
 
 namespace kest::files {
 
-/// Sets a function that is called before each read, write, append, copy, move and removal of a file. If it returns
-/// true, the operation fails with FileInputOutput. An empty function turns this off.
+/// Sets a function that is called before each step that can fail: a file is opened, read, written, cut, given its mode,
+/// flushed, renamed or removed, a folder is listed or made. If it returns true, the step fails with FileInputOutput. An
+/// empty function turns this off.
 void setFault(std::function<bool()> fault);
 
 }  // namespace kest::files

@@ -179,6 +179,7 @@ QStringList list(const QString& folder, const QString& pattern)
     const QString place = systemPath(folder);
     if (place.isEmpty() || !isFolder(place))
         return {};
+    failOnRequest(place);
     const Folder open = openFolder(place);
     if (!open)
         throwSystemError(place);

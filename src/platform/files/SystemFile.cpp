@@ -157,11 +157,11 @@ void throwSystemError(const QString& systemPath)
     }
 }
 
-SystemFile::SystemFile(const QString& systemPath, int flags, unsigned mode)
-    : path(systemPath), descriptor(withoutInterruption([name = encodedPath(systemPath), flags, mode] {
-          return ::open(name.constData(), flags | O_CLOEXEC | O_NONBLOCK, mode);
-      }))
+SystemFile::SystemFile(const QString& systemPath, int flags, unsigned mode) : path(systemPath), descriptor(-1)
 {
+    failOnRequest(path);
+    const QByteArray name = encodedPath(path);
+    descriptor = withoutInterruption([&] { return ::open(name.constData(), flags | O_CLOEXEC | O_NONBLOCK, mode); });
     if (descriptor < 0)
         throwSystemError(path);
 }
@@ -182,6 +182,7 @@ qint64 SystemFile::size() const
 
 QByteArray SystemFile::read(qsizetype most)
 {
+    failOnRequest(path);
     QByteArray bytes(most, Qt::Uninitialized);
     qsizetype have = 0;
     while (have < most) {
@@ -198,6 +199,7 @@ QByteArray SystemFile::read(qsizetype most)
 
 void SystemFile::write(const QByteArray& bytes)
 {
+    failOnRequest(path);
     qsizetype done = 0;
     while (done < bytes.size()) {
         const ssize_t count = ::write(descriptor, bytes.constData() + done, static_cast<size_t>(bytes.size() - done));
@@ -209,12 +211,14 @@ void SystemFile::write(const QByteArray& bytes)
 
 void SystemFile::cutTo(qint64 size)
 {
+    failOnRequest(path);
     if (::ftruncate(descriptor, size) != 0)
         throwSystemError(path);
 }
 
 void SystemFile::setMode(unsigned mode)
 {
+    failOnRequest(path);
     if (::fchmod(descriptor, mode) != 0)
         throwSystemError(path);
 }
@@ -235,6 +239,7 @@ bool SystemFile::lockByte(qint64 at)
 
 void SystemFile::commit()
 {
+    failOnRequest(path);
     if (::fsync(descriptor) != 0 && errno != EINVAL && errno != EROFS)  // some file systems can't do this
         throwSystemError(path);
     const int closing = std::exchange(descriptor, -1);
@@ -310,6 +315,7 @@ bool sameVolume(const QString& from, const QString& to)
 
 void renameFile(const QString& from, const QString& to)
 {
+    failOnRequest(from);
     if (::rename(encodedPath(from).constData(), encodedPath(to).constData()) != 0)
         throwSystemError(from);
     commitFolder(folderOf(to));
@@ -320,6 +326,7 @@ void removeFile(const QString& systemPath)
     checkFolderWritable(systemPath);
     if (isFolder(systemPath))
         throwFileError(PermissionDenied, systemPath);
+    failOnRequest(systemPath);
     if (::unlink(encodedPath(systemPath).constData()) != 0)
         throwSystemError(systemPath);
 }

@@ -37,7 +37,6 @@ qint64 size(const QString& path)
 
 QByteArray readBytes(const QString& path)
 {
-    failOnRequest(path);
     const QString place = systemPath(path);
     checkReadable(place);
     SystemFile file(place, O_RDONLY);
@@ -49,7 +48,6 @@ QByteArray readBytes(const QString& path)
 
 QByteArray readStart(const QString& path, qint64 most)
 {
-    failOnRequest(path);
     const QString place = systemPath(path);
     checkReadable(place);
     SystemFile file(place, O_RDONLY);
@@ -63,7 +61,6 @@ QString read(const QString& path)
 
 void writeBytes(const QString& path, const QByteArray& bytes, Access access)
 {
-    failOnRequest(path);
     replaceFile(
         systemPath(path), spelledPath(path), [&](SystemFile& file) { file.write(bytes); },
         access == Access::OwnerAlone ? std::optional(ownerAlone) : std::nullopt);
@@ -81,7 +78,6 @@ void write(const QString& path, const QString& text)
 
 void append(const QString& path, const QString& text)
 {
-    failOnRequest(path);
     const QString place = systemPath(path);
     checkWritable(place);
     if (!isFile(place))
@@ -100,7 +96,6 @@ void append(const QString& path, const QString& text)
 void copy(const QString& from, const QString& to)
 {
     constexpr qsizetype piece = 1024LL * 1024;
-    failOnRequest(from);
     const QString source = systemPath(from);
     checkReadable(source);
     SystemFile original(source, O_RDONLY);
@@ -112,7 +107,6 @@ void copy(const QString& from, const QString& to)
 
 void move(const QString& from, const QString& to)
 {
-    failOnRequest(from);
     const QString source = systemPath(from);
     const QString target = systemPath(to);
     checkReadable(source);
@@ -132,7 +126,6 @@ void move(const QString& from, const QString& to)
 
 void remove(const QString& path, Force force)
 {
-    failOnRequest(path);
     const QString place = systemPath(path);
     if (force == Force::No)
         checkWritable(place);
@@ -148,6 +141,7 @@ void makeFolder(const QString& path)
         throwFileError(PathNotFound, place);
     if (isFile(place))
         throwFileError(FileExists, place);
+    failOnRequest(place);
     if (!QDir().mkpath(place))
         throwFileError(PermissionDenied, place);
 }

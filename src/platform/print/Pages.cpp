@@ -3,6 +3,7 @@
 #include "platform/RuntimeError.h"
 #include "platform/desktop/Progress.h"
 #include "platform/files/files.h"
+#include "platform/print/FaultInjection.h"
 #include "platform/print/PdfAuthor.h"
 #include "platform/print/Report.h"
 
@@ -23,6 +24,8 @@ namespace kest::report {
 using namespace Qt::StringLiterals;
 
 namespace {
+
+std::function<bool()> printFault;
 
 constexpr double margin = 15;       // millimetres
 constexpr int pdfResolution = 600;  // dots per inch
@@ -236,6 +239,11 @@ void setPaper(QPagedPaintDevice& device)
                                      QMarginsF(margin, margin, margin, margin), QPageLayout::Millimeter));
 }
 
+void setPrintFault(std::function<bool()> fault)
+{
+    printFault = std::move(fault);
+}
+
 void paint(const Report& report, QPagedPaintDevice& device, int firstPage, int lastPage, int copies)
 {
     const Pages pages(report, device);
@@ -243,7 +251,7 @@ void paint(const Report& report, QPagedPaintDevice& device, int firstPage, int l
     if (firstPage > last)
         return;  // QPainter::begin() would print an empty page
     QPainter painter;
-    if (!painter.begin(&device))
+    if ((printFault && printFault()) || !painter.begin(&device))
         throw RuntimeError(FileInputOutput, u"The report can't be painted."_s);
     desktop::Progress progress(report.title(), u"Laying out the pages..."_s);
     const int perCopy = last - firstPage + 1;

@@ -1,4 +1,5 @@
 #include "platform/xml/DocumentData.h"
+#include "platform/xml/FaultInjection.h"
 
 #include <QStringEncoder>
 
@@ -17,6 +18,8 @@ using namespace Qt::StringLiterals;
 namespace kest::xml {
 
 namespace {
+
+std::function<bool()> parseFault;
 
 // Error codes for our own limits. Those of libxml2 are its numbers, added to `libraryErrors`.
 constexpr quint32 TooLarge = 0xC00CEF01;
@@ -300,10 +303,19 @@ std::vector<std::string_view> namesInStartTag(std::string_view tag)
     return names;
 }
 
+void setParseFault(std::function<bool()> fault)
+{
+    parseFault = std::move(fault);
+}
+
 bool parse(DocumentData& data, const QString& text)
 {
     data.clear();
     data.error = {};
+    if (parseFault && parseFault()) {
+        data.error = limitError(libraryErrors + XML_ERR_NO_MEMORY, u"A fault set by a test."_s);
+        return false;
+    }
     if (text.size() > Document::maximumBytes) {
         data.error = limitError(TooLarge, u"The text is too large."_s);
         return false;
