@@ -318,7 +318,7 @@ void renameFile(const QString& from, const QString& to)
     failOnRequest(from);
     if (::rename(encodedPath(from).constData(), encodedPath(to).constData()) != 0)
         throwSystemError(from);
-    commitFolder(folderOf(to));
+    attempt([&] { commitFolder(folderOf(to)); });  // the file is there now, whether or not this fails
 }
 
 void removeFile(const QString& systemPath)
