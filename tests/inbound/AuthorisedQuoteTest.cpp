@@ -150,25 +150,3 @@ TEST_F(AuthorisedQuotes, ACompanyNeedsNoPersonsName)
                          .without("authorisedQuoteClaimCustomer/*")
                          .set("authorisedQuoteClaimCustomer/companyName", "Fenwick Freight")));
 }
-
-TEST_F(AuthorisedQuotes, TotalsThatCouldNotBeStoredAreTold)
-{
-    quote("500").line(1).set("rrhour", 2).set("rr_rate2", 38);
-    const Snapshot before;
-    for (const Message& message : {authorisedQuote("500").labour(1, "C"), manualQuote("500").part(1, "I")}) {
-        bool told = false;
-        for (int number = 1; !told; ++number) {
-            before.restore();
-            int step = 0;
-            db::setStatementFault([&] { return ++step == number; });
-            const bool loaded = load(message);
-            db::setStatementFault({});
-            told =
-                loaded && shown().find("quote 500 are loaded, but its totals could not be stored") != std::string::npos;
-            if (step < number)
-                break;  // there are no more statements
-        }
-        EXPECT_TRUE(told);
-        EXPECT_TRUE(files::read(errorLogPath()).contains(u"QuoteTotals.storeTotals"_s));
-    }
-}

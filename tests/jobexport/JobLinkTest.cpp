@@ -16,7 +16,6 @@ struct JobLink : Shop {
         fill(car("ABC123"), "PAINT_GP=M1 XMission=Manual Year=03/2005");
         fill(quote("500"), "qtndate=2008-03-21 QUOTER=Sam policy_no=P7");
     }
-    ~JobLink() override { db::setStatementFault({}); }
 
     static void store(const QString& password)
     {
@@ -152,31 +151,6 @@ TEST_F(JobLink, WithoutASettingOrAServerThatAnswersNothingIsExportedOrSaid)
     exportQuote();
     EXPECT_EQ(statusOfTheJob(), -1);
     EXPECT_EQ(shown(), "");
-}
-
-TEST_F(JobLink, AFailureAtAnyStatementLeavesNoHalfJobThatLooksWhole)
-{
-    quote("500").line(1).set("tosend", "A").set("VENDOR", vendor("Spoiler World").id());
-    quote("500").line(2).set("tosend", "A");
-    quote("500").remarks("note", "anno_rr");
-    int statements = 0;
-    db::setStatementFault([&] { return ++statements < 0; });
-    exportQuote();
-    db::setStatementFault({});
-    ASSERT_EQ(statusOfTheJob(), 1);
-
-    for (int failing = 1; failing <= statements; ++failing) {
-        jobs->execute(u"DELETE FROM newJob"_s);
-        jobs->execute(u"DELETE FROM newJobDtl"_s);
-        int statement = 0;
-        db::setStatementFault([&] { return ++statement == failing; });
-        EXPECT_NO_THROW(exportQuote()) << failing;
-        db::setStatementFault({});
-        if (statusOfTheJob() == 1) {
-            EXPECT_EQ(details("lineNr"), "1|2|900") << failing;
-        }
-        EXPECT_TRUE(rows("SELECT * FROM newJobHdr WHERE nJobID_FK=0").eof()) << failing << ": a header of no job";
-    }
 }
 
 TEST(Cipher, WhatIsStoredComesBack)

@@ -210,8 +210,7 @@ void makeShopDatabase()
                 serverShop().serverName);
 }
 
-/// Closes the embedded database for all, so that the file contains all changes.
-static void closeFile()
+void closeConnections()
 {
     gConn->close();
     QSqlDatabase::database(plainName, false).close();
@@ -223,7 +222,7 @@ SavedShopDatabase::SavedShopDatabase()
         serverShop().copy(serverShop().shop, serverShop().saved);
         return;
     }
-    closeFile();
+    closeConnections();  // so that the file contains all changes
     file_ = files::readBytes(app::embeddedFile(shopName));
     EnsureConnection();
 }
@@ -234,7 +233,7 @@ void SavedShopDatabase::restore() const
         serverShop().copy(serverShop().saved, serverShop().shop);
         return;
     }
-    closeFile();
+    closeConnections();  // so that the file contains all changes
     for (const char* suffix : {"-wal", "-shm"})
         QFile::remove(app::embeddedFile(shopName) + QString::fromLatin1(suffix));
     files::writeBytes(app::embeddedFile(shopName), file_);

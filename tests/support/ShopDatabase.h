@@ -13,6 +13,9 @@ bool shopIsOnServer();
 /// Drops the component's connection, as a restart of the server would.
 void dropConnection();
 
+/// Closes the connection of the component and that of plainRows().
+void closeConnections();
+
 /// Runs a query on a connection that is not the component's.
 QList<QSqlRecord> plainRows(const QString& select);
 /// Returns the text of a value of such a row: a flag is 1 or 0, a date a short date, Null an empty text.

@@ -1,0 +1,301 @@
+#include "Faults.h"
+
+#include "base/Journal.h"
+#include "base/modLoggerEx.h"
+#include "messagelist/frmMessageList.h"
+#include "platform/print/FaultInjection.h"
+#include "platform/xml/FaultInjection.h"
+
+#include <sys/wait.h>
+#include <unistd.h>
+
+namespace kest::test {
+
+namespace {
+
+enum class Fault { None, Once, FromThenOn, Lost, Kill };
+constexpr const char* faultWords[] = {"none", "once", "on", "lost", "kill"};
+
+/// Sees every call that can fail, as long as it lives.
+class Calls {
+public:
+    explicit Calls(Fault fault, int number = 0)
+    {
+        const auto watch = [this, fault, number](const char* kind) {
+            return [this, fault, number, kind] {
+                const bool isIt = ++count == number;
+                kinds.append(QString::fromLatin1(kind));
+                if (isIt && fault == Fault::Kill)
+                    ::_exit(0);
+                return fault == Fault::FromThenOn ? count >= number : isIt && fault == Fault::Once;
+            };
+        };
+        db::setStatementFault([fault, seen = watch("statement"), this,
+                               number] { return seen() || (fault == Fault::Lost && count == number); },
+                              fault == Fault::Lost ? CannotOpen : StatementFailed);
+        db::setConnectionFault(watch("connection"));
+        files::setFault(watch("file"));
+        xml::setParseFault(watch("parse"));
+        report::setPrintFault(watch("print"));
+    }
+    ~Calls()
+    {
+        db::setStatementFault({});
+        db::setConnectionFault({});
+        files::setFault({});
+        xml::setParseFault({});
+        report::setPrintFault({});
+    }
+    Q_DISABLE_COPY_MOVE(Calls)
+
+    int count = 0;
+    QStringList kinds;
+};
+
+/// A row of deviations.txt.
+struct Deviation {
+    QStringList works, faults;
+    QString pattern, reason;
+    int seen = 0;
+
+    bool isOfAll() const { return works.first() == u"*"_s; }
+};
+
+std::vector<Deviation> deviationsOf(const QString& name)
+{
+    std::vector<Deviation> known;
+    for (const auto& [works, faults, pattern, reason] : casesIn<4>("faults/deviations.txt"))
+        if (const Deviation row{works.split(u' '), faults.split(u' '), pattern, reason};
+            row.isOfAll() || row.works.contains(name))
+            known.push_back(row);
+    return known;
+}
+
+/// Returns the shop with the rows numbered without gaps, because a number is not used again after a change that failed.
+std::string numbered(const std::string& shop)
+{
+    static const QRegularExpression number(u"\\b(rec_id|CUST_ID|VENDOR)(_ID)?=([1-9]\\d*)\\b"_s);
+    const QString found = QString::fromStdString(shop);
+    QMap<QString, QMap<int, int>> places;
+    for (const QRegularExpressionMatch& match : number.globalMatch(found))
+        places[match.captured(1)][match.captured(3).toInt()] = 0;
+    for (QMap<int, int>& ofColumn : places)
+        for (int place = 0; int& given : ofColumn)
+            given = ++place;
+    QString result;
+    qsizetype end = 0;
+    for (const QRegularExpressionMatch& match : number.globalMatch(found)) {
+        result += found.sliced(end, match.capturedStart(3) - end);
+        result += QString::number(places[match.captured(1)][match.captured(3).toInt()]);
+        end = match.capturedEnd();
+    }
+    return (result + found.sliced(end)).toStdString();
+}
+
+/// Removes what a killed writer has left. The next start after a day would do it.
+void removeTemporaryFiles()
+{
+    QDirIterator walk(profile::root() + u"/drive_c"_s, {u".kest-*.tmp"_s}, QDir::Files | QDir::Hidden,
+                      QDirIterator::Subdirectories);
+    while (walk.hasNext())
+        QFile::remove(walk.next());
+}
+
+qint64 logSize()
+{
+    return QFileInfo(errorLogPath()).size();
+}
+
+/// Waits until the server has noticed that the killed process is gone.
+void waitForLocks()
+{
+    EXPECT_TRUE(db::Lock(gConn, u"load M.XML"_s, 10).isHeld());
+    if (!journal::isKept())
+        return;
+    for (const QSqlRecord& row : plainRows(u"SELECT LockName FROM KESTOperation WHERE State='open'"_s))
+        EXPECT_TRUE(db::Lock(gConn, row.value(0).toString(), 10).isHeld());
+}
+
+QString statusShown;
+
+/// Operates windows without showing them: a killed process shares no threads with this one, and Qt paints with threads.
+struct HiddenWindows final : desktop::WindowDriver {
+    bool drive(QDialog& window) override
+    {
+        if (const auto steps = work.windows.find(window.objectName()); steps != work.windows.end())
+            steps->second(window);
+        return true;
+    }
+    explicit HiddenWindows(const Work& ofWork) : work(ofWork) {}
+    const Work& work;
+};
+
+/// One work of a shop, its end without a fault, and what is known to end differently.
+class Trial {
+public:
+    Trial(const QString& name, const Work& work, std::optional<ScriptedDesktop>& desktop);
+    /// Does the work with a fault at one of its calls, goes on as a user would, and compares.
+    void disturb(Fault fault, int number);
+    void tellWhatCameUp(bool isWhole) const;
+
+    /// The kinds of the undisturbed work's calls.
+    const QStringList& kinds() const { return kinds_; }
+
+private:
+    /// Returns what the user sees.
+    QString run(Fault fault = Fault::None, int number = 0);
+    void killAt(int number);
+    std::string shop() const { return numbered(work.result ? work.result() : holdings()); }
+    bool isKnown(Fault fault, const QString& account);
+
+    QString name;
+    const Work& work;
+    std::optional<ScriptedDesktop>& desktop;
+    std::vector<Deviation> known;
+    const Snapshot before;
+    QString undisturbed;
+    std::string expected;
+    QStringList kinds_;
+    int faults = 0;
+};
+
+Trial::Trial(const QString& ofName, const Work& ofWork, std::optional<ScriptedDesktop>& ofShop)
+    : name(ofName), work(ofWork), desktop(ofShop), known(deviationsOf(name))
+{
+    for (int time = 1; time <= 2; ++time) {  // the first one makes some calls that later ones don't need
+        kinds_.clear();
+        before.restore();
+        work.prepare();
+        undisturbed = run();
+    }
+    EXPECT_TRUE(work.isDone()) << undisturbed;
+    expected = shop();
+}
+
+QString Trial::run(Fault fault, int number)
+{
+    desktop.emplace(work.answers);
+    desktop::setWindowDriver(std::make_shared<HiddenWindows>(work));
+    statusShown.clear();
+    {
+        Calls counted(fault, number);
+        desktop::guarded(u"work"_s, work.doIt);
+        if (kinds_.isEmpty())
+            kinds_ = counted.kinds;
+    }
+    return desktop->boxTexts().join(u'\n') + u'\n' + statusShown;
+}
+
+/// Ends another process of the same workstation at that call.
+void Trial::killAt(int number)
+{
+    closeConnections();
+    const pid_t child = ::fork();
+    if (child == 0) {
+        EnsureConnection();
+        run(Fault::Kill, number);
+        ::_exit(0);
+    }
+    int status = 0;
+    ::waitpid(child, &status, 0);
+    EXPECT_TRUE(WIFEXITED(status)) << name << ": the process crashed before call " << number;
+    EnsureConnection();
+    waitForLocks();
+    removeTemporaryFiles();
+}
+
+bool Trial::isKnown(Fault fault, const QString& account)
+{
+    for (Deviation& deviation : known) {
+        const QRegularExpression pattern(deviation.pattern, QRegularExpression::DotMatchesEverythingOption);
+        if (deviation.faults.contains(QString::fromLatin1(faultWords[int(fault)])) && account.contains(pattern)) {
+            ++deviation.seen;
+            return true;
+        }
+    }
+    return false;
+}
+
+void Trial::disturb(Fault fault, int number)
+{
+    ++faults;
+    before.restore();
+    work.prepare();
+    const qint64 logBefore = logSize();
+    QString first = u"killed"_s;
+    if (fault == Fault::Kill)
+        killAt(number);
+    else
+        first = run(fault, number);
+    const bool isTold = first != undisturbed || logSize() > logBefore;
+    const bool isDone = work.isDone();
+    const QString second = isDone ? QString() : run();
+    std::string found = shop();
+    if (isDone && found != expected) {
+        attempt([] { Faults::openList(); });  // this finishes what is left
+        found = shop();
+    }
+    if (found == expected && (isDone || (isTold && second == undisturbed)))
+        return;
+    const QString account =
+        u"%1: %2 %3 of %4 (%5)\nfirst: %6: %7\nsecond: %8\n"_s.arg(name, QString::fromLatin1(faultWords[int(fault)]))
+            .arg(number)
+            .arg(kinds_.size())
+            .arg(kinds_[number - 1], isDone ? u"done"_s : u"not done"_s, first, second) +
+        (isTold ? u""_s : u"in silence\n"_s) + QString::fromStdString(difference(expected, found));
+    EXPECT_TRUE(isKnown(fault, account)) << account;
+}
+
+void Trial::tellWhatCameUp(bool isWhole) const
+{
+    before.restore();
+    std::cout << name.toStdString() << ": " << kinds_.size() << " calls, " << faults << " faults\n";
+    for (const Deviation& deviation : known) {
+        if (deviation.seen > 0)
+            std::cout << "  " << deviation.seen << " x " << deviation.reason.toStdString() << '\n';
+        EXPECT_TRUE(!isWhole || deviation.isOfAll() || deviation.seen > 0)
+            << name << ": never comes up: " << deviation.reason;
+    }
+}
+
+}  // namespace
+
+static void open(frmMessageList& window, const std::function<void()>& then)
+{
+    window.open();
+    then();
+    statusShown = control<QLabel>(window, "lblStatus").text();
+}
+
+QStringList Faults::openList()
+{
+    QStringList files;
+    frmMessageList window;
+    open(window, [&] {
+        for (const ListedMessage& message : window.rows())
+            files << message.file;
+    });
+    return files;
+}
+
+void Faults::loadFirst()
+{
+    frmMessageList window;
+    open(window, [&] { control<QPushButton>(window, "cmdProcess").click(); });
+}
+
+void Faults::survives(const QString& name, const Work& work)
+{
+    const bool isWhole = qEnvironmentVariable("KEST2_TEST_FAULTS") == u"all"_s && !shopIsOnServer();
+    Trial trial(name, work, desktop);
+    for (const Fault fault : {Fault::Once, Fault::FromThenOn, Fault::Lost, Fault::Kill}) {
+        if (shopIsOnServer() && fault != Fault::Kill)
+            continue;
+        for (int number = 1; number <= trial.kinds().size(); number += isWhole ? 1 : 10)
+            if (fault != Fault::Lost || trial.kinds()[number - 1] == u"statement"_s)
+                trial.disturb(fault, number);
+    }
+    trial.tellWhatCameUp(isWhole);
+}
+
+}  // namespace kest::test

@@ -1,0 +1,205 @@
+// What each operation of a shop leaves if one of its calls fails or the process dies there, and the user then goes on.
+#include "Faults.h"
+#include "base/CredentialCipher.h"
+#include "jobexport/JobLinkSettings.h"
+#include "jobexport/WriteQuote.h"
+#include "messages/Folders.h"
+#include "outbound/SendQuote.h"
+#include "support/MariaDbServer.h"
+#include "utilities/frmLogin.h"
+#include "utilities/frmUtilities.h"
+#include "utilities/frmViewXML.h"
+
+struct Loads : Faults {};
+
+struct Lines : Faults {
+    Lines()
+    {
+        quote("500").request("QR1").stage(3).set("excess", 500).set("contri", 50).note("Responded Quote Request");
+        quote("500").line(1).set("rrhour", 2).set("rr_rate2", 38).set("allow_tick", 7);
+        quote("500").line(2, "PRT").set("qty", 1).set("rrhour", 80);
+        quote("500").line(3, "OPG").set("pthour", 1).set("opg_rate", 48);
+        quote("500").line(4, "MIS").set("unitcost", 12);
+    }
+};
+
+struct Others : Faults {};
+
+TEST_F(Loads, Requests)
+{
+    survivesLoading("RequestOfACustomerWithoutFirstName", quoteRequest("QR1").set("claimCustomer/firstName", ""));
+    car("ABC123").set("COLOUR", "bLUE");
+    survivesLoading("RequestOfKnownCar", quoteRequest("QR1").rego("ABC123"));
+    arrive("QR1_001.jpg", "picture");
+    arrive("QR1_001.txt", "its text");
+    survivesLoading("Request", quoteRequest("QR1").images({"1"}));
+}
+
+TEST_F(Loads, StatusMessages)
+{
+    quote("500").request("QR1").quoteNumber("KQ1").stage(3).note("Responded Quote Request").line(1);
+    const std::pair<const char*, Message> cases[] = {
+        {"Match", quoteMatch("500")},
+        {"Revision", revisionRequest("QR1")},
+        {"Cancellation", cancellation("QR1")},
+        {"CancellationBackout", cancellationBackout("QR1")},
+        {"Assessment", assessmentResult("KQ1")},
+        {"AssessmentBackout", assessmentBackout("QR1")},
+        {"ExcessWaiver", excessWaiver("500")},
+        {"Deletion", quoteDeletion("KQ1")},
+        {"Adjustment", adjustedQuote("500")},
+    };
+    for (const auto& [name, message] : cases)
+        survivesLoading(name, message);
+
+    quote("500", 1).request("QR1").quoteNumber("KQ2").line(1);
+    survivesLoading("DeletionOfASupplement", quoteDeletion("KQ2"),
+                    R"({"boxes": [{"text": "DELETED", "answer": "yes"}]})");
+    quote("500", 1).note("Quote Rejected \"Reason : Part Price\"");
+    survivesLoading("RejectionBackout", assessmentBackout("QR1"));
+}
+
+TEST_F(Loads, BackoutOfAnAuthorisation)
+{
+    quote("500").request("QR1").authorised("KA1").stage(4).note("Won Quote Request").note("Authorised Quote");
+    survivesLoading("AuthorisationBackout", assessmentBackout("QR1"));
+}
+
+TEST_F(Lines, AuthorisationThatChanges)
+{
+    survivesLoading("AuthorisationThatChanges", authorisedQuote("500")
+                                                    .set("excess", "400")
+                                                    .set("customerContribution", "110")
+                                                    .labour(1, "C", {{"labourType", "REPR"}})
+                                                    .part(2, "C", {{"partQuantity", "2"}})
+                                                    .paint(3, "C")
+                                                    .sublet(4, "D"));
+}
+
+TEST_F(Lines, AuthorisationThatAdds)
+{
+    survivesLoading("AuthorisationThatAdds",
+                    authorisedQuote("500").labour(6, "I").sublet(7, "I", {{"subletAuthorityDocument", "JVBERi0x"}}));
+}
+
+TEST_F(Lines, ManualQuote)
+{
+    car("ABC123").set("COLOUR", "sILVER");
+    arrive("waiting.xml", quoteRequest("QR1"));
+    survivesLoading("ManualQuote", manualQuote("500").labour(1, "I").part(2, "I").paint(3, "I").sublet(4, "I"));
+}
+
+TEST_F(Lines, NewManualQuote)
+{
+    survivesLoading("NewManualQuote", manualQuote("MANQ").request("QR9").labour(1, "I"));
+}
+
+TEST_F(Lines, ManualQuoteWithBlanksInRego)
+{
+    car("ABC 123");
+    car("ABC123").set("VIN", "in the way");
+    quote("500").rego("ABC 123");
+    survivesLoading("ManualQuoteWithBlanksInRego", manualQuote("500").labour(1, "I"));
+}
+
+TEST_F(Others, SubmissionResponse)
+{
+    quote("500").note("Sending KEST Quote");
+    arrive("R_500_0.xml", submissionResponse("KQ1"));
+    survives(u"SubmissionResponse"_s, {[] { openList(); }, [] { return quote("500").text("KESTQuoteNo") == "KQ1"; }});
+}
+
+TEST_F(Others, Fill)
+{
+    quote("500").request("QR1");
+    arrive("a.xml", quoteRequest("QR2"));
+    arrive("b.xml", cancellation("QR1"));
+    arrive("c.xml", "<a>&</a>");
+    static QStringList rows;
+    survives(u"Fill"_s, {[] {
+                             rows.clear();
+                             rows = openList();
+                         },
+                         [] { return rows.size() == 3; }});
+}
+
+TEST_F(Others, Move)
+{
+    quote("500").request("QR1");
+    arrive("m.xml", cancellation("QR1"));
+    Work move = loadOf();
+    move.doIt = [] { MoveMessage(u"m.xml"_s, u"read"_s); };
+    survives(u"Move"_s, move);
+}
+
+TEST_F(Others, Send)
+{
+    for (const char* name : {"500_0001.jpg", "500_0002.jpg"})
+        files::write(gsImagesPath + QLatin1StringView(name), QLatin1StringView(name));
+    quote("500").request("QR1").note("Active Quote Request").line(1).set("rr_rate2", 50.255).set("rrhour", 2);
+    survives(u"Send"_s, {[] {
+                             if (openHostQuote(u"500"_s, u"0"_s))
+                                 SendQuote(*grsQuote);
+                         },
+                         [] { return quote("500").locked(); }});
+}
+
+TEST_F(Others, SaveInTheUtilities)
+{
+    quote("500").note("Responded Quote Request").locked(true);
+    Work save{[] { frmUtilities::ShowForm(u"500"_s, u"0"_s); },
+              [] { return quote("500").text("KESTQuoteNo") == "KQ5" && quote("500").notes().find("Sending") < 20; }};
+    save.windows[u"frmUtilities"_s] = [](QDialog& window) {
+        control<QLineEdit>(window, "txtQuoteNo").setText(u"KQ5"_s);
+        control<QPushButton>(window, "Command4").click();
+        control<QPushButton>(window, "Command1").click();
+    };
+    survives(u"SaveInTheUtilities"_s, save);
+}
+
+TEST_F(Others, SaveInTheViewer)
+{
+    arrive("m.xml", "<a>1</a><b>2</b>");
+    Work save{[] {
+                  gsCurFolder = gsUnreadPath;
+                  frmViewXML::ShowForm(u"m.xml"_s);
+              },
+              [] { return files::read(gsUnreadPath + u"m.xml"_s).startsWith(u'\r'); }};
+    save.windows[u"frmViewXML"_s] = [](QDialog& window) { control<QPushButton>(window, "Command2").click(); };
+    save.windows[u"frmLogin"_s] = [](QDialog& window) {
+        control<QLineEdit>(window, "txtPassword").setText(QString::number(dayPassword(QDate::currentDate())));
+        control<QPushButton>(window, "cmdOK").click();
+    };
+    survives(u"SaveInTheViewer"_s, save);
+}
+
+TEST_F(Others, Export)
+{
+    quote("500").line(1).set("tosend", "A").set("VENDOR", vendor("Spoiler World").id());
+    quote("500").remarks("note", "anno_rr");
+    const auto jobs = [](const char* select) {
+        const auto link = std::make_shared<db::Connection>();
+        link->open(mariaDb().connectionText(u"jobs"_s));
+        db::Recordset found(link);
+        found.open(QString::fromLatin1(select));
+        QStringList rows;
+        for (; !found.eof(); found.moveNext())
+            for (const QString& column : found.columns())
+                rows += column + u'=' + found.text(column);
+        return rows;
+    };
+    InitCipherKey();
+    storeJobLinkSettings({u"127.0.0.1"_s, mariaDb().port(), u"jobs"_s, mariaDb().user(), mariaDb().password()});
+    survives(
+        u"Export"_s,
+        {[] { WriteQuote(u"500"_s, u"0"_s); }, [=] { return !jobs("SELECT * FROM newJob WHERE Status=1").isEmpty(); },
+         [] { mariaDb().createDatabase(u"jobs"_s, files::read(checkoutFile(u"sql/joblink.sql"_s))); },
+         [=] {
+             return (jobs("SELECT lineNr, lineDescn FROM newJobDtl JOIN newJob ON nJobID_FK=nJobID_PK "
+                          "JOIN newJobHdr USING (nJobID_FK) WHERE Status=1") +
+                     jobs("SELECT COUNT(*) AS unfinished FROM newJob WHERE Status=0") +
+                     jobs("SELECT COUNT(*) AS ofNoJob FROM newJobHdr WHERE nJobID_FK=0"))
+                 .join(u'\n')
+                 .toStdString();
+         }});
+}
