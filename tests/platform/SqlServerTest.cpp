@@ -2,6 +2,7 @@
 #include "platform/Databases.h"
 #include "platform/database/Dialect.h"
 #include "platform/database/OdbcDrivers.h"
+#include "platform/database/Session.h"
 
 #include <QTcpServer>
 
@@ -97,6 +98,34 @@ TEST_P(SqlServer, ExactNumbersTellARowAndVersionsDoNot)
         EXPECT_EQ(failure([&] { prices.set(column, u"x"_s); }).number(), StatementFailed) << column.toStdString();
     prices.remove();
     EXPECT_TRUE(query(u"SELECT * FROM PRICES"_s).eof());
+}
+
+TEST_P(SqlServer, AWaitForALockEndsAsATimeOut)
+{
+    connection->execute(u"INSERT INTO CAR (REGO) VALUES ('A')"_s);
+    const db::ConnectionPtr other = connect();
+    other->session().begin();
+    other->execute(u"UPDATE CAR SET owner='Ann'"_s);
+    connection->execute(u"SET LOCK_TIMEOUT 100"_s);
+    const auto change = [&] { EXPECT_EQ(connection->execute(u"UPDATE CAR SET owner='Bob'"_s), 1); };
+    const RuntimeError thrown = failure(change);
+    EXPECT_EQ(thrown.nativeCode(), u"1222"_s);
+    EXPECT_EQ(thrown.sqlState(), u"HYT00"_s) << thrown.what();
+    other->session().rollback();
+    EXPECT_EQ(failure(change).number(), 0) << "the connection lives on";
+}
+
+TEST_P(SqlServer, ATableOfAnotherSchemaIsAnotherTable)
+{
+    connection->execute(u"CREATE SCHEMA other"_s);
+    connection->execute(u"CREATE TABLE other.LINE (number INT NOT NULL PRIMARY KEY, CODE DATETIME)"_s);
+    Recordset lines = query(u"SELECT * FROM LINE"_s);
+    lines.addNew();
+    lines.set(u"CODE"_s, u"A"_s);
+    lines.update();
+    lines.set(u"SEQ"_s, 5);
+    EXPECT_EQ(failure([&] { lines.update(); }).number(), 0);
+    EXPECT_EQ(count(u"CODE='A' AND SEQ=5"_s), 1);
 }
 
 TEST_P(SqlServer, AServerThatFallsSilentIsToldWithinSeconds)

@@ -10,7 +10,8 @@ from translation import INT, NAME, Column, ServerError
 from wire import Type
 
 SYSTEM = """
-CREATE TABLE sys_of_columns (table_name, ordinal, name, type, size, scale, nullable, fallback, is_identity, key_place);
+CREATE TABLE sys_of_columns (table_name, ordinal, name, type, size, scale, nullable, fallback, is_identity, key_place,
+                             schema);
 CREATE TABLE sys_of_triggers (name, parent, events, body);
 CREATE VIEW sys_triggers AS SELECT name, OBJECT_ID(parent) AS parent_id FROM sys_of_triggers;
 CREATE VIEW sys_indexes AS
@@ -21,26 +22,28 @@ CREATE VIEW sys_index_columns AS
 CREATE VIEW sys_databases AS SELECT DB_NAME() AS name, 150 AS compatibility_level;
 CREATE VIEW sys_dm_exec_sessions AS SELECT SPID() AS session_id, 'mdy' AS date_format;
 CREATE VIEW information_schema_tables AS
-    SELECT DISTINCT 'standin' AS TABLE_CATALOG, 'dbo' AS TABLE_SCHEMA, table_name AS TABLE_NAME,
+    SELECT DISTINCT 'standin' AS TABLE_CATALOG, schema AS TABLE_SCHEMA, table_name AS TABLE_NAME,
            'BASE TABLE' AS TABLE_TYPE FROM sys_of_columns;
 CREATE VIEW information_schema_columns AS
-    SELECT 'standin' AS TABLE_CATALOG, 'dbo' AS TABLE_SCHEMA, table_name AS TABLE_NAME, name AS COLUMN_NAME,
+    SELECT 'standin' AS TABLE_CATALOG, schema AS TABLE_SCHEMA, table_name AS TABLE_NAME, name AS COLUMN_NAME,
            ordinal AS ORDINAL_POSITION, fallback AS COLUMN_DEFAULT, nullable AS IS_NULLABLE, type AS DATA_TYPE,
            CASE WHEN type='text' THEN 2147483647 WHEN type='ntext' THEN 1073741823
                 WHEN type LIKE '%char' OR type='varbinary' THEN size END AS CHARACTER_MAXIMUM_LENGTH,
            CASE WHEN type IN ('decimal', 'numeric') THEN size END AS NUMERIC_PRECISION,
-           CASE WHEN type='money' THEN 4 WHEN type IN ('decimal', 'numeric') THEN scale END AS NUMERIC_SCALE
+           CASE WHEN type='money' THEN 4 WHEN type IN ('decimal', 'numeric') THEN scale END AS NUMERIC_SCALE,
+           CASE WHEN type='datetime' THEN 3 WHEN type='datetime2' THEN IFNULL(size, 7) END AS DATETIME_PRECISION
     FROM sys_of_columns;
 CREATE VIEW information_schema_key_column_usage AS
-    SELECT 'standin' AS TABLE_CATALOG, 'dbo' AS TABLE_SCHEMA, table_name AS TABLE_NAME, name AS COLUMN_NAME,
-           key_place AS ORDINAL_POSITION, 'PK_' || table_name AS CONSTRAINT_NAME, 'dbo' AS CONSTRAINT_SCHEMA
+    SELECT 'standin' AS TABLE_CATALOG, schema AS TABLE_SCHEMA, table_name AS TABLE_NAME, name AS COLUMN_NAME,
+           key_place AS ORDINAL_POSITION, 'PK_' || table_name AS CONSTRAINT_NAME, schema AS CONSTRAINT_SCHEMA
     FROM sys_of_columns WHERE key_place IS NOT NULL;
 CREATE VIEW information_schema_table_constraints AS
     SELECT DISTINCT TABLE_CATALOG, TABLE_SCHEMA, TABLE_NAME, CONSTRAINT_NAME, CONSTRAINT_SCHEMA,
            'PRIMARY KEY' AS CONSTRAINT_TYPE FROM information_schema_key_column_usage;
 """
-NUMBERS_OF_VIEWS = ("ordinal_position", "character_maximum_length", "numeric_precision", "numeric_scale", "parent_id",
-                    "compatibility_level", "session_id", "object_id", "index_id", "column_id", "key_ordinal")
+NUMBERS_OF_VIEWS = ("ordinal_position", "character_maximum_length", "numeric_precision", "numeric_scale",
+                    "datetime_precision", "parent_id", "compatibility_level", "session_id", "object_id", "index_id",
+                    "column_id", "key_ordinal")
 
 
 def key_of(text):
@@ -112,6 +115,15 @@ def as_datetime(text):
     raise ServerError(241, "Conversion failed when converting date and/or time from character string '%s'." % text)
 
 
+def as_datetime2(text):
+    """As datetime, with up to seven digits of a second."""
+    whole, _, fraction = text.strip().partition(".")
+    fraction = fraction[:7].rstrip("0")
+    if not (fraction + "0").isdigit():
+        raise ServerError(241, "Conversion failed when converting date and/or time from character string '%s'." % text)
+    return as_datetime(whole) + ("." + fraction if fraction else "")
+
+
 def as_code_page(text):
     return text.encode("cp1252", "replace").decode("cp1252")
 
@@ -126,7 +138,7 @@ class Database:
         self.lite.create_collation("SERVER", compare)
         add = functools.partial(self.lite.create_function, deterministic=True)
         add("like", 2, is_like)
-        for function in (as_number, as_bit, as_datetime, as_code_page):
+        for function in (as_number, as_bit, as_datetime, as_datetime2, as_code_page):
             add(function.__name__, 1, functools.partial(failing(function), self))
         add("OBJECT_ID", -1, lambda name, *_: self.object_id(name))
         add("OBJECT_NAME", 1, self.object_name)
@@ -142,8 +154,8 @@ class Database:
         return self.lite.execute("PRAGMA schema_version").fetchone()[0]
 
     def columns(self, table):
-        rows = self.lite.execute("SELECT name, type, size, scale, is_identity FROM sys_of_columns "
-                                 "WHERE table_name=? COLLATE NOCASE ORDER BY ordinal", (table, )).fetchall()
+        rows = self.lite.execute("SELECT name, type, size, scale, is_identity FROM sys_of_columns WHERE schema='dbo' "
+                                 "AND table_name=? COLLATE NOCASE ORDER BY ordinal", (table, )).fetchall()
         if rows:
             return [Column(name, Type(kind, size, scale), bool(identity)) for name, kind, size, scale, identity in rows]
         if table.startswith(("information_schema_", "sys_")):
@@ -152,8 +164,9 @@ class Database:
         return None
 
     def object_id(self, name):
-        table = re.sub(r"[\[\]]", "", name).split(".")[-1]
-        row = self.lite.execute("SELECT MIN(rowid) FROM sys_of_columns WHERE table_name=? COLLATE NOCASE", (table, ))
+        *schema, table = re.sub(r"[\[\]]", "", name).split(".")
+        row = self.lite.execute("SELECT MIN(rowid) FROM sys_of_columns WHERE table_name=? COLLATE NOCASE AND schema=?",
+                                (table, schema[-1] if schema else "dbo"))
         return row.fetchone()[0]
 
     def object_name(self, number):
@@ -161,7 +174,7 @@ class Database:
         return row and row[0]
 
     def column_name(self, table, ordinal):
-        row = self.lite.execute("SELECT name FROM sys_of_columns WHERE table_name=? AND ordinal=?",
+        row = self.lite.execute("SELECT name FROM sys_of_columns WHERE schema='dbo' AND table_name=? AND ordinal=?",
                                 (self.object_name(table), ordinal)).fetchone()
         return row and row[0]
 
@@ -169,22 +182,26 @@ class Database:
         if wanted.lower() != "isidentity":
             return None
         row = self.lite.execute(
-            "SELECT is_identity FROM sys_of_columns WHERE name=? COLLATE NOCASE AND table_name="
-            "(SELECT table_name FROM sys_of_columns WHERE rowid=?)", (column, table)).fetchone()
+            "SELECT is_identity FROM sys_of_columns WHERE name=? COLLATE NOCASE AND (table_name, schema)="
+            "(SELECT table_name, schema FROM sys_of_columns WHERE rowid=?)", (column, table)).fetchone()
         return row and row[0]
 
     def create_table(self, statement):
-        form = r"CREATE\s+TABLE\s+(?:dbo\.)?\[?(\w+)\]?\s*\((.*)\)\s*\Z"
-        name, body = re.match(form, statement, re.I | re.S).groups()
-        if self.columns(name):
+        """A table of another schema than "dbo" is only listed."""
+        form = r"CREATE\s+TABLE\s+(?:(\w+)\.)?\[?(\w+)\]?\s*\((.*)\)\s*\Z"
+        schema, name, body = re.match(form, statement, re.I | re.S).groups()
+        schema = schema or "dbo"
+        if schema == "dbo" and self.columns(name):
             raise ServerError(2714, "There is already an object named '%s' in the database." % name)
         lines, rows = [], []
         for ordinal, part in enumerate(re.split(r",(?![^(]*\))", body), 1):
             column, row = column_of(part.strip())
             lines.append(column)
-            rows.append((name, ordinal) + row)
+            rows.append((name, ordinal) + row + (schema, ))
+        self.lite.executemany("INSERT INTO sys_of_columns VALUES (?,?,?,?,?,?,?,?,?,?,?)", rows)
+        if schema != "dbo":
+            return
         self.lite.execute('CREATE TABLE "%s" (%s)' % (name, ", ".join(lines)))
-        self.lite.executemany("INSERT INTO sys_of_columns VALUES (?,?,?,?,?,?,?,?,?,?)", rows)
         for row in rows:
             if row[3] in ("timestamp", "rowversion"):
                 for event in ("INSERT", "UPDATE"):
@@ -195,7 +212,7 @@ class Database:
         name, declaration = re.match(r"ALTER\s+TABLE\s+\[?(\w+)\]?\s+ADD\s+(.*)", statement, re.I | re.S).groups()
         line, row = column_of(declaration.strip())
         self.lite.execute('ALTER TABLE "%s" ADD COLUMN %s' % (name, line))
-        self.lite.execute("INSERT INTO sys_of_columns SELECT MIN(table_name), MAX(ordinal)+1,?,?,?,?,?,?,?,? "
+        self.lite.execute("INSERT INTO sys_of_columns SELECT MIN(table_name), MAX(ordinal)+1,?,?,?,?,?,?,?,?,'dbo' "
                           "FROM sys_of_columns WHERE table_name=? COLLATE NOCASE", row + (name, ))
 
     def drop_table(self, name):
@@ -223,7 +240,7 @@ def column_of(declaration):
     if identity:
         line += "INTEGER PRIMARY KEY AUTOINCREMENT"
     else:
-        line += "TEXT COLLATE SERVER" if declared.is_text or kind in ("xml", "datetime") else \
+        line += "TEXT COLLATE SERVER" if declared.is_text or kind in ("xml", "datetime", "datetime2") else \
             "NUMERIC" if declared.is_number else "BLOB"
         line += " NOT NULL" if key or "NOT NULL" in rest else ""
         line += " PRIMARY KEY" if key else ""

@@ -242,6 +242,8 @@ class Session:
         verb, what = text.upper().split()[:2]
         if (verb, what) == ("CREATE", "DATABASE"):
             databases.create(self.server.folder, text.split()[2].strip("[]"))
+        elif (verb, what) == ("CREATE", "SCHEMA"):
+            pass
         elif (verb, what) == ("CREATE", "TABLE"):
             self.database.create_table(text)
         elif (verb, what) == ("ALTER", "TABLE"):

@@ -216,7 +216,7 @@ class Translator:
         """Puts the server's conversion around a text literal that meets a column of another kind."""
         if not isinstance(literal, exp.Column) or literal.name[:2] not in ("@s", "@u"):
             return
-        function = "as_datetime" if kind.name == "datetime" else "as_bit" if kind.name == "bit" else "as_number"
+        function = "as_" + kind.name if kind.is_date else "as_bit" if kind.name == "bit" else "as_number"
         if kind.is_text:
             if kind.is_national or literal.name[1] == "s":
                 return
@@ -236,7 +236,7 @@ class Translator:
                     raise ServerError(402, "The data types %s and varchar are incompatible in the %s operator." %
                                       (kind.name, node.key))
                 for side in sides:
-                    if kind.is_number or kind.name == "datetime":
+                    if kind.is_number or kind.is_date:
                         self.convert(side, kind)
 
     def convert_assigned(self, verb, table):

@@ -30,6 +30,10 @@ class Type(NamedTuple):
         return self.name in INTEGERS or self.name in ("float", "real", "money", "decimal", "numeric", "bit")
 
     @property
+    def is_date(self):
+        return self.name in ("datetime", "datetime2")
+
+    @property
     def is_comparable(self):
         return self.name not in ("text", "ntext", "image", "xml")
 
@@ -125,6 +129,8 @@ def declaration(kind, table):
         return b"\xad" + struct.pack("<H", 8)
     if name == "varbinary":
         return b"\xa5" + struct.pack("<H", 0xFFFF if size == -1 else size or 1)
+    if name == "datetime2":
+        return bytes([0x2A, 7 if size is None else size])
     return {"bit": b"\x68\x01", "float": b"\x6d\x08", "real": b"\x6d\x04", "money": b"\x6e\x08",
             "datetime": b"\x6f\x08", "xml": b"\xf1\x00"}[name]
 
@@ -165,9 +171,21 @@ def encoded(kind, value):
     if name in ("decimal", "numeric"):
         parts = round(decimal.Decimal(str(value)).scaleb(scale))
         return bytes([17, 0 if parts < 0 else 1]) + abs(parts).to_bytes(16, "little")
+    if name == "datetime2":
+        return finer_moment(7 if size is None else size, value)
     moment = datetime.datetime.fromisoformat(value)  # datetime, as it is stored
     ticks = round((moment - datetime.datetime.combine(moment.date(), datetime.time())).total_seconds() * 300)
     return struct.pack("<BiI", 8, (moment.date() - datetime.date(1900, 1, 1)).days, ticks)
+
+
+def finer_moment(digits, value):
+    """A datetime2: the time in parts of a second, then the day since the year 1."""
+    whole, _, fraction = value.partition(".")
+    moment = datetime.datetime.fromisoformat(whole)
+    seconds = moment.hour * 3600 + moment.minute * 60 + moment.second
+    parts = int(str(seconds) + fraction[:digits].ljust(digits, "0"))
+    length = 3 if digits <= 2 else 4 if digits <= 4 else 5
+    return bytes([length + 3]) + parts.to_bytes(length, "little") + (moment.toordinal() - 1).to_bytes(3, "little")
 
 
 def rows(columns, data):
