@@ -177,6 +177,21 @@ TEST_P(RecordsetOn, AColumnThatTheHostAddsMeanwhileCanBeChanged)
     EXPECT_EQ(lines.size(u"colour"_s), 10);
 }
 
+TEST_P(RecordsetOn, AMomentFinerThanAMillisecondTellsItsRow)
+{
+    const bool isEmbedded = GetParam() == On::Embedded;  // which compares whole seconds
+    const QString finest = GetParam() == On::Tds ? u"DATETIME2(7)"_s : u"DATETIME(6)"_s;
+    connection->execute(u"CREATE TABLE MOMENTS (what VARCHAR(20), day %1)"_s.arg(isEmbedded ? u"DATETIME"_s : finest));
+    elsewhere(u"INSERT INTO MOMENTS (what, day) VALUES ('a', '2026-02-28T13:05:59.123456')"_s);
+    Recordset moments = query(u"SELECT * FROM MOMENTS"_s);
+    moments.set(u"what"_s, u"b"_s);
+    EXPECT_EQ(failure([&] { moments.update(); }).number(), 0);
+    elsewhere(u"UPDATE MOMENTS SET day='2026-02-28T13:0%1'"_s.arg(isEmbedded ? u"6:00"_s : u"5:59.124"_s));
+    moments.set(u"what"_s, u"c"_s);
+    EXPECT_EQ(failure([&] { moments.update(); }).number(), RowChanged);
+    EXPECT_EQ(query(u"SELECT * FROM MOMENTS WHERE what='b'"_s).recordCount(), 1);
+}
+
 TEST_P(RecordsetOn, WithoutAKeyAllSelectedColumnsTellTheRow)
 {
     elsewhere(u"INSERT INTO TINTS (Code, Script) VALUES ('R', 'Red')"_s);

@@ -28,6 +28,8 @@ TableColumn columnOf(const QVariant* row)
     static const QStringList exactTypes{u"decimal"_s, u"numeric"_s, u"money"_s, u"smallmoney"_s};
     if (exactTypes.contains(type, Qt::CaseInsensitive) && !row[5].isNull())
         column.scale = row[5].toInt();
+    if (column.kind == Kind::Date && !row[6].isNull())
+        column.scale = row[6].toInt();
     return column;
 }
 
@@ -47,9 +49,10 @@ std::unique_ptr<TableInfo> tableOf(Engine& engine, const InformationSchemaTerms&
     auto info = std::make_unique<TableInfo>();
     info->name = name;
     const QString ofTable = u"TABLE_NAME="_s + engine.dialect().literal(name) + u" AND "_s + terms.ofDatabase;
-    const Answer columns = engine.run(
-        u"SELECT COLUMN_NAME, "_s + terms.type + u", CHARACTER_MAXIMUM_LENGTH, COLUMN_DEFAULT, "_s + terms.identity +
-        u", NUMERIC_SCALE FROM INFORMATION_SCHEMA.COLUMNS WHERE "_s + ofTable + u" ORDER BY ORDINAL_POSITION"_s);
+    const Answer columns =
+        engine.run(u"SELECT COLUMN_NAME, "_s + terms.type + u", CHARACTER_MAXIMUM_LENGTH, COLUMN_DEFAULT, "_s +
+                   terms.identity + u", NUMERIC_SCALE, DATETIME_PRECISION FROM INFORMATION_SCHEMA.COLUMNS WHERE "_s +
+                   ofTable + u" ORDER BY ORDINAL_POSITION"_s);
     for (size_t i = 0; i < columns.values.size(); i += size_t(columns.names.size()))
         info->columns.append(columnOf(&columns.values[i]));
     const Answer key = engine.run(

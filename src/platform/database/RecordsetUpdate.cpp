@@ -18,13 +18,24 @@ namespace {
                        "last read."_s);
 }
 
-/// Returns the condition that a column still has a value, or an empty text for a floating-point number, and for an
-/// exact number with more digits than a double holds.
+/// Returns the condition that a column still has a value. A moment was read without what is finer than a millisecond.
+QString holds(const Dialect& dialect, const ResultColumn& column, const QVariant& value)
+{
+    constexpr int digitsOfMilliseconds = 3;
+    if (column.kind != Kind::Date || column.scale <= digitsOfMilliseconds || value.typeId() != QMetaType::QDateTime)
+        return dialect.holds(column.name, column.kind, value);
+    const QString name = dialect.quoted(column.name);
+    return name + u">="_s + dialect.literal(value) + u" AND "_s + name + u'<' +
+           dialect.literal(value.toDateTime().addMSecs(1));
+}
+
+/// The same, but an empty text for a floating-point number, and for an exact number with more digits than a double
+/// holds.
 QString held(const Dialect& dialect, const ResultColumn& column, const QVariant& value)
 {
     constexpr double exactDigits = 1e15;
     if (column.kind != Kind::Number || (column.scale >= 0 && value.isNull()))
-        return dialect.holds(column.name, column.kind, value);
+        return holds(dialect, column, value);
     if (column.scale < 0 || value.typeId() != QMetaType::Double ||
         std::abs(value.toDouble()) * std::pow(10, column.scale) >= exactDigits)
         return {};
@@ -103,7 +114,7 @@ QString Recordset::Data::keyCondition(const TableInfo& table)
             conditions.clear();
             break;
         }
-        conditions.append(dialect().holds(columns[column].name, columns[column].kind, before(column)));
+        conditions.append(holds(dialect(), columns[column], before(column)));
     }
     if (conditions.isEmpty()) {
         for (int column = 0; column < columns.size(); ++column) {

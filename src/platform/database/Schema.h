@@ -14,7 +14,7 @@ struct TableColumn {
     QString name;
     Kind kind = Kind::Text;
     int size = 0;    // characters of a text; 0 means no limit
-    int scale = -1;  // digits after the point of an exact number; -1 for a floating-point number
+    int scale = -1;  // digits after the point, of an exact number or a date's second; -1 for a floating-point number
     bool identity = false;
     bool readOnly = false;  // computed, a version of the row, or a type that no statement compares or writes
     bool hasDefault = false;
