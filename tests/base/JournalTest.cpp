@@ -2,6 +2,7 @@
 #include "base/History.h"
 #include "base/Journal.h"
 #include "base/JournalRecord.h"
+#include "setup/PrepareDatabase.h"
 #include "support/Shop.h"
 
 struct JournalOfAShop : Shop {
@@ -25,11 +26,15 @@ struct JournalOfAShop : Shop {
     static int records() { return rowCount("KESTOperation") + rowCount("KESTJournal"); }
 };
 
-/// Hides one of the two tables, on a server that keeps them for the next test.
+/// Removes one of the two tables, and creates both anew on a server that keeps them for the next test.
 class NoJournalTable {
 public:
-    NoJournalTable() { gConn->execute(u"ALTER TABLE KESTJournal RENAME TO KESTHidden"_s); }
-    ~NoJournalTable() { gConn->execute(u"ALTER TABLE KESTHidden RENAME TO KESTJournal"_s); }
+    NoJournalTable() { gConn->execute(u"DROP TABLE KESTJournal"_s); }
+    ~NoJournalTable()
+    {
+        gConn->execute(u"DROP TABLE KESTOperation"_s);
+        app::createParts(gConn, app::missingParts(gConn));
+    }
     Q_DISABLE_COPY_MOVE(NoJournalTable)
 };
 
@@ -105,21 +110,20 @@ TEST_F(JournalOfAShop, IsNotNeededForALoad)
 
 TEST_F(JournalOfAShop, ForgetsOldOperationsSomeRowsAtATimeButNoOpenOne)
 {
-    const auto operation = [](int number, const char* state, int daysAgo) {
-        gConn->execute(sql(
-            "INSERT INTO KESTOperation (Operation, OperationKind, State, StartedAt) VALUES ({}, 'load', '{}', '{}')",
-            number, QString::fromLatin1(state),
-            QDateTime::currentDateTime().addDays(-daysAgo).toString(u"yyyy-MM-ddTHH:mm:ss"_s)));
+    const auto operation = [](const char* state, int daysAgo) {  // the server numbers them from 1
+        gConn->execute(sql("INSERT INTO KESTOperation (OperationKind, State, StartedAt) VALUES ('load', '{}', '{}')",
+                           QString::fromLatin1(state),
+                           QDateTime::currentDateTime().addDays(-daysAgo).toString(u"yyyy-MM-ddTHH:mm:ss"_s)));
     };
-    operation(1, "open", 200);
-    operation(2, "done", 100);
-    operation(3, "failed", 91);
-    operation(4, "done", 89);
-    operation(5, "unfinished", 200);
-    QStringList records;
-    for (int i = 0; i < 1200; ++i)
-        records += u"(%1, 'T', 0)"_s.arg(i < 1100 ? 3 : 4);
-    gConn->execute(u"INSERT INTO KESTJournal (Operation, TableName, Settled) VALUES "_s + records.join(u','));
+    operation("open", 200);
+    operation("done", 100);
+    operation("failed", 91);
+    operation("done", 89);
+    operation("unfinished", 200);
+    for (const auto& [number, count] : {std::pair(3, 600), {3, 500}, {4, 100}}) {
+        const QStringList records(count, u"(%1, 'T', 0)"_s.arg(number));
+        gConn->execute(u"INSERT INTO KESTJournal (Operation, TableName, Settled) VALUES "_s + records.join(u','));
+    }
 
     journal::prune();
     EXPECT_EQ(rowCount("KESTOperation", "Operation IN (1, 3, 4, 5)"), 4);

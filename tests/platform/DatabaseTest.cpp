@@ -21,7 +21,7 @@ TEST_P(Database, AComparisonMeansTheSameOnEveryEngine)
 {
     insert(u"CODE, SEQ, flag, amount"_s, u"'Red', 0, 1, 2.5"_s);
     insert(u"CODE, SEQ, flag, amount"_s, u"'red  ', 5, 0, 0"_s);
-    insert(u"CODE, SEQ, day"_s, u"'50% [off]', NULL, '2026-02-28 00:00:00'"_s);
+    insert(u"CODE, SEQ, day"_s, u"'50% [off]', NULL, "_s + stored(u"2026-02-28"_s, u"00:00:00"_s));
     insert(u"CODE, SEQ"_s, u"'ÖL', 10"_s);
     insert(u"CODE, SEQ"_s, u"'', 7"_s);
     for (const QStringList& row : rowsIn("comparisons.txt"))

@@ -20,6 +20,11 @@ protected:
     db::ConnectionPtr connect() const;
     db::Recordset query(const QString& select) const;
     int count(const QString& condition) const;
+    /// Returns a date as a literal that a statement can store: as in the embedded file, or with a "T" for servers.
+    static QString stored(const QString& day, const QString& time)
+    {
+        return u'\'' + day + (GetParam() == On::Embedded ? u' ' : u'T') + time + u'\'';
+    }
     TestProfile profile;
     QString connectionText;
     db::ConnectionPtr connection;

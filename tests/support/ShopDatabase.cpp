@@ -3,6 +3,7 @@
 #include "base/ModRegistry.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
+#include "setup/PrepareDatabase.h"
 #include "setup/QuoteDatabase.h"
 #include "support/MariaDbServer.h"
 #include "support/TdsServer.h"
@@ -121,6 +122,7 @@ public:
                                    TdsServer::schemaOf(app::schemaStatements(app::Dialect::MariaDb).join(u";\n"_s)));
         administrator->open(tdsServer().connectionText(fresh));
         fillShop(*administrator);
+        app::createParts(administrator, app::missingParts(administrator));
     }
 
     void copy(const QString& from, const QString& to) override
