@@ -53,7 +53,7 @@ bool standOnRow(db::Recordset& rows, LineChange change, qint64 number)
         case LineChange::Delete:
             break;
     }
-    rows.find(sql("SEQ_NO='{}'", number));
+    rows.find(u"SEQ_NO"_s, number);
     if (rows.eof())
         return false;
     if (change == LineChange::Delete)

@@ -51,7 +51,7 @@ std::span<const CodeRange> codesOf(const QString& category)
 bool isTaken(db::Recordset& rows, const QString& code)
 {
     rows.moveFirst();
-    rows.find(sql("itemno = '{}'", code));
+    rows.find(u"itemno"_s, code);
     return !rows.eof();
 }
 

@@ -2,7 +2,6 @@
 
 #include "base/modLoggerEx.h"
 #include "platform/RuntimeError.h"
-#include "platform/database/Sql.h"
 #include "platform/values.h"
 #include "quotedata/Quote.h"
 #include "quotedata/Rounding.h"
@@ -36,7 +35,7 @@ bool counts(db::Recordset& lines)
     const qint64 id = toLong(lines.value(u"itemid"_s));
     const int position = lines.absolutePosition();
     lines.moveFirst();
-    lines.find(sql("deleteditem = {}", id));
+    lines.find(u"deleteditem"_s, id);
     const bool replaced = !lines.eof();
     lines.setAbsolutePosition(position);
     const QVariant deleted = lines.value(u"delitem"_s);

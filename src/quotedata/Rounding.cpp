@@ -31,6 +31,12 @@ double RoundAmount(double& value, int places)
 
 double RoundDown(const double& value)
 {
+    // the text has 15 digits, so for an amount that is not too close to a whole number it tells nothing else
+    constexpr double mostExact = 1e9;
+    constexpr double tooClose = 1e-5;
+    const double whole = std::trunc(value);
+    if (std::abs(value) < mostExact && (value == whole || std::abs(value - std::round(value)) > tooClose))
+        return whole;
     try {
         const QString text = numberText(value);
         if (text.contains(u'E'))  // so large that it has no fraction, or so small that it has only a fraction

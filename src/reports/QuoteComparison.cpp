@@ -360,7 +360,7 @@ bool findLine(db::Recordset& lines, const QString& number)
     if (isBlank(number) || lines.recordCount() == 0)
         return false;
     lines.moveFirst();
-    lines.find(sql("SEQ_NO='{}'", number));
+    lines.find(u"SEQ_NO"_s, number);
     return !lines.eof();
 }
 

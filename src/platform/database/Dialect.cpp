@@ -14,6 +14,8 @@ using namespace Qt::StringLiterals;
 
 QString Dialect::quoted(const QString& identifier) const
 {
+    if (!identifier.contains(closeQuote))
+        return openQuote + identifier + closeQuote;
     QString inner = identifier;
     inner.replace(closeQuote, QString(2, closeQuote));
     return openQuote + inner + closeQuote;

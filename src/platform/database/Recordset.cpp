@@ -234,6 +234,34 @@ void Recordset::moveLast()
     data->position = recordCount() - 1;
 }
 
+/// Makes the next row whose column has that key the current row. Without a key, no row matches.
+void Recordset::Data::findKey(int column, const std::optional<QString>& key)
+{
+    const auto from = visible.begin() + std::clamp<qsizetype>(position, 0, qsizetype(visible.size()));
+    static const Bucket noRows;
+    auto hit = visible.end();
+    if (key && from != visible.end()) {
+        const Index& index = indexOf(column);
+        const auto found = index.constFind(*key);
+        const Bucket& bucket = found == index.constEnd() ? noRows : *found;
+        for (auto row = std::lower_bound(bucket.begin(), bucket.end(), *from);
+             row != bucket.end() && hit == visible.end(); ++row) {
+            const auto place = std::lower_bound(from, visible.end(), *row);
+            if (place != visible.end() && *place == *row)
+                hit = place;
+        }
+    }
+    position = int(hit - visible.begin());
+}
+
+void Recordset::find(const QString& column, const QVariant& value)
+{
+    update();
+    data->requireOpen();
+    const int number = data->columnNumber(column);
+    data->findKey(number, equalityKey(value, data->columns[number].kind));
+}
+
 void Recordset::find(const QString& text)
 {
     update();
@@ -243,28 +271,13 @@ void Recordset::find(const QString& text)
         throw RuntimeError(StatementFailed, u"A search takes one condition: "_s + text);
     const Criterion& criterion = criteria.first();
     const int column = data->columnNumber(criterion.column);
-    const Kind columnKind = data->columns[column].kind;
+    const Kind kind = data->columns[column].kind;
+    if (criterion.comparison == Criterion::Comparison::Equal && criterion.operand)
+        return data->findKey(column, equalityKey(*criterion.operand, kind));
     const std::vector<int>& visible = data->visible;
     const auto from = visible.begin() + std::clamp<qsizetype>(data->position, 0, qsizetype(visible.size()));
-    auto hit = visible.end();
-    if (criterion.comparison == Criterion::Comparison::Equal && criterion.operand) {
-        const std::optional<QString> key = equalityKey(*criterion.operand, columnKind);
-        if (key && from != visible.end()) {
-            static const Bucket noRows;
-            const Index& index = data->indexOf(column);
-            const auto found = index.constFind(*key);
-            const Bucket& bucket = found == index.constEnd() ? noRows : *found;
-            for (auto row = std::lower_bound(bucket.begin(), bucket.end(), *from);
-                 row != bucket.end() && hit == visible.end(); ++row) {
-                const auto place = std::lower_bound(from, visible.end(), *row);
-                if (place != visible.end() && *place == *row)
-                    hit = place;
-            }
-        }
-    } else {
-        hit = std::find_if(from, visible.end(),
-                           [&](int row) { return criterion.matches(data->at(row, column), columnKind); });
-    }
+    const auto hit =
+        std::find_if(from, visible.end(), [&](int row) { return criterion.matches(data->at(row, column), kind); });
     data->position = int(hit - visible.begin());
 }
 
@@ -321,7 +334,7 @@ QStringList Recordset::columns() const
 
 bool Recordset::hasColumn(const QString& column) const
 {
-    return data->columnNumbers.contains(column.toLower());
+    return data->columnNumbers.contains(column) || data->columnNumbers.contains(column.toLower());
 }
 
 Kind Recordset::kind(const QString& column) const

@@ -60,6 +60,8 @@ public:
     /// is empty, eof() becomes true. A criterion is `column='text'` or `column=number`, with = <> < <= > >= or LIKE. A
     /// search for equality uses an index.
     void find(const QString& criterion);
+    /// The same for a column that equals a value, which needs no criterion. Nothing equals Null.
+    void find(const QString& column, const QVariant& value);
     /// Shows only the rows that match all conditions, which are joined by AND. An empty text shows all rows. The first
     /// row becomes current.
     void setFilter(const QString& criterion);

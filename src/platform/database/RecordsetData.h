@@ -9,6 +9,7 @@
 
 #include <QHash>
 
+#include <optional>
 #include <vector>
 
 namespace kest::db {
@@ -63,7 +64,9 @@ struct Recordset::Data {
 
     int columnNumber(const QString& name) const
     {
-        const auto found = columnNumbers.constFind(name.toLower());
+        auto found = columnNumbers.constFind(name);
+        if (found == columnNumbers.constEnd())
+            found = columnNumbers.constFind(name.toLower());
         if (found == columnNumbers.constEnd())
             throw RuntimeError(NoSuchColumn,
                                QStringLiteral("Item cannot be found in the collection corresponding to the "
@@ -89,6 +92,7 @@ struct Recordset::Data {
     bool isShown(int row);
 
     const Index& indexOf(int column);
+    void findKey(int column, const std::optional<QString>& key);
     void store(int row, int column, const QVariant& value);
     void beginChange();
     void forgetChange();

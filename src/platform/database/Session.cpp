@@ -76,8 +76,10 @@ void setStatementFault(std::function<bool()> fault, int number)
 QHash<QString, int> columnNumbers(const QList<ResultColumn>& columns)
 {
     QHash<QString, int> numbers;
-    for (int i = int(columns.size()) - 1; i >= 0; --i)
+    for (int i = int(columns.size()) - 1; i >= 0; --i) {
+        numbers.insert(columns[i].name, i);
         numbers.insert(columns[i].name.toLower(), i);
+    }
     return numbers;
 }
 

@@ -26,7 +26,8 @@ struct ResultColumn {
     int scale = -1;  // as in TableColumn
 };
 
-/// Returns the numbers of columns by their names in lower case; of two with the same name that of the first.
+/// Returns the numbers of columns by their names, as they are and in lower case. If several have the same name, it is
+/// that of the first.
 QHash<QString, int> columnNumbers(const QList<ResultColumn>& columns);
 
 /// A completely fetched result, one row after the other.
