@@ -104,10 +104,10 @@ Session::Known& Session::known(const Shape& shape)
     const auto found = knownShapes.find(shape.text);
     if (found != knownShapes.end())
         return *found;
-    Known fresh{translated(shape, dialect(), *this), {}, {}, false, {}};
+    const Known fresh{translated(shape, dialect(), *this), {}, {}, false, {}};
     if (knownShapes.size() >= mostShapes)
         knownShapes.clear();
-    return *knownShapes.insert(shape.text, std::move(fresh));
+    return *knownShapes.insert(shape.text, fresh);
 }
 
 /// Describes the columns of a result. A column that the statement does not show, or shows differently, is read-only.
