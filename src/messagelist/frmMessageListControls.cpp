@@ -22,6 +22,9 @@
 #include <QTreeView>
 #include <QVBoxLayout>
 
+#include <algorithm>
+#include <numeric>
+
 using namespace Qt::StringLiterals;
 
 namespace kest {
@@ -164,18 +167,28 @@ void frmMessageList::arrange()
     fitColumns(2 * margin + ListView1->verticalScrollBar()->sizeHint().width() + 2 * ListView1->frameWidth());
 }
 
-// On a screen that is too narrow for the columns, all of them get narrower: a long text has a tool tip.
+// On a screen that is too narrow for the columns, all of them get narrower, the widest ones most: a long text has a
+// tool tip. `around` is what the window needs beside them.
 void frmMessageList::fitColumns(int around)
 {
     int all = 0;
     for (const int column : columnWidths)
         all += desktop::pixels(column);
     const QSize opening = QSize(all + around, desktop::pixels(openingHeight)).boundedTo(screen()->availableSize());
+    const int room = opening.width() - around;
     QHeaderView* header = ListView1->header();
+    int longestCaption = header->minimumSectionSize();
+    QList<int> widths;
     for (int i = 0; i < header->count(); ++i) {
-        const int share = desktop::pixels(columnWidths[static_cast<size_t>(i)]) * (opening.width() - around) / all;
-        header->resizeSection(i, qMax(share, header->sectionSizeHint(i)));
+        longestCaption = qMax(longestCaption, header->sectionSizeHint(i));
+        widths.append(qMax(desktop::pixels(columnWidths[static_cast<size_t>(i)]) * room / all,
+                           qMax(header->sectionSizeHint(i), header->minimumSectionSize())));
     }
+    for (int excess = std::accumulate(widths.begin(), widths.end(), 0) - room; excess > 0; --excess)
+        if (const auto widest = std::ranges::max_element(widths); *widest > longestCaption)
+            --*widest;
+    for (int i = 0; i < header->count(); ++i)
+        header->resizeSection(i, widths[i]);
     resize(opening);
 }
 

@@ -6,6 +6,7 @@ print what the document shows; "..." stands for any lines, or for the rest of a 
 shop of its own and must be a command that exists, with arguments that it takes. A block of JSON is written to the file
 that the text before it names. The box of the demo's damaged message is left out, as automation.md says.
 """
+import os
 import pathlib
 import re
 import shutil
@@ -51,7 +52,7 @@ def commands(lines):
 
 def run(command, shop, folder):
     environment = {"PATH": f"{folder}/bin:/usr/bin:/bin", "HOME": str(folder), "KEST2_PROFILE": str(shop),
-                   "LC_ALL": "C.UTF-8"}
+                   "LC_ALL": "C.UTF-8", "LSAN_OPTIONS": os.environ.get("LSAN_OPTIONS", "")}
     done = subprocess.run(["bash", "-c", command], cwd=folder, env=environment, input="secret\n", text=True,
                           stdout=subprocess.PIPE, stderr=subprocess.STDOUT, timeout=120)
     return done.returncode, [line for line in done.stdout.splitlines() if not line.startswith(DAMAGED)]
