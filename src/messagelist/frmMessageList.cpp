@@ -408,6 +408,12 @@ bool frmMessageList::select(const QString& file)
     return true;
 }
 
+void frmMessageList::resizeEvent(QResizeEvent* event)
+{
+    Form::resizeEvent(event);
+    fitColumns();
+}
+
 // The sort order of the last session is restored when the window is shown, so the first row is known only now.
 void frmMessageList::showEvent(QShowEvent* event)
 {

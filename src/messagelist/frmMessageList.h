@@ -61,6 +61,7 @@ public:
 
 protected:
     void showEvent(QShowEvent* event) override;
+    void resizeEvent(QResizeEvent* event) override;
     void dragEnterEvent(QDragEnterEvent* event) override;
     void dragLeaveEvent(QDragLeaveEvent* event) override;
     void dropEvent(QDropEvent* event) override;
@@ -83,7 +84,7 @@ private:
     QRadioButton* optionOf(MessageFolder folder) const { return Option1[static_cast<size_t>(folder)]; }
     void buildControls();
     void arrange();
-    void fitColumns(int around);
+    void fitColumns();
     void connectControls();
     void fill();
     QString status() const;
@@ -113,6 +114,9 @@ private:
     QPushButton* Command6;
     QPushButton* cmdExit;
     QTimer* tmrRefresh;
+
+    int around = 0;            // pixels that the window needs beside the columns
+    QList<int> fittedColumns;  // their widths, as long as the user has chosen no others
 
     QString sCurFile;  // the file clicked last
     MessageFolder iFolder = MessageFolder::Unread;

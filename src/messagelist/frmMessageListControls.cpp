@@ -164,32 +164,44 @@ void frmMessageList::arrange()
         setTabOrder(order[i - 1], order[i]);
     ListView1->setFocus();
 
-    fitColumns(2 * margin + ListView1->verticalScrollBar()->sizeHint().width() + 2 * ListView1->frameWidth());
+    around = 2 * margin + ListView1->verticalScrollBar()->sizeHint().width() + 2 * ListView1->frameWidth();
+    int width = around;
+    for (const int column : columnWidths)
+        width += desktop::pixels(column);
+    resize(QSize(width, desktop::pixels(openingHeight)).boundedTo(screen()->availableSize()));
+    fitColumns();
 }
 
-// On a screen that is too narrow for the columns, all of them get narrower, the widest ones most: a long text has a
-// tool tip. `around` is what the window needs beside them.
-void frmMessageList::fitColumns(int around)
+// In a window that is too narrow for the columns, all of them get narrower, the widest ones most: a long text has a
+// tool tip. Columns whose width the user has chosen stay.
+void frmMessageList::fitColumns()
 {
-    int all = 0;
-    for (const int column : columnWidths)
-        all += desktop::pixels(column);
-    const QSize opening = QSize(all + around, desktop::pixels(openingHeight)).boundedTo(screen()->availableSize());
-    const int room = opening.width() - around;
     QHeaderView* header = ListView1->header();
-    int longestCaption = header->minimumSectionSize();
+    const auto sizes = [header] {
+        QList<int> all;
+        for (int i = 0; i + 1 < header->count(); ++i)  // the last one takes the space that is left
+            all.append(header->sectionSize(i));
+        return all;
+    };
+    if (!fittedColumns.isEmpty() && sizes() != fittedColumns)
+        return;
     QList<int> widths;
+    for (const int column : columnWidths)
+        widths.append(desktop::pixels(column));
+    const int all = std::accumulate(widths.begin(), widths.end(), 0);
+    const int room = qMin(width() - around, all);
+    int longestCaption = header->minimumSectionSize();
     for (int i = 0; i < header->count(); ++i) {
-        longestCaption = qMax(longestCaption, header->sectionSizeHint(i));
-        widths.append(qMax(desktop::pixels(columnWidths[static_cast<size_t>(i)]) * room / all,
-                           qMax(header->sectionSizeHint(i), header->minimumSectionSize())));
+        const int caption = qMax(header->sectionSizeHint(i), header->minimumSectionSize());
+        longestCaption = qMax(longestCaption, caption);
+        widths[i] = qMax(widths[i] * room / all, caption);
     }
     for (int excess = std::accumulate(widths.begin(), widths.end(), 0) - room; excess > 0; --excess)
         if (const auto widest = std::ranges::max_element(widths); *widest > longestCaption)
             --*widest;
     for (int i = 0; i < header->count(); ++i)
         header->resizeSection(i, widths[i]);
-    resize(opening);
+    fittedColumns = sizes();
 }
 
 void frmMessageList::connectControls()

@@ -36,18 +36,23 @@ TEST_F(Handling, TheNameTellsWhenAFileArrived)
     });
 }
 
-TEST_F(Handling, AllColumnsAreInViewOnANarrowScreen)
+TEST_F(Handling, TheColumnsFitTheWindowUntilTheUserChoosesTheirWidth)
 {
-    const QFont usual = QApplication::font();
-    QFont small = usual;
-    small.setPointSizeF(usual.pointSizeF() * 0.75);  // the screen of the tests is narrower than those of today
-    QApplication::setFont(small);
     work([](QDialog& window) {
-        gestures::settle();
-        EXPECT_EQ(window.width(), window.screen()->availableSize().width());
-        EXPECT_EQ(control<QTreeView>(window, "ListView1").horizontalScrollBar()->maximum(), 0);
+        auto& list = control<QTreeView>(window, "ListView1");
+        const auto widthAt = [&](int width) {
+            window.resize(width, 500);
+            gestures::settle();
+            EXPECT_EQ(list.horizontalScrollBar()->maximum(), 0) << width;
+            return list.header()->sectionSize(1);
+        };
+        const int usual = widthAt(1500);
+        EXPECT_EQ(usual, desktop::pixels(3969));
+        EXPECT_LT(widthAt(1000), usual);
+        EXPECT_EQ(widthAt(1700), usual);
+        list.header()->resizeSection(1, 333);
+        EXPECT_EQ(widthAt(1600), 333);
     });
-    QApplication::setFont(usual);
 }
 
 TEST_F(Handling, NothingMovesWhenTheFilterAppears)
