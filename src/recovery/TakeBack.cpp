@@ -137,56 +137,75 @@ QSet<QString> quotesInUse(const QList<RowHistory>& rows)
     return inUse;
 }
 
-/// Goes through the rows that `undo` takes back. Returns a sentence for each that it refuses.
+/// Goes through the rows that an operation would be taken back in. Returns a sentence for each that `undo` refuses.
 template <class Undo>
-QStringList refused(qint64 operation, Undo&& undo)
+QStringList refused(const QList<RowHistory>& rows, const QSet<QString>& inUse, Undo&& undo)
 {
-    const QList<RowHistory> rows = rowsOf(operation);
-    const QSet<QString> inUse = quotesInUse(rows);
     QStringList left;
-    for (const QString& quote : inUse)
-        left.append(u"Quote %1 has lines, notes or an invoice from elsewhere and stays."_s.arg(quote));
     for (const RowHistory& row : rows)
         if (!stays(row) && !inUse.contains(row.quote()) && !undo(row))
             left.append(nameOf(row.net) + u" was changed by someone else and stays as it is."_s);
     return left;
 }
 
-/// Throws RowChanged if another workstation has taken the row back meanwhile.
-void markTakenBack(const RowHistory& row)
+QStringList sentencesOf(const QSet<QString>& quotesInUse)
 {
-    QStringList entries;
-    for (const qint64 entry : row.entries)
-        entries.append(sql("Entry={}", entry));
-    const qint64 hit =
-        gConn->execute(sql("UPDATE KESTJournal SET Settled=1 WHERE Settled=0 AND (") + entries.join(u" OR "_s) + u')');
-    if (hit != row.entries.size())
+    QStringList left;
+    for (const QString& quote : quotesInUse)
+        left.append(u"Quote %1 has lines, notes or an invoice from elsewhere and stays."_s.arg(quote));
+    return left;
+}
+
+/// Throws RowChanged if another workstation has taken one of the rows back meanwhile.
+void markTakenBack(const QList<qint64>& entries)
+{
+    if (entries.isEmpty())
+        return;
+    QStringList numbers;
+    for (const qint64 entry : entries)
+        numbers.append(sql("{}", entry));
+    const qint64 hit = gConn->execute(sql("UPDATE KESTJournal SET Settled=1 WHERE Settled=0 AND Entry IN (") +
+                                      numbers.join(u", "_s) + u')');
+    if (hit != entries.size())
         throw RuntimeError(RowChanged, u"Another workstation is taking this work back."_s);
 }
 
-bool undone(const RowHistory& row)
+/// Takes some rows back in one transaction, because each commit waits for the disk.
+QStringList takeBackTogether(const QList<RowHistory>& rows, const QSet<QString>& inUse)
 {
-    if (row.isNew() && row.isOf("QUOTE1"_L1) && hasMore(row, 0, 0))
-        return false;
-    try {
-        return db::takeBack(*gConn, row.net, [&] { markTakenBack(row); });
-    } catch (const RuntimeError& error) {
-        if (error.sqlState().startsWith("23"_L1))  // another row has its key meanwhile
+    db::TakeBack together(*gConn);
+    QList<qint64> taken;
+    const QStringList left = refused(rows, inUse, [&](const RowHistory& row) {
+        const bool isNewQuote = row.isNew() && row.isOf("QUOTE1"_L1);
+        if ((isNewQuote && hasMore(row, 0, 0)) || !together.undo(row.net))
             return false;
-        throw;
-    }
+        taken += row.entries;
+        return true;
+    });
+    markTakenBack(taken);
+    together.commit();
+    return left;
 }
 
 }  // namespace
 
 QStringList takeBack(qint64 operation)
 {
-    return refused(operation, undone);
+    constexpr qsizetype together = 100;  // rows
+    const QList<RowHistory> rows = rowsOf(operation);
+    const QSet<QString> inUse = quotesInUse(rows);
+    QStringList left = sentencesOf(inUse);
+    for (qsizetype first = 0; first < rows.size(); first += together)
+        left += takeBackTogether(rows.mid(first, together), inUse);
+    return left;
 }
 
 QStringList obstaclesTo(qint64 operation)
 {
-    return refused(operation, [](const RowHistory& row) { return db::stillHolds(*gConn, row.net); });
+    const QList<RowHistory> rows = rowsOf(operation);
+    const QSet<QString> inUse = quotesInUse(rows);
+    return sentencesOf(inUse) +
+           refused(rows, inUse, [](const RowHistory& row) { return db::stillHolds(*gConn, row.net); });
 }
 
 }  // namespace kest::recovery

@@ -5,8 +5,8 @@
 
 namespace kest::recovery {
 
-/// Takes the changes of an operation back, the newest row first. A row goes back whole, in a transaction of its own,
-/// and only if it still holds what the operation wrote last. New cars, customers and vendors and the counter of quotes
+/// Takes the changes of an operation back, the newest row first, some rows in a transaction. A row goes back whole, and
+/// only if it still holds what the operation wrote last. New cars, customers and vendors and the counter of quotes
 /// stay, because other loads may use them. A new quote that has lines, notes or an invoice from elsewhere stays with
 /// all its rows. Can be interrupted and run again. Returns what could not be taken back, a sentence each.
 QStringList takeBack(qint64 operation);

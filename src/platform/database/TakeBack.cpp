@@ -150,27 +150,38 @@ bool stillHolds(Connection& connection, const RowChange& change)
     return table && holds(*table, change, session.selectLocked(*table, rowCondition(session.dialect(), change)));
 }
 
-bool takeBack(Connection& connection, const RowChange& change, const std::function<void()>& record)
+TakeBack::TakeBack(Connection& connection) : connection_(connection)
 {
-    Session& session = connection.session();
-    const TableInfo* table = session.table(change.table);
-    if (!table)
+    connection_.session().begin();
+    connection_.setInChange(true);
+}
+
+TakeBack::~TakeBack()
+{
+    connection_.setInChange(false);
+    if (isOpen_ && connection_.state() == 1)
+        attempt([&] { connection_.session().rollback(); });
+}
+
+bool TakeBack::undo(const RowChange& change)
+{
+    if (!stillHolds(connection_, change))
         return false;
-    session.begin();
-    connection.setInChange(true);  // so that neither this nor the record is observed
-    bool isCommitted = false;
-    const auto end = qScopeGuard([&] {
-        connection.setInChange(false);
-        if (!isCommitted && connection.state() == 1)
-            attempt([&] { session.rollback(); });
-    });
-    if (!stillHolds(connection, change))
-        return false;
-    restore(session, *table, change);
-    record();
-    session.commit();
-    isCommitted = true;
-    return true;
+    Session& session = connection_.session();
+    try {
+        restore(session, *session.table(change.table), change);
+        return true;
+    } catch (const RuntimeError& error) {
+        if (error.sqlState().startsWith("23"_L1))
+            return false;
+        throw;
+    }
+}
+
+void TakeBack::commit()
+{
+    connection_.session().commit();
+    isOpen_ = false;
 }
 
 }  // namespace kest::db
