@@ -1,10 +1,7 @@
 // Tests documents: which texts are refused with which code, what nodes return, and how documents are written.
 #include "platform/xml/xml.h"
+#include "support/Cost.h"
 #include "support/Test.h"
-
-#include <malloc.h>
-
-#include <ctime>
 
 using namespace kest::xml;
 
@@ -14,6 +11,8 @@ static QString outcome(const QString& text)
     const bool loaded = document.loadXML(text);
     const quint32 code = document.parseError().errorCode;
     EXPECT_EQ(loaded, code == 0) << text.left(80);
+    if (loaded)
+        document.documentElement().text();  // its cost counts, too
     EXPECT_EQ(document.documentElement().isNull(), code != 0) << text.left(80);
     if (code == 0)
         return u"fine"_s;
@@ -50,44 +49,10 @@ static QString megabyteOf(const QString& piece)
     return piece.repeated(1'000'000 / piece.size());
 }
 
-#if defined(__SANITIZE_ADDRESS__)
-constexpr bool memoryIsReal = false;  // the sanitizer keeps released memory
-constexpr double slowness = 10;
-#elif defined(__OPTIMIZE__)
-constexpr bool memoryIsReal = true;
-constexpr double slowness = 1;
-#else
-constexpr bool memoryIsReal = true;
-constexpr double slowness = 3;
-#endif
-
-struct Cost {
-    double milliseconds = 0;
-    double megabytes = 0;
-};
-
-/// Returns the most memory that this process has used since the last reset, in megabytes.
-static double peakMemory(bool reset)
-{
-    if (reset) {
-        QFile references(u"/proc/self/clear_refs"_s);
-        EXPECT_TRUE(references.open(QFile::WriteOnly) && references.write("5") == 1);
-    }
-    QFile status(u"/proc/self/status"_s);
-    EXPECT_TRUE(status.open(QFile::ReadOnly));
-    const QByteArray all = status.readAll();
-    const qsizetype at = all.indexOf("VmHWM:") + 6;
-    return all.sliced(at, all.indexOf(" kB", at) - at).trimmed().toDouble() / 1024;
-}
-
-/// Returns the memory that a parse uses in addition to the text, in megabytes.
+/// Returns the time of a parse, and the memory that it uses in addition to the text.
 static Cost costOf(const QString& text, const QString& expected)
 {
-    ::malloc_trim(0);
-    const double before = peakMemory(true);
-    const std::clock_t start = std::clock();
-    EXPECT_EQ(outcome(text), expected) << text.left(80);
-    return {1000.0 * double(std::clock() - start) / CLOCKS_PER_SEC, peakMemory(false) - before};
+    return costOf([&] { EXPECT_EQ(outcome(text), expected) << text.left(80); });
 }
 
 static QString nested(int depth)

@@ -70,7 +70,7 @@ QString textOfNode(const xmlNode* node)
         const bool isText = at->type == XML_CDATA_SECTION_NODE || (at->type == XML_TEXT_NODE && !isBlankText(at)) ||
                             (at->type == XML_TEXT_NODE && node->type == XML_ATTRIBUTE_NODE);
         if (isText)
-            text = text.isEmpty() ? fromXml(at->content) : text + fromXml(at->content);
+            text += fromXml(at->content);
         if (at->type == XML_ELEMENT_NODE && at->children) {
             at = at->children;
             continue;
@@ -174,7 +174,8 @@ void Node::setText(const QString& text)
 
 QString Node::xml() const
 {
-    return serialized(*document, required());
+    const xmlNode* const self = required();
+    return serialized(*document, self);
 }
 
 QList<Attribute> Node::attributes() const
@@ -196,7 +197,8 @@ Node Node::firstChild() const
 
 Node Node::nextSibling() const
 {
-    return document->wrap(counting(required()->next));
+    const xmlNodePtr next = required()->next;
+    return document->wrap(counting(next));
 }
 
 QList<Node> Node::childNodes() const
@@ -230,12 +232,14 @@ void Node::removeChild(Node child) const
 
 Node Node::selectSingleNode(const QString& path) const
 {
-    return document->selectFirst(required(), path);
+    const xmlNodePtr from = required();  // first, because a null node has no document
+    return document->selectFirst(from, path);
 }
 
 QList<Node> Node::selectNodes(const QString& path) const
 {
-    return document->select(required(), path);
+    const xmlNodePtr from = required();
+    return document->select(from, path);
 }
 
 QString Node::textOf(const QString& path) const
