@@ -96,9 +96,9 @@ TEST_F(Registry, TheFileIsItsOwnersAlone)
 
 TEST_F(Registry, AFileThatIsNoneIsKept)
 {
-    for (const QByteArray& damaged :
-         {QByteArray(), QByteArray("\n\n"), QByteArray("<html></html>"), QByteArray("a=text:b\n"),
-          "[HKEY_LOCAL_MACHINE\\SOFTWARE]\na=text:b\n" + QByteArray(4096, '\0')}) {
+    for (const QByteArray& damaged : {QByteArray(), QByteArray("\n\n"), QByteArray("<html></html>"),
+                                      QByteArray("a=text:b\n"), QByteArray("[Desktop Entry]\nName=text:b\n"),
+                                      "[HKEY_LOCAL_MACHINE\\SOFTWARE]\na=text:b\n" + QByteArray(4096, '\0')}) {
         files::writeBytes(file(), damaged);
         EXPECT_EQ(test::failureOf([] { check(); }), FileInputOutput) << damaged.left(20).toStdString();
         EXPECT_FALSE(createKey(Hive::LocalMachine, key));

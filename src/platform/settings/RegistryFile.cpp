@@ -1,5 +1,6 @@
 #include "platform/settings/RegistryFile.h"
 
+#include <algorithm>
 #include <utility>
 
 using namespace Qt::StringLiterals;
@@ -9,6 +10,8 @@ namespace kest::settings {
 namespace {
 
 constexpr auto heading = "; Settings of KEST2\n";
+constexpr auto startOfHives = "HKEY_"_L1;
+constexpr qsizetype deepestKey = 64;  // names in a path; each path also creates the keys above it
 
 constexpr std::pair<Type, QLatin1StringView> typeNames[] = {
     {Type::Text, "text"_L1},
@@ -38,6 +41,13 @@ QString unescaped(const QByteArray& text)
     return QString::fromUtf8(QByteArray::fromPercentEncoding(text));
 }
 
+/// Returns the path of a key without surplus backslashes, or an empty text if it has too many names.
+QString pathIn(const QByteArray& text)
+{
+    const QStringList names = unescaped(text).split(u'\\', Qt::SkipEmptyParts);
+    return names.size() > deepestKey ? QString() : names.join(u'\\');
+}
+
 QString folded(const QString& path)
 {
     return path.toCaseFolded();
@@ -47,7 +57,11 @@ QString folded(const QString& path)
 
 bool RegistryFile::isOne(const QByteArray& bytes)
 {
-    return !bytes.contains('\0') && (bytes.startsWith(heading) || !fromBytes(bytes).keys().isEmpty());
+    if (bytes.contains('\0'))
+        return false;
+    return bytes.startsWith(heading) || std::ranges::any_of(fromBytes(bytes).keys(), [](const Key& key) {
+               return key.path.startsWith(startOfHives, Qt::CaseInsensitive);
+           });
 }
 
 RegistryFile RegistryFile::fromBytes(const QByteArray& bytes)
@@ -57,8 +71,9 @@ RegistryFile RegistryFile::fromBytes(const QByteArray& bytes)
     for (const QByteArray& written : bytes.split('\n')) {
         const QByteArray line = written.trimmed();
         if (line.startsWith('[') && line.endsWith(']')) {
-            path = unescaped(line.sliced(1, line.size() - 2));
-            file.make(path);
+            path = pathIn(line.sliced(1, line.size() - 2));
+            if (!path.isEmpty())
+                file.make(path);
             continue;
         }
         const qsizetype equals = line.indexOf('=');
