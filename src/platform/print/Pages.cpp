@@ -9,6 +9,7 @@
 
 #include <QAbstractTextDocumentLayout>
 #include <QBuffer>
+#include <QFileInfo>
 #include <QGuiApplication>
 #include <QPainter>
 #include <QPdfWriter>
@@ -32,6 +33,8 @@ constexpr int pdfResolution = 600;  // dots per inch
 constexpr double gap = 6;           // points between the body and header or footer
 constexpr double pointsPerInch = 72;
 constexpr double leastRoom = 36;  // points that the body needs on a page: three lines
+constexpr int deepestTable = 8;
+constexpr qint64 largestResource = 16 * 1024 * 1024;  // bytes
 
 double heightOf(const QTextDocument& document)
 {
@@ -41,6 +44,32 @@ double heightOf(const QTextDocument& document)
 QRectF rectOf(const QTextBlock& block)
 {
     return block.document()->documentLayout()->blockBoundingRect(block);
+}
+
+/// Reads pictures and style sheets from ordinary files only: a device or a pipe has no end.
+class TemplateDocument final : public QTextDocument {
+protected:
+    QVariant loadResource(int type, const QUrl& name) override
+    {
+        const QFileInfo file(name.toLocalFile());
+        const bool isRead = !name.isLocalFile() || (file.isFile() && file.size() <= largestResource);
+        return isRead ? QTextDocument::loadResource(type, name) : QVariant();
+    }
+};
+
+/// Throws TypeMismatch if tables contain each other too deeply. Each level doubles the time of the layout.
+void checkTables(const QString& html)
+{
+    int depth = 0;
+    for (qsizetype at = html.indexOf(u'<'); at >= 0; at = html.indexOf(u'<', at + 1)) {
+        const QStringView tag = QStringView(html).sliced(at + 1);
+        if (tag.startsWith("table"_L1, Qt::CaseInsensitive))
+            ++depth;
+        else if (tag.startsWith("/table"_L1, Qt::CaseInsensitive))
+            depth = std::max(0, depth - 1);
+        if (depth > deepestTable)
+            throw RuntimeError(TypeMismatch, u"The tables of the report contain each other too deeply"_s);
+    }
 }
 
 }  // namespace
@@ -60,7 +89,8 @@ Pages::Pages(const Report& shown, QPagedPaintDevice& onto) : report(shown), devi
 
 std::unique_ptr<QTextDocument> Pages::laidOut(const QString& html) const
 {
-    auto document = std::make_unique<QTextDocument>();
+    checkTables(html);
+    auto document = std::make_unique<TemplateDocument>();
     document->documentLayout()->setPaintDevice(&device);
     document->setDocumentMargin(0);
     document->setDefaultFont(QFont(u"Liberation Sans"_s, 9));

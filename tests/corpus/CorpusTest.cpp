@@ -1,0 +1,103 @@
+// Reads each hostile file of the corpus within limits of time and memory. Nothing may be changed that the file does not
+// concern. index.txt says what each file attacks.
+#include "corpus/Targets.h"
+#include "support/Cost.h"
+#include "support/Snapshot.h"
+#include "support/Test.h"
+
+#include <sys/resource.h>
+#include <unistd.h>
+
+#include <csignal>
+#include <cstring>
+
+namespace {
+
+constexpr double mostMilliseconds = 1000 * slowness;
+constexpr double mostMegabytes = 200;
+constexpr unsigned hangAfter = memoryIsReal ? 60 : 180;  // seconds
+constexpr rlim_t mostData = rlim_t(2048) << 20;          // bytes; ends a flood before it fills the machine
+
+struct Hostile {
+    std::string name;
+    QByteArray content;
+};
+
+std::string current;  // the file that is read
+
+void tellHang(int)
+{
+    for (const std::string_view text : {std::string_view("The corpus hangs at "), std::string_view(current)})
+        if (::write(STDERR_FILENO, text.data(), text.size()) < 0)
+            break;
+    ::_exit(1);
+}
+
+/// Returns the files for a target: those in its folder, and those that the index describes by a repeated piece.
+std::vector<Hostile> corpusOf(const QString& target)
+{
+    const QDir folder(checkoutFile(u"tests/corpus/"_s + target));
+    std::vector<Hostile> files;
+    for (const QStringList& row : rowsIn("../corpus/index.txt")) {
+        if (row[0].section(u'/', 0, 0) != target)
+            continue;
+        const std::string name = row[0].toStdString();
+        if (row.size() == 2)
+            files.push_back({name, files::readBytes(folder.filePath(row[0].section(u'/', 1)))});
+        else
+            files.push_back({name, (row[2] + row[3].repeated(row[4].toInt()) + row[5]).toLatin1()});
+    }
+    return files;
+}
+
+}  // namespace
+
+class Corpus : public ::testing::TestWithParam<const char*> {};
+
+TEST_P(Corpus, CostsLittleAndChangesNothingElse)
+{
+    if (memoryIsReal) {
+        rlimit limit{};
+        ASSERT_EQ(::getrlimit(RLIMIT_DATA, &limit), 0);
+        limit.rlim_cur = mostData;
+        ASSERT_EQ(::setrlimit(RLIMIT_DATA, &limit), 0);
+    }
+    std::signal(SIGALRM, tellHang);
+    const std::unique_ptr<Target> target = makeTarget(GetParam());
+    const std::vector<Hostile> files = corpusOf(QString::fromLatin1(GetParam()));
+    EXPECT_GT(files.size(), 4U);
+    const std::string held = target->holdsShop() ? holdings() : std::string();
+    for (const Hostile& file : files) {
+        const std::string& name = current = file.name;
+        ::alarm(hangAfter);
+        const Cost cost = costOf([&] { EXPECT_NO_THROW(target->take(file.content)) << name; });
+        ::alarm(0);
+        EXPECT_LT(cost.milliseconds, mostMilliseconds) << name;
+        EXPECT_TRUE(cost.megabytes < mostMegabytes || !memoryIsReal) << name << ": " << cost.megabytes;
+        if (target->holdsShop()) {
+            EXPECT_EQ(difference(held, holdings()), "\n") << name;
+        }
+    }
+}
+
+INSTANTIATE_TEST_SUITE_P(Of, Corpus, ::testing::ValuesIn(targetNames));
+
+TEST(CorpusIndex, SaysOfEachFileWhatItAttacks)
+{
+    QStringList told;
+    for (const QStringList& row : rowsIn("../corpus/index.txt")) {
+        EXPECT_TRUE((row.size() == 2 || row.size() == 6) && row[1].size() > 10) << row.join(u'|');
+        if (row.size() == 2)
+            told += row[0];
+    }
+    QStringList found;
+    for (const char* target : targetNames) {
+        const QString folder = QString::fromLatin1(target);
+        for (const QString& file : QDir(checkoutFile(u"tests/corpus/"_s + folder)).entryList(QDir::Files))
+            found += folder + u'/' + file;
+    }
+    told.sort();
+    found.sort();
+    EXPECT_EQ(told, found);
+    EXPECT_GE(found.size(), 150);
+}

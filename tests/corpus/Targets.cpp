@@ -1,0 +1,460 @@
+#include "corpus/Targets.h"
+
+#include "base/Helpers.h"
+#include "base/QuoteKey.h"
+#include "inbound/modLoadXML.h"
+#include "loopback/InsurerRules.h"
+#include "messages/Envelope.h"
+#include "messages/Folders.h"
+#include "outbound/QuoteImages.h"
+#include "platform/print/Pages.h"
+#include "platform/print/Report.h"
+#include "platform/settings/RegistryFile.h"
+#include "quotedata/NoteChain.h"
+#include "sublets/SubletDocuments.h"
+#include "sublets/frmViewPDF.h"
+#include "support/Shop.h"
+#include "utilities/ExactTextEdit.h"
+#include "utilities/FormatXML.h"
+
+#include <fcntl.h>
+#include <unistd.h>
+
+#include <cmath>
+#include <filesystem>
+
+namespace kest::test {
+
+namespace {
+
+const auto bystander = u"BYSTANDER"_s;
+const auto message = u"m.xml"_s;
+
+void require(bool holds, const char* promise)
+{
+    if (!holds)
+        throw std::logic_error(promise);
+}
+
+class ShopTarget : public Target, protected Shop {
+public:
+    bool holdsShop() const override { return true; }
+
+protected:
+    void TestBody() override {}
+    void newDesktop() { desktop.emplace(); }
+};
+
+/// Takes the first line off an input.
+QByteArray firstLine(QByteArray& input)
+{
+    const qsizetype end = input.indexOf('\n');
+    const QByteArray line = end < 0 ? input : input.first(end);
+    input = end < 0 ? QByteArray() : input.sliced(end + 1);
+    return line;
+}
+
+/// Creates a file of any name, even one that is not UTF-8. Returns false if the system does not accept the name.
+bool create(const QString& folder, const QByteArray& name, const QByteArray& content)
+{
+    if (name.isEmpty() || name.size() > 200 || name.contains('/') || name.contains('\0') || name == "." || name == "..")
+        return false;
+    const QByteArray path = QFile::encodeName(files::systemPath(folder)) + '/' + name;
+    const int file = ::open(path.constData(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600);
+    if (file < 0)
+        return false;
+    const bool written = ::write(file, content.constData(), size_t(content.size())) == content.size();
+    ::close(file);
+    return written;
+}
+
+void emptyFolder(const QString& folder)
+{
+    // not with Qt, which can't name a file whose name is not UTF-8
+    for (const auto& file : std::filesystem::directory_iterator(files::systemPath(folder).toStdString()))
+        std::filesystem::remove(file.path());
+}
+
+class XmlTarget final : public Target {
+    void take(const QByteArray& input) override
+    {
+        QString text = files::fromCodePage(input);
+        parsedMessage(text).parseError();
+        text = files::fromCodePage(input);
+        xml::Document document;
+        SetupDocument(document);
+        if (!parseWithRepairs(document, text)) {
+            require(document.documentElement().isNull(), "an unreadable text leaves no document");
+            require(document.parseError().srcText.size() <= 10'000, "the shown source is limited");
+            return;
+        }
+        const QString written = document.xml();
+        xml::Document again;
+        require(again.loadXML(written), "a document can be read as it is written");
+        require(again.xml() == written, "a document is written as it was read");
+        require(again.documentElement().text() == document.documentElement().text(), "no text is lost");
+        if (isSameWhenPrepared(text)) {
+            QString prepared = text;
+            require(parsedMessage(prepared).documentElement().text() == document.documentElement().text(),
+                    "a text that is the same when prepared is so");
+        }
+        GetMessageTypeName(document);
+        GetMarkerTypeName(document);
+        GetMessageRow(document, u"SENT"_s);
+    }
+};
+
+/// Returns a message: the input itself, or the sample that its lines describe. Returns nothing if there is no such
+/// sample.
+std::optional<QString> messageIn(QByteArray input)
+{
+    const bool isSample = input.size() >= 4 && input[0] >= 'A' && input[0] <= 'Z';
+    if (!isSample)
+        return files::fromCodePage(input);
+    try {
+        Message told = Message::told(QString::fromUtf8(firstLine(input)));
+        while (!input.isEmpty()) {
+            const QString line = QString::fromUtf8(firstLine(input));
+            const QString kind = line.section(u' ', 0, 0);
+            if (QStringList{u"labour"_s, u"part"_s, u"paint"_s, u"sublet"_s}.contains(kind))
+                told.line(kind, line.section(u' ', 1, 1).toInt(), line.section(u' ', 2, 2).remove(u'-'),
+                          fieldsIn(line.section(u' ', 3)));
+        }
+        return told.text();
+    } catch (const RuntimeError&) {
+    } catch (const std::runtime_error&) {
+    }
+    return {};
+}
+
+/// Loads messages into a shop with a quote that is theirs and one that is not.
+class LoadTarget final : public ShopTarget {
+public:
+    LoadTarget()
+    {
+        car(bystander).set("CUST_ID", customer(bystander).id());
+        quote(bystander).rego(bystander).request(bystander).quoteNumber(bystander).line(1);
+        quote("BYSTANDER2").rego(bystander).request("", "").quoteNumber("").line(1);
+        files::write(gsUnsentPath + bystander, bystander);
+        quote("500").request("QR1").quoteNumber("KQ1").stage(3).note("Responded Quote Request").line(1);
+        before.emplace();
+        held = holdings();
+    }
+
+    void take(const QByteArray& input) override
+    {
+        const std::optional<QString> text = messageIn(input);
+        if (!text)
+            return;
+        newDesktop();
+        arrive(message, *text);
+        const bool taken = loadAsTheWindow(message);
+        if (!taken)
+            files::remove(gsUnreadPath + message);
+        const std::string now = holdings();
+        if (now == held)
+            return;
+        before->restore();
+        if (!text->contains(u"BYSTANDER"_s))
+            require(about("BYSTANDER", now) == about("BYSTANDER", held), "a message changes no other quote");
+        for (const QString& file : about("^/", now))
+            require(
+                file.startsWith(u"/wirdoc/A"_s) || file.startsWith(u"/wirdoc/PDF/"_s) || file.startsWith(u"/wirimg/"_s),
+                "a message writes no file elsewhere");
+    }
+
+private:
+    static QStringList about(const char* what, const std::string& text)
+    {
+        return QString::fromStdString(text).split(u'\n').filter(QRegularExpression(QString::fromLatin1(what)));
+    }
+
+    std::optional<Snapshot> before;
+    std::string held;
+};
+
+/// Fills the list from folders that contain the files of the input.
+class FillTarget final : public ShopTarget {
+public:
+    FillTarget()
+    {
+        quote("500").request("QR1").quoteNumber("KQ1").stage(3).note("Sending KEST Quote");
+        before.emplace();
+        held = holdings();
+    }
+
+    void take(const QByteArray& input) override
+    {
+        newDesktop();
+        for (const MessageFolder folder : messageFolders) {
+            gsListFilter.clear();
+            gbFilterAsked = false;
+            const QString path = pathOf(folder);
+            put(path, input);
+            const QByteArray own = filesAs(path);
+            attempt([&] {
+                for (const ListedMessage& listed : BuildMessageList(folder, {LoadSubmissionResponse, {}, {}}))
+                    require(isBareName(listed.file), "a listed name is a name");
+            });
+            require(filesAs(path) == own, "a fill leaves the files as they are");
+            if (folder == MessageFolder::Unread)
+                for (const QString& file : files::list(path))
+                    attempt([&] { GetReadFileName(path + file); });
+            emptyFolder(path);
+        }
+        const std::string now = holdings();
+        if (now == held)
+            return;
+        before->restore();
+        for (const QString& line : QString::fromStdString(difference(held, now)).split(u'\n', Qt::SkipEmptyParts))
+            require(line.mid(2).startsWith(u"QUOTE1 "_s) || line.mid(2).startsWith(u"QUOTE3 "_s),
+                    "a fill changes only the quote of a response");
+    }
+
+private:
+    static void put(const QString& folder, const QByteArray& input)
+    {
+        QByteArray name = "m.xml";
+        QByteArray content;
+        for (const QByteArray& line : input.split('\n')) {
+            if (line.startsWith('@')) {
+                create(folder, name, content);
+                name = line.sliced(1);
+                content.clear();
+            } else {
+                content += line + '\n';
+            }
+        }
+        create(folder, name, content);
+    }
+    static QByteArray filesAs(const QString& folder)
+    {
+        QByteArray all;
+        for (const QFileInfo& file : QDir(files::systemPath(folder)).entryInfoList(QDir::Files | QDir::Hidden))
+            all += file.fileName().toUtf8() + ' ' + QByteArray::number(file.size()) + '\n';
+        return all;
+    }
+
+    std::optional<Snapshot> before;
+    std::string held;
+};
+
+class NotesTarget final : public Target {
+    void take(const QByteArray& input) override
+    {
+        QByteArray rest = input;
+        const QString subject = files::fromCodePage(firstLine(rest));
+        const QString status = files::fromCodePage(firstLine(rest));
+        const QString detail = files::fromCodePage(firstLine(rest));
+        const QString chain = files::fromCodePage(rest);
+        GetNoteStatus(subject, chain);
+        require(RemoveNote(subject, chain).size() <= chain.size() + chain.count(u')'), "a removal adds no notes");
+        QString changed = chain;
+        require(AddNote(subject, status, changed, detail, false) == changed, "a chain is returned twice");
+        QString longer = chain;
+        AddNewNote(subject, status, longer, detail);
+        require(longer.contains(subject) && longer.contains(detail), "a new note is in the chain");
+        constexpr int bodyOfNote = 14;  // after "(21/03/2008 : "
+        const bool isPlain = !subject.isEmpty() && !status.isEmpty() && !(status + subject).contains(u':') &&
+                             longer.indexOf(subject) == bodyOfNote + status.size() + 1;
+        if (isPlain) {
+            require(GetNoteStatus(subject, longer) == status, "the status of a new note is found");
+        }
+    }
+};
+
+class ValuesTarget final : public Target {
+    void take(const QByteArray& input) override
+    {
+        for (const QByteArray& line : input.split('\n'))
+            takeLine(files::fromCodePage(line));
+    }
+
+    static void takeLine(const QString& text)
+    {
+        attempt([&] { toLong(text); });
+        attempt([&] { toInteger(text); });
+        attempt([&] { toBool(text); });
+        attempt([&] { leadingNumber(text); });
+        attempt([&] { FormatNetworkDate(text); });
+        attempt([&] { require(std::isfinite(SafeVal(text, u"0"_s)), "a safe value is finite"); });
+        if (const std::optional<double> number = numberIn(text)) {
+            require(std::isfinite(*number), "a number is finite");
+            if (std::abs(*number) > 1.797693134862315e308)
+                return;  // 15 digits of it are above the largest number
+            const QString written = numberText(*number);
+            const std::optional<double> again = numberIn(written);
+            require(again.has_value(), "a number is read as it is written");
+            require(std::abs(*again - *number) <= 1e-14 * std::abs(*number), "a number keeps 15 digits");
+            require(numberText(*again) == written, "a number is written as it was read");
+        }
+        if (const std::optional<QDateTime> date = dateIn(text)) {
+            const QTime time = date->time();
+            const QDateTime whole = columnDate(date->date(), QTime(time.hour(), time.minute(), time.second()));
+            require(dateIn(toText(whole)) == whole, "a date is read as it is written");
+        }
+    }
+};
+
+class ViewerTarget final : public ShopTarget {
+    void take(const QByteArray& input) override
+    {
+        newDesktop();
+        files::writeBytes(gsUnreadPath + message, input);
+        const QString text = FormatXML(gsUnreadPath + message);
+        require(files::readBytes(gsUnreadPath + message) == input, "viewing changes no file");
+        ExactTextEdit edit;
+        edit.setExactText(text);
+        require(edit.exactText() == text, "the viewer holds the exact text");
+        files::write(gsUnreadPath + message, withMarkupCharacters(withoutRequestWrapper(text)));
+        FormatXML(gsUnreadPath + message);
+        files::remove(gsUnreadPath + message);
+    }
+};
+
+class ImagesTarget final : public ShopTarget {
+    void take(const QByteArray& input) override
+    {
+        for (const QByteArray& line : input.split('\n')) {
+            const QString name = files::fromCodePage(line);
+            const QString id = imageId(name);
+            require(id.isEmpty() || numberIn(id).has_value(), "an image's id is a number");
+            QuoteKey::fromReference(name);
+            QuoteKey::fromResponseName(name);
+            NormaliseQuoteRef(name);
+            SplitQuoteRef(name);
+            require(!files::isPlainName(name) || !name.contains(u'/'), "a plain name has no folder");
+            create(gsImagesPath, line, "jpeg");
+        }
+        for (const QString& number : {u"500"_s, u"*"_s, u".."_s, u"5?"_s, QString()}) {
+            attempt([&] { writeImageDocuments(gsImagesPath, {number, u"0"_s}); });
+            for (const QString& file : files::list(gsUnsentPath))
+                require(file.startsWith(u"I_"_s + number + u"_0"_s, Qt::CaseInsensitive), "an image is its quote's");
+            emptyFolder(gsUnsentPath);
+        }
+        emptyFolder(gsImagesPath);
+    }
+};
+
+class TemplateTarget final : public ShopTarget {
+public:
+    TemplateTarget() { files::makeFolder(u"c:\\wirra32\\report"_s); }
+
+private:
+    void take(const QByteArray& input) override
+    {
+        const QString path = u"c:\\wirra32\\report\\710.html"_s;
+        files::writeBytes(path, input);
+        attempt([&] {
+            report::Report report(path);
+            print(report);
+            report.setTable({{u"quote_ref"_s, u"amount"_s, u"day"_s},
+                             {{u"500"_s, u"1,234.5"_s, u"2008-04-11"_s}, {u"{{#rows}}"_s, QVariant(), u"<b>"_s}}});
+            print(report);
+        });
+        files::remove(path);
+    }
+
+    static void print(const report::Report& report)
+    {
+        report.heading();
+        QBuffer pdf;
+        pdf.open(QBuffer::WriteOnly);
+        QPdfWriter device(&pdf);
+        report::setPaper(device);
+        const report::Pages pages(report, device);
+        QPainter painter(&device);
+        for (int page = 0; page < std::min(pages.count(), 3); ++page)
+            pages.paint(painter, page);
+    }
+};
+
+class RulesTarget final : public Target {
+    void take(const QByteArray& input) override
+    {
+        attempt([&] {
+            const app::InsurerRules rules = app::parsedRules(QString::fromUtf8(input));
+            for (const app::Rule& rule : rules.rules) {
+                for (const app::Step& step : rule.steps) {
+                    const app::Step again = app::parsedStep(step.text);
+                    require(again.act == step.act && again.parameters == step.parameters, "a step is its text");
+                }
+            }
+            for (int time = 0; time < 3; ++time)
+                rules.ruleFor({u"500"_s, u"1"_s}, u"QR1"_s, time);
+        });
+    }
+};
+
+class SettingsTarget final : public ShopTarget {
+    void take(const QByteArray& input) override
+    {
+        using settings::Hive;
+        using settings::RegistryFile;
+        const QString path = root() + u"/registry.ini"_s;
+        const QByteArray own = QFile::exists(path) ? files::readBytes(path) : QByteArray();
+        const RegistryFile file = RegistryFile::fromBytes(input);
+        const QByteArray written = file.toBytes();
+        require(RegistryFile::isOne(written), "what is written is a settings file");
+        require(RegistryFile::fromBytes(written).toBytes() == written, "settings are read as they are written");
+
+        files::writeBytes(path, input);
+        const bool isRead = attempt([] { settings::check(); });
+        require(isRead == RegistryFile::isOne(input), "only a settings file is accepted");
+        const QString key = u"SOFTWARE\\wirra32\\fuzz"_s;
+        settings::createKey(Hive::LocalMachine, key);
+        const bool isSet = settings::setValue(Hive::LocalMachine, key, u"name"_s, {settings::Type::Text, u"x"_s});
+        require(isSet == isRead, "settings can be changed if they can be read");
+        require(isRead || files::readBytes(path) == input, "what is no settings file is not overwritten");
+        for (const settings::Entry& entry : settings::entries())
+            require(settings::query(entry.hive, entry.key, entry.name).has_value(), "each listed value is found");
+        own.isEmpty() ? files::remove(path) : files::writeBytes(path, own);
+    }
+};
+
+class SubletsTarget final : public ShopTarget {
+public:
+    SubletsTarget() { quote("500").line(1, "MIS").set("VENDOR", 0); }
+
+private:
+    void take(const QByteArray& input) override
+    {
+        newDesktop();
+        QByteArray content = input;
+        const QByteArray name = firstLine(content);
+        if (!create(subletFolder(), name, content))
+            return;
+        for (const QuoteKey& key : {QuoteKey{u"500"_s}, QuoteKey{u"500"_s, u"1"_s}, QuoteKey{}, QuoteKey{u"*"_s}}) {
+            const QStringList numbers = subletDocumentNumbers(key);
+            const QList<SubletDocument> documents = subletDocuments(key, numbers);
+            require(documents.size() <= numbers.size(), "a document belongs to one line");
+            for (const SubletDocument& document : documents)
+                frmViewPDF::ShowForm(subletFolder() + document.file);
+        }
+        frmViewPDF::ShowForm(subletFolder() + QFile::decodeName(name));
+        emptyFolder(subletFolder());
+    }
+};
+
+template <class Kind>
+std::unique_ptr<Target> made()
+{
+    return std::make_unique<Kind>();
+}
+
+}  // namespace
+
+std::unique_ptr<Target> makeTarget(const std::string& name)
+{
+    using Make = std::unique_ptr<Target> (*)();
+    static constexpr Make makers[] = {made<XmlTarget>,      made<LoadTarget>,     made<FillTarget>,
+                                      made<NotesTarget>,    made<ValuesTarget>,   made<ViewerTarget>,
+                                      made<ImagesTarget>,   made<TemplateTarget>, made<RulesTarget>,
+                                      made<SettingsTarget>, made<SubletsTarget>};
+    for (size_t i = 0; i < std::size(targetNames); ++i)
+        if (name == targetNames[i])
+            return makers[i]();
+    throw std::invalid_argument("no target " + name);
+}
+
+}  // namespace kest::test
