@@ -19,24 +19,26 @@ static QString embeddedSchema()
         .replace(text, u"\\1 COLLATE NOCASE"_s);
 }
 
-Databases::Databases()
+QString test::createDatabase(On engine)
 {
-    if (GetParam() == On::Embedded) {
-        connectionText = u"Driver={SQL Server};Server=(local)\\;Database=shop;Uid=sa;Pwd=x;"_s;
-        const db::ConnectionPtr made = app::openEmbedded(u"shop"_s);
-        for (const QString& statement : app::statementsIn(embeddedSchema()))
-            made->execute(statement);
-    } else if (GetParam() == On::Tds) {
-        tdsServer().createDatabase(u"shop"_s, TdsServer::schemaOf(mariaDbSchema));
-        connectionText = tdsServer().connectionText(u"shop"_s);
-    } else {
-        mariaDb().createDatabase(u"shop"_s, mariaDbSchema);
-        connectionText = GetParam() == On::MySql
-                             ? mariaDb().connectionText(u"shop"_s)
-                             : mariaDb().connectionText(u"shop"_s, QString::fromLatin1(odbcMariaDb));
+    switch (engine) {
+        case On::Embedded: {
+            const db::ConnectionPtr made = app::openEmbedded(u"shop"_s);
+            for (const QString& statement : app::statementsIn(embeddedSchema()))
+                made->execute(statement);
+            return u"Driver={SQL Server};Server=(local)\\;Database=shop;Uid=sa;Pwd=x;"_s;
+        }
+        case On::Tds:
+            tdsServer().createDatabase(u"shop"_s, TdsServer::schemaOf(mariaDbSchema));
+            return tdsServer().connectionText(u"shop"_s);
+        default:
+            mariaDb().createDatabase(u"shop"_s, mariaDbSchema);
+            return engine == On::MySql ? mariaDb().connectionText(u"shop"_s)
+                                       : mariaDb().connectionText(u"shop"_s, QString::fromLatin1(odbcMariaDb));
     }
-    connection = connect();
 }
+
+Databases::Databases() : connectionText(createDatabase(GetParam())), connection(connect()) {}
 
 db::ConnectionPtr Databases::connect() const
 {

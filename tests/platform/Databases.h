@@ -11,6 +11,9 @@ namespace kest::test {
 
 enum class On { Embedded, MySql, Odbc, Tds };
 
+/// Creates the database on an engine and returns the text for its connection.
+QString createDatabase(On engine);
+
 /// The tables are LINE (id, the identity; CODE, SEQ, amount, flag, day, notes), CAR (REGO, the key; owner) and Tints
 /// (Code, Script; no key). They compare values and have defaults as in the quote database.
 class Databases : public ::testing::TestWithParam<On> {
