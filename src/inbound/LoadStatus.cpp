@@ -66,7 +66,7 @@ void deleteQuoteRows(const QuoteKey& key)
     gConn->execute(sql("DELETE FROM QUOTE3 WHERE QTNNO='{}' AND SUBQUOTE={}", number, subquote));
     gConn->execute(sql("DELETE FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE={}", number, subquote));
     journal::passPoint(
-        [&] { gConn->execute(sql("DELETE FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE={}", number, subquote)); },
+        [&] { gConn->execute(sql("DELETE FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE={}", key.number, key.subquote)); },
         deletedKey());
 }
 

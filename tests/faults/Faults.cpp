@@ -262,7 +262,7 @@ void Trial::tellWhatCameUp(bool isWhole) const
 
 static void open(frmMessageList& window, const std::function<void()>& then)
 {
-    window.open();
+    window.openUnread();
     then();
     statusShown = control<QLabel>(window, "lblStatus").text();
 }

@@ -36,10 +36,8 @@ Change::~Change()
     if (!isOpen_)
         return;
     connection_.setInChange(false);
-    // a connection that is still in the transaction would fail or, on some servers, commit this change with the next
-    // one
-    if (connection_.state() == 1 && !attempt([&] { connection_.session().rollback(); }) && connection_.state() == 1)
-        connection_.session().engine().drop();
+    if (connection_.state() == 1)
+        connection_.session().abandon();
     observer_->takenBack();
 }
 

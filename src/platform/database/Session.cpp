@@ -213,6 +213,12 @@ void Session::rollback()
     engine_->run(u"ROLLBACK"_s);
 }
 
+void Session::abandon()
+{
+    if (!attempt([&] { rollback(); }))
+        engine_->drop();
+}
+
 void Session::checkFault()
 {
     statementStep();

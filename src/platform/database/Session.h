@@ -70,6 +70,9 @@ public:
     void begin();
     void commit();
     void rollback();
+    /// Rolls back. If that fails, gives the connection up, because the next change would fail or, on some servers,
+    /// commit this one too.
+    void abandon();
 
     /// Returns a table, or null if the database does not have it. Asks the database only once. The result is valid
     /// until a definition changes.

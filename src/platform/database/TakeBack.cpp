@@ -4,6 +4,7 @@
 #include "platform/database/Dialect.h"
 #include "platform/database/Session.h"
 
+#include <QDateTime>
 #include <QScopeGuard>
 
 #include <cmath>
@@ -160,7 +161,7 @@ TakeBack::~TakeBack()
 {
     connection_.setInChange(false);
     if (isOpen_ && connection_.state() == 1)
-        attempt([&] { connection_.session().rollback(); });
+        connection_.session().abandon();
 }
 
 bool TakeBack::undo(const RowChange& change)
