@@ -229,13 +229,10 @@ void Trial::disturb(Fault fault, int number)
         first = run(fault, number);
     const bool isTold = first != undisturbed || logSize() > logBefore;
     const bool isDone = work.isDone();
-    const QString second = isDone ? QString() : run();
-    std::string found = shop();
-    if (isDone && found != expected) {
-        attempt([] { Faults::openList(); });  // this finishes what is left
-        found = shop();
-    }
-    if (found == expected && (isDone || (isTold && second == undisturbed)))
+    attempt([] { Faults::openList(); });  // this takes interrupted work back, or finishes it
+    const QString second = work.isDone() ? QString() : run();
+    const std::string found = shop();
+    if (found == expected && (isDone || isTold) && (second.isEmpty() || second == undisturbed))
         return;
     const QString account =
         u"%1: %2 %3 of %4 (%5)\nfirst: %6: %7\nsecond: %8\n"_s.arg(name, QString::fromLatin1(faultWords[int(fault)]))

@@ -21,7 +21,8 @@ NOT_CHECKED = re.compile(r"sp_datatype_info\w* 1|SET LOCK_TIMEOUT -?1|KILL 1", r
 
 FUNCTIONS = {"COUNT", "MAX", "SCOPE_IDENTITY", "OBJECT_ID", "OBJECT_NAME", "COL_NAME", "COLUMNPROPERTY", "DB_NAME",
              "DATABASEPROPERTYEX", "SESSIONPROPERTY", "SCHEMA_NAME"}
-BEFORE_PARENTHESIS = {"IN", "VALUES", "AND", "OR", "NOT", "WHERE", "FROM", "ON", "EXISTS", "AS", "SELECT", "NVARCHAR", "WITH"}
+BEFORE_PARENTHESIS = {"IN", "VALUES", "AND", "OR", "NOT", "WHERE", "FROM", "ON", "EXISTS", "AS", "SELECT", "NVARCHAR",
+                      "WITH"}
 
 CONTROLS = [  # each is refused
     "SELECT * FROM QUOTE1 LIMIT 1",
@@ -97,7 +98,8 @@ def main():
     except OSError as failure:
         sys.exit("No statements were recorded: %s" % failure)
     failures = []
-    forms = {form_of(part): part for batch in statements for part in batch.split("; ") if not NOT_CHECKED.fullmatch(part)}
+    parts = {part for batch in statements for part in batch.split("; ")}
+    forms = {form_of(part): part for part in parts if not NOT_CHECKED.fullmatch(part)}
     with multiprocessing.Pool() as pool:
         for statement, why in pool.imap(refusal, map(form_of, CONTROLS)):
             if not (why or broken_rule(statement)):
