@@ -7,6 +7,7 @@
 #include "messages/Envelope.h"
 #include "messages/Folders.h"
 #include "outbound/QuoteImages.h"
+#include "platform/files/CodePage.h"
 #include "platform/print/Pages.h"
 #include "platform/print/Report.h"
 #include "platform/settings/RegistryFile.h"
