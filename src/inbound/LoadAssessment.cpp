@@ -123,7 +123,7 @@ void LoadSubmissionResponse(QString& text, const QString& fileName)
                                        u". Move the file out of the folder; until then no messages are listed."_s);
     };
     const QuoteKey key = QuoteKey::fromResponseName(fileName);
-    if (key.number.isEmpty() || key.subquote.isEmpty())
+    if (key.number.isEmpty() || key.subquote.isEmpty() || !key.subquote[0].isDigit())
         fail(NoCurrentRow, u"does not name the quote that it answers"_s);
     Quote quote(key);
     if (!quote.exists())
@@ -132,7 +132,7 @@ void LoadSubmissionResponse(QString& text, const QString& fileName)
         fail(NoCurrentRow, u"answers quote %1, which has no notes row"_s.arg(key.reference()));
     const SharedMessage message = sharedMessage(text);
     const xml::Node root = message->documentElement();
-    if (!root.selectSingleNode(u"rootns:kestQuoteNumber"_s) ||
+    if (!root || !root.selectSingleNode(u"rootns:kestQuoteNumber"_s) ||
         !root.selectSingleNode(u"rootns:quoteSubmissionStatus"_s))
         fail(NoObject, u"contains no complete answer to quote %1"_s.arg(key.reference()));
     quote.header().set(u"KESTQuoteNo"_s, root.textOf(u"rootns:kestQuoteNumber"_s));

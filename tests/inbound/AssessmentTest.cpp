@@ -11,9 +11,11 @@ static void takeResponse(const Text& file, const Text& number, const Text& statu
 
 TEST_F(Assessments, ABackOutUndoesWhatWasDecided)
 {
-    for (const auto& [subquote, authority, before, after, authorisation] : casesIn<5>("inbound/back-outs.txt")) {
+    for (const auto& [subquote, authority, authorised, before, after, authorisation] :
+         casesIn<6>("inbound/back-outs.txt")) {
         QuoteRow row = quote("500", subquote.toInt()).request("QR1").authorised(authority).stage(4).remarks(before);
-        row.set("AuthDate", "01/02/2008");
+        if (authorised != "-")
+            row.set("AuthDate", authorised);
         EXPECT_TRUE(load(assessmentBackout("QR1")));
         EXPECT_EQ(row.state(), "3 locked - " + after.toStdString());
         EXPECT_TRUE(row.shows(authorisation)) << before;
@@ -50,6 +52,7 @@ TEST_F(Assessments, ASubmissionResponseGivesTheQuoteItsNumber)
 
     // if its quote does not exist, or if its name has no subquote, the fill reports it
     EXPECT_THROW(takeResponse("R_502_0.xml", "KQ7"), RuntimeError);
-    EXPECT_THROW(takeResponse("R_501.xml", "KQ7"), RuntimeError);
+    for (const char* file : {"R_501.xml", "R_501_.xml", "R_501_A.xml"})
+        EXPECT_THROW(takeResponse(file, "KQ7"), RuntimeError) << file;
     EXPECT_EQ(quote("501").text("KESTQuoteNo"), "KQ6");
 }

@@ -96,6 +96,13 @@ TEST_F(AuthorisedQuotes, TotalsFollowTheMergedLines)
         EXPECT_TRUE(report.contains(onlyNow)) << onlyNow;
 }
 
+TEST_F(AuthorisedQuotes, TotalsCountAllLinesIfTheLastOneIsNotInTheQuote)
+{
+    quote("500").line(1).set("rrhour", 2).set("rr_rate2", 38);
+    EXPECT_TRUE(load(authorisedQuote("500").labour(1, "N").part(77, "D")));
+    EXPECT_EQ(quote("500").number("TOTAL"), 76);
+}
+
 TEST_F(AuthorisedQuotes, ANoteOfTheRequestIsAddedOnlyWhereItHasOne)
 {
     gConn->execute(u"DELETE FROM QUOTE3"_s);
