@@ -80,6 +80,20 @@ TEST_F(Preview, WhatCannotBeShownEndsInSilenceButAnUnknownNumber)
     EXPECT_EQ(shownReports() + shown(), "");
 }
 
+TEST_F(Preview, NoTemplateKeepsTheLayoutBusyForEver)
+{
+    const auto print = [&](const QByteArray& body) {
+        putTemplate("test.html", "<body>" + body + "</body>");
+        return failureOf(
+            [&] { report::writePdf(report::Report(u"c:\\wirra32\\report\\test.html"_s), root() + u"/out.pdf"_s); });
+    };
+    const QByteArray open = "<table><tr><td>";
+    const QByteArray close = "</td></tr></TABLE>";
+    EXPECT_EQ(print(open.repeated(30) + 'x' + close.repeated(30)), TypeMismatch);
+    EXPECT_EQ(print(QByteArray(open + close).repeated(30)), 0) << "only tables within tables count";
+    EXPECT_EQ(print("<p style='background-image: url(file:///dev/zero)'><img src='file:///dev/zero'>x</p>"), 0);
+}
+
 TEST_F(Preview, EachPreviewIsKeptInTheFolderOfReports)
 {
     const QString folder = root() + u"/out/deep"_s;
