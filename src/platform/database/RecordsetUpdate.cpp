@@ -128,7 +128,8 @@ QString Recordset::Data::keyCondition(const TableInfo& table)
     return conditions.join(u" AND "_s);
 }
 
-/// If the engine can't compare long texts in a condition, reads those that will be written again and compares them.
+/// If the engine can't compare long texts in a condition, reads those that will be written again and compares them. In
+/// a change, the row stays locked until the change is committed.
 void Recordset::Data::checkLongTexts(const TableInfo& table, const QString& key)
 {
     QList<int> longTexts;
@@ -144,9 +145,11 @@ void Recordset::Data::checkLongTexts(const TableInfo& table, const QString& key)
     }
     if (longTexts.isEmpty())
         return;
-    const Rows now = session().selectNative(
-        u"SELECT "_s + names.join(u", "_s) + u" FROM "_s + dialect().quoted(table.name) + u" WHERE "_s + key,
-        described);
+    const Rows now =
+        session().selectNative(u"SELECT "_s + names.join(u", "_s) + u" FROM "_s +
+                                   QString(dialect().lockedTable).replace(u"%1"_s, dialect().quoted(table.name)) +
+                                   u" WHERE "_s + key + dialect().lockedEnd,
+                               described);
     if (now.count() == 0)
         failRowChanged();
     for (qsizetype i = 0; i < longTexts.size(); ++i) {
@@ -176,8 +179,8 @@ void Recordset::Data::writeChange(const QString& tableName)
             condition += u" AND "_s + same;
         written.append(column);
     }
-    checkLongTexts(*table, key);
     Change change(*connection, tableName);
+    checkLongTexts(*table, key);
     const qint64 hit = session().executeNative(u"UPDATE "_s + dialect().quoted(tableName) + u" SET "_s +
                                                assignments.join(u", "_s) + u" WHERE "_s + condition);
     if (hit == 0)
