@@ -17,11 +17,6 @@ QJsonValue jsonOf(const QVariant& value)
     return value.isNull() ? QJsonValue(QJsonValue::Null) : QJsonValue(toText(value));
 }
 
-QString wordOf(db::ChangeKind kind)
-{
-    return kind == db::ChangeKind::Insert ? u"insert"_s : kind == db::ChangeKind::Delete ? u"delete"_s : u"update"_s;
-}
-
 QJsonObject jsonOf(const journal::RecordedChange& change)
 {
     QJsonArray columns;
@@ -29,7 +24,7 @@ QJsonObject jsonOf(const journal::RecordedChange& change)
         columns.append(QJsonObject{
             {u"name"_s, column.name}, {u"before"_s, jsonOf(column.before)}, {u"after"_s, jsonOf(column.after)}});
     return {{u"table"_s, change.row.table},
-            {u"change"_s, wordOf(change.row.kind)},
+            {u"change"_s, journal::wordOf(change.row.kind)},
             {u"quote"_s, change.number},
             {u"subquote"_s, change.subquote},
             {u"columns"_s, columns}};
@@ -37,7 +32,7 @@ QJsonObject jsonOf(const journal::RecordedChange& change)
 
 QString textOf(const journal::RecordedChange& change)
 {
-    QString text = u"  %1 %2"_s.arg(wordOf(change.row.kind), change.row.table);
+    QString text = u"  %1 %2"_s.arg(journal::wordOf(change.row.kind), change.row.table);
     if (!change.number.isEmpty())
         text += u" (quote %1/%2)"_s.arg(change.number, change.subquote);
     text += u'\n';

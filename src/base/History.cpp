@@ -123,25 +123,50 @@ QList<RecordedChange> changesOf(qint64 operation)
     return changes;
 }
 
+QList<ColumnStory> columnsOf(const db::RowChange& row)
+{
+    QList<ColumnStory> told;
+    for (const db::RowChange::Column& column : row.columns) {
+        const QVariant& before = column.before;
+        const QVariant& after = column.after;
+        if (before.isNull() == after.isNull() && before == after)
+            continue;
+        if (row.kind == db::ChangeKind::Insert)
+            told.append({column.name, {}, shown(after)});
+        else if (row.kind == db::ChangeKind::Delete)
+            told.append({column.name, shown(before), {}});
+        else if (column.kind == db::Kind::LongText && !before.isNull() && !after.isNull())
+            told.append({column.name, shown(difference(toText(before), toText(after))),
+                         shown(difference(toText(after), toText(before)))});
+        else
+            told.append({column.name, shown(before), shown(after)});
+    }
+    return told;
+}
+
 QStringList linesOf(const db::RowChange& row)
 {
     QStringList lines;
-    for (const db::RowChange::Column& column : row.columns) {
-        const bool differs = column.before.isNull() != column.after.isNull() || column.before != column.after;
-        if (!differs)
-            continue;
-        if (row.kind == db::ChangeKind::Insert)
-            lines.append(column.name + u": "_s + shown(column.after));
-        else if (row.kind == db::ChangeKind::Delete)
-            lines.append(column.name + u": "_s + shown(column.before));
-        else if (column.kind == db::Kind::LongText && !column.before.isNull() && !column.after.isNull())
-            lines.append(u"%1: \"%2\" -> \"%3\""_s.arg(column.name,
-                                                       difference(toText(column.before), toText(column.after)),
-                                                       difference(toText(column.after), toText(column.before))));
-        else
-            lines.append(column.name + u": "_s + shown(column.before) + u" -> "_s + shown(column.after));
+    for (const ColumnStory& column : columnsOf(row)) {
+        QStringList values{column.from, column.to};
+        values.removeAll(QString());
+        lines.append(column.name + u": "_s + values.join(u" -> "_s));
     }
     return lines;
+}
+
+QString wordOf(db::ChangeKind kind)
+{
+    return kind == db::ChangeKind::Insert ? u"insert"_s : kind == db::ChangeKind::Delete ? u"delete"_s : u"update"_s;
+}
+
+QString keyOf(const db::RowChange& row)
+{
+    QStringList key;
+    for (const QString& name : row.key)
+        if (const db::RowChange::Column* column = row.column(name))
+            key.append(name + u' ' + textOrEmpty(row.kind == db::ChangeKind::Delete ? column->before : column->after));
+    return key.join(u", "_s);
 }
 
 QString titleOf(const Entry& entry)

@@ -28,9 +28,21 @@ QList<Entry> pendingOperations();
 /// Returns what an operation changed, in the order of the changes.
 QList<RecordedChange> changesOf(qint64 operation);
 
-/// Returns the columns of a change as a person reads them: "excess: 250 -> 300". A new row shows what was filled in, a
-/// deleted one what was lost. Long texts are shortened to their difference.
+/// What a change did to one column, as a person reads it: a value in quotation marks, or "(empty)". Long texts are
+/// shortened to their difference.
+struct ColumnStory {
+    QString name;
+    QString from;  // empty if the row is new
+    QString to;    // empty if the row was deleted
+};
+/// Returns the columns that a change changed: of a new row what was filled in, of a deleted one what was lost.
+QList<ColumnStory> columnsOf(const db::RowChange& row);
+/// Returns the same as lines such as "excess: "250" -> "300"".
 QStringList linesOf(const db::RowChange& row);
+/// Returns "insert", "update" or "delete".
+QString wordOf(db::ChangeKind kind);
+/// Returns the key of a row, such as "QTNNO 1007, SUBQUOTE 0".
+QString keyOf(const db::RowChange& row);
 
 /// Returns a title such as "load of AUQT_1007.xml", "send" or "save in the utilities".
 QString titleOf(const Entry& entry);

@@ -1,7 +1,7 @@
 // The list window's controls, its layout and the connections of its events.
-#include "messagelist/ListSearch.h"
 #include "messagelist/MessageListModel.h"
 #include "messagelist/frmMessageList.h"
+#include "platform/desktop/ListSearch.h"
 #include "platform/desktop/Lists.h"
 #include "platform/desktop/StatusLine.h"
 #include "platform/desktop/Window.h"
@@ -96,7 +96,7 @@ void frmMessageList::buildControls()
     ListView1->setSelectionMode(QAbstractItemView::ExtendedSelection);  // for copying; the buttons use the current row
     desktop::prepareList(*ListView1, objectName());
     ListView1->header()->setSortIndicatorClearable(true);  // back to the order of the folder
-    new ListSearch(*ListView1, *txtFind);
+    new desktop::ListSearch(*ListView1, *txtFind);
 
     lblStatus = new desktop::StatusLine(u"lblStatus"_s);
     lblStatus->setWordWrap(true);

@@ -98,11 +98,7 @@ bool stays(const RowHistory& row)
 
 QString nameOf(const db::RowChange& row)
 {
-    QStringList key;
-    for (const QString& name : row.key)
-        if (const db::RowChange::Column* column = row.column(name))
-            key.append(name + u' ' + textOrEmpty(row.kind == db::ChangeKind::Delete ? column->before : column->after));
-    return u"The row of %1 with %2"_s.arg(row.table, key.join(u", "_s));
+    return u"The row of %1 with %2"_s.arg(row.table, journal::keyOf(row));
 }
 
 /// Returns true if a quote has more lines and notes than these, or an invoice.

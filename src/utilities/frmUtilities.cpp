@@ -13,6 +13,7 @@
 #include "quotedata/Quote.h"
 #include "utilities/ExactTextEdit.h"
 #include "utilities/StatusRepair.h"
+#include "utilities/frmHistory.h"
 
 #include <QCheckBox>
 #include <QGridLayout>
@@ -146,6 +147,7 @@ QWidget* frmUtilities::closingButtons()
     auto* row = new QHBoxLayout(buttons);
     row->setContentsMargins({});
     row->addWidget(button(u"Command9"_s, u"&Undo"_s, &frmUtilities::Command9_Click));
+    row->addWidget(button(u"cmdHistory"_s, u"&History"_s, &frmUtilities::cmdHistory_Click));
     row->addStretch();
     row->addWidget(button(u"Command1"_s, u"&Save"_s, &frmUtilities::Command1_Click));
     row->addWidget(button(u"Command2"_s, u"&Close"_s, &frmUtilities::Command2_Click));
@@ -307,6 +309,11 @@ void frmUtilities::Command2_Click()
 {
     CloseRows();
     close();
+}
+
+void frmUtilities::cmdHistory_Click()
+{
+    frmHistory::ShowForm(shown.number);
 }
 
 void frmUtilities::SetStatus(const StatusRepair& repair)

@@ -43,6 +43,7 @@ private:
     void Command1_Click();  // Save
     void Command2_Click();  // Close
     void Command9_Click();  // Undo
+    void cmdHistory_Click();
     void SetStatus(const StatusRepair& repair);
 
     QuoteKey shown;  // not read from `quote`, because another user may delete the row

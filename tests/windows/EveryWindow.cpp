@@ -1,6 +1,7 @@
 #include "windows/EveryWindow.h"
 
 #include "app/ProfileWindow.h"
+#include "base/Journal.h"
 #include "base/SharedVariables.h"
 #include "loopback/TransportWindow.h"
 #include "messagelist/frmHeld.h"
@@ -12,6 +13,7 @@
 #include "sublets/frmSubletAuth.h"
 #include "sublets/frmViewPDF.h"
 #include "support/Hands.h"
+#include "utilities/frmHistory.h"
 #include "utilities/frmLogin.h"
 #include "utilities/frmUtilities.h"
 #include "utilities/frmViewXML.h"
@@ -55,6 +57,8 @@ EveryWindow::EveryWindow()
     auto row = quote("500");
     quote("500", 1);
     row.line(1, "MIS", "Wheel alignment").set("VENDOR", vendor("Straight Track").id());
+    const journal::Operation operation(journal::Kind::Save);
+    gConn->execute(u"UPDATE QUOTE1 SET CLAIM='7700002' WHERE QTNNO='500'"_s);
     makeDocument();
 }
 
@@ -102,6 +106,7 @@ void EveryWindow::each(const Check& check)
         {"frmPrintPreview", check, [] { frmPrintPreview::ShowForm(710, QString(), nullptr); }},
         {"frmLogin", check, [&] { frmLogin::ShowForm(passed); }},
         {"frmUtilities", check, [] { frmUtilities::ShowForm(u"500"_s, u"0"_s); }},
+        {"frmHistory", check, [] { frmHistory::ShowForm(u"500"_s); }},
         {"frmViewXML", check,
          [] {
              gsCurFolder = gsUnreadPath;  // the list has left it in another folder

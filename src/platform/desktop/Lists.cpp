@@ -49,7 +49,7 @@ void copyRows(const QTreeView& list)
 
 }  // namespace
 
-void prepareList(QTreeView& list, const QString& window)
+void prepareList(QTreeView& list, const QString& window, Qt::ShortcutContext keysOf)
 {
     showFocus(list);
     list.setRootIsDecorated(false);
@@ -69,13 +69,14 @@ void prepareList(QTreeView& list, const QString& window)
         list.model()->setHeaderData(column, Qt::Horizontal,
                                     u"Sort by this column (%1)"_s.arg(keys.toString(QKeySequence::NativeText)),
                                     Qt::ToolTipRole);
-        onEvent(new QShortcut(keys, &list, nullptr, nullptr, Qt::WindowShortcut), &QShortcut::activated, &list, source,
+        onEvent(new QShortcut(keys, &list, nullptr, nullptr, keysOf), &QShortcut::activated, &list, source,
                 [header, column] { sortBy(*header, column); });
     }
     auto* copy = new QShortcut(QKeySequence::Copy, &list, nullptr, nullptr, Qt::WidgetShortcut);
     onEvent(copy, &QShortcut::activated, &list, window + u'.' + list.objectName() + u"_Copy"_s,
             [&list] { copyRows(list); });
     auto* widen = new QShortcut(&list);
+    widen->setContext(keysOf);
     widen->setKeys({Qt::CTRL | Qt::Key_Plus, Qt::CTRL | Qt::Key_Equal});  // "+" with and without Shift
     onEvent(widen, &QShortcut::activated, &list, source, [&list, header] {
         for (int column = 0; column < header->count(); ++column)

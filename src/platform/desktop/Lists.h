@@ -2,6 +2,7 @@
 #pragma once
 
 #include <QList>
+#include <Qt>
 
 class QPushButton;
 class QString;
@@ -14,7 +15,9 @@ namespace kest::desktop {
 /// A click on a header, or Ctrl and the number of the column, sorts the list; a second one reverses the order. The
 /// selected row stays selected and visible. Ctrl and "+" fits all columns to their contents. The last column takes the
 /// space that is left. Ctrl+C copies the selected rows, with tabs between their cells.
-void prepareList(QTreeView& list, const QString& window);
+///
+/// If the window has more than one list, the keys of each must be `Qt::WidgetShortcut`, for the list with the focus.
+void prepareList(QTreeView& list, const QString& window, Qt::ShortcutContext keysOf = Qt::WindowShortcut);
 
 /// Adds a context menu with the visible ones of these buttons, and with "Copy".
 void addListMenu(QTreeView& list, const QString& window, const QList<QPushButton*>& buttons);

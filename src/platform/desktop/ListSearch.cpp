@@ -1,11 +1,11 @@
-#include "messagelist/ListSearch.h"
+#include "platform/desktop/ListSearch.h"
 
 #include <QAbstractItemView>
 #include <QCoreApplication>
 #include <QKeyEvent>
 #include <QLineEdit>
 
-namespace kest {
+namespace kest::desktop {
 
 ListSearch::ListSearch(QAbstractItemView& searchedList, QLineEdit& searchField)
     : QObject(&searchedList), list(searchedList), field(searchField)
@@ -58,4 +58,4 @@ bool ListSearch::keyInField(QKeyEvent& key)
     }
 }
 
-}  // namespace kest
+}  // namespace kest::desktop

@@ -7,7 +7,7 @@ class QAbstractItemView;
 class QKeyEvent;
 class QLineEdit;
 
-namespace kest {
+namespace kest::desktop {
 
 /// Text typed in the list goes into the field. In the field, the arrow and page keys move through the list and Enter
 /// gives the list the focus. Escape in either clears the field; if the field is empty, Escape works as usual.
@@ -28,4 +28,4 @@ private:
     QLineEdit& field;
 };
 
-}  // namespace kest
+}  // namespace kest::desktop

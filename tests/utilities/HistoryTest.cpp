@@ -1,0 +1,114 @@
+// The history window answers what a service person asks first: who changed this, and from what to what?
+#include "base/Journal.h"
+#include "platform/script/Gestures.h"
+#include "support/Hands.h"
+#include "support/Shop.h"
+#include "utilities/frmUtilities.h"
+
+#include <QTreeWidget>
+
+namespace gestures = desktop::gestures;
+
+struct History : Shop {
+    History()
+    {
+        quote("500").set("excess", 250).claim("C1");
+        quote("500", 1).set("excess", 10);
+        quote("501").set("excess", 1);
+    }
+
+    static void change(const char* file, const QStringList& assignments, const char* where)
+    {
+        journal::Operation operation(journal::Kind::Load, QString::fromLatin1(file));
+        for (const QString& assignment : assignments)
+            gConn->execute(u"UPDATE QUOTE1 SET "_s + assignment + u" WHERE "_s + QString::fromLatin1(where));
+        operation.end(journal::State::Done);
+    }
+
+    /// Opens the window from the utilities of quote 500 and operates it.
+    static void open(const test::Hands::Work& work)
+    {
+        int seen = 0;
+        const test::Hands hands(
+            {{u"frmUtilities"_s, [](QDialog& window) { control<QPushButton>(window, "cmdHistory").click(); }},
+             {u"frmHistory"_s, [&](QDialog& window) {
+                  ++seen;
+                  work(window);
+              }}});
+        frmUtilities::ShowForm(u"500"_s, u"0"_s);
+        EXPECT_EQ(seen, 1);
+    }
+
+    /// Returns the visible texts of some columns, a line for each row.
+    static std::string rows(QDialog& window, const char* list, std::initializer_list<int> columns)
+    {
+        QString told;
+        const auto& tree = control<QTreeWidget>(window, list);
+        for (int i = 0; i < tree.topLevelItemCount(); ++i) {
+            const QTreeWidgetItem* row = tree.topLevelItem(i);
+            QStringList cells;
+            for (const int column : columns)
+                cells.append(row->text(column));
+            if (!row->isHidden())
+                told += cells.join(u' ').toUpper() + u'\n';
+        }
+        return told.toStdString();
+    }
+    static std::string operations(QDialog& window) { return rows(window, "ListView1", {3, 4}); }
+    static std::string changes(QDialog& window) { return rows(window, "ListView2", {0, 1, 3, 4, 5}); }
+    static std::string status(QDialog& window) { return control<QLabel>(window, "lblStatus").text().toStdString(); }
+};
+
+TEST_F(History, FindsWhoChangedAColumnFromWhatToWhat)
+{
+    change("a.xml", {u"excess=400"_s, u"CLAIM='C2'"_s}, "QTNNO='500' AND SUBQUOTE='0'");
+    change("b.xml", {u"CLAIM='C3'"_s}, "QTNNO='500' AND SUBQUOTE='0'");
+    change("c.xml", {u"CLAIM='C4'"_s}, "QTNNO='500' AND SUBQUOTE='1'");
+    change("d.xml", {u"excess=2"_s}, "QTNNO='501'");
+    open([](QDialog& window) {
+        EXPECT_EQ(operations(window), "LOAD OF C.XML DONE\nLOAD OF B.XML DONE\nLOAD OF A.XML DONE\n");
+        EXPECT_EQ(status(window), "3 operations");
+        auto& find = control<QLineEdit>(window, "txtFind");
+        find.setText(u"Excess"_s);
+        EXPECT_EQ(operations(window), "LOAD OF A.XML DONE\n");
+        EXPECT_EQ(changes(window), "QUOTE1 UPDATE EXCESS \"250\" \"400\"\n") << "only what was looked for";
+        EXPECT_EQ(status(window), "1 of 3 operations");
+        find.setText(u"a.xml"_s);
+        EXPECT_EQ(changes(window), "QUOTE1 UPDATE EXCESS \"250\" \"400\"\nQUOTE1 UPDATE CLAIM \"C1\" \"C2\"\n")
+            << "all that the operation changed, in its order";
+        dropConnection();
+        find.setText(u"b.xml"_s);
+        EXPECT_EQ(changes(window), "QUOTE1 UPDATE CLAIM \"C2\" \"C3\"\n");
+        find.setText(u"nothing"_s);
+        EXPECT_EQ(operations(window) + changes(window), "");
+        find.clear();
+        EXPECT_EQ(changes(window).substr(0, 19), "QUOTE1 UPDATE CLAIM") << "the newest is chosen again";
+    });
+}
+
+TEST_F(History, SortsTheListThatHasTheFocus)
+{
+    for (int number = 1; number <= 10; ++number)  // as texts, 10 would come before 9
+        change(number == 1 ? "a.xml" : "b.xml", {u"CLAIM='N%1', excess=%1"_s.arg(number)}, "QTNNO='500'");
+    open([](QDialog& window) {
+        const auto first = [&] { return operations(window).substr(0, 18); };
+        control<QTreeWidget>(window, "ListView1").setFocus();
+        for (const auto key : {Qt::Key_1, Qt::Key_2}) {
+            gestures::press(window, Qt::CTRL | key);
+            EXPECT_EQ(first(), "LOAD OF A.XML DONE");
+            gestures::press(window, Qt::CTRL | key);
+            EXPECT_EQ(first(), "LOAD OF B.XML DONE");
+        }
+        const std::string before = changes(window);
+        control<QTreeWidget>(window, "ListView2").setFocus();
+        gestures::press(window, Qt::CTRL | Qt::Key_4);
+        gestures::press(window, Qt::CTRL | Qt::Key_4);
+        EXPECT_EQ(first(), "LOAD OF B.XML DONE");
+        EXPECT_NE(changes(window), before);
+    });
+}
+
+TEST_F(History, SaysWhyItIsEmpty)
+{
+    open([](QDialog& window) { EXPECT_EQ(status(window), "Nothing is recorded for quote 500."); });
+}
