@@ -2,6 +2,8 @@
 #include "platform/database/Change.h"
 #include "platform/database/RecordsetData.h"
 
+#include <QDateTime>
+
 #include <algorithm>
 #include <cmath>
 

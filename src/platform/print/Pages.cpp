@@ -34,7 +34,7 @@ constexpr double gap = 6;           // points between the body and header or foo
 constexpr double pointsPerInch = 72;
 constexpr double leastRoom = 36;  // points that the body needs on a page: three lines
 constexpr int deepestTable = 8;
-constexpr qint64 largestResource = 16 * 1024 * 1024;  // bytes
+constexpr qint64 largestResource = qint64{16} * 1024 * 1024;  // bytes
 
 double heightOf(const QTextDocument& document)
 {
