@@ -6,9 +6,9 @@ struct Shape : Databases {};
 TEST_P(Shape, EachStatementMeansItsOwnValues)
 {
     connection->execute(
-        u"INSERT INTO LINE (CODE, SEQ, flag, day) VALUES ('A', 0, 0, '2026-02-28 00:00:00'), ('O''Neil', 1, 1, "
-        u"'2026-03-01 00:00:00'), "
-        "('?', 2, 1, NULL), ('Ab 5%', NULL, 0, NULL)"_s);
+        u"INSERT INTO LINE (CODE, SEQ, flag, day) VALUES ('A', 0, 0, %1), ('O''Neil', 1, 1, %2), "
+        "('?', 2, 1, NULL), ('Ab 5%', NULL, 0, NULL)"_s.arg(stored(u"2026-02-28"_s, u"00:00:00"_s),
+                                                            stored(u"2026-03-01"_s, u"00:00:00"_s)));
     const std::pair<QString, int> rows[] = {
         {u"CODE='A'"_s, 1},
         {u"CODE='O''Neil'"_s, 1},

@@ -20,8 +20,8 @@ struct TakeBackOn : Databases {
     TakeBackOn()
     {
         for (const QString& statement :
-             {u"INSERT INTO LINE (CODE, SEQ, amount, flag, day, notes) VALUES ('A', 1, 0.1, 1, '2026-10-25 02:30:00', "
-              "'O''Brien \\ says')"_s,
+             {u"INSERT INTO LINE (CODE, SEQ, amount, flag, day, notes) VALUES ('A', 1, 0.1, 1, %1, "
+              "'O''Brien \\ says')"_s.arg(stored(u"2026-10-25"_s, u"02:30:00"_s)),
               u"INSERT INTO LINE (CODE, SEQ, amount) VALUES ('', NULL, NULL)"_s,
               u"INSERT INTO CAR (REGO, owner) VALUES ('ABC1', 'Ada')"_s,
               u"INSERT INTO Tints (Code, Script) VALUES ('R', 'Red')"_s})

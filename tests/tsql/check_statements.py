@@ -20,7 +20,7 @@ from translation import tokens_of  # noqa: E402
 NOT_CHECKED = re.compile(r"sp_datatype_info\w* 1|SET LOCK_TIMEOUT -?1|KILL 1", re.I)
 
 FUNCTIONS = {"COUNT", "MAX", "SCOPE_IDENTITY", "OBJECT_ID", "OBJECT_NAME", "COL_NAME", "COLUMNPROPERTY", "DB_NAME",
-             "DATABASEPROPERTYEX", "SESSIONPROPERTY", "SCHEMA_NAME"}
+             "DATABASEPROPERTYEX", "SESSIONPROPERTY", "SCHEMA_NAME", "CHARINDEX", "LEFT"}
 BEFORE_PARENTHESIS = {"IN", "VALUES", "AND", "OR", "NOT", "WHERE", "FROM", "ON", "EXISTS", "AS", "SELECT", "NVARCHAR",
                       "WITH"}
 
@@ -47,7 +47,7 @@ def broken_literal(literal, statement):
     value = literal[literal.index("'") + 1:-1]
     if not value.isascii() and literal[0] != "N":
         return "a literal with letters outside of ASCII lacks its N"
-    if value.isascii() and literal[0] == "N" and not re.match(r"DECLARE|EXEC", statement, re.I):
+    if value.isascii() and literal[0] == "N" and not re.search(r"^DECLARE|^EXEC| FROM sys\.", statement, re.I):
         return "the N of an ASCII literal costs the index"
     if re.match(r"\d{4}-\d\d-\d\d(?!T\d\d:\d\d)", value):
         return "a date lacks its T"
