@@ -134,7 +134,7 @@ void frmMessageList::fill()
         hooks.progress = [&](qint64 done, qint64 total) {
             if (progress.isShown())
                 lblStatus->tell(what);
-            isStopped = !progress.step(done, total);
+            isStopped = !progress.step(done, total) && done < total;
             return !isStopped;
         };
         try {
@@ -150,7 +150,8 @@ void frmMessageList::fill()
     QStringList settled;
     for (const recovery::Settled& operation : recovery::takeSettled())
         settled.append(operation.sentence());
-    lblStatus->tell(settled.isEmpty() ? status() : settled.join(u' '));
+    settled.append(status());
+    lblStatus->tell(settled.join(u' '));
     cmdHeld->setText(u"%1 held back (F4)"_s.arg(heldBack.size()));
     cmdHeld->setShortcut(Qt::Key_F4);  // a new text takes the key away
     cmdHeld->setVisible(!heldBack.isEmpty());

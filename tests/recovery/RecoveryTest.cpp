@@ -8,6 +8,8 @@
 #include "platform/RuntimeError.h"
 #include "recovery/Recovery.h"
 
+#include <QLabel>
+
 namespace kest::test {
 
 using namespace Qt::StringLiterals;
@@ -195,6 +197,17 @@ TEST_F(Interrupted, TheUserIsToldWhatBecameOfIt)
                     }));
     recovery::settle();
     EXPECT_TRUE(recovery::takeSettled().isEmpty());
+}
+
+TEST_F(Interrupted, TheListTellsWhatWasSettledBesideItsMessages)
+{
+    arrive("m.xml", adjustedQuote("500"));
+    EXPECT_TRUE(interrupt(16, [] { loadAsTheWindow(u"m.xml"_s); }));
+    frmMessageList window;
+    window.openUnread();
+    const QString line = window.findChild<QLabel*>(u"lblStatus"_s)->text();
+    EXPECT_TRUE(line.startsWith(u"The load of m.xml was interrupted"_s) && line.endsWith(u" No unread messages"_s))
+        << line;
 }
 
 TEST_F(Interrupted, AReportThatNobodySawIsTold)
