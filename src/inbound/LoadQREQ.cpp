@@ -108,7 +108,7 @@ bool chooseInsurer(db::Recordset& insurer)
     return true;
 }
 
-/// Opens the customer of the car or, if it has none, the one of that name. If there is neither, adds a new row.
+/// Opens the customer of the car or, if it has none, the one of that name. If there is neither, it is empty.
 db::Recordset openCustomer(const db::Recordset& car, const Request& request)
 {
     db::Recordset customer(gConn);
@@ -176,6 +176,32 @@ void fillNewCar(db::Recordset& car, const Request& request, const db::Recordset&
                     });
     if (!request.cylinders.isEmpty())
         car.set(u"CYLINDERS"_s, SafeVal(request.cylinders, u"0"_s));
+}
+
+/// Fills the car and the customer of a request, adding those that the shop does not have. Returns the customer. Stores
+/// only the mark of a known car.
+db::Recordset fillCarAndCustomer(db::Recordset& car, const Request& request, const db::Recordset& model,
+                                 db::Recordset& colours)
+{
+    const bool carFound = !car.eof();
+    if (carFound) {
+        car.set(u"KEST"_s, 1);
+        car.update();
+    }
+    db::Recordset customer = openCustomer(car, request);
+    if (customer.eof()) {
+        customer.addNew();
+        fillCustomer(customer, request);
+    }
+    if (carFound) {
+        respellColour(car, colours);
+    } else {
+        car.addNew();
+        fillNewCar(car, request, model, colours);
+    }
+    if (car.isNull(u"PAINT_GP"_s))
+        throw RuntimeError(NullValue, u"The column PAINT_GP of the car %1 is Null."_s.arg(request.rego));
+    return customer;
 }
 
 void fillQuote(db::Recordset& quote, const QString& quoteNumber, const Request& request, const db::Recordset& insurer,
@@ -299,31 +325,12 @@ bool LoadQREQ(QString& text, const QString& fileName)
     quote.addNew();
     // before the first update, so that a text that is too long is refused before anything is stored
     fillQuote(quote, quoteNumber, request, insurer, cinfo);
-    const bool carFound = !car.eof();
-    if (carFound) {
-        car.set(u"KEST"_s, 1);
-        car.update();
-    }
-    db::Recordset customer = openCustomer(car, request);
-    const bool customerFound = !customer.eof();
-    if (!customerFound)
-        customer.addNew();
-    if (!carFound)
-        car.addNew();
+    db::Recordset customer = fillCarAndCustomer(car, request, model, colours);
+    quote.set(u"paint_rate"_s, insurer.value(car.text(u"PAINT_GP"_s) + u"_RATE"_s));
     if (notes.eof())
         notes.addNew();
-
     setColumns(notes, {{"QTNNO"_L1, quoteNumber}, {"Subquote"_L1, 0}});
     applyTransition(quoteRequested, quote, notes);
-    if (!customerFound)
-        fillCustomer(customer, request);
-    if (carFound)
-        respellColour(car, colours);
-    else
-        fillNewCar(car, request, model, colours);
-    if (car.isNull(u"PAINT_GP"_s))
-        throw RuntimeError(NullValue, u"The column PAINT_GP of the car %1 is Null."_s.arg(request.rego));
-    quote.set(u"paint_rate"_s, insurer.value(car.text(u"PAINT_GP"_s) + u"_RATE"_s));
 
     customer.update();
     car.set(u"CUST_ID"_s, customer.value(u"CUST_ID"_s));  // a new customer gets its number from the update
