@@ -34,6 +34,7 @@
 #include <QPushButton>
 #include <QRadioButton>
 #include <QScopedValueRollback>
+#include <QShortcut>
 #include <QThread>
 #include <QTimer>
 #include <QToolButton>
@@ -54,13 +55,45 @@ const QLocale& written()
 
 }  // namespace
 
-frmMessageList::frmMessageList() : Form(u"frmMessageList"_s, u"KEST Messages"_s)
+frmMessageList::frmMessageList() : Form(u"frmMessageList"_s, u"KEST Messages"_s), MessageListControls(this)
 {
     setWindowFlag(Qt::WindowMaximizeButtonHint);
     setAcceptDrops(true);
-    buildControls();
-    arrange();
     connectControls();
+}
+
+void frmMessageList::connectControls()
+{
+    for (const MessageFolder folder : messageFolders)
+        on(optionOf(folder), &QRadioButton::clicked, u"Option1_Click"_s, [this, folder] { Option1_Click(folder); });
+    on(ListView1->selectionModel(), &QItemSelectionModel::currentRowChanged, u"ListView1_ItemClick"_s,
+       [this](const QModelIndex& current, const QModelIndex&) {
+           if (current.isValid())
+               ListView1_ItemClick(current.row());
+       });
+    on(ListView1, &QTreeView::doubleClicked, u"ListView1_DblClick"_s, [this] { ListView1_DblClick(); });
+    on(cmdProcess, &QPushButton::clicked, u"cmdProcess_Click"_s, [this] { cmdProcess_Click(); });
+    on(cmdView, &QPushButton::clicked, u"cmdView_Click"_s, [this] { cmdView_Click(); });
+    on(cmdPrint, &QPushButton::clicked, u"cmdPrint_Click"_s, [this] { cmdPrint_Click(); });
+    on(cmdHeld, &QToolButton::clicked, u"cmdHeld_Click"_s, [this] { cmdHeld_Click(); });
+    on(Command1, &QPushButton::clicked, u"Command1_Click"_s, [this] { Command1_Click(); });
+    on(txtFilter, &QLineEdit::returnPressed, u"txtFilter_KeyDown"_s, [this] { Command1_Click(); });
+    on(Command6, &QPushButton::clicked, u"Command6_Click"_s, [this] { Command6_Click(); });
+    on(cmdExit, &QPushButton::clicked, u"cmdExit_Click"_s, [this] { close(); });
+    on(tmrRefresh, &QTimer::timeout, u"tmrRefresh_Timer"_s, [this] { tmrRefresh_Timer(); });
+
+    const auto inList = [this](Qt::Key key) {
+        return new QShortcut(key, ListView1, nullptr, nullptr, Qt::WidgetShortcut);
+    };
+    on(inList(Qt::Key_Delete), &QShortcut::activated, u"Command6_Click"_s, [this] { Command6_Click(); });
+    on(inList(Qt::Key_Return), &QShortcut::activated, u"ListView1_DblClick"_s, [this] { ListView1_DblClick(); });
+    on(txtFind, &QLineEdit::textChanged, u"txtFind_Change"_s, [this] { txtFind_Change(); });
+    on(new QShortcut(Qt::Key_F5, this), &QShortcut::activated, u"Form_KeyRefresh"_s, [this] { Form_KeyRefresh(); });
+    on(new QShortcut(QKeySequence::Paste, this), &QShortcut::activated, u"Form_Paste"_s, [this] { Form_Paste(); });
+    on(new QShortcut(QKeySequence::Find, this), &QShortcut::activated, u"Form_Find"_s, [this] {
+        txtFind->setFocus();
+        txtFind->selectAll();
+    });
 }
 
 void frmMessageList::ShowForm()

@@ -1,31 +1,14 @@
 // The window that lists the messages of the three folders.
 #pragma once
 
+#include "messagelist/MessageListControls.h"
 #include "messagelist/Summary.h"
 #include "platform/desktop/Form.h"
 
-#include <array>
-
-class QGroupBox;
-class QLabel;
-class QLineEdit;
-class QProgressBar;
-class QPushButton;
-class QRadioButton;
-class QTimer;
-class QToolButton;
-class QTreeView;
-
-namespace kest::desktop {
-class StatusLine;
-}
-
 namespace kest {
 
-class MessageListModel;
-
 /// Lists the unread, read or sent messages, and loads, reprints, shows or deletes the selected one.
-class frmMessageList final : public desktop::Form {
+class frmMessageList final : public desktop::Form, private MessageListControls {
     Q_OBJECT
 public:
     frmMessageList();
@@ -81,10 +64,6 @@ private:
     void Form_KeyRefresh();
     void Form_Paste();
 
-    QRadioButton* optionOf(MessageFolder folder) const { return Option1[static_cast<size_t>(folder)]; }
-    void buildControls();
-    void arrange();
-    void fitColumns();
     void connectControls();
     void fill();
     QString status() const;
@@ -95,28 +74,6 @@ private:
     QString selectedFile() const;
     void choose(int row);
     bool select(const QString& file);
-
-    std::array<QRadioButton*, 3> Option1;
-    QGroupBox* Frame1;
-    QGroupBox* Frame2;
-    QLabel* Label1;
-    QLineEdit* txtFilter;
-    QPushButton* Command1;
-    QLineEdit* txtFind;
-    QTreeView* ListView1;
-    MessageListModel* messages;
-    desktop::StatusLine* lblStatus;
-    QToolButton* cmdHeld;
-    QProgressBar* prgFill;
-    QPushButton* cmdProcess;
-    QPushButton* cmdView;
-    QPushButton* cmdPrint;
-    QPushButton* Command6;
-    QPushButton* cmdExit;
-    QTimer* tmrRefresh;
-
-    int around = 0;            // pixels that the window needs beside the columns
-    QList<int> fittedColumns;  // their widths, as long as the user has chosen no others
 
     QString sCurFile;  // the file clicked last
     MessageFolder iFolder = MessageFolder::Unread;

@@ -1,11 +1,13 @@
-// The list window's controls, its layout and the connections of its events.
+#include "messagelist/MessageListControls.h"
+
 #include "messagelist/MessageListModel.h"
-#include "messagelist/frmMessageList.h"
+#include "platform/desktop/Form.h"
 #include "platform/desktop/ListSearch.h"
 #include "platform/desktop/Lists.h"
 #include "platform/desktop/StatusLine.h"
 #include "platform/desktop/Window.h"
 
+#include <QDialog>
 #include <QGroupBox>
 #include <QHBoxLayout>
 #include <QHeaderView>
@@ -16,7 +18,6 @@
 #include <QRadioButton>
 #include <QScreen>
 #include <QScrollBar>
-#include <QShortcut>
 #include <QTimer>
 #include <QToolButton>
 #include <QTreeView>
@@ -61,7 +62,15 @@ Control* named(Control* control, const QString& name, const QString& tip = {})
 
 }  // namespace
 
-void frmMessageList::buildControls()
+MessageListControls::MessageListControls(QDialog* owner) : form(*owner)
+{
+    buildFolders();
+    buildList();
+    buildActions();
+    arrange();
+}
+
+void MessageListControls::buildFolders()
 {
     Frame1 = named(new QGroupBox, u"Frame1"_s);
     Frame1->setAccessibleName(u"Folder"_s);
@@ -81,7 +90,10 @@ void frmMessageList::buildControls()
     place.setRetainSizeWhenHidden(true);  // so that nothing moves when it appears
     Frame2->setSizePolicy(place);
     Frame2->setVisible(false);
+}
 
+void MessageListControls::buildList()
+{
     txtFind =
         named(new QLineEdit, u"txtFind"_s, u"Show the rows with this text in any column; or just type in the list"_s);
     txtFind->setAccessibleName(u"Find"_s);
@@ -91,10 +103,10 @@ void frmMessageList::buildControls()
 
     ListView1 = named(new QTreeView, u"ListView1"_s);
     ListView1->setAccessibleName(u"Messages"_s);
-    messages = new MessageListModel(this);
+    messages = new MessageListModel(&form);
     ListView1->setModel(messages);
     ListView1->setSelectionMode(QAbstractItemView::ExtendedSelection);  // for copying; the buttons use the current row
-    desktop::prepareList(*ListView1, objectName());
+    desktop::prepareList(*ListView1, form.objectName());
     ListView1->header()->setSortIndicatorClearable(true);  // back to the order of the folder
     new desktop::ListSearch(*ListView1, *txtFind);
 
@@ -106,22 +118,25 @@ void frmMessageList::buildControls()
     prgFill = named(new QProgressBar, u"prgFill"_s);
     prgFill->setAccessibleName(u"Progress"_s);
     prgFill->setVisible(false);
+}
 
+void MessageListControls::buildActions()
+{
     cmdProcess = named(new QPushButton(u"&Load"_s), u"cmdProcess"_s, u"Load the message into the quotes"_s);
     cmdPrint = named(new QPushButton(u"Re&print"_s), u"cmdPrint"_s, u"Show the message's report"_s);
     cmdPrint->setVisible(false);
     cmdView = named(new QPushButton(u"&View"_s), u"cmdView"_s, u"Show the message's text"_s);
     Command6 = named(new QPushButton(u"&Delete"_s), u"Command6"_s, u"Remove the message's file (Del)"_s);
-    cmdExit = desktop::exitButton(this, u"cmdExit"_s, u"Close (Esc)"_s);
-    desktop::addListMenu(*ListView1, objectName(), {cmdProcess, cmdPrint, cmdView, Command6});
+    cmdExit = desktop::exitButton(&form, u"cmdExit"_s, u"Close (Esc)"_s);
+    desktop::addListMenu(*ListView1, form.objectName(), {cmdProcess, cmdPrint, cmdView, Command6});
 
-    tmrRefresh = new QTimer(this);
+    tmrRefresh = new QTimer(&form);
     tmrRefresh->setObjectName(u"tmrRefresh"_s);
     tmrRefresh->setSingleShot(true);
     tmrRefresh->setInterval(refreshDelay);
 }
 
-void frmMessageList::arrange()
+void MessageListControls::arrange()
 {
     auto* options = new QHBoxLayout(Frame1);
     for (QRadioButton* option : Option1)
@@ -150,7 +165,7 @@ void frmMessageList::arrange()
     bottom->addStretch();
     bottom->addWidget(cmdExit);
 
-    auto* all = new QVBoxLayout(this);
+    auto* all = new QVBoxLayout(&form);
     const int margin = desktop::pixels(listMargin);
     all->setContentsMargins(margin, margin, margin, margin);
     all->addLayout(top);
@@ -161,20 +176,20 @@ void frmMessageList::arrange()
     const QList<QWidget*> order{Option1[0], Option1[1], Option1[2], txtFilter, Command1, ListView1, cmdHeld,
                                 txtFind,    cmdProcess, cmdPrint,   cmdView,   Command6, cmdExit};
     for (qsizetype i = 1; i < order.size(); ++i)
-        setTabOrder(order[i - 1], order[i]);
+        QWidget::setTabOrder(order[i - 1], order[i]);
     ListView1->setFocus();
 
     around = 2 * margin + ListView1->verticalScrollBar()->sizeHint().width() + 2 * ListView1->frameWidth();
     int width = around;
     for (const int column : columnWidths)
         width += desktop::pixels(column);
-    resize(QSize(width, desktop::pixels(openingHeight)).boundedTo(screen()->availableSize()));
+    form.resize(QSize(width, desktop::pixels(openingHeight)).boundedTo(form.screen()->availableSize()));
     fitColumns();
 }
 
 // In a window that is too narrow for the columns, all of them get narrower, the widest ones most: a long text has a
 // tool tip. Columns whose width the user has chosen stay.
-void frmMessageList::fitColumns()
+void MessageListControls::fitColumns()
 {
     QHeaderView* header = ListView1->header();
     const auto sizes = [header] {
@@ -189,7 +204,7 @@ void frmMessageList::fitColumns()
     for (const int column : columnWidths)
         widths.append(desktop::pixels(column));
     const int all = std::accumulate(widths.begin(), widths.end(), 0);
-    const int room = qMin(width() - around, all);
+    const int room = qMin(form.width() - around, all);
     int longestCaption = header->minimumSectionSize();
     for (int i = 0; i < header->count(); ++i) {
         const int caption = qMax(header->sectionSizeHint(i), header->minimumSectionSize());
@@ -202,40 +217,6 @@ void frmMessageList::fitColumns()
     for (int i = 0; i < header->count(); ++i)
         header->resizeSection(i, widths[i]);
     fittedColumns = sizes();
-}
-
-void frmMessageList::connectControls()
-{
-    for (const MessageFolder folder : messageFolders)
-        on(optionOf(folder), &QRadioButton::clicked, u"Option1_Click"_s, [this, folder] { Option1_Click(folder); });
-    on(ListView1->selectionModel(), &QItemSelectionModel::currentRowChanged, u"ListView1_ItemClick"_s,
-       [this](const QModelIndex& current, const QModelIndex&) {
-           if (current.isValid())
-               ListView1_ItemClick(current.row());
-       });
-    on(ListView1, &QTreeView::doubleClicked, u"ListView1_DblClick"_s, [this] { ListView1_DblClick(); });
-    on(cmdProcess, &QPushButton::clicked, u"cmdProcess_Click"_s, [this] { cmdProcess_Click(); });
-    on(cmdView, &QPushButton::clicked, u"cmdView_Click"_s, [this] { cmdView_Click(); });
-    on(cmdPrint, &QPushButton::clicked, u"cmdPrint_Click"_s, [this] { cmdPrint_Click(); });
-    on(cmdHeld, &QToolButton::clicked, u"cmdHeld_Click"_s, [this] { cmdHeld_Click(); });
-    on(Command1, &QPushButton::clicked, u"Command1_Click"_s, [this] { Command1_Click(); });
-    on(txtFilter, &QLineEdit::returnPressed, u"txtFilter_KeyDown"_s, [this] { Command1_Click(); });
-    on(Command6, &QPushButton::clicked, u"Command6_Click"_s, [this] { Command6_Click(); });
-    on(cmdExit, &QPushButton::clicked, u"cmdExit_Click"_s, [this] { close(); });
-    on(tmrRefresh, &QTimer::timeout, u"tmrRefresh_Timer"_s, [this] { tmrRefresh_Timer(); });
-
-    const auto inList = [this](Qt::Key key) {
-        return new QShortcut(key, ListView1, nullptr, nullptr, Qt::WidgetShortcut);
-    };
-    on(inList(Qt::Key_Delete), &QShortcut::activated, u"Command6_Click"_s, [this] { Command6_Click(); });
-    on(inList(Qt::Key_Return), &QShortcut::activated, u"ListView1_DblClick"_s, [this] { ListView1_DblClick(); });
-    on(txtFind, &QLineEdit::textChanged, u"txtFind_Change"_s, [this] { txtFind_Change(); });
-    on(new QShortcut(Qt::Key_F5, this), &QShortcut::activated, u"Form_KeyRefresh"_s, [this] { Form_KeyRefresh(); });
-    on(new QShortcut(QKeySequence::Paste, this), &QShortcut::activated, u"Form_Paste"_s, [this] { Form_Paste(); });
-    on(new QShortcut(QKeySequence::Find, this), &QShortcut::activated, u"Form_Find"_s, [this] {
-        txtFind->setFocus();
-        txtFind->selectAll();
-    });
 }
 
 }  // namespace kest
