@@ -61,20 +61,6 @@ struct Loopback : Shop {
     std::optional<app::Transport> transport;
 };
 
-TEST_F(Loopback, ASentQuoteIsAnswered)
-{
-    ASSERT_TRUE(send());
-    const QString document = files::read(gsUnsentPath + u"1004.0_1.xml"_s);
-    EXPECT_EQ(carried(), "out 1004.0_1.xml, in R_1004_0_600002.xml");
-    EXPECT_EQ(in(gsUnsentPath), "");
-    EXPECT_EQ(files::read(gsSentPath + u"1004.0_1.xml"_s), document);
-
-    EXPECT_EQ(listed(), QStringList());
-    EXPECT_EQ(quote("1004").state(),
-              "3 locked 600002 (today : Submitted KEST Quote) (01/02/2008 : Responded Quote Request)");
-    EXPECT_EQ(carried(), "") << "a second carry has nothing to do";
-}
-
 TEST_F(Loopback, OneLivingTransportWorksOnTheFolders)
 {
     for (const QString& leftOver : {u""_s, u"1\nkest2\nanother-machine\n"_s}) {

@@ -28,14 +28,6 @@ TEST_F(Sending, ARefusalChangesNothing)
     EXPECT_EQ(shown(), "[critical] Please Select a Make and Model for this car");
 }
 
-TEST_F(Sending, AMainQuoteOfARequestIsLocked)
-{
-    sendable().request("QR1", "2").note("Active Quote Request");
-    EXPECT_EQ(send("500"), 110);
-    EXPECT_EQ(shown(), "[information] Quote Sent.");
-    EXPECT_EQ(quote("500").state(), "3 locked - (today : Sending KEST Quote) (01/02/2008 : Responded Quote Request)");
-}
-
 TEST_F(Sending, ASupplementaryQuoteGoesInPlaceOfItsMainQuote)
 {
     sendable().quoteNumber("KQ7").locked(true).set("INSURER_ID", 99);
