@@ -80,20 +80,6 @@ TEST_F(Preview, WhatCannotBeShownEndsInSilenceButAnUnknownNumber)
     EXPECT_EQ(shownReports() + shown(), "");
 }
 
-TEST_F(Preview, NoTemplateKeepsTheLayoutBusyForEver)
-{
-    const auto print = [&](const QByteArray& body) {
-        putTemplate("test.html", "<body>" + body + "</body>");
-        return failureOf(
-            [&] { report::writePdf(report::Report(u"c:\\wirra32\\report\\test.html"_s), root() + u"/out.pdf"_s); });
-    };
-    const QByteArray open = "<table><tr><td>";
-    const QByteArray close = "</td></tr></TABLE>";
-    EXPECT_EQ(print(open.repeated(30) + 'x' + close.repeated(30)), TypeMismatch);
-    EXPECT_EQ(print(QByteArray(open + close).repeated(30)), 0) << "only tables within tables count";
-    EXPECT_EQ(print("<p style='background-image: url(file:///dev/zero)'><img src='file:///dev/zero'>x</p>"), 0);
-}
-
 TEST_F(Preview, EachPreviewIsKeptInTheFolderOfReports)
 {
     const QString folder = root() + u"/out/deep"_s;
@@ -174,26 +160,6 @@ TEST_F(Preview, ALayoutWithoutRoomIsAFailureThatIsTold)
     putTemplate("720.html", "<title>T</title><body><header>" + tall + "</header><p>x</p></body>");
     show(720);
     EXPECT_NE(shown().find("The report \"T\" does not fit on this paper"), std::string::npos);
-}
-
-TEST_F(Preview, ADamagedTemplateShowsWhatIsLeftOfItOrNothing)
-{
-    const QByteArray whole = files::readBytes(u"c:\\wirra32\\report\\720.html"_s);
-    const QByteArray pieces[] = {QByteArray(1, '\0'), "{{", "}}", "<", ">", "</template>", "\xff"};
-    for (qsizetype i = 1; i < 20; ++i) {
-        const qsizetype at = whole.size() * i / 20;
-        putTemplate("720.html", whole.first(at));
-        show(720);
-        putTemplate("720.html", whole.first(at) + pieces[i % std::size(pieces)] + whole.sliced(at));
-        show(720);
-    }
-    QByteArray fragments;
-    for (int i = 0; i < 40; ++i)
-        fragments += "<template id=\"f" + QByteArray::number(i) + "\">" +
-                     ("{{>f" + QByteArray::number(i + 1) + "}}").repeated(9) + "</template>";
-    putTemplate("720.html", "<body>{{>f0}}" + fragments + "</body>");
-    show(720);
-    EXPECT_EQ(shown(), "");
 }
 
 TEST_F(Preview, APdfThatCannotBeWrittenWholeIsNotThere)
