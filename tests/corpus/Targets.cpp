@@ -6,6 +6,7 @@
 #include "loopback/InsurerRules.h"
 #include "messages/Envelope.h"
 #include "messages/Folders.h"
+#include "messages/MessageTypes.h"
 #include "outbound/QuoteImages.h"
 #include "platform/files/CodePage.h"
 #include "platform/print/Pages.h"
@@ -128,7 +129,7 @@ std::optional<QString> messageIn(QByteArray input)
     return {};
 }
 
-/// Loads messages into a shop with a quote that is theirs and one that is not.
+/// Loads messages into a shop with a quote that is theirs and others that are not.
 class LoadTarget final : public ShopTarget {
 public:
     LoadTarget()
@@ -149,25 +150,34 @@ public:
             return;
         newDesktop();
         arrive(message, *text);
-        const bool taken = loadAsTheWindow(message);
-        if (!taken)
+        const bool isTaken = loadAsTheWindow(message);
+        if (!isTaken)
             files::remove(gsUnreadPath + message);
+        const QString code = text->section(u"messageType>"_s, 1, 1).section(u'<', 0, 0).toUpper();
+        const bool isOfKnownType = findMessageType(code) != nullptr;  // no other is told of
+        require(isTaken || !isOfKnownType || !desktop->boxes().isEmpty(), "a refusal has a box");
         const std::string now = holdings();
         if (now == held)
             return;
         before->restore();
+        const bool isMerged = code == "AUQT"_L1 || code == "MANQ"_L1;  // lines before the one that fails stay
+        require(isTaken || isMerged || withoutCarMark(now) == withoutCarMark(held), "a refusal changes nothing");
         if (!text->contains(u"BYSTANDER"_s))
             require(about("BYSTANDER", now) == about("BYSTANDER", held), "a message changes no other quote");
-        for (const QString& file : about("^/", now))
-            require(
-                file.startsWith(u"/wirdoc/A"_s) || file.startsWith(u"/wirdoc/PDF/"_s) || file.startsWith(u"/wirimg/"_s),
-                "a message writes no file elsewhere");
+        require(about("^/", now) == about("^/wir(doc/(A|PDF/)|img/)", now), "a message writes no file elsewhere");
     }
 
 private:
     static QStringList about(const char* what, const std::string& text)
     {
         return QString::fromStdString(text).split(u'\n').filter(QRegularExpression(QString::fromLatin1(what)));
+    }
+
+    /// Returns the rows and files without the mark of a car of the network, the only thing stored before a refusal.
+    static QString withoutCarMark(const std::string& text)
+    {
+        static const QRegularExpression mark(u"^(CAR REGO=.*) KEST=\\S+"_s, QRegularExpression::MultilineOption);
+        return QString::fromStdString(text).replace(mark, u"\\1"_s);
     }
 
     std::optional<Snapshot> before;
