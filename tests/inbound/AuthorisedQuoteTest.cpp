@@ -111,15 +111,6 @@ TEST_F(AuthorisedQuotes, ANoteOfTheRequestIsAddedOnlyWhereItHasOne)
     EXPECT_EQ(rowCount("QUOTE3", "QTNNO='500' AND Subquote=0"), 1);
 }
 
-TEST_F(AuthorisedQuotes, TheDocumentsOfSubletWorkAreShownOnce)
-{
-    EXPECT_TRUE(load(authorisedQuote("500").sublet(4, "I", {{"subletAuthorityDocument", "JVBERi0x"}})));
-    EXPECT_TRUE(load(authorisedQuote("500")));
-    ASSERT_EQ(desktop->record().windows.size(), 1);
-    EXPECT_EQ(desktop->record().windows[0][u"name"_s], u"frmSubletAuth"_s);
-    EXPECT_EQ(desktop->record().windows[0][u"rows"_s][0][0], u"Four wheel alignment"_s);
-}
-
 TEST_F(AuthorisedQuotes, AFailureLeavesWhatWasWrittenBeforeIt)
 {
     const auto expectFailure = [&](const Message& message, const char* told) {
@@ -145,15 +136,4 @@ TEST_F(AuthorisedQuotes, AFailureLeavesWhatWasWrittenBeforeIt)
     EXPECT_TRUE(quote("500").shows("KESTAuthNo=KA1 TOTAL=0"));
     EXPECT_EQ(quote("500").lines(), 2);
     EXPECT_EQ(quote("500").notes(), untouched);
-    // a second load continues from this state
-    EXPECT_TRUE(load(authorisedQuote("500").part(2, "C")));
-    EXPECT_EQ(quote("500").number("TOTAL"), 76);
-    EXPECT_EQ(quote("500").notes(), "(today : Authorised Quote) (01/02/2008 : Won Quote Request)");
-}
-
-TEST_F(AuthorisedQuotes, ACompanyNeedsNoPersonsName)
-{
-    EXPECT_TRUE(load(authorisedQuote("500")
-                         .without("authorisedQuoteClaimCustomer/*")
-                         .set("authorisedQuoteClaimCustomer/companyName", "Fenwick Freight")));
 }

@@ -1,6 +1,8 @@
 #include "base/modLoggerEx.h"
 #include "inbound/modLoadXML.h"
+#include "messagelist/frmMessageList.h"
 #include "platform/files/Background.h"
+#include "platform/xml/FaultInjection.h"
 #include "support/Shop.h"
 
 using Dispatcher = Shop;
@@ -14,6 +16,26 @@ TEST_F(Dispatcher, ABareAmpersandIsRepairedOnce)
     // text that is already escaped is escaped twice
     EXPECT_EQ(quote("500").notes(), "(today : QR Cancelled - sold & gone &amp;amp) (today : Cancelled Quote Request)");
     EXPECT_TRUE(text.contains(u"sold &amp; gone"_s));
+}
+
+TEST_F(Dispatcher, ALoadParsesItsMessageOnce)
+{
+    for (const char* told : {"QREQ quoteRequestNumber=QR9", "QMQR", "RRQT", "QRCN", "BCQR", "ADQT", "AUQT", "ARES",
+                             "BACA", "EWAP", "MANQ", "QTDL"}) {
+        quote("500").request("QR1").quoteNumber("KQ1").line(1).set("qty", 1.0);
+        arrive("m.xml", Message::told(told));
+        frmMessageList window;
+        window.openUnread();
+        int parses = 0;
+        xml::setParseFault([&] {
+            ++parses;
+            return false;
+        });
+        EXPECT_TRUE(window.loadFile(u"m.xml"_s)) << told << shown();
+        xml::setParseFault({});
+        EXPECT_EQ(parses, 1) << told;
+        EXPECT_EQ(filesIn(gsUnreadPath), QStringList()) << told;
+    }
 }
 
 TEST_F(Dispatcher, AMessageThatDoesNotParseIsReportedInFiveLines)

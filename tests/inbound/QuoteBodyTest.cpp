@@ -264,18 +264,3 @@ TEST_F(QuoteBody, WhatIsOddButANumberIsTaken)
     EXPECT_TRUE(line(70000).shows("qty=-2 unitcost=-1000 rrhour=-1250"));
     EXPECT_EQ(line(6).text("script"), "the first of them");
 }
-
-TEST_F(QuoteBody, TenThousandLines)
-{
-    Message message = body();
-    for (int line = 1; line <= 10'000; ++line)
-        message.labour(line, "I");
-    quote("500");
-    if (!shopIsOnServer())
-        gConn->execute(u"BEGIN"_s);  // instead of 20,000 commits
-    EXPECT_TRUE(apply(message));
-    if (!shopIsOnServer())
-        gConn->execute(u"COMMIT"_s);
-    EXPECT_EQ(quote("500").lines(), 10'000);
-    EXPECT_EQ(quote("500").line(10'000).text("itemno"), "999");
-}
