@@ -1,9 +1,7 @@
 // Does one operation of the shop once, in a shop of a chosen size, for `count`, which counts its instructions,
 // statements and calls for files: operations NAME SIZE.
-#include "base/SharedVariables.h"
 #include "messages/Folders.h"
 #include "outbound/SendQuote.h"
-#include "platform/database/Sql.h"
 #include "support/OdbcDrivers.h"
 #include "support/Shop.h"
 
@@ -14,10 +12,6 @@
 #include <functional>
 #include <map>
 #include <string>
-
-using namespace Qt::StringLiterals;
-using namespace kest;
-using namespace kest::test;
 
 /// What is counted. The name is not mangled, so that `count` can give it to valgrind.
 extern "C" __attribute__((noinline)) void measured(const std::function<void()>& operation)
@@ -72,93 +66,76 @@ void measureFill(qsizetype rows)
     measured([&] { expect(listed().size() == rows); });
 }
 
-void fill(Bench& shop, int messages)
+void measureLoad(const QString& text)
 {
-    for (int i = 0; i < messages; ++i)
-        shop.arrive(u"%1.xml"_s.arg(i), quoteRequest(u"QR%1"_s.arg(i)));
-    measureFill(messages);
-}
-
-void waiting(Bench& shop, int messages)
-{
-    for (int i = 0; i < messages; ++i)
-        shop.arrive(u"%1.xml"_s.arg(i), quoteRequest(u"QR%1"_s.arg(i)).images({"1", "2"}));
-    measureFill(0);
-}
-
-void fillFromTables(Bench& shop, int quotes)
-{
-    constexpr int messages = 20;
-    addQuotes(quotes);
-    for (int i = 1; i <= messages; ++i)
-        shop.arrive(u"%1.xml"_s.arg(i), cancellation(u"QR%1"_s.arg(i)));
-    measureFill(messages);
-}
-
-void loadRequest(Bench&, int quotes)
-{
-    addQuotes(quotes);
-    const QString text = quoteRequest("QRNEW").text();
     measured([&] { expect(load(text)); });
 }
 
-void loadManual(Bench&, int quotes)
-{
-    addQuotes(quotes);
-    car("ABC123");
-    addRows("CAR", "REGO, CUST_ID, MODEL_ID", "'XBC' || i, 100 + i, 'C120'", quotes);
-    const QString text = manualQuote("Q5").rego("ABC123").labour(1, "C").text();
-    measured([&] { expect(load(text)); });
-}
-
-void notes(Bench&, int notes)
-{
-    QString chain;
-    for (int i = 0; i < notes; ++i)
-        chain += u"(01/02/2026 : Note %1) "_s.arg(i);
-    quote("500").request("QR1").remarks(chain);
-    const QString text = cancellation("QR1").text();
-    measured([&] { expect(load(text)); });
-}
-
-void loadAuthorised(Bench&, int lines)
-{
-    addLines(lines);
-    Message message = authorisedQuote("500").rego("ABC123");
-    for (int line = 1; line <= lines; ++line)
-        message.labour(line, "C");
-    const QString text = message.text();
-    measured([&] { expect(load(text)); });
-}
-
-void send(Bench&, int lines)
-{
-    addLines(lines);
-    db::Recordset panel(gConn);
-    panel.open(u"SELECT * FROM QUOTE1 WHERE QTNNO='500'"_s);
-    measured([&] { expect(SendQuote(panel) > 0); });
-}
-
-void moveLoaded(Bench&, int readFiles)
-{
-    quote("500").request("QR1");
-    for (int i = 0; i < readFiles; ++i)
-        files::write(gsReadPath + u"%1.0_1.xml"_s.arg(1000 + i), {});
-    files::write(gsUnreadPath + u"in.xml"_s, cancellation("QR1").text());
-    measured([] { MoveMessage(u"in.xml"_s, u"read"_s); });
-    expect(files::exists(gsReadPath + u"500.0_1.xml"_s));
-}
-
-const std::map<std::string, void (*)(Bench&, int)> operations{
-    {"fill", fill},
-    {"waiting", waiting},
-    {"fill-from-tables", fillFromTables},
-    {"load-request", loadRequest},
-    {"load-manual", loadManual},
-    {"notes", notes},
-    {"load-authorised", loadAuthorised},
-    {"send", send},
-    {"move-loaded", moveLoaded},
+/// What is done, in a shop of that size.
+const std::map<std::string, std::function<void(Bench&, int)>> operations{
+    {"fill",
+     [](Bench& shop, int messages) {
+         for (int i = 0; i < messages; ++i)
+             shop.arrive(u"%1.xml"_s.arg(i), quoteRequest(u"QR%1"_s.arg(i)));
+         measureFill(messages);
+     }},
+    {"waiting",
+     [](Bench& shop, int messages) {
+         for (int i = 0; i < messages; ++i)
+             shop.arrive(u"%1.xml"_s.arg(i), quoteRequest(u"QR%1"_s.arg(i)).images({"1", "2"}));
+         measureFill(0);
+     }},
+    {"fill-from-tables",
+     [](Bench& shop, int quotes) {
+         constexpr int messages = 20;
+         addQuotes(quotes);
+         for (int i = 1; i <= messages; ++i)
+             shop.arrive(u"%1.xml"_s.arg(i), cancellation(u"QR%1"_s.arg(i)));
+         measureFill(messages);
+     }},
+    {"load-request",
+     [](Bench&, int quotes) {
+         addQuotes(quotes);
+         measureLoad(quoteRequest("QRNEW").text());
+     }},
+    {"load-manual",
+     [](Bench&, int quotes) {
+         addQuotes(quotes);
+         car("ABC123");
+         addRows("CAR", "REGO, CUST_ID, MODEL_ID", "'XBC' || i, 100 + i, 'C120'", quotes);
+         measureLoad(manualQuote("Q5").rego("ABC123").labour(1, "C").text());
+     }},
+    {"notes",
+     [](Bench&, int notes) {
+         QString chain;
+         for (int i = 0; i < notes; ++i)
+             chain += u"(01/02/2026 : Note %1) "_s.arg(i);
+         quote("500").request("QR1").remarks(chain);
+         measureLoad(cancellation("QR1").text());
+     }},
+    {"load-authorised",
+     [](Bench&, int lines) {
+         addLines(lines);
+         Message message = authorisedQuote("500").rego("ABC123");
+         for (int line = 1; line <= lines; ++line)
+             message.labour(line, "C");
+         measureLoad(message.text());
+     }},
+    {"send",
+     [](Bench&, int lines) {
+         addLines(lines);
+         db::Recordset panel = opened(u"SELECT * FROM QUOTE1 WHERE QTNNO='500'"_s);
+         measured([&] { expect(SendQuote(panel) > 0); });
+     }},
+    {"move-loaded",
+     [](Bench& shop, int readFiles) {
+         quote("500").request("QR1");
+         for (int i = 0; i < readFiles; ++i)
+             files::write(gsReadPath + u"%1.0_1.xml"_s.arg(1000 + i), {});
+         shop.arrive("in.xml", cancellation("QR1"));
+         measured([] { MoveMessage(u"in.xml"_s, u"read"_s); });
+         expect(files::exists(gsReadPath + u"500.0_1.xml"_s));
+     }},
 };
 
 }  // namespace
