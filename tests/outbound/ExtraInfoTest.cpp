@@ -79,12 +79,6 @@ TEST_F(ExtraInformation, ColoursCompleteThemselves)
     }
 }
 
-TEST_F(ExtraInformation, AltAndDownShowsTheColours)
-{
-    show(u"{'key': 'txtColour', 'keys': ['Alt+Down']}, {'read': 'lvColour'}, "_s + completeAndDone);
-    EXPECT_TRUE(desktop->read(u"lvColour"_s, u"visible"_s).toBool());
-}
-
 TEST_F(ExtraInformation, NoTextIsLongerThanItsColumn)
 {
     const QString digits = u"1"_s.repeated(300);

@@ -1,28 +1,17 @@
 // Compares complete quote documents with files. The quote lines come from a file of tests/data/outbound, too.
 #include "Sending.h"
 
-const QString quoteNamespace = u"http://quote3.webservice.orla.example"_s;
-
-/// Reads a quote document with another parser. Returns a line for each element with its depth, name and text. Leaves
-/// out the version of the software, which changes with each release.
-static QStringList readAsXml(const QString& document)
+/// Returns the document with each element on a line of its own, and without the version of the software.
+static std::string byElement(const QString& document)
 {
-    QXmlStreamReader reader(document);
-    QStringList lines;
-    qsizetype depth = 0;
-    while (!reader.atEnd()) {
-        reader.readNext();
-        if (reader.isStartElement()) {
-            lines.append(QString(2 * depth++, u' ') + reader.name().toString() + u": "_s);
-            if (reader.namespaceUri() != quoteNamespace || !reader.attributes().isEmpty())
-                lines.last() += u"(in another namespace or with attributes) "_s;
-        } else if (reader.isEndElement()) {
-            --depth;
-        } else if (reader.isCharacters() && !reader.isWhitespace() && !lines.last().contains("SoftwareVersion"_L1)) {
-            lines.last() += reader.text().toString();
-        }
-    }
-    return lines << reader.errorString();
+    static const QRegularExpression version(u"(SoftwareVersion>)[^<]*"_s);
+    static const QRegularExpression between(u">\\s*<"_s);
+    return QString(document)
+        .remove(u'\r')
+        .replace(version, u"\\1"_s)
+        .replace(between, u">\n<"_s)
+        .trimmed()
+        .toStdString();
 }
 
 struct GoldenDocument : Sending {
@@ -42,11 +31,9 @@ struct GoldenDocument : Sending {
             lines.update();
         }
         EXPECT_DOUBLE_EQ(send(quote.text("QTNNO")), total);
-        const QStringList actual =
-            readAsXml(u"<request xmlns=\"%1\">"_s.arg(quoteNamespace) + outgoing(file) + u"</request>"_s);
-        const QStringList expected = readAsXml(QString::fromUtf8(dataFile("outbound/" + name + ".xml")));
-        for (qsizetype i = 0; i < std::max(actual.size(), expected.size()); ++i)
-            EXPECT_EQ(actual.value(i), expected.value(i)) << name << ", element " << i;
+        const QString document =
+            u"<request xmlns=\"http://quote3.webservice.orla.example\">"_s + outgoing(file) + u"</request>"_s;
+        EXPECT_EQ(byElement(document), byElement(QString::fromUtf8(dataFile("outbound/" + name + ".xml"))));
     }
 };
 
