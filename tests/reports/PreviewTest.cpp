@@ -143,15 +143,18 @@ TEST_F(Preview, ATextIsWholeHoweverLongItIs)
 TEST_F(Preview, ALayoutWithoutRoomIsAFailureThatIsTold)
 {
     const QString pdf = root() + u"/out.pdf"_s;
-    const QByteArray tall = QByteArray("<p>text</p>").repeated(100);
-    for (const QByteArray& body : {"<header>" + tall + "</header><p>x</p>", "<p>x</p><footer>" + tall + "</footer>",
-                                   "<table><thead><tr><th>" + tall + "</th></tr></thead>" +
-                                       QByteArray("<tr><td>x</td></tr>").repeated(200) + "</table>"}) {
+    const auto print = [&](const QByteArray& body) {
         putTemplate("test.html", "<body>" + body + "</body>");
-        const report::Report report(u"c:\\wirra32\\report\\test.html"_s);
-        EXPECT_EQ(failureOf([&] { report::writePdf(report, pdf); }), Overflow) << body.left(20).toStdString();
+        return failureOf([&] { report::writePdf(report::Report(u"c:\\wirra32\\report\\test.html"_s), pdf); });
+    };
+    const QByteArray tall = QByteArray("<p>text</p>").repeated(100);
+    const QByteArray row = "<tr><td>x</td></tr>";
+    for (const QByteArray& body : {"<header>" + tall + "</header><p>x</p>", "<p>x</p><footer>" + tall + "</footer>",
+                                   "<table><thead><tr><th>" + tall + "</th></tr></thead>" + row.repeated(200)}) {
+        EXPECT_EQ(print(body), Overflow) << body.left(20).toStdString();
         EXPECT_FALSE(files::exists(pdf));
     }
+    EXPECT_EQ(print(("<table>" + row + "</table>").repeated(30)), 0) << "only tables within tables have a limit";
     QPdfWriter label(pdf);
     label.setPageSize(QPageSize(QSizeF(62, 29), QPageSize::Millimeter));
     label.setPageMargins(QMarginsF(3, 3, 3, 3), QPageLayout::Millimeter);

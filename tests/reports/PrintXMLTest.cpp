@@ -150,15 +150,8 @@ TEST_F(Printing, EachChangedLineStandsInItsSection)
     addRow("SUBLET", {{"Sublet", 1}, {"Type", "OTH"}});
     report::setOutputFolder(root() + u"/out"_s);
     for (Message message : {authorisedQuote("500"), adjustedQuote("500")}) {
-        message.labour(1, "D").labour(2, "D").sublet(3, "D").part(4, "D").paint(5, "D").part(6, "D");
-        message.labour(86, "D").part(87, "D").paint(88, "D").sublet(89, "D");
-        message.labour(90, "C", {{"labourType", "OTH"}, {"labourGroup", ""}, {"labourDescription", "Labour kept"}});
-        message.labour(91, "I", {{"labourType", ""}, {"labourGroup", "1"}, {"labourDescription", "Labour unknown"}});
-        message.part(92, "I", {{"partDescription", "Parts unknown"}});
-        message.paint(93, "I", {{"paintWorkType", ""}, {"paintGroup", "1"}, {"paintDescription", "Paint unknown"}});
-        message.paint(96, "C", {{"paintWorkType", "BLND"}, {"paintGroup", ""}, {"paintDescription", "Paint bare"}});
-        message.sublet(94, "C", {{"subletType", "OTH"}, {"subletDescription", "Sublet other"}});
-        message.sublet(95, "I", {{"subletType", ""}, {"subletDescription", "Sublet bare"}});
+        for (const auto& [kind, number, indicator, elements] : casesIn<4>("reports/sections.txt"))
+            message.line(kind, number.toInt(), indicator, fieldsIn(elements));
         print(message, false);
     }
     print(adjustedQuote("500"));
