@@ -61,17 +61,6 @@ struct Loopback : Shop {
     std::optional<app::Transport> transport;
 };
 
-TEST_F(Loopback, OneLivingTransportWorksOnTheFolders)
-{
-    for (const QString& leftOver : {u""_s, u"1\nkest2\nanother-machine\n"_s}) {
-        files::write(folders().own + u"KESTWeb.lock"_s, leftOver);
-        app::TransportRunner first(folders(), [](const app::Carry&) {});
-        app::TransportRunner second(folders(), [](const app::Carry&) {});
-        EXPECT_TRUE(first.claim()) << leftOver;
-        EXPECT_FALSE(second.claim());
-    }
-}
-
 TEST_F(Loopback, EachMessageLoads)
 {
     ASSERT_TRUE(send());
