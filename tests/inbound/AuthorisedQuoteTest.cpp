@@ -11,20 +11,6 @@ struct AuthorisedQuotes : Shop {
     }
 };
 
-TEST_F(AuthorisedQuotes, TheHeaderIsWritten)
-{
-    quote("500").set("RR_TOTAL", 44).set("override", 5).set("CONTACTID", 3).set("invoiced", true).set("Type", "OLD");
-    ASSERT_TRUE(load(authorisedQuote("500").request("QR7").claim("8800").quoteNumber("KQ7")));
-    EXPECT_EQ(shown(), "[critical] Matching quote was not found in database, Please contact MarlinDesk Support.");
-    EXPECT_TRUE(quote("500").shows(
-        "KESTQRNo=QR7 KESTQuoteNo=KQ7 KESTAuthNo=KA1 Claim=8800 REGO=ABC123 assess=Whitby, Morgan Lee AuthDate=today "
-        "targetdate=11/04/2008 INSURER_ID=1 RR_RATE=1 RA_RATE=1 paint_rate=1 QSENT=R excess_gst=1 RR_TOTAL=0 "
-        "RA_TOTAL=0 PAINT_TOTAL=0 CONTACTID=0 override=0 rr_override=0 ra_override=0 paint_override=0 "
-        "quotechanged=1 invoiced=0 Job_stage=4 ReadOnly=1 Type=OLD"));
-    EXPECT_EQ(car("ABC123").number("KEST"), 1);
-    EXPECT_EQ(quote("500").notes(), "(today : Authorised Quote) (01/02/2008 : Won Quote Request)");
-}
-
 TEST_F(AuthorisedQuotes, TheQuoteIsFoundByNumberOrByTheNetworksNumbers)
 {
     quote("500", 2).request("QR1").line(1);
@@ -69,10 +55,12 @@ TEST_F(AuthorisedQuotes, ValuesOfTheHeaderComeOverToTheMainQuote)
 {
     quote("500", 1).request("QR1").set("excess", 7).set("contri", 8).line(1);
     for (const auto& [elements, before, after] : casesIn<3>("inbound/authorised-columns.txt")) {
-        fill(quote("500"), before);
+        fill(quote("500"), before).remarks("(01/02/2008 : Responded Quote Request)");
         EXPECT_TRUE(load(authorisedQuote("500").with(elements)));
         EXPECT_TRUE(load(authorisedQuote("500/1").with(elements)));
         EXPECT_TRUE(quote("500").shows(after)) << elements;
+        EXPECT_EQ(quote("500").notes(), "(today : Authorised Quote) (01/02/2008 : Won Quote Request)");
+        EXPECT_EQ(car("ABC123").number("KEST"), 1);
         EXPECT_TRUE(quote("500", 1).shows("excess=7 contri=8")) << elements;
     }
 }

@@ -1,4 +1,3 @@
-#include "inbound/NextNumbers.h"
 #include "support/Shop.h"
 
 struct Requests : Shop {
@@ -145,17 +144,6 @@ TEST_F(Requests, TheQuoteNumberIsTheNextThatIsFree)
     EXPECT_FALSE(load(quoteRequest("QR9").rego("NEW1")));
     EXPECT_NE(shown().find("Error Number: 94"), std::string::npos);
     EXPECT_EQ(rowCount("QUOTE1", "QTNNO=''") + rowCount("CAR", "REGO='NEW1'"), 0);
-
-    run("UPDATE CINFO SET QUOTE_VAL=700");
-    quote("700");
-    for (const auto& [wish, number] :
-         {std::pair("", "701"), std::pair("MANQ", "701"), std::pair("8", "701"), std::pair("123456789", "701"),
-          std::pair("88", "88"), std::pair("1001", "701")}) {
-        db::Recordset tried(gConn);
-        const db::Recordset shop = opened(u"SELECT * FROM CINFO"_s);
-        EXPECT_EQ(NextQuoteNumber(QString::fromLatin1(wish), shop, tried, false), QString::fromLatin1(number)) << wish;
-        EXPECT_TRUE(tried.eof());
-    }
 }
 
 TEST_F(Requests, PhotographsMoveIntoTheImagesFolder)
