@@ -78,6 +78,7 @@ TEST_F(Printing, AResultShowsItsReasonForTheOneQuoteOfTheRequest)
 TEST_F(Printing, EachTypeHasItsReportOrNone)
 {
     quote("500").request("QR1").line(1);
+    quote("502").request("", "");
     EXPECT_FALSE(PrintXML(u"gone.xml"_s, true));
     EXPECT_EQ(shown().substr(0, 67), "[none] An error 53 has occured, Please contact MarlinDesk Support\r\n");
     EXPECT_TRUE(PrintXML({}, true));
@@ -125,18 +126,6 @@ TEST_F(Printing, AnAuthorisationAlsoShowsItsSubletDocuments)
     files::writeBytes(u"c:\\wirdoc\\PDF\\500.1_7.pdf"_s, "%PDF-1.4");
     print(authorisedQuote("500/1"));
     EXPECT_EQ(shownReports(), "frmPrintPreview730 frmSubletAuth");
-}
-
-TEST_F(Printing, AnEmptyNumberMatchesNoQuote)
-{
-    quote("500").request("", "");
-    print(quoteRequest("").set("quoteRequestVersionNumber", ""));
-    print(assessmentResult("KQ1").set("kestQuoteRequestNumber", ""));
-    print(adjustedQuote("500").request(""));
-    EXPECT_EQ(shown(),
-              "[critical] Quote does not exist in database, please contact MarlinDesk Support.\n"
-              "[critical] Failed Matching Quote. Please contact MarlinDesk Support\n"
-              "[critical] Quote not found in database. Please contact MarlinDesk Support.");
 }
 
 TEST_F(Printing, EachChangedLineStandsInItsSection)
