@@ -1,27 +1,20 @@
+#include "inbound/modLoadXML.h"
 #include "support/Shop.h"
 
 using StatusMessages = Shop;
 
 TEST_F(StatusMessages, EachMovesTheQuoteToItsState)
 {
-    for (const auto& [subquote, locked, message, state, boxes] : casesIn<5>("inbound/states.txt")) {
+    const QString responded = u"(01/02/2008 : Responded Quote Request)"_s;
+    for (const auto& [subquote, before, notes, message, state, after, boxes] : casesIn<7>("inbound/states.txt")) {
         gConn->execute(u"UPDATE QUOTE1 SET KESTQRNo=NULL, KESTQuoteNo=NULL"_s);
         QuoteRow row = quote("500", subquote.toInt()).request("QR1").quoteNumber("KQ1").stage(7).set("excess", 300);
-        fill(row, "ReadOnly=" + locked.toStdString()).remarks("(01/02/2008 : Responded Quote Request)");
+        fill(row, before).remarks(notes.isEmpty() ? responded : notes);
         EXPECT_TRUE(load(Message::told(message)));
         EXPECT_EQ(row.state(), state.toStdString());
+        EXPECT_TRUE(row.shows(after)) << message << notes;
         EXPECT_EQ(QString::fromStdString(shown()).replace(u"\r\n"_s, u" / "_s), boxes);
-        EXPECT_EQ(row.number("excess"), message.startsWith(u"EWAP"_s) ? 0 : 300) << message;
     }
-}
-
-TEST_F(StatusMessages, TheRequestsValuesComeOver)
-{
-    quote("500").set("KESTQRVer", "7");
-    EXPECT_TRUE(load(quoteMatch("500").request("QR8").claim("8800")));
-    EXPECT_TRUE(quote("500").shows("KESTQRNo=QR8 KESTQRVer=1 Claim=8800 ExtraInfo=1"));
-    EXPECT_TRUE(load(revisionRequest("QR8").version("3")));
-    EXPECT_EQ(quote("500").text("KESTQRVer"), "3");
 }
 
 TEST_F(StatusMessages, EachMeansOneQuoteOfTheRequest)
@@ -92,4 +85,39 @@ TEST_F(StatusMessages, AMessageWhoseQuoteIsUnknownIsRefused)
     EXPECT_EQ(quote("500").state(), "7 open - ");
     EXPECT_EQ(quote("500").lines(), 1);
     EXPECT_EQ(quote("").state(), "1 open KQ9 ");
+}
+
+TEST_F(StatusMessages, EachAdjustmentAddsANoteToAQuoteWithLines)
+{
+    quote("500").request("QR1").stage(3).locked(true).note("Responded Quote Request").line(1);
+    EXPECT_TRUE(load(adjustedQuote("500")));
+    EXPECT_TRUE(load(adjustedQuote("999")));  // with a wrong reference, the newest quote of the request is used
+    EXPECT_EQ(shown(), "[critical] Quote not found in database. Please contact MarlinDesk Support.") << "no report";
+    EXPECT_EQ(quote("500").state(),
+              "3 locked - (today : Adjustment Suggested) (today : Adjustment Suggested) "
+              "(01/02/2008 : Responded Quote Request)");
+
+    quote("500", 1).request("QR1");
+    EXPECT_FALSE(load(adjustedQuote("500/1")));
+    EXPECT_EQ(shown(), "[none] Error: Cannot load an Adjustment onto a blank quote!");
+    EXPECT_EQ(quote("500", 1).notes(), "");
+}
+
+static void takeResponse(const Text& file, const Text& number, const Text& status = "Submitted")
+{
+    QString text = submissionResponse(number).set("quoteSubmissionStatus", status).text();
+    LoadSubmissionResponse(text, file);
+}
+
+TEST_F(StatusMessages, ASubmissionResponseGivesTheQuoteItsNumber)
+{
+    quote("500", 2).note("Sending KEST Quote").note("Sending KEST Quote", "02/02/2008");
+    for (int twice = 0; twice < 2; ++twice)  // as each fill does
+        takeResponse("R_500_2_0001.xml", "KQ5");
+    EXPECT_EQ(quote("500", 2).state(),
+              "1 locked KQ5 (02/02/2008 : Submitted KEST Quote) (01/02/2008 : Submitted KEST Quote)");
+
+    quote("501").note("Sending KEST Quote");
+    takeResponse("R_501_0.xml", "KQ6", "submitted");  // a different status
+    EXPECT_EQ(quote("501").state(), "1 open KQ6 (01/02/2008 : Sending KEST Quote)");
 }
