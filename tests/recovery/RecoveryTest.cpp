@@ -272,7 +272,7 @@ TEST_F(Interrupted, PicturesThatCouldNotBeSentAreSentLater)
 TEST_F(Interrupted, RecoveryMayBeInterruptedToo)
 {
     arrive("m.xml", authorisedQuote("500").set("excess", "400").labour(1, "C").part(2, "D").paint(3, "I"));
-    for (const int lost : {14, 1000}) {  // before and after the point of no return
+    for (const int lost : {30, 1000}) {  // before and after the point of no return
         const auto load = [lost] {
             int statement = 0;
             db::setStatementFault([&] { return ++statement >= lost; }, CannotOpen);
@@ -287,6 +287,7 @@ TEST_F(Interrupted, RecoveryMayBeInterruptedToo)
         };
         interruptEachStatement(settle, loadIfItWaits, load);
     }
+    EXPECT_EQ(outcomes, both) << "nothing is left";
 }
 
 TEST_F(Interrupted, WorkOfALivingOwnerIsLeftAlone)
