@@ -12,6 +12,12 @@ struct Settings : ::testing::Test {
         ASSERT_TRUE(settings::createKey(Hive::LocalMachine, splash));
         ASSERT_TRUE(settings::setValue(Hive::LocalMachine, splash, name, value));
     }
+    static void forTheUser(const QString& text)
+    {
+        const QString key = u"Software\\ApplicationSettings\\wirra32\\frmsplash"_s;
+        settings::createKey(Hive::CurrentUser, key);
+        settings::setValue(Hive::CurrentUser, key, u"EcomHome"_s, {Type::Text, text});
+    }
     static QString stored(const QString& name) { return RegGetValue(Hive::LocalMachine, splash, name); }
     static bool store(const QString& name, const QString& text)
     {
@@ -30,11 +36,11 @@ TEST_F(Settings, TheFirstReadFixesAValueForTheMachine)
     EXPECT_EQ(setting(u"default"_s, CopyUp::No), u"default"_s);
     EXPECT_EQ(setting(u""_s), u""_s);
     EXPECT_FALSE(settings::keyExists(Hive::LocalMachine, splash));
-    settings::setUserSetting(u"wirra32"_s, u"frmsplash"_s, u"EcomHome"_s, u"user"_s);
+    forTheUser(u"user"_s);
     EXPECT_EQ(setting(u"default"_s, CopyUp::No), u"user"_s);
     machineWide(u"EcomHome"_s, {Type::Text, u""_s});
     EXPECT_EQ(setting(u"default"_s), u"user"_s);
-    settings::setUserSetting(u"wirra32"_s, u"frmsplash"_s, u"EcomHome"_s, u"changed"_s);
+    forTheUser(u"changed"_s);
     EXPECT_EQ(setting(u"elsewhere"_s), u"user"_s);
 }
 

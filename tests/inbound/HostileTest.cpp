@@ -42,13 +42,16 @@ static QStringList variantsOf(QString text)
     };
     const qsizetype count = parsedMessage(text).selectNodes(leaves).size();
     for (qsizetype leaf = 0; leaf < count; ++leaf) {
-        changed(leaf, [](xml::Document&, xml::Node element) { element.parentNode().removeChild(element); });
+        changed(leaf, [](xml::Document& message, xml::Node element) {
+            message.createNode(xml::NodeType::Element, u"nowhere"_s).appendChild(element);
+        });
         changed(leaf, [](xml::Document& message, xml::Node element) {
             const QString name = element.nodeName();
             const QString space = name.contains(u':') ? GetNamespaceURI() : QString();
             xml::Node twin = message.createNode(element.nodeType(), name, space);
-            twin.setText(u"2"_s);
-            element.parentNode().insertBefore(twin, element);
+            twin.setText(element.text());
+            element.setText(u"2"_s);
+            element.selectSingleNode(u".."_s).appendChild(twin);
         });
         for (const QString& value : wrong)
             changed(leaf, [&](xml::Document&, xml::Node element) { element.setText(value); });

@@ -39,12 +39,14 @@ TEST_F(Registry, NamesAreFoundInAnyCase)
 
 TEST_F(Registry, AnyTextSurvives)
 {
+    const QString userKey = u"Software\\ApplicationSettings\\an app\\a section"_s;
+    createKey(Hive::CurrentUser, userKey);
     for (const QString& text :
          u"| blanks |a=b:c|[x]|;x|@|50%25 %|a\r\nb\tc\n|\u00e9\u20ac\U0001F697|c:\\x\\|x\u0000y|\u0085|\""_s.split(
              u'|')) {
         EXPECT_TRUE(set(text, text));
         EXPECT_EQ(Registry::text(text), text) << text;
-        setUserSetting(u"an app"_s, u"a section"_s, text + u"1"_s, text);
+        setValue(Hive::CurrentUser, userKey, text + u"1"_s, {Type::Text, text});
         EXPECT_EQ(userSetting(u"AN APP"_s, u"A Section"_s, text + u"1"_s, u"fallback"_s), text) << text;
     }
     EXPECT_EQ(userSetting(u"an app"_s, u"other"_s, u"x"_s, u"fallback"_s), u"fallback"_s);
@@ -122,6 +124,5 @@ TEST_F(Registry, WhatCannotBeReadIsNotOverwritten)
     profile::setRoot(profile.root() + u"/missing"_s);
     EXPECT_EQ(text(u"a"_s), u"(none)"_s);
     EXPECT_FALSE(createKey(Hive::LocalMachine, key));
-    EXPECT_FALSE(setUserSetting(u"a"_s, u"b"_s, u"c"_s, u"d"_s));
     EXPECT_FALSE(QDir(profile::root()).exists());
 }

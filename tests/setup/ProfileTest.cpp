@@ -80,7 +80,9 @@ TEST_F(Profile, IsCompletedAfterAnInterruptedStart)
 
 TEST_F(Profile, IsToldWhereTheComponentLooks)
 {
-    ASSERT_TRUE(settings::setUserSetting(u"wirra32"_s, u"frmsplash"_s, u"ReportPath"_s, u"d:\\rep\\"_s));
+    const QString key = u"Software\\ApplicationSettings\\wirra32\\frmsplash"_s;
+    ASSERT_TRUE(settings::createKey(settings::Hive::CurrentUser, key));
+    settings::setValue(settings::Hive::CurrentUser, key, u"ReportPath"_s, {settings::Type::Text, u"d:\\rep\\"_s});
     EXPECT_EQ(app::where()[u"reports"_s].toString(), profile.root() + u"/drive_d/rep"_s);
     EXPECT_EQ(app::where()[u"database"_s].toString(), app::embeddedFile(u"WirSql"_s));
 

@@ -71,8 +71,9 @@ Message& Message::setFirst(std::initializer_list<Text> paths, const Text& text)
 
 Message& Message::without(const Text& path)
 {
+    const xml::Node nowhere = document.createNode(xml::NodeType::Element, u"nowhere"_s);
     for (const xml::Node& element : document.selectNodes(pathTo(path)))
-        element.parentNode().removeChild(element);
+        nowhere.appendChild(element);
     return *this;
 }
 

@@ -196,13 +196,4 @@ QString userSetting(const QString& application, const QString& section, const QS
     return value ? value->data : fallback;
 }
 
-bool setUserSetting(const QString& application, const QString& section, const QString& name, const QString& value)
-{
-    const QString path = pathOf(Hive::CurrentUser, userKey(application, section));
-    return change([&](RegistryFile& content) {
-        content.set(path, name, {Type::Text, value});
-        return true;
-    });
-}
-
 }  // namespace kest::settings

@@ -50,7 +50,5 @@ QList<Entry> entries();
 
 /// Returns a value from the per-user area of applications, or `fallback` if there is none.
 QString userSetting(const QString& application, const QString& section, const QString& name, const QString& fallback);
-/// Sets a value in the per-user area. Returns false if it can't be written.
-bool setUserSetting(const QString& application, const QString& section, const QString& name, const QString& value);
 
 }  // namespace kest::settings

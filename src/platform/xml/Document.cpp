@@ -72,20 +72,17 @@ xmlNsPtr DocumentData::namespaceFor(const QString& prefix, const QString& uri)
     return namespaces.back();
 }
 
-void DocumentData::link(xmlNodePtr parent, xmlNodePtr child, xmlNodePtr before)
+void DocumentData::link(xmlNodePtr parent, xmlNodePtr child)
 {
     // not with libxml2's own functions, which join neighbouring texts and free the given node
     if (isAncestorOrSelf(child, parent))
         throw RuntimeError(TypeMismatch, u"A node can't be below itself"_s);
-    if (before == child)
-        return;
     unlink(child);
     loose.remove(child);
     child->parent = parent;
-    child->next = before;
-    child->prev = before ? before->prev : parent->last;
+    child->prev = parent->last;
     (child->prev ? child->prev->next : parent->children) = child;
-    (child->next ? child->next->prev : parent->last) = child;
+    parent->last = child;
 }
 
 void DocumentData::unlink(xmlNodePtr node)
@@ -174,7 +171,7 @@ Node Document::appendChild(Node root)
         throw RuntimeError(TypeMismatch, u"The node belongs to another document"_s);
     if (node->type == XML_ELEMENT_NODE && xmlDocGetRootElement(data->document))
         throw RuntimeError(TypeMismatch, u"The document already has a root"_s);
-    data->link(reinterpret_cast<xmlNodePtr>(data->document), node, nullptr);
+    data->link(reinterpret_cast<xmlNodePtr>(data->document), node);
     return root;
 }
 

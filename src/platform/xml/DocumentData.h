@@ -30,8 +30,8 @@ struct DocumentData {
     /// Returns a namespace for a created node. It is declared when the document is written.
     xmlNsPtr namespaceFor(const QString& prefix, const QString& uri);
 
-    /// Adds a node to the children of `parent`, before `before` or, if that is null, at the end.
-    void link(xmlNodePtr parent, xmlNodePtr child, xmlNodePtr before);
+    /// Adds a node to the end of the children of `parent`.
+    void link(xmlNodePtr parent, xmlNodePtr child);
     /// Removes a node from the tree. It lives as long as the document.
     void unlink(xmlNodePtr node);
 

@@ -169,7 +169,7 @@ void Node::setText(const QString& text)
     while (node->children)
         document->unlink(node->children);
     if (!allowed.isEmpty())
-        document->link(node, xmlNewDocText(node->doc, toXml(allowed)), nullptr);
+        document->link(node, xmlNewDocText(node->doc, toXml(allowed)));
 }
 
 QString Node::xml() const
@@ -182,12 +182,6 @@ QList<Attribute> Node::attributes() const
 {
     required();
     return attributesOf(*document, node);
-}
-
-Node Node::parentNode() const
-{
-    const xmlNodePtr parent = required()->parent;
-    return parent && parent->type == XML_ELEMENT_NODE ? document->wrap(parent) : Node();
 }
 
 Node Node::firstChild() const
@@ -211,23 +205,11 @@ QList<Node> Node::childNodes() const
 
 Node Node::appendChild(Node child) const
 {
-    return insertBefore(child, {});
-}
-
-Node Node::insertBefore(Node child, Node reference) const
-{
     if (required()->type != XML_ELEMENT_NODE || child.required()->type == XML_ATTRIBUTE_NODE ||
-        child.document != document || (reference && reference.node->parent != node))
+        child.document != document)
         throw RuntimeError(TypeMismatch, u"The node can't be added here"_s);
-    document->link(node, child.node, reference.node);
+    document->link(node, child.node);
     return child;
-}
-
-void Node::removeChild(Node child) const
-{
-    if (child.required()->parent != required() || child.node->type == XML_ATTRIBUTE_NODE)
-        throw RuntimeError(TypeMismatch, u"The node is not a child of this one"_s);
-    document->unlink(child.node);
 }
 
 Node Node::selectSingleNode(const QString& path) const

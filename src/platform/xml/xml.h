@@ -59,16 +59,12 @@ public:
     /// All attributes and namespace declarations in document order.
     QList<Attribute> attributes() const;
 
-    Node parentNode() const;
     Node firstChild() const;
     Node nextSibling() const;
     /// All children except texts with only white space.
     QList<Node> childNodes() const;
     /// Moves a node of the same document to the end of the children. Throws TypeMismatch if that is not possible.
     Node appendChild(Node child) const;
-    /// Moves a node to a place before the child `reference`, or to the end if that is null.
-    Node insertBefore(Node child, Node reference) const;
-    void removeChild(Node child) const;
 
     /// Returns the first match, or null. Prefixes are those of the document's selection namespaces.
     Node selectSingleNode(const QString& path) const;
