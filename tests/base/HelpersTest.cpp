@@ -2,7 +2,6 @@
 #include "base/Helpers.h"
 #include "base/modLoggerEx.h"
 #include "support/Test.h"
-#include "support/TimeZone.h"
 
 static QString result(const QString& routine, const QStringList& arguments)
 {
@@ -25,7 +24,6 @@ static QString result(const QString& routine, const QStringList& arguments)
 
 TEST(Helpers, ReadTextsAsTheTableSays)
 {
-    const test::TimeZone zone("Australia/Sydney");
     for (const QStringList& row : test::rowsIn("helpers.txt"))
         EXPECT_EQ(test::outcomeOf([&] { return result(row[0], row.mid(2)); }), row[1]) << row.join(u" | "_s);
     EXPECT_EQ(SafeVal(QString(500, u'9'), u"7"_s), 7);
