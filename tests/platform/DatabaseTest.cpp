@@ -6,6 +6,7 @@
 #include <QSqlQuery>
 #include <QTcpServer>
 
+using db::Kind;
 using db::Recordset;
 
 struct Database : Databases {
@@ -24,9 +25,10 @@ TEST_P(Database, AComparisonMeansTheSameOnEveryEngine)
     insert(u"CODE, SEQ, day"_s, u"'50% [off]', NULL, "_s + stored(u"2026-02-28"_s, u"00:00:00"_s));
     insert(u"CODE, SEQ"_s, u"'ÖL', 10"_s);
     insert(u"CODE, SEQ"_s, u"'', 7"_s);
-    for (const QStringList& row : rowsIn("comparisons.txt"))
-        for (const QString& condition : row.mid(1))
-            EXPECT_EQ(count(condition), row[0].toInt()) << condition;
+    for (int time = 0; time < 2; ++time)  // a statement of a known wording is not translated again
+        for (const QStringList& row : rowsIn("comparisons.txt"))
+            for (const QString& condition : row.mid(1))
+                EXPECT_EQ(count(condition), row[0].toInt()) << condition;
 }
 
 TEST_P(Database, StatementsInTheDialectOfTheHostAreUnderstood)
@@ -34,18 +36,27 @@ TEST_P(Database, StatementsInTheDialectOfTheHostAreUnderstood)
     insert(u"CODE, SEQ"_s, u"'A+B', 1"_s);
     insert(u"CODE, SEQ"_s, u"NULL, 2"_s);
     insert(u"CODE, SEQ"_s, u"'c', 3"_s);
-    Recordset newest = query(u"select top 2 * from line order by ID desc"_s);
-    EXPECT_EQ(newest.recordCount(), 2);
-    EXPECT_EQ(newest.text(u"CODE"_s), u"c"_s);
+    for (const int top : {2, 3, 1}) {
+        Recordset newest = query(u"select top %1 * from line order by ID desc"_s.arg(top));
+        EXPECT_EQ(newest.recordCount(), top);
+        EXPECT_EQ(newest.text(u"CODE"_s), u"c"_s);
+    }
 
     Recordset joined = query(u"SELECT CODE + ' top 1 ' + CODE + ';' AS NAME, SEQ + 1 AS n FROM LINE ORDER BY SEQ"_s);
     EXPECT_EQ(joined.text(u"NAME"_s), u"A+B top 1 A+B;"_s);
     EXPECT_EQ(joined.value(u"n"_s), QVariant(qint64(2)));
     joined.moveNext();
     EXPECT_TRUE(joined.isNull(u"NAME"_s)) << "a Null joined to a text is Null";
+    for (const auto& [code, kind] : {std::pair(u"none"_s, Kind::Text), {u"c"_s, Kind::WholeNumber}})
+        EXPECT_EQ(query(u"SELECT MAX(SEQ + 1) AS n FROM LINE WHERE CODE='%1'"_s.arg(code)).kind(u"n"_s), kind)
+            << "the kind of each result, though the wording is the same";
 
     EXPECT_EQ(connection->execute(u"UPDATE line SET SEQ=3, flag=true WHERE SEQ='3';"_s), 1);
     EXPECT_EQ(connection->execute(u"UPDATE line SET SEQ=3, flag=true WHERE SEQ='3'"_s), 1) << "the same again";
+    for (const auto& [text, number] : {std::pair(u"7"_s, 7), {u""_s, 0}}) {
+        EXPECT_EQ(connection->execute(u"UPDATE LINE SET SEQ='%1' WHERE CODE='c'"_s.arg(text)), 1);
+        EXPECT_EQ(query(u"SELECT SEQ FROM LINE WHERE CODE='c'"_s).value(u"SEQ"_s), QVariant(qint64(number)));
+    }
     EXPECT_EQ(connection->execute(u"DELETE FROM TINTS"_s), 0);
 }
 
@@ -74,8 +85,8 @@ TEST_P(Database, NoValueEndsItsLiteral)
     }
     insert(u"SEQ"_s, u"1"_s);
     for (const QString& two : {u"DELETE FROM LINE; DELETE FROM CAR"_s, u"SELECT 1;DELETE FROM LINE"_s})
-        EXPECT_EQ(failure([&] { connection->execute(two); }).number(), StatementFailed);
-    EXPECT_EQ(failure([&] { query(u"SELECT * FROM LINE; DELETE FROM LINE"_s); }).number(), StatementFailed);
+        EXPECT_EQ(failureOf([&] { connection->execute(two); }), StatementFailed);
+    EXPECT_EQ(failureOf([&] { query(u"SELECT * FROM LINE; DELETE FROM LINE"_s); }), StatementFailed);
     EXPECT_EQ(count(u"SEQ=1"_s), 1);
 }
 
@@ -88,13 +99,12 @@ TEST_P(Database, AFailureKeepsTheCodesOfTheDatabase)
     EXPECT_TRUE(noTable.description().contains(u"NOSUCH"_s, Qt::CaseInsensitive)) << noTable.what();
 
     Recordset cars = query(u"SELECT * FROM CAR"_s);
-    for (const int expected : {0, int(StatementFailed)}) {
-        cars.addNew();
-        cars.set(u"REGO"_s, expected == 0 ? u"ABC1"_s : u"abc1 "_s);
-        const RuntimeError twice = failure([&] { cars.update(); });
-        EXPECT_EQ(twice.number(), expected);
-        EXPECT_EQ(twice.sqlState(), expected == 0 ? QString() : u"23000"_s);
-    }
+    EXPECT_EQ(added(cars, u"REGO"_s, u"ABC1"_s), 0);
+    EXPECT_EQ(added(cars, u"REGO"_s, u"abc1 "_s), StatementFailed);
+    cars.cancelUpdate();
+    for (const auto& [rego, state] : {std::pair(u"abc1"_s, u"23000"_s), {u"XYZ789"_s, QString()}})
+        EXPECT_EQ(failure([&] { connection->execute(sql("INSERT INTO CAR (REGO) VALUES ('{}')", rego)); }).sqlState(),
+                  state);
     EXPECT_EQ(connection->state(), 1);
 }
 
@@ -150,10 +160,10 @@ TEST_P(Database, AConnectionThatHasGoneIsNoticed)
     } else {
         drop();
     }
-    EXPECT_EQ(failure([&] { query(u"SELECT * FROM LINE"_s); }).number(), CannotOpen);
+    EXPECT_EQ(failureOf([&] { query(u"SELECT * FROM LINE"_s); }), CannotOpen);
     EXPECT_EQ(connection->state(), 0);
     db::setStatementFault({});
-    EXPECT_EQ(failure([&] { connection->execute(u"DELETE FROM LINE"_s); }).number(), CannotOpen);
+    EXPECT_EQ(failureOf([&] { connection->execute(u"DELETE FROM LINE"_s); }), CannotOpen);
     connection->open(connectionText);
     EXPECT_EQ(connection->state(), 1);
     EXPECT_EQ(count(u"1=1"_s), 0);
@@ -163,7 +173,7 @@ TEST_P(Database, AConnectionThatHasGoneIsNoticed)
         EXPECT_FALSE(connection->answers()) << "before any statement has failed";
     }
     Recordset none{db::ConnectionPtr()};
-    EXPECT_EQ(failure([&] { none.open(u"SELECT 1"_s); }).number(), NoObject);
+    EXPECT_EQ(failureOf([&] { none.open(u"SELECT 1"_s); }), NoObject);
 }
 
 INSTANTIATE_TEST_SUITE_P(Engines, Database, ::testing::Values(On::Embedded, On::MySql, On::Odbc, On::Tds));
@@ -213,7 +223,7 @@ TEST(connectionText, ChoosesTheEngineThatAnswers)
         text.replace(u"THISHOST"_s, QSysInfo::machineHostName());
         const bool opens = outcome == u"opens"_s;
         db::Connection connection;
-        EXPECT_EQ(failure([&] { connection.open(text); }).number(), opens ? 0 : CannotOpen) << text;
+        EXPECT_EQ(failureOf([&] { connection.open(text); }), opens ? 0 : CannotOpen) << text;
         EXPECT_EQ(connection.state(), opens ? 1 : 0) << text;
     }
     EXPECT_FALSE(QFile::exists(profile.root() + u"/databases/NoShop.db"_s)) << "a missing database is not made";

@@ -23,6 +23,22 @@ protected:
     db::ConnectionPtr connect() const;
     db::Recordset query(const QString& select) const;
     int count(const QString& condition) const;
+    /// Executes a statement as another user.
+    void elsewhere(const QString& statement) const { connect()->execute(statement); }
+    /// Sets a column of the current row and updates the row. Returns the number of the error, or 0.
+    static int written(db::Recordset& rows, const QString& column, const QVariant& value)
+    {
+        return failureOf([&] {
+            rows.set(column, value);
+            rows.update();
+        });
+    }
+    /// Adds a row that has this value. Returns the number of the error, or 0.
+    static int added(db::Recordset& rows, const QString& column, const QVariant& value)
+    {
+        rows.addNew();
+        return written(rows, column, value);
+    }
     /// Returns a date as a literal that a statement can store: as in the embedded file, or with a "T" for servers.
     static QString stored(const QString& day, const QString& time)
     {
