@@ -34,7 +34,7 @@ QString test::createDatabase(On engine)
         default:
             mariaDb().createDatabase(u"shop"_s, mariaDbSchema);
             return engine == On::MySql ? mariaDb().connectionText(u"shop"_s)
-                                       : mariaDb().connectionText(u"shop"_s, QString::fromLatin1(odbcMariaDb));
+                                       : mariaDb().connectionText(u"shop"_s, odbcMariaDb);
     }
 }
 

@@ -1,44 +1,32 @@
-// Runs a MariaDB server for tests on a free loopback port, with its data in a temporary folder.
+// Runs a MariaDB server for tests on a free loopback port.
 #pragma once
 
-#include <QProcess>
-#include <QString>
-#include <QTemporaryDir>
+#include "support/TestServer.h"
 
 namespace kest::test {
 
-class MariaDbServer {
+class MariaDbServer final : public TestServer {
 public:
-    /// Starts the server and waits until it is ready. Throws std::runtime_error with the server's output if it does not
-    /// start.
     MariaDbServer();
-    /// Stops the server. It also stops if the test program crashes.
-    ~MariaDbServer();
+    ~MariaDbServer() override { server_.terminate(); }
+    Q_DISABLE_COPY_MOVE(MariaDbServer)
 
-    int port() const { return tcpPort; }
+    int port() const { return port_; }
     QString user() const { return QStringLiteral("kest"); }
     QString password() const { return QStringLiteral("s3cret"); }
-
-    /// Creates an empty database, after dropping one of the same name, and runs a script in it.
-    void createDatabase(const QString& name, const QString& script = {});
-    /// Returns the connection text for a database on this server, with the driver "MySQL" or one that is registered
-    /// with ODBC.
-    QString connectionText(const QString& database, const QString& driver = QStringLiteral("MySQL")) const;
-    /// Stops the server as a power cut would.
-    void kill();
+    QString connectionText(const QString& database) const override { return connectionText(database, "MySQL"); }
+    /// Returns the connection text for a driver that is registered with ODBC.
+    QString connectionText(const QString& database, const char* driver) const;
 
 private:
-    void prepareData();
-    void start();
+    void createData();
 
-    QTemporaryDir folder;
-    QProcess server;
-    int tcpPort = 0;
+    int port_ = 0;
 };
 
-/// Returns the server of this test program. The first call starts it.
-MariaDbServer& mariaDb();
-/// Call this before the program ends.
-void stopMariaDb();
+inline MariaDbServer& mariaDb()
+{
+    return sharedServer<MariaDbServer>();
+}
 
 }  // namespace kest::test

@@ -6,13 +6,8 @@ namespace kest::test {
 
 static QString libraryOf(const QString& name)
 {
-    QString found;
-    for (const QString& place : {u"x86_64-linux-gnu/odbc"_s, u"aarch64-linux-gnu/odbc"_s, u"odbc"_s}) {
-        const QString candidate = u"/usr/lib/%1/%2"_s.arg(place, name);
-        if (QFile::exists(candidate))
-            found = candidate;
-    }
-    return found;
+    QDir::setSearchPaths(u"odbc"_s, {u"/usr/lib/x86_64-linux-gnu/odbc"_s, u"/usr/lib/aarch64-linux-gnu/odbc"_s});
+    return QFileInfo(u"odbc:"_s + name).absoluteFilePath();
 }
 
 OdbcDrivers::OdbcDrivers(Names names)

@@ -1,64 +1,29 @@
 #include "support/TdsServer.h"
 
-#include "platform/database/Connection.h"
-#include "setup/QuoteDatabase.h"
 #include "support/OdbcDrivers.h"
 #include "support/Test.h"
 
-#include <sys/prctl.h>
-
-#include <csignal>
-
 namespace kest::test {
 
-static std::unique_ptr<TdsServer> shared;
-
-constexpr int startMilliseconds = 30000;
-constexpr int stopMilliseconds = 10000;
-
-TdsServer::TdsServer() : folder_(memoryFolder(u"tds"_s))
+TdsServer::TdsServer() : TestServer(u"tds"_s, u"master"_s, u"CREATE DATABASE %1"_s)
 {
     QStringList arguments{u"-B"_s,       checkoutFile(u"tests/support/tds/standin.py"_s),
                           u"--folder"_s, folder_.path(),
-                          u"--login"_s,  user() + u':'};
+                          u"--login"_s,  u"sa:"_s};
     if (const QString statements = qEnvironmentVariable("KEST2_TDS_STATEMENTS"); !statements.isEmpty())
         arguments << u"--statements"_s << statements;
-    server_.setProcessChannelMode(QProcess::MergedChannels);
-    server_.setChildProcessModifier([] { prctl(PR_SET_PDEATHSIG, SIGKILL); });
-    server_.start(u"/usr/bin/python3"_s, arguments);  // not another Python, which would not find Debian's packages
-    const QDeadlineTimer deadline(startMilliseconds);
-    while (!server_.canReadLine()) {
-        if (deadline.hasExpired() || server_.state() == QProcess::NotRunning)
-            throw std::runtime_error("standin.py: " + server_.readAll().toStdString());
-        server_.waitForReadyRead(100);
-    }
+    // not another Python, which would not find Debian's packages
+    start(u"/usr/bin/python3"_s, arguments, [this] { return server_.canReadLine(); });
     const QString line = QString::fromUtf8(server_.readLine()).trimmed();
     if (!line.startsWith(u"ready "_s))
         throw std::runtime_error("standin.py: " + line.toStdString() + server_.readAll().toStdString());
     address_ = line.section(u' ', 1);
 }
 
-TdsServer::~TdsServer()
-{
-    server_.closeWriteChannel();
-    if (!server_.waitForFinished(stopMilliseconds))
-        server_.kill();
-}
-
-void TdsServer::createDatabase(const QString& name, const QString& script)
-{
-    db::Connection connection;
-    connection.open(connectionText(u"master"_s));
-    connection.execute(u"CREATE DATABASE "_s + name);
-    connection.open(connectionText(name));
-    for (const QString& statement : app::statementsIn(script))
-        connection.execute(statement);
-}
-
 QString TdsServer::connectionText(const QString& database) const
 {
-    return u"Driver={%1};Server=%2;Port=1433;Database=%3;Uid=%4;Pwd=;App=test;"_s.arg(QLatin1StringView(odbcTds),
-                                                                                      address_, database, user());
+    return u"Driver={%1};Server=%2;Port=1433;Database=%3;Uid=sa;Pwd=;App=test;"_s.arg(QLatin1StringView(odbcTds),
+                                                                                      address_, database);
 }
 
 QString TdsServer::schemaOf(QString mariaDbScript)
@@ -72,18 +37,6 @@ QString TdsServer::schemaOf(QString mariaDbScript)
     for (const auto& [theirs, ours] : words)
         mariaDbScript.replace(theirs, ours);
     return mariaDbScript.remove(QRegularExpression(u" DEFAULT CHARACTER SET [^;]*"_s));
-}
-
-TdsServer& tdsServer()
-{
-    if (!shared)
-        shared = std::make_unique<TdsServer>();
-    return *shared;
-}
-
-void stopTdsServer()
-{
-    shared.reset();
 }
 
 }  // namespace kest::test

@@ -1,7 +1,5 @@
-// Runs a test program without a display and without the drivers of this machine, and stops its servers at the end.
-#include "support/MariaDbServer.h"
+// Runs a test program without the display, the drivers and the time zone of this machine.
 #include "support/OdbcDrivers.h"
-#include "support/TdsServer.h"
 
 #include <QApplication>
 
@@ -19,12 +17,9 @@ int main(int argc, char** argv)
     if (!qEnvironmentVariableIsSet("QT_QPA_PLATFORM"))
         qputenv("QT_QPA_PLATFORM", "offscreen");
     qputenv("TZ", "Australia/Sydney");  // on 4 October 2026 there is no time from 02:00 to 03:00
-    using kest::test::OdbcDrivers;  // first, because ODBC reads the list of drivers only once
+    using kest::test::OdbcDrivers;      // first, because ODBC reads the list of drivers only once
     const OdbcDrivers drivers(qgetenv("KEST2_TEST_ENGINE") == "tds" ? OdbcDrivers::WithSqlServer : OdbcDrivers::Own);
     QApplication application(argc, argv);
     ::testing::InitGoogleTest(&argc, argv);
-    const int result = RUN_ALL_TESTS();
-    kest::test::stopMariaDb();
-    kest::test::stopTdsServer();
-    return result;
+    return RUN_ALL_TESTS();
 }
