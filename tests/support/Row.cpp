@@ -66,12 +66,14 @@ int rowCount(const Text& table, const Text& condition)
     return int(plainRows(selectOf(table, condition)).size());
 }
 
-void addRow(const Text& table, std::initializer_list<std::pair<const char*, Value>> values)
+void addRow(const Text& table, std::initializer_list<std::pair<const char*, Value>> values, const Text& more)
 {
     db::Recordset rows = opened(selectOf(table, u"1=0"_s));
     rows.addNew();
     for (const auto& [column, value] : values)
         rows.set(QString::fromLatin1(column), value);
+    for (const auto& [column, value] : pairsIn(more))
+        rows.set(column, value);
     rows.update();
 }
 

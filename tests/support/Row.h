@@ -42,7 +42,8 @@ private:
     QString condition_;
 };
 
-void addRow(const Text& table, std::initializer_list<std::pair<const char*, Value>> values);
+/// Adds a row with these values, and with more in the form "column=value".
+void addRow(const Text& table, std::initializer_list<std::pair<const char*, Value>> values, const Text& more = "");
 
 /// A quote: its header, with access to its note chain and its lines.
 class QuoteRow : public Row {

@@ -19,15 +19,8 @@ static void forgetSharedVariables()
 static void addQuote(const QString& number, int subquote)
 {
     car("ABC123");
-    addRow("QUOTE1", {{"QTNNO", number},
-                      {"Subquote", subquote},
-                      {"REGO", "ABC123"},
-                      {"INSURER_ID", 1},
-                      {"Claim", "7700001"},
-                      {"QUOTER", "Pat Ferrier"},
-                      {"excess", 0},
-                      {"contri", 0},
-                      {"Job_stage", 1}});
+    addRow("QUOTE1", {{"QTNNO", number}, {"Subquote", subquote}},
+           "REGO=ABC123 INSURER_ID=1 Claim=7700001 QUOTER=Pat Ferrier excess=0 contri=0 Job_stage=1");
 }
 
 QuoteRow quote(const Text& number, int subquote)
@@ -54,15 +47,8 @@ Row car(const Text& rego)
 {
     const Row row("CAR", sql("REGO='{}'", QString(rego)));
     if (!row.exists())
-        addRow("CAR", {{"REGO", QString(rego)},
-                       {"KEST", 0},
-                       {"CUST_ID", customer("Holloway").id()},
-                       {"MODEL_ID", "C120"},
-                       {"BODY_ID", "4"},
-                       {"BODY_ID2", "4S"},
-                       {"COLOUR", "Silver"},
-                       {"Year", "03/2005"},
-                       {"PAINT_GP", "M1"}});
+        addRow("CAR", {{"REGO", QString(rego)}, {"CUST_ID", customer("Holloway").id()}},
+               "KEST=0 MODEL_ID=C120 BODY_ID=4 BODY_ID2=4S COLOUR=Silver Year=03/2005 PAINT_GP=M1");
     return row;
 }
 
@@ -70,11 +56,8 @@ Row customer(const Text& name)
 {
     const Row row("CUSTOMER", sql("NAME='{}'", QString(name)));
     if (!row.exists())
-        addRow("CUSTOMER", {{"NAME", QString(name)},
-                            {"FIRSTNAME", "Kim"},
-                            {"SALUTATION", "Ms"},
-                            {"street", "14 Banksia Street"},
-                            {"suburb", "Wattlebridge 3999"}});
+        addRow("CUSTOMER", {{"NAME", QString(name)}},
+               "FIRSTNAME=Kim SALUTATION=Ms street=14 Banksia Street suburb=Wattlebridge 3999");
     return row;
 }
 
@@ -82,7 +65,7 @@ Row vendor(const Text& name)
 {
     const Row row("VENDOR", sql("NAME='{}'", QString(name)));
     if (!row.exists())
-        addRow("VENDOR", {{"NAME", QString(name)}, {"Account", 293}});
+        addRow("VENDOR", {{"NAME", QString(name)}}, "Account=293");
     return row;
 }
 

@@ -27,23 +27,14 @@ static void fillShop(db::Connection& database)
         u"INSERT INTO ALLMODEL (MODEL_ID, MAKE, MODEL, SCHEDULE) VALUES ('C120', 'CORELLA', 'MERIDIAN GL', '')"_s);
 }
 
-static void fill(db::Connection& database, app::Dialect dialect)
+/// Returns the file of a new shop.
+static QByteArray newShopFile()
 {
-    app::createTables(database, dialect);
-    fillShop(database);
-}
-
-/// Returns the file of a new shop. It is created only once, in the profile of the first test, because creating tables
-/// is slow.
-const QByteArray& newShopFile()
-{
-    static const QByteArray file = [] {
-        const db::ConnectionPtr database = app::openEmbedded(shopName);
-        fill(*database, app::Dialect::Embedded);
-        database->close();
-        return files::readBytes(app::embeddedFile(shopName));
-    }();
-    return file;
+    const db::ConnectionPtr database = app::openEmbedded(shopName);
+    app::createTables(*database, app::Dialect::Embedded);
+    fillShop(*database);
+    database->close();
+    return files::readBytes(app::embeddedFile(shopName));
 }
 
 enum class Engine { Embedded, MariaDb, Tds };
@@ -57,7 +48,10 @@ static Engine engine()
 /// The shop's database on a server. Keeps copies of it, because creating tables would be the slowest part of a test.
 class ServerShop {
 public:
-    ServerShop(QString name, QString ownNumber) : serverName(std::move(name)), connectionNumber(std::move(ownNumber)) {}
+    ServerShop(QString name, QString ownNumber, QString driver)
+        : serverName(std::move(name)), connectionNumber(std::move(ownNumber)), qtDriver(std::move(driver))
+    {
+    }
     virtual ~ServerShop() = default;
     virtual void copy(const QString& from, const QString& to) = 0;
     /// Opens a connection that is not the component's.
@@ -65,6 +59,7 @@ public:
 
     const QString serverName;        // as a setting
     const QString connectionNumber;  // a query for the server's number of a connection
+    const QString qtDriver;
     const db::ConnectionPtr administrator = std::make_shared<db::Connection>();
 
     const QString shop = shopName;
@@ -74,12 +69,13 @@ public:
 
 class MariaDbShop final : public ServerShop {
 public:
-    MariaDbShop() : ServerShop(u"mysql:127.0.0.1:%1"_s.arg(mariaDb().port()), u"CONNECTION_ID()"_s)
+    MariaDbShop() : ServerShop(u"mysql:127.0.0.1:%1"_s.arg(mariaDb().port()), u"CONNECTION_ID()"_s, u"QMYSQL"_s)
     {
         for (const QString& name : {shop, saved, fresh})
             mariaDb().createDatabase(name);
         administrator->open(mariaDb().connectionText(fresh));
-        fill(*administrator, app::Dialect::MariaDb);
+        app::createTables(*administrator, app::Dialect::MariaDb);
+        fillShop(*administrator);
         db::Recordset names(administrator);
         names.open(u"SELECT TABLE_NAME, AUTO_INCREMENT FROM INFORMATION_SCHEMA.TABLES WHERE TABLE_SCHEMA=DATABASE()"_s);
         for (; !names.eof(); names.moveNext()) {
@@ -114,7 +110,7 @@ private:
 
 class TdsShop final : public ServerShop {
 public:
-    TdsShop() : ServerShop(tdsServer().address(), u"@@SPID"_s)
+    TdsShop() : ServerShop(tdsServer().address(), u"@@SPID"_s, u"QODBC"_s)
     {
         for (const QString& name : {shop, saved})
             tdsServer().createDatabase(name);
@@ -162,18 +158,14 @@ QList<QSqlRecord> plainRows(const QString& select)
 {
     const bool isFile = engine() == Engine::Embedded;
     if (!QSqlDatabase::contains(plainName))
-        QSqlDatabase::addDatabase(isFile                    ? u"QSQLITE"_s
-                                  : engine() == Engine::Tds ? u"QODBC"_s
-                                                            : u"QMYSQL"_s,
-                                  plainName);
+        QSqlDatabase::addDatabase(isFile ? u"QSQLITE"_s : serverShop().qtDriver, plainName);
     QSqlDatabase database = QSqlDatabase::database(plainName, false);
     if (isFile && database.databaseName() != app::embeddedFile(shopName)) {
         database.close();
         database.setDatabaseName(app::embeddedFile(shopName));
-        database.open();
-    } else if (!database.isOpen()) {
-        isFile ? void(database.open()) : serverShop().open(database);
     }
+    if (!database.isOpen())
+        isFile ? void(database.open()) : serverShop().open(database);
     QSqlQuery query(database);
     query.setForwardOnly(true);  // otherwise QODBC asks for a cursor on the server
     EXPECT_TRUE(query.exec(select)) << select.toStdString() << ": " << query.lastError().text().toStdString();
@@ -201,7 +193,7 @@ QString plainText(const QVariant& value)
 void makeShopDatabase()
 {
     if (engine() == Engine::Embedded) {
-        const QByteArray& file = newShopFile();
+        static const QByteArray file = newShopFile();  // only once, because creating tables is slow
         files::makeFolder(profile::root() + u"/databases"_s);
         files::writeBytes(app::embeddedFile(shopName), file);
         return;
@@ -218,27 +210,28 @@ void closeConnections()
     QSqlDatabase::database(plainName, false).close();
 }
 
-SavedShopDatabase::SavedShopDatabase()
+QByteArray savedShopDatabase()
 {
     if (shopIsOnServer()) {
         serverShop().copy(serverShop().shop, serverShop().saved);
-        return;
+        return {};
     }
     closeConnections();  // so that the file contains all changes
-    file_ = files::readBytes(app::embeddedFile(shopName));
+    const QByteArray file = files::readBytes(app::embeddedFile(shopName));
     EnsureConnection();
+    return file;
 }
 
-void SavedShopDatabase::restore() const
+void restoreShopDatabase(const QByteArray& file)
 {
     if (shopIsOnServer()) {
         serverShop().copy(serverShop().saved, serverShop().shop);
         return;
     }
-    closeConnections();  // so that the file contains all changes
+    closeConnections();
     for (const char* suffix : {"-wal", "-shm"})
         QFile::remove(app::embeddedFile(shopName) + QString::fromLatin1(suffix));
-    files::writeBytes(app::embeddedFile(shopName), file_);
+    files::writeBytes(app::embeddedFile(shopName), file);
     EnsureConnection();
 }
 

@@ -25,15 +25,9 @@ QString plainText(const QVariant& value);
 /// server, only sets `ServerName`.
 void makeShopDatabase();
 
-/// Saves all rows. Only one object may exist at a time.
-class SavedShopDatabase {
-public:
-    SavedShopDatabase();
-    /// Restores the rows. The connection may be a new one.
-    void restore() const;
-
-private:
-    QByteArray file_;  // of the embedded database
-};
+/// Saves all rows, for one restoreShopDatabase() at a time. Returns the file of the embedded database.
+QByteArray savedShopDatabase();
+/// Restores the rows. The connection may be a new one.
+void restoreShopDatabase(const QByteArray& file);
 
 }  // namespace kest::test

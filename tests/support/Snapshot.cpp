@@ -65,7 +65,7 @@ Snapshot::Snapshot() : files_(filesOnDisk()) {}
 
 void Snapshot::restore() const
 {
-    database_.restore();
+    restoreShopDatabase(database_);
     const QMap<QString, QByteArray> now = filesOnDisk();
     for (const QString& file : now.keys())
         QFile::remove(file);

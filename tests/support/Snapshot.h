@@ -25,7 +25,7 @@ public:
 
 private:
     QMap<QString, QByteArray> files_;
-    SavedShopDatabase database_;
+    QByteArray database_ = savedShopDatabase();
 };
 
 }  // namespace kest::test
