@@ -4,6 +4,7 @@
 #include "platform/desktop/Person.h"
 #include "platform/desktop/Progress.h"
 #include "platform/script/Gestures.h"
+#include "support/Hands.h"
 #include "support/ScriptedDesktop.h"
 #include "support/Test.h"
 
@@ -26,14 +27,16 @@ TEST(Seam, TheScriptAnswersByTheFirstEntryThatFits)
     EXPECT_THROW(desktop::msgBox(u"Message Loaded"_s), desktop::NeedsAnswer) << "no answer that the box offers";
     EXPECT_THROW(desktop::ask(u"Go on!"_s), desktop::NeedsAnswer);
 
+    const auto json = [](const QJsonValue& entry) {
+        return QJsonDocument(entry.toObject()).toJson(QJsonDocument::Compact);
+    };
     EXPECT_EQ(desk.boxes().join(u'\n'),
               u"critical||Are you SURE ?|yes\ncritical||Are you SURE ?|yes\nexclamation|Login|Overwrite?|no\n"
               "question||Go on?|yes\nnone||Message Sent|ok"_s);
     EXPECT_EQ(
-        QJsonDocument(desk.record().boxes[2].toObject()).toJson(QJsonDocument::Compact),
+        json(desk.record().boxes[2]),
         R"({"answer":"no","buttons":"yesno","default":"no","icon":"exclamation","text":"Overwrite?","title":"Login"})");
-    EXPECT_EQ(QJsonDocument(desk.record().inputs[0].toObject()).toJson(QJsonDocument::Compact),
-              R"({"answer":"abc","prompt":"Enter a filter","title":"List"})");
+    EXPECT_EQ(json(desk.record().inputs[0]), R"({"answer":"abc","prompt":"Enter a filter","title":"List"})");
 }
 
 TEST(Seam, AProgramIsStartedUnderItsHostName)
@@ -51,21 +54,6 @@ TEST(Seam, AProgramIsStartedUnderItsHostName)
         QThread::msleep(10);
     EXPECT_EQ(files::read(trace), profile.root()) << "it works on the profile of who started it";
     EXPECT_THROW(desktop::startProgram(u"c:\\missing.exe"_s), RuntimeError);
-}
-
-/// Waits until a window of this kind appears and calls `act` with it.
-template <class Window, class Act>
-static void whenShown(const Act& act)
-{
-    auto* timer = new QTimer(qApp);
-    QObject::connect(timer, &QTimer::timeout, timer, [timer, act] {
-        if (auto* window = qobject_cast<Window*>(QApplication::activeModalWidget())) {
-            timer->deleteLater();
-            timer->stop();
-            act(*window);
-        }
-    });
-    timer->start(1);
 }
 
 struct Person : testing::Test {

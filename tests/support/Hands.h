@@ -3,9 +3,10 @@
 
 #include "platform/desktop/Window.h"
 
-#include <QCoreApplication>
+#include <QApplication>
 #include <QPrintDialog>
 #include <QPrinter>
+#include <QTimer>
 #include <QToolButton>
 
 #include <map>
@@ -45,6 +46,21 @@ template <class Control>
 Control& control(QDialog& window, const char* name)
 {
     return *window.findChild<Control*>(QString::fromLatin1(name));
+}
+
+/// Calls `act` with the next modal window of this kind that a person sees.
+template <class Window>
+void whenShown(const std::function<void(Window&)>& act)
+{
+    auto* timer = new QTimer(qApp);
+    QObject::connect(timer, &QTimer::timeout, timer, [timer, act] {
+        if (auto* window = qobject_cast<Window*>(QApplication::activeModalWidget())) {
+            timer->deleteLater();
+            timer->stop();
+            act(*window);
+        }
+    });
+    timer->start(1);
 }
 
 /// Clicks "Print" in a window and answers the printer dialog: prints to that file, all pages or only one.

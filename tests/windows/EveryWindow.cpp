@@ -24,13 +24,6 @@ namespace {
 
 const QString document = u"c:\\wirdoc\\PDF\\500.0_1.pdf"_s;
 
-void makeDocument()
-{
-    QPdfWriter writer(files::systemPath(document));
-    QPainter painter(&writer);
-    painter.drawText(2000, 2000, u"Authority for sublet work"_s);
-}
-
 bool isBuiltIn(const QWidget& widget)
 {
     for (const QWidget* above = widget.parentWidget(); above && !above->isWindow(); above = above->parentWidget())
@@ -59,24 +52,19 @@ EveryWindow::EveryWindow()
     row.line(1, "MIS", "Wheel alignment").set("VENDOR", vendor("Straight Track").id());
     const journal::Operation operation(journal::Kind::Save);
     gConn->execute(u"UPDATE QUOTE1 SET CLAIM='7700002' WHERE QTNNO='500'"_s);
-    makeDocument();
+    QPdfWriter writer(files::systemPath(document));
+    QPainter(&writer).drawText(2000, 2000, u"Authority for sublet work"_s);
 }
 
 // Shows real boxes, without a script.
 void EveryWindow::showBox(const std::function<void()>& show, const Check& check)
 {
     desktop::usePerson();
-    QTimer timer;
-    QObject::connect(&timer, &QTimer::timeout, &timer, [&] {
-        auto* box = qobject_cast<QDialog*>(QApplication::activeModalWidget());
-        if (!box)
-            return;
-        timer.stop();
-        desktop::gestures::activate(*box);
-        check(*box);
-        box->close();
+    whenShown<QDialog>([&](QDialog& box) {
+        desktop::gestures::activate(box);
+        check(box);
+        box.close();
     });
-    timer.start(1);
     SCOPED_TRACE("a box");
     show();
 }
@@ -134,10 +122,8 @@ void EveryWindow::each(const Check& check)
 
 QList<QWidget*> controlsOf(const QDialog& window)
 {
-    QList<QWidget*> result;
-    for (QWidget* widget : window.findChildren<QWidget*>())
-        if (isControl(*widget) && widget->isVisible() && widget->isEnabled() && !isBuiltIn(*widget))
-            result.append(widget);
+    QList<QWidget*> result = visible<QWidget>(window);
+    result.removeIf([](const QWidget* one) { return !isControl(*one) || !one->isEnabled() || isBuiltIn(*one); });
     return result;
 }
 

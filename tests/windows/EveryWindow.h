@@ -25,6 +25,15 @@ bool isA(const QWidget& widget)
     return (qobject_cast<const Kinds*>(&widget) || ...);
 }
 
+/// Returns the visible widgets of a kind in the window.
+template <class Kind>
+QList<Kind*> visible(const QDialog& window)
+{
+    QList<Kind*> all = window.findChildren<Kind*>();
+    all.removeIf([](const QWidget* widget) { return !widget->isVisible(); });
+    return all;
+}
+
 /// Returns the visible and enabled controls that a person can use, without the parts that Qt creates inside of them.
 QList<QWidget*> controlsOf(const QDialog& window);
 /// Returns the name of a control for error messages.

@@ -1,4 +1,4 @@
-// Tests what a person sees on a dark desktop and by the keyboard's focus, and what a screen reader hears.
+// Tests what a person sees on a dark desktop and by the keyboard's focus, and what its status line announces.
 #include "platform/desktop/Colours.h"
 #include "platform/desktop/StatusLine.h"
 #include "platform/script/Gestures.h"
@@ -56,10 +56,9 @@ TEST_F(EveryWindow, CanBeReadOnDarkAndOnStarkDesktops)
         each([](QDialog& window) {
             gestures::settle();
             const bool isSystems = !window.objectName().startsWith("frm"_L1);
-            for (const QWidget* widget : window.findChildren<QWidget*>()) {
-                const bool hasText =
-                    isA<QLabel, QAbstractButton, QLineEdit, QComboBox, QTreeView, QPlainTextEdit>(*widget);
-                if (!hasText || !widget->isVisible() || !widget->isEnabled())
+            for (const QWidget* widget : visible<QWidget>(window)) {
+                if (!widget->isEnabled() ||
+                    !isA<QLabel, QAbstractButton, QLineEdit, QComboBox, QTreeView, QPlainTextEdit>(*widget))
                     continue;
                 EXPECT_GE(textContrast(*widget), readableText) << nameOf(*widget);
                 const auto* button = qobject_cast<const QAbstractButton*>(widget);
@@ -94,40 +93,10 @@ TEST_F(EveryWindow, ShowsWhichControlHasTheFocus)
     });
 }
 
-TEST_F(EveryWindow, TellsRowAndColumnOfEachCellToAScreenReader)
-{
-    each([](QDialog& window) {
-        for (QTreeView* list : window.findChildren<QTreeView*>()) {
-            if (!list->isVisible() || list->model()->rowCount() == 0)
-                continue;
-            QAccessibleTableInterface* table = QAccessible::queryAccessibleInterface(list)->tableInterface();
-            ASSERT_TRUE(table);
-            EXPECT_EQ(table->rowCount(), list->model()->rowCount());
-            for (int column = 0; column < list->model()->columnCount(); ++column) {
-                QAccessibleInterface* cell = table->cellAt(0, column);
-                ASSERT_TRUE(cell && cell->tableCellInterface()) << column;
-                EXPECT_EQ(cell->tableCellInterface()->rowIndex(), 0);
-                EXPECT_EQ(cell->tableCellInterface()->columnIndex(), column);
-                EXPECT_EQ(cell->text(QAccessible::Name), list->model()->index(0, column).data().toString());
-                EXPECT_TRUE(list->model()
-                                ->index(0, column)
-                                .data(Qt::ToolTipRole)
-                                .toString()
-                                .contains(list->model()->index(0, column).data().toString()))
-                    << "a long text can be read whole";
-                EXPECT_EQ(table->columnDescription(column),
-                          list->model()->headerData(column, Qt::Horizontal).toString());
-            }
-        }
-    });
-}
-
 TEST_F(EveryWindow, OffersButtonsAndCopyInTheMenuOfItsList)
 {
     each([](QDialog& window) {
-        for (QTreeView* list : window.findChildren<QTreeView*>()) {
-            if (!list->isVisible())
-                continue;
+        for (QTreeView* list : visible<QTreeView>(window)) {
             const QPoint place = list->viewport()->rect().center();
             QContextMenuEvent asks(QContextMenuEvent::Mouse, place, list->viewport()->mapToGlobal(place));
             QCoreApplication::sendEvent(list->viewport(), &asks);
