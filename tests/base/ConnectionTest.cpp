@@ -3,7 +3,6 @@
 #include "support/Shop.h"
 #include "support/TdsServer.h"
 
-#include <QElapsedTimer>
 #include <QTcpServer>
 
 static void setSetting(const QString& key, const QString& value, const QString& section = u"wirra32\\frmsplash"_s)
@@ -24,7 +23,13 @@ TEST(connectionText, NamesTheServerAsItsDriverExpects)
     }
 }
 
-class ShopConnection : public test::Shop {};
+struct ShopConnection : Shop {
+    static void openWith(const QString& key, const QString& value)
+    {
+        setSetting(key, value);
+        OpenDatabase();
+    }
+};
 
 TEST_F(ShopConnection, ATabletWorksOnTheMasterOrOnItsOwn)
 {
@@ -32,8 +37,7 @@ TEST_F(ShopConnection, ATabletWorksOnTheMasterOrOnItsOwn)
     setSetting(u"TabletMasterDatabaseName"_s, u"Master"_s);
     for (const auto& [useMaster, database, local] :
          {std::tuple(u"1"_s, u"Master"_s, false), {u"0"_s, u"Own"_s, true}, {u"yes"_s, u"Own"_s, false}}) {
-        setSetting(u"TabletUseMaster"_s, useMaster);
-        OpenDatabase();
+        openWith(u"TabletUseMaster"_s, useMaster);
         EXPECT_EQ(gsDatabase, database) << useMaster;
         EXPECT_EQ(gbTabletLocal, local) << useMaster;
     }
@@ -85,15 +89,13 @@ TEST_F(ShopConnection, ASilentServerCostsFiveSecondsForAllStepsTogether)
     for (int step = 0; step < 3; ++step)
         EXPECT_EQ(GetConnection(), nullptr);
     EXPECT_LT(time.elapsed(), 5000);
-    setSetting(u"ServerName"_s, u"(local)"_s);
-    OpenDatabase();
+    openWith(u"ServerName"_s, u"(local)"_s);
     EXPECT_TRUE(EnsureConnection());
 }
 
 TEST_F(ShopConnection, ASettingLowersTheTimeOfAStatement)
 {
-    setSetting(u"CommandTimeout"_s, u"1"_s);
-    OpenDatabase();
+    openWith(u"CommandTimeout"_s, u"1"_s);
     QElapsedTimer time;
     time.start();
     EXPECT_THROW(opened(u"WITH RECURSIVE n(i) AS (SELECT 1 UNION ALL SELECT i + 1 FROM n) SELECT COUNT(*) FROM n"_s),
@@ -103,18 +105,15 @@ TEST_F(ShopConnection, ASettingLowersTheTimeOfAStatement)
 
 TEST_F(ShopConnection, TheOptionsOfTheSettingOrTheVariableReachTheDriver)
 {
-    const test::OdbcDrivers drivers(test::OdbcDrivers::WithSqlServer);
-    test::tdsServer().createDatabase(u"WirSql"_s);
-    const QString options = u"Server="_s + test::tdsServer().address();
-    setSetting(u"ServerName"_s, u"127.0.0.1,1"_s);
-    OpenDatabase();
+    const OdbcDrivers drivers(OdbcDrivers::WithSqlServer);
+    tdsServer().createDatabase(u"WirSql"_s);
+    const QString options = u"Server="_s + tdsServer().address();
+    openWith(u"ServerName"_s, u"127.0.0.1,1"_s);
     EXPECT_FALSE(gcnDB->answers());
-    setSetting(u"OdbcOptions"_s, options);
-    OpenDatabase();
+    openWith(u"OdbcOptions"_s, options);
     EXPECT_TRUE(gcnDB->answers()) << connectionFailure();
-    setSetting(u"OdbcOptions"_s, u""_s);
     qputenv("KEST2_ODBC_OPTIONS", options.toUtf8());
-    OpenDatabase();
+    openWith(u"OdbcOptions"_s, u""_s);
     EXPECT_TRUE(gcnDB->answers()) << connectionFailure();
     qunsetenv("KEST2_ODBC_OPTIONS");
 }

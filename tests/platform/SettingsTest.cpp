@@ -6,6 +6,8 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <ranges>
+
 using namespace kest::settings;
 
 const QString key = u"SOFTWARE\\wirra32\\frmsplash"_s;
@@ -55,19 +57,15 @@ TEST_F(Registry, AnyTextSurvives)
 TEST_F(Registry, TwoProcessesWriteAtOnce)
 {
     const auto writeAll = [](const QString& who) {
-        for (int i = 0; i < 40; ++i)
-            if (!set(who + QString::number(i), who))
-                return false;
-        return true;
+        const auto write = [&](int number) { return set(who + QString::number(number), who); };
+        return std::ranges::all_of(std::views::iota(0, 40), write);
     };
     const pid_t child = ::fork();
     ASSERT_GE(child, 0);
     if (child == 0)
         ::_exit(writeAll(u"child"_s) ? 0 : 1);
     EXPECT_TRUE(writeAll(u"parent"_s));
-    int status = -1;
-    ASSERT_EQ(::waitpid(child, &status, 0), child);
-    EXPECT_EQ(status, 0);
+    ASSERT_EQ(::waitpid(child, nullptr, 0), child);
     EXPECT_EQ(entries().size(), 80);
 }
 
