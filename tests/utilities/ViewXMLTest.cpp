@@ -44,20 +44,16 @@ const QString leave = u"Are you sure you want to exit without saving this messag
 TEST_F(Viewer, ASaveWritesTheTextWithoutTheWrapper)
 {
     const QByteArray longValue(3'000'000, 'Q');  // a base64 document
-    struct {
-        QByteArray content, written;
-        std::string typed = {};
-    } const cases[] = {
-        {"<a>1</a><b>2</b>", "\r\n\t<a>1</a>\r\n\t<b>2</b>\r\n"},
-        {"<request><a>1</a></request>", "\r\n\t<a>1</a>\r\n"},
-        {"<a>&lt;b&gt; &amp;amp; &amp;lt; &amp;amp;lt;</a>", "<a><b> & < &lt;</a>\r\n"},
-        {"<a>caf\xe9\xa0\x80 one\ntwo</a>", "<a>caf\xe9\xa0\x80 one\ntwo</a>\r\n"},
-        {"<a><pdf>" + longValue + "</pdf></a>", "<a>\r\n\t<pdf>" + longValue + "</pdf>\r\n</a>\r\n"},
-        {"<a>1</a>", "<a>\r\n2</a>", R"({"set": "txtXML", "text": "<a>\n2</a>"}, )"},
-    };
-    for (const auto& c : cases) {
-        EXPECT_EQ(view(c.content, c.typed + save), QStringList(overwrite));
-        EXPECT_TRUE(written() == c.written) << written().left(100).toStdString();
+    const std::tuple<std::string, QByteArray, QByteArray> cases[] = {
+        {"", "<a>1</a><b>2</b>", "\r\n\t<a>1</a>\r\n\t<b>2</b>\r\n"},
+        {"", "<request><a>1</a></request>", "\r\n\t<a>1</a>\r\n"},
+        {"", "<a>&lt;b&gt; &amp;amp; &amp;lt; &amp;amp;lt;</a>", "<a><b> & < &lt;</a>\r\n"},
+        {"", "<a>caf\xe9\xa0\x80 one\ntwo</a>", "<a>caf\xe9\xa0\x80 one\ntwo</a>\r\n"},
+        {"", "<a><pdf>" + longValue + "</pdf></a>", "<a>\r\n\t<pdf>" + longValue + "</pdf>\r\n</a>\r\n"},
+        {R"({"set": "txtXML", "text": "<a>\n2</a>"}, )", "<a>1</a>", "<a>\r\n2</a>"}};
+    for (const auto& [typed, content, expected] : cases) {
+        EXPECT_EQ(view(content, typed + save), QStringList(overwrite));
+        EXPECT_TRUE(written() == expected) << written().left(100).toStdString();
     }
 }
 
