@@ -117,7 +117,7 @@ TEST_F(EveryWindow, AnnouncesWhatItsStatusLineSays)
     each([](QDialog& window) {
         QStringList announced;
         for (desktop::StatusLine* line : window.findChildren<desktop::StatusLine*>()) {
-            QObject::connect(line, &desktop::StatusLine::told, &window, [&](const QString& text) {
+            QObject::connect(line, &desktop::StatusLine::told, &window, [&announced, line](const QString& text) {
                 announced.append(text);
                 const QAccessibleInterface* heard = QAccessible::queryAccessibleInterface(line);
                 EXPECT_EQ(heard->role(), QAccessible::StatusBar);

@@ -105,7 +105,7 @@ private:
         raise();
     }
 
-    QPointer<QPushButton> button;
+    QPointer<QWidget> button;  // not of QPushButton, which it no longer is while its destructor runs
 };
 
 }  // namespace
