@@ -263,7 +263,12 @@ QString wordOf(State state)
 
 QString hashOf(const QString& text)
 {
-    return QString::fromLatin1(QCryptographicHash::hash(text.toUtf8(), QCryptographicHash::Sha256).toHex());
+    return hashOf(text.toUtf8());
+}
+
+QString hashOf(const QByteArray& bytes)
+{
+    return QString::fromLatin1(QCryptographicHash::hash(bytes, QCryptographicHash::Sha256).toHex());
 }
 
 void watch(const db::ConnectionPtr& connection)

@@ -51,8 +51,9 @@ struct Entry {
     QJsonObject facts;       // what finishing it needs
 };
 
-/// Returns a hash that identifies the text of a message or document.
+/// Returns a hash that identifies the text of a message, or the bytes of a document.
 QString hashOf(const QString& text);
+QString hashOf(const QByteArray& bytes);
 
 /// Makes the journal see the changes on the connection. Call it once the connection is open.
 void watch(const db::ConnectionPtr& connection);

@@ -9,12 +9,13 @@
 #include "messages/MessageLines.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
-#include "platform/files/CodePage.h"
+#include "platform/files/Base64.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
 #include "quotedata/NetworkCodes.h"
 #include "quotedata/Vendors.h"
 
+#include <QCryptographicHash>
 #include <QJsonArray>
 
 namespace kest {
@@ -238,12 +239,14 @@ qint64 takeDocument(const db::Recordset& quote, const MessageLine& line, qint64 
     if (number == 0)
         number = numberForDocument(key, before);
     const QString path = NextDocumentName(key.number, key.subquote, number);
-    const QByteArray bytes = files::fromBase64(document.utf8());
+    const QByteArray base64 = document.utf8();
+    QCryptographicHash hash(QCryptographicHash::Sha256);
+    files::decodeBase64(base64, [&](const QByteArray& bytes) { hash.addData(bytes); });
     // first, so that taking an interrupted load back removes the document, too
     QJsonArray written = journal::kept(u"documents"_s).toArray();
-    written.append(QJsonArray{path, journal::hashOf(QString::fromLatin1(bytes))});
+    written.append(QJsonArray{path, QString::fromLatin1(hash.result().toHex())});
     journal::keep(u"documents"_s, written);
-    files::writeBytes(path, bytes);
+    files::writeBase64(path, base64);
     gbSubletDocumentArrived = true;
     return number;
 }

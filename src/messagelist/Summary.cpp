@@ -179,10 +179,9 @@ void Fill::hold(const QString& file, const QString& type, const QString& waitsFo
 
 bool Fill::parse(const QString& path)
 {
-    const QByteArray bytes = files::readStart(path, xml::Document::maximumBytes + 1);
-    if (bytes.size() > xml::Document::maximumBytes)
+    text = files::fromCodePage(files::readStart(path, xml::Document::maximumBytes + 1));
+    if (text.size() > xml::Document::maximumBytes)
         return false;
-    text = files::fromCodePage(bytes);
     if (folder != MessageFolder::Sent)
         return parseWithRepairs(document, text);
     if (!escapeAmpersands(text))

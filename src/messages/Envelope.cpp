@@ -11,6 +11,7 @@ namespace {
 constexpr QLatin1StringView networkDomain = "orla.example"_L1;  // every namespace of the network ends in this
 constexpr QLatin1StringView schemaInstance = "xmlns:xsi=\"http://www.w3.org/2001/XMLSchema-instance\" "_L1;
 constexpr int repairsAllowed = 3;
+constexpr qsizetype mostKeptForLong = 1'000'000;  // characters; a second parse costs less than that much memory
 
 struct LastMessage {
     QString text;
@@ -144,7 +145,7 @@ xml::Document parsedMessage(QString& text)
 
 SharedMessage sharedMessage(QString& text)
 {
-    text = AddXsiDeclaration(text);
+    text = AddXsiDeclaration(std::move(text));
     if (lastMessage.document && lastMessage.text == text)
         return lastMessage.document;
     const auto document = std::make_shared<const xml::Document>(parsedMessage(text));
@@ -160,7 +161,7 @@ KeptMessage::KeptMessage()
 
 KeptMessage::~KeptMessage()
 {
-    if (--keepers == 0)
+    if (--keepers == 0 || lastMessage.text.size() > mostKeptForLong)
         lastMessage = {};
 }
 

@@ -51,7 +51,8 @@ using SharedMessage = std::shared_ptr<const xml::Document>;
 SharedMessage sharedMessage(QString& text);
 
 /// While an object exists, the last document of sharedMessage() is kept, because the steps of a load read the same text
-/// one after the other. It is not kept longer, because a message can contain documents of many megabytes.
+/// one after the other. It is not kept longer, because a message can contain documents of many megabytes. A long text
+/// is kept only until the first object is destroyed.
 class KeptMessage {
 public:
     KeptMessage();

@@ -91,8 +91,7 @@ void removeDocuments(const journal::Entry& entry)
 {
     for (const QJsonValue written : entry.facts[u"documents"_s].toArray()) {
         const QString path = written[0].toString();
-        if (files::exists(path) &&
-            journal::hashOf(QString::fromLatin1(files::readBytes(path))) == written[1].toString())
+        if (files::exists(path) && journal::hashOf(files::readBytes(path)) == written[1].toString())
             files::remove(path);
     }
 }

@@ -1,7 +1,5 @@
 #include "platform/files/CodePage.h"
 
-#include "platform/RuntimeError.h"
-
 #include <algorithm>
 #include <iterator>
 
@@ -25,11 +23,6 @@ char byteOf(char16_t c)
         return static_cast<char>(c);
     const auto* place = std::find(std::begin(upperControls), std::end(upperControls), c);
     return place == std::end(upperControls) ? '?' : static_cast<char>(0x80 + (place - std::begin(upperControls)));
-}
-
-bool isWhiteSpace(char c)
-{
-    return c == ' ' || c == '\t' || c == '\r' || c == '\n' || c == '\f' || c == '\v';
 }
 
 }  // namespace
@@ -61,18 +54,6 @@ QString fromCodePage(const QByteArray& bytes)
             c = upperControls[c.unicode() - 0x80];
     }
     return text;
-}
-
-QByteArray fromBase64(QByteArrayView text)
-{
-    QByteArray letters = text.toByteArray();
-    letters.removeIf(isWhiteSpace);
-    const bool isWhole = letters.size() % 4 == 0;  // which Qt checks only if there is padding
-    const auto result = QByteArray::fromBase64Encoding(
-        std::move(letters), QByteArray::Base64Encoding | QByteArray::AbortOnBase64DecodingErrors);
-    if (!isWhole || !result)
-        throw RuntimeError(TypeMismatch, u"The text is not base64"_s);
-    return *result;
 }
 
 }  // namespace kest::files

@@ -10,7 +10,5 @@ namespace kest::files {
 QByteArray toCodePage(const QString& text);
 /// Decodes Windows-1252. All 256 bytes are characters.
 QString fromCodePage(const QByteArray& bytes);
-/// Decodes base64 and ignores white space. Throws TypeMismatch for any other character or a wrong length.
-QByteArray fromBase64(QByteArrayView text);
 
 }  // namespace kest::files
