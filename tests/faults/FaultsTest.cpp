@@ -5,6 +5,7 @@
 #include "jobexport/WriteQuote.h"
 #include "messages/Folders.h"
 #include "outbound/SendQuote.h"
+#include "reports/PrintXML.h"
 #include "support/MariaDbServer.h"
 #include "utilities/frmLogin.h"
 #include "utilities/frmUtilities.h"
@@ -171,6 +172,23 @@ TEST_F(Others, SaveInTheViewer)
         control<QPushButton>(window, "cmdOK").click();
     };
     survives(u"SaveInTheViewer"_s, save);
+}
+
+TEST_F(Others, Print)
+{
+    quote("500").request("QR1").quoteNumber("KQ1");
+    files::write(gsReadPath + u"m.xml"_s, assessmentResult("KQ1").text());
+    putTemplate(720);
+    const QString printed = root() + u"/printed.pdf"_s;
+    survives(u"Print"_s, {[] {
+                              gsListFolder = gsReadPath;
+                              PrintXML(u"m.xml"_s, true);
+                          },
+                          [=] { return QFile::exists(printed); },
+                          [=] { QFile::remove(printed); },
+                          {},
+                          "{}",
+                          printing(u"frmPrintPreview"_s, printed, 0)});
 }
 
 TEST_F(Others, Export)
