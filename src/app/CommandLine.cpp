@@ -63,6 +63,7 @@ QString usage()
   joblink set --server S --port N --database D --user U     the password is read from standard input
   view unread|read|sent FILE    the indented text of a message
   history QTNNO [SUBQUOTE]      what changed a quote: when, by which message, and from what to what
+  undo OPERATION                take a load back that history shows, and its message to the unread folder; asks first
   check-database [--prepare]    try on the quote database everything that is relied on, in scratch tables;
                                 --prepare first creates missing indexes and the journal
   setting list | get APP SECTION KEY | set APP SECTION KEY VALUE     a password is read from standard input

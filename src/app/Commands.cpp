@@ -270,6 +270,7 @@ const std::map<QString, Command> commands{
     {u"setting"_s, {Needs::Profile, 1, 5, with(setting)}},
     {u"joblink"_s, {Needs::Connection, 1, 9, with(jobLink)}},
     {u"history"_s, {Needs::Connection, 1, 2, with(history)}},
+    {u"undo"_s, {Needs::Connection, 1, 1, with(undo)}},
     {u"held"_s, {Needs::Connection, 0, 0, with(held)}},
     {u"transport"_s, {Needs::Profile, 0, 1, transport}},
     {u"check-database"_s, {Needs::Connection, 0, 1, with(checkDatabase)}},

@@ -1,7 +1,9 @@
 #include "app/HistoryCommands.h"
 
 #include "base/History.h"
+#include "platform/Prompt.h"
 #include "platform/values.h"
+#include "recovery/Undo.h"
 
 #include <QJsonArray>
 #include <QJsonObject>
@@ -68,6 +70,22 @@ Outcome history(const QStringList& arguments)
         text = journal::isKept() ? u"Nothing is recorded for quote %1.\n"_s.arg(arguments[0])
                                  : u"This database keeps no journal.\n"_s;
     return {.fields = {{u"operations"_s, operations}}, .text = text};
+}
+
+Outcome undo(const QStringList& arguments)
+{
+    bool isNumber = false;
+    const qint64 operation = arguments[0].toLongLong(&isNumber);
+    if (!isNumber)
+        return refused(u"undo takes the number of an operation, as history shows it"_s, Usage);
+    const QStringList reasons = recovery::obstaclesToUndo(operation);
+    if (!reasons.isEmpty())
+        return refused(u"operation %1 can't be undone: "_s.arg(operation) + reasons.join(u' '), Refused);
+    if (!desktop::ask(recovery::undoQuestion(operation), desktop::Icon::Exclamation, u"undo"_s, desktop::Answer::No))
+        return {.exitCode = Refused};
+    const QStringList left = recovery::undo(operation);
+    return {.fields = {{u"left"_s, QJsonArray::fromStringList(left)}},
+            .text = (QStringList(u"The load is undone."_s) + left).join(u' ') + u'\n'};
 }
 
 QJsonArray jsonOf(const QList<recovery::Settled>& operations)

@@ -173,6 +173,8 @@ QString titleOf(const Entry& entry)
 {
     if (entry.kind == wordOf(Kind::Load))
         return u"load of "_s + entry.file;
+    if (entry.kind == wordOf(Kind::Undo))
+        return u"undo of the load of "_s + entry.file;
     if (entry.kind == wordOf(Kind::Save))
         return u"save in the utilities"_s;
     if (entry.kind == wordOf(Kind::Response))

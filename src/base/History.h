@@ -44,7 +44,8 @@ QString wordOf(db::ChangeKind kind);
 /// Returns the key of a row, such as "QTNNO 1007, SUBQUOTE 0".
 QString keyOf(const db::RowChange& row);
 
-/// Returns a title such as "load of AUQT_1007.xml", "send" or "save in the utilities".
+/// Returns a title such as "load of AUQT_1007.xml", "undo of the load of AUQT_1007.xml", "send" or "save in the
+/// utilities".
 QString titleOf(const Entry& entry);
 
 /// Deletes operations that are older than the setting "JournalDays", but none that is open or unfinished. Deletes at

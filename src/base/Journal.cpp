@@ -27,7 +27,7 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-constexpr std::array kindWords{"load"_L1, "send"_L1, "save"_L1, "response"_L1};
+constexpr std::array kindWords{"load"_L1, "send"_L1, "save"_L1, "response"_L1, "undo"_L1};
 constexpr std::array stateWords{"open"_L1,       "unfinished"_L1,  "done"_L1,    "failed"_L1,
                                 "taken back"_L1, "interrupted"_L1, "finished"_L1};
 
@@ -401,6 +401,17 @@ void openNow(const QString& number, const QString& subquote)
         openOperation();
         work->isCommitted = true;
     });
+}
+
+void record(const db::RowChange& change)
+{
+    if (work && recorder->isKept)
+        recorder->changed(*gConn, {change});
+}
+
+void setState(qint64 operation, State state)
+{
+    gConn->execute(sql("UPDATE KESTOperation SET State='{}' WHERE Operation={}", wordOf(state), operation));
 }
 
 }  // namespace kest::journal

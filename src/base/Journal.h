@@ -1,7 +1,7 @@
 // The journal: what each operation changed in the quote database, so that every change of a quote can be explained, and
 // interrupted work can be taken back or finished.
 //
-// An operation is a load of a message, a send, a save in the utilities or a submission response. Its row in
+// An operation is a load of a message, its undo, a send, a save in the utilities or a submission response. Its row in
 // KESTOperation and the record of each changed row in KESTJournal are written in the transaction of the change that
 // they belong to: both are there, or neither is. A database without these two tables works without a journal; the error
 // log says so once.
@@ -16,9 +16,13 @@
 #include <functional>
 #include <memory>
 
+namespace kest::db {
+struct RowChange;
+}
+
 namespace kest::journal {
 
-enum class Kind { Load, Send, Save, Response };
+enum class Kind { Load, Send, Save, Response, Undo };
 
 /// What became of an operation.
 enum class State {
@@ -102,5 +106,11 @@ void keep(const QString& fact, const QJsonValue& value);
 QJsonValue kept(const QString& fact);
 /// Opens the operation without a change, for one that begins with a file.
 void openNow(const QString& number, const QString& subquote);
+/// Records a change that the connection does not show because it takes another one back. Call it in the transaction of
+/// the change, after openNow().
+void record(const db::RowChange& change);
+
+/// Stores what became of another operation.
+void setState(qint64 operation, State state);
 
 }  // namespace kest::journal

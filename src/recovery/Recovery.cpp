@@ -8,6 +8,7 @@
 #include "platform/RuntimeError.h"
 #include "recovery/FinishLoad.h"
 #include "recovery/TakeBack.h"
+#include "recovery/Undo.h"
 
 #include <optional>
 #include <utility>
@@ -27,9 +28,14 @@ bool isOf(const journal::Entry& entry, journal::Kind kind)
     return entry.kind == journal::wordOf(kind);
 }
 
+bool isOfFile(const journal::Entry& entry, const QString& file)
+{
+    return entry.file.compare(file, Qt::CaseInsensitive) == 0;
+}
+
 bool isLoadOf(const journal::Entry& entry, const QString& file)
 {
-    return isOf(entry, journal::Kind::Load) && entry.file.compare(file, Qt::CaseInsensitive) == 0;
+    return isOf(entry, journal::Kind::Load) && isOfFile(entry, file);
 }
 
 bool isUnfinished(const journal::Entry& entry)
@@ -73,12 +79,26 @@ void settleIncomplete(const journal::Entry& entry, journal::Operation& operation
     tell({entry, left.isEmpty() ? Outcome::TakenBack : Outcome::Left, left});
 }
 
+void settleUndo(const journal::Entry& entry, journal::Operation& operation)
+{
+    const QStringList left = finishUndo();
+    const bool isMoved = !isMessageToMove();
+    if (isUnfinished(entry)) {
+        if (isMoved)
+            operation.end(journal::State::Done);
+        return;
+    }
+    operation.end(isMoved ? journal::State::Finished : journal::State::Unfinished);
+    tell({entry, Outcome::Finished, left});
+}
+
 void settleAlone(journal::Entry entry, const QString& lockedFile)
 {
     journal::endDeadSession(entry);
     // nobody may load the message meanwhile
     std::optional<db::Lock> load;
-    if (isOf(entry, journal::Kind::Load) && !isLoadOf(entry, lockedFile))
+    const bool hasMessage = isOf(entry, journal::Kind::Load) || isOf(entry, journal::Kind::Undo);
+    if (hasMessage && !isOfFile(entry, lockedFile))
         if (!load.emplace(gConn, loadLock(entry.file)).isHeld())
             return;
     journal::Operation operation(entry);
@@ -86,6 +106,8 @@ void settleAlone(journal::Entry entry, const QString& lockedFile)
         return;
     if (isOf(entry, journal::Kind::Send))
         settleSend(entry, operation);
+    else if (isOf(entry, journal::Kind::Undo))
+        settleUndo(entry, operation);
     else if (entry.pastPoint)
         settleComplete(entry, operation);
     else

@@ -1,7 +1,7 @@
 // Settles work that was interrupted, for example by a killed process, a power cut or a lost server.
 //
 // Each operation happens exactly once: before its last update was committed, an interrupted load is taken back; after
-// it, it is finished. A send is finished if its document was written.
+// it, it is finished. A send is finished if its document was written. An undo is always finished.
 #pragma once
 
 #include "base/Journal.h"

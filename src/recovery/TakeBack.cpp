@@ -12,6 +12,7 @@
 #include <QSet>
 
 #include <algorithm>
+#include <utility>
 
 namespace kest::recovery {
 
@@ -166,8 +167,20 @@ void markTakenBack(const QList<qint64>& entries)
         throw RuntimeError(RowChanged, u"Another workstation is taking this work back."_s);
 }
 
+/// Returns the change that takes another one back.
+db::RowChange reversed(db::RowChange change)
+{
+    if (change.kind != db::ChangeKind::Update)
+        change.kind = change.kind == db::ChangeKind::Insert ? db::ChangeKind::Delete : db::ChangeKind::Insert;
+    for (db::RowChange::Column& column : change.columns)
+        std::swap(column.before, column.after);
+    return change;
+}
+
+using Record = std::function<void(const db::RowChange&)>;
+
 /// Takes some rows back in one transaction, because each commit waits for the disk.
-QStringList takeBackTogether(const QList<RowHistory>& rows, const QSet<QString>& inUse)
+QStringList takeBackTogether(const QList<RowHistory>& rows, const QSet<QString>& inUse, const Record& record)
 {
     db::TakeBack together(*gConn);
     QList<qint64> taken;
@@ -175,6 +188,8 @@ QStringList takeBackTogether(const QList<RowHistory>& rows, const QSet<QString>&
         const bool isNewQuote = row.isNew() && row.isOf("QUOTE1"_L1);
         if ((isNewQuote && hasMore(row, 0, 0)) || !together.undo(row.net))
             return false;
+        if (record)
+            record(reversed(row.net));
         taken += row.entries;
         return true;
     });
@@ -185,14 +200,14 @@ QStringList takeBackTogether(const QList<RowHistory>& rows, const QSet<QString>&
 
 }  // namespace
 
-QStringList takeBack(qint64 operation)
+QStringList takeBack(qint64 operation, const std::function<void(const db::RowChange&)>& record)
 {
     constexpr qsizetype together = 100;  // rows
     const QList<RowHistory> rows = rowsOf(operation);
     const QSet<QString> inUse = quotesInUse(rows);
     QStringList left = sentencesOf(inUse);
     for (qsizetype first = 0; first < rows.size(); first += together)
-        left += takeBackTogether(rows.mid(first, together), inUse);
+        left += takeBackTogether(rows.mid(first, together), inUse, record);
     return left;
 }
 

@@ -1,15 +1,20 @@
 // Takes back what an operation changed.
 #pragma once
 
+#include "platform/database/Change.h"
+
 #include <QStringList>
+
+#include <functional>
 
 namespace kest::recovery {
 
 /// Takes the changes of an operation back, the newest row first, some rows in a transaction. A row goes back whole, and
 /// only if it still holds what the operation wrote last. New cars, customers and vendors and the counter of quotes
 /// stay, because other loads may use them. A new quote that has lines, notes or an invoice from elsewhere stays with
-/// all its rows. Can be interrupted and run again. Returns what could not be taken back, a sentence each.
-QStringList takeBack(qint64 operation);
+/// all its rows. Can be interrupted and run again. Returns what could not be taken back, a sentence each. `record` gets
+/// the change that takes a row back, in its transaction.
+QStringList takeBack(qint64 operation, const std::function<void(const db::RowChange&)>& record = {});
 
 /// Returns what takeBack() could not take back, a sentence each, and changes nothing.
 QStringList obstaclesTo(qint64 operation);
