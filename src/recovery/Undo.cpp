@@ -4,6 +4,7 @@
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "base/modLoggerEx.h"
+#include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
@@ -110,6 +111,26 @@ QStringList undo(qint64 operation)
     const QStringList left = finishUndo();
     work.end(isMessageToMove() ? journal::State::Unfinished : journal::State::Done);
     return left;
+}
+
+bool askAndUndo(qint64 operation)
+{
+    const QString title = u"Undo"_s;
+    const auto tell = [&](const QString& what, const QStringList& sentences) {
+        desktop::msgBox(what + u"\r\n\r\n"_s + sentences.join(u"\r\n"_s), desktop::Icon::Exclamation, title);
+    };
+    const QStringList reasons = obstaclesToUndo(operation);
+    if (!reasons.isEmpty()) {
+        tell(u"Operation %1 can't be undone."_s.arg(operation), reasons);
+        return false;
+    }
+    if (!desktop::ask(undoQuestion(operation), desktop::Icon::Exclamation, title, desktop::Answer::No))
+        return false;
+    EnsureConnection();  // the question may have been open for hours
+    const QStringList left = undo(operation);
+    if (!left.isEmpty())
+        tell(u"The load is undone."_s, left);
+    return true;
 }
 
 QStringList finishUndo()

@@ -20,6 +20,10 @@ QString undoQuestion(qint64 operation);
 /// each. Throws RowChanged with the reasons if the operation can't be undone.
 QStringList undo(qint64 operation);
 
+/// Undoes a load if the user answers Yes. A box says why the load can't be undone, or what was not done. Returns true
+/// if it was undone.
+bool askAndUndo(qint64 operation);
+
 /// Goes on with an undo inside its operation.
 QStringList finishUndo();
 /// Returns true if the message of the load that is undone still has to be moved.

@@ -12,6 +12,7 @@
 #include "platform/files/files.h"
 #include "platform/profile.h"
 #include "recovery/Recovery.h"
+#include "recovery/Undo.h"
 #include "utilities/frmLogin.h"
 #include "utilities/frmUtilities.h"
 
@@ -183,7 +184,7 @@ void frmKEST::openUtilities()
     frmLogin::ShowForm(passed);
     if (!passed)
         return;
-    frmUtilities::ShowForm(grsQuote->text(u"QTNNO"_s), grsQuote->text(u"Subquote"_s));
+    frmUtilities::ShowForm(grsQuote->text(u"QTNNO"_s), grsQuote->text(u"Subquote"_s), recovery::askAndUndo);
     EnsureConnection();  // it may have been lost while the window was open
     grsQuote->requery();
 }

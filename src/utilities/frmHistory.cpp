@@ -3,6 +3,7 @@
 #include "base/modDBAccess.h"
 #include "platform/desktop/ListSearch.h"
 #include "platform/desktop/Lists.h"
+#include "platform/desktop/Progress.h"
 #include "platform/desktop/StatusLine.h"
 #include "platform/desktop/Window.h"
 
@@ -17,6 +18,7 @@
 
 #include <algorithm>
 #include <initializer_list>
+#include <utility>
 
 using namespace Qt::StringLiterals;
 
@@ -84,7 +86,6 @@ QTreeWidget* newList(const QString& name, const QString& heard, const QStringLis
     int column = 0;
     for (const int width : widths)
         list->setColumnWidth(column++, desktop::pixels(width));
-    desktop::addListMenu(*list, window, {});
     return list;
 }
 
@@ -97,9 +98,10 @@ QLabel* labelOf(QWidget* list, const QString& caption)
 
 }  // namespace
 
-frmHistory::frmHistory(const QString& number)
+frmHistory::frmHistory(const QString& number, Undo undoLoad)
     : Form(u"frmHistory"_s, u"History of Quote "_s + number),
       sQTNNO(number),
+      undo(std::move(undoLoad)),
       ListView1(newList(u"ListView1"_s, u"Operations on the quote"_s,
                         {u"No."_s, u"Time"_s, u"Workstation"_s, u"Operation"_s, u"State"_s}, objectName(),
                         {900, 2400, 2100, 4200})),
@@ -108,6 +110,7 @@ frmHistory::frmHistory(const QString& number)
                         {1400, 1600, 2400, 1900, 2400})),
       txtFind(new QLineEdit),
       lblStatus(new desktop::StatusLine(u"lblStatus"_s)),
+      cmdUndo(button(u"cmdUndo"_s, u"&Undo"_s, [this] { cmdUndo_Click(); })),
       cmdClose(button(u"cmdClose"_s, u"C&lose"_s, [this] { close(); }))
 {
     setWindowFlag(Qt::WindowMaximizeButtonHint);
@@ -117,10 +120,12 @@ frmHistory::frmHistory(const QString& number)
     txtFind->setPlaceholderText(u"Find (Ctrl+F)"_s);
     txtFind->setClearButtonEnabled(true);
     new desktop::ListSearch(*ListView1, *txtFind);
+    cmdUndo->setAccessibleName(u"Undo the chosen load"_s);
+    cmdUndo->setToolTip(u"Take back all that the chosen load has changed, and make its message unread again"_s);
+    cmdUndo->setVisible(bool(undo));
+    desktop::addListMenu(*ListView1, objectName(), {cmdUndo});
+    desktop::addListMenu(*ListView2, objectName(), {});
     arrange();
-
-    for (const journal::Entry& entry : journal::historyOf(sQTNNO, {}))
-        ListView1->addTopLevelItem(new OperationItem(entry));
 
     on(txtFind, &QLineEdit::textChanged, u"txtFind_Change"_s, [this] { txtFind_Change(); });
     on(ListView1, &QTreeWidget::currentItemChanged, u"ListView1_ItemClick"_s, [this] { ListView1_ItemClick(); });
@@ -128,15 +133,24 @@ frmHistory::frmHistory(const QString& number)
         txtFind->setFocus();
         txtFind->selectAll();
     });
-    txtFind_Change();
+    fill();
     ListView1->setFocus();
 }
 
-void frmHistory::ShowForm(const QString& number)
+bool frmHistory::ShowForm(const QString& number, const Undo& undo)
 {
     EnsureConnection();
-    frmHistory form(number);
+    frmHistory form(number, undo);
     desktop::showModal(form);
+    return form.isUndone;
+}
+
+void frmHistory::fill()
+{
+    ListView1->clear();
+    for (const journal::Entry& entry : journal::historyOf(sQTNNO, {}))
+        ListView1->addTopLevelItem(new OperationItem(entry));
+    txtFind_Change();
 }
 
 void frmHistory::arrange()
@@ -148,6 +162,7 @@ void frmHistory::arrange()
     txtFind->setMinimumWidth(desktop::pixels(3000));
     auto* bottom = new QHBoxLayout;
     bottom->addWidget(lblStatus, 1);
+    bottom->addWidget(cmdUndo);
     bottom->addWidget(cmdClose);
     auto* layout = new QVBoxLayout(this);
     layout->addLayout(top);
@@ -207,6 +222,7 @@ void frmHistory::ListView1_ItemClick()
 {
     ListView2->clear();
     const qint64 operation = chosen();
+    cmdUndo->setEnabled(operation != 0);
     if (operation == 0)
         return;
     const bool areSome = hasFoundText(operation);  // otherwise the text was found in the operation itself
@@ -217,6 +233,16 @@ void frmHistory::ListView1_ItemClick()
         explainCells(*row);
     }
     ListView2->setCurrentItem(ListView2->topLevelItem(0));
+}
+
+void frmHistory::cmdUndo_Click()
+{
+    EnsureConnection();
+    const desktop::WaitPointer pointer(u"Undoing the load..."_s);
+    if (!undo(chosen()))
+        return;
+    isUndone = true;
+    fill();
 }
 
 void frmHistory::tellCount(int visible)

@@ -13,7 +13,6 @@
 #include "quotedata/Quote.h"
 #include "utilities/ExactTextEdit.h"
 #include "utilities/StatusRepair.h"
-#include "utilities/frmHistory.h"
 
 #include <QCheckBox>
 #include <QGridLayout>
@@ -24,6 +23,8 @@
 #include <QPushButton>
 #include <QTabBar>
 #include <QVBoxLayout>
+
+#include <utility>
 
 using namespace Qt::StringLiterals;
 
@@ -69,8 +70,9 @@ QString firstValueOf(const QString& select)
 
 }  // namespace
 
-frmUtilities::frmUtilities(const QuoteKey& key)
+frmUtilities::frmUtilities(const QuoteKey& key, frmHistory::Undo undo)
     : Form(u"frmUtilities"_s, u"Utilities"_s),
+      undoLoad(std::move(undo)),
       shown(key),
       quote(gConn),
       lines(gConn),
@@ -167,10 +169,10 @@ QLineEdit* frmUtilities::box(QLatin1StringView name) const
     return findChild<QLineEdit*>(name);
 }
 
-void frmUtilities::ShowForm(const QString& sQTNNO, const QString& sSubQuote)
+void frmUtilities::ShowForm(const QString& sQTNNO, const QString& sSubQuote, const frmHistory::Undo& undoLoad)
 {
     EnsureConnection();
-    frmUtilities form({sQTNNO, sSubQuote.isEmpty() ? u"0"_s : sSubQuote});
+    frmUtilities form({sQTNNO, sSubQuote.isEmpty() ? u"0"_s : sSubQuote}, undoLoad);
     form.AddTabs();
     form.OpenRows();
     form.Fill();
@@ -313,7 +315,12 @@ void frmUtilities::Command2_Click()
 
 void frmUtilities::cmdHistory_Click()
 {
-    frmHistory::ShowForm(shown.number);
+    if (!frmHistory::ShowForm(shown.number, undoLoad))
+        return;
+    if (!Quote::openHeader(shown).eof())
+        return Command9_Click();  // the fields show what was undone
+    desktop::msgBox(u"Quote %1 no longer exists."_s.arg(shown.fullReference()), desktop::Icon::Information);
+    Command2_Click();
 }
 
 void frmUtilities::SetStatus(const StatusRepair& repair)

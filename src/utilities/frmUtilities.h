@@ -4,6 +4,7 @@
 #include "base/QuoteKey.h"
 #include "platform/database/Recordset.h"
 #include "platform/desktop/Form.h"
+#include "utilities/frmHistory.h"
 
 class QCheckBox;
 class QLineEdit;
@@ -21,10 +22,11 @@ class frmUtilities final : public desktop::Form {
 
 public:
     /// Shows the quote; an empty subquote means "0". Only "Save" writes to the tables, and it opens `grsQuote` again.
-    static void ShowForm(const QString& sQTNNO, const QString& sSubQuote);
+    /// `undoLoad` is for the button "Undo" of the history.
+    static void ShowForm(const QString& sQTNNO, const QString& sSubQuote, const frmHistory::Undo& undoLoad = {});
 
 private:
-    explicit frmUtilities(const QuoteKey& key);
+    frmUtilities(const QuoteKey& key, frmHistory::Undo undo);
     QWidget* quoteInformation();
     QWidget* setQuoteStatus();
     QWidget* closingButtons();
@@ -46,6 +48,7 @@ private:
     void cmdHistory_Click();
     void SetStatus(const StatusRepair& repair);
 
+    frmHistory::Undo undoLoad;
     QuoteKey shown;  // not read from `quote`, because another user may delete the row
     int shownTab = 0;
 

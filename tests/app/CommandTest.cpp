@@ -88,6 +88,19 @@ TEST_F(Command, AnInterruptedLoadIsToldOnce)
     EXPECT_FALSE(kest2(u"list unread"_s).json.contains(u"recovered"_s));
 }
 
+TEST_F(Command, ALoadIsUndoneOnlyAfterYes)
+{
+    kest2(u"load QRCN_1012.xml"_s);
+    const int load = kest2(u"history 1012"_s).json[u"operations"][0][u"operation"].toInt();
+    const QString undo = u"undo "_s + QString::number(load);
+    const Ended refused = kest2(undo);
+    EXPECT_EQ(refused.json[u"boxes"][0][u"default"].toString(), u"no"_s);
+    EXPECT_EQ(refused.exitCode, app::Refused);
+    const Ended undone = kest2(undo, R"({"boxes": [{"text": "Undo the load", "answer": "yes"}]})");
+    EXPECT_EQ(undone.exitCode, app::Done) << undone.errors;
+    EXPECT_TRUE(files::exists(u"c:\\wirdoc\\AUnread\\QRCN_1012.xml"_s));
+}
+
 TEST_F(Command, AListGivesWhatItsWindowShows)
 {
     const QJsonObject list = kest2(u"list unread"_s).json;

@@ -140,6 +140,21 @@ TEST_F(UndoOfALoad, IsRefusedWithTheReason)
     }
 }
 
+TEST_F(UndoOfALoad, AsksFirstAndSaysWhyItIsRefused)
+{
+    const qint64 load = loaded(u"m.xml"_s, authorisation());
+    const std::string before = holdings();
+    shown();
+    EXPECT_FALSE(recovery::askAndUndo(999));
+    EXPECT_EQ(shown(), "[exclamation] Undo: Operation 999 can't be undone.\r\n\r\nThere is no operation 999.");
+    EXPECT_FALSE(recovery::askAndUndo(load)) << "the default is No";
+    EXPECT_TRUE(shown().starts_with("[exclamation] Undo: Undo the load of m.xml of "));
+    EXPECT_EQ(difference(before, holdings()), "\n");
+    desktop.emplace(R"({"boxes": [{"text": "Undo the load", "answer": "yes"}]})");
+    EXPECT_TRUE(recovery::askAndUndo(load));
+    EXPECT_TRUE(files::exists(gsUnreadPath + u"m.xml"_s));
+}
+
 TEST_F(UndoOfALoad, IsFinishedIfItWasInterrupted)
 {
     arrive("m.xml", authorisation());

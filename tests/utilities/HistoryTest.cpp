@@ -25,17 +25,21 @@ struct History : Shop {
         operation.end(journal::State::Done);
     }
 
-    /// Opens the window from the utilities of quote 500 and operates it.
-    static void open(const test::Hands::Work& work)
+    /// Opens the window from the utilities of quote 500 and operates it. Stores the claim that the utilities show then.
+    void open(const test::Hands::Work& work, const frmHistory::Undo& undo = {})
     {
         int seen = 0;
-        const test::Hands hands(
-            {{u"frmUtilities"_s, [](QDialog& window) { control<QPushButton>(window, "cmdHistory").click(); }},
-             {u"frmHistory"_s, [&](QDialog& window) {
-                  ++seen;
-                  work(window);
-              }}});
-        frmUtilities::ShowForm(u"500"_s, u"0"_s);
+        const test::Hands hands({{u"frmUtilities"_s,
+                                  [&](QDialog& window) {
+                                      control<QPushButton>(window, "cmdHistory").click();
+                                      claim = window.isVisible() ? control<QLineEdit>(window, "txtClaimNo").text()
+                                                                 : u"closed"_s;
+                                  }},
+                                 {u"frmHistory"_s, [&](QDialog& window) {
+                                      ++seen;
+                                      work(window);
+                                  }}});
+        frmUtilities::ShowForm(u"500"_s, u"0"_s, undo);
         EXPECT_EQ(seen, 1);
     }
 
@@ -56,6 +60,7 @@ struct History : Shop {
     }
     static std::string operations(QDialog& window) { return rows(window, "ListView1", {3, 4}); }
     static std::string changes(QDialog& window) { return rows(window, "ListView2", {0, 1, 3, 4, 5}); }
+    QString claim;
     static std::string status(QDialog& window) { return control<QLabel>(window, "lblStatus").text().toStdString(); }
 };
 
@@ -106,6 +111,36 @@ TEST_F(History, SortsTheListThatHasTheFocus)
         EXPECT_EQ(first(), "LOAD OF B.XML DONE");
         EXPECT_NE(changes(window), before);
     });
+}
+
+TEST_F(History, UndoesTheChosenLoad)
+{
+    change("a.xml", {u"CLAIM='C2'"_s}, "QTNNO='500'");
+    open([](QDialog& window) { EXPECT_FALSE(control<QPushButton>(window, "cmdUndo").isVisible()); });
+    const auto undo = [](const QString& statement) {
+        return [statement](qint64 operation) {
+            EXPECT_EQ(operation, 1);
+            if (statement.isEmpty())
+                return false;
+            gConn->execute(statement);
+            gConn->execute(u"UPDATE KESTOperation SET State='taken back'"_s);
+            return true;
+        };
+    };
+    const auto press = [](QDialog& window) {
+        gestures::press(window, Qt::ALT | Qt::Key_U);
+        EXPECT_EQ(rowCount("KESTOperation", "State='done'") == 1, operations(window) == "LOAD OF A.XML DONE\n");
+    };
+    const std::pair<QString, QString> cases[] = {
+        {{}, u"C2"_s},
+        {u"UPDATE QUOTE1 SET CLAIM='C1' WHERE QTNNO='500'"_s, u"C1"_s},
+        {u"DELETE FROM QUOTE1 WHERE QTNNO='500'"_s, u"closed"_s},
+    };
+    for (const auto& [statement, expected] : cases) {
+        open(press, undo(statement));
+        EXPECT_EQ(claim, expected);
+    }
+    EXPECT_EQ(shown(), "[information] Quote 500/0 no longer exists.");
 }
 
 TEST_F(History, SaysWhyItIsEmpty)

@@ -94,7 +94,7 @@ void EveryWindow::each(const Check& check)
         {"frmPrintPreview", check, [] { frmPrintPreview::ShowForm(710, QString(), nullptr); }},
         {"frmLogin", check, [&] { frmLogin::ShowForm(passed); }},
         {"frmUtilities", check, [] { frmUtilities::ShowForm(u"500"_s, u"0"_s); }},
-        {"frmHistory", check, [] { frmHistory::ShowForm(u"500"_s); }},
+        {"frmHistory", check, [] { frmHistory::ShowForm(u"500"_s, [](qint64) { return false; }); }},
         {"frmViewXML", check,
          [] {
              gsCurFolder = gsUnreadPath;  // the list has left it in another folder
