@@ -20,6 +20,7 @@
 #include <QUuid>
 
 #include <array>
+#include <utility>
 
 namespace kest::journal {
 
@@ -38,6 +39,7 @@ struct Work {
     QString hash;
     QString number;
     QString subquote;
+    bool isNumberNew = false;  // since the last committed change
     QString lockName;
     std::unique_ptr<db::Lock> lock;
     std::unique_ptr<files::Lock> sign;  // of life, for other processes of the profile
@@ -127,6 +129,12 @@ void openOperation()
     work->id = toLong(row.value(u"Operation"_s));
 }
 
+void storeNumber()
+{
+    gConn->execute(sql("UPDATE KESTOperation SET QTNNO='{}', Subquote='{}' WHERE Operation={}", work->number,
+                       work->subquote, work->id));
+}
+
 void markPoint()
 {
     gConn->execute(sql("UPDATE KESTOperation SET PastPoint=1, Facts='{}', QTNNO='{}', Subquote='{}' WHERE Operation={}",
@@ -189,12 +197,17 @@ QVariant valueOf(const db::RowChange& row, const QString& name)
 void Recorder::committed()
 {
     work->isCommitted = true;
+    work->isNumberNew = false;
     work->isPointAhead = false;  // it was this change
 }
 
 /// The operation's own row has gone with its first change.
 void Recorder::takenBack()
 {
+    if (std::exchange(work->isNumberNew, false)) {
+        work->number.clear();
+        work->subquote.clear();
+    }
     if (work->isCommitted)
         return;
     work->id = 0;
@@ -230,12 +243,16 @@ void Recorder::record(const QList<db::RowChange>& rows)
         if (work->number.isEmpty() && !number.isNull()) {
             work->number = toText(number);
             work->subquote = textOrEmpty(valueOf(row, u"Subquote"_s));
+            work->isNumberNew = true;
         }
     }
-    if (work->id == 0)
+    if (work->id == 0) {
         openOperation();
-    else
+    } else {
         requireOwner();
+        if (work->isNumberNew)
+            storeNumber();
+    }
     const QString moment = now();
     for (const db::RowChange& row : rows) {
         const QVariant number = valueOf(row, u"QTNNO"_s);
@@ -393,14 +410,22 @@ QJsonValue kept(const QString& fact)
 
 void openNow(const QString& number, const QString& subquote)
 {
-    if (!work || !recorder->isKept || work->id != 0)
+    if (!work || !recorder->isKept)
         return;
-    work->number = number;
-    work->subquote = subquote;
-    recorder->unlessForbidden([] {
-        openOperation();
-        work->isCommitted = true;
-    });
+    const bool isNew = work->number.isEmpty();
+    if (isNew) {
+        work->number = number;
+        work->subquote = subquote;
+    }
+    if (work->id == 0) {
+        recorder->unlessForbidden([] {
+            openOperation();
+            work->isCommitted = true;
+        });
+    } else if (isNew) {
+        requireOwner();
+        storeNumber();
+    }
 }
 
 void record(const db::RowChange& change)

@@ -104,7 +104,7 @@ void passPoint(const std::function<void()>& lastUpdate, const QJsonObject& facts
 void keep(const QString& fact, const QJsonValue& value);
 /// Returns a fact that was kept, also before the operation was interrupted.
 QJsonValue kept(const QString& fact);
-/// Opens the operation without a change, for one that begins with a file.
+/// Opens the operation without a change, for one that goes on with a file, and names its quote.
 void openNow(const QString& number, const QString& subquote);
 /// Records a change that the connection does not show because it takes another one back. Call it in the transaction of
 /// the change, after openNow().

@@ -139,12 +139,17 @@ TEST_F(Interrupted, ASendHappensOnce)
     sendable("600").request("QR6").note("Active Quote Request");
     for (const char* picture : {"600_0001.jpg", "600_0002.jpg"})
         files::write(gsImagesPath + QString::fromLatin1(picture), u"picture"_s);
-    interruptEachStatement([] { send("600"); },
-                           [] {
-                               if (!quote("600").locked())
-                                   send("600");
-                           });
+    const auto sendIfOpen = [] {
+        if (!quote("600").locked())
+            send("600");
+    };
+    interruptEachStatement([] { send("600"); }, sendIfOpen);
     EXPECT_EQ(outcomes, both);
+
+    send("600");  // after this, the first change of another send is that of the car
+    quote("600").locked(false).stage(1).remarks("(01/02/2008 : Active Quote Request)");
+    car("ABC123").set("Year", "1998");
+    interruptEachStatement([] { send("600"); }, sendIfOpen);
 }
 
 TEST_F(Interrupted, ASendIsNotFinishedOverItsAnswer)
