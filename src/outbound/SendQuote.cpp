@@ -78,17 +78,6 @@ double refuse(const QString& message)
     return 0;
 }
 
-/// Pictures that can't be written, for example because the disk is full, are written later.
-void sendPictures(journal::Operation& operation, db::Recordset& quote)
-{
-    try {
-        CreateImageXML(gsImagesPath, quote);
-    } catch (const RuntimeError&) {
-        operation.end(journal::State::Unfinished);
-        throw;
-    }
-}
-
 }  // namespace
 
 double SendQuote(db::Recordset& quote, bool* sent)
@@ -107,14 +96,20 @@ double SendQuote(db::Recordset& quote, bool* sent)
         return refuse(refusal);
 
     journal::Operation operation(journal::Kind::Send);
-    RoundQuoteLines(quote);
-    const double total = CreateQuoteXML(quote);
-    if (sent)
-        *sent = total != 0;
-    if (total != 0)
-        sendPictures(operation, quote);
-    operation.end(total != 0 ? journal::State::Done : journal::State::Failed);
-    return total;
+    try {
+        RoundQuoteLines(quote);
+        const double total = CreateQuoteXML(quote);
+        if (sent)
+            *sent = total != 0;
+        if (total != 0)
+            CreateImageXML(gsImagesPath, quote);
+        operation.end(total != 0 ? journal::State::Done : journal::State::Failed);
+        return total;
+    } catch (const RuntimeError&) {
+        if (isDocumentAnnounced())  // a picture that does not fit on the disk, a note that another user has changed
+            operation.end(journal::State::Unfinished);
+        throw;
+    }
 }
 
 }  // namespace kest

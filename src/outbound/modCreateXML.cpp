@@ -83,6 +83,7 @@ void addImages(const Branch& request, const QuoteRows& rows)
 }
 
 const QString submitted = u"Submitted"_s;
+const QString sentStage = QString::number(*quoteSent.stage);
 
 QString quoteStatus(const db::Recordset& notes)
 {
@@ -105,7 +106,8 @@ void announceDocument(const QuoteRows& rows, const QString& name, const QString&
     journal::keep(u"document"_s,
                   QJsonObject{{u"name"_s, name},
                               {u"hash"_s, journal::hashOf(files::fromCodePage(files::toCodePage(content)))},
-                              {u"wasSubmitted"_s, quoteStatus(rows.notes) == submitted}});
+                              {u"status"_s, quoteStatus(rows.notes)},
+                              {u"stage"_s, text(rows.quote, "Job_stage")}});
 }
 
 /// Returns true if the document waits for the transport, or was sent.
@@ -174,6 +176,30 @@ void CreateImageXML(const QString& imagesPath, db::Recordset& quote)
     writeImageDocuments(imagesPath, QuoteKey::fromRow(quote));
 }
 
+bool isDocumentAnnounced()
+{
+    return !journal::kept(u"document"_s).isUndefined();
+}
+
+namespace {
+
+/// Marks the quote of an interrupted send, unless the insurer has done more since than to receive it.
+void markLate(const QuoteKey& key, Quote& quote, const QJsonObject& document)
+{
+    const QString stage = text(quote.header(), "Job_stage");
+    const QString status = quoteStatus(quote.notes());
+    const bool isReceived = status == submitted && status != document[u"status"_s].toString();
+    const bool isUntouched = status == document[u"status"_s].toString();
+    if (!(isReceived || isUntouched) || (stage != document[u"stage"_s].toString() && stage != sentStage))
+        return;
+    Transition sent = quoteSent;
+    if (isReceived)
+        sent.notes[0] = {};
+    markAsSent(key, quote.header(), quote.notes(), sent);
+}
+
+}  // namespace
+
 bool finishSend(const QuoteKey& key, bool isMarked)
 {
     const QJsonObject document = journal::kept(u"document"_s).toObject();
@@ -182,12 +208,10 @@ bool finishSend(const QuoteKey& key, bool isMarked)
     if (!isWritten)
         return false;
     Quote quote(key);
-    if (!isMarked && quote.exists() && !quote.notes().eof()) {
-        Transition sent = quoteSent;
-        if (quoteStatus(quote.notes()) == submitted && !document[u"wasSubmitted"_s].toBool())
-            sent.notes[0] = {};  // the network has received it meanwhile
-        markAsSent(key, quote.header(), quote.notes(), sent);
-    }
+    if (!quote.exists())
+        return false;
+    if (!isMarked && !quote.notes().eof())
+        markLate(key, quote, document);
     writeImageDocuments(gsImagesPath, key);
     return true;
 }

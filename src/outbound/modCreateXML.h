@@ -16,8 +16,12 @@ double CreateQuoteXML(db::Recordset& quote);
 /// Writes a document and a copy of each photograph of the quote to the outgoing folder.
 void CreateImageXML(const QString& imagesPath, db::Recordset& quote);
 
+/// Returns true if the send at work may have written its document, so that it has to be finished if it fails.
+bool isDocumentAnnounced();
+
 /// Goes on with the send of an interrupted operation: marks the quote as sent, unless `isMarked` says that this was
-/// done, and writes the pictures that are missing. Returns false and changes nothing if the document was not written.
+/// done or the insurer has acted on the quote since, and writes the pictures that are missing. Returns false and
+/// changes nothing if the document was not written or the quote is gone.
 bool finishSend(const QuoteKey& key, bool isMarked);
 
 }  // namespace kest

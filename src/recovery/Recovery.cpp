@@ -52,7 +52,7 @@ void tell(Settled settled)
 void settleSend(const journal::Entry& entry, journal::Operation& operation)
 {
     const bool isSent = finishSend({entry.number, entry.subquote}, entry.pastPoint);
-    if (isUnfinished(entry))  // the user has seen what could not be written
+    if (isUnfinished(entry) && entry.pastPoint)  // the user has seen which picture could not be written
         return operation.end(journal::State::Done);
     operation.end(isSent ? journal::State::Finished : journal::State::Failed);
     tell({entry, isSent ? Outcome::Finished : Outcome::TakenBack, {}});

@@ -157,10 +157,21 @@ TEST_F(Interrupted, ASendIsNotFinishedOverItsAnswer)
     sendable("600");
     send("600");
     // the process died before it could end the operation, and the answer is there before anybody settles
-    gConn->execute(u"UPDATE KESTOperation SET State='open', PastPoint=0"_s);
-    quote("600").locked(false).remarks("(01/02/2008 : Submitted KEST Quote)");
-    recovery::settle();
-    EXPECT_EQ(quote("600").state(), "3 locked - (01/02/2008 : Submitted KEST Quote)");
+    const struct {
+        int stage;
+        const char* notes;
+        const char* expected;
+    } answers[] = {
+        {1, "Submitted KEST Quote", "3 locked - (01/02/2008 : Submitted KEST Quote)"},
+        {4, "Submitted KEST Quote", "4 open - (01/02/2008 : Submitted KEST Quote)"},
+        {1, "Deleted KEST Quote", "1 open - (01/02/2008 : Deleted KEST Quote)"},
+    };
+    for (const auto& [stage, notes, expected] : answers) {
+        gConn->execute(u"UPDATE KESTOperation SET State='open', PastPoint=0"_s);
+        quote("600").locked(false).stage(stage).remarks("").note(notes);
+        recovery::settle();
+        EXPECT_EQ(quote("600").state(), expected);
+    }
 }
 
 TEST_F(Interrupted, TheUserIsToldWhatBecameOfIt)
