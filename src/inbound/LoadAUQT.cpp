@@ -218,7 +218,8 @@ bool authorise(QString& text)
     if (lines.recordCount() > 0)
         lines.moveFirst();  // a search without a match has left them at their end, and the totals would be 0
     bool isStored = false;
-    journal::passPoint([&] { isStored = CalcAuthorisedTotals(quote, lines); });
+    journal::passPoint([&] { isStored = CalcAuthorisedTotals(quote, lines); },
+                       {{u"isExported"_s, true}, {u"hasReport"_s, comparison.has_value()}});
     if (!isStored)
         tellOldTotals(quote);
     if (comparison)

@@ -243,6 +243,7 @@ qint64 takeDocument(const db::Recordset& quote, const MessageLine& line, qint64 
     QCryptographicHash hash(QCryptographicHash::Sha256);
     files::decodeBase64(base64, [&](const QByteArray& bytes) { hash.addData(bytes); });
     // first, so that taking an interrupted load back removes the document, too
+    journal::openNow(key.number, key.subquote);
     QJsonArray written = journal::kept(u"documents"_s).toArray();
     written.append(QJsonArray{path, QString::fromLatin1(hash.result().toHex())});
     journal::keep(u"documents"_s, written);

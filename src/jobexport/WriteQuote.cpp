@@ -103,7 +103,7 @@ bool openJobLink(Export& job, const db::Recordset& settings)
     return reached;
 }
 
-void openTarget(Export& job)
+void makeJob(Export& job)
 {
     attempt([&] { job.jobLink->execute(u"INSERT INTO newJob SET Status=0"_s); });
     attempt([&] {
@@ -111,6 +111,10 @@ void openTarget(Export& job)
         identity.open(u"SELECT last_insert_id()"_s);
         job.jobId = identity.value(identity.columns().first()).toLongLong();
     });
+}
+
+void openTarget(Export& job)
+{
     attempt([&] {
         job.header.open(
             sql("SELECT nJobHdr_PK, nJobID_FK, JobNr, estNr, estimateDate, startDate, endDate, invoiceDate, "
@@ -352,10 +356,11 @@ void WriteQuote(const QString& quoteNumber, const QString& subquote)
     if (!openJobLink(job, settings))
         return;
     settings.close();
-    openTarget(job);
+    makeJob(job);
     try {
         if (job.jobId != 0)  // as soon as it is known, so that the job of an interrupted load is not made again
             journal::keep(u"job"_s, job.jobId);
+        openTarget(job);
         openSource(job);
         if (job.jobId == 0 || !job.customer.isOpen() || job.customer.eof()) {
             desktop::msgBox(u"Quote could not be exported to JobLink."_s, desktop::Icon::Critical);

@@ -46,7 +46,23 @@ QStringList finishExport(const journal::Entry& entry)
 
 bool hasReport(MessageCode type)
 {
-    return type == MessageCode::QREQ || type == MessageCode::ADQT || type == MessageCode::AUQT;
+    return type == MessageCode::QREQ || type == MessageCode::ADQT ||
+           (type == MessageCode::AUQT && journal::kept(u"hasReport"_s).toBool());
+}
+
+/// Returns which windows the load has not shown, a sentence each.
+QStringList notShown(const MessageType& type)
+{
+    QStringList windows;
+    if (hasReport(type.code) && !journal::kept(u"reportShown"_s).toBool())
+        windows.append(u"report \"%1\""_s.arg(type.name));
+    if (!journal::kept(u"documents"_s).toArray().isEmpty() && !journal::kept(u"subletsShown"_s).toBool())
+        windows.append(u"window \"Sublet Authority Documents\""_s);
+    QStringList sentences;
+    for (const QString& window : windows)
+        sentences.append(u"Its %1 was not shown: reprint %2 from the read messages."_s.arg(
+            window, journal::kept(u"newName"_s).toString()));
+    return sentences;
 }
 
 void move(const journal::Entry& entry)
@@ -64,22 +80,20 @@ void move(const journal::Entry& entry)
 QStringList finishLoad(const journal::Entry& entry)
 {
     QString text = waitingText(entry);
-    if (text.isEmpty())
-        return {};  // it was moved, which is the last step
-    QStringList left;
-    const MessageType* type = typeOf(text);
     const bool isBegun = !journal::kept(u"newName"_s).isUndefined();  // the move, so all before it is done
-    if (type && !isBegun) {
-        if (type->code == MessageCode::QREQ)
-            finishRequest(text, entry.number);
-        if (type->code == MessageCode::AUQT)
-            left += finishExport(entry);
+    QStringList left;
+    if (!isBegun && entry.facts[u"isExported"_s].toBool())
+        left += finishExport(entry);
+    if (text.isEmpty()) {
+        if (!isBegun)
+            left += u"Its message has been removed or changed since, so it was not moved."_s;
+        return left;
     }
+    const MessageType* type = typeOf(text);
+    if (type && !isBegun && type->code == MessageCode::QREQ)
+        finishRequest(text, entry.number);
     move(entry);
-    if (type && hasReport(type->code) && !journal::kept(u"reportShown"_s).toBool())
-        left += u"Its report was not shown: reprint %1 from the read messages."_s.arg(
-            journal::kept(u"newName"_s).toString());
-    return left;
+    return type ? left + notShown(*type) : left;
 }
 
 bool stillWaits(const journal::Entry& entry)

@@ -8,7 +8,7 @@
 namespace kest::recovery {
 
 /// Does the rest of a load inside its operation: pictures, counter, export and file move. Returns what was not done, a
-/// sentence each: a report that was not shown, a job that JobLink has in part.
+/// sentence each: a window that was not shown, a job that JobLink has in part, a message that is gone.
 QStringList finishLoad(const journal::Entry& entry);
 
 /// Returns true if the message is still in the unread folder, unchanged.

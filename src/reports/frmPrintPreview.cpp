@@ -3,6 +3,7 @@
 #include "base/Journal.h"
 #include "base/ModRegistry.h"
 #include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Recordset.h"
@@ -131,6 +132,7 @@ void frmPrintPreview::ShowForm(qint32 peReportType, const QVariant& pvValue, db:
         recordPreview(peReportType, report, rows);
         frmPrintPreview form(report);
         desktop::showModal(form);
+        EnsureConnection();  // the server may have dropped it while the window was open
         journal::keep(u"reportShown"_s, true);
     });
     setDefaultPointer();

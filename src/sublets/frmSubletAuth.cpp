@@ -1,5 +1,6 @@
 #include "sublets/frmSubletAuth.h"
 
+#include "base/Journal.h"
 #include "base/modDBAccess.h"
 #include "platform/Prompt.h"
 #include "platform/desktop/Lists.h"
@@ -76,6 +77,10 @@ void frmSubletAuth::ShowForm(const QString& QTNNO, const QString& Subquote)
     desktop::recordWindow({{u"name"_s, u"frmSubletAuth"_s}, {u"rows"_s, rows}});
     frmSubletAuth form(documents);
     desktop::showModal(form);
+    attempt([] {
+        EnsureConnection();  // the server may have dropped it while the window was open
+        journal::keep(u"subletsShown"_s, true);
+    });
 }
 
 void frmSubletAuth::Command1_Click()

@@ -176,19 +176,43 @@ TEST_F(Interrupted, ASendIsNotFinishedOverItsAnswer)
 
 TEST_F(Interrupted, TheUserIsToldWhatBecameOfIt)
 {
-    const QDateTime started(QDate(2026, 11, 23), QTime(10, 31));
-    for (const auto& [kind, file, number, outcome, sentence] : casesIn<5>("recovery/sentences.txt")) {
-        recovery::Settled settled;
-        settled.operation.kind = kind;
-        settled.operation.file = file;
-        settled.operation.number = number;
-        settled.operation.started = started;
-        for (const recovery::Outcome any :
-             {recovery::Outcome::TakenBack, recovery::Outcome::Finished, recovery::Outcome::Left})
-            if (recovery::wordOf(any) == outcome)
-                settled.outcome = any;
-        EXPECT_EQ(settled.sentence(), sentence);
-    }
+    const auto operation = [](int id, const char* kind, const char* file, const char* quote, bool pastPoint) {
+        gConn->execute(sql(
+            "INSERT INTO KESTOperation (Operation, OperationKind, State, FileName, QTNNO, Subquote, LockName, "
+            "StartedAt, PastPoint, Facts) VALUES ({}, '{}', 'open', '{}', '{}', '0', 'x', "
+            "'2026-11-23T10:31:00', {}, '{}')",
+            id, QString::fromLatin1(kind), QString::fromLatin1(file), QString::fromLatin1(quote), pastPoint, u"{}"_s));
+    };
+    operation(11, "load", "AUQT_1007.xml", "1007", false);
+    operation(12, "load", "AUQT_1007.xml", "1007", true);
+    operation(13, "send", "", "1007", false);
+    operation(14, "save", "", "1007", false);
+    operation(15, "response", "R_1_0.xml", "1", true);
+    operation(16, "load", "m.xml", "500", false);
+    gConn->execute(
+        sql("INSERT INTO KESTJournal (Operation, TableName, Settled, RowData) VALUES (16, 'QUOTE1', 0, '{}')",
+            uR"({"change":1,"columns":[["QTNNO",0,"777","777"],["Claim",0,"1","2"]],"key":["QTNNO"],)"
+            R"("table":"QUOTE1"})"_s));
+    recovery::settle();
+    QStringList told;
+    for (const recovery::Settled& settled : recovery::takeSettled())
+        told += recovery::wordOf(settled.outcome) + u": "_s + settled.sentence();
+    const QString at = u" was interrupted on 23/11/2026 at 10:31. "_s;
+    EXPECT_EQ(
+        told,
+        (QStringList{
+            u"taken back: The load of AUQT_1007.xml"_s + at + u"It has been taken back; load the message again."_s,
+            u"finished: The load of AUQT_1007.xml"_s + at +
+                u"It has been finished. Its message has been removed or changed since, so it was not moved."_s,
+            u"taken back: The send of quote 1007"_s + at + u"The quote was not sent; send it again."_s,
+            u"taken back: The save in the utilities"_s + at + u"It has been taken back."_s,
+            u"finished: The response R_1_0.xml"_s + at + u"It has been finished."_s,
+            u"left: The load of m.xml"_s + at +
+                u"Not all of it could be taken back; check the quote 500. The row of QUOTE1 with QTNNO 777 "
+                "was changed by someone else and stays as it is."_s,
+        }));
+    recovery::settle();
+    EXPECT_TRUE(recovery::takeSettled().isEmpty());
 }
 
 TEST_F(Interrupted, TheListTellsWhatWasSettledBesideItsMessages)
@@ -202,20 +226,49 @@ TEST_F(Interrupted, TheListTellsWhatWasSettledBesideItsMessages)
         << line;
 }
 
-TEST_F(Interrupted, AReportThatNobodySawIsTold)
+TEST_F(Interrupted, WhatNobodySawIsTold)
 {
-    putTemplate(710);
-    arrive("m.xml", quoteRequest("QR9"));
-    desktop.emplace(R"({"windows": {"frmPrintPreview": [[{"click": "nothing"}]]}})");  // ends the process there
-    EXPECT_ANY_THROW(loadAsTheWindow(u"m.xml"_s));
-    gConn->execute(u"UPDATE KESTOperation SET State='open'"_s);
-    recovery::settle();
-    const QList<recovery::Settled> settled = recovery::takeSettled();
-    ASSERT_EQ(settled.size(), 1);
-    const QString number = settled[0].operation.number;
-    EXPECT_EQ(settled[0].left,
-              QStringList(u"Its report was not shown: reprint %1.xml from the read messages."_s.arg(number)));
-    EXPECT_TRUE(files::exists(gsReadPath + number + u".xml"_s));
+    const QString report = u"Its report \"%1\" was not shown: reprint %2.xml from the read messages."_s;
+    const std::pair<Text, const char*> document("subletAuthorityDocument", "JVBERi0xLjQ=");
+    const struct {
+        Message message;
+        const char* window;  // the process ends while it is open
+        QStringList told;
+    } cases[] = {
+        {quoteRequest("QR9"), "frmPrintPreview", {report.arg(u"Quote Request"_s)}},
+        {authorisedQuote("500").sublet(5, "I", {document}),
+         "frmPrintPreview",
+         {report.arg(u"Authorised Quote"_s),
+          u"Its window \"Sublet Authority Documents\" was not shown: reprint %2.xml from the read messages."_s}},
+        {authorisedQuote("500").sublet(6, "I", {document}),
+         "frmSubletAuth",
+         {u"Its window \"Sublet Authority Documents\" was not shown: reprint %2.xml from the read messages."_s}},
+        {excessWaiver("500"), "", {}},
+    };
+    for (const int number : {710, 730})
+        putTemplate(number);
+    for (const auto& [message, window, told] : cases) {
+        SCOPED_TRACE(window);
+        arrive("m.xml", message);
+        desktop.emplace(R"({"windows": {")" + QByteArray(window) + R"(": [[{"click": "nothing"}]]}})");
+        if (*window)
+            EXPECT_ANY_THROW(loadAsTheWindow(u"m.xml"_s));
+        else
+            loadAsTheWindow(u"m.xml"_s);
+        const QStringList before = filesIn(gsReadPath);
+        gConn->execute(
+            u"UPDATE KESTOperation SET State='open' WHERE Operation=(SELECT MAX(Operation) FROM "
+            "(SELECT Operation FROM KESTOperation) AS n)"_s);
+        recovery::settle();
+        const QList<recovery::Settled> settled = recovery::takeSettled();
+        ASSERT_EQ(settled.size(), 1);
+        QStringList expected;
+        for (const QString& file : filesIn(gsReadPath))
+            for (const QString& sentence : before.contains(file) ? QStringList() : told)
+                expected += QString(sentence).replace(u"%2.xml"_s, file);
+        EXPECT_EQ(settled[0].left, expected);
+        EXPECT_EQ(expected.size(), told.size());
+    }
 }
 
 TEST_F(Interrupted, ALoadedMessageThatCouldNotBeMovedIsMovedLater)
