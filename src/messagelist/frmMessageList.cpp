@@ -146,6 +146,12 @@ bool frmMessageList::reprintFile(const QString& file)
 
 void frmMessageList::RefreshList()
 {
+    settled.clear();
+    refill();
+}
+
+void frmMessageList::refill()
+{
     gdicQuoteRequests.clear();
     fill();
 }
@@ -180,11 +186,9 @@ void frmMessageList::fill()
     }
     messages->setMessages(std::move(listed));
     choose(0);
-    QStringList settled;
     for (const recovery::Settled& operation : recovery::takeSettled())
         settled.append(operation.sentence());
-    settled.append(status());
-    lblStatus->tell(settled.join(u' '));
+    lblStatus->tell((settled + QStringList(status())).join(u' '));
     cmdHeld->setText(u"%1 held back (F4)"_s.arg(heldBack.size()));
     cmdHeld->setShortcut(Qt::Key_F4);  // a new text takes the key away
     cmdHeld->setVisible(!heldBack.isEmpty());
@@ -254,7 +258,7 @@ bool frmMessageList::loadOnce(const QString& file)
             return true;
         case recovery::EarlierLoad::Pending:
             throw RuntimeError(RowChanged,
-                               u"The last load of %1 was interrupted and could not be taken back yet."_s.arg(file));
+                               u"The last load of %1 was interrupted and could not be settled yet."_s.arg(file));
         case recovery::EarlierLoad::None:
             break;
     }
@@ -308,7 +312,7 @@ void frmMessageList::tmrRefresh_Timer()
     if (busy)
         tmrRefresh->start();
     else
-        RefreshList();
+        refill();  // what the last fill has settled stays to be read
 }
 
 void frmMessageList::cmdView_Click()

@@ -65,6 +65,7 @@ private:
     void Form_Paste();
 
     void connectControls();
+    void refill();
     void fill();
     QString status() const;
     bool load(const QString& file);
@@ -78,6 +79,7 @@ private:
     QString sCurFile;  // the file clicked last
     MessageFolder iFolder = MessageFolder::Unread;
     QString fillFailure;
+    QStringList settled;     // since the user's last action, a sentence for each interrupted operation
     bool isStopped = false;  // the last fill was stopped by Esc
     QList<HeldMessage> heldBack;
     int busy = 0;  // how many fills and loads are running; a delayed refresh waits until they end
