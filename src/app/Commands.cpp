@@ -30,6 +30,7 @@
 #include <QFile>
 #include <QFileInfo>
 #include <QJsonDocument>
+#include <QScopeGuard>
 
 #include <cstdio>
 #include <functional>
@@ -306,14 +307,7 @@ Outcome runConnected(const Command& command, const CommandLine& line)
         return {.exitCode = NoConnection};
     InitCipherKey();  // as the panel does, because a load may export to JobLink
     recovery::settle();
-    QList<recovery::Settled> settled = recovery::takeSettled();
-    Outcome outcome = command.run(line);
-    settled += recovery::takeSettled();
-    for (const recovery::Settled& operation : settled)
-        say(u"kest2: "_s + operation.sentence() + u'\n', stderr);
-    if (!settled.isEmpty())
-        outcome.fields[u"recovered"_s] = jsonOf(settled);
-    return outcome;
+    return command.run(line);
 }
 
 Outcome runChecked(const CommandLine& line)
@@ -348,6 +342,21 @@ Outcome runCaught(const CommandLine& line)
     } catch (const RuntimeError& error) {
         return refused(error.description(), Refused);
     }
+}
+
+/// Runs the command, and tells which interrupted operations it has settled.
+Outcome runTelling(const CommandLine& line)
+{
+    QList<recovery::Settled> settled;
+    recovery::setReporter([&](const recovery::Settled& operation) {
+        say(u"kest2: "_s + operation.sentence() + u'\n', stderr);
+        settled.append(operation);
+    });
+    const auto end = qScopeGuard([] { recovery::setReporter({}); });
+    Outcome outcome = runCaught(line);
+    if (!settled.isEmpty())
+        outcome.fields[u"recovered"_s] = jsonOf(settled);
+    return outcome;
 }
 
 QJsonObject scriptIn(const QString& file)
@@ -429,7 +438,7 @@ int run(const CommandLine& line)
         return refuse(line, error.description(), Usage);
     }
 
-    const Outcome outcome = runCaught(line);
+    const Outcome outcome = runTelling(line);
     files::waitForBackground(backgroundWait);
     print(line, outcome, script ? script->record() : desktop::Record());
     return outcome.exitCode;

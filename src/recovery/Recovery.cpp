@@ -5,6 +5,7 @@
 #include "base/modDBAccess.h"
 #include "base/modLoggerEx.h"
 #include "outbound/modCreateXML.h"
+#include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
 #include "recovery/FinishLoad.h"
 #include "recovery/TakeBack.h"
@@ -22,6 +23,7 @@ namespace {
 constexpr auto source = "Recovery.settle"_L1;
 
 QList<Settled> settledSince;
+std::function<void(const Settled&)> settledReporter;
 
 bool isOf(const journal::Entry& entry, journal::Kind kind)
 {
@@ -46,6 +48,8 @@ bool isUnfinished(const journal::Entry& entry)
 void tell(Settled settled)
 {
     attempt([&] { logFailure(RuntimeError(RowChanged, settled.sentence()), source); });
+    if (settledReporter)
+        settledReporter(settled);
     settledSince.append(std::move(settled));
 }
 
@@ -173,6 +177,19 @@ void settle(const QString& lockedFile)
 QList<Settled> takeSettled()
 {
     return std::exchange(settledSince, {});
+}
+
+void setReporter(std::function<void(const Settled&)> reporter)
+{
+    settledReporter = std::move(reporter);
+}
+
+void showSettled()
+{
+    if (!desktop::isPersonPresent())
+        return;
+    for (const Settled& operation : takeSettled())
+        desktop::msgBox(operation.sentence(), desktop::Icon::Exclamation);
 }
 
 EarlierLoad settleLoadOf(const QString& file, const QString& hash)

@@ -10,6 +10,8 @@
 #include <QString>
 #include <QStringList>
 
+#include <functional>
+
 namespace kest::recovery {
 
 enum class Outcome { TakenBack, Finished, Left };
@@ -34,6 +36,10 @@ void settle(const QString& lockedFile = {});
 
 /// Returns what was settled since the last call.
 QList<Settled> takeSettled();
+/// Sets who is told of each operation as soon as it is settled, in addition to takeSettled().
+void setReporter(std::function<void(const Settled&)> reporter);
+/// If a person sees the windows, tells what was settled since the last call, a box for each operation.
+void showSettled();
 
 /// What an earlier load of a message has left.
 enum class EarlierLoad {

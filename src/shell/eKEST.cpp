@@ -84,8 +84,7 @@ void eKEST::ShowKESTWindow(const QString& sQTNNO, const QString& sSubQuote)
         recovery::settle();  // first, because it may change the quote that the panel opens
         if (!openHostQuote(sQTNNO, sSubQuote))
             return;
-        for (const recovery::Settled& operation : recovery::takeSettled())
-            desktop::msgBox(operation.sentence(), desktop::Icon::Exclamation);
+        recovery::showSettled();
         desktop::showModal(panel);
     });
     files::waitForBackground(closingWait);

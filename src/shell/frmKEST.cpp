@@ -160,6 +160,7 @@ void frmKEST::sendQuote()
     const desktop::WaitPointer pointer(u"Sending the quote..."_s);
     EnsureConnection();
     recovery::settle();  // an interrupted send of this quote may have to be finished first
+    recovery::showSettled();
     SendQuote(*grsQuote);
 }
 

@@ -73,10 +73,13 @@ TEST_F(Command, AFillThatEndedEarlyIsRefusedWithItsReason)
 
 TEST_F(Command, AnInterruptedLoadIsToldOnce)
 {
-    app::openEmbedded(u"WirSql"_s)
-        ->execute(
-            u"INSERT INTO KESTOperation (Operation, OperationKind, State, FileName, QTNNO, LockName, StartedAt) VALUES "
-            "(17, 'load', 'open', 'm.xml', '1007', 'operation x', '2026-11-23T10:31:00')"_s);
+    const auto interrupt = [](int number) {
+        app::openEmbedded(u"WirSql"_s)
+            ->execute(
+                u"INSERT INTO KESTOperation (Operation, OperationKind, State, FileName, QTNNO, LockName, StartedAt) "
+                "VALUES (%1, 'load', 'open', 'm.xml', '1007', 'operation x', '2026-11-23T10:31:00')"_s.arg(number));
+    };
+    interrupt(17);
     const QString told =
         u"The load of m.xml was interrupted on 23/11/2026 at 10:31. It has been taken back; load the message again."_s;
     const Ended first = kest2(u"list unread"_s);
@@ -86,6 +89,12 @@ TEST_F(Command, AnInterruptedLoadIsToldOnce)
     EXPECT_EQ(first.json[u"recovered"][0][u"left"].toArray(), QJsonArray());
     EXPECT_FALSE(QJsonDocument(first.json[u"boxes"].toArray()).toJson().contains("interrupted"));
     EXPECT_FALSE(kest2(u"list unread"_s).json.contains(u"recovered"_s));
+
+    interrupt(90);
+    const Ended panel = kest2(u"open 1004"_s, R"json({"windows": {"frmKEST": [[{"click": "none"}]]}})json");
+    EXPECT_TRUE(panel.exitCode == app::NeedsAPerson && panel.errors.contains(told)) << panel.errors.toStdString();
+    EXPECT_EQ(panel.json[u"recovered"][0][u"operation"].toInt(), 90);
+    EXPECT_EQ(panel.json[u"boxes"].toArray(), QJsonArray());
 }
 
 TEST_F(Command, ALoadIsUndoneOnlyAfterYes)

@@ -1,3 +1,4 @@
+#include "support/Hands.h"
 #include "support/Shop.h"
 #include "utilities/frmLogin.h"
 
@@ -40,6 +41,30 @@ TEST_F(Panel, AConnectionThatWasLostIsOpenedAgainByTheNextClick)
     ASSERT_EQ(texts.size(), 2) << texts.join(u'\n');
     EXPECT_TRUE(texts[0].contains(u"-2147467259"_s)) << texts[0];
     EXPECT_TRUE(texts[1].contains(u"$0 variations"_s)) << texts[1];
+}
+
+TEST_F(Panel, APersonIsToldOnceWhatWasSettled)
+{
+    struct Person final : desktop::Answerer {
+        desktop::Answer box(const desktop::Box& box) override
+        {
+            texts.append(box.text);
+            return desktop::Answer::Ok;
+        }
+        QString input(const desktop::Input&) override { return {}; }
+        void start(const QString&) override {}
+        QStringList texts;
+    };
+    gConn->execute(
+        u"INSERT INTO KESTOperation (OperationKind, State, FileName, LockName, StartedAt) VALUES ('load', "
+        "'open', 'm.xml', 'x', '2026-11-23T10:31:00')"_s);
+    const auto person = std::make_shared<Person>();
+    desktop::setAnswerer(person);
+    const test::Hands hands({{u"frmKEST"_s, [](QDialog&) {}}});
+    for (int opened = 0; opened < 2; ++opened)
+        eKEST().ShowKESTWindow(u"0"_s, u"0"_s);
+    EXPECT_EQ(person->texts, QStringList(u"The load of m.xml was interrupted on 23/11/2026 at 10:31. It has been taken "
+                                         "back; load the message again."_s));
 }
 
 TEST_F(Panel, WithoutAConnectionItIsNotShown)
