@@ -11,6 +11,9 @@
 #include "recovery/TakeBack.h"
 #include "recovery/Undo.h"
 
+#include <QSet>
+
+#include <algorithm>
 #include <optional>
 #include <utility>
 
@@ -43,6 +46,32 @@ bool isLoadOf(const journal::Entry& entry, const QString& file)
 bool isUnfinished(const journal::Entry& entry)
 {
     return entry.state == journal::wordOf(journal::State::Unfinished);
+}
+
+bool isTakenBack(const journal::Entry& entry)
+{
+    return !entry.pastPoint && !isUnfinished(entry) &&
+           (isOf(entry, journal::Kind::Load) || isOf(entry, journal::Kind::Save) ||
+            isOf(entry, journal::Kind::Response));
+}
+
+/// Puts the operations that are to be taken back first, newest first: an older one may find its row again only after a
+/// newer one is gone.
+QList<journal::Entry> inOrder(QList<journal::Entry> pending)
+{
+    const auto others = std::stable_partition(pending.begin(), pending.end(), isTakenBack);
+    std::reverse(pending.begin(), others);
+    return pending;
+}
+
+/// Logs a failure once, not at each fill.
+void logOnce(const RuntimeError& error)
+{
+    static QSet<QString> logged;
+    if (logged.contains(error.description()))
+        return;
+    logged.insert(error.description());
+    logFailure(error, source);
 }
 
 void tell(Settled settled)
@@ -160,14 +189,13 @@ void settle(const QString& lockedFile)
         return;
     QList<journal::Entry> pending;
     attempt([&] { pending = journal::pendingOperations(); });
-    for (const journal::Entry& entry : pending) {
+    for (const journal::Entry& entry : inOrder(pending)) {
         attempt([&] {
             try {
                 settleAlone(entry, lockedFile);
             } catch (const RuntimeError& error) {
                 const QString what = u"The %1 could not be settled yet: %2"_s;
-                logFailure(RuntimeError(error.number(), what.arg(journal::titleOf(entry), error.description())),
-                           source);
+                logOnce(RuntimeError(error.number(), what.arg(journal::titleOf(entry), error.description())));
                 throw;
             }
         });

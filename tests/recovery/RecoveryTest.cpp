@@ -201,15 +201,15 @@ TEST_F(Interrupted, TheUserIsToldWhatBecameOfIt)
     EXPECT_EQ(
         told,
         (QStringList{
+            u"left: The load of m.xml"_s + at +
+                u"Not all of it could be taken back; check the quote 500. The row of QUOTE1 with QTNNO 777 "
+                "was changed by someone else and stays as it is."_s,
+            u"taken back: The save in the utilities"_s + at + u"It has been taken back."_s,
             u"taken back: The load of AUQT_1007.xml"_s + at + u"It has been taken back; load the message again."_s,
             u"finished: The load of AUQT_1007.xml"_s + at +
                 u"It has been finished. Its message has been removed or changed since, so it was not moved."_s,
             u"taken back: The send of quote 1007"_s + at + u"The quote was not sent; send it again."_s,
-            u"taken back: The save in the utilities"_s + at + u"It has been taken back."_s,
             u"finished: The response R_1_0.xml"_s + at + u"It has been finished."_s,
-            u"left: The load of m.xml"_s + at +
-                u"Not all of it could be taken back; check the quote 500. The row of QUOTE1 with QTNNO 777 "
-                "was changed by someone else and stays as it is."_s,
         }));
     recovery::settle();
     EXPECT_TRUE(recovery::takeSettled().isEmpty());
@@ -370,6 +370,19 @@ TEST_F(Interrupted, RecoveryMayBeInterruptedToo)
         interruptEachStatement(settle, loadIfItWaits, load);
     }
     EXPECT_EQ(outcomes, both) << "nothing is left";
+}
+
+TEST_F(Interrupted, TheNewestChangeOfARowIsTakenBackFirst)
+{
+    const std::string claim = quote("500").text("Claim");
+    for (const QString& other : {u"C1"_s, u"C2"_s}) {
+        const journal::Operation operation(journal::Kind::Save);
+        gConn->execute(sql("UPDATE QUOTE1 SET Claim='{}' WHERE QTNNO='500' AND SUBQUOTE='0'", other));
+    }
+    gConn->execute(u"UPDATE KESTOperation SET State='open'"_s);
+    recovery::settle();
+    EXPECT_EQ(quote("500").text("Claim"), claim);
+    EXPECT_EQ(rowCount("KESTOperation", "State='taken back'"), 2);
 }
 
 TEST_F(Interrupted, WorkOfALivingOwnerIsLeftAlone)
