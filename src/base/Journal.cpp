@@ -14,12 +14,14 @@
 
 #include <QCoreApplication>
 #include <QCryptographicHash>
+#include <QJsonDocument>
 #include <QScopeGuard>
 #include <QSet>
 #include <QSysInfo>
 #include <QUuid>
 
 #include <array>
+#include <optional>
 #include <utility>
 
 namespace kest::journal {
@@ -46,6 +48,7 @@ struct Work {
     int generation = 0;                 // of the connection that has the lock
     QString serverSession;              // of that connection
     bool isLost = false;                // to another workstation
+    std::optional<db::Recordset> row;   // of KESTOperation, until it is inserted
     qint64 id = 0;                      // 0 until its first change
     bool isCommitted = false;           // with that change
     State state = State::Open;
@@ -54,6 +57,8 @@ struct Work {
 };
 
 std::unique_ptr<Work> work;
+
+constexpr int sessionEnd = 5;  // seconds, in which a server notices that a session is gone
 
 QString now()
 {
@@ -65,27 +70,22 @@ bool takeLock(int seconds)
 {
     work->lock.reset();  // first, because it may be that of a lost connection
     work->lock = std::make_unique<db::Lock>(gConn, work->lockName, seconds);
-    work->generation = gConn->generation();
     work->serverSession = gConn->serverSession();
     return work->lock->isHeld();
-}
-
-bool isStillOpen()
-{
-    constexpr int patience = 5;  // seconds, in which the server notices that the session is gone
-    attempt([] { gConn->endSession(work->serverSession, work->lockName); });  // or the server does so later
-    if (!takeLock(patience))
-        return false;
-    const db::Recordset row = opened(sql("SELECT State FROM KESTOperation WHERE Operation={}", work->id));
-    return !row.eof() && row.text(u"State"_s) == wordOf(work->state);
 }
 
 /// A lost connection has lost the lock, too, so that another workstation may have settled the work.
 void requireOwner()
 {
     if (!work->isLost && gConn->generation() != work->generation) {
-        work->isLost = true;  // also if the question fails
-        work->isLost = !isStillOpen();
+        attempt([] { gConn->endSession(work->serverSession, work->lockName); });  // or the server does so later
+        if (!takeLock(sessionEnd))
+            throw RuntimeError(RowChanged, u"The connection was lost, and the lock of this work is not free yet."_s);
+        const db::Recordset row = opened(sql("SELECT State, Facts FROM KESTOperation WHERE Operation={}", work->id));
+        work->isLost = row.eof() || row.text(u"State"_s) != wordOf(work->state);
+        if (!work->isLost)
+            work->facts = QJsonDocument::fromJson(row.text(u"Facts"_s).toUtf8()).object();
+        work->generation = gConn->generation();
     }
     if (work->isLost)
         throw RuntimeError(RowChanged, u"This work was interrupted, and another workstation has settled it."_s);
@@ -102,15 +102,22 @@ QString place()
     return hashOf(QString::fromLatin1(QSysInfo::machineUniqueId()) + profile::root());
 }
 
-void openOperation()
+/// Does what the operation's row needs before the transaction of its first change.
+void prepareOperation()
 {
     work->lockName = u"operation "_s + QUuid::createUuid().toString(QUuid::WithoutBraces);
-    takeLock(0);
+    if (!takeLock(0))
+        throw RuntimeError(PermissionDenied, u"The database does not give the lock of this work."_s);
+    work->generation = gConn->generation();
     if (!work->serverSession.isEmpty() &&
         attempt([] { work->sign = std::make_unique<files::Lock>(signFile(), work->lockName); }))
         work->facts[u"place"_s] = place();
-    db::Recordset row(gConn);
-    row.open(u"SELECT * FROM KESTOperation WHERE Operation=0"_s);
+    work->row = opened(u"SELECT * FROM KESTOperation WHERE Operation=0"_s);
+}
+
+void insertOperation()
+{
+    db::Recordset& row = *work->row;
     row.addNew();
     row.set(u"OperationKind"_s, wordOf(work->kind));
     row.set(u"State"_s, wordOf(State::Open));
@@ -127,6 +134,17 @@ void openOperation()
     row.set(u"Facts"_s, asciiJson(work->facts));
     row.update();
     work->id = toLong(row.value(u"Operation"_s));
+    work->row.reset();
+}
+
+/// Fails with "42501" if this user may not write what settling an operation writes. That a row can be inserted shows
+/// with the first one.
+void requireRights()
+{
+    for (const char* statement :
+         {"UPDATE KESTOperation SET State=State WHERE Operation=0", "DELETE FROM KESTOperation WHERE Operation=0",
+          "UPDATE KESTJournal SET Settled=Settled WHERE Entry=0", "DELETE FROM KESTJournal WHERE Entry=0"})
+        gConn->execute(QString::fromLatin1(statement));
 }
 
 void storeNumber()
@@ -145,7 +163,8 @@ void markPoint()
 QString transactionFault(const db::Connection& connection)
 {
     const QStringList without = connection.tablesWithoutTransactions();
-    for (const QString& table : u"KESTOperation KESTJournal QUOTE1 QUOTE2 QUOTE3 CAR"_s.split(u' '))
+    for (const QString& table :
+         u"KESTOperation KESTJournal QUOTE1 QUOTE2 QUOTE3 CAR CUSTOMER VENDOR CINFO"_s.split(u' '))
         if (without.contains(table, Qt::CaseInsensitive))
             return u"The table %1 has no transactions"_s.arg(table);
     return {};
@@ -170,11 +189,13 @@ public:
                !table.startsWith("KESTJournal"_L1, Qt::CaseInsensitive);
     }
     QStringList wantedColumns() const override { return {u"QTNNO"_s, u"Subquote"_s}; }
+    void aboutToChange() override;
     void changed(db::Connection& connection, const QList<db::RowChange>& rows) override;
     void committed() override;
     void takenBack() override;
 
     bool isKept = false;
+    bool hasRights = false;  // known for this connection
 
     /// Runs the first record of an operation. If the database forbids it, there is no journal from now on.
     template <class Step>
@@ -194,6 +215,18 @@ QVariant valueOf(const db::RowChange& row, const QString& name)
     return row.kind == db::ChangeKind::Delete ? column->before : column->after;
 }
 
+void Recorder::aboutToChange()
+{
+    if (work->id != 0)
+        return requireOwner();
+    unlessForbidden([this] {
+        if (!hasRights)
+            requireRights();
+        hasRights = true;
+        prepareOperation();
+    });
+}
+
 void Recorder::committed()
 {
     work->isCommitted = true;
@@ -211,6 +244,7 @@ void Recorder::takenBack()
     if (work->isCommitted)
         return;
     work->id = 0;
+    work->row.reset();
     work->lock.reset();
     work->sign.reset();
 }
@@ -233,7 +267,8 @@ void Recorder::unlessForbidden(Step&& step)
 
 void Recorder::changed(db::Connection&, const QList<db::RowChange>& rows)
 {
-    unlessForbidden([&] { record(rows); });
+    if (isKept)
+        unlessForbidden([&] { record(rows); });
 }
 
 void Recorder::record(const QList<db::RowChange>& rows)
@@ -246,13 +281,10 @@ void Recorder::record(const QList<db::RowChange>& rows)
             work->isNumberNew = true;
         }
     }
-    if (work->id == 0) {
-        openOperation();
-    } else {
-        requireOwner();
-        if (work->isNumberNew)
-            storeNumber();
-    }
+    if (work->id == 0)
+        insertOperation();
+    else if (work->isNumberNew)
+        storeNumber();
     const QString moment = now();
     for (const db::RowChange& row : rows) {
         const QVariant number = valueOf(row, u"QTNNO"_s);
@@ -288,9 +320,15 @@ QString hashOf(const QByteArray& bytes)
     return QString::fromLatin1(QCryptographicHash::hash(bytes, QCryptographicHash::Sha256).toHex());
 }
 
+void unwatch()
+{
+    recorder->isKept = false;
+    recorder->hasRights = false;
+}
+
 void watch(const db::ConnectionPtr& connection)
 {
-    recorder->isKept = false;  // until the database has answered
+    unwatch();  // until the database has answered
     const bool hasTables = connection->hasTable(u"KESTOperation"_s) && connection->hasTable(u"KESTJournal"_s);
     const QString fault = hasTables ? transactionFault(*connection) : u"The database has no tables for the journal"_s;
     recorder->isKept = fault.isEmpty();
@@ -299,12 +337,13 @@ void watch(const db::ConnectionPtr& connection)
         tellNoJournal(fault);
 }
 
-void endDeadSession(const Entry& entry)
+int endDeadSession(const Entry& entry)
 {
-    if (entry.serverSession.isEmpty() || entry.facts[u"place"_s] != place())
-        return;
-    if (files::Lock(signFile(), entry.lock).isHeld())
-        attempt([&] { gConn->endSession(entry.serverSession, entry.lock); });
+    if (entry.serverSession.isEmpty() || entry.facts[u"place"_s] != place() ||
+        !files::Lock(signFile(), entry.lock).isHeld())
+        return 0;
+    attempt([&] { gConn->endSession(entry.serverSession, entry.lock); });
+    return sessionEnd;
 }
 
 bool isKept()
@@ -328,11 +367,11 @@ Operation::Operation(Kind kind, const QString& file, const QString& hash)
     work->hash = hash;
 }
 
-Operation::Operation(Entry& entry)
+Operation::Operation(Entry& entry, int patience)
 {
     if (work)
         return;
-    auto lock = std::make_unique<db::Lock>(gConn, entry.lock);
+    auto lock = std::make_unique<db::Lock>(gConn, entry.lock, patience);
     const QString stateBefore = entry.state;
     if (!lock->isHeld())
         return;
@@ -381,6 +420,8 @@ void passPoint(const std::function<void()>& lastUpdate, const QJsonObject& facts
 {
     if (!work || !recorder->isKept)
         return lastUpdate();
+    if (work->id != 0)
+        requireOwner();  // before the facts, which it may read again
     for (auto fact = facts.begin(); fact != facts.end(); ++fact)
         work->facts[fact.key()] = fact.value();
     work->isPointAhead = true;
@@ -394,12 +435,15 @@ void passPoint(const std::function<void()>& lastUpdate, const QJsonObject& facts
 
 void keep(const QString& fact, const QJsonValue& value)
 {
-    if (!work || !recorder->isKept || work->facts.value(fact) == value)
+    if (!work || !recorder->isKept)
+        return;
+    if (work->id != 0)
+        requireOwner();  // before the fact, because it may read the facts again
+    if (work->facts.value(fact) == value)
         return;
     work->facts[fact] = value;
     if (work->id == 0)
         return;
-    requireOwner();
     gConn->execute(sql("UPDATE KESTOperation SET Facts='{}' WHERE Operation={}", asciiJson(work->facts), work->id));
 }
 
@@ -418,8 +462,11 @@ void openNow(const QString& number, const QString& subquote)
         work->subquote = subquote;
     }
     if (work->id == 0) {
+        recorder->aboutToChange();
+        if (!recorder->isKept)
+            return;
         recorder->unlessForbidden([] {
-            openOperation();
+            insertOperation();
             work->isCommitted = true;
         });
     } else if (isNew) {

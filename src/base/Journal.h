@@ -59,12 +59,15 @@ struct Entry {
 QString hashOf(const QString& text);
 QString hashOf(const QByteArray& bytes);
 
-/// Makes the journal see the changes on the connection. Call it once the connection is open.
+/// Makes the journal see the changes on the connection, which must be open. Throws if the database does not say whether
+/// it has a journal.
 void watch(const db::ConnectionPtr& connection);
+/// Keeps no journal until watch() is called again.
+void unwatch();
 
 /// If the owner of an operation was a process of this profile that no longer lives, ends its session on the server,
-/// which could hold its locks for hours.
-void endDeadSession(const Entry& entry);
+/// which could hold its locks for hours. Returns in how many seconds its locks are free.
+int endDeadSession(const Entry& entry);
 
 /// Returns true if the connection's database keeps a journal.
 bool isKept();
@@ -79,7 +82,8 @@ class Operation {
 public:
     explicit Operation(Kind kind, const QString& file = {}, const QString& hash = {});
     /// Goes on with interrupted work, which `entry` then describes as it is now. It stays open if it is not ended.
-    explicit Operation(Entry& entry);
+    /// Waits so many seconds for the owner's lock.
+    Operation(Entry& entry, int patience);
     ~Operation();
     Operation(const Operation&) = delete;
     Operation& operator=(const Operation&) = delete;

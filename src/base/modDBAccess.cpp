@@ -134,15 +134,17 @@ void OpenDatabase()
             readConnectionSettings();
             settings::check();  // a damaged file must not open the database of the default settings
             gcnDB->close();
+            journal::unwatch();
             open(*gcnDB, driverNumber());
+            journal::watch(gcnDB);
         } catch (const RuntimeError& error) {
+            gcnDB->close();  // also if only the journal did not answer: work without it could not be taken back
             lastFailure = error;
             if (error.description() != failureBefore)  // only once, because each event of an open window tries again
                 logFailure(error, u"modDBAccess.OpenDatabase"_s);
         }
     });
     silence = QDeadlineTimer(lastFailure && time.hasExpired(slowMilliseconds) ? pauseMilliseconds : 0);
-    attempt([] { journal::watch(gcnDB); });
 }
 
 QString connectionFailure()

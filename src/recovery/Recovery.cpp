@@ -127,14 +127,14 @@ void settleUndo(const journal::Entry& entry, journal::Operation& operation)
 
 void settleAlone(journal::Entry entry, const QString& lockedFile)
 {
-    journal::endDeadSession(entry);
+    const int patience = journal::endDeadSession(entry);
     // nobody may load the message meanwhile
     std::optional<db::Lock> load;
     const bool hasMessage = isOf(entry, journal::Kind::Load) || isOf(entry, journal::Kind::Undo);
     if (hasMessage && !isOfFile(entry, lockedFile))
-        if (!load.emplace(gConn, loadLock(entry.file)).isHeld())
+        if (!load.emplace(gConn, loadLock(entry.file), patience).isHeld())
             return;
-    journal::Operation operation(entry);
+    journal::Operation operation(entry, patience);
     if (!operation.isOwner())
         return;
     if (isOf(entry, journal::Kind::Send))

@@ -218,7 +218,7 @@ TEST_F(Interrupted, TheUserIsToldWhatBecameOfIt)
 TEST_F(Interrupted, TheListTellsWhatWasSettledBesideItsMessages)
 {
     arrive("m.xml", adjustedQuote("500"));
-    EXPECT_TRUE(interrupt(16, [] { loadAsTheWindow(u"m.xml"_s); }));
+    EXPECT_TRUE(interrupt(20, [] { loadAsTheWindow(u"m.xml"_s); }));
     frmMessageList window;
     const auto line = [&] { return window.findChild<QLabel*>(u"lblStatus"_s)->text(); };
     window.openUnread();

@@ -26,6 +26,7 @@ Change::Change(Connection& connection, const QString& table) : connection_(conne
     observer_ = connection.observerOf(table);
     if (!observer_)
         return;
+    observer_->aboutToChange();
     connection_.session().begin();
     isOpen_ = true;
     connection_.setInChange(true);

@@ -39,6 +39,8 @@ public:
     virtual bool observes(const QString& table) const = 0;
     /// Returns the columns whose values it wants to see with every change, if the row has them.
     virtual QStringList wantedColumns() const { return {}; }
+    /// Called before the transaction of a change begins. If it throws, nothing is changed.
+    virtual void aboutToChange() {}
     /// Called in the transaction of the change, after it. What it writes on the connection is committed with the change
     /// and is not observed itself. If it throws, the change is rolled back.
     virtual void changed(Connection& connection, const QList<RowChange>& rows) = 0;
