@@ -9,6 +9,7 @@
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
 #include "platform/RuntimeError.h"
+#include "platform/Waiting.h"
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
@@ -264,6 +265,7 @@ void takePhotograph(const QString& arrived, const QString& path, const QString& 
 void takePhotographs(const xml::Node& root, const QString& requestNumber, const QString& quoteNumber)
 {
     for (const xml::Node& imageId : root.selectNodes(u"rootns:quoteRequestImageIds/*"_s)) {
+        workStep();
         const QString arrived = requestNumber + u'_' + PadZeroLeft(imageId.text(), 3);
         const bool isHere = files::isPlainName(arrived) && files::exists(gsUnreadPath + arrived + u".jpg"_s);
         if (isHere)

@@ -2,6 +2,7 @@
 
 #include "base/Journal.h"
 #include "base/SharedVariables.h"
+#include "platform/Waiting.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
 #include "platform/xml/Branch.h"
@@ -39,6 +40,7 @@ QString imageId(const QString& file)
 void writeImageDocuments(const QString& folder, const QuoteKey& quote)
 {
     for (const QuoteImage& image : quoteImages(folder, quote)) {
+        workStep();
         if (journal::kept(image.file).toBool())
             continue;
         xml::Document document;

@@ -6,7 +6,7 @@
 #include "base/modLoggerEx.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
-#include "platform/database/Waiting.h"
+#include "platform/Waiting.h"
 #include "platform/desktop/Progress.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/Background.h"
@@ -51,8 +51,8 @@ eKEST::eKEST()
     desktop::setAbout(about);
     desktop::setFailureReporter(reportUntrapped);
     if (desktop::isPersonPresent()) {
-        db::setStatementStep(desktop::stillWaiting);
-        db::setWait(desktop::waitFor);
+        setWorkStep(desktop::stillWaiting);
+        setWait(desktop::waitFor);
     }
     gConn = GetConnection();
     gsUnreadPath = homeFolder() + u"AUnread\\"_s;

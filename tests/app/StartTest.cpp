@@ -2,7 +2,7 @@
 #include "app/CommandLine.h"
 #include "app/Commands.h"
 #include "app/ProfileWindow.h"
-#include "platform/database/Waiting.h"
+#include "platform/Waiting.h"
 #include "support/Hands.h"
 #include "support/ScriptedDesktop.h"
 #include "support/Test.h"
@@ -12,8 +12,8 @@ struct Start : ::testing::Test {
     ~Start() override
     {
         desktop::useScript(nullptr);
-        db::setWait({});
-        db::setStatementStep({});
+        setWait({});
+        setWorkStep({});
         profile::setRoot({});
     }
 

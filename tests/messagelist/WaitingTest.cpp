@@ -1,14 +1,17 @@
 // Tests what a person sees and can do while a fill runs, and while a server does not answer.
 #include "messagelist/frmMessageList.h"
+#include "outbound/QuoteImages.h"
 #include "platform/Prompt.h"
+#include "platform/Waiting.h"
 #include "platform/database/Connection.h"
-#include "platform/database/Waiting.h"
 #include "platform/desktop/Person.h"
 #include "platform/desktop/Progress.h"
 #include "platform/script/Gestures.h"
 #include "support/Hands.h"
 #include "support/Shop.h"
 
+#include <QSqlDatabase>
+#include <QSqlQuery>
 #include <QTcpServer>
 #include <QTcpSocket>
 
@@ -17,17 +20,18 @@ namespace gestures = desktop::gestures;
 struct Waiting : Shop {
     ~Waiting() override
     {
-        db::setWait({});
-        db::setStatementStep({});
+        setWait({});
+        setWorkStep({});
     }
 
     /// Returns the text of the small window that says what is being waited for, or an empty text.
-    static QString notice()
+    static QString notice() { return noticeWindow() ? noticeWindow()->findChild<QLabel*>()->text() : QString(); }
+    static QWidget* noticeWindow()
     {
-        for (const QWidget* window : QApplication::topLevelWidgets())
+        for (QWidget* window : QApplication::topLevelWidgets())
             if (window->isVisible() && !qobject_cast<const QDialog*>(window) && window->findChild<QLabel*>())
-                return window->findChild<QLabel*>()->text();
-        return {};
+                return window;
+        return nullptr;
     }
 };
 
@@ -41,9 +45,9 @@ TEST_F(Waiting, AFillTakesNoKeyButEscWhichStopsIt)
         auto& read = control<QAbstractButton>(window, "Option1(1)");
         const auto fill = [&](const std::function<void()>& during) {
             QTimer::singleShot(0, &window, during);
-            db::setStatementStep([] {
+            setWorkStep([] {
                 QThread::msleep(501);  // from then on it is a long one
-                db::setStatementStep({});
+                setWorkStep({});
             });
             control<QAbstractButton>(window, "Option1(0)").click();
             gestures::settle();
@@ -89,7 +93,7 @@ TEST_F(Waiting, ASilentServerIsNamedAfterASecond)
     });
     look.start(10);
     desktop::usePerson();
-    db::setWait(desktop::waitFor);
+    setWait(desktop::waitFor);
     db::Connection connection;
     EXPECT_EQ(failureOf([&] {
                   connection.open(
@@ -102,13 +106,70 @@ TEST_F(Waiting, ASilentServerIsNamedAfterASecond)
     desktop.emplace();
 }
 
+TEST_F(Waiting, AStatementThatTakesLongIsToldWhileItRuns)
+{
+    QString seen;
+    bool isEscaped = false;
+    {
+        QSqlDatabase other = QSqlDatabase::addDatabase(u"QSQLITE"_s, u"other"_s);
+        other.setDatabaseName(profile::root() + u"/databases/WirSql.db"_s);
+        ASSERT_TRUE(other.open());
+        QTimer look;
+        QObject::connect(&look, &QTimer::timeout, &look, [&] {
+            if (!notice().isEmpty())
+                QSqlQuery(other).exec(u"ROLLBACK"_s);
+            seen += notice();
+        });
+        look.start(10);
+        desktop::usePerson();
+        setWait(desktop::waitFor);
+        for (const bool isPartOfALoad : {false, true}) {
+            QSqlQuery(other).exec(u"BEGIN IMMEDIATE"_s);
+            const auto write = [] { gConn->execute(u"UPDATE CINFO SET QUOTE_VAL=QUOTE_VAL"_s); };
+            seen.clear();
+            if (isPartOfALoad) {
+                const desktop::WaitPointer pointer(u"Loading m.xml..."_s);
+                write();
+            } else {
+                write();
+            }
+            EXPECT_TRUE(seen.startsWith(isPartOfALoad ? u"Loading m.xml..." : u"Waiting for the database...")) << seen;
+            EXPECT_EQ(notice(), QString());
+        }
+        look.stop();
+        QSqlQuery(other).exec(u"BEGIN IMMEDIATE"_s);
+        desktop::Progress progress(u"KEST"_s, u"Reading..."_s, nullptr, desktop::Stop::ByEscape);
+        QThread::msleep(501);
+        progress.step(0, 1);
+        QTimer::singleShot(600, &look, [&] {
+            gestures::press(*noticeWindow(), Qt::Key_Escape);
+            QSqlQuery(other).exec(u"ROLLBACK"_s);
+        });
+        gConn->execute(u"UPDATE CINFO SET QUOTE_VAL=QUOTE_VAL"_s);
+        isEscaped = !progress.step(1, 2);
+    }
+    EXPECT_TRUE(isEscaped) << "also while the fill waits for the database";
+    QSqlDatabase::removeDatabase(u"other"_s);
+    desktop.emplace();
+}
+
+TEST_F(Waiting, EachPictureOfAQuoteIsAStep)
+{
+    QStringList before;
+    for (const char* name : {"500_0001.jpg", "500_0002.jpg"})
+        files::write(gsImagesPath + QLatin1StringView(name), u"picture"_s);
+    setWorkStep([&] { before.append(QString::number(filesIn(gsUnsentPath).size())); });
+    writeImageDocuments(gsImagesPath, {u"500"_s, u"0"_s});
+    EXPECT_EQ(before, (QStringList{u"0"_s, u"2"_s})) << "a document and a picture each";
+}
+
 TEST_F(Waiting, ALongLoadSaysWhatItDoesButNotBesideABox)
 {
     quote("500").request("QR1");
     arrive("m.xml", cancellation("QR1"));
     QString seen;
     bool isSlow = false;
-    db::setStatementStep([&] {
+    setWorkStep([&] {
         if (std::exchange(isSlow, false))
             QThread::msleep(1001);
         desktop::stillWaiting();

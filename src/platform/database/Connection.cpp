@@ -1,13 +1,13 @@
 #include "platform/database/Connection.h"
 
 #include "platform/RuntimeError.h"
+#include "platform/Waiting.h"
 #include "platform/database/Change.h"
 #include "platform/database/ColumnValues.h"
 #include "platform/database/ConnectionText.h"
 #include "platform/database/FaultInjection.h"
 #include "platform/database/OdbcDrivers.h"
 #include "platform/database/Session.h"
-#include "platform/database/Waiting.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
 
@@ -190,7 +190,8 @@ Lock::Lock(ConnectionPtr connection, const QString& name, int seconds) : connect
 {
     if (!connection_)
         throw RuntimeError(CannotOpen, u"There is no connection to the database."_s);
-    held_ = connection_->session().engine().lock(name_, seconds);
+    Session& session = connection_->session();
+    patiently(u"Waiting for the database..."_s, [&] { held_ = session.engine().lock(name_, seconds); });
 }
 
 Lock::~Lock()

@@ -1,8 +1,8 @@
 // The engines for MariaDB and MySQL: one uses QMYSQL, the other an ODBC driver.
+#include "platform/Waiting.h"
 #include "platform/database/EngineOdbc.h"
 #include "platform/database/MySqlServer.h"
 #include "platform/database/QtSqlEngine.h"
-#include "platform/database/Waiting.h"
 
 #include <QSqlError>
 

@@ -1,9 +1,9 @@
 #include "platform/database/EngineOdbc.h"
 
 #include "platform/RuntimeError.h"
+#include "platform/Waiting.h"
 #include "platform/database/OdbcDrivers.h"
 #include "platform/database/TdsServer.h"
-#include "platform/database/Waiting.h"
 
 #include <QRegularExpression>
 

@@ -1,9 +1,9 @@
 #include "platform/database/Session.h"
 
 #include "platform/RuntimeError.h"
+#include "platform/Waiting.h"
 #include "platform/database/ColumnValues.h"
 #include "platform/database/FaultInjection.h"
-#include "platform/database/Waiting.h"
 
 #include <QRegularExpression>
 
@@ -17,6 +17,15 @@ namespace {
 
 std::function<bool()> statementFault;
 int statementFaultNumber = StatementFailed;
+
+/// Asks the engine without holding up the windows.
+template <class Question>
+auto answered(const Question& question)
+{
+    decltype(question()) answer{};
+    patiently(u"Waiting for the database..."_s, [&] { answer = question(); });
+    return answer;
+}
 
 bool isNamed(const SelectedColumn& column, const QString& name)
 {
@@ -88,7 +97,7 @@ Rows Session::select(const QString& statement)
     const Shape shape = Shape::toTranslate(statement);
     const QString text = translatedText(shape);
     checkFault();
-    Answer answer = engine_->run(text);
+    Answer answer = answered([&] { return engine_->run(text); });
     if (!fits(known(shape).statement.columns, answer.names))  // the host has changed the table
         forgetSchema();
     Known& query = known(shape);
@@ -148,7 +157,7 @@ qint64 Session::execute(const QString& statement)
 Rows Session::selectNative(const QString& statement, const QList<ResultColumn>& columns)
 {
     checkFault();
-    Rows rows{columns, {}, engine_->run(statement).values};
+    Rows rows{columns, {}, answered([&] { return engine_->run(statement); }).values};
     normalise(rows);
     return rows;
 }
@@ -156,7 +165,7 @@ Rows Session::selectNative(const QString& statement, const QList<ResultColumn>& 
 qint64 Session::executeNative(const QString& statement)
 {
     checkFault();
-    return engine_->change(statement);
+    return answered([&] { return engine_->change(statement); });
 }
 
 QVariant Session::insert(const TableInfo& info, const QStringList& columns, const QStringList& literals)
@@ -170,7 +179,7 @@ QVariant Session::insert(const TableInfo& info, const QStringList& columns, cons
         return {};
     }
     checkFault();
-    const QVariant identity = engine_->insert(statement);
+    const QVariant identity = answered([&] { return engine_->insert(statement); });
     return identity.isNull() ? QVariant() : QVariant(identity.toLongLong());
 }
 
@@ -198,19 +207,19 @@ Rows Session::selectLocked(const TableInfo& info, const QString& condition)
 void Session::begin()
 {
     checkFault();
-    engine_->run(dialect().begin);
+    answered([&] { return engine_->run(dialect().begin); });
 }
 
 void Session::commit()
 {
     checkFault();
-    engine_->run(u"COMMIT"_s);
+    answered([&] { return engine_->run(u"COMMIT"_s); });
 }
 
 void Session::rollback()
 {
     checkFault();
-    engine_->run(u"ROLLBACK"_s);
+    answered([&] { return engine_->run(u"ROLLBACK"_s); });
 }
 
 void Session::abandon()
@@ -221,7 +230,7 @@ void Session::abandon()
 
 void Session::checkFault()
 {
-    statementStep();
+    workStep();
     if (!statementFault || !statementFault())
         return;
     if (statementFaultNumber == CannotOpen)

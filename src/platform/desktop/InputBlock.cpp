@@ -36,21 +36,28 @@ bool isInput(const QEvent& event)
     }
 }
 
+QList<InputBlock*> blocks;
+
 }  // namespace
 
 InputBlock::InputBlock() : modal(QApplication::activeModalWidget())
 {
+    blocks.append(this);
     qApp->installEventFilter(this);
 }
 
-InputBlock::~InputBlock() = default;
+InputBlock::~InputBlock()
+{
+    blocks.removeOne(this);
+}
 
 bool InputBlock::eventFilter(QObject* watched, QEvent* event)
 {
     if (!isInput(*event) || QApplication::activeModalWidget() != modal)
         return QObject::eventFilter(watched, event);
     if (event->type() == QEvent::KeyPress && static_cast<QKeyEvent*>(event)->key() == Qt::Key_Escape)
-        escaped = true;
+        for (InputBlock* block : std::as_const(blocks))
+            block->escaped = true;
     // an accepted ShortcutOverride keeps the key from being a shortcut; an ignored Close keeps the window open
     event->setAccepted(event->type() == QEvent::ShortcutOverride);
     return true;

@@ -15,7 +15,7 @@ public:
     InputBlock();
     ~InputBlock() override;
 
-    /// Returns true if Esc was pressed.
+    /// Returns true if Esc was pressed, even if it was while a block of a shorter operation existed, too.
     bool isEscaped() const { return escaped; }
 
 protected:

@@ -12,6 +12,8 @@
 #include <QVBoxLayout>
 #include <QWindow>
 
+#include <optional>
+
 namespace kest::desktop {
 
 namespace {
@@ -26,16 +28,17 @@ constexpr int pollInterval = 10;
 constexpr int steps = 100;
 
 struct Wait {
-    QString what;  // empty while a box, a window or a progress bar is up
+    QString what;  // empty while a box or a window is up
+    bool hasBar;   // a progress bar says it
     QElapsedTimer since;
-    int waited = 0;  // milliseconds, before `since`
+    int waited;  // milliseconds, before `since`
 };
 QList<Wait> waits;  // the last one is the innermost
 std::unique_ptr<QWidget> notice;
 
-void beginWait(const QString& what, int waited)
+void beginWait(const QString& what, bool hasBar = false, int waited = 0)
 {
-    Wait wait{what, {}, waited};
+    Wait wait{what, hasBar, {}, waited};
     wait.since.start();
     waits.append(wait);
 }
@@ -93,7 +96,7 @@ void putOnScreen(QWidget& window)
 WaitPointer::WaitPointer(const QString& what, int waited)
 {
     QGuiApplication::setOverrideCursor(Qt::WaitCursor);
-    beginWait(what, waited);
+    beginWait(what, false, waited);
 }
 
 WaitPointer::~WaitPointer()
@@ -105,10 +108,10 @@ WaitPointer::~WaitPointer()
 
 void stillWaiting()
 {
-    if (notice || waits.isEmpty() || waits.last().what.isEmpty() || !isPersonPresent())
+    if (notice || waits.isEmpty() || !isPersonPresent())
         return;
     const Wait& wait = waits.last();
-    if (wait.since.elapsed() + wait.waited < explained)
+    if (wait.what.isEmpty() || wait.hasBar || wait.since.elapsed() + wait.waited < explained)
         return;
     notice = makeWindow(defaultTitle(), wait.what, false);
     putOnScreen(*notice);
@@ -122,7 +125,9 @@ void waitFor(const QString& what, const std::function<bool()>& isDone)
             return;
     }
     const InputBlock block;
-    const WaitPointer pointer(what, quiet);
+    std::optional<WaitPointer> pointer;
+    if (waits.isEmpty() || waits.last().what.isEmpty())  // otherwise it is part of what the user is waiting for
+        pointer.emplace(what, quiet);
     while (!isDone()) {
         stillWaiting();
         QCoreApplication::processEvents();
@@ -131,7 +136,7 @@ void waitFor(const QString& what, const std::function<bool()>& isDone)
 
 OrdinaryPointer::OrdinaryPointer() : wasOther(QGuiApplication::overrideCursor())
 {
-    beginWait({}, 0);
+    beginWait({});
     takeAway(notice);
     if (wasOther)
         QGuiApplication::setOverrideCursor(Qt::ArrowCursor);
@@ -187,7 +192,7 @@ bool Progress::step(qint64 done, qint64 total)
 void Progress::show()
 {
     shown = true;
-    beginWait({}, 0);  // it says itself what it does
+    beginWait(what, true);
     takeAway(notice);
     QGuiApplication::setOverrideCursor(Qt::WaitCursor);
     if (bar && bar->window()->isVisible()) {

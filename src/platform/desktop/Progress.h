@@ -29,7 +29,8 @@ public:
 void stillWaiting();
 
 /// Waits until `isDone` returns true, which may itself take some milliseconds. After half a second the wait cursor
-/// appears, and windows are repainted but take no input. After a second `what` appears.
+/// appears, and windows are repainted but take no input. After a second the user sees `what`, or, if it is part of a
+/// longer operation, what that one does.
 void waitFor(const QString& what, const std::function<bool()>& isDone);
 
 /// Shows the normal cursor, and nothing to wait for, while a box or a window is up: a long operation that opens one is
