@@ -177,13 +177,25 @@ bool printResult(const xml::Document& message)
     return true;
 }
 
+/// Returns the header as a table, for a report without rows.
+report::Table oneRow(const ComparisonHeader& header)
+{
+    report::Table table{{}, {QVariantList()}};
+    for (const auto& [field, value] : header) {
+        table.fields.append(field);
+        table.rows.first().append(value);
+    }
+    return table;
+}
+
 bool printAdjusted(const xml::Document& message, bool Reprint)
 {
     db::Recordset table = openComparison(ComparisonOf::AdjustedQuote);
     bool isMatched = true;
     step([&] { isMatched = fillAdjustedReport(table, message, Reprint); });
     if (isMatched)
-        frmPrintPreview::ShowForm(ComparisonReport, u""_s, &table);
+        frmPrintPreview::ShowForm(ComparisonReport, u""_s, &table,
+                                  oneRow(readHeader(message, ComparisonOf::AdjustedQuote)));
     return isMatched;
 }
 

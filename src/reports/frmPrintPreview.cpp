@@ -115,7 +115,8 @@ frmPrintPreview::frmPrintPreview(const report::Report& report)
     setDefaultPointer();
 }
 
-void frmPrintPreview::ShowForm(qint32 peReportType, const QVariant& pvValue, db::Recordset* table)
+void frmPrintPreview::ShowForm(qint32 peReportType, const QVariant& pvValue, db::Recordset* table,
+                               const report::Table& outside)
 {
     attempt([&] {
         const std::optional<QString> path = templateOf(peReportType);
@@ -126,6 +127,7 @@ void frmPrintPreview::ShowForm(qint32 peReportType, const QVariant& pvValue, db:
         if (table) {
             rows = report::tableOf(*table);
             report.setTable(*rows);
+            report.setOutside(outside);
         }
         setParameters(report, peReportType, pvValue);
         report.setAuthor(GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"ShopName"_s, {}, CopyUp::No));

@@ -4,6 +4,8 @@
 #include "reports/Previews.h"
 #include "reports/PrintXML.h"
 
+#include <QPdfDocument>
+
 struct Printing : Previews {
     static void print(const Text& message, bool reprint = true)
     {
@@ -164,4 +166,25 @@ TEST_F(Printing, EachChangedLineStandsInItsSection)
     const QString unchanged = pdfText(root() + u"/out/3-730.pdf"_s);
     EXPECT_TRUE(unchanged.contains(u"No line of this quote was changed or added"_s));
     EXPECT_FALSE(unchanged.contains(u"Authorised"_s));
+}
+
+TEST_F(Printing, EachReportIsNamedByItsNumber)
+{
+    quote("500");
+    quote("500", 2).request("QR1").line(1, "PRT");
+    const auto unchanged = [](Message message) { return message.part(1, "N"); };
+    const std::pair<Message, const char*> cases[] = {
+        {quoteRequest("QR1"), "Quote request QR1"},
+        {assessmentResult("KQ1").reason("UNSP"), "Assessment Result 500/2"},
+        {unchanged(authorisedQuote("500/2")), "Authorised quote 500/2"},
+        {unchanged(adjustedQuote("500/2")), "Adjusted quote 500/2"},
+    };
+    report::setOutputFolder(root() + u"/out"_s);
+    for (const auto& [message, name] : cases) {
+        print(message);
+        QPdfDocument document;
+        document.load(QDir(root() + u"/out"_s).entryInfoList({u"*.pdf"_s}, QDir::Files, QDir::Name).last().filePath());
+        EXPECT_EQ(document.metaData(QPdfDocument::MetaDataField::Title).toString(), QLatin1StringView(name));
+    }
+    report::setOutputFolder({});
 }

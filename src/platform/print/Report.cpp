@@ -244,7 +244,8 @@ QString Report::filled(const QString& part, int page, int pages) const
                 data.set(tag.toStdString(), valueOf(tag, row));
         return data;
     };
-    mustache::data data = rowData(Row(table_, table_.rows.isEmpty() ? nullptr : &table_.rows.first()));
+    const Table& outside = table_.rows.isEmpty() && !outside_.rows.isEmpty() ? outside_ : table_;
+    mustache::data data = rowData(Row(outside, outside.rows.isEmpty() ? nullptr : &outside.rows.first()));
     for (const QString& tag : tags) {
         if (!isOfRows(tag))
             continue;

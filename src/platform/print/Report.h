@@ -59,6 +59,9 @@ public:
     /// Sets the rows to show. Without this call, the report shows the rows that are saved in the template.
     void setTable(Table table) { table_ = std::move(table); }
 
+    /// Sets a table whose first row the tags outside of rows show if the table of the report has no row.
+    void setOutside(Table table) { outside_ = std::move(table); }
+
     /// The parts of the report as HTML, with all tags filled in.
     QString body() const;
     QString header(int page, int pages) const { return filled(header_, page, pages); }
@@ -78,6 +81,7 @@ private:
     QList<Parameter> parameters_;
     QHash<QString, QString> groups;
     Table table_;
+    Table outside_;
 };
 
 }  // namespace kest::report
