@@ -2,10 +2,12 @@
 #include "app/CommandLine.h"
 #include "app/Commands.h"
 #include "platform/desktop/Display.h"
+#include "platform/desktop/ScratchSettings.h"
 
 #include <QApplication>
 
 #include <cstdio>
+#include <optional>
 
 namespace {
 
@@ -24,7 +26,7 @@ QtMessageHandler usualHandler = nullptr;
 void withoutRemarks(QtMsgType type, const QMessageLogContext& context, const QString& message)
 {
     const auto isRemark = [&](const char* part) { return message.contains(QLatin1String(part)); };
-    if (!isRemark("propagateSizeHints") && !isRemark("XDG_RUNTIME_DIR not set"))
+    if (!isRemark("This plugin does not support") && !isRemark("XDG_RUNTIME_DIR not set"))
         usualHandler(type, context, message);
 }
 
@@ -52,6 +54,9 @@ int main(int argc, char** argv)
             NeedsAPerson);
     if (!isInteractive(line) && !qEnvironmentVariableIsSet("QT_QPA_PLATFORM"))
         qputenv("QT_QPA_PLATFORM", "offscreen");
+    std::optional<kest::desktop::ScratchSettings> scratch;
+    if (!isInteractive(line))
+        scratch.emplace();
     usualHandler = qInstallMessageHandler(withoutRemarks);
 
     QApplication application(argc, argv);

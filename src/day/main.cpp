@@ -1,8 +1,11 @@
 // The command kest2-day plays the working day on a new demo shop, to its end or until the given step has been played.
+// With --has-display it only says by its exit code if windows can be shown.
 #include "day/Day.h"
 #include "day/DayPage.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
+#include "platform/desktop/Display.h"
+#include "platform/desktop/ScratchSettings.h"
 #include "platform/files/Background.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
@@ -37,8 +40,11 @@ int play(const QStringList& words)
 
 int main(int argc, char** argv)
 {
+    if (argc == 2 && QLatin1StringView(argv[1]) == QLatin1StringView("--has-display"))
+        return kest::desktop::hasDisplay() ? 0 : 1;
     if (!qEnvironmentVariableIsSet("QT_QPA_PLATFORM"))
         qputenv("QT_QPA_PLATFORM", "offscreen");
+    const kest::desktop::ScratchSettings scratch;
     QApplication application(argc, argv);
     const QStringList words = QCoreApplication::arguments();
     if (words.size() < 3) {

@@ -160,6 +160,19 @@ TEST_F(Command, AnOpenPanelIsDrivenByAScript)
     EXPECT_EQ(kest2(u"open"_s, "{\"windows\": 5}").exitCode, app::Usage);
 }
 
+TEST_F(Command, AScriptChangesNothingThatDialogsRememberForAPerson)
+{
+    qunsetenv("XDG_CONFIG_HOME");
+    qputenv("HOME", profile.root().toLocal8Bit());
+    const QByteArray script = R"json({"windows": {"frmPrintPreview": [[{"click": "cmdSave"}]], "SaveDialog": [[
+        {"set": "fileNameEdit", "text": "%1/saved.pdf"}, {"key": "fileNameEdit", "keys": "Return"}]]}})json";
+    EXPECT_EQ(kest2(u"load ADQT_1008.xml"_s, QByteArray(script).replace("%1", profile.root().toLocal8Bit())).exitCode,
+              app::Done);
+    EXPECT_TRUE(QFile::exists(profile.root() + u"/saved.pdf"_s));
+    EXPECT_FALSE(QFile::exists(profile.root() + u"/.config"_s));
+    EXPECT_FALSE(QFile::exists(profile.root() + u"/windows.ini"_s));
+}
+
 TEST_F(Command, NoSettingShowsAPassword)
 {
     for (const auto& [words, code] : casesIn<2>("app/secrets.txt")) {
