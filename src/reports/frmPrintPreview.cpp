@@ -13,12 +13,12 @@
 #include "platform/print/OutputFolder.h"
 #include "platform/print/Pages.h"
 #include "platform/print/Preview.h"
+#include "platform/print/PrinterDialog.h"
 #include "platform/values.h"
 #include "reports/ReportTable.h"
 
 #include <QGuiApplication>
 #include <QJsonArray>
-#include <QPrintDialog>
 #include <QPrinter>
 #include <QPushButton>
 
@@ -144,15 +144,9 @@ void frmPrintPreview::crvPreview_PrintButtonClicked()
 {
     QPrinter printer(QPrinter::HighResolution);
     report::setPaper(printer);
-    QPrintDialog setup(&printer, this);
-    setup.setObjectName(u"PrintDialog"_s);
-    setup.setMinMax(1, crvPreview->pageCount());
-    desktop::showModal(setup);
-    if (setup.result() != QDialog::Accepted)
-        return;
-    const bool isRange = printer.printRange() == QPrinter::PageRange;
-    report::paint(crvPreview->report(), printer, isRange ? printer.fromPage() : 1, isRange ? printer.toPage() : 0,
-                  printer.supportsMultipleCopies() ? 1 : printer.copyCount());
+    if (report::askForPrinter(printer, this, crvPreview->pageCount()))
+        report::paint(crvPreview->report(), printer,
+                      [&](int pageCount) { return report::pagesToPrint(printer, pageCount); });
 }
 
 void frmPrintPreview::resizeEvent(QResizeEvent* event)

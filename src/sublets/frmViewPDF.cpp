@@ -6,12 +6,12 @@
 #include "platform/desktop/Progress.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
+#include "platform/print/PrinterDialog.h"
 
 #include <QPainter>
 #include <QPdfDocument>
 #include <QPdfPageNavigator>
 #include <QPdfView>
-#include <QPrintDialog>
 #include <QPrinter>
 #include <QScreen>
 #include <QScrollBar>
@@ -131,28 +131,22 @@ void frmViewPDF::print()
 {
     QPrinter printer(QPrinter::HighResolution);
     printer.setResolution(printResolution);
-    QPrintDialog dialog(&printer, this);
-    dialog.setObjectName("PrintDialog"_L1);
-    dialog.setMinMax(1, pdf.pageCount());
-    desktop::showModal(dialog);
-    if (dialog.result() != QDialog::Accepted)
+    if (!report::askForPrinter(printer, this, pdf.pageCount()))
         return;
-    const bool isRange = printer.printRange() == QPrinter::PageRange;
-    const int first = isRange ? printer.fromPage() - 1 : 0;
-    const int last = isRange ? printer.toPage() - 1 : pdf.pageCount() - 1;
+    const QList<int> pages = report::pagesToPrint(printer, pdf.pageCount());
+    if (pages.isEmpty())
+        return;  // QPainter would print an empty page
     QPainter painter(&printer);
     if (!painter.isActive()) {
         desktop::msgBox(u"The document can't be printed."_s, desktop::Icon::Critical);
         return;
     }
     desktop::Progress progress(windowTitle(), u"Printing the document..."_s);
-    const int perCopy = last - first + 1;
-    const int pages = perCopy * (printer.supportsMultipleCopies() ? 1 : printer.copyCount());
-    for (int printed = 0; printed < pages; ++printed) {
-        progress.step(printed, pages);
+    for (qsizetype printed = 0; printed < pages.size(); ++printed) {
+        progress.step(printed, pages.size());
         if (printed > 0)
             printer.newPage();
-        const int page = first + printed % perCopy;
+        const int page = pages[printed];
         const QRect sheet = painter.viewport();
         const QSize size = pdf.pagePointSize(page).scaled(sheet.size(), Qt::KeepAspectRatio).toSize();
         painter.drawImage(QRect(QPoint((sheet.width() - size.width()) / 2, 0), size), pdf.render(page, size));

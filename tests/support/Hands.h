@@ -4,6 +4,7 @@
 #include "platform/desktop/Window.h"
 
 #include <QApplication>
+#include <QPageRanges>
 #include <QPrintDialog>
 #include <QPrinter>
 #include <QTimer>
@@ -63,14 +64,16 @@ void whenShown(const std::function<void(Window&)>& act)
     timer->start(1);
 }
 
-/// Clicks "Print" in a window and answers the printer dialog: prints to that file, all pages or only one.
-inline std::map<QString, Hands::Work> printing(const QString& name, const QString& file, int onlyPage)
+/// Clicks "Print" in a window and answers the printer dialog: prints to that file these pages, such as "1,3-4", or all.
+inline std::map<QString, Hands::Work> printing(const QString& name, const QString& file, const QString& pages,
+                                               int copies = 1, bool isCollated = true)
 {
     const auto choose = [=](QDialog& dialog) {
         QPrinter& printer = *static_cast<QPrintDialog&>(dialog).printer();
         printer.setOutputFileName(file);
-        printer.setPrintRange(onlyPage ? QPrinter::PageRange : QPrinter::AllPages);
-        printer.setFromTo(onlyPage, onlyPage);
+        printer.setPageRanges(QPageRanges::fromString(pages));
+        printer.setCopyCount(copies);
+        printer.setCollateCopies(isCollated);
         dialog.hide();
         dialog.setResult(QDialog::Accepted);
     };

@@ -19,6 +19,7 @@
 
 #include <algorithm>
 #include <limits>
+#include <numeric>
 
 namespace kest::report {
 
@@ -274,23 +275,24 @@ void setPrintFault(std::function<bool()> fault)
     printFault = std::move(fault);
 }
 
-void paint(const Report& report, QPagedPaintDevice& device, int firstPage, int lastPage, int copies)
+void paint(const Report& report, QPagedPaintDevice& device, const PageChoice& choice)
 {
     const Pages pages(report, device);
-    const int last = lastPage > 0 ? std::min(lastPage, pages.count()) : pages.count();
-    if (firstPage > last)
+    QList<int> chosen(pages.count());
+    std::iota(chosen.begin(), chosen.end(), 0);
+    if (choice)
+        chosen = choice(pages.count());
+    if (chosen.isEmpty())
         return;  // QPainter::begin() would print an empty page
     QPainter painter;
     if ((printFault && printFault()) || !painter.begin(&device))
         throw RuntimeError(FileInputOutput, u"The report can't be painted."_s);
     desktop::Progress progress(report.title(), u"Laying out the pages..."_s);
-    const int perCopy = last - firstPage + 1;
-    const int total = perCopy * copies;
-    for (int painted = 0; painted < total; ++painted) {
+    for (qsizetype painted = 0; painted < chosen.size(); ++painted) {
         if (painted > 0)
             device.newPage();
-        pages.paint(painter, firstPage - 1 + painted % perCopy);
-        progress.step(painted + 1, total);
+        pages.paint(painter, chosen[painted]);
+        progress.step(painted + 1, chosen.size());
     }
 }
 

@@ -5,6 +5,7 @@
 #include <QTextBlock>
 #include <QTextDocument>
 
+#include <functional>
 #include <memory>
 
 class QPagedPaintDevice;
@@ -68,8 +69,10 @@ private:
     QList<Slice> slices;
 };
 
-/// Paints the pages from `firstPage` to `lastPage`, counted from 1, so many times. A `lastPage` of 0 means all pages.
-void paint(const Report& report, QPagedPaintDevice& device, int firstPage = 1, int lastPage = 0, int copies = 1);
+/// Returns the pages to paint, counted from 0, of a report with so many pages.
+using PageChoice = std::function<QList<int>(int pageCount)>;
+/// Paints the chosen pages, or all.
+void paint(const Report& report, QPagedPaintDevice& device, const PageChoice& choice = {});
 /// Sets the device to A4 with the margins of a report.
 void setPaper(QPagedPaintDevice& device);
 /// Writes the report as a PDF file, whole or not at all. Throws RuntimeError if the file can't be written.
