@@ -21,10 +21,11 @@ const RowChange::Column* RowChange::column(const QString& name) const
     return found == columns.end() ? nullptr : &*found;
 }
 
-Change::Change(Connection& connection, const QString& table) : connection_(connection), table_(table)
+Change::Change(Connection& connection, const QString& table, ChangeSteps steps)
+    : connection_(connection), table_(table), observer_(connection.observerOf(table))
 {
-    observer_ = connection.observerOf(table);
-    if (!observer_)
+    const bool isAlone = steps == ChangeSteps::WriteOnly || connection.isInChange();
+    if (!observer_ && isAlone)
         return;
     observer_->aboutToChange();
     connection_.session().begin();
@@ -39,18 +40,21 @@ Change::~Change()
     connection_.setInChange(false);
     if (connection_.state() == 1)
         connection_.session().abandon();
-    observer_->takenBack();
+    if (observer_)
+        observer_->takenBack();
 }
 
 void Change::commit(const QList<RowChange>& rows)
 {
     if (!isOpen_)
         return;
-    observer_->changed(connection_, rows);
+    if (observer_)
+        observer_->changed(connection_, rows);
     connection_.session().commit();
     isOpen_ = false;
     connection_.setInChange(false);
-    observer_->committed();
+    if (observer_)
+        observer_->committed();
 }
 
 namespace {

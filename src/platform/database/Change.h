@@ -49,11 +49,14 @@ public:
     virtual void takenBack() {}
 };
 
-/// The transaction around one change. If nothing observes the table, there is no transaction, and the change commits
-/// alone.
+/// Whether a change reads its row before it writes it.
+enum class ChangeSteps { WriteOnly, ReadAndWrite };
+
+/// The transaction around one change. If nothing observes the table, a change that only writes has no transaction and
+/// commits alone.
 class Change {
 public:
-    Change(Connection& connection, const QString& table);
+    Change(Connection& connection, const QString& table, ChangeSteps steps = ChangeSteps::WriteOnly);
     /// Rolls the change back if it was not committed.
     ~Change();
     Change(const Change&) = delete;
@@ -61,6 +64,7 @@ public:
 
     bool isObserved() const { return observer_ != nullptr; }
     QStringList wantedColumns() const { return observer_->wantedColumns(); }
+    /// Shows the rows to the observer, if there is one, and commits the change.
     void commit(const QList<RowChange>& rows);
 
 private:

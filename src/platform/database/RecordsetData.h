@@ -102,7 +102,8 @@ struct Recordset::Data {
     bool isChanged(int column);
     QString keyCondition(const TableInfo& table);
     int resultColumn(const QString& table, const QString& column) const;
-    void checkLongTexts(const TableInfo& table, const QString& key);
+    QList<int> uncomparedTexts(const TableInfo& table);
+    void checkTexts(const TableInfo& table, const QString& key, const QList<int>& texts);
     void writeChange(const QString& table);
     void writeInsert(const QString& table);
     RowChange rowChange(const TableInfo& table, ChangeKind kind, const QStringList& wanted);

@@ -130,23 +130,27 @@ QString Recordset::Data::keyCondition(const TableInfo& table)
     return conditions.join(u" AND "_s);
 }
 
-/// If the engine can't compare long texts in a condition, reads those that will be written again and compares them. In
-/// a change, the row stays locked until the change is committed.
-void Recordset::Data::checkLongTexts(const TableInfo& table, const QString& key)
+/// Returns the long texts that will be written and that the engine can't compare in a condition.
+QList<int> Recordset::Data::uncomparedTexts(const TableInfo& table)
 {
-    QList<int> longTexts;
-    QList<ResultColumn> described;
-    QStringList names;
+    QList<int> texts;
     for (int column = 0; column < columns.size(); ++column) {
         if (columns[column].table == table.name && columns[column].kind == Kind::LongText && isChanged(column) &&
-            dialect().holds(columns[column].name, Kind::LongText, original[size_t(column)]).isEmpty()) {
-            longTexts.append(column);
-            described.append(columns[column]);
-            names.append(dialect().quoted(columns[column].name));
-        }
+            dialect().holds(columns[column].name, Kind::LongText, original[size_t(column)]).isEmpty())
+            texts.append(column);
     }
-    if (longTexts.isEmpty())
-        return;
+    return texts;
+}
+
+/// Reads long texts again and compares them. The row stays locked until the transaction ends.
+void Recordset::Data::checkTexts(const TableInfo& table, const QString& key, const QList<int>& texts)
+{
+    QList<ResultColumn> described;
+    QStringList names;
+    for (const int column : texts) {
+        described.append(columns[column]);
+        names.append(dialect().quoted(columns[column].name));
+    }
     const Rows now =
         session().selectNative(u"SELECT "_s + names.join(u", "_s) + u" FROM "_s +
                                    QString(dialect().lockedTable).replace(u"%1"_s, dialect().quoted(table.name)) +
@@ -154,8 +158,8 @@ void Recordset::Data::checkLongTexts(const TableInfo& table, const QString& key)
                                described);
     if (now.count() == 0)
         failRowChanged();
-    for (qsizetype i = 0; i < longTexts.size(); ++i) {
-        const QVariant& before = original[size_t(longTexts[i])];
+    for (qsizetype i = 0; i < texts.size(); ++i) {
+        const QVariant& before = original[size_t(texts[i])];
         const QVariant& stored = now.values[size_t(i)];
         if (before.isNull() != stored.isNull() || before.toString() != stored.toString())
             failRowChanged();
@@ -181,14 +185,18 @@ void Recordset::Data::writeChange(const QString& tableName)
             condition += u" AND "_s + same;
         written.append(column);
     }
-    Change change(*connection, tableName);
-    checkLongTexts(*table, key);
+    const QList<int> texts = uncomparedTexts(*table);
+    Change change(*connection, tableName, texts.isEmpty() ? ChangeSteps::WriteOnly : ChangeSteps::ReadAndWrite);
+    if (!texts.isEmpty())
+        checkTexts(*table, key, texts);
     const qint64 hit = session().executeNative(u"UPDATE "_s + dialect().quoted(tableName) + u" SET "_s +
                                                assignments.join(u", "_s) + u" WHERE "_s + condition);
     if (hit == 0)
         failRowChanged();
+    QList<RowChange> recorded;
     if (change.isObserved())
-        change.commit({rowChange(*table, ChangeKind::Update, change.wantedColumns())});
+        recorded.append(rowChange(*table, ChangeKind::Update, change.wantedColumns()));
+    change.commit(recorded);
     for (const int column : written)
         original[size_t(column)] = at(row(), column);
 }
