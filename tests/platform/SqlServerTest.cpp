@@ -48,6 +48,21 @@ TEST_P(SqlServer, TextsOfAnyLengthAndLetterComeBackWhole)
     EXPECT_EQ(db::sqlServerDialect().literal(u"O'Brien"_s), u"'O''Brien'"_s) << "an index needs it without N";
 }
 
+TEST_P(SqlServer, ALetterOutsideOfThePlaneIsNotCutBetweenTwoPieces)
+{
+    connection->execute(u"CREATE TABLE TEXTS (id INT IDENTITY(1,1) PRIMARY KEY, wide NVARCHAR(MAX))"_s);
+    Recordset texts = query(u"SELECT * FROM TEXTS"_s);
+    for (const int before : {4093, 4094, 4095, 8189}) {  // a piece has 4,095 units
+        const QString text = QString(before, u'x') + u"😀 end"_s;
+        texts.addNew();
+        texts.set(u"wide"_s, text);
+        texts.update();
+        texts.requery();
+        texts.moveLast();
+        EXPECT_EQ(texts.text(u"wide"_s), text) << before;
+    }
+}
+
 TEST_P(SqlServer, TriggersChangeNeitherCountsNorIdentities)
 {
     execute(
@@ -65,12 +80,13 @@ TEST_P(SqlServer, TriggersChangeNeitherCountsNorIdentities)
 TEST_P(SqlServer, ExactNumbersTellARowAndVersionsDoNot)
 {
     connection->execute(
-        u"CREATE TABLE PRICES (name VARCHAR(20), price MONEY, hours DECIMAL(9,2), weight FLOAT, picture VARBINARY(20), "
-        "version TIMESTAMP)"_s);
-    connection->execute(u"INSERT INTO PRICES (name, price, hours, weight) VALUES ('door', 12.35, 0.1, 0.1)"_s);
+        u"CREATE TABLE PRICES (name VARCHAR(20), price MONEY, tax SMALLMONEY, hours DECIMAL(9,2), weight FLOAT, "
+        "picture VARBINARY(20), photo IMAGE, tree XML, mixed SQL_VARIANT, version TIMESTAMP)"_s);
+    connection->execute(
+        u"INSERT INTO PRICES (name, price, tax, hours, weight, tree, mixed) VALUES ('door', 12.35, 1.5, 0.1, 0.1, '<a/>', 5)"_s);
     Recordset prices = query(u"SELECT * FROM PRICES"_s);
     for (const auto& [column, value, theirs] :
-         {std::tuple(u"price"_s, 99.9, u"12.36"_s), {u"hours"_s, 7.25, u"0.2"_s}}) {
+         {std::tuple(u"price"_s, 99.9, u"12.36"_s), {u"tax"_s, 2.25, u"1.75"_s}, {u"hours"_s, 7.25, u"0.2"_s}}) {
         EXPECT_EQ(written(prices, column, value), 0);
         elsewhere(u"UPDATE PRICES SET %1=%2"_s.arg(column, theirs));
         EXPECT_EQ(written(prices, column, 1), RowChanged) << column;
@@ -79,7 +95,7 @@ TEST_P(SqlServer, ExactNumbersTellARowAndVersionsDoNot)
         EXPECT_EQ(prices.text(column), theirs);
     }
     EXPECT_EQ(written(prices, u"weight"_s, 2.5), 0) << "no key, so all other columns tell the row";
-    for (const QString& column : {u"version"_s, u"picture"_s})
+    for (const QString& column : {u"version"_s, u"picture"_s, u"photo"_s, u"tree"_s, u"mixed"_s})
         EXPECT_EQ(failureOf([&] { prices.set(column, u"x"_s); }), StatementFailed) << column;
     prices.remove();
     EXPECT_TRUE(query(u"SELECT * FROM PRICES"_s).eof());

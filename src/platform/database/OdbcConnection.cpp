@@ -240,7 +240,7 @@ private:
                 return false;
             const bool isCut = left == SQL_NO_TOTAL || left / SQLLEN(sizeof(Unit)) > SQLLEN(piece.size()) - terminators;
             take(piece.data(), isCut ? qsizetype(piece.size()) - terminators : qsizetype(left / SQLLEN(sizeof(Unit))));
-            if (done == SQL_SUCCESS)
+            if (done == SQL_SUCCESS || !isCut)  // FreeTDS never reports the end of a variant
                 return true;
         }
     }

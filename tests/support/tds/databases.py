@@ -2,6 +2,7 @@
 
 import datetime
 import functools
+import json
 import os
 import re
 import sqlite3
@@ -12,13 +13,16 @@ from wire import Type
 SYSTEM = """
 CREATE TABLE sys_of_columns (table_name, ordinal, name, type, size, scale, nullable, fallback, is_identity, key_place,
                              schema);
-CREATE TABLE sys_of_triggers (name, parent, events, body);
-CREATE VIEW sys_triggers AS SELECT name, OBJECT_ID(parent) AS parent_id FROM sys_of_triggers;
+CREATE TABLE sys_of_triggers (name, parent, events, body, is_disabled);
+CREATE TABLE sys_of_indexes (name, parent, columns, has_filter, ignores_duplicates, is_disabled);
+CREATE VIEW sys_triggers AS SELECT name, OBJECT_ID(parent) AS parent_id, is_disabled FROM sys_of_triggers;
 CREATE VIEW sys_indexes AS
-    SELECT name, OBJECT_ID(tbl_name) AS object_id, rowid AS index_id FROM sqlite_master WHERE type='index';
+    SELECT name, OBJECT_ID(parent) AS object_id, rowid AS index_id, is_disabled, has_filter, 0 AS is_hypothetical
+    FROM sys_of_indexes;
 CREATE VIEW sys_index_columns AS
-    SELECT OBJECT_ID(m.tbl_name) AS object_id, m.rowid AS index_id, i.cid + 1 AS column_id, i.seqno + 1 AS key_ordinal
-    FROM sqlite_master m, pragma_index_info(m.name) i WHERE m.type='index';
+    SELECT OBJECT_ID(i.parent) AS object_id, i.rowid AS index_id, c.ordinal AS column_id, part.key + 1 AS key_ordinal
+    FROM sys_of_indexes i, json_each(i.columns) part, sys_of_columns c
+    WHERE c.name=part.value COLLATE NOCASE AND OBJECT_ID(c.schema || '.' || c.table_name)=OBJECT_ID(i.parent);
 CREATE VIEW sys_databases AS SELECT DB_NAME() AS name, 150 AS compatibility_level;
 CREATE VIEW sys_dm_exec_sessions AS SELECT SPID() AS session_id, 'mdy' AS date_format;
 CREATE VIEW information_schema_tables AS
@@ -30,7 +34,7 @@ CREATE VIEW information_schema_columns AS
            CASE WHEN type='text' THEN 2147483647 WHEN type='ntext' THEN 1073741823
                 WHEN type LIKE '%char' OR type='varbinary' THEN size END AS CHARACTER_MAXIMUM_LENGTH,
            CASE WHEN type IN ('decimal', 'numeric') THEN size END AS NUMERIC_PRECISION,
-           CASE WHEN type='money' THEN 4 WHEN type IN ('decimal', 'numeric') THEN scale END AS NUMERIC_SCALE,
+           CASE WHEN type IN ('money', 'smallmoney') THEN 4 WHEN type IN ('decimal', 'numeric') THEN scale END AS NUMERIC_SCALE,
            CASE WHEN type='datetime' THEN 3 WHEN type='datetime2' THEN IFNULL(size, 7) END AS DATETIME_PRECISION
     FROM sys_of_columns;
 CREATE VIEW information_schema_key_column_usage AS
@@ -43,7 +47,7 @@ CREATE VIEW information_schema_table_constraints AS
 """
 NUMBERS_OF_VIEWS = ("ordinal_position", "character_maximum_length", "numeric_precision", "numeric_scale",
                     "datetime_precision", "parent_id", "compatibility_level", "session_id", "object_id", "index_id",
-                    "column_id", "key_ordinal")
+                    "column_id", "key_ordinal", "is_disabled", "has_filter", "is_hypothetical", "request_session_id")
 
 
 def key_of(text):
@@ -141,13 +145,16 @@ class Database:
         for function in (as_number, as_bit, as_datetime, as_datetime2, as_code_page):
             add(function.__name__, 1, functools.partial(failing(function), self))
         add("OBJECT_ID", -1, lambda name, *_: self.object_id(name))
-        add("OBJECT_NAME", 1, self.object_name)
+        add("OBJECT_NAME", 1, lambda number: self.object_of(number)[0])
+        add("OBJECT_SCHEMA_NAME", 1, lambda number: self.object_of(number)[1])
         add("COL_NAME", 2, self.column_name)
         add("COLUMNPROPERTY", 3, self.column_property)
         add("DATABASEPROPERTYEX", 2, lambda *_: "Latin1_General_CI_AS")
         add("SESSIONPROPERTY", 1, lambda _: 1)
         add("DB_NAME", 0, lambda: "standin")
         add("SCHEMA_NAME", 0, lambda: "dbo")
+        self.lite.execute("CREATE TEMP TABLE sys_dm_tran_locks (resource_type, request_session_id, "
+                          "resource_description)")
         add("DATALENGTH", 1, lambda value: None if value is None else len(str(value).encode("cp1252", "replace")))
 
     def schema_version(self):
@@ -169,13 +176,13 @@ class Database:
                                 (table, schema[-1] if schema else "dbo"))
         return row.fetchone()[0]
 
-    def object_name(self, number):
-        row = self.lite.execute("SELECT table_name FROM sys_of_columns WHERE rowid=?", (number, )).fetchone()
-        return row and row[0]
+    def object_of(self, number):
+        row = self.lite.execute("SELECT table_name, schema FROM sys_of_columns WHERE rowid=?", (number, )).fetchone()
+        return row or (None, None)
 
     def column_name(self, table, ordinal):
-        row = self.lite.execute("SELECT name FROM sys_of_columns WHERE schema='dbo' AND table_name=? AND ordinal=?",
-                                (self.object_name(table), ordinal)).fetchone()
+        row = self.lite.execute("SELECT name FROM sys_of_columns WHERE (table_name, schema)=(?,?) AND ordinal=?",
+                                self.object_of(table) + (ordinal, )).fetchone()
         return row and row[0]
 
     def column_property(self, table, column, wanted):
@@ -220,11 +227,26 @@ class Database:
             raise ServerError(3701, "Cannot drop the table '%s', because it does not exist." % name, 11)
         self.lite.execute('DROP TABLE "%s"' % name)
         self.lite.execute("DELETE FROM sys_of_columns WHERE table_name=? COLLATE NOCASE", (name, ))
-        self.lite.execute("DELETE FROM sys_of_triggers WHERE parent=? COLLATE NOCASE", (name, ))
+        for listed in ("triggers", "indexes"):
+            self.lite.execute("DELETE FROM sys_of_%s WHERE parent=? COLLATE NOCASE" % listed, (name, ))
+
+    def ignores_duplicates(self, table):
+        return self.lite.execute("SELECT COUNT(*) FROM sys_of_indexes WHERE parent=? COLLATE NOCASE AND "
+                                 "ignores_duplicates", (table, )).fetchone()[0] > 0
 
     def triggers(self, table, verb):
         return [body for events, body in self.lite.execute(
-            "SELECT events, body FROM sys_of_triggers WHERE parent=? COLLATE NOCASE", (table, )) if verb in events]
+            "SELECT events, body FROM sys_of_triggers WHERE parent=? COLLATE NOCASE AND NOT is_disabled", (table, )) if verb in events]
+
+
+def index_of(statement):
+    """An index in SQLite's words, and its row for the list. One of a table in another schema is only listed."""
+    form = r"(CREATE\s+(?:UNIQUE\s+)?INDEX\s+(\w+)\s+ON\s+([\w.]+)\s*\(([^)]*)\))(.*)"
+    words, name, parent, columns, rest = re.match(form, statement, re.I | re.S).groups()
+    ignores = "IGNORE_DUP_KEY" in rest.upper()
+    parts = json.dumps([column.strip() for column in columns.split(",")])
+    row = (name, parent, parts, "WHERE" in rest.upper(), ignores)
+    return "SELECT 1" if "." in parent else words if ignores else words + rest, row
 
 
 def column_of(declaration):

@@ -74,6 +74,7 @@ class Session:
         self.identity = self.scope_identity = None
         self.row_count, self.variables = 0, {}
         self.identity_insert = None  # the table whose identities an INSERT must give
+        self.attentions = 0
         self.database.lite.create_function("SCOPE_IDENTITY", 0, lambda: self.scope_identity)
         self.database.lite.create_function("SPID", 0, lambda: self.number)
         self.database.lite.execute("PRAGMA busy_timeout=30000")
@@ -125,6 +126,8 @@ class Session:
                       v_language="us_english", v_trancount=int(self.database.lite.in_transaction),
                       v_lock_timeout=self.lock_timeout, v_error=0, **self.variables)
         if plan.columns:
+            if "dm_tran_locks" in shape:
+                self.list_locks()
             rows = self.execute(plan.text, values).fetchall()
             self.row_count = len(rows)
             return wire.rows(plan.columns, rows) + wire.done(0, len(rows))
@@ -144,6 +147,8 @@ class Session:
     def change(self, verb, table, text, values):
         """A change with the table's triggers, in one transaction. Their counts come before its own."""
         bodies = self.database.triggers(table, verb)
+        if verb == "INSERT" and self.database.ignores_duplicates(table):
+            text = re.sub("INSERT", "INSERT OR IGNORE", text, 1, re.I)
         nested = self.database.lite.in_transaction
         if bodies and not nested:
             self.execute("BEGIN IMMEDIATE")
@@ -201,6 +206,22 @@ class Session:
         raise ServerError(1223, "Cannot release the application lock (Resource: '%s') because it is not currently held."
                           % arguments["resource"])
 
+    def list_locks(self):
+        """The named locks as the server shows them: the first 32 characters of the name and a hash."""
+        self.database.lite.execute("DELETE FROM temp.sys_dm_tran_locks")
+        self.database.lite.executemany(
+            "INSERT INTO temp.sys_dm_tran_locks VALUES ('APPLICATION', ?, ?)",
+            [(owner.number, "0:[%s]:(%08x)" % (name[:32], hash(name) & 0xFFFFFFFF))
+             for (database, name), (owner, _) in list(locks.held.items()) if database == self.database.name])
+
+    def count_attentions(self, _):
+        """How often the client has given up a statement."""
+        return self.attentions
+
+    def fail(self, arguments):
+        """As if the last statement had failed with that number."""
+        raise ServerError(arguments["number"], "A failure that a test has asked for.")
+
     def fall_silent(self, _):
         """From the next batch on this session gets no answer, as on a line that has stalled."""
         self.silent = True
@@ -251,16 +272,23 @@ class Session:
         elif (verb, what) == ("DROP", "TABLE"):
             self.database.drop_table(text.split()[2].strip("[]"))
         elif (verb, what) == ("CREATE", "TRIGGER"):
-            match = re.match(r"CREATE\s+TRIGGER\s+\[?(\w+)\]?\s+ON\s+\[?(\w+)\]?\s+(?:AFTER|FOR)\s+([\w\s,]+?)\s+AS\s+"
-                             r"(.*)", text, re.I | re.S)
+            match = re.match(r"CREATE\s+TRIGGER\s+(\w+)\s+ON\s+([\w.]+)\s+(?:AFTER|FOR)\s+([\w\s,]+?)\s+AS\s+(.*)",
+                             text, re.I | re.S)
             name, table, events, body = match.groups()
-            self.execute("INSERT INTO sys_of_triggers VALUES (?,?,?,?)", (name, table, events.upper(), body))
+            self.execute("INSERT INTO sys_of_triggers VALUES (?,?,?,?,0)", (name, table, events.upper(), body))
+        elif (verb, what) == ("DISABLE", "TRIGGER"):
+            self.execute("UPDATE sys_of_triggers SET is_disabled=1 WHERE name=? COLLATE NOCASE", (text.split()[2], ))
         elif what == "TRIGGER":
             self.execute("DELETE FROM sys_of_triggers WHERE name=? COLLATE NOCASE", (text.split()[2].strip("[]"), ))
         elif (verb, what) == ("DROP", "INDEX"):
-            self.execute(re.sub(r"\s+ON\s.*", "", text, flags=re.I))
+            self.execute("DROP INDEX " + text.split()[2])
+            self.execute("DELETE FROM sys_of_indexes WHERE name=? COLLATE NOCASE", (text.split()[2], ))
+        elif (verb, what) == ("ALTER", "INDEX"):  # to disable it
+            self.execute("UPDATE sys_of_indexes SET is_disabled=1 WHERE name=? COLLATE NOCASE", (text.split()[2], ))
         else:
-            self.execute(text)  # an index
+            index, row = databases.index_of(text)
+            self.execute(index)
+            self.execute("INSERT INTO sys_of_indexes VALUES (?,?,?,?,?,0)", row)
         return wire.done()
 
     def kill(self, text):
@@ -269,9 +297,9 @@ class Session:
 
     STEPS = {"SET": set_option, "WAITFOR DELAY": wait_for, "BEGIN TRAN": transaction, "BEGIN TRANSACTION": transaction,
              "COMMIT": transaction, "ROLLBACK": transaction, "CREATE": define, "ALTER": define,
-             "DROP": define, "KILL": kill}
+             "DROP": define, "DISABLE": define, "KILL": kill}
     PROCEDURES = {"sp_getapplock": get_lock, "sp_releaseapplock": release_lock, "standin_silence": fall_silent,
-                  "standin_copy": copy_database}
+                  "standin_copy": copy_database, "standin_fail": fail, "standin_attentions": count_attentions}
 
 
 def joined(parts):

@@ -54,6 +54,7 @@ class Client(threading.Thread):
                 elif kind == wire.SQL_BATCH:
                     self.batch(wire.batch_text(message))
                 elif kind == wire.ATTENTION:
+                    self.session.attentions += 1
                     self.send(wire.done(wire.ATTENDED))
                 elif kind == wire.TRANSACTION:
                     self.transaction(message)

@@ -217,6 +217,8 @@ class Translator:
         if not isinstance(literal, exp.Column) or literal.name[:2] not in ("@s", "@u"):
             return
         function = "as_" + kind.name if kind.is_date else "as_bit" if kind.name == "bit" else "as_number"
+        if kind.name in ("image", "varbinary", "xml", "sql_variant"):
+            return
         if kind.is_text:
             if kind.is_national or literal.name[1] == "s":
                 return

@@ -27,7 +27,7 @@ class Type(NamedTuple):
 
     @property
     def is_number(self):
-        return self.name in INTEGERS or self.name in ("float", "real", "money", "decimal", "numeric", "bit")
+        return self.name in INTEGERS or self.name in ("float", "real", "money", "smallmoney", "decimal", "numeric", "bit")
 
     @property
     def is_date(self):
@@ -35,7 +35,7 @@ class Type(NamedTuple):
 
     @property
     def is_comparable(self):
-        return self.name not in ("text", "ntext", "image", "xml")
+        return self.name not in ("text", "ntext", "image", "xml", "sql_variant")
 
     @property
     def is_national(self):
@@ -66,7 +66,7 @@ def done(status=0, count=None, token=0xFD):
 
 
 def error(number, message, severity=16, information=False):
-    body = struct.pack("<IBB", number, 1, severity) + long_text(message)
+    body = struct.pack("<iBB", number, 1, severity) + long_text(message)
     body += short_text("STANDIN") + short_text("") + struct.pack("<I", 1)
     return (b"\xab" if information else b"\xaa") + sized(body)
 
@@ -132,7 +132,8 @@ def declaration(kind, table):
     if name == "datetime2":
         return bytes([0x2A, 7 if size is None else size])
     return {"bit": b"\x68\x01", "float": b"\x6d\x08", "real": b"\x6d\x04", "money": b"\x6e\x08",
-            "datetime": b"\x6f\x08", "xml": b"\xf1\x00"}[name]
+            "smallmoney": b"\x6e\x04", "datetime": b"\x6f\x08", "xml": b"\xf1\x00",
+            "sql_variant": b"\x62" + struct.pack("<I", 8009)}[name]
 
 
 def in_parts(data):
@@ -156,6 +157,8 @@ def encoded(kind, value):
         return b"\xff\xff" if data is None else sized(data)
     if name in ("timestamp", "rowversion", "varbinary"):
         return in_parts(value) if size == -1 else b"\xff\xff" if value is None else sized(value)
+    if name == "sql_variant":  # as an int
+        return bytes(4) if value is None else struct.pack("<IBBi", 6, 0x38, 0, int(value))
     if value is None:
         return b"\x00"
     if name in INTEGERS:
@@ -168,6 +171,8 @@ def encoded(kind, value):
     if name == "money":
         parts = round(decimal.Decimal(str(value)) * 10000)
         return struct.pack("<BiI", 8, parts >> 32, parts & 0xFFFFFFFF)
+    if name == "smallmoney":
+        return struct.pack("<Bi", 4, round(decimal.Decimal(str(value)) * 10000))
     if name in ("decimal", "numeric"):
         parts = round(decimal.Decimal(str(value)).scaleb(scale))
         return bytes([17, 0 if parts < 0 else 1]) + abs(parts).to_bytes(16, "little")
