@@ -77,6 +77,69 @@ TEST_P(SqlServer, TriggersChangeNeitherCountsNorIdentities)
     EXPECT_EQ(written(lines, u"SEQ"_s, 7), RowChanged) << "only the trigger has changed rows";
 }
 
+TEST_P(SqlServer, AFailureMeansWhatItsNumberMeansOnThisServer)
+{
+    const std::tuple<int, QString, bool> cases[] = {
+        {1205, u"40001"_s, true},  // a deadlock
+        {-2, u"HYT00"_s, true},   {1222, u"HYT00"_s, true}, {2627, u"23000"_s, true}, {104, u"42000"_s, true},
+        {10053, {}, false},       {10054, {}, false},       {10060, {}, false},       {20004, {}, false}};
+    for (const auto& [number, state, livesOn] : cases) {
+        connection = connect();
+        const RuntimeError thrown =
+            failure([&] { connection->session().engine().run(u"EXEC standin_fail @number=%1"_s.arg(number)); });
+        EXPECT_EQ(thrown.nativeCode(), QString::number(number));
+        EXPECT_EQ(connection->state(), livesOn ? 1 : 0) << number;
+        if (livesOn) {
+            EXPECT_EQ(thrown.sqlState(), state) << number;
+        }
+    }
+}
+
+TEST_P(SqlServer, OrdinaryWorkGivesNoStatementUp)
+{
+    const auto attentions = [&] {
+        return connection->session()
+            .engine()
+            .run(u"DECLARE @r int; EXEC @r = standin_attentions; SELECT @r"_s)
+            .values.front()
+            .toInt();
+    };
+    connection->execute(u"INSERT INTO CAR (REGO, CODE) VALUES ('A', 'x')"_s);
+    for (int i = 0; i < 3; ++i) {
+        Recordset lines = query(u"SELECT * FROM LINE"_s);
+        lines.addNew();
+        lines.set(u"CODE"_s, u"x"_s);
+        lines.set(u"notes"_s, QString(5000, u'n'));
+        lines.update();
+        lines.set(u"notes"_s, u"short"_s);
+        lines.update();
+        Recordset joined = query(u"SELECT L.*, C.owner FROM LINE L INNER JOIN CAR C ON C.CODE=L.CODE"_s);
+        joined.set(u"owner"_s, u"Ann %1"_s.arg(i));
+        joined.update();
+        EXPECT_TRUE(db::Lock(connection, u"a"_s).isHeld());
+        EXPECT_TRUE(connection->answers());
+        EXPECT_EQ(failure([&] { query(u"SELECT * FROM NOSUCH"_s); }).number(), StatementFailed);
+        lines.remove();
+    }
+    EXPECT_EQ(attentions(), 0);
+    connection->setCommandTimeout(1);
+    EXPECT_THROW(connection->execute(u"WAITFOR DELAY '00:00:20'"_s), RuntimeError);
+    EXPECT_EQ(attentions(), 1);
+}
+
+TEST_P(SqlServer, AWaitForALockIsLimitedLikeAStatement)
+{
+    const auto limit = [&] {
+        return connection->session().engine().run(u"SELECT @@LOCK_TIMEOUT"_s).values.front().toInt();
+    };
+    connection->setCommandTimeout(7);
+    EXPECT_EQ(limit(), 7000);
+    connection->open(connectionText);
+    EXPECT_EQ(limit(), 7000) << "it outlives the session";
+    connection->setCommandTimeout(0);
+    EXPECT_EQ(limit(), -1);
+}
+
 TEST_P(SqlServer, ExactNumbersTellARowAndVersionsDoNot)
 {
     connection->execute(

@@ -90,8 +90,11 @@ protected:
 
     bool meansConnectionLost(const OdbcMessage& message) const override
     {
-        // of FreeTDS: timed out, read failed, write failed, end of file, connection dead
-        static const QSet<int> codes{20003, 20004, 20006, 20017, 20047};
+        static const QSet<int> codes{
+            20003, 20004, 20006, 20017, 20047,  // of FreeTDS: timed out, read, write, end of file, connection dead
+            // of Microsoft's drivers, as Windows numbers them. The numbers of other systems, such as 104 and 110, are
+            // also errors of statements; with them the state says that the connection is lost.
+            10050, 10051, 10052, 10053, 10054, 10057, 10058, 10060, 10061, 10064, 10065};
         static const std::array texts{"Communication link failure"_L1,  "Unexpected EOF"_L1,
                                       "Read from the server failed"_L1, "Write to the server failed"_L1,
                                       "is dead or not enabled"_L1,      "TCP Provider"_L1};
