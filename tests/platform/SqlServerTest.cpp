@@ -77,6 +77,19 @@ TEST_P(SqlServer, TriggersChangeNeitherCountsNorIdentities)
     EXPECT_EQ(written(lines, u"SEQ"_s, 7), RowChanged) << "only the trigger has changed rows";
 }
 
+TEST_P(SqlServer, ARowThatAnIndexRefusesSilentlyIsNotTakenForAdded)
+{
+    connection->execute(u"CREATE UNIQUE INDEX ONCE ON LINE (CODE) WITH (IGNORE_DUP_KEY = ON)"_s);
+    connection->execute(u"CREATE UNIQUE INDEX ONCETOO ON Tints (Code) WITH (IGNORE_DUP_KEY = ON)"_s);
+    for (const QString& table : {u"LINE"_s, u"Tints"_s})  // with and without an identity
+        for (const int expected : {0, int(StatementFailed)}) {
+            Recordset rows = query(u"SELECT * FROM "_s + table);
+            rows.addNew();
+            rows.set(u"CODE"_s, u"A"_s);
+            EXPECT_EQ(failure([&] { rows.update(); }).number(), expected) << table;
+        }
+}
+
 TEST_P(SqlServer, AFailureMeansWhatItsNumberMeansOnThisServer)
 {
     const std::tuple<int, QString, bool> cases[] = {

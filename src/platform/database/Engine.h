@@ -44,7 +44,7 @@ public:
     /// Executes an UPDATE, INSERT or DELETE and returns the number of rows that it has changed, without those of
     /// triggers.
     virtual qint64 change(const QString& statement) { return run(statement).hit; }
-    /// Executes an INSERT and returns the identity of the new row.
+    /// Executes an INSERT and returns the identity of the new row. Throws StatementFailed if no row was added.
     virtual QVariant insert(const QString& statement) = 0;
 
     /// Checks if the server still answers, and throws if it does not. Waits some seconds at most, even if a statement

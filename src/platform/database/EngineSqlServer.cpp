@@ -38,7 +38,11 @@ public:
     }
     QVariant insert(const QString& statement) override
     {
-        const QVariant identity = lastValue(run(statement + u"; SELECT SCOPE_IDENTITY()"_s));
+        const Answer answer = run(statement + u"; SELECT SCOPE_IDENTITY(), @@ROWCOUNT"_s);
+        // an index that ignores duplicates refuses a row without an error
+        if (answer.values.size() != 2 || answer.values[1].toLongLong() == 0)
+            throw RuntimeError(StatementFailed, u"The database has not added the row."_s);
+        const QVariant& identity = answer.values[0];
         return identity.isNull() ? QVariant() : QVariant(identity.toLongLong());
     }
 

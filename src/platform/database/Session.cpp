@@ -174,13 +174,9 @@ QVariant Session::insert(const TableInfo& info, const QStringList& columns, cons
                                ? dialect().defaultsOnly
                                : u'(' + columns.join(u", "_s) + u") VALUES ("_s + literals.join(u", "_s) + u')';
     const QString statement = u"INSERT INTO "_s + dialect().quoted(info.name) + u' ' + values;
-    if (!info.identity()) {
-        executeNative(statement);
-        return {};
-    }
     checkFault();
     const QVariant identity = answered([&] { return engine_->insert(statement); });
-    return identity.isNull() ? QVariant() : QVariant(identity.toLongLong());
+    return !info.identity() || identity.isNull() ? QVariant() : QVariant(identity.toLongLong());
 }
 
 QString Session::translatedCondition(const QString& table, const QString& condition)
