@@ -92,7 +92,8 @@ HostTables lookAtHostTables(const db::ConnectionPtr& connection)
         compare(ours, connection->session().table(ours.name), result);
     if (serverOf(connection) == Server::SqlServer)
         noteTriggers(connection,
-                     u"SELECT OBJECT_NAME(parent_id) AS parent, name FROM sys.triggers WHERE parent_id<>0"_s,
+                     u"SELECT OBJECT_NAME(parent_id) AS parent, name FROM sys.triggers WHERE is_disabled=0 AND "
+                     "OBJECT_SCHEMA_NAME(parent_id)=SCHEMA_NAME()"_s,
                      result.notes);
     else if (serverOf(connection) == Server::MySql)
         noteTriggers(connection,

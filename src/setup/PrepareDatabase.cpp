@@ -19,23 +19,25 @@ struct ExistingIndex {
     QStringList columns;
 };
 
-/// Returns the question for the columns of all indexes, in order.
+/// Returns the question for the columns of all indexes that serve every search, in order.
 QString questionFor(Server server)
 {
     switch (server) {
         case Server::Embedded:
             return u"SELECT m.tbl_name AS owner, m.name AS name, i.name AS part FROM sqlite_master m, "
-                   "pragma_index_info(m.name) i WHERE m.type='index' ORDER BY m.name, i.seqno"_s;
+                   "pragma_index_list(m.tbl_name) l, pragma_index_info(m.name) i WHERE m.type='index' AND "
+                   "l.name=m.name AND l.partial=0 ORDER BY m.name, i.seqno"_s;
         case Server::MySql:
             return u"SELECT TABLE_NAME AS owner, INDEX_NAME AS name, COLUMN_NAME AS part FROM "
-                   "INFORMATION_SCHEMA.STATISTICS WHERE TABLE_SCHEMA=DATABASE() "
+                   "INFORMATION_SCHEMA.STATISTICS WHERE TABLE_SCHEMA=DATABASE() AND INDEX_TYPE='BTREE' "
                    "ORDER BY TABLE_NAME, INDEX_NAME, SEQ_IN_INDEX"_s;
         case Server::SqlServer:
             break;
     }
     return u"SELECT OBJECT_NAME(i.object_id) AS owner, i.name AS name, COL_NAME(c.object_id, c.column_id) AS part FROM "
            "sys.indexes i INNER JOIN sys.index_columns c ON c.object_id=i.object_id AND c.index_id=i.index_id "
-           "WHERE c.key_ordinal>0 ORDER BY i.object_id, i.index_id, c.key_ordinal"_s;
+           "WHERE c.key_ordinal>0 AND i.is_disabled=0 AND i.has_filter=0 AND i.is_hypothetical=0 AND "
+           "OBJECT_SCHEMA_NAME(i.object_id)=SCHEMA_NAME() ORDER BY i.object_id, i.index_id, c.key_ordinal"_s;
 }
 
 QList<ExistingIndex> existingIndexes(const db::ConnectionPtr& connection)

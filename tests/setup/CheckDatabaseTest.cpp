@@ -55,6 +55,15 @@ TEST_F(CheckedDatabase, GetsTheIndexesThatItLacksAndKeepsThoseThatServe)
     database->execute(isEmbedded ? u"DROP INDEX QUOTE2_QUOTE"_s : u"DROP INDEX QUOTE2_QUOTE ON QUOTE2"_s);
     database->execute(isEmbedded ? u"DROP INDEX QUOTE1_QTNNO"_s : u"DROP INDEX QUOTE1_QTNNO ON QUOTE1"_s);
     database->execute(u"CREATE INDEX OTHER ON QUOTE1 (QTNNO, REGO)"_s);
+    if (app::serverOf(database) == app::Server::SqlServer)
+        for (const QString& useless :
+             {u"CREATE INDEX FILTERED ON QUOTE2 (QTNNO, Subquote) WHERE QTNNO IS NOT NULL"_s,
+              u"CREATE INDEX ASLEEP ON QUOTE2 (QTNNO, Subquote)"_s, u"ALTER INDEX ASLEEP ON QUOTE2 DISABLE"_s,
+              u"CREATE SCHEMA other"_s, u"CREATE TABLE other.QUOTE2 (QTNNO INT, Subquote INT)"_s,
+              u"CREATE INDEX ELSEWHERE ON other.QUOTE2 (QTNNO, Subquote)"_s})
+            database->session().engine().run(useless);
+    else if (isEmbedded)
+        database->execute(u"CREATE INDEX FILTERED ON QUOTE2 (QTNNO, Subquote) WHERE QTNNO IS NOT NULL"_s);
 
     const QList<app::MissingPart> missing = app::missingParts(database);
     ASSERT_EQ(missing.size(), 1);
@@ -64,6 +73,29 @@ TEST_F(CheckedDatabase, GetsTheIndexesThatItLacksAndKeepsThoseThatServe)
 
     database->execute(isEmbedded ? u"DROP INDEX OTHER"_s : u"DROP INDEX OTHER ON QUOTE1"_s);
     app::createParts(database, app::missingParts(database));
+}
+
+TEST_F(CheckedDatabase, IsReachedByAnotherDriverIfTheHostsIsNotRegistered)
+{
+    db::Connection other;
+    const int nativeClient = 1;
+    other.open(connectionText(nativeClient));
+    EXPECT_TRUE(other.hasTable(u"QUOTE1"_s));
+}
+
+TEST_F(CheckedDatabase, OnlyTriggersThatCanRunAreNoted)
+{
+    const db::ConnectionPtr database = anotherConnection();
+    const bool hasTriggers = app::serverOf(database) == app::Server::SqlServer;
+    const QStringList statements{
+        u"CREATE TRIGGER WORKS ON CAR AFTER UPDATE AS UPDATE CAR SET REGO='A' WHERE REGO='B'"_s,
+        u"CREATE TRIGGER RESTS ON CAR AFTER UPDATE AS UPDATE CAR SET REGO='A' WHERE REGO='B'"_s,
+        u"DISABLE TRIGGER RESTS ON CAR"_s, u"CREATE TABLE other.CAR (REGO INT)"_s,
+        u"CREATE TRIGGER ELSEWHERE ON other.CAR AFTER UPDATE AS UPDATE CAR SET REGO='A' WHERE REGO='B'"_s};
+    for (const QString& statement : hasTriggers ? statements : QStringList())
+        database->session().engine().run(statement);
+    EXPECT_EQ(app::lookAtHostTables(database).notes.filter(u"trigger"_s),
+              hasTriggers ? QStringList(u"CAR has the trigger WORKS"_s) : QStringList());
 }
 
 TEST_F(CheckedDatabase, AFailureOnTheWayIsToldAndLeavesNoTable)

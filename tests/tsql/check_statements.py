@@ -17,9 +17,9 @@ sys.path.insert(0, os.path.join(os.path.dirname(__file__), "..", "support", "tds
 from translation import tokens_of  # noqa: E402
 
 # the driver's own, and what the server knows but the parser does not
-NOT_CHECKED = re.compile(r"sp_datatype_info\w* 1|SET LOCK_TIMEOUT -?1|KILL 1", re.I)
+NOT_CHECKED = re.compile(r"sp_datatype_info\w* 1|SET LOCK_TIMEOUT -?1|KILL 1|ALTER INDEX \w+ ON \w+ DISABLE", re.I)
 
-FUNCTIONS = {"COUNT", "MAX", "SCOPE_IDENTITY", "OBJECT_ID", "OBJECT_NAME", "COL_NAME", "COLUMNPROPERTY", "DB_NAME",
+FUNCTIONS = {"COUNT", "MAX", "SCOPE_IDENTITY", "OBJECT_ID", "OBJECT_NAME", "OBJECT_SCHEMA_NAME", "COL_NAME", "COLUMNPROPERTY", "DB_NAME",
              "DATABASEPROPERTYEX", "SESSIONPROPERTY", "SCHEMA_NAME", "CHARINDEX", "LEFT"}
 BEFORE_PARENTHESIS = {"IN", "VALUES", "AND", "OR", "NOT", "WHERE", "FROM", "ON", "EXISTS", "AS", "SELECT", "NVARCHAR",
                       "WITH"}

@@ -77,7 +77,7 @@ INT, BIGINT, FLOAT, NAME = Type("int"), Type("bigint"), Type("float"), Type("nva
 PARAMETERS = {"s": Type("varchar", 8000), "u": Type("nvarchar", 4000), "i": INT, "f": FLOAT}
 VARIABLES = {"v_identity": Type("numeric", 38), "v_version": Type("nvarchar", 300), "v_language": NAME}
 FUNCTIONS = {"SCOPE_IDENTITY": Type("numeric", 38), "DB_NAME": NAME, "SCHEMA_NAME": NAME, "SERVERPROPERTY": NAME,
-             "DATABASEPROPERTYEX": NAME, "OBJECT_NAME": NAME, "COL_NAME": NAME}
+             "DATABASEPROPERTYEX": NAME, "OBJECT_NAME": NAME, "OBJECT_SCHEMA_NAME": NAME, "COL_NAME": NAME}
 
 
 class Plan(NamedTuple):
