@@ -4,11 +4,13 @@
 #include "platform/database/Dialect.h"
 #include "platform/database/Schema.h"
 
+#include <QList>
 #include <QString>
 #include <QStringList>
 #include <QVariant>
 
 #include <memory>
+#include <utility>
 #include <vector>
 
 class QThread;
@@ -37,6 +39,8 @@ public:
     void drop() { isOpen_ = false; }
 
     virtual const Dialect& dialect() const = 0;
+    /// Returns the names and versions of what lies between the component and the database, for a person to read.
+    virtual QList<std::pair<QString, QString>> versions() const { return {}; }
 
     /// Executes a statement. Throws StatementFailed, or CannotOpen if the connection is lost, with the codes of the
     /// database.

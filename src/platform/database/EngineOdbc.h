@@ -11,6 +11,7 @@ namespace kest::db {
 /// An engine that uses an OdbcConnection.
 class EngineOdbc : public Engine {
 public:
+    QList<std::pair<QString, QString>> versions() const override { return connection_->versions(); }
     Answer run(const QString& statement) override { return run(statement, statementSeconds()); }
     void ping() override;
 

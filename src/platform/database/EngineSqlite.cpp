@@ -163,7 +163,11 @@ public:
         return qint64(sqlite3_last_insert_rowid(handle.get()));
     }
 
-    void setTimeout(int seconds) override { timeout = seconds; }
+    void setTimeout(int seconds) override
+    {
+        timeout = seconds;
+        sqlite3_busy_timeout(handle.get(), (seconds > 0 ? std::min(seconds, busySeconds) : busySeconds) * 1000);
+    }
 
     void rebuildIndexes() override { run(u"REINDEX"_s); }
 

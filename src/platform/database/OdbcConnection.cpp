@@ -287,9 +287,22 @@ Answer OdbcConnection::run(const QString& statement, int seconds)
 
 QString OdbcConnection::databaseName() const
 {
+    return information(SQL_DBMS_NAME);
+}
+
+QList<std::pair<QString, QString>> OdbcConnection::versions() const
+{
+    return {{u"driver"_s, information(SQL_DRIVER_NAME) + u' ' + information(SQL_DRIVER_VER)},
+            {u"driver manager"_s, information(SQL_DM_VER)},
+            {u"server version"_s, information(SQL_DBMS_VER)}};
+}
+
+/// Returns an empty text if the driver does not know.
+QString OdbcConnection::information(unsigned short item) const
+{
     std::array<SQLWCHAR, 256> name{};
     SQLSMALLINT length = 0;  // in bytes
-    SQLGetInfoW(*handles->connection, SQL_DBMS_NAME, name.data(), SQLSMALLINT(sizeof name - sizeof name[0]), &length);
+    SQLGetInfoW(*handles->connection, item, name.data(), SQLSMALLINT(sizeof name - sizeof name[0]), &length);
     return fromWide(name);
 }
 

@@ -7,6 +7,7 @@
 #include <QString>
 
 #include <memory>
+#include <utility>
 
 namespace kest::db {
 
@@ -38,8 +39,12 @@ public:
 
     /// Returns the name of the database's product.
     QString databaseName() const;
+    /// Returns the names and versions of the driver, the driver manager and the server.
+    QList<std::pair<QString, QString>> versions() const;
 
 private:
+    QString information(unsigned short item) const;
+
     struct Handles;
     std::unique_ptr<Handles> handles;
 };

@@ -53,6 +53,11 @@ void QtSqlEngine::moveTo(QThread* thread)
     database.driver()->moveToThread(thread);
 }
 
+QList<std::pair<QString, QString>> QtSqlEngine::versions() const
+{
+    return {{u"driver"_s, database.driverName() + u" of Qt "_s + QString::fromLatin1(qVersion())}};
+}
+
 Answer QtSqlEngine::run(const QString& statement)
 {
     QSqlQuery query(database);

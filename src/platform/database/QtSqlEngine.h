@@ -16,6 +16,7 @@ class QtSqlEngine : public Engine {
 public:
     ~QtSqlEngine() override;
 
+    QList<std::pair<QString, QString>> versions() const override;
     Answer run(const QString& statement) override;
     QVariant insert(const QString& statement) override;
     void moveTo(QThread* thread) override;
