@@ -122,7 +122,7 @@ private:
     bool isHeldUnread(const QString& file);
     void hold(const QString& file, const QString& type, const QString& waitsFor) const;
 
-    QString text;            // of the current file
+    QByteArray text;         // of the current file, in the code page
     xml::Document document;  // the parsed text
     xml::Document reparsed;
     MessageFolder folder;
@@ -137,7 +137,8 @@ void Fill::take(const QString& file)
     } else if (folder == MessageFolder::Sent) {
         listed.append({file, GetMessageRow(prepared(), u"SENT"_s)});
     } else if (file.startsWith("R_"_L1)) {
-        hooks.submissionResponse(text, file);
+        QString response = files::fromCodePage(text);
+        hooks.submissionResponse(response, file);
     } else if (file.contains("MDMSG"_L1)) {
         if (isMarker(document)) {
             const xml::Document& marker = prepared();
@@ -179,7 +180,7 @@ void Fill::hold(const QString& file, const QString& type, const QString& waitsFo
 
 bool Fill::parse(const QString& path)
 {
-    text = files::fromCodePage(files::readStart(path, xml::Document::maximumBytes + 1));
+    text = files::readStart(path, xml::Document::maximumBytes + 1);
     if (text.size() > xml::Document::maximumBytes)
         return false;
     if (folder != MessageFolder::Sent)
@@ -187,7 +188,7 @@ bool Fill::parse(const QString& path)
     if (!escapeAmpersands(text))
         return false;
     text = wrappedInRequest(text);
-    return document.loadXML(text) && text.size() >= shortestSentText;
+    return parseBytes(document, text) && text.size() >= shortestSentText;
 }
 
 // Returns the document with the schema-instance declaration added, from which rows are read. The declaration can make a
@@ -196,7 +197,8 @@ const xml::Document& Fill::prepared()
 {
     if (isSameWhenPrepared(text))
         return document;
-    reparsed = parsedMessage(text);
+    QString whole = files::fromCodePage(text);
+    reparsed = parsedMessage(whole);
     return reparsed;
 }
 

@@ -40,7 +40,7 @@ void checkMessage(const QString& path, const QString& name)
 {
     if (files::size(path) > xml::Document::maximumBytes)
         throw NotTaken{u"it is too large for a message"_s};
-    QString text = files::read(path);
+    QByteArray text = files::readBytes(path);
     xml::Document document;
     SetupDocument(document);
     if (!parseWithRepairs(document, text))

@@ -2,6 +2,9 @@
 
 #include "messages/MessageTypes.h"
 #include "platform/RuntimeError.h"
+#include "platform/files/CodePage.h"
+
+#include <string_view>
 
 using namespace Qt::StringLiterals;
 
@@ -10,6 +13,7 @@ namespace {
 
 constexpr QLatin1StringView networkDomain = "orla.example"_L1;  // every namespace of the network ends in this
 constexpr QLatin1StringView schemaInstance = "xmlns:xsi=\"http://www.w3.org/2001/XMLSchema-instance\" "_L1;
+constexpr QLatin1StringView escapedAmpersand = "&amp;"_L1;
 constexpr int repairsAllowed = 3;
 constexpr qsizetype mostKeptForLong = 1'000'000;  // characters; a second parse costs less than that much memory
 
@@ -21,7 +25,8 @@ LastMessage lastMessage;
 int keepers = 0;
 
 /// Looks only at the quotation marks: a search of the whole text that ignores case is slower than the parser.
-bool declaresSchemaInstance(QStringView text)
+template <class View>
+bool declaresSchemaInstance(View text)
 {
     const qsizetype toMark = schemaInstance.indexOf(u'"');
     for (qsizetype mark = text.indexOf(u'"', toMark); mark >= 0; mark = text.indexOf(u'"', mark + 1)) {
@@ -53,24 +58,27 @@ void SetupDocument(xml::Document& document)
 QString AddXsiDeclaration(QString text)
 {
     const qsizetype first = text.indexOf("xmlns"_L1);
-    if (first < 0 || declaresSchemaInstance(text))
+    if (first < 0 || declaresSchemaInstance(QStringView(text)))
         return text;
     text.insert(first, schemaInstance);
     return text;
 }
 
-bool isSameWhenPrepared(const QString& text)
+bool isSameWhenPrepared(QByteArrayView text)
 {
-    const qsizetype first = text.indexOf("xmlns"_L1);
-    if (first < 0 || declaresSchemaInstance(text))
+    const std::string_view all(text.data(), static_cast<size_t>(text.size()));
+    const size_t first = all.find("xmlns");
+    if (first == all.npos || declaresSchemaInstance(QLatin1StringView(text)))
         return true;
-    if (text.contains("xmlns:xsi"_L1))
+    if (all.find("xmlns:xsi") != all.npos)
         return false;  // the element that gets the declaration may already have one
-    const QStringView before = QStringView(text).first(first);
-    const QStringView tag = before.sliced(qMax(before.lastIndexOf(u'<'), 0));
-    const bool isAttribute = tag.startsWith(u'<') && tag.back().isSpace() && !tag.contains(u'>') &&
-                             !tag.contains(u'"') && !tag.contains(u'\'');
-    return isAttribute && !before.contains("<!"_L1) && !before.contains("<?"_L1);
+    const std::string_view before = all.substr(0, first);
+    const size_t opening = before.rfind('<');
+    if (opening == before.npos || before.find("<!") != before.npos || before.find("<?") != before.npos)
+        return false;
+    const std::string_view tag = before.substr(opening);
+    const bool isAttribute = std::string_view(" \t\r\n").find(tag.back()) != std::string_view::npos;
+    return isAttribute && tag.find_first_of(">\"'") == tag.npos;
 }
 
 QString GetMessageTypeName(QString& text)
@@ -111,7 +119,15 @@ bool escapeAmpersands(QString& text)
 {
     if (text.size() + 4 * text.count(u'&') > xml::Document::maximumBytes)
         return false;
-    text.replace(u'&', "&amp;"_L1);
+    text.replace(u'&', escapedAmpersand);
+    return true;
+}
+
+bool escapeAmpersands(QByteArray& text)
+{
+    if (text.size() + 4 * text.count('&') > xml::Document::maximumBytes)
+        return false;
+    text.replace('&', escapedAmpersand);
     return true;
 }
 
@@ -120,9 +136,19 @@ QString wrappedInRequest(const QString& text)
     return "<request>"_L1 + text + "</request>"_L1;
 }
 
-bool parseWithRepairs(xml::Document& document, QString& text)
+QByteArray wrappedInRequest(const QByteArray& text)
 {
-    for (int repairs = 0; !document.loadXML(text); ++repairs) {
+    return "<request>" + text + "</request>";
+}
+
+bool parseBytes(xml::Document& document, const QByteArray& text)
+{
+    return files::isAscii(text) ? document.loadAscii(text) : document.loadXML(files::fromCodePage(text));
+}
+
+bool parseWithRepairs(xml::Document& document, QByteArray& text)
+{
+    for (int repairs = 0; !parseBytes(document, text); ++repairs) {
         const quint32 error = document.parseError().errorCode;
         if (repairs == repairsAllowed)
             return false;

@@ -17,9 +17,9 @@ void SetupDocument(xml::Document& document);
 /// Inserts the schema-instance declaration before the first "xmlns" of the text. Returns the text unchanged if it has
 /// no "xmlns", or if it already has the declaration in exactly this wording.
 QString AddXsiDeclaration(QString text);
-/// Returns true if the text gives the same document before and after AddXsiDeclaration(), so that it needs no second
-/// parse. Returns false in doubt.
-bool isSameWhenPrepared(const QString& text);
+/// Returns true if the text, in the code page, gives the same document before and after AddXsiDeclaration(), so that it
+/// needs no second parse. Returns false in doubt.
+bool isSameWhenPrepared(QByteArrayView text);
 
 /// Returns the display name of a network message. Adds the schema-instance declaration to `text`. Never throws.
 QString GetMessageTypeName(QString& text);
@@ -35,12 +35,16 @@ bool isMarker(const xml::Document& message);
 /// Replaces every "&" with "&amp;", even those of entities. The text can become five times as long; if it would be too
 /// long to parse, returns false and leaves it unchanged.
 bool escapeAmpersands(QString& text);
+bool escapeAmpersands(QByteArray& text);
 /// Returns the text between "<request>" and "</request>".
 QString wrappedInRequest(const QString& text);
+QByteArray wrappedInRequest(const QByteArray& text);
 
-/// Parses a text into the document. If necessary, makes one or both of the two repairs in `text`. Returns false if the
+/// Parses a text in the code page. Converts it only if it has characters other than ASCII.
+bool parseBytes(xml::Document& document, const QByteArray& text);
+/// Parses a text in the code page. If necessary, makes one or both of the two repairs in `text`. Returns false if the
 /// text is still unreadable.
-bool parseWithRepairs(xml::Document& document, QString& text);
+bool parseWithRepairs(xml::Document& document, QByteArray& text);
 /// Adds the schema-instance declaration to `text` and parses it. The caller must check `parseError` of the result.
 xml::Document parsedMessage(QString& text);
 

@@ -82,10 +82,10 @@ class XmlTarget final : public Target {
     {
         QString text = files::fromCodePage(input);
         parsedMessage(text).parseError();
-        text = files::fromCodePage(input);
+        QByteArray bytes = input;
         xml::Document document;
         SetupDocument(document);
-        if (!parseWithRepairs(document, text)) {
+        if (!parseWithRepairs(document, bytes)) {
             require(document.documentElement().isNull(), "an unreadable text leaves no document");
             require(document.parseError().srcText.size() <= 10'000, "the shown source is limited");
             return;
@@ -95,8 +95,8 @@ class XmlTarget final : public Target {
         require(again.loadXML(written), "a document can be read as it is written");
         require(again.xml() == written, "a document is written as it was read");
         require(again.documentElement().text() == document.documentElement().text(), "no text is lost");
-        if (isSameWhenPrepared(text)) {
-            QString prepared = text;
+        if (isSameWhenPrepared(bytes)) {
+            QString prepared = files::fromCodePage(bytes);
             require(parsedMessage(prepared).documentElement().text() == document.documentElement().text(),
                     "a text that is the same when prepared is so");
         }

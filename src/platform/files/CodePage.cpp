@@ -41,14 +41,19 @@ QByteArray toCodePage(const QString& text)
     return bytes;
 }
 
+bool isAscii(QByteArrayView bytes)
+{
+    char all = 0;  // not with std::all_of, whose early end prevents that many bytes are tested at once
+    for (const char c : bytes)
+        all |= c;
+    return static_cast<signed char>(all) >= 0;
+}
+
 QString fromCodePage(const QByteArray& bytes)
 {
-    if (bytes.isValidUtf8()) {
-        const QString ascii = QString::fromUtf8(bytes);
-        if (ascii.size() == bytes.size())
-            return ascii;  // nearly all texts
-    }
     QString text = QString::fromLatin1(bytes);
+    if (isAscii(bytes))
+        return text;  // nearly all texts
     for (QChar& c : text) {
         if (c >= QChar(0x80) && c < QChar(0xA0))
             c = upperControls[c.unicode() - 0x80];

@@ -109,12 +109,22 @@ Document& Document::operator=(Document&& other) noexcept
 
 void Document::setSelectionNamespaces(const QMap<QString, QString>& prefixes)
 {
+    if (prefixes == data->prefixes)
+        return;
     data->prefixes = prefixes;
+    data->uris.clear();
+    for (auto prefix = prefixes.cbegin(); prefix != prefixes.cend(); ++prefix)
+        data->uris.insert(prefix.key(), prefix.value().toUtf8());
 }
 
 bool Document::loadXML(const QString& text)
 {
-    return parse(*data, text);
+    return parse(*data, {.utf16 = text});
+}
+
+bool Document::loadAscii(QByteArrayView text)
+{
+    return parse(*data, {.ascii = text});
 }
 
 const ParseError& Document::parseError() const

@@ -41,6 +41,7 @@ struct DocumentData {
     xmlDocPtr document = nullptr;
     ParseError error;
     QMap<QString, QString> prefixes;
+    QMap<QString, QByteArray> uris;  // of the prefixes, in UTF-8
     /// The start tags of elements in which a declaration comes after an attribute. They tell the order.
     QHash<const xmlNode*, QByteArray> startTags;
 
@@ -77,8 +78,17 @@ QList<Attribute> attributesOf(const DocumentData& data, const xmlNode* element);
 /// Returns the names of the attributes and declarations in a start tag, in their order.
 std::vector<std::string_view> namesInStartTag(std::string_view tag);
 
+/// A text to parse: one of the two, the other is empty.
+struct Source {
+    QStringView utf16 = {};
+    QByteArrayView ascii = {};
+
+    qsizetype size() const { return qMax(utf16.size(), ascii.size()); }
+    QString toString() const { return ascii.isEmpty() ? utf16.toString() : QString::fromLatin1(ascii); }
+};
+
 /// Parses a text into `data`. If it fails, returns false and sets the error; `data` is then empty.
-bool parse(DocumentData& data, const QString& text);
+bool parse(DocumentData& data, const Source& source);
 /// Returns a node as XML text.
 QString serialized(const DocumentData& data, const xmlNode* node);
 

@@ -38,15 +38,22 @@ constexpr qsizetype longestSource = 10000;  // the most characters of a line to 
 
 /// The state of a parse. Only the first error counts.
 struct Progress {
-    const QString& text;
+    const Source& source;
     xmlParserCtxtPtr parser = nullptr;
     QStringEncoder encoder{QStringEncoder::Utf8, QStringEncoder::Flag::Stateless};
     qsizetype fed = 0;  // how many characters libxml2 has been given
     int nodes = 0;
+    bool hasBlank = false;  // whether there may be texts of white space only
     std::optional<ParseError> failure = {};
     int firstCode = 0;
     QHash<const xmlNode*, QByteArray> startTags = {};
 };
+
+/// Returns the source from a place on.
+QByteArray utf8From(const Source& source, qsizetype place)
+{
+    return source.ascii.isEmpty() ? source.utf16.sliced(place).toUtf8() : source.ascii.sliced(place).toByteArray();
+}
 
 Progress& progressOf(xmlParserCtxtPtr parser)
 {
@@ -116,8 +123,8 @@ void takeError(void* userData, xmlErrorPtr error)
     Progress& progress = progressOf(parser);
     if (error->code == XML_ERR_DOCUMENT_END && parser->input &&
         (!progress.failure || progress.firstCode == XML_ERR_RESERVED_XML_NAME)) {
-        const QByteArray rest = QByteArray(reinterpret_cast<const char*>(parser->input->cur)) +
-                                QStringView(progress.text).sliced(progress.fed).toUtf8();
+        const QByteArray rest =
+            QByteArray(reinterpret_cast<const char*>(parser->input->cur)) + utf8From(progress.source, progress.fed);
         if (isElementNext({rest.constData(), static_cast<size_t>(rest.size())})) {
             progress.failure.reset();
             fail(progress, parser, SecondRoot, u"There is more than one top-level element."_s);
@@ -145,11 +152,28 @@ void refuseDtd(void* userData, const xmlChar*, const xmlChar*, const xmlChar*)
     refuse(static_cast<xmlParserCtxtPtr>(userData), DtdRefused, u"A document type declaration is not accepted."_s);
 }
 
+/// Writes the next piece of the source to the buffer, in UTF-8, and returns its end.
+char* nextPiece(Progress& progress, char* buffer, qsizetype length)
+{
+    constexpr int longestCharacter = 3;  // the most bytes of a UTF-16 unit in UTF-8
+    const qsizetype rest = progress.source.size() - progress.fed;
+    const qsizetype from = progress.fed;
+    if (!progress.source.ascii.isEmpty()) {
+        const QByteArrayView piece = progress.source.ascii.sliced(from, qMin(length, rest));
+        progress.fed += piece.size();
+        return std::copy(piece.begin(), piece.end(), buffer);
+    }
+    qsizetype count = qMin(length / longestCharacter, rest);
+    if (count > 1 && progress.source.utf16[from + count - 1].isHighSurrogate())
+        --count;
+    progress.fed += count;
+    return progress.encoder.appendToBuffer(buffer, progress.source.utf16.sliced(from, count));
+}
+
 /// Gives libxml2 the next piece of the text. Ends the text if the parse has failed or if a start tag exceeds the
 /// limits, because libxml2 would read such a tag to its end before it calls `startElement`.
 int feed(void* userData, char* buffer, int length)
 {
-    constexpr int longestCharacter = 3;  // the most bytes of a UTF-16 unit in UTF-8
     Progress& progress = *static_cast<Progress*>(userData);
     const xmlParserCtxtPtr parser = progress.parser;
     // Each attribute takes five places, and libxml2 doubles the number of places if all are in use.
@@ -157,13 +181,7 @@ int feed(void* userData, char* buffer, int length)
         fail(progress, parser, TooManyAttributes, tooManyAttributes);
     if (progress.failure && progress.firstCode != XML_ERR_RESERVED_XML_NAME)
         return 0;
-    qsizetype count = qMin<qsizetype>(length / longestCharacter, progress.text.size() - progress.fed);
-    if (count > 1 && progress.text[progress.fed + count - 1].isHighSurrogate())
-        --count;
-    const char* const end =
-        progress.encoder.appendToBuffer(buffer, QStringView(progress.text).sliced(progress.fed, count));
-    progress.fed += count;
-    return static_cast<int>(end - buffer);
+    return static_cast<int>(nextPiece(progress, buffer, length) - buffer);
 }
 
 void countNodes(xmlParserCtxtPtr parser, int count)
@@ -177,6 +195,7 @@ void addText(void* userData, const xmlChar* text, int length)
 {
     const auto parser = static_cast<xmlParserCtxtPtr>(userData);
     const xmlNode* const before = parser->node ? parser->node->last : nullptr;
+    progressOf(parser).hasBlank |= length > 0 && isBlank(static_cast<char>(*text));
     xmlSAX2Characters(userData, text, length);
     if (parser->node && parser->node->last != before)
         countNodes(parser, 1);
@@ -308,7 +327,7 @@ void setParseFault(std::function<bool()> fault)
     parseFault = std::move(fault);
 }
 
-bool parse(DocumentData& data, const QString& text)
+bool parse(DocumentData& data, const Source& source)
 {
     data.clear();
     data.error = {};
@@ -316,18 +335,18 @@ bool parse(DocumentData& data, const QString& text)
         data.error = limitError(libraryErrors + XML_ERR_NO_MEMORY, u"A fault set by a test."_s);
         return false;
     }
-    if (text.size() > Document::maximumBytes) {
+    if (source.size() > Document::maximumBytes) {
         data.error = limitError(TooLarge, u"The text is too large."_s);
         return false;
     }
-    if (text.contains(QChar(u'\0'))) {  // libxml2 would end the text here
+    if (source.utf16.contains(QChar(u'\0')) || source.ascii.contains('\0')) {  // libxml2 would end the text here
         data.error = limitError(NulCharacter, u"There is a character of the code 0."_s);
         return false;
     }
 
     const std::unique_ptr<xmlParserCtxt, decltype(&xmlFreeParserCtxt)> parser(xmlNewParserCtxt(), &xmlFreeParserCtxt);
     Q_CHECK_PTR(parser.get());
-    Progress progress{text, parser.get()};
+    Progress progress{source, parser.get()};
     parser->_private = &progress;
     parser->sax->serror = takeError;
     parser->sax->internalSubset = refuseDtd;
@@ -343,10 +362,11 @@ bool parse(DocumentData& data, const QString& text)
     if (progress.failure) {
         xmlFreeDoc(document);
         data.error = *progress.failure;
-        data.error.srcText = sourceText(text, data.error);
+        data.error.srcText = sourceText(source.toString(), data.error);
         return false;
     }
-    removeBlankTexts(document);
+    if (progress.hasBlank)
+        removeBlankTexts(document);
     data.take(document, std::move(progress.startTags));
     return true;
 }

@@ -2,9 +2,11 @@
 #include "platform/xml/DocumentData.h"
 
 #include <QRegularExpression>
+#include <QVarLengthArray>
 
 #include <libxml/xpathInternals.h>
 
+#include <cstdint>
 #include <memory>
 #include <unordered_map>
 
@@ -28,20 +30,20 @@ void passOver(void*, xmlErrorPtr) {}
 
 struct Step {
     QString prefix;
-    QByteArray name;
+    QByteArray name;  // empty for "*", any element
 };
 
-/// The steps of a path that consists of names only, such as "//p:a/p:b" or "a". A walk that ends at the first match
-/// finds its node faster than libxml2, which looks at the whole document.
+/// The steps of a path that consists of names only, such as "//p:a/p:b" or "a", or of names and a "*" at the end. A
+/// walk finds its nodes faster than libxml2, which numbers the whole document first, and looks at all of it for "//".
 struct PlainPath {
     explicit PlainPath(const QString& path)
     {
-        static const QRegularExpression form(u"^(//)?(?:\\w+:)?[A-Za-z]\\w*(?:/(?:\\w+:)?[A-Za-z]\\w*)*$"_s);
+        static const QRegularExpression form(u"^(//)?(?:\\w+:)?[A-Za-z]\\w*(?:/(?:\\w+:)?[A-Za-z]\\w*)*(?:/\\*)?$"_s);
         const auto match = form.match(path);
         anywhere = !match.capturedView(1).isEmpty();
         for (const QString& step : match.captured().sliced(anywhere ? 2 : 0).split(u'/', Qt::SkipEmptyParts)) {
             const qsizetype colon = step.indexOf(u':');
-            steps.push_back({step.left(qMax(colon, 0)), step.sliced(colon + 1).toUtf8()});
+            steps.push_back({step.left(qMax(colon, 0)), step == u'*' ? QByteArray() : step.sliced(colon + 1).toUtf8()});
         }
     }
 
@@ -49,15 +51,15 @@ struct PlainPath {
     std::vector<Step> steps;  // none if there is something else in the path
 };
 
-/// Finds the first node of a plain path.
+/// Finds the nodes of a plain path.
 class Walk {
 public:
-    Walk(const PlainPath& path, const QMap<QString, QString>& prefixes) : steps(path.steps)
+    Walk(const PlainPath& path, const QMap<QString, QByteArray>& urisOfPrefixes) : steps(path.steps)
     {
         for (const Step& step : steps) {
-            const auto uri = prefixes.constFind(step.prefix);
-            isPossible = isPossible && (step.prefix.isEmpty() || uri != prefixes.cend());
-            uris.push_back(step.prefix.isEmpty() || !isPossible ? QByteArray() : uri->toUtf8());
+            const auto uri = urisOfPrefixes.constFind(step.prefix);
+            isPossible = isPossible && (step.prefix.isEmpty() || uri != urisOfPrefixes.cend());
+            uris.append(step.prefix.isEmpty() || !isPossible ? QByteArray() : *uri);
         }
     }
 
@@ -76,25 +78,37 @@ public:
         return at;
     }
 
-    xmlNodePtr firstBelow(const xmlNode* parent, size_t step = 0) const
+    xmlNodePtr firstBelow(const xmlNode* parent) const
     {
-        for (xmlNodePtr child = parent->children; child; child = child->next) {
+        std::vector<xmlNodePtr> found;
+        findBelow(parent, found, 1);
+        return found.empty() ? nullptr : found.front();
+    }
+
+    /// Adds the nodes of a path without "//" to `found`, in the order of the document, until there are `most`.
+    void findBelow(const xmlNode* parent, std::vector<xmlNodePtr>& found, size_t most = SIZE_MAX, size_t step = 0) const
+    {
+        for (xmlNodePtr child = parent->children; child && found.size() < most; child = child->next) {
             if (!fits(child, step))
                 continue;
-            const xmlNodePtr found = step + 1 == steps.size() ? child : firstBelow(child, step + 1);
-            if (found)
-                return found;
+            if (step + 1 == steps.size())
+                found.push_back(child);
+            else
+                findBelow(child, found, most, step + 1);
         }
-        return nullptr;
     }
 
 private:
     bool fits(const xmlNode* node, size_t step) const
     {
-        if (node->type != XML_ELEMENT_NODE || !xmlStrEqual(node->name, toXml(steps[step].name)))
+        if (node->type != XML_ELEMENT_NODE)
+            return false;
+        if (steps[step].name.isEmpty())
+            return true;
+        if (!xmlStrEqual(node->name, toXml(steps[step].name)))
             return false;
         const bool named = !steps[step].prefix.isEmpty();
-        return node->ns ? named && xmlStrEqual(node->ns->href, toXml(uris[step])) : !named;
+        return node->ns ? named && xmlStrEqual(node->ns->href, toXml(uris[qsizetype(step)])) : !named;
     }
 
     /// Returns true if the last step is at this node, and those before it are at its parents.
@@ -108,7 +122,7 @@ private:
     }
 
     const std::vector<Step>& steps;
-    std::vector<QByteArray> uris;
+    QVarLengthArray<QByteArray, 4> uris;
     bool isPossible = true;
 };
 
@@ -168,7 +182,7 @@ xmlXPathContextPtr DocumentData::selectionContext()
 Node DocumentData::selectFirst(xmlNodePtr from, const QString& path)
 {
     const PlainPath& plain = knownPath(path).plain;
-    if (const Walk walk(plain, prefixes); walk.canBeWalked())
+    if (const Walk walk(plain, uris); walk.canBeWalked())
         return wrap(plain.anywhere ? walk.firstIn(document) : walk.firstBelow(from));
     const QList<Node> found = select(from, path);
     return found.isEmpty() ? Node() : found.first();
@@ -176,12 +190,20 @@ Node DocumentData::selectFirst(xmlNodePtr from, const QString& path)
 
 QList<Node> DocumentData::select(xmlNodePtr from, const QString& path)
 {
+    const KnownPath& known = knownPath(path);
+    QList<Node> nodes;
+    if (const Walk walk(known.plain, uris); !known.plain.anywhere && walk.canBeWalked()) {
+        std::vector<xmlNodePtr> walked;
+        walk.findBelow(from, walked);
+        for (const xmlNodePtr node : walked)
+            nodes.append(wrap(node));
+        return nodes;
+    }
     const xmlXPathContextPtr here = selectionContext();
     here->node = from;
-    const Result result(xmlXPathCompiledEval(knownPath(path).compiled.get(), here), &xmlXPathFreeObject);
+    const Result result(xmlXPathCompiledEval(known.compiled.get(), here), &xmlXPathFreeObject);
     if (!result || result->type != XPATH_NODESET)
         failAsExpression(path);
-    QList<Node> nodes;
     const xmlNodeSetPtr found = result->nodesetval;
     for (int i = 0; found && i < found->nodeNr; ++i) {
         const xmlNodePtr node = found->nodeTab[i];

@@ -1,6 +1,7 @@
 // XML documents for the message code, based on libxml2.
 #pragma once
 
+#include <QByteArrayView>
 #include <QList>
 #include <QMap>
 #include <QString>
@@ -103,6 +104,8 @@ public:
 
     /// Parses a text. If it fails, returns false and sets parseError(); the document is then empty.
     bool loadXML(const QString& text);
+    /// The same for a text that has only ASCII characters, which needs no conversion.
+    bool loadAscii(QByteArrayView text);
     /// Returns the error of the last parse.
     const ParseError& parseError() const;
 
