@@ -30,9 +30,10 @@ done
 ! grep -vE ' \./(usr/.*)?$' "$tmp/contents" || fail "the package has files outside /usr"
 ! grep -v ' root/root ' "$tmp/contents" || fail "the package has files that are not root's"
 depends=$(dpkg-deb --field "$deb" Depends)
-for package in libqt6sql6-sqlite libqt6widgets6 libxml2 libnettle8; do
+for package in libsqlite3-0 libqt6widgets6 libxml2 libnettle8; do
     [[ $depends == *"$package"* ]] || fail "the package does not depend on $package: $depends"
 done
+[[ $depends != *libqt6sql6-* ]] || fail "the package depends on a driver that it does not use: $depends"
 
 # the installation in an empty folder; the dependencies are those of this machine
 root=$tmp/root
