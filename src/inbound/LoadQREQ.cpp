@@ -281,7 +281,6 @@ void takePhotographs(const xml::Node& root, const QString& requestNumber, const 
 /// search for the next number.
 void countOn(db::Recordset& cinfo)
 {
-    attempt([] { EnsureConnection(); });  // the server may have dropped it while the report was open
     const auto moveOn = [&] {
         cinfo.cancelUpdate();
         cinfo.requery();
@@ -342,6 +341,7 @@ bool LoadQREQ(QString& text, const QString& fileName)
     journal::passPoint([&] { notes.update(); });
 
     PrintXML(fileName, false);
+    attempt([] { EnsureConnection(); });  // the server may have dropped it while the report was open
     takePhotographs(message->documentElement(), request.number, quoteNumber);
     countOn(cinfo);
     return true;

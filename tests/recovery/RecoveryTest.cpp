@@ -9,6 +9,7 @@
 #include "platform/RuntimeError.h"
 #include "recovery/Recovery.h"
 #include "recovery/TakeBack.h"
+#include "support/Hands.h"
 
 #include <QLabel>
 
@@ -332,6 +333,17 @@ TEST_F(Interrupted, AMoveThatBeganEndsUnderItsName)
     }
     recovery::settle();
     EXPECT_EQ(filesIn(gsReadPath), QStringList(u"500.0_1.xml"_s));
+    EXPECT_EQ(filesIn(gsUnreadPath), QStringList());
+}
+
+TEST_F(Interrupted, AReportMayStayOpenUntilTheConnectionIsLost)
+{
+    putTemplate(710);
+    arrive("QR9_001.jpg", "picture");
+    arrive("m.xml", quoteRequest("QR9").images({"1"}));
+    const Hands hands({{u"frmPrintPreview"_s, [](QDialog&) { dropConnection(); }}});
+    EXPECT_TRUE(loadAsTheWindow(u"m.xml"_s));
+    EXPECT_EQ(shown(), "");
     EXPECT_EQ(filesIn(gsUnreadPath), QStringList());
 }
 
