@@ -168,6 +168,7 @@ double CreateQuoteXML(db::Recordset& quote)
     journal::keep(u"written"_s, true);
     markAsSent(rows.key, rows.quote, rows.notes, quoteSent);
     desktop::msgBox(u"Quote Sent."_s, desktop::Icon::Information);
+    EnsureConnection();  // it may have been lost while the box was open
     return total;
 }
 

@@ -347,6 +347,24 @@ TEST_F(Interrupted, AReportMayStayOpenUntilTheConnectionIsLost)
     EXPECT_EQ(filesIn(gsUnreadPath), QStringList());
 }
 
+TEST_F(Interrupted, ABoxMayStayOpenUntilTheConnectionIsLost)
+{
+    struct Absent final : desktop::Answerer {
+        desktop::Answer box(const desktop::Box&) override
+        {
+            dropConnection();
+            return desktop::Answer::Ok;
+        }
+        QString input(const desktop::Input&) override { return {}; }
+        void start(const QString&) override {}
+    };
+    sendable("600");
+    files::write(gsImagesPath + u"600_0001.jpg"_s, u"picture"_s);
+    desktop::setAnswerer(std::make_shared<Absent>());
+    EXPECT_EQ(failureOf([] { send("600"); }), 0);
+    EXPECT_EQ(newest().text("State"), "done");
+}
+
 TEST_F(Interrupted, PicturesThatCouldNotBeSentAreSentLater)
 {
     sendable("600");
