@@ -188,7 +188,7 @@ TEST_F(Others, Print)
                           [=] { QFile::remove(printed); },
                           {},
                           "{}",
-                          printing(u"frmPrintPreview"_s, printed, 0)});
+                          printing(u"frmPrintPreview"_s, printed, {})});
 }
 
 TEST_F(Others, Export)
