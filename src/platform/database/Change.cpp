@@ -27,7 +27,8 @@ Change::Change(Connection& connection, const QString& table, ChangeSteps steps)
     const bool isAlone = steps == ChangeSteps::WriteOnly || connection.isInChange();
     if (!observer_ && isAlone)
         return;
-    observer_->aboutToChange();
+    if (observer_)
+        observer_->aboutToChange();
     connection_.session().begin();
     isOpen_ = true;
     connection_.setInChange(true);
