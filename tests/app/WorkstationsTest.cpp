@@ -14,7 +14,6 @@ struct Workstations : Shop {
         EXPECT_TRUE(settings::createKey(settings::Hive::LocalMachine, u"SOFTWARE"_s));
         files::writeBytes(second_ + file, files::readBytes(root() + file));
     }
-    ~Workstations() override { db::setStatementFault({}); }
 
     /// Returns the exit codes of loads that start at the same time, each on its own workstation.
     std::vector<int> loadTogether(const QStringList& messages) const

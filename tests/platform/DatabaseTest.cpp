@@ -1,6 +1,5 @@
 // Tests connections and statements: which engine is used, how each compares values, and which errors occur.
 #include "platform/Databases.h"
-#include "platform/database/FaultInjection.h"
 
 #include <QSqlDatabase>
 #include <QSqlQuery>
@@ -10,8 +9,6 @@ using db::Kind;
 using db::Recordset;
 
 struct Database : Databases {
-    ~Database() override { db::setStatementFault({}); }
-
     void insert(const QString& columns, const QString& values) const
     {
         connection->execute(u"INSERT INTO LINE (%1) VALUES (%2)"_s.arg(columns, values));

@@ -1,6 +1,7 @@
 // Provides the same small database on each engine, so that a test states a rule for all of them.
 #pragma once
 
+#include "platform/database/FaultInjection.h"
 #include "platform/database/Recordset.h"
 #include "platform/database/Sql.h"
 #include "support/MariaDbServer.h"
@@ -19,6 +20,7 @@ QString createDatabase(On engine);
 class Databases : public ::testing::TestWithParam<On> {
 protected:
     Databases();
+    ~Databases() override { db::setStatementFault({}); }
 
     db::ConnectionPtr connect() const;
     db::Recordset query(const QString& select) const;

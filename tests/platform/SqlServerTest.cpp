@@ -10,14 +10,7 @@
 
 using db::Recordset;
 
-class SqlServer : public Databases {
-protected:
-    void execute(std::initializer_list<QString> statements) const
-    {
-        for (const QString& statement : statements)
-            connection->execute(statement);
-    }
-};
+class SqlServer : public Databases {};
 
 TEST_P(SqlServer, TextsOfAnyLengthAndLetterComeBackWhole)
 {
@@ -65,10 +58,11 @@ TEST_P(SqlServer, ALetterOutsideOfThePlaneIsNotCutBetweenTwoPieces)
 
 TEST_P(SqlServer, TriggersChangeNeitherCountsNorIdentities)
 {
-    execute(
-        {u"CREATE TABLE AUDIT (id INT IDENTITY(1,1) PRIMARY KEY, what VARCHAR(20))"_s,
-         u"INSERT INTO AUDIT (what) VALUES ('first')"_s, u"INSERT INTO AUDIT (what) VALUES ('second')"_s,
-         u"CREATE TRIGGER Audited ON LINE AFTER INSERT, UPDATE AS INSERT INTO AUDIT (what) SELECT what FROM AUDIT"_s});
+    for (const QString& statement :
+         {u"CREATE TABLE AUDIT (id INT IDENTITY(1,1) PRIMARY KEY, what VARCHAR(20))"_s,
+          u"INSERT INTO AUDIT (what) VALUES ('first')"_s, u"INSERT INTO AUDIT (what) VALUES ('second')"_s,
+          u"CREATE TRIGGER Audited ON LINE AFTER INSERT, UPDATE AS INSERT INTO AUDIT (what) SELECT what FROM AUDIT"_s})
+        connection->execute(statement);
     Recordset lines = query(u"SELECT * FROM LINE"_s);
     EXPECT_EQ(added(lines, u"CODE"_s, u"A"_s), 0);
     EXPECT_EQ(lines.value(u"id"_s), QVariant(qint64(1)));

@@ -118,6 +118,7 @@ Shop::Shop() : desktop(std::in_place), root_(profile_.root())
 
 Shop::~Shop()
 {
+    db::setStatementFault({});
     desktop.reset();
     host_.reset();
     forgetSharedVariables();

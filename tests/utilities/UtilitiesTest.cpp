@@ -91,32 +91,27 @@ TEST_F(Utilities, OnlySaveStoresWhatWasTyped)
     quote("500", 1).set("AuthDate", QDate(2008, 3, 21)).remarks("one\r\ntwo\u00a0three");
     gsQTNNO = u"500"_s;
     gsSubQuote = u"0"_s;
-    const std::string typed = set("txtQRNo", "QR9") + set("txtQRVer", "3") + set("txtQuoteNo", "KQ'9") +
-                              set("txtAuthNo", "KA9") + set("txtAuthDate", "22/4/2009") + set("txtClaimNo", "ABC 123") +
-                              R"({"click": "chkReadOnly"}, {"click": "chkExtraInfo"}, )";
-    const std::string before = "||||7700001|21/03/2008|0|0|";
-    const std::string after = "QR9|3|KQ'9|KA9|ABC 123|22/04/2009|1|1|";
-    const char* const refusal = "Invalid Claim Number Entered";
-    struct {
-        std::string way, stored;
-        const char* box = "";
-    } const cases[] = {
-        {R"({"click": "Command3"}, {"click": "Command9"}, )" + save, before},
-        {R"({"click": "Command2"})", before},
+    std::string typed = R"({"click": "chkReadOnly"}, {"click": "chkExtraInfo"}, )";
+    for (const auto& [control, text] : pairsIn(u"txtQRNo=QR9 txtQRVer=3 txtQuoteNo=KQ'9 txtAuthNo=KA9 "
+                                               "txtAuthDate=22/4/2009 txtClaimNo=ABC 123"_s))
+        typed += set(control.toStdString(), text.toStdString());
+    const std::string before =
+        "KESTQRNo= KESTQRVer= KESTQuoteNo= KESTAuthNo= Claim=7700001 AuthDate=21/03/2008 ReadOnly=0 ExtraInfo=0";
+    const std::string after =
+        "KESTQRNo=QR9 KESTQRVer=3 KESTQuoteNo=KQ'9 KESTAuthNo=KA9 Claim=ABC 123 AuthDate=22/04/2009 ReadOnly=1 "
+        "ExtraInfo=1";
+    const std::string refusal = "Invalid Claim Number Entered";
+    const std::tuple<std::string, std::string, std::string> cases[] = {
+        {R"({"click": "Command3"}, {"click": "Command9"}, )" + save, before, ""},
+        {R"({"click": "Command2"})", before, ""},
         {set("txtClaimNo", "ABC") + save + ", " + readAll, before, refusal},
         {set("txtClaimNo", "-5") + save + ", " + readAll, before, refusal},
-        {save, after},
-    };
-    for (const auto& c : cases) {
-        work(typed + c.way, u"1"_s);
-        const auto row = quote("500", 1);
-        std::string stored;
-        for (const char* column :
-             {"KESTQRNo", "KESTQRVer", "KESTQuoteNo", "KESTAuthNo", "Claim", "AuthDate", "ReadOnly", "ExtraInfo"})
-            stored += row.text(column) + '|';
-        EXPECT_EQ(stored, c.stored) << c.way;
-        EXPECT_EQ(row.notes(), "one\r\ntwo\u00a0three") << c.way;
-        EXPECT_EQ(desktop->boxTexts().join(u'|').toStdString(), c.box) << c.way;
+        {save, after, ""}};
+    for (const auto& [way, stored, box] : cases) {
+        work(typed + way, u"1"_s);
+        EXPECT_TRUE(quote("500", 1).shows(stored)) << way;
+        EXPECT_EQ(quote("500", 1).notes(), "one\r\ntwo\u00a0three") << way;
+        EXPECT_EQ(desktop->boxTexts().join(u'|').toStdString(), box) << way;
     }
     ASSERT_TRUE(grsQuote && !grsQuote->eof());
     EXPECT_EQ(grsQuote->text(u"KESTQuoteNo"_s), u"HOST"_s);
