@@ -38,22 +38,6 @@ public:
     Q_DISABLE_COPY_MOVE(NoJournalTable)
 };
 
-TEST_F(JournalOfAShop, TellsWhatALoadChangedFromWhatToWhat)
-{
-    quote("500").request("QR1").set("excess", 500).note("Responded Quote Request");
-    quote("500").line(1).set("rrhour", 2);
-    quote("500").line(2, "MIS").set("unitcost", 12);
-    arrive("m.xml", authorisedQuote("500").set("excess", "400").labour(1, "C").sublet(2, "D"));
-
-    ASSERT_TRUE(loadAsTheWindow(u"m.xml"_s)) << shown();
-
-    EXPECT_EQ(operations(), u"load of m.xml: done"_s);
-    const QStringList told = changes();
-    for (const QString& change : {uR"(QUOTE1 EXCESS: "500" -> "400")"_s, uR"(QUOTE2 RRHOUR: "2" ->)"_s,
-                                  uR"(QUOTE2 UNITCOST: "12")"_s})  // the deleted line
-        EXPECT_EQ(told.filter(change).size(), 1) << told.join(u'\n');
-}
-
 TEST_F(JournalOfAShop, RecordsNothingForALoadThatChangesNothing)
 {
     quote("500").request("QR1");
