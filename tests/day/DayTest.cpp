@@ -10,8 +10,6 @@
 #include "support/MariaDbServer.h"
 #include "support/Test.h"
 
-constexpr int backgroundWait = 5000;  // milliseconds
-
 /// What a clerk would look at: quotes with their notes and lines, files, and the jobs in JobLink.
 using Holdings = QMap<QString, QString>;
 
@@ -105,10 +103,9 @@ static QMap<QString, QStringList> expectedSteps()
 /// Checks that every window and every report has a picture that is not empty.
 static void checkPictures(const QDir& pictures)
 {
-    const QStringList windows{u"comparison"_s, u"extra-information"_s, u"login"_s,        u"messages"_s,
-                              u"panel"_s,      u"sublet-document"_s,   u"text"_s,         u"transport"_s,
-                              u"utilities"_s,  u"report-1-710"_s,      u"report-1-720"_s, u"report-1-730"_s};
-    for (const QString& window : windows)
+    for (const QString& window :
+         u"comparison extra-information login messages panel sublet-document text transport "
+         "utilities report-1-710 report-1-720 report-1-730"_s.split(u' '))
         EXPECT_FALSE(pictures.entryList({u"*-"_s + window + u".png"_s}).isEmpty()) << window;
     const QString page = QString::fromUtf8(files::readBytes(pictures.filePath(u"index.html"_s)));
     EXPECT_TRUE(page.contains(u"Damage Description must be entered."_s)) << "the page shows the boxes";
@@ -139,7 +136,7 @@ TEST(Day, LeavesAfterEachStepWhatItShould)
         const desktop::Record shown = day.play(step);
         page.add(step, shown);
         QStringList lines = told(shown);
-        files::waitForBackground(backgroundWait);
+        EXPECT_TRUE(files::waitForBackground(5000));
         const Holdings after = found(server);
         if (!before.isEmpty() && !step.endsWith(u".sql"_s))
             lines << changes(before, after);

@@ -41,6 +41,29 @@ struct TakeBackOn : Databases {
         return all;
     }
 
+    using Row = std::array<QString, 6>;
+    /// Returns the rows of the table with this result.
+    static std::vector<Row> changesThat(const QString& result)
+    {
+        std::vector<Row> rows = casesIn<6>("changes.txt");
+        std::erase_if(rows, [&](const Row& row) { return row[0] != result; });
+        return rows;
+    }
+    /// Makes a change and returns what was recorded.
+    QList<db::RowChange> change(const Row& row) const
+    {
+        const auto& [result, how, statement, column, text, theirs] = row;
+        const QVariant value = text == u"Null"_s ? QVariant() : text;
+        seen->changes.clear();
+        if (how == u"execute"_s)
+            connection->execute(statement);
+        else if (Recordset rows = query(statement); how == u"remove"_s)
+            rows.remove();
+        else
+            EXPECT_EQ(how == u"add"_s ? added(rows, column, value) : written(rows, column, value), 0) << statement;
+        return seen->changes;
+    }
+
     bool takenBack(const db::RowChange& change) const
     {
         db::TakeBack back(*connection);
@@ -54,65 +77,28 @@ struct TakeBackOn : Databases {
 
 TEST_P(TakeBackOn, EveryKindOfChangeIsTakenBack)
 {
-    const auto edit = [&](const QString& select, const QString& column, const QVariant& value) {
-        Recordset rows = query(select);
-        EXPECT_EQ(written(rows, column, value), 0);
-    };
-    const auto add = [&](const QString& select, const QString& column, const QVariant& value) {
-        Recordset rows = query(select);
-        EXPECT_EQ(added(rows, column, value), 0);
-    };
-    const std::function<void()> changes[] = {
-        [&] { edit(u"SELECT * FROM LINE"_s, u"amount"_s, 0.3); },
-        [&] { edit(u"SELECT * FROM LINE"_s, u"notes"_s, QVariant()); },
-        [&] { edit(u"SELECT * FROM LINE WHERE CODE=''"_s, u"CODE"_s, QVariant()); },
-        [&] { edit(u"SELECT * FROM CAR"_s, u"REGO"_s, u"ABC2"_s); },
-        [&] { edit(u"SELECT * FROM Tints"_s, u"Script"_s, u"Blue"_s); },
-        [&] { add(u"SELECT * FROM LINE"_s, u"amount"_s, 1.1); },
-        [&] { add(u"SELECT * FROM CAR"_s, u"REGO"_s, u"XYZ"_s); },
-        [&] { add(u"SELECT * FROM Tints"_s, u"Code"_s, u"G"_s); },
-        [&] { query(u"SELECT * FROM LINE"_s).remove(); },
-        [&] { query(u"SELECT * FROM Tints"_s).remove(); },
-        [&] { connection->execute(u"DELETE FROM LINE WHERE CODE='A' OR SEQ IS NULL"_s); },
-        [&] { connection->execute(u"DELETE FROM CAR WHERE REGO='ABC1'"_s); },
-        [&] { connection->execute(u"UPDATE CAR SET REGO='N2', owner=NULL WHERE REGO='abc1'"_s); },
-    };
     const QString before = everything();
-    for (size_t i = 0; i < std::size(changes); ++i) {
-        seen->changes.clear();
-        changes[i]();
-        EXPECT_NE(everything(), before) << "case " << i;
-        const QList<db::RowChange> recorded = seen->changes;
-        for (const db::RowChange& change : recorded)
-            EXPECT_TRUE(takenBack(change)) << "case " << i;
-        EXPECT_EQ(everything(), before) << "case " << i;
+    for (const auto& row : changesThat(u"is taken back"_s)) {
+        const QList<db::RowChange> recorded = change(row);
+        EXPECT_NE(everything(), before) << row[2];
+        for (const db::RowChange& one : recorded)
+            EXPECT_TRUE(takenBack(one)) << row[2];
+        EXPECT_EQ(everything(), before) << row[2];
         EXPECT_EQ(seen->changes.size(), recorded.size()) << "it is not observed itself";
     }
-    add(u"SELECT * FROM LINE"_s, u"CODE"_s, u"last"_s);
+    Recordset lines = query(u"SELECT * FROM LINE"_s);
+    EXPECT_EQ(added(lines, u"CODE"_s, u"last"_s), 0);
     EXPECT_EQ(count(u"CODE='last'"_s), 1) << "an identity that came back does not disturb the next insert";
 }
 
 TEST_P(TakeBackOn, ARowThatSomeoneElseHasChangedSinceStays)
 {
-    const QString add;  // a row with the code "new"
-    const std::pair<QString, QString> cases[] = {
-        {u"UPDATE LINE SET amount=5 WHERE CODE='A'"_s, u"UPDATE LINE SET amount=6"_s},
-        {u"UPDATE LINE SET notes='x' WHERE CODE='A'"_s, u"UPDATE LINE SET notes='X'"_s},
-        {u"UPDATE LINE SET flag=0 WHERE CODE='A'"_s, u"DELETE FROM LINE"_s},
-        {add, u"UPDATE LINE SET SEQ=9 WHERE CODE='new'"_s},
-        {add, u"UPDATE LINE SET CODE='NEW' WHERE CODE='new'"_s},
-        {u"DELETE FROM CAR WHERE REGO='ABC1'"_s, u"INSERT INTO CAR (REGO, owner) VALUES ('abc1', 'Bob')"_s},
-    };
-    for (const auto& [change, theirs] : cases) {
-        seen->changes.clear();
-        if (Recordset lines = query(u"SELECT * FROM LINE"_s); change == add)
-            added(lines, u"CODE"_s, u"new"_s);
-        else
-            connection->execute(change);
-        elsewhere(theirs);
+    for (const auto& row : changesThat(u"stays after"_s)) {
+        const QList<db::RowChange> recorded = change(row);
+        elsewhere(row[5]);
         const QString meanwhile = everything();
-        EXPECT_FALSE(takenBack(seen->changes.front())) << theirs;
-        EXPECT_EQ(everything(), meanwhile) << theirs;
+        EXPECT_FALSE(takenBack(recorded.front())) << row[5];
+        EXPECT_EQ(everything(), meanwhile) << row[5];
     }
 }
 
