@@ -22,10 +22,14 @@
 #include <ostream>
 #include <tuple>
 
-/// Failed expectations show texts by this.
+// Failed expectations show texts by these.
 inline std::ostream& operator<<(std::ostream& out, const QString& text)
 {
     return out << text.toStdString();
+}
+inline void PrintTo(const QString& text, std::ostream* out)
+{
+    *out << '"' << text << '"';
 }
 
 using namespace Qt::StringLiterals;

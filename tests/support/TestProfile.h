@@ -2,17 +2,13 @@
 #pragma once
 
 #include "platform/profile.h"
-#include "support/MemoryFolder.h"
+#include "support/Places.h"
 
+#include <QDir>
 #include <QString>
 #include <QTemporaryDir>
 
 #include <gtest/gtest.h>
-
-#include <iosfwd>
-
-/// GoogleTest finds this by argument-dependent lookup, so that a failed expectation shows the text.
-void PrintTo(const QString& text, std::ostream* out);
 
 namespace kest::test {
 

@@ -2,7 +2,7 @@
 
 #include "platform/database/Connection.h"
 #include "setup/QuoteDatabase.h"
-#include "support/MemoryFolder.h"
+#include "support/Places.h"
 
 #include <QDeadlineTimer>
 
