@@ -151,15 +151,6 @@ TEST_F(Command, ACheckOfTheDatabaseCreatesIndexesAfterYesAndFailsForAMissingTabl
     EXPECT_EQ(failed.json[u"points"].toArray().last()[u"why"].toString(), u"there is no table SUBLET"_s);
 }
 
-TEST_F(Command, AnOpenPanelIsDrivenByAScript)
-{
-    EXPECT_EQ(kest2(u"open 1004"_s, R"json({"windows": {"frmKEST": [[{"click": "cmdExit"}]]}})json").exitCode,
-              app::Done);
-    EXPECT_EQ(kest2(u"open"_s, R"json({"windows": {"frmKEST": [[{"click": "Option1(2)"}]]}})json").exitCode,
-              app::NeedsAPerson);
-    EXPECT_EQ(kest2(u"open"_s, "{\"windows\": 5}").exitCode, app::Usage);
-}
-
 TEST_F(Command, AScriptChangesNothingThatDialogsRememberForAPerson)
 {
     qunsetenv("XDG_CONFIG_HOME");
