@@ -7,17 +7,15 @@ using db::Kind;
 struct FixedSchema final : db::Schema {
     const db::TableInfo* table(const QString& name) override
     {
-        for (const db::TableInfo* info : {&line, &car}) {
-            if (info->name.compare(name, Qt::CaseInsensitive) == 0)
-                return info;
-        }
-        return nullptr;
+        const auto found = tables.constFind(name.toUpper());
+        return found == tables.cend() ? nullptr : &*found;
     }
     QString tableSpelling(const QString& name) override { return table(name) ? table(name)->name : QString(); }
 
 private:
-    db::TableInfo line{u"LINE"_s, {{u"id"_s, Kind::WholeNumber}, {u"CODE"_s}, {u"day"_s, Kind::Date}}, {u"id"_s}};
-    db::TableInfo car{u"Car"_s, {{u"REGO"_s}, {u"CODE"_s}}, {u"REGO"_s}};
+    const QMap<QString, db::TableInfo> tables{
+        {u"LINE"_s, {u"LINE"_s, {{u"id"_s, Kind::WholeNumber}, {u"CODE"_s}, {u"day"_s, Kind::Date}}, {u"id"_s}}},
+        {u"CAR"_s, {u"Car"_s, {{u"REGO"_s}, {u"CODE"_s}}, {u"REGO"_s}}}};
 };
 
 static QString told(const std::optional<QList<db::SelectedColumn>>& columns)

@@ -16,10 +16,8 @@ struct Sublet : Shop {
     static void realDocument(const QString& name)
     {
         QPdfWriter writer(files::systemPath(u"c:\\wirdoc\\PDF\\"_s + name));
-        QPainter painter(&writer);
-        painter.drawText(2000, 2000, u"Authority for sublet work"_s);
+        const QPainter painter(&writer);
         writer.newPage();
-        painter.drawText(2000, 2000, u"Conditions"_s);
     }
     QJsonArray windows() const { return desktop->record().windows; }
 };
