@@ -8,7 +8,6 @@
 #include "platform/profile.h"
 #include "platform/script/Gestures.h"
 #include "reports/PrintXML.h"
-#include "shell/eKEST.h"
 #include "support/Hands.h"
 #include "support/ShopDatabase.h"
 #include "utilities/frmUtilities.h"
@@ -291,11 +290,6 @@ TEST_F(EveryWindow, GoesOnAfterTheServerHasDroppedTheConnection)
              click(window, "Option1(1)");
              EXPECT_EQ(control<QLabel>(window, "lblStatus").text(), u"2 messages"_s);
          }},
-        {u"frmKEST"_s,
-         [&](QDialog& window) {
-             click(window, "Option1(2)");
-             click(window, "cmdOK");
-         }},
         {u"frmPrintPreview"_s, [](QDialog&) { dropConnection(); }},
         {u"frmSubletAuth"_s,
          [&](QDialog& window) { documents = control<QTreeWidget>(window, "ListView1").topLevelItemCount(); }},
@@ -304,10 +298,6 @@ TEST_F(EveryWindow, GoesOnAfterTheServerHasDroppedTheConnection)
     PrintXML(u"501.xml"_s, true);
     EXPECT_EQ(documents, 1);
     frmMessageList::ShowForm();
-    EXPECT_EQ(shown(), "");
-    eKEST().ShowKESTWindow(u"500"_s, u"0"_s);
-    EXPECT_EQ(shown(), "[critical] The main quote has no ORLA quote number yet, this additional cannot be sent.");
-    quote("500").claim("7700001");
     gsQTNNO = u"500"_s;
     gsSubQuote = u"0"_s;
     frmUtilities::ShowForm(u"500"_s, u"0"_s);
