@@ -138,9 +138,8 @@ TEST(XmlBuilding, TheNamespaceIsDeclaredOnceAtTheRoot)
         return document.createNode(NodeType::Element, name, uri);
     };
     const Node root = element(u"request"_s, space);
-    const Node body = element(u"quoteBody"_s, space);
+    const Node body = root.appendChild(element(u"quoteBody"_s, space));
     body.appendChild(element(u"n"_s, space));  // the leaves before the root
-    root.appendChild(body);
     document.appendChild(root);
     const Node plain = body.appendChild(element(u"plain"_s, {}));
     plain.appendChild(element(u"q:back"_s, space));
