@@ -1,6 +1,6 @@
 #include "platform/database/Recordset.h"
 
-#include "platform/database/RecordsetData.h"
+#include "platform/database/RecordsetWriter.h"
 #include "platform/values.h"
 
 #include <algorithm>
@@ -97,6 +97,32 @@ const Index& Recordset::Data::indexOf(int column)
             index[*key].push_back(row);
     }
     return *indexes.insert(column, index);
+}
+
+void Recordset::Data::beginChange()
+{
+    const int current = row();
+    if (pending != Pending::None)
+        return;
+    pending = Pending::Change;
+    original.assign(&at(current, 0), &at(current, 0) + columns.size());
+    assigned.assign(size_t(columns.size()), false);
+}
+
+void Recordset::Data::forgetChange()
+{
+    pending = Pending::None;
+    original.clear();
+    assigned.clear();
+}
+
+void Recordset::Data::dropCurrentRow()
+{
+    const int dropped = row();
+    for (int column = 0; column < columns.size(); ++column)
+        store(dropped, column, {});
+    rows.erase(std::lower_bound(rows.begin(), rows.end(), dropped));
+    visible.erase(visible.begin() + position);
 }
 
 /// Changes a value and updates the indexes. All changes are made here.
@@ -345,6 +371,50 @@ Kind Recordset::kind(const QString& column) const
 int Recordset::size(const QString& column) const
 {
     return data->columns[data->columnNumber(column)].size;
+}
+
+void Recordset::addNew()
+{
+    update();
+    data->requireOpen();
+    const int row = data->columns.isEmpty() ? 0 : int(data->values.size()) / int(data->columns.size());
+    data->values.resize(data->values.size() + size_t(data->columns.size()));
+    data->rows.push_back(row);
+    data->visible.push_back(row);
+    data->position = int(data->visible.size()) - 1;
+    data->beginChange();
+    data->pending = Data::Pending::Insert;
+}
+
+void Recordset::update()
+{
+    if (data->pending == Data::Pending::None)
+        return;
+    if (!data->declared)
+        Data::Writer(*data).write();
+    data->forgetChange();
+}
+
+void Recordset::cancelUpdate()
+{
+    if (data->pending == Data::Pending::Insert) {
+        data->dropCurrentRow();
+    } else if (data->pending == Data::Pending::Change) {
+        for (int column = 0; column < data->columns.size(); ++column)
+            data->store(data->row(), column, data->original[size_t(column)]);
+    }
+    data->forgetChange();
+}
+
+void Recordset::remove()
+{
+    data->row();  // throws if there is none
+    if (data->pending == Data::Pending::Insert)
+        return cancelUpdate();
+    if (!data->declared)
+        Data::Writer(*data).remove();
+    data->forgetChange();
+    data->dropCurrentRow();
 }
 
 }  // namespace kest::db

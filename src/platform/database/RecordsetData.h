@@ -1,8 +1,7 @@
-// The data of a recordset, shared by the files that read rows and that write changes.
+// The data of a recordset, shared by the recordset and its writer.
 #pragma once
 
 #include "platform/RuntimeError.h"
-#include "platform/database/Change.h"
 #include "platform/database/Criterion.h"
 #include "platform/database/Recordset.h"
 #include "platform/database/Session.h"
@@ -98,17 +97,7 @@ struct Recordset::Data {
     void forgetChange();
     void dropCurrentRow();
 
-    QStringList changedTables();
-    bool isChanged(int column);
-    QString keyCondition(const TableInfo& table);
-    int resultColumn(const QString& table, const QString& column) const;
-    QList<int> uncomparedTexts(const TableInfo& table);
-    void checkTexts(const TableInfo& table, const QString& key, const QList<int>& texts);
-    void writeChange(const QString& table);
-    void writeInsert(const QString& table);
-    RowChange rowChange(const TableInfo& table, ChangeKind kind, const QStringList& wanted);
-    void readBack(const TableInfo& table, const QVariant& identity);
-    QString insertedRow(const TableInfo& table);
+    class Writer;
 };
 
 }  // namespace kest::db
