@@ -170,35 +170,6 @@ TEST_F(Loopback, RulesWithAFaultStopEverythingUntilTheyAreMended)
     EXPECT_EQ(faults(), "");
 }
 
-TEST_F(Loopback, TheSameSeedSendsTheSameWhateverComesBetween)
-{
-    ASSERT_TRUE(send());
-    const QByteArray document = files::readBytes(gsUnsentPath + u"1004.0_1.xml"_s);
-    const auto run = [&](const QString& seed, bool restarting) {
-        QMap<QString, QByteArray> sent;
-        rules(seed +
-              u"\non start\n  request pictures=1\non quote 1004 claim=1\n"
-              "  adjust change=2 add=2\n  authorise change=1 sublet=1\n"_s);
-        files::writeBytes(gsUnsentPath + u"1004.0_1.xml"_s, document);
-        for (int i = 0; i < 5; ++i) {
-            if (restarting || i == 0)
-                restart();
-            carried();
-            for (const QString& file : files::list(gsUnreadPath)) {
-                sent[file] = files::readBytes(gsUnreadPath + file);
-                files::remove(gsUnreadPath + file);
-            }
-        }
-        files::remove(gsSentPath + u"1004.0_1.xml"_s);
-        files::remove(folders().own + app::Transport::stateName);
-        return sent;
-    };
-    const auto once = run(u"seed 20551"_s, false);
-    EXPECT_EQ(once.size(), 6);
-    EXPECT_EQ(run(u"seed 20551"_s, true), once);
-    EXPECT_NE(run(u"seed 20552"_s, false), once);
-}
-
 TEST_F(Loopback, TheWindowShowsWhatIsCarried)
 {
     desktop.emplace(R"({"windows":{"KESTWeb":[[{"click":"carryButton"}, {"read":["carriedList","status"]},
