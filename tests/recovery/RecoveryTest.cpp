@@ -1,14 +1,9 @@
-// Work that loses its connection at any statement ends, once it is settled and repeated, as if nothing had happened. A
-// whole operation is taken back, except for what others use or have changed.
-#include "base/History.h"
-#include "base/Journal.h"
+// Work that loses its connection at any statement ends, once it is settled and repeated, as if nothing had happened.
 #include "inbound/modLoadXML.h"
 #include "messagelist/frmMessageList.h"
 #include "messages/Folders.h"
-#include "outbound/Sending.h"
 #include "platform/RuntimeError.h"
-#include "recovery/Recovery.h"
-#include "recovery/TakeBack.h"
+#include "recovery/Interrupted.h"
 #include "support/Hands.h"
 
 #include <QLabel>
@@ -16,92 +11,6 @@
 namespace kest::test {
 
 using namespace Qt::StringLiterals;
-
-namespace {
-
-struct Interrupted : Sending {
-    Interrupted()
-    {
-        quote("500").request("QR1").quoteNumber("KQ1").stage(3).set("excess", 500).note("Responded Quote Request");
-        quote("500").line(1).set("rrhour", 2);
-        quote("500").line(2, "PRT").set("qty", 1).set("rrhour", 80);
-        quote("500").line(4, "MIS").set("unitcost", 12);
-        quote("500").remarks("O'Brien \\ says\r\nso", "p_remarks");
-        quote("500", 1).quoteNumber("KQ2").line(1);
-        recovery::takeSettled();
-    }
-    ~Interrupted() override { db::setStatementFault({}); }
-
-    /// Runs work whose connection is lost at that statement, and opens another one. Returns false if the work has fewer
-    /// statements.
-    template <class Work>
-    static bool interrupt(int number, Work&& work)
-    {
-        int statement = 0;
-        db::setStatementFault([&] { return ++statement == number; }, CannotOpen);
-        attempt(work);
-        db::setStatementFault({});
-        EXPECT_TRUE(EnsureConnection());  // settles what it finds
-        recovery::settle();
-        return statement >= number;
-    }
-
-    static void loadIfItWaits()
-    {
-        const bool waits = files::exists(gsUnreadPath + u"m.xml"_s);
-        EXPECT_TRUE(!waits || loadAsTheWindow(u"m.xml"_s));
-    }
-
-    /// All data, without the numbers of rows, which the database gives again only to the last.
-    static std::string numberless()
-    {
-        static const QRegularExpression number(u"\\b(rec_id|CUST_ID|VENDOR|VENDOR_ID)=\\d+"_s);
-        return QString::fromStdString(holdings()).replace(number, u"\\1=*"_s).toStdString();
-    }
-
-    /// Interrupts work at each of its statements and repeats it. All must be as after undisturbed work. `prepare` is
-    /// what comes before the work.
-    void interruptEachStatement(
-        const std::function<void()>& work, const std::function<void()>& again,
-        const std::function<void()>& prepare = [] {})
-    {
-        const Snapshot before;
-        prepare();
-        work();
-        again();
-        const std::string expected = numberless();
-        for (int number = 1;; ++number) {
-            before.restore();
-            EnsureConnection();
-            recovery::takeSettled();
-            prepare();
-            const bool isInterrupted = interrupt(number, work);
-            for (const recovery::Settled& settled : recovery::takeSettled())
-                outcomes.insert(recovery::wordOf(settled.outcome));
-            again();
-            EXPECT_EQ(difference(expected, numberless()), "\n") << "statement " << number;
-            EXPECT_EQ(rowCount("KESTOperation", "State='open'"), 0) << "statement " << number;
-            if (!isInterrupted)
-                break;
-        }
-        before.restore();
-        EnsureConnection();
-    }
-
-    QSet<QString> outcomes;
-    const QSet<QString> both{u"taken back"_s, u"finished"_s};
-
-    static db::ConnectionPtr anotherConnection()
-    {
-        auto connection = std::make_shared<db::Connection>();
-        connection->open(connectionText(driverNumber()));
-        return connection;
-    }
-
-    static Row newest() { return Row("KESTOperation", "Operation=(SELECT MAX(Operation) FROM KESTOperation)"); }
-};
-
-}  // namespace
 
 TEST_F(Interrupted, ALoadHappensOnce)
 {
@@ -177,43 +86,19 @@ TEST_F(Interrupted, ASendIsNotFinishedOverItsAnswer)
 
 TEST_F(Interrupted, TheUserIsToldWhatBecameOfIt)
 {
-    const auto operation = [](int id, const char* kind, const char* file, const char* quote, bool pastPoint) {
-        gConn->execute(sql(
-            "INSERT INTO KESTOperation (Operation, OperationKind, State, FileName, QTNNO, Subquote, LockName, "
-            "StartedAt, PastPoint, Facts) VALUES ({}, '{}', 'open', '{}', '{}', '0', 'x', "
-            "'2026-11-23T10:31:00', {}, '{}')",
-            id, QString::fromLatin1(kind), QString::fromLatin1(file), QString::fromLatin1(quote), pastPoint, u"{}"_s));
-    };
-    operation(11, "load", "AUQT_1007.xml", "1007", false);
-    operation(12, "load", "AUQT_1007.xml", "1007", true);
-    operation(13, "send", "", "1007", false);
-    operation(14, "save", "", "1007", false);
-    operation(15, "response", "R_1_0.xml", "1", true);
-    operation(16, "load", "m.xml", "500", false);
-    gConn->execute(
-        sql("INSERT INTO KESTJournal (Operation, TableName, Settled, RowData) VALUES (16, 'QUOTE1', 0, '{}')",
-            uR"({"change":1,"columns":[["QTNNO",0,"777","777"],["Claim",0,"1","2"]],"key":["QTNNO"],)"
-            R"("table":"QUOTE1"})"_s));
-    recovery::settle();
-    QStringList told;
-    for (const recovery::Settled& settled : recovery::takeSettled())
-        told += recovery::wordOf(settled.outcome) + u": "_s + settled.sentence();
-    const QString at = u" was interrupted on 23/11/2026 at 10:31. "_s;
-    EXPECT_EQ(
-        told,
-        (QStringList{
-            u"left: The load of m.xml"_s + at +
-                u"Not all of it could be taken back; check the quote 500. The row of QUOTE1 with QTNNO 777 "
-                "was changed by someone else and stays as it is."_s,
-            u"taken back: The save in the utilities"_s + at + u"It has been taken back."_s,
-            u"taken back: The load of AUQT_1007.xml"_s + at + u"It has been taken back; load the message again."_s,
-            u"finished: The load of AUQT_1007.xml"_s + at +
-                u"It has been finished. Its message has been removed or changed since, so it was not moved."_s,
-            u"taken back: The send of quote 1007"_s + at + u"The quote was not sent; send it again."_s,
-            u"finished: The response R_1_0.xml"_s + at + u"It has been finished."_s,
-        }));
-    recovery::settle();
-    EXPECT_TRUE(recovery::takeSettled().isEmpty());
+    const QDateTime started(QDate(2026, 11, 23), QTime(10, 31));
+    for (const auto& [kind, file, number, outcome, sentence] : casesIn<5>("recovery/sentences.txt")) {
+        recovery::Settled settled;
+        settled.operation.kind = kind;
+        settled.operation.file = file;
+        settled.operation.number = number;
+        settled.operation.started = started;
+        for (const recovery::Outcome any :
+             {recovery::Outcome::TakenBack, recovery::Outcome::Finished, recovery::Outcome::Left})
+            if (recovery::wordOf(any) == outcome)
+                settled.outcome = any;
+        EXPECT_EQ(settled.sentence(), sentence);
+    }
 }
 
 TEST_F(Interrupted, TheListTellsWhatWasSettledBesideItsMessages)
@@ -467,98 +352,6 @@ TEST_F(Interrupted, AWindowThatLostItsSessionGoesOnIfNobodySettledItsWork)
     }
     EXPECT_EQ(quote("500").text("Claim"), "C9");
     EXPECT_EQ(newest().text("State"), "done");
-}
-
-// --- Taking a whole load back ---
-
-struct TakeBackOfALoad : Interrupted {
-    /// Loads a message and returns the load's operation.
-    static qint64 loaded(const Message& message)
-    {
-        files::write(gsUnreadPath + u"m.xml"_s, message.text());
-        EXPECT_TRUE(loadAsTheWindow(u"m.xml"_s));
-        return toLong(opened(u"SELECT MAX(Operation) AS newest FROM KESTOperation"_s).value(u"newest"_s));
-    }
-
-    /// All rows, without the files.
-    static std::string rows()
-    {
-        QStringList lines = QString::fromStdString(holdings()).split(u'\n');
-        lines.removeIf([](const QString& line) { return line.startsWith(u'/'); });
-        return lines.join(u'\n').toStdString();
-    }
-};
-
-TEST_F(TakeBackOfALoad, LeavesAllRowsAsTheyWere)
-{
-    desktop.emplace(R"({"boxes": [{"text": "want to continue", "answer": "yes"}]})");
-    vendor("Straightline Alignment");  // a new one would stay
-    const std::string before = rows();
-    for (const Message& message :
-         {authorisedQuote("500").set("excess", "400").labour(1, "C").part(2, "D").paint(3, "I").sublet(4, "C"),
-          manualQuote("500").labour(1, "I").part(2, "I"), cancellation("QR1"), excessWaiver("500"),
-          assessmentResult("KQ1"), quoteDeletion("KQ1"), quoteDeletion("KQ2")}) {
-        const qint64 operation = loaded(message);
-        EXPECT_NE(rows(), before);
-        EXPECT_EQ(recovery::obstaclesTo(operation), QStringList());
-        EXPECT_EQ(recovery::takeBack(operation), QStringList());
-        EXPECT_EQ(difference(before, rows()), "\n");
-    }
-}
-
-TEST_F(TakeBackOfALoad, KeepsWhatOtherLoadsMayUse)
-{
-    const qint64 operation = loaded(quoteRequest("QR9").rego("NEW001"));
-    const int counter = Row("CINFO", "1=1").value("QUOTE_VAL").toInt();
-    EXPECT_EQ(recovery::takeBack(operation), QStringList());
-    EXPECT_EQ(rowCount("QUOTE1", "KESTQRNo='QR9'") + rowCount("QUOTE3", "QTNNO NOT IN ('500')"), 0);
-    EXPECT_EQ(rowCount("CAR", "REGO='NEW001'"), 1);
-    EXPECT_EQ(rowCount("CUSTOMER", "CUST_ID IN (SELECT CUST_ID FROM CAR WHERE REGO='NEW001')"), 1);
-    EXPECT_EQ(Row("CINFO", "1=1").value("QUOTE_VAL").toInt(), counter);
-}
-
-TEST_F(TakeBackOfALoad, LeavesARowThatSomeoneElseHasChangedWhole)
-{
-    // the load writes the line twice; of neither write anything may go
-    const qint64 operation =
-        loaded(authorisedQuote("500").set("excess", "400").labour(1, "C").paint(3, "I").part(2, "D"));
-    quote("500").line(3).set("script", "by the host");
-    quote("500").line(1).set("rrhour", 77);
-    const std::string itemNumber = quote("500").line(3).text("itemno");
-
-    const QStringList left = recovery::obstaclesTo(operation);
-    EXPECT_EQ(left.filter(u"The row of QUOTE2 with "_s).filter(u"changed by someone else and stays as it is."_s).size(),
-              2);
-    EXPECT_EQ(recovery::takeBack(operation), left);
-    EXPECT_TRUE(quote("500").line(3).shows("category=PAINT script=by the host"));
-    EXPECT_EQ(quote("500").line(3).text("itemno"), itemNumber);
-    EXPECT_EQ(quote("500").line(1).number("rrhour"), 77);
-    EXPECT_TRUE(quote("500").line(2).shows("category=PRT rrhour=80")) << "the deleted line is back";
-    EXPECT_EQ(quote("500").state(), "3 open KQ1 (01/02/2008 : Responded Quote Request)");
-    EXPECT_EQ(quote("500").number("excess"), 500);
-}
-
-TEST_F(TakeBackOfALoad, LeavesANewQuoteThatSomeoneElseWorksOn)
-{
-    const std::function<void(const QString&)> uses[] = {
-        [](const QString& number) { quote(number).line(9); },
-        [](const QString& number) {
-            addRow("QUOTE3", {{"QTNNO", number}, {"Subquote", 0}});
-        },
-        [](const QString& number) {
-            addRow("DEBTOR", {{"QTNNO", number}});
-        },
-    };
-    int request = 0;
-    for (const auto& use : uses) {
-        const qint64 operation = loaded(quoteRequest(u"QR9%1"_s.arg(++request)));
-        const QString number = journal::entryOf(operation).number;
-        use(number);
-        const QStringList told{u"Quote %1/0 has lines, notes or an invoice from elsewhere and stays."_s.arg(number)};
-        EXPECT_EQ(recovery::obstaclesTo(operation), told);
-        EXPECT_EQ(recovery::takeBack(operation), told);
-        EXPECT_NE(quote(number).notes(), "") << "with its notes, or nobody could send it";
-    }
 }
 
 }  // namespace kest::test
