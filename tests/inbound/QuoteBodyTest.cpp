@@ -173,12 +173,6 @@ TEST_F(QuoteBody, ADocumentThatCannotBeStoredFailsTheBody)
     EXPECT_TRUE(documents().isEmpty());
 }
 
-TEST_F(QuoteBody, ADocumentMayBeThirtyMegabytesLong)
-{
-    EXPECT_TRUE(apply(withDocument(1, "I", QString(30 * 1024 * 1024, u'A'))));
-    EXPECT_EQ(files::size(subletFolder() + u"500.0_1.pdf"_s), 30 * 1024 * 1024 / 4 * 3);
-}
-
 TEST_F(QuoteBody, ItemNumbersComeFromThePoolOfTheCategory)
 {
     for (const auto& [category, size, first, last] : casesIn<4>("inbound/item-numbers.txt")) {
