@@ -155,6 +155,8 @@ TEST_F(Preview, ALayoutWithoutRoomIsAFailureThatIsTold)
         EXPECT_FALSE(files::exists(pdf));
     }
     EXPECT_EQ(print(("<table>" + row + "</table>").repeated(30)), 0) << "only tables within tables have a limit";
+    EXPECT_EQ(print("<table><TD class=a ColSpan = '100'>x</table>"), TypeMismatch);
+    EXPECT_EQ(print("<table><tr><td colspan=\"99\" rowspan=1>colspan=100</td></tr></table>"), 0);
     QPdfWriter label(pdf);
     label.setPageSize(QPageSize(QSizeF(62, 29), QPageSize::Millimeter));
     label.setPageMargins(QMarginsF(3, 3, 3, 3), QPageLayout::Millimeter);

@@ -13,6 +13,7 @@
 #include <QGuiApplication>
 #include <QPainter>
 #include <QPdfWriter>
+#include <QRegularExpression>
 #include <QScreen>
 #include <QTextBlock>
 #include <QTextTable>
@@ -58,7 +59,17 @@ protected:
     }
 };
 
-/// Throws TypeMismatch if tables contain each other too deeply. Each level doubles the time of the layout.
+/// Throws TypeMismatch if a cell spans more than 99 columns or rows. The layout would have to fill them all.
+void checkSpans(QStringView tag)
+{
+    static const QRegularExpression tooWide(u"\\b(?:col|row)span\\s*+=\\s*+[\"']?+(?!\\d{1,2}(?:[\"'\\s/]|$))"_s,
+                                            QRegularExpression::CaseInsensitiveOption);
+    if (tooWide.match(tag).hasMatch())
+        throw RuntimeError(TypeMismatch, u"A cell of the report spans too many columns or rows"_s);
+}
+
+/// Throws TypeMismatch if tables contain each other too deeply, which doubles the time of the layout for each level, or
+/// if a cell spans too much.
 void checkTables(const QString& html)
 {
     int depth = 0;
@@ -68,6 +79,8 @@ void checkTables(const QString& html)
             ++depth;
         else if (tag.startsWith("/table"_L1, Qt::CaseInsensitive))
             depth = std::max(0, depth - 1);
+        else if (tag.startsWith("td"_L1, Qt::CaseInsensitive) || tag.startsWith("th"_L1, Qt::CaseInsensitive))
+            checkSpans(tag.first(tag.contains(u'>') ? tag.indexOf(u'>') : tag.size()));
         if (depth > deepestTable)
             throw RuntimeError(TypeMismatch, u"The tables of the report contain each other too deeply"_s);
     }
