@@ -74,17 +74,43 @@ bool takeLock(int seconds)
     return work->lock->isHeld();
 }
 
-/// A lost connection has lost the lock, too, so that another workstation may have settled the work.
+/// Takes the lock of a lost connection again.
+void takeLockAgain()
+{
+    const QString lostSession = work->serverSession;
+    attempt([&] { gConn->endSession(lostSession, work->lockName); });  // or the server does so later
+    if (takeLock(sessionEnd))
+        return;
+    work->serverSession = lostSession;
+    throw RuntimeError(RowChanged, u"The connection was lost, and the lock of this work is not free yet."_s);
+}
+
+/// Returns false if another workstation has settled the work, or has begun to take it back. Otherwise notes what that
+/// workstation has done, and the session that has the lock now.
+bool isStillOpen()
+{
+    const db::Recordset row =
+        opened(sql("SELECT State, Facts FROM KESTOperation WHERE Operation={} AND Operation NOT IN (SELECT Operation "
+                   "FROM KESTJournal WHERE Operation={} AND Settled=1)",
+                   work->id, work->id));
+    if (row.eof() || row.text(u"State"_s) != wordOf(work->state))
+        return false;
+    const QJsonObject stored = QJsonDocument::fromJson(row.text(u"Facts"_s).toUtf8()).object();
+    for (auto fact = stored.begin(); fact != stored.end(); ++fact)  // not all, because storing the last may have failed
+        work->facts[fact.key()] = fact.value();
+    if (!work->serverSession.isEmpty())
+        gConn->execute(
+            sql("UPDATE KESTOperation SET ServerSession='{}' WHERE Operation={}", work->serverSession, work->id));
+    return true;
+}
+
+/// A lost connection has lost the lock, too, so that another workstation may have settled the work. A question that
+/// fails is asked again at the next change.
 void requireOwner()
 {
     if (!work->isLost && gConn->generation() != work->generation) {
-        attempt([] { gConn->endSession(work->serverSession, work->lockName); });  // or the server does so later
-        if (!takeLock(sessionEnd))
-            throw RuntimeError(RowChanged, u"The connection was lost, and the lock of this work is not free yet."_s);
-        const db::Recordset row = opened(sql("SELECT State, Facts FROM KESTOperation WHERE Operation={}", work->id));
-        work->isLost = row.eof() || row.text(u"State"_s) != wordOf(work->state);
-        if (!work->isLost)
-            work->facts = QJsonDocument::fromJson(row.text(u"Facts"_s).toUtf8()).object();
+        takeLockAgain();
+        work->isLost = !isStillOpen();
         work->generation = gConn->generation();
     }
     if (work->isLost)

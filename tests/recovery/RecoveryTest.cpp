@@ -321,22 +321,35 @@ TEST_F(Interrupted, WorkOfALivingOwnerIsLeftAlone)
 TEST_F(Interrupted, AWindowThatLostItsSessionChangesNothingOnceOthersSettledItsWork)
 {
     const db::ConnectionPtr owner = anotherConnection();
-    for (const bool isSettled : {false, true}) {
-        const std::string claim = quote("500").text("Claim");
+    const struct {
+        const char* done;  // by another workstation; null if it only has the lock
+        const char* told;
+        const char* stateAfter;
+    } cases[] = {
+        {nullptr, "not free yet", "done"},
+        {"UPDATE KESTOperation SET State='taken back' WHERE State='open'", "has settled it", "taken back"},
+        {"UPDATE KESTJournal SET Settled=1", "has settled it", "open"},
+    };
+    for (const auto& [done, told, stateAfter] : cases) {
+        quote("500").claim("C1");
         journal::Operation operation(journal::Kind::Save);
         gConn->execute(u"UPDATE QUOTE1 SET TOTAL=5 WHERE QTNNO='500'"_s);
+        journal::keep(u"newName"_s, u"x"_s);
         dropConnection();
         ASSERT_TRUE(EnsureConnection());
         std::unique_ptr<db::Lock> settling;
-        if (isSettled)
-            owner->execute(u"UPDATE KESTOperation SET State='taken back' WHERE State='open'"_s);
+        if (done)
+            owner->execute(QString::fromLatin1(done));
         else
             settling = std::make_unique<db::Lock>(owner, journal::entryOf(newest().id()).lock);
-        EXPECT_EQ(failureOf([] { gConn->execute(u"UPDATE QUOTE1 SET Claim='C9' WHERE QTNNO='500'"_s); }), RowChanged);
+        const auto change = [] { gConn->execute(u"UPDATE QUOTE1 SET Claim='C9' WHERE QTNNO='500'"_s); };
+        EXPECT_TRUE(failure(change).description().contains(QString::fromLatin1(told))) << told;
         EXPECT_EQ(failureOf([] { journal::keep(u"newName"_s, u"x"_s); }), RowChanged);
+        EXPECT_EQ(quote("500").text("Claim"), "C1");
+        settling.reset();
+        EXPECT_EQ(failureOf(change), done ? RowChanged : 0) << "once the lock is free, it goes on";
         operation.end(journal::State::Done);
-        EXPECT_EQ(quote("500").text("Claim"), claim);
-        EXPECT_EQ(newest().text("State"), isSettled ? "taken back" : "open");
+        EXPECT_EQ(newest().text("State"), stateAfter);
     }
 }
 
@@ -345,9 +358,13 @@ TEST_F(Interrupted, AWindowThatLostItsSessionGoesOnIfNobodySettledItsWork)
     {
         journal::Operation operation(journal::Kind::Save);
         gConn->execute(u"UPDATE QUOTE1 SET TOTAL=5 WHERE QTNNO='500'"_s);
-        dropConnection();
+        db::setStatementFault([] { return true; }, CannotOpen);
+        EXPECT_EQ(failureOf([] { journal::keep(u"job"_s, 7); }), CannotOpen);
+        db::setStatementFault({});
         ASSERT_TRUE(EnsureConnection());
         gConn->execute(u"UPDATE QUOTE1 SET Claim='C9' WHERE QTNNO='500'"_s);
+        EXPECT_EQ(journal::kept(u"job"_s).toInt(), 7);
+        EXPECT_EQ(journal::entryOf(newest().id()).serverSession, gConn->serverSession());
         operation.end(journal::State::Done);
     }
     EXPECT_EQ(quote("500").text("Claim"), "C9");
