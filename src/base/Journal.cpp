@@ -21,6 +21,7 @@
 #include <QUuid>
 
 #include <array>
+#include <exception>
 #include <optional>
 #include <utility>
 
@@ -53,6 +54,7 @@ struct Work {
     bool isCommitted = false;           // with that change
     State state = State::Open;
     bool isPointAhead = false;  // the next change is the last
+    bool isPointPassed = false;
     QJsonObject facts;
 };
 
@@ -257,7 +259,8 @@ void Recorder::committed()
 {
     work->isCommitted = true;
     work->isNumberNew = false;
-    work->isPointAhead = false;  // it was this change
+    if (std::exchange(work->isPointAhead, false))
+        work->isPointPassed = true;  // with this change
 }
 
 /// The operation's own row has gone with its first change.
@@ -422,10 +425,14 @@ Operation::Operation(Entry& entry, int patience)
 
 Operation::~Operation()
 {
-    if (!isResumed)
-        end(State::Failed);
-    else if (isOutermost)
+    if (!isOutermost)
+        return;
+    // an unattended command that stops at a window has not failed: the rest is done later
+    const bool isToFinish = work && work->isPointPassed && std::uncaught_exceptions() > 0;
+    if (isResumed || isToFinish)
         work.reset();
+    else
+        end(State::Failed);
 }
 
 void Operation::end(State state)
@@ -457,6 +464,7 @@ void passPoint(const std::function<void()>& lastUpdate, const QJsonObject& facts
         return;
     requireOwner();  // the last update has changed nothing, so that nothing was recorded
     markPoint();
+    work->isPointPassed = true;
 }
 
 void keep(const QString& fact, const QJsonValue& value)

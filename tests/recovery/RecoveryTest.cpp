@@ -371,4 +371,14 @@ TEST_F(Interrupted, AWindowThatLostItsSessionGoesOnIfNobodySettledItsWork)
     EXPECT_EQ(newest().text("State"), "done");
 }
 
+TEST_F(Interrupted, ALoadThatStopsAtItsReportIsFinished)
+{
+    putTemplate(710);
+    arrive("m.xml", quoteRequest("QR9"));
+    desktop.emplace(R"({"windows": {"frmPrintPreview": [[{"click": "nothing"}]]}})");  // ends an unattended command
+    EXPECT_ANY_THROW(loadAsTheWindow(u"m.xml"_s));
+    recovery::settle();
+    EXPECT_EQ(newest().text("State"), "finished");
+}
+
 }  // namespace kest::test
