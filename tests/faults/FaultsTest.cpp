@@ -5,6 +5,7 @@
 #include "jobexport/WriteQuote.h"
 #include "messages/Folders.h"
 #include "outbound/SendQuote.h"
+#include "quotedata/QuoteTotals.h"
 #include "reports/PrintXML.h"
 #include "support/MariaDbServer.h"
 #include "utilities/frmLogin.h"
@@ -138,11 +139,16 @@ TEST_F(Others, Send)
     for (const char* name : {"500_0001.jpg", "500_0002.jpg"})
         files::write(gsImagesPath + QLatin1StringView(name), QLatin1StringView(name));
     quote("500").request("QR1").note("Active Quote Request").line(1).set("rr_rate2", 50.255).set("rrhour", 2);
-    survives(u"Send"_s, {[] {
-                             if (openHostQuote(u"500"_s, u"0"_s))
-                                 SendQuote(*grsQuote);
-                         },
-                         [] { return quote("500").locked(); }});
+    const Work send{[] {
+                        if (openHostQuote(u"500"_s, u"0"_s))
+                            SendQuote(*grsQuote);
+                    },
+                    [] { return quote("500").locked(); }};
+    survives(u"Send"_s, send);
+    car("ABC123").set("Year", "1998");  // with right totals, the car's row is the first that changes
+    openHostQuote(u"500"_s, u"0"_s);
+    RoundQuoteLines(*grsQuote);
+    survives(u"SendThatBeginsWithTheCar"_s, send);
 }
 
 TEST_F(Others, SaveInTheUtilities)
