@@ -1,9 +1,14 @@
 #include "sublets/frmViewPDF.h"
 
+#include "base/QuoteKey.h"
 #include "platform/Prompt.h"
+#include "platform/RuntimeError.h"
+#include "platform/TrialRun.h"
+#include "platform/Waiting.h"
 #include "platform/desktop/Colours.h"
 #include "platform/desktop/PageTools.h"
 #include "platform/desktop/Progress.h"
+#include "platform/desktop/SaveDialog.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/files.h"
 #include "platform/print/PrinterDialog.h"
@@ -13,6 +18,7 @@
 #include <QPdfPageNavigator>
 #include <QPdfView>
 #include <QPrinter>
+#include <QRegularExpression>
 #include <QScreen>
 #include <QScrollBar>
 
@@ -29,7 +35,8 @@ constexpr double smallestZoom = 0.1;
 constexpr double largestZoom = 8;
 constexpr int printResolution = 300;  // dots per inch
 constexpr double pointsPerInch = 72;
-constexpr int rightMargin = 150;  // twips
+constexpr int rightMargin = 150;      // twips
+constexpr int longestReading = 5000;  // milliseconds
 
 QString whyNotOpened(QPdfDocument::Error error)
 {
@@ -46,15 +53,43 @@ QString whyNotOpened(QPdfDocument::Error error)
     }
 }
 
+/// Returns true if the library can read the document and all its pages. Some damaged documents keep it busy for ever.
+bool isReadable(const QString& systemPath)
+{
+    bool isRead = false;
+    patiently(u"Opening the document..."_s, [&] {
+        isRead = endsInTime(
+            [&] {
+                QPdfDocument document;
+                document.load(systemPath);
+                for (int page = 0; page < document.pageCount(); ++page)
+                    document.pagePointSize(page);
+            },
+            longestReading);
+    });
+    return isRead;
+}
+
+/// Returns a name for a copy of a sublet document that says what it is.
+QString nameOfCopy(const QString& fileName)
+{
+    static const QRegularExpression ofLine(u"^(.+\\.\\d+)_(\\d+)$"_s);
+    const QRegularExpressionMatch match = ofLine.match(fileName);
+    const QString quote = match.captured(1);
+    const QuoteKey key{quote.section(u'.', 0, -2), quote.section(u'.', -1)};
+    return match.hasMatch() ? u"Sublet authority %1 line %2"_s.arg(key.reference(), match.captured(2)) : fileName;
+}
+
 }  // namespace
 
-frmViewPDF::frmViewPDF(QPdfDocument& document, const QString& caption)
-    : Form(u"frmViewPDF"_s, caption),
+frmViewPDF::frmViewPDF(QPdfDocument& document, const QString& fileName)
+    : Form(u"frmViewPDF"_s, fileName.section(u'\\', -1)),
       pdf(document),
+      path(fileName),
       AcroPDF1(new QPdfView(this)),
       tools(new desktop::PageTools(this, u"frmViewPDF"_s,
                                    {.print = [this] { print(); },
-                                    .save = {},
+                                    .save = [this] { save(); },
                                     .goTo = [this](int page) { goTo(page - 1); },
                                     .enlarge = [this] { zoom(zoomStep); },
                                     .reduce = [this] { zoom(1 / zoomStep); },
@@ -80,15 +115,18 @@ frmViewPDF::frmViewPDF(QPdfDocument& document, const QString& caption)
 
 void frmViewPDF::ShowForm(const QString& fileName)
 {
+    const auto refuse = [&](const QString& why) {
+        desktop::msgBox(u"The document %1 can't be shown: %2."_s.arg(fileName, why), desktop::Icon::Critical);
+    };
+    const QString systemPath = files::systemPath(fileName);
+    if (!isReadable(systemPath))
+        return refuse(u"it is damaged, so that reading it does not end"_s);
     QPdfDocument document;
-    const QPdfDocument::Error error = document.load(files::systemPath(fileName));
-    if (error != QPdfDocument::Error::None) {
-        desktop::msgBox(u"The document %1 can't be shown: %2."_s.arg(fileName, whyNotOpened(error)),
-                        desktop::Icon::Critical);
-        return;
-    }
+    const QPdfDocument::Error error = document.load(systemPath);
+    if (error != QPdfDocument::Error::None)
+        return refuse(whyNotOpened(error));
     desktop::recordWindow({{u"name"_s, u"frmViewPDF"_s}, {u"file"_s, fileName}});
-    frmViewPDF form(document, fileName.section(u'\\', -1));
+    frmViewPDF form(document, fileName);
     desktop::showModal(form);
 }
 
@@ -125,6 +163,19 @@ void frmViewPDF::zoom(double factor)
     AcroPDF1->setZoomMode(QPdfView::ZoomMode::Custom);
     AcroPDF1->setZoomFactor(next);
     bar->setValue(qRound(middle * next / now - bar->pageStep() / 2.0));  // keep the middle of the view in place
+}
+
+void frmViewPDF::save()
+{
+    const QString target = desktop::askForPdf(this, nameOfCopy(windowTitle().section(u'.', 0, -2)));
+    if (target.isEmpty())
+        return;
+    try {
+        files::writeBytes(target, files::readBytes(path));
+    } catch (const RuntimeError& error) {
+        desktop::msgBox(u"The document can't be saved as %1: %2"_s.arg(target, error.description()),
+                        desktop::Icon::Critical);
+    }
 }
 
 void frmViewPDF::print()

@@ -1,4 +1,5 @@
 // Tests sublet documents: which belong to a quote, how they are listed, and a file that is not a PDF.
+#include "platform/script/Gestures.h"
 #include "sublets/SubletDocuments.h"
 #include "sublets/frmSubletAuth.h"
 #include "sublets/frmViewPDF.h"
@@ -6,6 +7,8 @@
 #include "support/Shop.h"
 
 #include <QPdfDocument>
+
+namespace gestures = desktop::gestures;
 
 struct Sublet : Shop {
     static void document(const char* name, const QByteArray& content = "%PDF-1.4")
@@ -71,6 +74,53 @@ TEST_F(Sublet, OpenShowsTheChosenDocument)
 
     frmViewPDF::ShowForm(u"c:\\wirdoc\\PDF\\gone.pdf"_s);
     EXPECT_EQ(shown(), "[critical] The document c:\\wirdoc\\PDF\\gone.pdf can't be shown: the file does not exist.");
+}
+
+TEST_F(Sublet, ADocumentThatContainsItselfIsRefused)
+{
+    const QByteArray file = files::readBytes(checkoutFile(u"tests/corpus/sublets/pages-circle.pdf"_s));
+    document("500.0_1.pdf", file.sliced(file.indexOf('\n') + 1));
+    frmViewPDF::ShowForm(u"c:\\wirdoc\\PDF\\500.0_1.pdf"_s);
+    EXPECT_EQ(shown(),
+              "[critical] The document c:\\wirdoc\\PDF\\500.0_1.pdf can't be shown: it is damaged, so that "
+              "reading it does not end.");
+    EXPECT_EQ(windows().size(), 0);
+}
+
+TEST_F(Sublet, ASavedCopyIsNamedByItsQuoteAndLine)
+{
+    realDocument(u"500.2_7.pdf"_s);
+    const QString copy = root() + u"/copy.pdf"_s;
+    QString offered;
+    const test::Hands hands({{u"frmViewPDF"_s, [](QDialog& window) { gestures::press(window, Qt::CTRL | Qt::Key_S); }},
+                             {u"SaveDialog"_s, [&](QDialog& dialog) {
+                                  auto& files = static_cast<QFileDialog&>(dialog);
+                                  offered = files.selectedFiles().first();
+                                  dialog.hide();  // while it is shown, the field that has the focus keeps its text
+                                  files.selectFile(copy);
+                                  dialog.setResult(QDialog::Accepted);
+                              }}});
+    frmViewPDF::ShowForm(u"c:\\wirdoc\\PDF\\500.2_7.pdf"_s);
+    EXPECT_TRUE(offered.endsWith(u"/Sublet authority 500-2 line 7.pdf"_s)) << offered;
+    EXPECT_EQ(files::readBytes(copy), files::readBytes(u"c:\\wirdoc\\PDF\\500.2_7.pdf"_s));
+}
+
+TEST_F(Sublet, PageKeysTurnThePagesWhereverTheFocusIs)
+{
+    realDocument(u"500.0_1.pdf"_s);
+    const test::Hands hands({{u"frmViewPDF"_s, [](QDialog& window) {
+                                  auto& page = test::control<QLabel>(window, "lblPage");
+                                  for (const char* focused : {"cmdPrint", "AcroPDF1"}) {
+                                      test::control<QWidget>(window, focused).setFocus();
+                                      for (int presses = 0; presses < 20 && page.text() != u"Page 2 of 2"_s; ++presses)
+                                          gestures::press(window, Qt::Key_PageDown);
+                                      EXPECT_EQ(page.text(), u"Page 2 of 2"_s) << focused;
+                                      for (int presses = 0; presses < 20 && page.text() != u"Page 1 of 2"_s; ++presses)
+                                          gestures::press(window, Qt::Key_PageUp);
+                                      EXPECT_EQ(page.text(), u"Page 1 of 2"_s) << focused;
+                                  }
+                              }}});
+    frmViewPDF::ShowForm(u"c:\\wirdoc\\PDF\\500.0_1.pdf"_s);
 }
 
 TEST_F(Sublet, APrintTakesThePagesThatWereChosen)

@@ -47,8 +47,8 @@ Preview::Preview(QWidget* parent, const std::function<void()>& print)
     auto* all = new QVBoxLayout(this);
     all->setContentsMargins({});
     all->setSpacing(0);
-    all->addWidget(tools);
     all->addWidget(view, 1);
+    all->addWidget(tools);
 
     view->setViewMode(QPrintPreviewWidget::SinglePageView);
     view->setZoomMode(QPrintPreviewWidget::FitToWidth);
