@@ -147,6 +147,13 @@ TEST_F(EveryWindow, HasTextsAndRowsThatCanBeCopied)
         }
         if (isA<QMessageBox>(window)) {
             EXPECT_TRUE(copied(window).startsWith(window.windowTitle() + u'\n'));
+            window.findChild<QLabel*>(u"qt_msgbox_label"_s)->setSelection(0, 7);
+            EXPECT_EQ(copied(window), u"Are you"_s);
+        } else if (auto* field = window.findChild<QLineEdit*>(); qobject_cast<QInputDialog*>(&window)) {
+            EXPECT_TRUE(copied(window).startsWith(window.windowTitle() + u'\n'));
+            field->setText(u"1007"_s);
+            field->selectAll();
+            EXPECT_EQ(copied(window), u"1007"_s);
         }
         if (window.objectName().startsWith("frm"_L1) || !window.findChildren<QTreeView*>().isEmpty())
             return;

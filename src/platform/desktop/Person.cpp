@@ -9,9 +9,13 @@
 #include <QApplication>
 #include <QClipboard>
 #include <QInputDialog>
+#include <QKeyEvent>
 #include <QLabel>
+#include <QLineEdit>
 #include <QMessageBox>
 #include <QShortcut>
+
+#include <algorithm>
 
 namespace kest::desktop {
 
@@ -54,14 +58,40 @@ public:
     void start(const QString& path) override { startDetached(path); }
 };
 
+/// Lets a field without a selection leave Ctrl+C to its window.
+class EmptyCopy final : public QObject {
+public:
+    explicit EmptyCopy(QLineEdit& lineEdit) : QObject(&lineEdit), field(lineEdit) { field.installEventFilter(this); }
+
+protected:
+    bool eventFilter(QObject* watched, QEvent* event) override
+    {
+        if (event->type() != QEvent::ShortcutOverride || field.hasSelectedText() ||
+            !static_cast<QKeyEvent*>(event)->matches(QKeySequence::Copy))
+            return QObject::eventFilter(watched, event);
+        event->ignore();
+        return true;
+    }
+
+private:
+    QLineEdit& field;
+};
+
 /// Lets the user select and copy the texts of a box. Without a selection, Ctrl+C copies the whole box.
 void makeCopyable(QDialog& window, const QString& text)
 {
-    for (QLabel* label : window.findChildren<QLabel*>())
+    const QList<QLabel*> labels = window.findChildren<QLabel*>();
+    for (QLabel* label : labels)
         if (!label->text().isEmpty())
             label->setTextInteractionFlags(Qt::TextSelectableByMouse);
-    QObject::connect(new QShortcut(QKeySequence::Copy, &window), &QShortcut::activated, &window,
-                     [&window, text] { QGuiApplication::clipboard()->setText(window.windowTitle() + u'\n' + text); });
+    for (QLineEdit* field : window.findChildren<QLineEdit*>())
+        new EmptyCopy(*field);
+    QObject::connect(
+        new QShortcut(QKeySequence::Copy, &window), &QShortcut::activated, &window, [&window, labels, text] {
+            const auto chosen = std::ranges::find_if(labels, &QLabel::hasSelectedText);
+            QGuiApplication::clipboard()->setText(chosen != labels.end() ? (*chosen)->selectedText()
+                                                                         : window.windowTitle() + u'\n' + text);
+        });
 }
 
 /// Runs the box, and repaints what was below it: a long operation that follows would leave it on the screen.
