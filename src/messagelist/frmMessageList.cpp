@@ -188,8 +188,9 @@ void frmMessageList::fill()
     choose(0);
     for (const recovery::Settled& operation : recovery::takeSettled())
         settled.append(operation.sentence());
-    lblStatus->tell((settled + QStringList(status())).join(u' '));
-    cmdHeld->setText(u"%1 held back (F4)"_s.arg(heldBack.size()));
+    const QString held = u"%1 held back (F4)"_s.arg(heldBack.size());
+    lblStatus->tell((settled + QStringList(status())).join(u' '), heldBack.isEmpty() ? QString() : held);
+    cmdHeld->setText(held);
     cmdHeld->setShortcut(Qt::Key_F4);  // a new text takes the key away
     cmdHeld->setVisible(!heldBack.isEmpty());
 }

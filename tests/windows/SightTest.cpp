@@ -1,5 +1,6 @@
 // Tests what a person sees on a dark desktop and by the keyboard's focus, and what its status line announces.
 #include "platform/desktop/Colours.h"
+#include "platform/desktop/PageTools.h"
 #include "platform/desktop/StatusLine.h"
 #include "platform/script/Gestures.h"
 #include "support/Hands.h"
@@ -114,7 +115,7 @@ TEST_F(EveryWindow, OffersButtonsAndCopyInTheMenuOfItsList)
 
 TEST_F(EveryWindow, AnnouncesWhatItsStatusLineSays)
 {
-    each([](QDialog& window) {
+    each([&](QDialog& window) {
         QStringList announced;
         for (desktop::StatusLine* line : window.findChildren<desktop::StatusLine*>()) {
             QObject::connect(line, &desktop::StatusLine::told, &window, [&announced, line](const QString& text) {
@@ -131,6 +132,16 @@ TEST_F(EveryWindow, AnnouncesWhatItsStatusLineSays)
         if (window.objectName() == "frmMessageList"_L1) {
             control<QLineEdit>(window, "txtFind").setText(u"nothing like it"_s);
             EXPECT_TRUE(announced.value(0).startsWith(u"0 of "_s)) << announced.join(u'|');
+            announced.clear();
+            arrive("d.xml", cancellation("QR2"));
+            gestures::press(window, Qt::Key_F5);
+            EXPECT_TRUE(control<QToolButton>(window, "cmdHeld").isHidden() ||
+                        announced.last().endsWith(u", 2 held back (F4)"_s))
+                << announced.join(u'|');
+        } else if (auto* tools = window.findChild<desktop::PageTools*>()) {
+            tools->showPage(1, 2);
+            tools->showPage(1, 2);
+            EXPECT_EQ(announced, QStringList(u"Page 1 of 2"_s));
         } else if (window.objectName() == "frmViewXML"_L1) {
             control<QLineEdit>(window, "txtFind").setText(u"nothing like it"_s);
             gestures::press(window, Qt::Key_F3);

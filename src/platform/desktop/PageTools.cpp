@@ -1,10 +1,10 @@
 #include "platform/desktop/PageTools.h"
 
+#include "platform/desktop/StatusLine.h"
 #include "platform/desktop/Window.h"
 
 #include <QAbstractScrollArea>
 #include <QHBoxLayout>
-#include <QLabel>
 #include <QScrollBar>
 #include <QShortcut>
 #include <QToolButton>
@@ -14,7 +14,7 @@ namespace kest::desktop {
 using namespace Qt::StringLiterals;
 
 PageTools::PageTools(QWidget* parent, const QString& window, const PageActions& actions)
-    : QWidget(parent), source(window), lblPage(new QLabel)
+    : QWidget(parent), source(window), lblPage(new StatusLine(u"lblPage"_s))
 {
     auto* row = new QHBoxLayout(this);
     row->setContentsMargins({});
@@ -35,7 +35,6 @@ PageTools::PageTools(QWidget* parent, const QString& window, const PageActions& 
     for (const auto& [key, direction] : {std::pair(Qt::Key_PageUp, -1), {Qt::Key_PageDown, 1}})
         onEvent(new QShortcut(key, this), &QShortcut::activated, this, source + u".View_Scroll"_s,
                 [=, this, direction = direction] { scroll(actions, direction); });
-    lblPage->setObjectName(u"lblPage"_s);
     lblPage->setContentsMargins({pixels(90), 0, pixels(90), 0});
     lblPage->setMinimumWidth(lblPage->fontMetrics().horizontalAdvance(u"Page 88 of 88"_s) + pixels(180));
     row->addWidget(lblPage);
@@ -79,7 +78,7 @@ void PageTools::showPage(int page, int pages)
 {
     current = page;
     count = pages;
-    lblPage->setText(u"Page %1 of %2"_s.arg(page).arg(pages));
+    lblPage->tell(u"Page %1 of %2"_s.arg(page).arg(pages));
     for (QToolButton* button : std::as_const(back))
         button->setEnabled(page > 1);
     for (QToolButton* button : std::as_const(forward))

@@ -7,10 +7,11 @@
 #include <functional>
 
 class QAbstractScrollArea;
-class QLabel;
 class QToolButton;
 
 namespace kest::desktop {
+
+class StatusLine;
 
 /// What the buttons do. A function that is left out has no button.
 struct PageActions {
@@ -43,7 +44,7 @@ private:
     QString source;
     QList<QToolButton*> back;
     QList<QToolButton*> forward;
-    QLabel* lblPage;
+    StatusLine* lblPage;
     int current = 1;
     int count = 1;
 };

@@ -12,7 +12,7 @@ public:
 
     QString text(QAccessible::Text kind) const override
     {
-        return kind == QAccessible::Name ? static_cast<QLabel*>(widget())->text() : QAccessibleWidget::text(kind);
+        return kind == QAccessible::Name ? static_cast<StatusLine*>(widget())->spoken() : QAccessibleWidget::text(kind);
     }
 };
 
@@ -31,14 +31,15 @@ StatusLine::StatusLine(const QString& name)
     setTextFormat(Qt::PlainText);
 }
 
-void StatusLine::tell(const QString& text)
+void StatusLine::tell(const QString& text, const QString& beside)
 {
-    if (text == this->text())
+    if (text == this->text() && beside == besideIt)
         return;
     setText(text);
+    besideIt = beside;
     QAccessibleEvent event(this, QAccessible::Alert);
     QAccessible::updateAccessibility(&event);
-    emit told(text);
+    emit told(spoken());
 }
 
 }  // namespace kest::desktop
