@@ -121,7 +121,7 @@ void frmExtraInfo::build()
     Command1->installEventFilter(this);
     lvColour->installEventFilter(this);
 
-    QAction* drop = txtColour->addAction(desktop::dropArrow(palette()), QLineEdit::TrailingPosition);
+    QAction* drop = txtColour->addAction(desktop::dropArrow(), QLineEdit::TrailingPosition);
     drop->setToolTip(u"Show the colours (F4, Alt+Down)"_s);
     drop->setShortcut(Qt::Key_F4);
     drop->setShortcutContext(Qt::WidgetShortcut);

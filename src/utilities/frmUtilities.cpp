@@ -14,6 +14,7 @@
 #include "utilities/ExactTextEdit.h"
 #include "utilities/StatusRepair.h"
 
+#include <QApplication>
 #include <QCheckBox>
 #include <QGridLayout>
 #include <QGroupBox>
@@ -91,6 +92,7 @@ frmUtilities::frmUtilities(const QuoteKey& key, frmHistory::Undo undo)
     layout->addWidget(quoteInformation(), 1);
     layout->addWidget(setQuoteStatus());
     layout->addWidget(closingButtons());
+    chooseColours();
     box("txtQRNo"_L1)->setFocus();
 }
 
@@ -104,12 +106,7 @@ QWidget* frmUtilities::quoteInformation()
         auto* text = new QLineEdit;
         text->setObjectName(field.name);
         text->setMinimumWidth(desktop::pixels(2400));
-        if (!field.editable) {
-            text->setReadOnly(true);
-            QPalette colours = text->palette();
-            colours.setColor(QPalette::Base, colours.color(QPalette::Window));
-            text->setPalette(colours);
-        }
+        text->setReadOnly(!field.editable);
         const int column = place % 2 * 2;
         grid->addWidget(labelOf(text, field.label), place / 2, column);
         grid->addWidget(text, place / 2, column + 1);
@@ -162,6 +159,18 @@ QPushButton* frmUtilities::button(const QString& name, const QString& caption, v
         EnsureConnection();
         (this->*click)();
     });
+}
+
+// Fields that can't be changed look like their window.
+void frmUtilities::chooseColours()
+{
+    for (const Field& field : fields) {
+        if (field.editable)
+            continue;
+        QPalette colours = QApplication::palette(box(field.name));
+        colours.setColor(QPalette::Base, colours.color(QPalette::Window));
+        box(field.name)->setPalette(colours);
+    }
 }
 
 QLineEdit* frmUtilities::box(QLatin1StringView name) const

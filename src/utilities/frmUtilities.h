@@ -25,6 +25,9 @@ public:
     /// `undoLoad` is for the button "Undo" of the history.
     static void ShowForm(const QString& sQTNNO, const QString& sSubQuote, const frmHistory::Undo& undoLoad = {});
 
+protected:
+    void chooseColours() override;
+
 private:
     frmUtilities(const QuoteKey& key, frmHistory::Undo undo);
     QWidget* quoteInformation();

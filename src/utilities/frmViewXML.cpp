@@ -148,6 +148,12 @@ void frmViewXML::resizeEvent(QResizeEvent* event)
     place(findBar, margin, formHeight - 1125, formWidth - 1830 - 2 * margin, buttonHeight);
 }
 
+void frmViewXML::chooseColours()
+{
+    coloured = {};
+    colourVisibleTags();
+}
+
 void frmViewXML::closeEvent(QCloseEvent* event)
 {
     const bool typed = !unchanged || txtXML->document()->isModified();

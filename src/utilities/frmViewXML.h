@@ -29,6 +29,7 @@ public:
 protected:
     bool eventFilter(QObject* watched, QEvent* event) override;
     void resizeEvent(QResizeEvent* event) override;
+    void chooseColours() override;
     void closeEvent(QCloseEvent* event) override;
 
 private:

@@ -45,7 +45,32 @@ static double pictureContrast(const QAbstractButton& button)
     return best;
 }
 
-TEST_F(EveryWindow, CanBeReadOnDarkAndOnStarkDesktops)
+static void expectReadable(const QDialog& window)
+{
+    const bool isSystems = !window.objectName().startsWith("frm"_L1);
+    for (const QWidget* widget : visible<QWidget>(window)) {
+        if (!widget->isEnabled() ||
+            !isA<QLabel, QAbstractButton, QLineEdit, QComboBox, QTreeView, QPlainTextEdit>(*widget))
+            continue;
+        EXPECT_GE(textContrast(*widget), readableText) << nameOf(*widget);
+        const auto* button = qobject_cast<const QAbstractButton*>(widget);
+        if (button && !button->icon().isNull() && !isSystems) {
+            EXPECT_GE(pictureContrast(*button), visiblePicture) << nameOf(*widget);
+        }
+    }
+}
+
+/// Changes the colours of the desktop, and tells it as an application does that runs.
+static void setDesktop(const QPalette& colours)
+{
+    QApplication::setPalette(colours);
+    for (QWidget* widget : QApplication::allWidgets()) {
+        QEvent change(QEvent::ApplicationPaletteChange);
+        QCoreApplication::sendEvent(widget, &change);
+    }
+}
+
+TEST_F(EveryWindow, CanBeReadOnDarkAndOnStarkDesktopsAndAfterAChange)
 {
     const QPalette usual = QApplication::palette();
     QPalette stark(Qt::black, Qt::black);
@@ -54,19 +79,14 @@ TEST_F(EveryWindow, CanBeReadOnDarkAndOnStarkDesktops)
     for (const QPalette& colours : {usual, QPalette(QColor(53, 53, 53), QColor(35, 35, 35)), stark}) {
         QApplication::setPalette(colours);
         SCOPED_TRACE(colours.color(QPalette::Window).name());
-        each([](QDialog& window) {
+        each([&](QDialog& window) {
             gestures::settle();
-            const bool isSystems = !window.objectName().startsWith("frm"_L1);
-            for (const QWidget* widget : visible<QWidget>(window)) {
-                if (!widget->isEnabled() ||
-                    !isA<QLabel, QAbstractButton, QLineEdit, QComboBox, QTreeView, QPlainTextEdit>(*widget))
-                    continue;
-                EXPECT_GE(textContrast(*widget), readableText) << nameOf(*widget);
-                const auto* button = qobject_cast<const QAbstractButton*>(widget);
-                if (button && !button->icon().isNull() && !isSystems) {
-                    EXPECT_GE(pictureContrast(*button), visiblePicture) << nameOf(*widget);
-                }
-            }
+            expectReadable(window);
+            setDesktop(colours == usual ? stark : usual);
+            SCOPED_TRACE("after a change");
+            gestures::settle();
+            expectReadable(window);
+            setDesktop(colours);
         });
     }
     QApplication::setPalette(usual);

@@ -5,6 +5,7 @@
 #include "platform/desktop/Window.h"
 
 #include <QApplication>
+#include <QIconEngine>
 #include <QKeyEvent>
 #include <QLayout>
 #include <QPainter>
@@ -21,26 +22,53 @@ std::function<QString()> aboutText;
 
 constexpr int pictureSize = 24;  // pixels
 
-/// Draws lines in the colour of the text, so that they are visible on light and dark desktops.
-QIcon drawn(const QPalette& palette, const QList<QPolygonF>& lines)
-{
-    constexpr qreal sharpness = 2;
-    QPixmap picture(QSize(pictureSize, pictureSize) * sharpness);
-    picture.setDevicePixelRatio(sharpness);
-    picture.fill(Qt::transparent);
-    QPainter painter(&picture);
-    painter.setRenderHint(QPainter::Antialiasing);
-    painter.setPen(QPen(palette.color(QPalette::ButtonText), 2, Qt::SolidLine, Qt::RoundCap, Qt::RoundJoin));
-    for (const QPolygonF& line : lines)
-        painter.drawPolyline(line);
-    return picture;
-}
+/// A picture that is drawn in the colours that the desktop has now.
+class DrawnIcon final : public QIconEngine {
+public:
+    using Drawing = void (*)(QPainter& painter);
+
+    explicit DrawnIcon(Drawing picture) : drawing(picture) {}
+
+    void paint(QPainter* painter, const QRect& place, QIcon::Mode, QIcon::State) override
+    {
+        painter->save();
+        painter->translate(place.topLeft());
+        painter->scale(place.width() / qreal(pictureSize), place.height() / qreal(pictureSize));
+        drawing(*painter);
+        painter->restore();
+    }
+    QPixmap pixmap(const QSize& size, QIcon::Mode mode, QIcon::State state) override
+    {
+        QPixmap picture(size);
+        picture.fill(Qt::transparent);
+        QPainter painter(&picture);
+        paint(&painter, picture.rect(), mode, state);
+        return picture;
+    }
+    QIconEngine* clone() const override { return new DrawnIcon(drawing); }
+
+private:
+    Drawing drawing;
+};
 
 /// Draws a door with an arrow that leads out.
-QIcon exitPicture(const QPalette& palette)
+void drawExit(QPainter& painter)
 {
-    return drawn(palette, {QPolygonF({{13, 7}, {13, 3}, {3, 3}, {3, 21}, {13, 21}, {13, 17}}),
-                           QPolygonF(QList<QPointF>{{8, 12}, {21, 12}}), QPolygonF({{17, 8}, {21, 12}, {17, 16}})});
+    painter.setRenderHint(QPainter::Antialiasing);
+    const QColor colour = QApplication::palette().color(QPalette::ButtonText);
+    painter.setPen(QPen(colour, 2, Qt::SolidLine, Qt::RoundCap, Qt::RoundJoin));
+    painter.drawPolyline(QPolygonF({{13, 7}, {13, 3}, {3, 3}, {3, 21}, {13, 21}, {13, 17}}));
+    painter.drawLine(8, 12, 21, 12);
+    painter.drawPolyline(QPolygonF({{17, 8}, {21, 12}, {17, 16}}));
+}
+
+void drawArrow(QPainter& painter)
+{
+    QStyleOption arrow;
+    arrow.rect = QRect(0, 0, pictureSize, pictureSize);
+    arrow.palette = QApplication::palette();
+    arrow.state = QStyle::State_Enabled;
+    QApplication::style()->drawPrimitive(QStyle::PE_IndicatorArrowDown, &arrow, &painter);
 }
 
 bool isPlainEnter(const QKeyEvent& key)
@@ -63,6 +91,13 @@ void Form::showEvent(QShowEvent* event)
         button->setAutoDefault(false);
     setAttribute(Qt::WA_KeyboardFocusChange);  // otherwise the focus is invisible until the first Tab
     QDialog::showEvent(event);
+}
+
+void Form::changeEvent(QEvent* event)
+{
+    QDialog::changeEvent(event);
+    if (event->type() == QEvent::PaletteChange)
+        chooseColours();
 }
 
 QPushButton* Form::button(const QString& name, const QString& caption, const std::function<void()>& click)
@@ -103,27 +138,16 @@ void showAbout()
     msgBox(aboutText ? aboutText() : u"KEST2 " KEST_VERSION ""_s, Icon::Information, u"About KEST2"_s);
 }
 
-QIcon dropArrow(const QPalette& palette)
+QIcon dropArrow()
 {
-    constexpr qreal sharpness = 2;
-    const int size = QApplication::style()->pixelMetric(QStyle::PM_SmallIconSize);  // as in a QLineEdit, so not shrunk
-    QPixmap picture(QSize(size, size) * sharpness);
-    picture.setDevicePixelRatio(sharpness);
-    picture.fill(Qt::transparent);
-    QPainter painter(&picture);
-    QStyleOption arrow;
-    arrow.rect = QRect(0, 0, size, size);
-    arrow.palette = palette;
-    arrow.state = QStyle::State_Enabled;
-    QApplication::style()->drawPrimitive(QStyle::PE_IndicatorArrowDown, &arrow, &painter);
-    return picture;
+    return QIcon(new DrawnIcon(drawArrow));
 }
 
 QPushButton* exitButton(QWidget* parent, const QString& name, const QString& tip)
 {
     auto* button = new QPushButton(parent);
     button->setObjectName(name);
-    button->setIcon(exitPicture(button->palette()));
+    button->setIcon(QIcon(new DrawnIcon(drawExit)));
     button->setIconSize({pictureSize, pictureSize});
     button->setToolTip(tip);
     button->setAccessibleName(tip);

@@ -24,6 +24,10 @@ public:
 protected:
     void keyPressEvent(QKeyEvent* event) override;
     void showEvent(QShowEvent* event) override;
+    void changeEvent(QEvent* event) override;
+
+    /// Sets the colours that the window has chosen itself again, after the desktop has changed its own.
+    virtual void chooseColours() {}
 
     /// Fits the window to its layout, so that it can't be stretched.
     void fixSize();
@@ -47,6 +51,6 @@ void showAbout();
 QPushButton* exitButton(QWidget* parent, const QString& name, const QString& tip = QStringLiteral("Close"));
 
 /// Returns the arrow of a combo box, as the style draws it.
-QIcon dropArrow(const QPalette& palette);
+QIcon dropArrow();
 
 }  // namespace kest::desktop
