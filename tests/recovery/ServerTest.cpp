@@ -4,6 +4,7 @@
 #include "base/modLoggerEx.h"
 #include "platform/files/Lock.h"
 #include "recovery/Recovery.h"
+#include "setup/HostTables.h"
 #include "support/MariaDbServer.h"
 #include "support/Shop.h"
 
@@ -14,7 +15,11 @@ using namespace Qt::StringLiterals;
 namespace {
 
 struct RecoveryOnAServer : Shop {
-    RecoveryOnAServer() { administrator->open(mariaDb().connectionText(gsDatabase)); }
+    RecoveryOnAServer()
+    {
+        const bool isSqlServer = app::serverOf(gConn) == app::Server::SqlServer;
+        administrator->open(isSqlServer ? connectionText(driverNumber()) : mariaDb().connectionText(gsDatabase));
+    }
 
     /// Loads a message on a new connection, which finds the tables and rights as they are now.
     void loadAnew()

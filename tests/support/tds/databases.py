@@ -144,6 +144,7 @@ class Database:
         add("like", 2, is_like)
         for function in (as_number, as_bit, as_datetime, as_datetime2, as_code_page):
             add(function.__name__, 1, functools.partial(failing(function), self))
+        add("STR_POSITION", 2, lambda text, part: key_of(text).find(key_of(part)) + 1)  # CHARINDEX
         add("OBJECT_ID", -1, lambda name, *_: self.object_id(name))
         add("OBJECT_NAME", 1, lambda number: self.object_of(number)[0])
         add("OBJECT_SCHEMA_NAME", 1, lambda number: self.object_of(number)[1])

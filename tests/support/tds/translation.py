@@ -124,6 +124,10 @@ class Translator:
             self.convert_assigned(verb, table)
         self.convert_compared()
         self.join_texts()
+        for function in self.tree.find_all(exp.Anonymous):
+            if function.name.upper() == "LEFT":  # the name of a join in SQLite
+                function.set("this", "SUBSTR")
+                function.expressions.insert(1, exp.Literal.number(1))
         return Plan(self.tree.sql("sqlite").replace("CURRENT_TIMESTAMP()", "CURRENT_TIMESTAMP"), verb, table, columns)
 
     def take(self, table):
