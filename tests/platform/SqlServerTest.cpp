@@ -102,6 +102,12 @@ TEST_P(SqlServer, AFailureMeansWhatItsNumberMeansOnThisServer)
     }
 }
 
+TEST_P(SqlServer, ALockThatTheServerRefusesIsNotTakenForSomebodyElses)
+{
+    connection->session().engine().run(u"EXEC standin_refuse_locks"_s);
+    EXPECT_EQ(failure([&] { const db::Lock lock(connection, u"a"_s); }).number(), StatementFailed);
+}
+
 TEST_P(SqlServer, OrdinaryWorkGivesNoStatementUp)
 {
     const auto attentions = [&] {

@@ -65,9 +65,12 @@ public:
                 "@LockOwner='Session', @LockTimeout=%2; SELECT @r"_s.arg(resource(name))
                     .arg(seconds * 1000),
                 seconds + lockSeconds);
+        constexpr int timedOut = -1;
         const QVariant result = lastValue(answer);
-        if (result.isNull() || result.toInt() < 0)
+        if (result == QVariant(timedOut))
             return false;
+        if (result.isNull() || result.toInt() < 0)
+            throw RuntimeError(StatementFailed, u"The server refuses the lock (%1)."_s.arg(result.toString()));
         locks.insert(name);
         return true;
     }

@@ -74,7 +74,7 @@ class Session:
         self.identity = self.scope_identity = None
         self.row_count, self.variables = 0, {}
         self.identity_insert = None  # the table whose identities an INSERT must give
-        self.attentions = 0
+        self.attentions, self.refuses_locks = 0, False
         self.database.lite.create_function("SCOPE_IDENTITY", 0, lambda: self.scope_identity)
         self.database.lite.create_function("SPID", 0, lambda: self.number)
         self.database.lite.execute("PRAGMA busy_timeout=30000")
@@ -196,6 +196,8 @@ class Session:
     def get_lock(self, arguments):
         if arguments.get("lockowner") != "Session" or arguments.get("lockmode") != "Exclusive":
             raise ServerError(40510, "The stand-in knows exclusive locks of sessions only.")
+        if self.refuses_locks:
+            return -999
         seconds = arguments.get("locktimeout", self.lock_timeout) / 1000
         result = locks.get((self.database.name, arguments["resource"]), self, seconds, self.interrupted)
         return None if result == -2 else result
@@ -217,6 +219,10 @@ class Session:
     def count_attentions(self, _):
         """How often the client has given up a statement."""
         return self.attentions
+
+    def refuse_locks(self, _):
+        self.refuses_locks = True
+        return 0
 
     def fail(self, arguments):
         """As if the last statement had failed with that number."""
@@ -299,7 +305,8 @@ class Session:
              "COMMIT": transaction, "ROLLBACK": transaction, "CREATE": define, "ALTER": define,
              "DROP": define, "DISABLE": define, "KILL": kill}
     PROCEDURES = {"sp_getapplock": get_lock, "sp_releaseapplock": release_lock, "standin_silence": fall_silent,
-                  "standin_copy": copy_database, "standin_fail": fail, "standin_attentions": count_attentions}
+                  "standin_copy": copy_database, "standin_fail": fail, "standin_attentions": count_attentions,
+                  "standin_refuse_locks": refuse_locks}
 
 
 def joined(parts):
