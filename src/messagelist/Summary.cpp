@@ -89,7 +89,8 @@ Precedence precedenceOf(const xml::Document& message, QList<ListedMessage>& list
         result.isHeld = isNamed && gdicQuoteRequests.contains(request) && message.textOf(u"messageType"_s) != "MANQ"_L1;
         if (!isNamed || result.isHeld)
             return;
-        const auto displaced = std::ranges::find(listed, result.earlier, &ListedMessage::file);
+        const auto displaced =
+            result.earlier.isEmpty() ? listed.end() : std::ranges::find(listed, result.earlier, &ListedMessage::file);
         if (displaced != listed.end()) {
             result.displacedType = displaced->row[0];
             listed.erase(displaced);

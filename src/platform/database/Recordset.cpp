@@ -74,7 +74,7 @@ bool Recordset::Data::isShown(int row)
 {
     return std::all_of(filter.cbegin(), filter.cend(), [&](const Criterion& criterion) {
         const int column = columnNumber(criterion.column);
-        return criterion.matches(at(row, column), columns[column].kind);
+        return criterion.matches(at(row, column), columns.at(column).kind);
     });
 }
 
@@ -93,7 +93,7 @@ const Index& Recordset::Data::indexOf(int column)
     Index index;
     index.reserve(qsizetype(rows.size()));
     for (const int row : rows) {
-        if (const auto key = equalityKey(at(row, column), columns[column].kind))
+        if (const auto key = equalityKey(at(row, column), columns.at(column).kind))
             index[*key].push_back(row);
     }
     return *indexes.insert(column, index);
@@ -131,7 +131,7 @@ void Recordset::Data::store(int row, int column, const QVariant& value)
     QVariant& held = at(row, column);
     const auto index = indexes.find(column);
     if (index != indexes.end()) {
-        const Kind kind = columns[column].kind;
+        const Kind kind = columns.at(column).kind;
         if (const auto key = equalityKey(held, kind)) {
             Bucket& bucket = (*index)[*key];
             const auto place = std::lower_bound(bucket.begin(), bucket.end(), row);
@@ -285,7 +285,7 @@ void Recordset::find(const QString& column, const QVariant& value)
     update();
     data->requireOpen();
     const int number = data->columnNumber(column);
-    data->findKey(number, equalityKey(value, data->columns[number].kind));
+    data->findKey(number, equalityKey(value, data->columns.at(number).kind));
 }
 
 void Recordset::find(const QString& text)
@@ -297,7 +297,7 @@ void Recordset::find(const QString& text)
         throw RuntimeError(StatementFailed, u"A search takes one condition: "_s + text);
     const Criterion& criterion = criteria.first();
     const int column = data->columnNumber(criterion.column);
-    const Kind kind = data->columns[column].kind;
+    const Kind kind = data->columns.at(column).kind;
     if (criterion.comparison == Criterion::Comparison::Equal && criterion.operand)
         return data->findKey(column, equalityKey(*criterion.operand, kind));
     const std::vector<int>& visible = data->visible;
@@ -338,7 +338,7 @@ void Recordset::set(const QString& name, const QVariant& value)
 {
     const int row = data->row();
     const int column = data->columnNumber(name);
-    const ResultColumn& described = data->columns[column];
+    const ResultColumn& described = data->columns.at(column);
     if (!data->declared && described.table.isEmpty())
         throw RuntimeError(StatementFailed, u"The column "_s + name + u" can't be changed."_s);
     const QVariant stored = converted(value, described.kind, data->declared ? described.size : 0);
@@ -365,12 +365,12 @@ bool Recordset::hasColumn(const QString& column) const
 
 Kind Recordset::kind(const QString& column) const
 {
-    return data->columns[data->columnNumber(column)].kind;
+    return data->columns.at(data->columnNumber(column)).kind;
 }
 
 int Recordset::size(const QString& column) const
 {
-    return data->columns[data->columnNumber(column)].size;
+    return data->columns.at(data->columnNumber(column)).size;
 }
 
 void Recordset::addNew()

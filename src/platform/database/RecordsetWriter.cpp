@@ -78,8 +78,8 @@ QStringList Recordset::Data::Writer::changedTables()
 {
     QStringList tables;
     for (int column = 0; column < data.columns.size(); ++column) {
-        if (isChanged(column) && !tables.contains(data.columns[column].table))
-            tables.append(data.columns[column].table);
+        if (isChanged(column) && !tables.contains(data.columns.at(column).table))
+            tables.append(data.columns.at(column).table);
     }
     return tables;
 }
@@ -87,13 +87,13 @@ QStringList Recordset::Data::Writer::changedTables()
 int Recordset::Data::Writer::resultColumn(const QString& table, const QString& name) const
 {
     for (int i = 0; i < data.columns.size(); ++i) {
-        if (data.columns[i].table == table && data.columns[i].name.compare(name, Qt::CaseInsensitive) == 0)
+        if (data.columns.at(i).table == table && data.columns.at(i).name.compare(name, Qt::CaseInsensitive) == 0)
             return i;
     }
     return -1;
 }
 
-/// Returns the condition for the current row in a table: its primary key, or all selected data.columns if the query
+/// Returns the condition for the current row in a table: its primary key, or all selected columns if the query
 /// does not contain the key.
 QString Recordset::Data::Writer::keyCondition(const TableInfo& table)
 {
@@ -107,17 +107,17 @@ QString Recordset::Data::Writer::keyCondition(const TableInfo& table)
             conditions.clear();
             break;
         }
-        conditions.append(holds(data.dialect(), data.columns[column], before(column)));
+        conditions.append(holds(data.dialect(), data.columns.at(column), before(column)));
     }
     if (conditions.isEmpty()) {
         for (int column = 0; column < data.columns.size(); ++column) {
-            if (data.columns[column].table == table.name && data.columns[column].kind != Kind::LongText)
-                conditions.append(held(data.dialect(), data.columns[column], before(column)));
+            if (data.columns.at(column).table == table.name && data.columns.at(column).kind != Kind::LongText)
+                conditions.append(held(data.dialect(), data.columns.at(column), before(column)));
         }
         conditions.removeAll(QString());
     }
     if (conditions.isEmpty())
-        throw RuntimeError(StatementFailed, u"The data.columns of the query don't identify a row of "_s + table.name);
+        throw RuntimeError(StatementFailed, u"The columns of the query don't identify a row of "_s + table.name);
     return conditions.join(u" AND "_s);
 }
 
@@ -126,9 +126,9 @@ QList<int> Recordset::Data::Writer::uncomparedTexts(const TableInfo& table)
 {
     QList<int> texts;
     for (int column = 0; column < data.columns.size(); ++column) {
-        if (data.columns[column].table == table.name && data.columns[column].kind == Kind::LongText &&
-            isChanged(column) &&
-            data.dialect().holds(data.columns[column].name, Kind::LongText, data.original[size_t(column)]).isEmpty())
+        if (isChanged(column) && data.columns.at(column).table == table.name &&
+            data.columns.at(column).kind == Kind::LongText &&
+            data.dialect().holds(data.columns.at(column).name, Kind::LongText, data.original[size_t(column)]).isEmpty())
             texts.append(column);
     }
     return texts;
@@ -140,8 +140,8 @@ void Recordset::Data::Writer::checkTexts(const TableInfo& table, const QString& 
     QList<ResultColumn> described;
     QStringList names;
     for (const int column : texts) {
-        described.append(data.columns[column]);
-        names.append(data.dialect().quoted(data.columns[column].name));
+        described.append(data.columns.at(column));
+        names.append(data.dialect().quoted(data.columns.at(column).name));
     }
     const Rows now = data.session().selectNative(
         u"SELECT "_s + names.join(u", "_s) + u" FROM "_s +
@@ -168,12 +168,12 @@ void Recordset::Data::Writer::writeChange(const QString& tableName)
     QString condition = key;
     QList<int> written;
     for (int column = 0; column < data.columns.size(); ++column) {
-        if (data.columns[column].table != tableName || !isChanged(column))
+        if (!isChanged(column) || data.columns.at(column).table != tableName)
             continue;
-        const QString& name = data.columns[column].name;
+        const QString& name = data.columns.at(column).name;
         const QVariant& before = data.original[size_t(column)];
         assignments.append(data.dialect().quoted(name) + u'=' + data.dialect().literal(data.at(data.row(), column)));
-        if (const QString same = held(data.dialect(), data.columns[column], before); !same.isEmpty())
+        if (const QString same = held(data.dialect(), data.columns.at(column), before); !same.isEmpty())
             condition += u" AND "_s + same;
         written.append(column);
     }
@@ -201,16 +201,16 @@ void Recordset::Data::Writer::writeInsert(const QString& tableName)
     QStringList names;
     QStringList literals;
     for (int column = 0; column < data.columns.size(); ++column) {
-        if (data.columns[column].table != tableName || !isChanged(column))
+        if (!isChanged(column) || data.columns.at(column).table != tableName)
             continue;
-        names.append(data.dialect().quoted(data.columns[column].name));
+        names.append(data.dialect().quoted(data.columns.at(column).name));
         literals.append(data.dialect().literal(data.at(data.row(), column)));
     }
     Change change(*data.connection, tableName);
     const QVariant identity = data.session().insert(*table, names, literals);
     for (int column = 0; column < data.columns.size(); ++column) {
-        if (table->identity() && data.columns[column].table == tableName &&
-            data.columns[column].name == table->identity()->name)
+        if (table->identity() && data.columns.at(column).table == tableName &&
+            data.columns.at(column).name == table->identity()->name)
             data.store(data.row(), column, identity);
     }
     if (change.isObserved())
@@ -224,13 +224,13 @@ RowChange Recordset::Data::Writer::rowChange(const TableInfo& table, ChangeKind 
     const bool hasKey = !table.key.isEmpty() && std::ranges::all_of(table.key, [&](const QString& name) {
         return resultColumn(table.name, name) >= 0;
     });
+    const TableColumn* const identity = table.identity();
     RowChange change{kind, table.name, hasKey ? table.key : QStringList(), {}};
     for (int column = 0; column < data.columns.size(); ++column) {
-        const ResultColumn& described = data.columns[column];
+        const ResultColumn& described = data.columns.at(column);
         if (described.table != table.name)
             continue;
-        const TableColumn* base = table.column(described.name);
-        const bool isIdentity = base && base->identity;
+        const bool isIdentity = identity && described.name.compare(identity->name, Qt::CaseInsensitive) == 0;
         const bool isExact = described.kind != Kind::Number && described.kind != Kind::LongText;
         const bool isKey = hasKey ? table.key.contains(described.name, Qt::CaseInsensitive)
                                   : isExact && (kind == ChangeKind::Update || data.assigned[size_t(column)]);
@@ -245,23 +245,22 @@ RowChange Recordset::Data::Writer::rowChange(const TableInfo& table, ChangeKind 
     return change;
 }
 
-/// Reads what the database has set in the new row: its identity, and the defaults of the data.columns without a value.
+/// Reads what the database has set in the new row: its identity, and the defaults of the columns without a value.
 void Recordset::Data::Writer::readBack(const TableInfo& table, const QVariant& identity)
 {
     QList<int> wanted;
     QList<ResultColumn> described;
     QStringList names;
-    for (int column = 0; column < data.columns.size(); ++column) {
-        const TableColumn* base =
-            data.columns[column].table == table.name ? table.column(data.columns[column].name) : nullptr;
-        if (!base || data.assigned[size_t(column)])
+    for (const TableColumn& base : table.columns) {
+        const int column = base.identity || base.hasDefault ? resultColumn(table.name, base.name) : -1;
+        if (column < 0 || data.assigned[size_t(column)])
             continue;
-        if (base->identity) {
+        if (base.identity) {
             data.store(data.row(), column, identity);
-        } else if (base->hasDefault) {
+        } else {
             wanted.append(column);
-            described.append(data.columns[column]);
-            names.append(data.dialect().quoted(base->name));
+            described.append(data.columns.at(column));
+            names.append(data.dialect().quoted(base.name));
         }
     }
     if (wanted.isEmpty())
@@ -281,9 +280,9 @@ QString Recordset::Data::Writer::insertedRow(const TableInfo& table)
 {
     QStringList conditions{u"1=1"_s};
     for (int column = 0; column < data.columns.size(); ++column) {
-        if (data.columns[column].table == table.name && data.assigned[size_t(column)] &&
-            data.columns[column].kind != Kind::LongText)
-            conditions.append(held(data.dialect(), data.columns[column], data.at(data.row(), column)));
+        if (data.assigned[size_t(column)] && data.columns.at(column).table == table.name &&
+            data.columns.at(column).kind != Kind::LongText)
+            conditions.append(held(data.dialect(), data.columns.at(column), data.at(data.row(), column)));
     }
     conditions.removeAll(QString());
     return conditions.join(u" AND "_s);
