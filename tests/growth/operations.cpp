@@ -1,16 +1,23 @@
 // Does one operation of the shop once, in a shop of a chosen size, for `count`, which counts its instructions,
 // statements and calls for files: operations NAME SIZE.
+#include "messages/Envelope.h"
 #include "messages/Folders.h"
 #include "outbound/SendQuote.h"
+#include "platform/print/Pages.h"
+#include "platform/print/Report.h"
+#include "reports/BuildAuthReport.h"
 #include "support/OdbcDrivers.h"
+#include "support/Places.h"
 #include "support/Shop.h"
 
 #include <QApplication>
+#include <QTemporaryDir>
 
 #include <cstdio>
 #include <cstdlib>
 #include <functional>
 #include <map>
+#include <optional>
 #include <string>
 
 /// What is counted. The name is not mangled, so that `count` can give it to valgrind.
@@ -71,6 +78,14 @@ void measureLoad(const QString& text)
     measured([&] { expect(load(text)); });
 }
 
+QString authorisation(int lines)
+{
+    Message message = authorisedQuote("500").rego("ABC123");
+    for (int line = 1; line <= lines; ++line)
+        message.labour(line, "C");
+    return message.text();
+}
+
 /// What is done, in a shop of that size.
 const std::map<std::string, std::function<void(Bench&, int)>> operations{
     {"fill",
@@ -116,10 +131,21 @@ const std::map<std::string, std::function<void(Bench&, int)>> operations{
     {"load-authorised",
      [](Bench&, int lines) {
          addLines(lines);
-         Message message = authorisedQuote("500").rego("ABC123");
-         for (int line = 1; line <= lines; ++line)
-             message.labour(line, "C");
-         measureLoad(message.text());
+         measureLoad(authorisation(lines));
+     }},
+    {"print",
+     [](Bench&, int lines) {
+         addLines(lines);
+         quote("500").request("QR1");
+         QString text = authorisation(lines);
+         QString number;
+         QString subquote;
+         std::optional<db::Recordset> table = BuildAuthReport(parsedMessage(text), number, subquote, false);
+         expect(table && table->recordCount() == lines);
+         report::Report report(checkoutFile(u"templates/730.html"_s));
+         report.setTable(report::tableOf(*table));
+         const QTemporaryDir folder;
+         measured([&] { report::writePdf(report, folder.filePath(u"report.pdf"_s)); });
      }},
     {"send",
      [](Bench&, int lines) {
