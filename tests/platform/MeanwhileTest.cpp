@@ -4,9 +4,7 @@
 
 using db::Recordset;
 
-struct Meanwhile : Databases {
-    ~Meanwhile() override { db::setStatementFault({}); }
-};
+struct Meanwhile : Databases {};
 
 TEST_P(Meanwhile, ALongTextIsNotOverwritten)
 {
@@ -26,7 +24,7 @@ TEST_P(Meanwhile, ALongTextIsNotOverwritten)
                 isTheirs = attempt([&] { other->execute(theirs); });
             return false;
         });
-        const int refused = failure([&] { lines.update(); }).number();
+        const int refused = failureOf([&] { lines.update(); });
         db::setStatementFault({});
         EXPECT_EQ(refused, isTheirs ? RowChanged : 0) << number;
         EXPECT_EQ(query(u"SELECT notes FROM LINE"_s).text(u"notes"_s), isTheirs ? u"theirs"_s : u"ours"_s) << number;

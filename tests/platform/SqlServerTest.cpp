@@ -10,7 +10,10 @@
 
 using db::Recordset;
 
-class SqlServer : public Databases {};
+struct SqlServer : Databases {
+    /// Returns the number that a batch selects.
+    int asked(const QString& batch) const { return connection->session().engine().run(batch).values.front().toInt(); }
+};
 
 TEST_P(SqlServer, TextsOfAnyLengthAndLetterComeBackWhole)
 {
@@ -22,38 +25,25 @@ TEST_P(SqlServer, TextsOfAnyLengthAndLetterComeBackWhole)
         u"CREATE TABLE TEXTS (id INT IDENTITY(1,1) PRIMARY KEY, old TEXT, long VARCHAR(MAX), wide NVARCHAR(MAX), "
         "short NVARCHAR(20))"_s);
     Recordset texts = query(u"SELECT * FROM TEXTS"_s);
-    for (const int length : {0, 255, 256, 4095, 4096, 8001, 65536, 65537, 200000}) {
+    // long literals are sent in pieces of 4,095 units, which must not cut a letter in two
+    for (const int length : {0, 255, 256, 4093, 4094, 4095, 4096, 8001, 8189, 65536, 65537, 200000}) {
         const QString text = QString(length, u'x') + u"Zoë €5"_s;
+        const QString wide = QString(length, u'x') + u"😀 Żółw"_s;
         texts.addNew();
-        for (const QString& column : {u"old"_s, u"long"_s, u"wide"_s})
+        for (const QString& column : {u"old"_s, u"long"_s})
             texts.set(column, text);
-        texts.set(u"wide"_s, text + u"Żółw"_s);
+        texts.set(u"wide"_s, wide);
         EXPECT_EQ(written(texts, u"short"_s, u"Żółw 😀"_s), 0) << length;
         texts.requery();
         texts.moveLast();
         EXPECT_EQ(texts.text(u"old"_s), text) << length;
         EXPECT_EQ(texts.text(u"long"_s), text) << length;
-        EXPECT_EQ(texts.text(u"wide"_s), text + u"Żółw"_s) << length;
+        EXPECT_EQ(texts.text(u"wide"_s), wide) << length;
         EXPECT_EQ(texts.text(u"short"_s), u"Żółw 😀"_s) << length;
         EXPECT_EQ(written(texts, u"old"_s, text + u'.'), 0) << length;
     }
-    EXPECT_EQ(query(u"SELECT * FROM TEXTS WHERE short='żółw 😀'"_s).recordCount(), 9);
+    EXPECT_EQ(query(u"SELECT * FROM TEXTS WHERE short='żółw 😀'"_s).recordCount(), 12);
     EXPECT_EQ(db::sqlServerDialect().literal(u"O'Brien"_s), u"'O''Brien'"_s) << "an index needs it without N";
-}
-
-TEST_P(SqlServer, ALetterOutsideOfThePlaneIsNotCutBetweenTwoPieces)
-{
-    connection->execute(u"CREATE TABLE TEXTS (id INT IDENTITY(1,1) PRIMARY KEY, wide NVARCHAR(MAX))"_s);
-    Recordset texts = query(u"SELECT * FROM TEXTS"_s);
-    for (const int before : {4093, 4094, 4095, 8189}) {  // a piece has 4,095 units
-        const QString text = QString(before, u'x') + u"😀 end"_s;
-        texts.addNew();
-        texts.set(u"wide"_s, text);
-        texts.update();
-        texts.requery();
-        texts.moveLast();
-        EXPECT_EQ(texts.text(u"wide"_s), text) << before;
-    }
 }
 
 TEST_P(SqlServer, TriggersChangeNeitherCountsNorIdentities)
@@ -78,9 +68,7 @@ TEST_P(SqlServer, ARowThatAnIndexRefusesSilentlyIsNotTakenForAdded)
     for (const QString& table : {u"LINE"_s, u"Tints"_s})  // with and without an identity
         for (const int expected : {0, int(StatementFailed)}) {
             Recordset rows = query(u"SELECT * FROM "_s + table);
-            rows.addNew();
-            rows.set(u"CODE"_s, u"A"_s);
-            EXPECT_EQ(failure([&] { rows.update(); }).number(), expected) << table;
+            EXPECT_EQ(added(rows, u"CODE"_s, u"A"_s), expected) << table;
         }
 }
 
@@ -96,9 +84,7 @@ TEST_P(SqlServer, AFailureMeansWhatItsNumberMeansOnThisServer)
             failure([&] { connection->session().engine().run(u"EXEC standin_fail @number=%1"_s.arg(number)); });
         EXPECT_EQ(thrown.nativeCode(), QString::number(number));
         EXPECT_EQ(connection->state(), livesOn ? 1 : 0) << number;
-        if (livesOn) {
-            EXPECT_EQ(thrown.sqlState(), state) << number;
-        }
+        EXPECT_TRUE(!livesOn || thrown.sqlState() == state) << number << thrown.sqlState();
     }
 }
 
@@ -110,47 +96,35 @@ TEST_P(SqlServer, ALockThatTheServerRefusesIsNotTakenForSomebodyElses)
 
 TEST_P(SqlServer, OrdinaryWorkGivesNoStatementUp)
 {
-    const auto attentions = [&] {
-        return connection->session()
-            .engine()
-            .run(u"DECLARE @r int; EXEC @r = standin_attentions; SELECT @r"_s)
-            .values.front()
-            .toInt();
-    };
+    const auto attentions = u"DECLARE @r int; EXEC @r = standin_attentions; SELECT @r"_s;
     connection->execute(u"INSERT INTO CAR (REGO, CODE) VALUES ('A', 'x')"_s);
     for (int i = 0; i < 3; ++i) {
         Recordset lines = query(u"SELECT * FROM LINE"_s);
-        lines.addNew();
-        lines.set(u"CODE"_s, u"x"_s);
-        lines.set(u"notes"_s, QString(5000, u'n'));
-        lines.update();
-        lines.set(u"notes"_s, u"short"_s);
-        lines.update();
+        EXPECT_EQ(added(lines, u"CODE"_s, u"x"_s), 0);
+        EXPECT_EQ(written(lines, u"notes"_s, QString(5000, u'n')), 0);
+        EXPECT_EQ(written(lines, u"notes"_s, u"short"_s), 0);
         Recordset joined = query(u"SELECT L.*, C.owner FROM LINE L INNER JOIN CAR C ON C.CODE=L.CODE"_s);
-        joined.set(u"owner"_s, u"Ann %1"_s.arg(i));
-        joined.update();
+        EXPECT_EQ(written(joined, u"owner"_s, u"Ann %1"_s.arg(i)), 0);
         EXPECT_TRUE(db::Lock(connection, u"a"_s).isHeld());
         EXPECT_TRUE(connection->answers());
         EXPECT_EQ(failure([&] { query(u"SELECT * FROM NOSUCH"_s); }).number(), StatementFailed);
         lines.remove();
     }
-    EXPECT_EQ(attentions(), 0);
+    EXPECT_EQ(asked(attentions), 0);
     connection->setCommandTimeout(1);
     EXPECT_THROW(connection->execute(u"WAITFOR DELAY '00:00:20'"_s), RuntimeError);
-    EXPECT_EQ(attentions(), 1);
+    EXPECT_EQ(asked(attentions), 1);
 }
 
 TEST_P(SqlServer, AWaitForALockIsLimitedLikeAStatement)
 {
-    const auto limit = [&] {
-        return connection->session().engine().run(u"SELECT @@LOCK_TIMEOUT"_s).values.front().toInt();
-    };
+    const auto limit = u"SELECT @@LOCK_TIMEOUT"_s;
     connection->setCommandTimeout(7);
-    EXPECT_EQ(limit(), 7000);
+    EXPECT_EQ(asked(limit), 7000);
     connection->open(connectionText);
-    EXPECT_EQ(limit(), 7000) << "it outlives the session";
+    EXPECT_EQ(asked(limit), 7000) << "it outlives the session";
     connection->setCommandTimeout(0);
-    EXPECT_EQ(limit(), -1);
+    EXPECT_EQ(asked(limit), -1);
 }
 
 TEST_P(SqlServer, ExactNumbersTellARowAndVersionsDoNot)

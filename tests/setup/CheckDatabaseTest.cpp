@@ -10,10 +10,9 @@
 static std::string pointsThat(app::CheckedPoint::Result result, const app::DatabaseCheck& check)
 {
     QStringList texts;
-    for (const app::CheckedPoint& point : check.points) {
+    for (const app::CheckedPoint& point : check.points)
         if (point.result == result)
             texts += point.what + u": "_s + point.why;
-    }
     return texts.join(u'\n').toStdString();
 }
 
@@ -23,8 +22,6 @@ static std::string failures(const std::function<db::ConnectionPtr()>& connect = 
 }
 
 struct CheckedDatabase : Shop {
-    ~CheckedDatabase() override { db::setStatementFault({}); }
-
     static QStringList tables()
     {
         QStringList names = anotherConnection()->session().engine().tableNames();
