@@ -23,18 +23,15 @@ static double milliseconds()
     return 1000.0 * double(std::clock()) / CLOCKS_PER_SEC;
 }
 
-CostMeter::CostMeter()
+Cost costOf(const std::function<void()>& step)
 {
     ::malloc_trim(0);
     QFile references(u"/proc/self/clear_refs"_s);
     EXPECT_TRUE(references.open(QFile::WriteOnly | QFile::Unbuffered) && references.write("5") == 1);
-    memoryBefore = peakMemory();
-    timeBefore = milliseconds();
-}
-
-Cost CostMeter::cost() const
-{
-    return {milliseconds() - timeBefore, peakMemory() - memoryBefore};
+    const double memory = peakMemory();
+    const double time = milliseconds();
+    step();
+    return {milliseconds() - time, peakMemory() - memory};
 }
 
 }  // namespace kest::test

@@ -1,6 +1,8 @@
 // Measures the time and the memory of a step.
 #pragma once
 
+#include <functional>
+
 namespace kest::test {
 
 #if defined(__SANITIZE_ADDRESS__) || defined(__clang__)  // clang only builds the fuzz targets, with sanitizers
@@ -19,23 +21,6 @@ struct Cost {
     double megabytes = 0;     // the most that was used at a time
 };
 
-class CostMeter {
-public:
-    CostMeter();
-    /// Returns the cost since this object was created.
-    Cost cost() const;
-
-private:
-    double memoryBefore;
-    double timeBefore;
-};
-
-template <class Step>
-Cost costOf(const Step& step)
-{
-    const CostMeter meter;
-    step();
-    return meter.cost();
-}
+Cost costOf(const std::function<void()>& step);
 
 }  // namespace kest::test
