@@ -47,14 +47,12 @@ struct History : Shop {
     static std::string rows(QDialog& window, const char* list, std::initializer_list<int> columns)
     {
         QString told;
-        const auto& tree = control<QTreeWidget>(window, list);
-        for (int i = 0; i < tree.topLevelItemCount(); ++i) {
-            const QTreeWidgetItem* row = tree.topLevelItem(i);
+        const auto shown = QTreeWidgetItemIterator::NotHidden;
+        for (QTreeWidgetItemIterator row(&control<QTreeWidget>(window, list), shown); *row; ++row) {
             QStringList cells;
             for (const int column : columns)
-                cells.append(row->text(column));
-            if (!row->isHidden())
-                told += cells.join(u' ').toUpper() + u'\n';
+                cells.append((*row)->text(column));
+            told += cells.join(u' ').toUpper() + u'\n';
         }
         return told.toStdString();
     }
