@@ -52,11 +52,11 @@ TransportWindow::TransportWindow(const TransportFolders& folders)
     status = new desktop::StatusLine(u"status"_s);
     status->setWordWrap(true);
 
-    carryButton = new QPushButton(u"&Carry Now"_s, this);
+    carryButton = new QPushButton(u"Carry &Now"_s, this);
     carryButton->setObjectName(u"carryButton"_s);
     desktop::onEvent(carryButton, &QPushButton::clicked, this, u"KESTWeb.carryNow_clicked"_s,
                      [this] { runner.carryNow(); });
-    closeButton = new QPushButton(u"C&lose"_s, this);
+    closeButton = new QPushButton(u"&Close"_s, this);
     closeButton->setObjectName(u"closeButton"_s);
     desktop::onEvent(closeButton, &QPushButton::clicked, this, u"KESTWeb.close_clicked"_s, [this] { close(); });
 

@@ -111,7 +111,7 @@ frmHistory::frmHistory(const QString& number, Undo undoLoad)
       txtFind(new QLineEdit),
       lblStatus(new desktop::StatusLine(u"lblStatus"_s)),
       cmdUndo(button(u"cmdUndo"_s, u"&Undo"_s, [this] { cmdUndo_Click(); })),
-      cmdClose(button(u"cmdClose"_s, u"C&lose"_s, [this] { close(); }))
+      cmdClose(button(u"cmdClose"_s, u"&Close"_s, [this] { close(); }))
 {
     setWindowFlag(Qt::WindowMaximizeButtonHint);
     txtFind->setObjectName("txtFind"_L1);
@@ -167,7 +167,7 @@ void frmHistory::arrange()
     auto* layout = new QVBoxLayout(this);
     layout->addLayout(top);
     layout->addWidget(ListView1, 2);
-    layout->addWidget(labelOf(ListView2, u"&Changes of the chosen operation"_s));
+    layout->addWidget(labelOf(ListView2, u"C&hanges of the chosen operation"_s));
     layout->addWidget(ListView2, 3);
     layout->addLayout(bottom);
     resize(desktop::pixels(13500, 9000));

@@ -143,8 +143,12 @@ void frmViewXML::resizeEvent(QResizeEvent* event)
     constexpr int margin = 375 / 2;
     constexpr int buttonHeight = 540;
     place(txtXML, margin, 120, formWidth - 375, formHeight - 1350);
-    place(Command1, formWidth - 870, formHeight - 1125, 870 - margin, buttonHeight);
-    place(Command2, formWidth - 1830, formHeight - 1125, 855, buttonHeight);
+    const auto placeButton = [&](QPushButton* button, int left, int width) {
+        const int height = desktop::twips(button->sizeHint().height());
+        place(button, left, formHeight - 1125 + (buttonHeight - height) / 2, width, height);
+    };
+    placeButton(Command1, formWidth - 870, 870 - margin);
+    placeButton(Command2, formWidth - 1830, 855);
     place(findBar, margin, formHeight - 1125, formWidth - 1830 - 2 * margin, buttonHeight);
 }
 

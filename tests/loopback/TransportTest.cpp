@@ -173,7 +173,7 @@ TEST_F(Loopback, RulesWithAFaultStopEverythingUntilTheyAreMended)
 TEST_F(Loopback, TheWindowShowsWhatIsCarried)
 {
     desktop.emplace(R"({"windows":{"KESTWeb":[[{"click":"carryButton"}, {"read":["carriedList","status"]},
-        {"key":"KESTWeb","keys":"Alt+L"}]]}})");
+        {"key":"KESTWeb","keys":"Alt+C"}]]}})");
     ASSERT_TRUE(send());
     EXPECT_TRUE(app::runTransport(app::TransportMode::Window, {}));
     EXPECT_EQ(desktop->read(u"carriedList"_s, u"rows"_s)[0][2].toString(), u"1004.0_1.xml"_s);

@@ -27,13 +27,14 @@ class DrawnIcon final : public QIconEngine {
 public:
     using Drawing = void (*)(QPainter& painter);
 
-    explicit DrawnIcon(Drawing picture) : drawing(picture) {}
+    /// The drawing is that of a square of this size in pixels.
+    DrawnIcon(Drawing picture, int pixels) : drawing(picture), side(pixels) {}
 
     void paint(QPainter* painter, const QRect& place, QIcon::Mode, QIcon::State) override
     {
         painter->save();
         painter->translate(place.topLeft());
-        painter->scale(place.width() / qreal(pictureSize), place.height() / qreal(pictureSize));
+        painter->scale(place.width() / qreal(side), place.height() / qreal(side));
         drawing(*painter);
         painter->restore();
     }
@@ -45,10 +46,11 @@ public:
         paint(&painter, picture.rect(), mode, state);
         return picture;
     }
-    QIconEngine* clone() const override { return new DrawnIcon(drawing); }
+    QIconEngine* clone() const override { return new DrawnIcon(drawing, side); }
 
 private:
     Drawing drawing;
+    int side;
 };
 
 /// Draws a door with an arrow that leads out.
@@ -62,10 +64,16 @@ void drawExit(QPainter& painter)
     painter.drawPolyline(QPolygonF({{17, 8}, {21, 12}, {17, 16}}));
 }
 
+/// As in a QLineEdit, so that it is not shrunk there.
+int arrowSize()
+{
+    return QApplication::style()->pixelMetric(QStyle::PM_SmallIconSize);
+}
+
 void drawArrow(QPainter& painter)
 {
     QStyleOption arrow;
-    arrow.rect = QRect(0, 0, pictureSize, pictureSize);
+    arrow.rect = QRect(0, 0, arrowSize(), arrowSize());
     arrow.palette = QApplication::palette();
     arrow.state = QStyle::State_Enabled;
     QApplication::style()->drawPrimitive(QStyle::PE_IndicatorArrowDown, &arrow, &painter);
@@ -140,14 +148,14 @@ void showAbout()
 
 QIcon dropArrow()
 {
-    return QIcon(new DrawnIcon(drawArrow));
+    return QIcon(new DrawnIcon(drawArrow, arrowSize()));
 }
 
 QPushButton* exitButton(QWidget* parent, const QString& name, const QString& tip)
 {
     auto* button = new QPushButton(parent);
     button->setObjectName(name);
-    button->setIcon(QIcon(new DrawnIcon(drawExit)));
+    button->setIcon(QIcon(new DrawnIcon(drawExit, pictureSize)));
     button->setIconSize({pictureSize, pictureSize});
     button->setToolTip(tip);
     button->setAccessibleName(tip);
