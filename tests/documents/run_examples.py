@@ -3,12 +3,15 @@
 
 A block with lines that begin with "$ " is a session. All sessions of a document run in one shop, in their order, and
 print what the document shows; "..." stands for any lines, or for the rest of a line. In other blocks, each line that begins with "kest2" runs in a
-shop of its own and must be a command that exists, with arguments that it takes. A block of JSON is written to the file
+shop of its own and must do what it says: it succeeds, prints JSON if it says so, prints the rows of a list, and a setting
+can be read as it was set. A block of JSON is written to the file
 that the text before it names. The box of the demo's damaged message is left out, as automation.md says.
 """
+import json
 import os
 import pathlib
 import re
+import shlex
 import shutil
 import subprocess
 import sys
@@ -16,7 +19,6 @@ import tempfile
 
 KEST2, SOURCE = pathlib.Path(sys.argv[1]), pathlib.Path(sys.argv[2])
 DAMAGED = "[critical] KEST: Message QREQ_20554_1.xml unreadable"
-USAGE = 2
 faults = []
 
 
@@ -50,11 +52,11 @@ def commands(lines):
     yield command, output
 
 
-def run(command, shop, folder):
+def run(command, shop, folder, errors=subprocess.STDOUT):
     environment = {"PATH": f"{folder}/bin:/usr/bin:/bin", "HOME": str(folder), "KEST2_PROFILE": str(shop),
                    "LC_ALL": "C.UTF-8", "LSAN_OPTIONS": os.environ.get("LSAN_OPTIONS", "")}
     done = subprocess.run(["bash", "-c", command], cwd=folder, env=environment, input="secret\n", text=True,
-                          stdout=subprocess.PIPE, stderr=subprocess.STDOUT, timeout=120)
+                          stdout=subprocess.PIPE, stderr=errors, timeout=120)
     return done.returncode, [line for line in done.stdout.splitlines() if not line.startswith(DAMAGED)]
 
 
@@ -67,15 +69,26 @@ def check_session(where, command, expected, shop, folder):
                       "\n".join(expected))
 
 
+def does_as_told(command, printed, shop, folder):
+    words = shlex.split(command)
+    if words[1] == "--json":
+        answer = json.loads("\n".join(printed))
+        return answer["command"] == words[2] and answer["result"] is True
+    if words[1:3] == ["setting", "set"] and len(words) == 7:
+        return run(shlex.join(["kest2", "setting", "get", *words[3:6]]), shop, folder)[1] == [words[6]]
+    return words[1] != "list" or all(line.count("\t") == 6 for line in printed) and len(printed) > 1
+
+
 def check_line(where, line, fresh, folder):
     command = re.split(r" {2,}", line)[0]
     if re.search(r" open\b", command):
         return  # it needs a person
     shop = folder / "one"
     shutil.copytree(fresh, shop)
-    code, printed = run(re.sub(r"--profile \S+", "", command), shop, folder)
-    if code == USAGE:
-        faults.append(f"{where}: {command}\nprinted:\n" + "\n".join(printed))
+    command = re.sub(r"--profile \S+ ", "", command)
+    code, printed = run(command, shop, folder, subprocess.DEVNULL)
+    if code != 0 or not does_as_told(command, printed, shop, folder):
+        faults.append(f"{where}: {command}\nends with {code} and prints:\n" + "\n".join(printed))
     shutil.rmtree(shop)
 
 

@@ -122,6 +122,11 @@ TEST_F(EveryWindow, TellsVersionProfileDatabaseAndLastErrorByF1)
         const QString about = desktop->boxes().last();
         for (const QString& part : {u"KEST2 " KEST_VERSION ""_s, profile::root(), u"WirSql (embedded)"_s, u"straw"_s})
             EXPECT_TRUE(about.contains(part)) << about.toStdString();
+        if (window.objectName() == "frmKEST"_L1) {
+            EXPECT_EQ(window.contextMenuPolicy(), Qt::ActionsContextMenu);
+            window.actions().value(0)->trigger();
+            EXPECT_EQ(desktop->boxes(), QStringList({about, about})) << "in its menu";
+        }
     });
 }
 
