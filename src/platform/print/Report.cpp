@@ -187,10 +187,12 @@ void Report::putInFragments()
         u"<template\\s+id=\"([^\"]+)\">(.*?)</template>"_s,
         QRegularExpression::DotMatchesEverythingOption | QRegularExpression::CaseInsensitiveOption);
     for (auto found = fragment.match(body_); found.hasMatch(); found = fragment.match(body_)) {
+        const QString place = u"{{>"_s + found.captured(1) + u"}}"_s;
+        const QString text = found.captured(2).trimmed();
         body_.remove(found.capturedStart(), found.capturedLength());
-        body_.replace(u"{{>"_s + found.captured(1) + u"}}"_s, found.captured(2).trimmed());
-        if (body_.size() > longestBody)
+        if (body_.size() + body_.count(place) * text.size() > longestBody)
             noTemplate(u"its fragments contain each other"_s);
+        body_.replace(place, text);
     }
 }
 
