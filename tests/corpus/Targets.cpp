@@ -332,7 +332,7 @@ class ImagesTarget final : public ShopTarget {
             require(id.isEmpty() || numberIn(id).has_value(), "an image's id is a number");
             QuoteKey::fromReference(name);
             QuoteKey::fromResponseName(name);
-            NormaliseQuoteRef(name);
+            attempt([&] { NormaliseQuoteRef(name); });  // a number can be too large
             SplitQuoteRef(name);
             require(!files::isPlainName(name) || !name.contains(u'/'), "a plain name has no folder");
             create(gsImagesPath, line, "jpeg");
