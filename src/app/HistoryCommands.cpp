@@ -29,15 +29,19 @@ QJsonObject jsonOf(const journal::RecordedChange& change)
             {u"change"_s, journal::wordOf(change.row.kind)},
             {u"quote"_s, change.number},
             {u"subquote"_s, change.subquote},
+            {u"key"_s, journal::keyOf(change.row)},
+            {u"takenBack"_s, change.isTakenBack},
             {u"columns"_s, columns}};
 }
 
 QString textOf(const journal::RecordedChange& change)
 {
     QString text = u"  %1 %2"_s.arg(journal::wordOf(change.row.kind), change.row.table);
+    if (const QString key = journal::keyOf(change.row); !key.isEmpty())
+        text += u' ' + key;
     if (!change.number.isEmpty())
         text += u" (quote %1/%2)"_s.arg(change.number, change.subquote);
-    text += u'\n';
+    text += change.isTakenBack ? u", taken back\n"_s : u"\n"_s;
     for (const QString& line : journal::linesOf(change.row))
         text += u"    "_s + line + u'\n';
     return text;

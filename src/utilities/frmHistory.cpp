@@ -182,8 +182,9 @@ const QList<QStringList>& frmHistory::changesOf(qint64 operation)
     QList<QStringList> rows;
     for (const journal::RecordedChange& change : journal::changesOf(operation))
         for (const journal::ColumnStory& column : journal::columnsOf(change.row))
-            rows.append({change.row.table, journal::wordOf(change.row.kind), journal::keyOf(change.row), column.name,
-                         column.from, column.to});
+            rows.append({change.row.table,
+                         journal::wordOf(change.row.kind) + (change.isTakenBack ? u", taken back"_s : QString()),
+                         journal::keyOf(change.row), column.name, column.from, column.to});
     return changes.emplace(operation, rows).first->second;
 }
 
@@ -242,6 +243,7 @@ void frmHistory::cmdUndo_Click()
     if (!undo(chosen()))
         return;
     isUndone = true;
+    changes.clear();  // it tells now which were taken back
     fill();
 }
 
