@@ -5,6 +5,8 @@
 #include "setup/HostTables.h"
 #include "setup/QuoteDatabase.h"
 
+#include <QRegularExpression>
+
 #include <algorithm>
 
 namespace kest::app {
@@ -65,6 +67,32 @@ bool isServedBy(const Index& wanted, const ExistingIndex& existing)
                       });
 }
 
+bool isServed(const Index& wanted, const QList<ExistingIndex>& existing)
+{
+    return std::any_of(existing.begin(), existing.end(),
+                       [&](const ExistingIndex& found) { return isServedBy(wanted, found); });
+}
+
+/// Returns the statements that create what the journal lacks, of which another attempt may have created a part.
+QStringList missingOfJournal(const db::ConnectionPtr& connection, const QList<ExistingIndex>& existing)
+{
+    const Server server = serverOf(connection);
+    const QStringList statements = journalStatements(server == Server::Embedded ? Dialect::Embedded
+                                                     : server == Server::MySql  ? Dialect::MariaDb
+                                                                                : Dialect::SqlServer);
+    QStringList there;
+    for (const Index& index : indexesIn(statements))
+        if (isServed(index, existing))
+            there.append(index.statement);
+    static const QRegularExpression tableOf(u"\\ACREATE TABLE (\\w+)"_s);
+    for (const QString& statement : statements)
+        if (const auto table = tableOf.match(statement); table.hasMatch() && connection->hasTable(table.captured(1)))
+            there.append(statement);
+    QStringList missing = statements;
+    missing.removeIf([&](const QString& statement) { return there.contains(statement); });
+    return missing;
+}
+
 bool hasColumns(const db::ConnectionPtr& connection, const Index& index)
 {
     const db::TableInfo* table = connection->session().table(index.table);
@@ -79,17 +107,12 @@ QList<MissingPart> missingParts(const db::ConnectionPtr& connection)
     QList<MissingPart> missing;
     const QList<ExistingIndex> existing = existingIndexes(connection);
     for (const Index& index : quoteIndexes()) {
-        const bool isServed = std::any_of(existing.begin(), existing.end(),
-                                          [&](const ExistingIndex& found) { return isServedBy(index, found); });
-        if (!isServed && hasColumns(connection, index))
+        if (!isServed(index, existing) && hasColumns(connection, index))
             missing.append({u"index of %1 by %2"_s.arg(index.table, index.columns.join(u", "_s)), {index.statement}});
     }
-    const Server server = serverOf(connection);
-    if (!connection->hasTable(u"KESTOperation"_s))
-        missing.append({u"journal (KESTOperation, KESTJournal)"_s,
-                        journalStatements(server == Server::Embedded ? Dialect::Embedded
-                                          : server == Server::MySql  ? Dialect::MariaDb
-                                                                     : Dialect::SqlServer)});
+    const QStringList journal = missingOfJournal(connection, existing);
+    if (!journal.isEmpty())
+        missing.append({u"journal (KESTOperation, KESTJournal)"_s, journal});
     return missing;
 }
 

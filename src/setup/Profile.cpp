@@ -9,6 +9,7 @@
 #include "platform/profile.h"
 #include "platform/settings/registry.h"
 #include "setup/DemoShop.h"
+#include "setup/PrepareDatabase.h"
 #include "setup/QuoteDatabase.h"
 
 #include <QDir>
@@ -108,8 +109,7 @@ void repairDatabases()
         attempt([&] {  // a file may not be a quote database
             const db::ConnectionPtr database = openEmbedded(file.chopped(3));
             repairIndexes(*database);
-            if (!database->hasTable(u"KESTOperation"_s))
-                createJournal(*database, Dialect::Embedded);
+            createParts(database, missingParts(database));
         });
 }
 

@@ -56,15 +56,21 @@ void createTables(db::Connection& database, Dialect dialect)
     createJournal(database, dialect);
 }
 
-QList<Index> quoteIndexes()
+QList<Index> indexesIn(const QStringList& statements)
 {
     static const QRegularExpression form(u"^CREATE INDEX (\\w+) ON (\\w+) \\((.+)\\)$"_s);
     QList<Index> indexes;
-    for (const QString& statement : statementsIn(script(u"quote-indexes.sql"_s))) {
+    for (const QString& statement : statements) {
         const auto parts = form.match(statement);
-        indexes.append({parts.captured(1), parts.captured(2), parts.captured(3).split(u", "_s), statement});
+        if (parts.hasMatch())
+            indexes.append({parts.captured(1), parts.captured(2), parts.captured(3).split(u", "_s), statement});
     }
     return indexes;
+}
+
+QList<Index> quoteIndexes()
+{
+    return indexesIn(statementsIn(script(u"quote-indexes.sql"_s)));
 }
 
 void repairIndexes(db::Connection& database)

@@ -19,6 +19,8 @@ struct Index {
     QStringList columns;
     QString statement;  // which creates it, on every engine
 };
+/// Returns the indexes that these statements create.
+QList<Index> indexesIn(const QStringList& statements);
 /// Returns the indexes that serve the component's searches, as in quote-indexes.sql.
 QList<Index> quoteIndexes();
 /// Rebuilds all indexes of an embedded quote database, because another tool may have left them in another order, and

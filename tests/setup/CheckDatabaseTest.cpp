@@ -70,6 +70,14 @@ TEST_F(CheckedDatabase, GetsTheIndexesThatItLacksAndKeepsThoseThatServe)
     app::createParts(database, missing);
     EXPECT_TRUE(app::missingParts(database).isEmpty());
 
+    database->execute(u"DROP TABLE KESTJournal"_s);
+    database->execute(isEmbedded ? u"DROP INDEX KESTOperation_File"_s
+                                 : u"DROP INDEX KESTOperation_File ON KESTOperation"_s);
+    const QList<app::MissingPart> journal = app::missingParts(database);
+    ASSERT_EQ(journal.size(), 1);
+    EXPECT_EQ(journal[0].statements.size(), 4) << "the table, its two indexes, and one of the other table";
+    app::createParts(database, journal);
+
     database->execute(isEmbedded ? u"DROP INDEX OTHER"_s : u"DROP INDEX OTHER ON QUOTE1"_s);
     app::createParts(database, app::missingParts(database));
 }
