@@ -211,6 +211,8 @@ public:
             if (column.kind == Kind::Text && width > 0)
                 column.size = int(leadingNumber(type.sliced(width + 1)));
             column.hasDefault = !row[2].isNull() && row[2].toString().compare(u"NULL"_s, Qt::CaseInsensitive) != 0;
+            if (column.hasDefault)
+                column.fixedDefault = fixedDefault(row[2].toString(), column.kind);
             if (row[3].toInt() > 0) {
                 key.insert(row[3].toInt(), column.name);
                 keyType = type;

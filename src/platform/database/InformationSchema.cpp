@@ -24,6 +24,8 @@ TableColumn columnOf(const QVariant* row)
     column.readOnly = type == InformationSchemaTerms::readOnly;
     column.size = column.kind == Kind::Text && row[2].toLongLong() <= longestText ? row[2].toInt() : 0;
     column.hasDefault = !row[3].isNull() && textOf(row[3]) != u"NULL"_s;
+    if (column.hasDefault)
+        column.fixedDefault = fixedDefault(textOf(row[3]), column.kind);
     column.identity = row[4].toInt() == 1;
     static const QStringList exactTypes{u"decimal"_s, u"numeric"_s, u"money"_s, u"smallmoney"_s};
     if (exactTypes.contains(type, Qt::CaseInsensitive) && !row[5].isNull())

@@ -1,5 +1,9 @@
 #include "platform/database/Schema.h"
 
+#include "platform/database/ColumnValues.h"
+
+#include <QRegularExpression>
+
 #include <algorithm>
 
 namespace kest::db {
@@ -19,6 +23,18 @@ const TableColumn* TableInfo::identity() const
     const auto found =
         std::find_if(columns.begin(), columns.end(), [](const TableColumn& column) { return column.identity; });
     return found == columns.end() ? nullptr : &*found;
+}
+
+QVariant fixedDefault(QString text, Kind kind)
+{
+    while (text.startsWith(u'(') && text.endsWith(u')'))
+        text = text.sliced(1, text.size() - 2);
+    static const QRegularExpression literal(u"\\A(?:N?'((?:[^']|'')*)'|([-+]?[0-9.]+))\\z"_s);
+    const QRegularExpressionMatch match = literal.match(text);
+    if (!match.hasMatch())
+        return {};
+    const bool isNumber = match.hasCaptured(2);
+    return normalised(isNumber ? match.captured(2) : match.captured(1).replace(u"''"_s, u"'"_s), kind);
 }
 
 Kind kindOfType(const QString& declaredType)

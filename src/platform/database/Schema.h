@@ -18,6 +18,7 @@ struct TableColumn {
     bool identity = false;
     bool readOnly = false;  // computed, a version of the row, or a type that no statement compares or writes
     bool hasDefault = false;
+    QVariant fixedDefault = {};  // the default if it is a number or a text; null for any other expression
 };
 
 /// A table of the database.
@@ -42,6 +43,8 @@ public:
     virtual QString tableSpelling(const QString& name) = 0;
 };
 
+/// Returns the value of a default as the schema spells it, such as "((0))" or "'A'", or null if it is no literal.
+QVariant fixedDefault(QString text, Kind kind);
 /// Returns the kind of a column with that declared type.
 Kind kindOfType(const QString& declaredType);
 

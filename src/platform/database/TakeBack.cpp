@@ -72,8 +72,10 @@ bool holds(const TableInfo& table, const RowChange& change, const Rows& rows)
         if (const RowChange::Column* column = change.column(base.name)) {
             if (!isStoredAs(now, column->after, rows.columns[i]))
                 return false;
-        } else if (change.kind == ChangeKind::Insert && !base.hasDefault && !base.readOnly && !now.isNull()) {
-            return false;  // a column that the new row left empty has been filled since
+        } else if (change.kind == ChangeKind::Insert && !base.readOnly) {
+            const bool isKnown = !base.hasDefault || !base.fixedDefault.isNull();
+            if (isKnown && !isStoredAs(now, base.fixedDefault, rows.columns[i]))
+                return false;  // a column to which the new row gave no value has got one since
         }
     }
     return true;
