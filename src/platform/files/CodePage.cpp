@@ -25,10 +25,20 @@ char byteOf(char16_t c)
     return place == std::end(upperControls) ? '?' : static_cast<char>(0x80 + (place - std::begin(upperControls)));
 }
 
+bool isAscii(QStringView text)
+{
+    char16_t all = 0;
+    for (const QChar c : text)
+        all |= c.unicode();
+    return all < 0x80;
+}
+
 }  // namespace
 
 QByteArray toCodePage(const QString& text)
 {
+    if (isAscii(QStringView(text)))
+        return text.toLatin1();
     QByteArray bytes(text.size(), Qt::Uninitialized);
     char* out = bytes.data();
     for (qsizetype i = 0; i < text.size(); ++i) {
