@@ -4,6 +4,7 @@
 #include "base/Journal.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
+#include "base/modLoggerEx.h"
 #include "jobexport/Address.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
@@ -97,6 +98,7 @@ bool openJobLink(Export& job, const db::Recordset& settings)
             job.jobLink->open(text);
         } catch (const RuntimeError& error) {
             reached = error.number() != CannotOpen;
+            attempt([&] { logFailure(error, u"modLoadXML.WriteQuote"_s); });
             throw;
         }
     });
@@ -105,7 +107,14 @@ bool openJobLink(Export& job, const db::Recordset& settings)
 
 void makeJob(Export& job)
 {
-    attempt([&] { job.jobLink->execute(u"INSERT INTO newJob SET Status=0"_s); });
+    attempt([&] {
+        try {
+            job.jobLink->execute(u"INSERT INTO newJob SET Status=0"_s);
+        } catch (const RuntimeError& error) {
+            attempt([&] { logFailure(error, u"modLoadXML.WriteQuote"_s); });
+            throw;
+        }
+    });
     attempt([&] {
         db::Recordset identity(job.jobLink);
         identity.open(u"SELECT last_insert_id()"_s);

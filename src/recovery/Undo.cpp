@@ -39,7 +39,7 @@ QStringList obstaclesOfFiles(const journal::Entry& load)
     QStringList reasons;
     if (load.facts.contains(u"job"_s))
         reasons.append(u"It has exported job %1 to JobLink."_s.arg(load.facts[u"job"_s].toInteger()));
-    for (const QJsonValue& fact : load.facts)
+    for (const auto& fact : load.facts)
         if (fact.toString().endsWith(".jpg"_L1, Qt::CaseInsensitive))
             reasons.append(u"It has moved the picture %1."_s.arg(fact.toString()));
     if (!isMessageRead(load))

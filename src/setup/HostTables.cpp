@@ -35,6 +35,8 @@ void compare(const db::TableInfo& ours, const db::TableInfo* theirs, HostTables&
         const db::TableColumn* found = theirs->column(column.name);
         if (!found)
             result.missing += u"there is no column "_s + name;
+        else if (found->readOnly && !column.readOnly)
+            result.missing += name + u" can't be written"_s;
         else if (!agree(column.kind, found->kind))
             result.missing += name + u" holds another kind of value"_s;
         else if (found->kind == Kind::Text && found->size > 0 && (column.size == 0 || found->size < column.size))

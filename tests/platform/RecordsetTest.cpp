@@ -172,6 +172,17 @@ TEST_P(RecordsetOn, AMomentFinerThanAMillisecondTellsItsRow)
     EXPECT_EQ(query(u"SELECT * FROM MOMENTS WHERE what='b'"_s).recordCount(), 1);
 }
 
+TEST_P(RecordsetOn, AnExactNumberTellsItsRowAfterTheDatabaseHasRoundedIt)
+{
+    if (GetParam() == On::Tds)
+        GTEST_SKIP() << "the simulated server does not round";
+    connection->execute(u"CREATE TABLE PRICES (name VARCHAR(20), price DECIMAL(9,2))"_s);
+    connection->execute(u"INSERT INTO PRICES (name, price) VALUES ('door', 1)"_s);
+    Recordset prices = query(u"SELECT * FROM PRICES"_s);
+    for (const double price : {9.555, 1.005, -2.675, 9.554, 12.35})
+        EXPECT_EQ(written(prices, u"price"_s, price), 0) << price;
+}
+
 TEST_P(RecordsetOn, WithoutAKeyAllSelectedColumnsTellTheRow)
 {
     elsewhere(u"INSERT INTO TINTS (Code, Script) VALUES ('R', 'Red'), ('R', NULL)"_s);

@@ -68,6 +68,8 @@ QList<RowChange> rowsOf(ChangeKind kind, const TableInfo& table, const Rows& row
         RowChange change{kind, table.name, table.key, {}};
         for (size_t i = 0; i < width; ++i) {
             const ResultColumn& column = rows.columns[qsizetype(i)];
+            if (const TableColumn* base = table.column(column.name); base && base->readOnly)
+                continue;  // the database changes it by itself
             change.columns.append({column.name, column.kind, rows.values[size_t(row) * width + i], QVariant()});
             if (table.key.isEmpty() && column.kind != Kind::Number && column.kind != Kind::LongText)
                 change.key.append(column.name);

@@ -30,16 +30,17 @@ QString holds(const Dialect& dialect, const ResultColumn& column, const QVariant
 }
 
 /// The same, but an empty text for a floating-point number, and for an exact number with more digits than a double
-/// holds.
+/// holds. A database rounds 9.555 up to two digits, though its double is a little less.
 QString held(const Dialect& dialect, const ResultColumn& column, const QVariant& value)
 {
-    constexpr double exactDigits = 1e15;
+    constexpr double exactDigits = 1e14;
+    constexpr double roundedUp = 1 + 1e-15;
     if (column.kind != Kind::Number || (column.scale >= 0 && value.isNull()))
         return holds(dialect, column, value);
     if (column.scale < 0 || value.typeId() != QMetaType::Double ||
         std::abs(value.toDouble()) * std::pow(10, column.scale) >= exactDigits)
         return {};
-    return dialect.quoted(column.name) + u'=' + QString::number(value.toDouble(), 'f', column.scale);
+    return dialect.quoted(column.name) + u'=' + QString::number(value.toDouble() * roundedUp, 'f', column.scale);
 }
 
 }  // namespace

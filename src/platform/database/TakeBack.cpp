@@ -69,10 +69,12 @@ bool holds(const TableInfo& table, const RowChange& change, const Rows& rows)
     for (qsizetype i = 0; i < rows.columns.size(); ++i) {
         const TableColumn& base = table.columns[i];
         const QVariant& now = rows.values[size_t(i)];
+        if (base.readOnly)
+            continue;
         if (const RowChange::Column* column = change.column(base.name)) {
             if (!isStoredAs(now, column->after, rows.columns[i]))
                 return false;
-        } else if (change.kind == ChangeKind::Insert && !base.readOnly) {
+        } else if (change.kind == ChangeKind::Insert) {
             const bool isKnown = !base.hasDefault || !base.fixedDefault.isNull();
             if (isKnown && !isStoredAs(now, base.fixedDefault, rows.columns[i]))
                 return false;  // a column to which the new row gave no value has got one since

@@ -53,10 +53,10 @@ QByteArray toCodePage(const QString& text)
 
 bool isAscii(QByteArrayView bytes)
 {
-    char all = 0;  // not with std::all_of, whose early end prevents that many bytes are tested at once
+    uchar all = 0;  // not with std::all_of, whose early end prevents that many bytes are tested at once
     for (const char c : bytes)
-        all |= c;
-    return static_cast<signed char>(all) >= 0;
+        all |= static_cast<uchar>(c);
+    return all < 0x80;
 }
 
 QString fromCodePage(const QByteArray& bytes)

@@ -256,23 +256,22 @@ def column_of(declaration):
         r"\[?(\w+)\]?\s+\[?(\w+)\]?\s*(?:\(\s*(max|\d+)\s*(?:,\s*(\d+)\s*)?\))?(.*)", declaration, re.I | re.S).groups()
     kind = {"integer": "int", "rowversion": "timestamp", "double": "float"}.get(kind.lower(), kind.lower())
     declared = Type(kind, -1 if (size or "").lower() == "max" else int(size) if size else None, int(scale or 0))
-    rest = rest.upper()
-    identity, key = "IDENTITY" in rest, "PRIMARY KEY" in rest
-    default = re.search(r"DEFAULT\s+('(?:[^']|'')*'|\S+)", rest)
+    identity, key, filled = ("IDENTITY" in rest.upper(), "PRIMARY KEY" in rest.upper(), "NOT NULL" in rest.upper())
+    default = re.search(r"DEFAULT\s+('(?:[^']|'')*'|\S+)", rest, re.I)
     line = '"%s" ' % name
     if identity:
         line += "INTEGER PRIMARY KEY AUTOINCREMENT"
     else:
         line += "TEXT COLLATE SERVER" if declared.is_text or kind in ("xml", "datetime", "datetime2") else \
             "NUMERIC" if declared.is_number else "BLOB"
-        line += " NOT NULL" if key or "NOT NULL" in rest else ""
+        line += " NOT NULL" if key or filled else ""
         line += " PRIMARY KEY" if key else ""
-        line += " DEFAULT " + declaration[-len(rest):][default.start(1):default.end(1)] if default else ""
+        line += " DEFAULT " + default.group(1) if default else ""
         if declared.is_text and (declared.size or 0) > 0:
             line += ' CONSTRAINT truncated CHECK (length(rtrim("%s"))<=%d)' % (name, declared.size)
         elif declared.is_number:
             line += " CONSTRAINT unconverted CHECK (typeof(\"%s\")<>'text')" % name
-    return line, (name, kind, declared.size, declared.scale, "NO" if key or "NOT NULL" in rest else "YES",
+    return line, (name, kind, declared.size, declared.scale, "NO" if key or filled else "YES",
                   default and "(%s)" % default.group(1), int(identity), 1 if key else None)
 
 
