@@ -118,6 +118,7 @@ QList<MissingPart> missingParts(const db::ConnectionPtr& connection)
 
 void createParts(const db::ConnectionPtr& connection, const QList<MissingPart>& parts)
 {
+    connection->setCommandTimeout(0);  // an index on a large table takes long
     for (const MissingPart& part : parts) {
         for (const QString& statement : part.statements)
             connection->execute(statement);

@@ -1,5 +1,6 @@
 // Tests what only SQL Server and its drivers do, over its protocol.
 #include "platform/Databases.h"
+#include "platform/database/Change.h"
 #include "platform/database/Dialect.h"
 #include "platform/database/OdbcDrivers.h"
 #include "platform/database/Session.h"
@@ -86,6 +87,16 @@ TEST_P(SqlServer, AFailureMeansWhatItsNumberMeansOnThisServer)
         EXPECT_EQ(connection->state(), livesOn ? 1 : 0) << number;
         EXPECT_TRUE(!livesOn || thrown.sqlState() == state) << number << thrown.sqlState();
     }
+}
+
+TEST_P(SqlServer, ADeadlockEndsTheTransactionAndNotTheConnection)
+{
+    {
+        const db::Change change(*connection, u"LINE"_s, db::ChangeSteps::ReadAndWrite);
+        EXPECT_EQ(failureOf([&] { connection->session().engine().run(u"EXEC standin_fail @number=1205"_s); }),
+                  StatementFailed);
+    }
+    EXPECT_EQ(connection->state(), 1);
 }
 
 TEST_P(SqlServer, ALockThatTheServerRefusesIsNotTakenForSomebodyElses)

@@ -124,6 +124,7 @@ const Dialect& sqlServerDialect()
         .openQuote = u'[',
         .closeQuote = u']',
         .begin = u"BEGIN TRANSACTION"_s,
+        .rollback = u"IF @@TRANCOUNT > 0 ROLLBACK"_s,
         .lockedTable = u"%1 WITH (UPDLOCK, HOLDLOCK)"_s,
         .sessionNumber = u"SELECT @@SPID"_s,
         .identityInsert = u"SET IDENTITY_INSERT %1 "_s,

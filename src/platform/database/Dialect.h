@@ -22,14 +22,15 @@ struct Dialect {
     QChar openQuote = u'"';
     QChar closeQuote = u'"';
     QString defaultsOnly = QStringLiteral("DEFAULT VALUES");
-    QString sameDate = QStringLiteral("%1=%2");  // the condition that a date column equals a literal
-    QString sameLongText = QString();            // the same for a long text; empty if the database can't compare it
-    QString begin = QStringLiteral("BEGIN");     // begins a transaction
-    QString lockedTable = QStringLiteral("%1");  // a table in a SELECT that locks its rows until the commit
-    QString lockedEnd = QString();               // the end of such a SELECT
-    QString sessionNumber = QString();           // asks for the server's number of the connection
-    QString withoutTransactions = QString();     // asks for the tables whose changes can't be taken back
-    QString identityInsert = QString();          // with ON or OFF after it: lets an INSERT give the identity of its row
+    QString sameDate = QStringLiteral("%1=%2");     // the condition that a date column equals a literal
+    QString sameLongText = QString();               // the same for a long text; empty if the database can't compare it
+    QString begin = QStringLiteral("BEGIN");        // begins a transaction
+    QString rollback = QStringLiteral("ROLLBACK");  // ends it, also if the server has ended it by itself
+    QString lockedTable = QStringLiteral("%1");     // a table in a SELECT that locks its rows until the commit
+    QString lockedEnd = QString();                  // the end of such a SELECT
+    QString sessionNumber = QString();              // asks for the server's number of the connection
+    QString withoutTransactions = QString();        // asks for the tables whose changes can't be taken back
+    QString identityInsert = QString();  // with ON or OFF after it: lets an INSERT give the identity of its row
 
     /// Returns a literal with the prefix that its letters need. An index on a text column serves only one without.
     QString withPrefix(const QString& literal) const;

@@ -6,6 +6,7 @@
 #include <QCryptographicHash>
 #include <QHash>
 #include <QRegularExpression>
+#include <QScopeGuard>
 #include <QSet>
 
 #include <array>
@@ -76,8 +77,11 @@ public:
     }
     void unlock(const QString& name) override
     {
-        if (locks.remove(name))
-            run(u"EXEC sp_releaseapplock @Resource=%1, @LockOwner='Session'"_s.arg(resource(name)));
+        if (!locks.remove(name))
+            return;
+        auto dropped = qScopeGuard([&] { drop(); });  // a lock that could not be released goes with its session
+        run(u"EXEC sp_releaseapplock @Resource=%1, @LockOwner='Session'"_s.arg(resource(name)));
+        dropped.dismiss();
     }
 
     void endSession(const QString& session, const QString& lock) override

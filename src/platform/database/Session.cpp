@@ -176,7 +176,11 @@ QVariant Session::insert(const TableInfo& info, const QStringList& columns, cons
     const QString statement = u"INSERT INTO "_s + dialect().quoted(info.name) + u' ' + values;
     checkFault();
     const QVariant identity = answered([&] { return engine_->insert(statement); });
-    return !info.identity() || identity.isNull() ? QVariant() : QVariant(identity.toLongLong());
+    if (!info.identity())
+        return {};
+    if (identity.isNull())
+        throw RuntimeError(StatementFailed, u"The database has not told the number of the new row."_s);
+    return identity.toLongLong();
 }
 
 QString Session::translatedCondition(const QString& table, const QString& condition)
@@ -215,7 +219,7 @@ void Session::commit()
 void Session::rollback()
 {
     checkFault();
-    answered([&] { return engine_->run(u"ROLLBACK"_s); });
+    answered([&] { return engine_->run(dialect().rollback); });
 }
 
 void Session::abandon()

@@ -225,7 +225,9 @@ class Session:
         return 0
 
     def fail(self, arguments):
-        """As if the last statement had failed with that number."""
+        """As if the last statement had failed with that number. A deadlock ends the transaction."""
+        if arguments["number"] == 1205 and self.database.lite.in_transaction:
+            self.execute("ROLLBACK")
         raise ServerError(arguments["number"], "A failure that a test has asked for.")
 
     def fall_silent(self, _):
@@ -260,6 +262,10 @@ class Session:
 
     def transaction(self, text):
         verb = text.upper().split()[0]
+        if verb == "IF":
+            if not self.database.lite.in_transaction:
+                return wire.done()
+            verb = "ROLLBACK"
         if verb != "BEGIN" and not self.database.lite.in_transaction:
             raise ServerError(3902, "The %s TRANSACTION request has no corresponding BEGIN TRANSACTION." % verb)
         self.execute({"BEGIN": "BEGIN IMMEDIATE"}.get(verb, verb))
@@ -302,7 +308,7 @@ class Session:
         return wire.done()
 
     STEPS = {"SET": set_option, "WAITFOR DELAY": wait_for, "BEGIN TRAN": transaction, "BEGIN TRANSACTION": transaction,
-             "COMMIT": transaction, "ROLLBACK": transaction, "CREATE": define, "ALTER": define,
+             "COMMIT": transaction, "ROLLBACK": transaction, "IF @@TRANCOUNT > 0 ROLLBACK": transaction, "CREATE": define, "ALTER": define,
              "DROP": define, "DISABLE": define, "KILL": kill}
     PROCEDURES = {"sp_getapplock": get_lock, "sp_releaseapplock": release_lock, "standin_silence": fall_silent,
                   "standin_copy": copy_database, "standin_fail": fail, "standin_attentions": count_attentions,
