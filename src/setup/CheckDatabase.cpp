@@ -409,6 +409,15 @@ void Check::keepsTexts()
                                          : u"of %1 letters %2 came back"_s.arg(length).arg(stored.text(column).size()));
         }
     }
+    for (const QVariant& text : {QVariant(QString(u""_s)), QVariant()}) {
+        for (const auto& column : {u"notes"_s, u"remarks"_s, u"wideNotes"_s})
+            row.set(column, text);
+        row.update();
+        const Recordset stored = rows();
+        for (const auto& column : {u"notes"_s, u"remarks"_s, u"wideNotes"_s})
+            expect(stored.isNull(column) == text.isNull() && stored.text(column).isEmpty(),
+                   u"an empty or a Null %1 came back as another"_s.arg(column));
+    }
 }
 
 void Check::keepsDatesAndNumbers()
@@ -443,15 +452,16 @@ void Check::keepsDatesAndNumbers()
 
 void Check::compares()
 {
-    for (const QString& values :
-         {u"'Red', 0, 1"_s, u"'red  ', 5, 0"_s, u"'a[b', NULL, 0"_s, u"'', 7, 0"_s, u"'it''s', 10, 0"_s})
+    for (const QString& values : {u"'Red', 0, 1"_s, u"'red  ', 5, 0"_s, u"'a[b', NULL, 0"_s, u"'', 7, 0"_s,
+                                  u"'it''s', 10, 0"_s, u"'öl', 20, 0"_s})
         ours_->execute(u"INSERT INTO %1 (code, seq, flag) VALUES (%2)"_s.arg(table_, values));
     const std::pair<QString, int> conditions[] = {
         {u"code='RED'"_s, 2},     {u"code='red '"_s, 2},       {u"code LIKE 'RE_'"_s, 2},
         {u"code LIKE '%D'"_s, 2}, {u"code LIKE 'a[[]b'"_s, 1}, {u"code=''"_s, 1},
-        {u"code='it''s'"_s, 1},   {u"code<>'red'"_s, 3},       {u"seq=''"_s, 1},
-        {u"seq='5'"_s, 1},        {u"seq='5x'"_s, 0},          {u"seq<>'x'"_s, 4},
-        {u"seq IS NULL"_s, 1},    {u"flag=TRUE"_s, 1},         {u"code IN ('RED', 'IT''S')"_s, 3}};
+        {u"code='it''s'"_s, 1},   {u"code<>'red'"_s, 4},       {u"seq=''"_s, 1},
+        {u"seq='5'"_s, 1},        {u"seq='5x'"_s, 0},          {u"seq<>'x'"_s, 5},
+        {u"seq IS NULL"_s, 1},    {u"flag=TRUE"_s, 1},         {u"code IN ('RED', 'IT''S')"_s, 3},
+        {u"code='öl'"_s, 1},      {u"code LIKE 'ö%'"_s, 1},    {u"code LIKE '%[%'"_s, 1}};
     for (const auto& [condition, expected] : conditions) {
         const int found = rows(condition).recordCount();
         expect(found == expected, u"%1 finds %2 rows, not %3"_s.arg(condition).arg(found).arg(expected));
@@ -459,6 +469,9 @@ void Check::compares()
     Recordset newest(ours_);
     newest.open(u"SELECT TOP 1 code + ' and ' + code AS joined FROM %1 WHERE seq=10"_s.arg(table_));
     expect(newest.text(u"joined"_s) == u"it's and it's"_s, u"texts are not joined"_s);
+    Recordset counted(ours_);
+    counted.open(u"SELECT COUNT(*) AS found, MAX(seq) AS highest FROM "_s + table_);
+    expect(counted.text(u"found"_s) == u"6"_s && counted.text(u"highest"_s) == u"20"_s, u"rows are not counted"_s);
 }
 
 void Check::keepsVersions()
