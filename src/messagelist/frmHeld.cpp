@@ -14,6 +14,31 @@ using namespace Qt::StringLiterals;
 
 namespace kest {
 
+namespace {
+
+constexpr int sinceColumn = 2;
+
+/// A row of the list. Its times are sorted as times.
+class HeldItem final : public QTreeWidgetItem {
+public:
+    HeldItem(QTreeWidget* list, const HeldMessage& message)
+        : QTreeWidgetItem(list, {message.file, message.type, message.sinceText(), message.waitsFor})
+    {
+        setData(sinceColumn, Qt::UserRole, message.since);
+        for (int column = 0; column < columnCount(); ++column)
+            setToolTip(column, text(column));
+    }
+
+    bool operator<(const QTreeWidgetItem& other) const override
+    {
+        if (treeWidget()->sortColumn() != sinceColumn)
+            return QTreeWidgetItem::operator<(other);
+        return data(sinceColumn, Qt::UserRole).toDateTime() < other.data(sinceColumn, Qt::UserRole).toDateTime();
+    }
+};
+
+}  // namespace
+
 frmHeld::frmHeld(const QList<HeldMessage>& messages)
     : Form(u"frmHeld"_s, u"Held Messages"_s),
       ListView1(new QTreeWidget),
@@ -27,11 +52,8 @@ frmHeld::frmHeld(const QList<HeldMessage>& messages)
     constexpr std::array widths{2600, 2600, 2100};  // twips
     for (size_t column = 0; column < widths.size(); ++column)
         ListView1->setColumnWidth(static_cast<int>(column), desktop::pixels(widths[column]));
-    for (const HeldMessage& message : messages) {
-        auto* row = new QTreeWidgetItem(ListView1, {message.file, message.type, message.sinceText(), message.waitsFor});
-        for (int column = 0; column < row->columnCount(); ++column)
-            row->setToolTip(column, row->text(column));
-    }
+    for (const HeldMessage& message : messages)
+        new HeldItem(ListView1, message);
     ListView1->setCurrentItem(ListView1->topLevelItem(0));
     cmdView->setDefault(true);
     desktop::addListMenu(*ListView1, objectName(), {cmdView});

@@ -4,6 +4,8 @@
 #include "platform/profile.h"
 
 #include <QDialog>
+#include <QDir>
+#include <QFileInfo>
 #include <QHeaderView>
 #include <QScreen>
 #include <QSettings>
@@ -91,7 +93,8 @@ void WindowLayout::restore()
 
 void WindowLayout::remember() const
 {
-    if (window.objectName().isEmpty())
+    const QDir folder(QFileInfo(layoutFile()).path());
+    if (window.objectName().isEmpty() || folder.isEmpty())  // only an empty folder can become that of a new shop
         return;
     const State after = state();
     QSettings file(layoutFile(), QSettings::IniFormat);
