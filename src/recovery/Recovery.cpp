@@ -91,10 +91,9 @@ void settleSend(const journal::Entry& entry, journal::Operation& operation)
     tell({entry, isSent ? Outcome::Finished : Outcome::TakenBack, {}});
 }
 
-void settleComplete(const journal::Entry& entry, journal::Operation& operation)
+/// Ends an operation whose tables are complete. It stays unfinished until its message is moved.
+void endComplete(const journal::Entry& entry, journal::Operation& operation, bool isMoved, const QStringList& left)
 {
-    const QStringList left = isOf(entry, journal::Kind::Load) ? finishLoad(entry) : QStringList();
-    const bool isMoved = !isOf(entry, journal::Kind::Load) || !stillWaits(entry);
     if (isUnfinished(entry)) {
         if (isMoved)
             operation.end(journal::State::Done);
@@ -102,6 +101,14 @@ void settleComplete(const journal::Entry& entry, journal::Operation& operation)
     }
     operation.end(isMoved ? journal::State::Finished : journal::State::Unfinished);
     tell({entry, Outcome::Finished, left});
+}
+
+void settleComplete(const journal::Entry& entry, journal::Operation& operation)
+{
+    if (!isOf(entry, journal::Kind::Load))
+        return endComplete(entry, operation, true, {});
+    const QStringList left = finishLoad(entry);
+    endComplete(entry, operation, !stillWaits(entry), left);
 }
 
 void settleIncomplete(const journal::Entry& entry, journal::Operation& operation)
@@ -115,14 +122,7 @@ void settleIncomplete(const journal::Entry& entry, journal::Operation& operation
 void settleUndo(const journal::Entry& entry, journal::Operation& operation)
 {
     const QStringList left = finishUndo();
-    const bool isMoved = !isMessageToMove();
-    if (isUnfinished(entry)) {
-        if (isMoved)
-            operation.end(journal::State::Done);
-        return;
-    }
-    operation.end(isMoved ? journal::State::Finished : journal::State::Unfinished);
-    tell({entry, Outcome::Finished, left});
+    endComplete(entry, operation, !isMessageToMove(), left);
 }
 
 void settleAlone(journal::Entry entry, const QString& lockedFile)
