@@ -31,6 +31,7 @@ struct RowHistory {
     QString quote() const { return number + u'/' + subquote; }
     bool isNew() const { return net.kind == db::ChangeKind::Insert; }
     bool isOf(QLatin1StringView table) const { return net.table.compare(table, Qt::CaseInsensitive) == 0; }
+    bool isNewQuote() const { return isNew() && isOf("QUOTE1"_L1); }
 };
 
 enum class Moment { Before, After };
@@ -64,7 +65,8 @@ void putBefore(RowHistory& row, const db::RowChange& older)
     }
 }
 
-/// Returns the rows that an operation changed and that are not taken back yet, the one changed last first.
+/// Returns the rows that an operation changed and that are not taken back yet, the one changed last first. New quotes
+/// come after all others, because a quote goes only after its lines and notes, and its totals are stored after them.
 QList<RowHistory> rowsOf(qint64 operation)
 {
     QList<RowHistory> rows;
@@ -87,6 +89,7 @@ QList<RowHistory> rowsOf(qint64 operation)
             known.insert(identityOf(change->row, Moment::Before), row);
     }
     rows.removeIf([](const RowHistory& row) { return row.isGone; });
+    std::ranges::stable_partition(rows, [](const RowHistory& row) { return !row.isNewQuote(); });
     return rows;
 }
 
@@ -121,7 +124,7 @@ QSet<QString> quotesInUse(const QList<RowHistory>& rows)
 {
     QSet<QString> inUse;
     for (const RowHistory& quote : rows) {
-        if (!quote.isNew() || !quote.isOf("QUOTE1"_L1))
+        if (!quote.isNewQuote())
             continue;
         const auto own = [&](QLatin1StringView table) {
             return std::ranges::count_if(rows, [&](const RowHistory& row) {
@@ -185,8 +188,7 @@ QStringList takeBackTogether(const QList<RowHistory>& rows, const QSet<QString>&
     db::TakeBack together(*gConn);
     QList<qint64> taken;
     const QStringList left = refused(rows, inUse, [&](const RowHistory& row) {
-        const bool isNewQuote = row.isNew() && row.isOf("QUOTE1"_L1);
-        if ((isNewQuote && hasMore(row, 0, 0)) || !together.undo(row.net))
+        if ((row.isNewQuote() && hasMore(row, 0, 0)) || !together.undo(row.net))
             return false;
         if (record)
             record(reversed(row.net));

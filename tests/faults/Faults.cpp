@@ -134,8 +134,9 @@ struct HiddenWindows final : desktop::WindowDriver {
 class Trial {
 public:
     Trial(const QString& name, const Work& work, std::optional<ScriptedDesktop>& desktop);
-    /// Does the work with a fault at one of its calls, goes on as a user would, and compares.
-    void disturb(Fault fault, int number);
+    /// Does the work with a fault at one of its calls, goes on as a user would, and compares. Returns false if a
+    /// process that was to be killed came to its end.
+    bool disturb(Fault fault, int number);
     void tellWhatCameUp(bool isWhole) const;
 
     /// The kinds of the undisturbed work's calls.
@@ -144,7 +145,8 @@ public:
 private:
     /// Returns what the user sees.
     QString run(Fault fault = Fault::None, int number = 0);
-    void killAt(int number);
+    bool killAt(int number);
+    void takeSeat();
     std::string shop() const { return numbered(work.result ? work.result() : holdings()); }
     bool isKnown(Fault fault, const QString& account);
 
@@ -172,29 +174,44 @@ Trial::Trial(const QString& ofName, const Work& ofWork, std::optional<ScriptedDe
     expected = shop();
 }
 
-QString Trial::run(Fault fault, int number)
+/// Sits a user down before the shop.
+void Trial::takeSeat()
 {
     desktop.emplace(work.answers);
     desktop::setWindowDriver(std::make_shared<HiddenWindows>(work));
     statusShown.clear();
+}
+
+QString Trial::run(Fault fault, int number)
+{
+    takeSeat();
     {
         Calls counted(fault, number);
         desktop::guarded(u"work"_s, work.doIt);
         if (kinds_.isEmpty())
             kinds_ = counted.kinds;
     }
+    if (fault == Fault::None && work.meanwhile)
+        work.meanwhile();
     return desktop->boxTexts().join(u'\n') + u'\n' + statusShown;
 }
 
-/// Ends another process of the same workstation at that call.
-void Trial::killAt(int number)
+/// Ends another process of the same workstation at that call. Returns false if it has
+/// fewer calls.
+bool Trial::killAt(int number)
 {
     closeConnections();
     const pid_t child = ::fork();
     if (child == 0) {
+        takeSeat();
+        const Calls counted(Fault::Kill, number);
+        EnsureConnection();  // which settles what it finds
+        desktop::guarded(u"work"_s, work.doIt);
+        ::_exit(1);
+    }
+    if (work.meanwhile) {
         EnsureConnection();
-        run(Fault::Kill, number);
-        ::_exit(0);
+        work.meanwhile();
     }
     int status = 0;
     ::waitpid(child, &status, 0);
@@ -202,6 +219,7 @@ void Trial::killAt(int number)
     EnsureConnection();
     waitForLocks();
     removeTemporaryFiles();
+    return WEXITSTATUS(status) == 0;
 }
 
 bool Trial::isKnown(Fault fault, const QString& account)
@@ -216,15 +234,16 @@ bool Trial::isKnown(Fault fault, const QString& account)
     return false;
 }
 
-void Trial::disturb(Fault fault, int number)
+bool Trial::disturb(Fault fault, int number)
 {
     ++faults;
+    bool isReached = true;
     before.restore();
     work.prepare();
     const qint64 logBefore = logSize();
     QString first = u"killed"_s;
     if (fault == Fault::Kill)
-        killAt(number);
+        isReached = killAt(number);
     else
         first = run(fault, number);
     const bool isTold = first != undisturbed || logSize() > logBefore;
@@ -232,15 +251,19 @@ void Trial::disturb(Fault fault, int number)
     attempt([] { Faults::openList(); });  // this takes interrupted work back, or finishes it
     const QString second = work.isDone() ? QString() : run();
     const std::string found = shop();
+    EXPECT_EQ(rowCount("KESTOperation", "State IN ('open', 'interrupted')"), 0)
+        << name << ' ' << faultWords[int(fault)] << ' ' << number << '\n'
+        << files::read(errorLogPath());
     if (found == expected && (isDone || isTold) && (second.isEmpty() || second == undisturbed))
-        return;
+        return isReached;
     const QString account =
         u"%1: %2 %3 of %4 (%5)\nfirst: %6: %7\nsecond: %8\n"_s.arg(name, QString::fromLatin1(faultWords[int(fault)]))
             .arg(number)
             .arg(kinds_.size())
-            .arg(kinds_[number - 1], isDone ? u"done"_s : u"not done"_s, first, second) +
+            .arg(kinds_.value(number - 1), isDone ? u"done"_s : u"not done"_s, first, second) +
         (isTold ? u""_s : u"in silence\n"_s) + QString::fromStdString(difference(expected, found));
     EXPECT_TRUE(isKnown(fault, account)) << account;
+    return isReached;
 }
 
 void Trial::tellWhatCameUp(bool isWhole) const
@@ -285,12 +308,14 @@ void Faults::survives(const QString& name, const Work& work)
 {
     const bool isWhole = qEnvironmentVariable("KEST2_TEST_FAULTS") == u"all"_s && !shopIsOnServer();
     Trial trial(name, work, desktop);
-    for (const Fault fault : {Fault::Once, Fault::FromThenOn, Fault::Lost, Fault::Kill}) {
-        if (shopIsOnServer() && fault != Fault::Kill)
-            continue;
-        for (int number = 1; number <= trial.kinds().size(); number += isWhole ? 1 : 10)
+    QList<Fault> faults{Fault::Once, Fault::FromThenOn, Fault::Lost, Fault::Kill};
+    faults.remove(0, work.meanwhile ? 3 : shopIsOnServer() ? 2 : 0);
+    for (const Fault fault : faults) {
+        const int stride = isWhole || (fault == Fault::Lost && !shopIsOnServer()) ? 1 : 10;
+        for (int number = 1; fault == Fault::Kill || number <= trial.kinds().size(); number += stride)
             if (fault != Fault::Lost || trial.kinds()[number - 1] == u"statement"_s)
-                trial.disturb(fault, number);
+                if (!trial.disturb(fault, number))
+                    break;
     }
     trial.tellWhatCameUp(isWhole);
 }

@@ -15,9 +15,11 @@ struct Work {
     std::function<std::string()> result = {};  // what is compared, instead of the shop
     const char* answers = "{}";                // a script for the boxes
     std::map<QString, std::function<void(QDialog&)>> windows = {};  // what is done in each, which is not shown
+    std::function<void()> meanwhile = {};  // only if killed: what another process does then
 };
 
-/// The setting KEST2_TEST_FAULTS=all lets every call fail; otherwise every tenth does.
+/// The setting KEST2_TEST_FAULTS=all lets every call fail; otherwise every statement loses the connection, and every
+/// tenth call has each other fault.
 class Faults : public Shop {
 public:
     /// Opens the list of messages and returns its files.

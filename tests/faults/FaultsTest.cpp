@@ -6,6 +6,8 @@
 #include "messages/Folders.h"
 #include "outbound/SendQuote.h"
 #include "quotedata/QuoteTotals.h"
+#include "recovery/Recovery.h"
+#include "recovery/Undo.h"
 #include "reports/PrintXML.h"
 #include "support/MariaDbServer.h"
 #include "utilities/frmLogin.h"
@@ -40,6 +42,7 @@ TEST_F(Loads, Requests)
 TEST_F(Loads, StatusMessages)
 {
     quote("500").request("QR1").quoteNumber("KQ1").stage(3).note("Responded Quote Request").line(1);
+    quote("500").remarks("O'Brien \\ says\r\nso", "p_remarks");
     const std::pair<const char*, Message> cases[] = {
         {"Match", quoteMatch("500")},
         {"Revision", revisionRequest("QR1")},
@@ -132,6 +135,57 @@ TEST_F(Others, Move)
     Work move = loadOf();
     move.doIt = [] { MoveMessage(u"m.xml"_s, u"read"_s); };
     survives(u"Move"_s, move);
+}
+
+TEST_F(Lines, Settling)
+{
+    arrive("m.xml", authorisedQuote("500").set("excess", "400").labour(1, "C").part(2, "D").paint(3, "I"));
+    for (const int lost : {30, 1000}) {  // before and after the point of no return
+        const auto isSettled = [] { return rowCount("KESTOperation", "State='open'") == 0; };
+        survives(u"Settling"_s, {[] { openList(); }, isSettled,
+                                 [lost] {
+                                     EnsureConnection();
+                                     int statement = 0;
+                                     db::setStatementFault([&] { return ++statement >= lost; }, CannotOpen);
+                                     attempt([] { loadAsTheWindow(u"m.xml"_s); });
+                                     db::setStatementFault({});
+                                     if (lost == 1000)  // the process dies before it can close the operation
+                                         gConn->execute(u"UPDATE KESTOperation SET State='open'"_s);
+                                 }});
+    }
+}
+
+TEST_F(Lines, Undo)
+{
+    vendor("Straightline Alignment");  // a new one would stay
+    static qint64 load;
+    arrive("m.xml", authorisedQuote("500").set("excess", "400").labour(1, "C").part(2, "D").sublet(4, "I"));
+    const auto isUnread = [] { return files::exists(gsUnreadPath + u"m.xml"_s); };
+    survives(u"Undo"_s, {[=] {
+                             if (!isUnread())
+                                 recovery::undo(load);
+                         },
+                         isUnread,
+                         [] {
+                             EnsureConnection();
+                             EXPECT_TRUE(loadAsTheWindow(u"m.xml"_s));
+                             load = Row("KESTOperation", "Operation=(SELECT MAX(Operation) FROM KESTOperation)").id();
+                         }});
+}
+
+TEST_F(Lines, LoadBesideAnother)
+{
+    quote("501").request("QR501").stage(3).note("Responded Quote Request");
+    arrive("m.xml", authorisedQuote("500").set("excess", "400").labour(1, "C").paint(3, "I"));
+    arrive("n.xml", cancellation("QR501"));
+    Work load = loadOf();
+    load.doIt = [] { loadAsTheWindow(u"m.xml"_s); };
+    load.meanwhile = [] {
+        if (files::exists(gsUnreadPath + u"n.xml"_s))
+            loadAsTheWindow(u"n.xml"_s);
+        recovery::settle();
+    };
+    survives(u"LoadBesideAnother"_s, load);
 }
 
 TEST_F(Others, Send)
