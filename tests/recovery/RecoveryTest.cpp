@@ -1,4 +1,4 @@
-// Work that loses its connection at any statement ends, once it is settled and repeated, as if nothing had happened.
+// What becomes of interrupted work when it is settled, and what the user is told.
 #include "inbound/modLoadXML.h"
 #include "messagelist/frmMessageList.h"
 #include "messages/Folders.h"
@@ -11,56 +11,6 @@
 namespace kest::test {
 
 using namespace Qt::StringLiterals;
-
-TEST_F(Interrupted, ALoadHappensOnce)
-{
-    desktop.emplace(R"({"boxes": [{"text": "want to continue", "answer": "yes"}]})");
-    arrive("QR9_001.jpg", "picture");
-    arrive("QR9_001.txt", "its text");
-    const std::pair<Text, const char*> sublet("subletAuthorityDocument", "JVBERi0xLjQ=");
-    for (const Message& message :
-         {authorisedQuote("500")
-              .set("excess", "400")
-              .labour(1, "C")
-              .part(2, "D")
-              .paint(3, "I")
-              .sublet(5, "I", {sublet}),
-          manualQuote("500").labour(1, "I").part(2, "I"), quoteRequest("QR9").images({"1"}), cancellation("QR1"),
-          cancellationBackout("QR1"), revisionRequest("QR1"), excessWaiver("500"), quoteMatch("500"),
-          adjustedQuote("500"), assessmentResult("KQ1"), assessmentBackout("QR1"), quoteDeletion("KQ1"),
-          quoteDeletion("KQ2")}) {
-        arrive("m.xml", message);
-        SCOPED_TRACE(message.text().left(60).toStdString());
-        interruptEachStatement([] { loadAsTheWindow(u"m.xml"_s); }, loadIfItWaits);
-    }
-    EXPECT_EQ(outcomes, both);
-}
-
-TEST_F(Interrupted, AResponseHappensOnce)
-{
-    quote("500").note("Sending KEST Quote");
-    arrive("R_500_0.xml", submissionResponse("KQ7"));
-    interruptEachStatement([] { listed(); }, [] { listed(); });
-    EXPECT_EQ(outcomes, both);
-}
-
-TEST_F(Interrupted, ASendHappensOnce)
-{
-    sendable("600").request("QR6").note("Active Quote Request");
-    for (const char* picture : {"600_0001.jpg", "600_0002.jpg"})
-        files::write(gsImagesPath + QString::fromLatin1(picture), u"picture"_s);
-    const auto sendIfOpen = [] {
-        if (!quote("600").locked())
-            send("600");
-    };
-    interruptEachStatement([] { send("600"); }, sendIfOpen);
-    EXPECT_EQ(outcomes, both);
-
-    send("600");  // after this, the first change of another send is that of the car
-    quote("600").locked(false).stage(1).remarks("(01/02/2008 : Active Quote Request)");
-    car("ABC123").set("Year", "1998");
-    interruptEachStatement([] { send("600"); }, sendIfOpen);
-}
 
 TEST_F(Interrupted, ASendIsNotFinishedOverItsAnswer)
 {
@@ -103,10 +53,16 @@ TEST_F(Interrupted, TheUserIsToldWhatBecameOfIt)
 
 TEST_F(Interrupted, TheListTellsWhatWasSettledBesideItsMessages)
 {
-    arrive("m.xml", adjustedQuote("500"));
-    EXPECT_TRUE(interrupt(20, [] { loadAsTheWindow(u"m.xml"_s); }));
     frmMessageList window;
     const auto line = [&] { return window.findChild<QLabel*>(u"lblStatus"_s)->text(); };
+    const auto loseConnectionAt = [](int number, const std::function<void()>& work) {
+        int statement = 0;
+        db::setStatementFault([&] { return ++statement == number; }, CannotOpen);
+        attempt(work);
+        db::setStatementFault({});
+    };
+    arrive("m.xml", adjustedQuote("500"));
+    loseConnectionAt(20, [] { loadAsTheWindow(u"m.xml"_s); });
     window.openUnread();
     EXPECT_TRUE(line().startsWith(u"The load of m.xml was interrupted"_s) && line().endsWith(u" No unread messages"_s))
         << line();
@@ -114,10 +70,8 @@ TEST_F(Interrupted, TheListTellsWhatWasSettledBesideItsMessages)
     bool isTold = false;
     for (int number = 1; number < 50 && !isTold; ++number) {
         arrive("m.xml", adjustedQuote("500"));
-        int statement = 0;
-        db::setStatementFault([&] { return ++statement == number; }, CannotOpen);
-        const bool isLoaded = window.loadFile(u"m.xml"_s);  // which includes the delayed refresh
-        db::setStatementFault({});
+        bool isLoaded = true;
+        loseConnectionAt(number, [&] { isLoaded = window.loadFile(u"m.xml"_s); });  // and the delayed refresh
         isTold = !isLoaded && line().startsWith(u"The load of m.xml was interrupted"_s);
     }
     EXPECT_TRUE(isTold);
@@ -264,27 +218,6 @@ TEST_F(Interrupted, PicturesThatCouldNotBeSentAreSentLater)
     EXPECT_EQ(filesIn(gsUnsentPath),
               (QStringList{u"600.0_1.xml"_s, u"I_600_0001.xml"_s, u"I_600_0002.jpg"_s, u"I_600_0002.xml"_s}));
     EXPECT_EQ(newest().text("State"), "done");
-}
-
-TEST_F(Interrupted, RecoveryMayBeInterruptedToo)
-{
-    arrive("m.xml", authorisedQuote("500").set("excess", "400").labour(1, "C").part(2, "D").paint(3, "I"));
-    for (const int lost : {30, 1000}) {  // before and after the point of no return
-        const auto load = [lost] {
-            int statement = 0;
-            db::setStatementFault([&] { return ++statement >= lost; }, CannotOpen);
-            attempt([] { loadAsTheWindow(u"m.xml"_s); });
-            db::setStatementFault({});
-            if (lost == 1000)  // the process dies before it can close the operation
-                gConn->execute(u"UPDATE KESTOperation SET State='open'"_s);
-        };
-        const auto settle = [] {
-            EnsureConnection();
-            recovery::settle();
-        };
-        interruptEachStatement(settle, loadIfItWaits, load);
-    }
-    EXPECT_EQ(outcomes, both) << "nothing is left";
 }
 
 TEST_F(Interrupted, TheNewestChangeOfARowIsTakenBackFirst)

@@ -149,19 +149,6 @@ TEST_F(UndoOfALoad, AsksFirstAndSaysWhyItIsRefused)
     EXPECT_TRUE(files::exists(gsUnreadPath + u"m.xml"_s));
 }
 
-TEST_F(UndoOfALoad, IsFinishedIfItWasInterrupted)
-{
-    qint64 load = 0;
-    const auto undo = [&] {
-        if (!files::exists(gsUnreadPath + u"m.xml"_s))
-            recovery::undo(load);
-        EXPECT_EQ(titleAndState(load), u"load of m.xml: taken back"_s);
-        EXPECT_EQ(rowCount("KESTOperation", "State='unfinished'"), 0);
-    };
-    interruptEachStatement([&] { recovery::undo(load); }, undo, [&] { load = loaded(u"m.xml"_s, authorisation()); });
-    EXPECT_EQ(outcomes, QSet<QString>{u"finished"_s});
-}
-
 TEST_F(UndoOfALoad, KeepsWhatOtherLoadsMayUse)
 {
     const qint64 operation = loaded(u"m.xml"_s, quoteRequest("QR9").rego("NEW001"));
@@ -192,6 +179,15 @@ TEST_F(UndoOfALoad, LeavesARowThatSomeoneElseHasChangedWhole)
     EXPECT_TRUE(quote("500").line(2).shows("category=PRT rrhour=80")) << "the deleted line is back";
     EXPECT_EQ(quote("500").state(), "3 open KQ1 (01/02/2008 : Responded Quote Request)");
     EXPECT_EQ(quote("500").number("excess"), 500);
+}
+
+TEST_F(UndoOfALoad, LeavesANewRowThatSomeoneElseHasFilled)
+{
+    const qint64 operation = loaded(u"m.xml"_s, authorisedQuote("500").paint(7, "I").labour(8, "I"));
+    quote("500").line(7).set("Report_on", 1);  // the load gave it no value, so the table gave it 0
+    EXPECT_EQ(recovery::takeBack(operation).size(), 1);
+    EXPECT_EQ(rowCount("QUOTE2", "SEQ_NO=7"), 1);
+    EXPECT_EQ(rowCount("QUOTE2", "SEQ_NO=8"), 0);
 }
 
 TEST_F(UndoOfALoad, LeavesANewQuoteThatSomeoneElseWorksOn)
