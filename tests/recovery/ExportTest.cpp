@@ -7,10 +7,6 @@
 #include "support/MariaDbServer.h"
 #include "support/Shop.h"
 
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
-
 using InterruptedExport = Shop;
 
 TEST_F(InterruptedExport, IsMadeUnlessItHasBegunAndToldIfItIsNotComplete)
@@ -63,5 +59,3 @@ TEST_F(InterruptedExport, IsMadeUnlessItHasBegunAndToldIfItIsNotComplete)
         EnsureConnection();
     }
 }
-
-}  // namespace kest::test

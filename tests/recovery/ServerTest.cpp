@@ -8,10 +8,6 @@
 #include "support/MariaDbServer.h"
 #include "support/Shop.h"
 
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
-
 namespace {
 
 struct RecoveryOnAServer : Shop {
@@ -106,5 +102,3 @@ TEST_F(RecoveryOnAServer, AJournalThatMayNotBeWrittenStopsNoLoad)
     }
     EXPECT_EQ(timesLogged(u"denied"_s), 3) << "each reason once";
 }
-
-}  // namespace kest::test

@@ -1,12 +1,7 @@
 // A load is undone as a whole or not at all. What is taken back leaves what others use or have changed.
-#include "platform/RuntimeError.h"
 #include "recovery/Interrupted.h"
 #include "recovery/TakeBack.h"
 #include "recovery/Undo.h"
-
-namespace kest::test {
-
-using namespace Qt::StringLiterals;
 
 struct UndoOfALoad : Interrupted {
     UndoOfALoad() { vendor("Straightline Alignment"); }  // a new one would stay
@@ -212,5 +207,3 @@ TEST_F(UndoOfALoad, LeavesANewQuoteThatSomeoneElseWorksOn)
         EXPECT_NE(quote(number).notes(), "") << "with its notes, or nobody could send it";
     }
 }
-
-}  // namespace kest::test
