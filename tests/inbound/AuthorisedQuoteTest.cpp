@@ -76,19 +76,13 @@ TEST_F(AuthorisedQuotes, TotalsFollowTheMergedLines)
                          .labour(2, "D")
                          .part(3, "C", {{"partQuantity", "3"}})
                          .paint(8, "I")
-                         .labour(9, "I", {{"labourType", "OTH"}, {"labourAmount", "12.5"}})));
+                         .labour(9, "I", {{"labourType", "OTH"}, {"labourAmount", "12.5"}})
+                         .sublet(77, "D")));  // the last one is not in the quote
     EXPECT_EQ(quote("500").lines(), 4);
     EXPECT_TRUE(quote("500").shows("TOTAL=226 PRTTOTAL=750 MISTOTAL=12.5"));
     const QByteArray report = QJsonDocument(desktop->record().windows).toJson();
     for (const char* onlyNow : {"\"988.5\"", "\"990\"", "\"137\""})  // the total and the codes of new lines
         EXPECT_TRUE(report.contains(onlyNow)) << onlyNow;
-}
-
-TEST_F(AuthorisedQuotes, TotalsCountAllLinesIfTheLastOneIsNotInTheQuote)
-{
-    quote("500").line(1).set("rrhour", 2).set("rr_rate2", 38);
-    EXPECT_TRUE(load(authorisedQuote("500").labour(1, "N").part(77, "D")));
-    EXPECT_EQ(quote("500").number("TOTAL"), 76);
 }
 
 TEST_F(AuthorisedQuotes, ANoteOfTheRequestIsAddedOnlyWhereItHasOne)

@@ -35,15 +35,6 @@ TEST_F(Requests, ARequestBecomesANewQuote)
     EXPECT_EQ(quote("1001").notes(), "(today : Active Quote Request)");
 }
 
-TEST_F(Requests, ATextThatAStatementCouldTripOverIsATextLikeAnyOther)
-{
-    EXPECT_TRUE(load(quoteRequest("QR\\1")));
-    EXPECT_FALSE(load(quoteRequest("qr\\1")));
-    EXPECT_EQ(shown(), "[critical] Quote Request already exists as quote number 1001!");
-    EXPECT_TRUE(load(cancellation("QR\\1").reason("it's \\ sold")));
-    EXPECT_EQ(quote("1001").notes(), "(today : QR Cancelled - it's \\ sold) (today : Cancelled Quote Request)");
-}
-
 TEST_F(Requests, TheUniversalInsurerIsPreferredAmongMany)
 {
     const QString universal = u"KEST Universal Insurer"_s;

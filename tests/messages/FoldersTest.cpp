@@ -1,5 +1,4 @@
 #include "messages/Folders.h"
-#include "support/FullDisk.h"
 #include "support/Shop.h"
 
 struct MessageFolders : Shop {
@@ -68,19 +67,4 @@ TEST_F(MessageFolders, ARequestTakesThePlaceOfTheEarlierOneOrStaysUnread)
     arrive("in.xml", quoteMatch("123"));
     MoveMessage(u"in.xml"_s, u"read"_s);
     EXPECT_EQ(filesIn(gsUnreadPath), QStringList{u"in.xml"_s});
-}
-
-TEST_F(MessageFolders, AnOldCopySurvivesAFullDisk)
-{
-    quote("500").request("QR1");
-    files::write(gsReadPath + u"500.xml"_s, u"old"_s);
-    arrive("in.xml", quoteRequest("QR1"));
-    {
-        const FullDisk full(100);
-        MoveMessage(u"in.xml"_s, u"read"_s);
-    }
-    EXPECT_EQ(files::read(gsReadPath + u"500.xml"_s), u"old"_s);
-    EXPECT_EQ(filesIn(gsUnreadPath), QStringList{u"in.xml"_s});
-    MoveMessage(u"in.xml"_s, u"read"_s);
-    EXPECT_NE(files::read(gsReadPath + u"500.xml"_s), u"old"_s);
 }
