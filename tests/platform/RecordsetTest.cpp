@@ -63,25 +63,6 @@ TEST_P(RecordsetOn, AKindOfColumnHasOneTypeOnEveryEngine)
     EXPECT_EQ(failureOf([&] { lines.value(u"nosuch"_s); }), NoSuchColumn);
 }
 
-TEST_P(RecordsetOn, ANewRowHoldsItsDefaultsAtOnce)
-{
-    add(u"A"_s, 1);
-    lines.addNew();
-    EXPECT_EQ(lines.absolutePosition(), 2);
-    EXPECT_TRUE(lines.isNull(u"amount"_s));
-    write(u"CODE"_s, u"B"_s);
-    EXPECT_EQ(lines.value(u"id"_s), QVariant(qint64(2)));
-    EXPECT_EQ(lines.value(u"amount"_s), QVariant(0.0));
-    EXPECT_EQ(lines.value(u"flag"_s), QVariant(false));
-    EXPECT_TRUE(lines.isNull(u"SEQ"_s));
-    write(u"SEQ"_s, 2);  // the row can be changed again, by its new identity
-    EXPECT_EQ(count(u"CODE='B' AND SEQ=2"_s), 1);
-
-    lines.addNew();  // no column set, so all have their defaults
-    lines.update();
-    EXPECT_EQ(lines.value(u"id"_s), QVariant(qint64(3)));
-}
-
 TEST_P(RecordsetOn, AnUpdateWritesOnlyWhatDiffers)
 {
     add(u"A"_s, 1);
@@ -308,22 +289,3 @@ TEST_P(RecordsetOn, AFilterShowsTheRowsThatMatch)
 }
 
 INSTANTIATE_TEST_SUITE_P(Engines, RecordsetOn, ::testing::Values(On::Embedded, On::MySql, On::Odbc, On::Tds));
-
-TEST(DeclaredTable, CutsTextsToTheirFields)
-{
-    Recordset table;
-    table.declare(u"Name"_s, Kind::Text, 5);
-    table.declare(u"Price"_s, Kind::Number);
-    table.openDeclared();
-    EXPECT_TRUE(table.eof());
-    table.addNew();
-    table.set(u"name"_s, u"Windscreen"_s);
-    EXPECT_EQ(table.recordCount(), 1);
-    table.set(u"Price"_s, u"12.50"_s);
-    table.addNew();
-    table.moveFirst();
-    EXPECT_EQ(table.text(u"Name"_s), u"Winds"_s);
-    EXPECT_EQ(table.value(u"Price"_s), QVariant(12.5));
-    table.moveNext();
-    EXPECT_TRUE(table.isNull(u"Price"_s));
-}

@@ -4,6 +4,8 @@
 #include "setup/HostTables.h"
 #include "setup/PrepareDatabase.h"
 #include "setup/QuoteDatabase.h"
+#include "support/MariaDbServer.h"
+#include "support/OdbcDrivers.h"
 #include "support/Shop.h"
 
 /// Returns the points with that result, and why they have it.
@@ -41,6 +43,14 @@ TEST_F(CheckedDatabase, HoldsAndIsLeftAsItWas)
     EXPECT_FALSE(check.facts.first().second.trimmed().isEmpty());
     if (app::serverOf(gConn) == app::Server::SqlServer) {
         EXPECT_EQ(pointsThat(app::CheckedPoint::Result::Skipped, check), "");
+    }
+    if (app::serverOf(gConn) == app::Server::MySql) {
+        const auto overOdbc = [] {
+            auto made = std::make_shared<db::Connection>();
+            made->open(mariaDb().connectionText(gsDatabase, odbcMariaDb));
+            return made;
+        };
+        EXPECT_EQ(failures(overOdbc), "");
     }
     EXPECT_EQ(tables(), before);
     EXPECT_EQ(holdings(), held);
