@@ -73,13 +73,3 @@ TEST_F(Handling, NothingMovesWhenTheFilterAppears)
         EXPECT_EQ(places(), before);
     });
 }
-
-TEST_F(Handling, AScriptLeavesThePersonsLayoutAlone)
-{
-    desktop.emplace(R"json({"windows": {"frmMessageList": [[{"resize": [15000, 7000]},
-                            {"key": "ListView1", "keys": "Ctrl+1"}]]}})json");
-    frmMessageList::ShowForm();
-    EXPECT_FALSE(files::exists(root() + u"/windows.ini"_s));
-    work([](QDialog& window) { window.resize(900, 600); });
-    EXPECT_TRUE(files::exists(root() + u"/windows.ini"_s)) << "a person's layout is kept";
-}

@@ -96,21 +96,6 @@ TEST_F(Printing, EachTypeHasItsReportOrNone)
     EXPECT_EQ(shown().substr(0, 67), "[none] An error 91 has occured, Please contact MarlinDesk Support\r\n");
 }
 
-TEST_F(Printing, AMessageIsRepairedForItsReportAsForItsLoad)
-{
-    quote("500").request("QR1");
-    const std::pair<Message, const char*> cases[] = {
-        {quoteRequest("QR1").set("claimDescription", "Hail and wind"), "frmPrintPreview710"},
-        {cancellation("QR1").reason("Hail and wind"), ""},
-    };
-    for (const auto& [message, reports] : cases) {
-        print(message.text().replace(u"Hail and"_s, u"Hail &"_s));
-        EXPECT_EQ(shownReports(), reports);
-        EXPECT_EQ(shown(), "");
-        EXPECT_TRUE(files::read(gsReadPath + u"message.xml"_s).contains(u"Hail & wind"_s)) << "the file stays";
-    }
-}
-
 TEST_F(Printing, TheListWindowReprintsItsReadMessages)
 {
     quote("500").request("QR1").line(1, "PRT").set("qty", 1.0);
@@ -120,14 +105,6 @@ TEST_F(Printing, TheListWindowReprintsItsReadMessages)
     window.chooseFolder(MessageFolder::Read);
     EXPECT_TRUE(window.reprintFile(u"a.xml"_s));
     EXPECT_EQ(cells(onlyWindow(), 0, "action"), "N") << "the deleted line is left out";
-}
-
-TEST_F(Printing, AnAuthorisationAlsoShowsItsSubletDocuments)
-{
-    quote("500", 1).request("QR1").line(7, "MIS", "Alignment").set("qty", 1.0);
-    files::writeBytes(u"c:\\wirdoc\\PDF\\500.1_7.pdf"_s, "%PDF-1.4");
-    print(authorisedQuote("500/1"));
-    EXPECT_EQ(shownReports(), "frmPrintPreview730 frmSubletAuth");
 }
 
 TEST_F(Printing, EachChangedLineStandsInItsSection)

@@ -5,8 +5,6 @@
 #include "support/Shop.h"
 #include "utilities/frmUtilities.h"
 
-#include <QTreeWidget>
-
 namespace gestures = desktop::gestures;
 
 struct History : Shop {

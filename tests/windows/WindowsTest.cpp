@@ -1,15 +1,11 @@
 // Tests what a person can expect of every window: a key for everything, readable texts at any size, and names for
 // screen readers.
-#include "base/SharedVariables.h"
 #include "base/modLoggerEx.h"
 #include "messagelist/frmMessageList.h"
 #include "outbound/frmExtraInfo.h"
-#include "platform/files/files.h"
-#include "platform/profile.h"
 #include "platform/script/Gestures.h"
 #include "reports/PrintXML.h"
 #include "support/Hands.h"
-#include "support/ShopDatabase.h"
 #include "utilities/frmUtilities.h"
 #include "windows/EveryWindow.h"
 
