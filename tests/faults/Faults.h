@@ -15,7 +15,7 @@ struct Work {
     std::function<std::string()> result = {};  // what is compared, instead of the shop
     const char* answers = "{}";                // a script for the boxes
     std::map<QString, std::function<void(QDialog&)>> windows = {};  // what is done in each, which is not shown
-    std::function<void()> meanwhile = {};  // only if killed: what another process does then
+    std::function<void()> meanwhile = {};                           // only if killed: what another process does then
 };
 
 /// The setting KEST2_TEST_FAULTS=all lets every call fail; otherwise every statement loses the connection, and every
