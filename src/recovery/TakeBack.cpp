@@ -12,6 +12,7 @@
 #include <QSet>
 
 #include <algorithm>
+#include <functional>
 #include <utility>
 
 namespace kest::recovery {
@@ -137,6 +138,70 @@ QSet<QString> quotesInUse(const QList<RowHistory>& rows)
     return inUse;
 }
 
+bool isSame(const QVariant& registration, const QString& other)
+{
+    return textOrEmpty(registration).compare(other, Qt::CaseInsensitive) == 0;
+}
+
+/// Returns the new registrations of cars that quotes from elsewhere use already. Not one that another car had to give
+/// up: that car gets it back.
+QStringList registrationsInUse(const QList<RowHistory>& rows)
+{
+    QStringList inUse;
+    const auto count = [&](QLatin1StringView table, auto&& condition) {
+        return std::ranges::count_if(rows, [&](const RowHistory& row) {
+            const db::RowChange::Column* rego = row.isOf(table) ? row.net.column(u"REGO"_s) : nullptr;
+            return rego && condition(*rego);
+        });
+    };
+    for (const RowHistory& car : rows) {
+        const db::RowChange::Column* rego = car.isOf("CAR"_L1) ? car.net.column(u"REGO"_s) : nullptr;
+        const QString given = rego ? textOrEmpty(rego->after) : QString();
+        if (car.isNew() || !rego || isSame(rego->before, given) ||
+            count("CAR"_L1, [&](const auto& other) { return isSame(other.before, given); }) > 0)
+            continue;
+        const auto own = count("QUOTE1"_L1, [&](const auto& other) { return isSame(other.after, given); });
+        if (opened(sql("SELECT QTNNO FROM QUOTE1 WHERE REGO='{}'", given)).recordCount() > own)
+            inUse.append(given);
+    }
+    return inUse;
+}
+
+/// Lets a column stay as it is when its row is taken back.
+void leave(RowHistory& row, const QString& name, const QStringList& values = {})
+{
+    for (db::RowChange::Column& column : row.net.columns)
+        if (column.name.compare(name, Qt::CaseInsensitive) == 0 &&
+            (values.isEmpty() || values.contains(textOrEmpty(column.after), Qt::CaseInsensitive)))
+            column.before = column.after;
+}
+
+/// What an operation is taken back in, and what stays because others use it.
+struct Work {
+    explicit Work(qint64 operation);
+
+    QList<RowHistory> rows;
+    QSet<QString> quotesInUse;
+    QStringList left;  // a sentence each
+};
+
+Work::Work(qint64 operation) : rows(rowsOf(operation)), quotesInUse(kest::recovery::quotesInUse(rows))
+{
+    for (const QString& quote : quotesInUse)
+        left.append(u"Quote %1 has lines, notes or an invoice from elsewhere and stays."_s.arg(quote));
+    const QStringList registrations = registrationsInUse(rows);
+    for (const QString& registration : registrations)
+        left.append(u"The car %1 keeps this registration, because another quote uses it."_s.arg(registration));
+    for (RowHistory& row : rows) {
+        if (row.isNew())
+            continue;
+        if (row.isOf("CAR"_L1))
+            leave(row, u"KEST"_s);  // a later load that found it set has recorded nothing
+        if (!registrations.isEmpty() && (row.isOf("CAR"_L1) || row.isOf("QUOTE1"_L1)))
+            leave(row, u"REGO"_s, registrations);
+    }
+}
+
 /// Goes through the rows that an operation would be taken back in. Returns a sentence for each that `undo` refuses.
 template <class Undo>
 QStringList refused(const QList<RowHistory>& rows, const QSet<QString>& inUse, Undo&& undo)
@@ -145,14 +210,6 @@ QStringList refused(const QList<RowHistory>& rows, const QSet<QString>& inUse, U
     for (const RowHistory& row : rows)
         if (!stays(row) && !inUse.contains(row.quote()) && !undo(row))
             left.append(nameOf(row.net) + u" was changed by someone else and stays as it is."_s);
-    return left;
-}
-
-QStringList sentencesOf(const QSet<QString>& quotesInUse)
-{
-    QStringList left;
-    for (const QString& quote : quotesInUse)
-        left.append(u"Quote %1 has lines, notes or an invoice from elsewhere and stays."_s.arg(quote));
     return left;
 }
 
@@ -205,20 +262,18 @@ QStringList takeBackTogether(const QList<RowHistory>& rows, const QSet<QString>&
 QStringList takeBack(qint64 operation, const std::function<void(const db::RowChange&)>& record)
 {
     constexpr qsizetype together = 100;  // rows
-    const QList<RowHistory> rows = rowsOf(operation);
-    const QSet<QString> inUse = quotesInUse(rows);
-    QStringList left = sentencesOf(inUse);
-    for (qsizetype first = 0; first < rows.size(); first += together)
-        left += takeBackTogether(rows.mid(first, together), inUse, record);
+    const Work work(operation);
+    QStringList left = work.left;
+    for (qsizetype first = 0; first < work.rows.size(); first += together)
+        left += takeBackTogether(work.rows.mid(first, together), work.quotesInUse, record);
     return left;
 }
 
 QStringList obstaclesTo(qint64 operation)
 {
-    const QList<RowHistory> rows = rowsOf(operation);
-    const QSet<QString> inUse = quotesInUse(rows);
-    return sentencesOf(inUse) +
-           refused(rows, inUse, [](const RowHistory& row) { return db::stillHolds(*gConn, row.net); });
+    const Work work(operation);
+    return work.left +
+           refused(work.rows, work.quotesInUse, [](const RowHistory& row) { return db::stillHolds(*gConn, row.net); });
 }
 
 }  // namespace kest::recovery

@@ -4,7 +4,11 @@
 #include "recovery/Undo.h"
 
 struct UndoOfALoad : Interrupted {
-    UndoOfALoad() { vendor("Straightline Alignment"); }  // a new one would stay
+    UndoOfALoad()
+    {
+        vendor("Straightline Alignment");  // a new one would stay, and so does a car's flag
+        car("ABC123").set("KEST", 1);
+    }
 
     /// Loads a message and returns the load's operation.
     static qint64 loaded(const QString& file, const Message& message)
@@ -29,8 +33,9 @@ TEST_F(UndoOfALoad, LeavesAllAsItWas)
     desktop.emplace(R"({"boxes": [{"text": "want to continue", "answer": "yes"}]})");
     for (const Message& message :
          {authorisedQuote("500").set("excess", "400").labour(1, "C").part(2, "D").paint(3, "I").sublet(4, "C"),
-          manualQuote("500").labour(1, "I").part(2, "I"), cancellation("QR1"), excessWaiver("500"),
-          assessmentResult("KQ1"), quoteDeletion("KQ1"), quoteDeletion("KQ2")}) {
+          manualQuote("500").labour(1, "I").part(2, "I"), manualQuote("700").labour(1, "I"),
+          manualQuote("500/3").labour(1, "I"), cancellation("QR1"), excessWaiver("500"), assessmentResult("KQ1"),
+          quoteDeletion("KQ1"), quoteDeletion("KQ2")}) {
         arrive("m.xml", message);
         const std::string before = holdings();
         const qint64 load = loaded(u"m.xml"_s, message);
@@ -153,6 +158,22 @@ TEST_F(UndoOfALoad, KeepsWhatOtherLoadsMayUse)
     EXPECT_EQ(rowCount("CAR", "REGO='NEW001'"), 1);
     EXPECT_EQ(rowCount("CUSTOMER", "CUST_ID IN (SELECT CUST_ID FROM CAR WHERE REGO='NEW001')"), 1);
     EXPECT_EQ(Row("CINFO", "1=1").value("QUOTE_VAL").toInt(), counter);
+}
+
+TEST_F(UndoOfALoad, KeepsTheRegistrationThatAnotherQuoteUses)
+{
+    car("XYZ 42");
+    quote("700").rego("XYZ 42");
+    const qint64 operation = loaded(u"m.xml"_s, manualQuote("700").rego("XYZ42").labour(1, "I"));
+    EXPECT_EQ(recovery::obstaclesTo(operation), QStringList());
+    quote("701").rego("XYZ42");
+    const QStringList left{u"The car XYZ42 keeps this registration, because another quote uses it."_s};
+    EXPECT_EQ(recovery::obstaclesTo(operation), left);
+    EXPECT_EQ(recovery::takeBack(operation), left);
+    EXPECT_EQ(rowCount("CAR", "REGO='XYZ 42'"), 0);
+    EXPECT_EQ(rowCount("CAR", "REGO='XYZ42' AND KEST=1"), 1) << "a load of the other quote relies on the flag, too";
+    EXPECT_EQ(quote("700").text("REGO"), "XYZ42");
+    EXPECT_EQ(quote("700").lines(), 0);
 }
 
 TEST_F(UndoOfALoad, LeavesARowThatSomeoneElseHasChangedWhole)
