@@ -6,6 +6,7 @@
 #include "base/modLoggerEx.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
+#include "platform/database/Sql.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
 #include "recovery/FinishLoad.h"
@@ -49,15 +50,31 @@ QStringList obstaclesOfFiles(const journal::Entry& load)
     return reasons;
 }
 
-/// Returns the newer operations on the quotes of a load that are not taken back, a sentence for each quote.
-QStringList newerOperations(const journal::Entry& load)
+QStringList quoteNumbers(const journal::Entry& load)
 {
     QStringList numbers;
     for (const journal::RecordedChange& change : journal::changesOf(load.id))
         if (!change.number.isEmpty() && !numbers.contains(change.number))
             numbers.append(change.number);
+    return numbers;
+}
+
+/// The host invoices a quote without changing a column that a load writes.
+QStringList invoices(const journal::Entry& load)
+{
     QStringList reasons;
-    for (const QString& number : numbers) {
+    for (const QString& number : quoteNumbers(load))
+        if (!opened(sql("SELECT QTNNO FROM QUOTE1 WHERE QTNNO='{}' AND invoiced=1", number)).eof() ||
+            (gConn->hasTable(u"DEBTOR"_s) && !opened(sql("SELECT QTNNO FROM DEBTOR WHERE QTNNO='{}'", number)).eof()))
+            reasons.append(u"Quote %1 has an invoice."_s.arg(number));
+    return reasons;
+}
+
+/// Returns the newer operations on the quotes of a load that are not taken back, a sentence for each quote.
+QStringList newerOperations(const journal::Entry& load)
+{
+    QStringList reasons;
+    for (const QString& number : quoteNumbers(load)) {
         for (const journal::Entry& other : journal::historyOf(number, {})) {
             if (isIn(other, journal::State::TakenBack) || other.kind == journal::wordOf(journal::Kind::Undo))
                 continue;
@@ -87,7 +104,7 @@ QStringList obstaclesToUndo(qint64 operation)
     if (!isIn(load, journal::State::Done) && !isIn(load, journal::State::Finished))
         return {u"The state of the load is \"%1\"."_s.arg(load.state)};
     const QStringList newer = newerOperations(load);  // which explain changed rows, too
-    return newer.isEmpty() ? obstaclesOfFiles(load) + obstaclesTo(operation) : newer;
+    return newer.isEmpty() ? obstaclesOfFiles(load) + invoices(load) + obstaclesTo(operation) : newer;
 }
 
 QString undoQuestion(qint64 operation)

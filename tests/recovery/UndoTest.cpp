@@ -112,6 +112,18 @@ TEST_F(UndoOfALoad, IsRefusedWithTheReason)
              arrive("m.xml", authorisation());
              return load;
          }},
+        {"Quote 500 has an invoice.",
+         [] {
+             const qint64 load = loaded(u"m.xml"_s, authorisation());
+             addRow("DEBTOR", {{"QTNNO", u"500"_s}});
+             return load;
+         }},
+        {"Quote 500 has an invoice.",
+         [] {
+             const qint64 load = loaded(u"m.xml"_s, cancellation("QR1"));
+             quote("500").set("invoiced", 1);
+             return load;
+         }},
         {"The row of QUOTE1 with",
          [] {
              const qint64 load = loaded(u"m.xml"_s, authorisation());
