@@ -270,7 +270,7 @@ bool frmMessageList::loadOnce(const QString& file)
     // a report may have been open for hours, and the file's new name comes from the database
     attempt([] { EnsureConnection(); });
     MoveMessage(file, u"read"_s);
-    operation.end(files::exists(gsCurFolder + file) ? journal::State::Unfinished : journal::State::Done);
+    operation.end(isMoved(file) ? journal::State::Done : journal::State::Unfinished);
     return true;
 }
 
@@ -291,7 +291,7 @@ bool frmMessageList::load(const QString& file)
             return false;
         }
         RefreshList();
-        if (files::exists(gsCurFolder + file))
+        if (!isMoved(file))
             lblStatus->tell(
                 u"%1 is loaded, but could not be moved to the read messages: it is moved as soon as that "
                 "is possible."_s.arg(file));

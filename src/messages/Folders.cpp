@@ -174,6 +174,11 @@ void MoveMessage(const QString& file, const QString& action)
     gsMatchedQTNNO.clear();
 }
 
+bool isMoved(const QString& file)
+{
+    return files::folderExists(gsUnreadPath) && !files::exists(gsUnreadPath + file);
+}
+
 QString GetReadFileName(const QString& path)
 {
     MessageQuoteKey key;

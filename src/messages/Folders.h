@@ -24,6 +24,9 @@ bool isBareName(const QString& file);
 /// `gsMatchedQTNNO`. Never throws: if the copy fails, the message stays in the unread folder.
 void MoveMessage(const QString& file, const QString& action);
 
+/// Returns true if the file is no longer in the unread folder, which can be seen.
+bool isMoved(const QString& file);
+
 /// Returns the name of a loaded message in the read folder, or an empty text if it can't be determined. Clears
 /// `gsDeletedQTNNO` and `gsDeletedSubquote`.
 QString GetReadFileName(const QString& path);

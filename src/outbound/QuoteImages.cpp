@@ -2,10 +2,13 @@
 
 #include "base/Journal.h"
 #include "base/SharedVariables.h"
+#include "platform/RuntimeError.h"
 #include "platform/Waiting.h"
 #include "platform/files/files.h"
 #include "platform/values.h"
 #include "platform/xml/Branch.h"
+
+#include <QJsonArray>
 
 #include <cmath>
 
@@ -37,12 +40,32 @@ QString imageId(const QString& file)
     return number ? numberText(std::trunc(*number)) : QString();
 }
 
-void writeImageDocuments(const QString& folder, const QuoteKey& quote)
+/// Returns the images that the document of the send at work counts.
+static QList<QuoteImage> countedImages(const QString& folder, const QuoteKey& quote)
 {
-    for (const QuoteImage& image : quoteImages(folder, quote)) {
+    const QJsonValue names = journal::kept(u"document"_s)[u"images"_s];
+    if (names.isUndefined())
+        return quoteImages(folder, quote);
+    QList<QuoteImage> images;
+    for (const QJsonValue name : names.toArray())
+        images.append({name.toString(), imageId(name.toString())});
+    return images;
+}
+
+QStringList writeImageDocuments(const QString& folder, const QuoteKey& quote)
+{
+    QStringList gone;
+    for (const QuoteImage& image : countedImages(folder, quote)) {
         workStep();
         if (journal::kept(image.file).toBool())
             continue;
+        if (!files::folderExists(folder))
+            throw RuntimeError(PathNotFound, u"The pictures' folder %1 was not found."_s.arg(folder));
+        const QString picture = files::pathForWriting(folder, image.file);
+        if (!files::exists(picture)) {
+            gone.append(image.file);
+            continue;
+        }
         xml::Document document;
         const Branch request(document, "request");
         request.add({
@@ -53,9 +76,10 @@ void writeImageDocuments(const QString& folder, const QuoteKey& quote)
         });
         const QString name = u"I_"_s + image.file;
         files::write(gsUnsentPath + name.chopped(3) + u"xml"_s, request.xml());
-        files::copy(files::pathForWriting(folder, image.file), gsUnsentPath + name);
+        files::copy(picture, gsUnsentPath + name);
         journal::keep(image.file, true);
     }
+    return gone;
 }
 
 }  // namespace kest

@@ -5,6 +5,7 @@
 
 #include <QList>
 #include <QString>
+#include <QStringList>
 
 namespace kest {
 
@@ -22,8 +23,9 @@ QList<QuoteImage> quoteImages(const QString& folder, const QuoteKey& quote);
 /// empty text if there is none.
 QString imageId(const QString& file);
 
-/// Writes a document and a copy of each image to the outgoing folder. Leaves out those that the operation has written
-/// before it was interrupted.
-void writeImageDocuments(const QString& folder, const QuoteKey& quote);
+/// Writes a document and a copy of each image to the outgoing folder: of those that the quote's document counts, if a
+/// send is at work. Leaves out those that it has written before it was interrupted. Returns the names of images that
+/// are gone. Throws PathNotFound if there are images to write and their folder is away.
+QStringList writeImageDocuments(const QString& folder, const QuoteKey& quote);
 
 }  // namespace kest

@@ -63,7 +63,8 @@ QString withoutRoot(const QString& text)
     return text.mid(behindRoot, text.size() - behindRoot - u"</request>"_s.size());
 }
 
-void addImages(const Branch& request, const QuoteRows& rows)
+/// Returns the names of the pictures that the document counts.
+QStringList addImages(const Branch& request, const QuoteRows& rows)
 {
     const QString folder = GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"ImagesPath"_s, u"c:\\wirimg\\"_s);
     if (!files::folderExists(folder)) {
@@ -76,10 +77,14 @@ void addImages(const Branch& request, const QuoteRows& rows)
     const QList<QuoteImage> images = quoteImages(folder, rows.key);
     request.add("imageCount", QString::number(images.size()));
     if (images.isEmpty())
-        return;
+        return {};
+    QStringList names;
     const Branch ids = request.add("quoteImageIds");
-    for (const QuoteImage& image : images)
+    for (const QuoteImage& image : images) {
         ids.add("quoteImageId", image.id);
+        names.append(image.file);
+    }
+    return names;
 }
 
 const QString submitted = u"Submitted"_s;
@@ -100,14 +105,15 @@ void markAsSent(const QuoteKey& key, db::Recordset& quote, db::Recordset& notes,
 }
 
 /// Keeps what finishing the send needs if it is interrupted after the document was written.
-void announceDocument(const QuoteRows& rows, const QString& name, const QString& content)
+void announceDocument(const QuoteRows& rows, const QString& name, const QString& content, const QStringList& images)
 {
     journal::openNow(rows.key.number, rows.key.subquote);
     journal::keep(u"document"_s,
                   QJsonObject{{u"name"_s, name},
                               {u"hash"_s, journal::hashOf(files::fromCodePage(files::toCodePage(content)))},
                               {u"status"_s, quoteStatus(rows.notes)},
-                              {u"stage"_s, text(rows.quote, "Job_stage")}});
+                              {u"stage"_s, text(rows.quote, "Job_stage")},
+                              {u"images"_s, QJsonArray::fromStringList(images)}});
 }
 
 /// Returns true if the document waits for the transport, or was sent.
@@ -158,12 +164,12 @@ double CreateQuoteXML(db::Recordset& quote)
     if (total == 0)
         return refuse(
             u"Error: Cannot send $0 variations to ORLA. Please call your assessor to discuss the variation."_s);
-    addImages(request, rows);
+    const QStringList images = addImages(request, rows);
 
     // write the document before the quote is locked: a full disk must not lock it
     const QString name = documentName(rows);
     const QString content = withoutRoot(request.xml());
-    announceDocument(rows, name, content);
+    announceDocument(rows, name, content, images);
     files::write(files::pathForWriting(gsUnsentPath, name), content);
     journal::keep(u"written"_s, true);
     markAsSent(rows.key, rows.quote, rows.notes, quoteSent);
@@ -201,20 +207,19 @@ void markLate(const QuoteKey& key, Quote& quote, const QJsonObject& document)
 
 }  // namespace
 
-bool finishSend(const QuoteKey& key, bool isMarked)
+std::optional<QStringList> finishSend(const QuoteKey& key, bool isMarked)
 {
     const QJsonObject document = journal::kept(u"document"_s).toObject();
     const bool isWritten =
         journal::kept(u"written"_s).toBool() || isThere(document[u"name"_s].toString(), document[u"hash"_s].toString());
     if (!isWritten)
-        return false;
+        return {};
     Quote quote(key);
     if (!quote.exists())
-        return false;
+        return {};
     if (!isMarked && !quote.notes().eof())
         markLate(key, quote, document);
-    writeImageDocuments(gsImagesPath, key);
-    return true;
+    return writeImageDocuments(gsImagesPath, key);
 }
 
 }  // namespace kest

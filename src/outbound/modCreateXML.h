@@ -5,6 +5,9 @@
 #include "platform/database/Recordset.h"
 
 #include <QString>
+#include <QStringList>
+
+#include <optional>
 
 namespace kest {
 
@@ -20,8 +23,8 @@ void CreateImageXML(const QString& imagesPath, db::Recordset& quote);
 bool isDocumentAnnounced();
 
 /// Goes on with the send of an interrupted operation: marks the quote as sent, unless `isMarked` says that this was
-/// done or the insurer has acted on the quote since, and writes the pictures that are missing. Returns false and
-/// changes nothing if the document was not written or the quote is gone.
-bool finishSend(const QuoteKey& key, bool isMarked);
+/// done or the insurer has acted on the quote since, and writes the pictures that are missing. Returns the names of
+/// those that are gone. Returns nothing and changes nothing if the document was not written or the quote is gone.
+std::optional<QStringList> finishSend(const QuoteKey& key, bool isMarked);
 
 }  // namespace kest

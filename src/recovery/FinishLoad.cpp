@@ -1,6 +1,7 @@
 #include "recovery/FinishLoad.h"
 
 #include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 #include "inbound/Finishing.h"
 #include "jobexport/WriteQuote.h"
 #include "messages/Envelope.h"
@@ -19,10 +20,16 @@ namespace {
 /// Returns the message if it still waits as it was when it was loaded, otherwise an empty text.
 QString waitingText(const journal::Entry& entry)
 {
-    if (!isBareName(entry.file) || !files::exists(gsUnreadPath + entry.file))
-        return {};
-    const QString text = files::read(gsUnreadPath + entry.file);
-    return journal::hashOf(text) == entry.hash ? text : QString();
+    return isThere(gsUnreadPath, entry.file, entry.hash) ? files::read(gsUnreadPath + entry.file) : QString();
+}
+
+/// Returns true if the message was moved, or if it has gone from a folder that this workstation shares with the one
+/// that loaded it.
+bool isGone(const journal::Entry& entry)
+{
+    if (!files::folderExists(gsUnreadPath) || isThere(gsUnreadPath, entry.file, entry.hash))
+        return false;
+    return isOfThisWorkstation(entry) || isThere(gsReadPath, journal::kept(u"newName"_s).toString(), entry.hash);
 }
 
 const MessageType* typeOf(QString& text)
@@ -85,7 +92,10 @@ QStringList finishLoad(const journal::Entry& entry)
     if (!isBegun && entry.facts[u"isExported"_s].toBool())
         left += finishExport(entry);
     if (text.isEmpty()) {
-        if (!isBegun)
+        if (!isGone(entry))
+            left += u"Its message is not in sight here; it is moved as soon as workstation %1 sees it."_s.arg(
+                entry.workstation);
+        else if (!isBegun)
             left += u"Its message has been removed or changed since, so it was not moved."_s;
         return left;
     }
@@ -98,7 +108,17 @@ QStringList finishLoad(const journal::Entry& entry)
 
 bool stillWaits(const journal::Entry& entry)
 {
-    return !waitingText(entry).isEmpty();
+    return !isGone(entry);
+}
+
+bool isThere(const QString& folder, const QString& file, const QString& hash)
+{
+    return isBareName(file) && files::exists(folder + file) && journal::hashOf(files::read(folder + file)) == hash;
+}
+
+bool isOfThisWorkstation(const journal::Entry& entry)
+{
+    return entry.workstation == GetComputerName();
 }
 
 void removeDocuments(const journal::Entry& entry)

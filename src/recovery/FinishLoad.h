@@ -11,8 +11,14 @@ namespace kest::recovery {
 /// sentence each: a window that was not shown, a job that JobLink has in part, a message that is gone.
 QStringList finishLoad(const journal::Entry& entry);
 
-/// Returns true if the message is still in the unread folder, unchanged.
+/// Returns true if the message is still in the unread folder, unchanged, or if that can't be seen from here.
 bool stillWaits(const journal::Entry& entry);
+
+/// Returns true if the folder has that message.
+bool isThere(const QString& folder, const QString& file, const QString& hash);
+
+/// Another workstation may have folders of its own, with what its operation has left.
+bool isOfThisWorkstation(const journal::Entry& entry);
 
 /// Removes the documents of sublet work that a load has written.
 void removeDocuments(const journal::Entry& entry);

@@ -84,11 +84,16 @@ void tell(Settled settled)
 
 void settleSend(const journal::Entry& entry, journal::Operation& operation)
 {
-    const bool isSent = finishSend({entry.number, entry.subquote}, entry.pastPoint);
-    if (isUnfinished(entry) && entry.pastPoint)  // the user has seen which picture could not be written
-        return operation.end(journal::State::Done);
-    operation.end(isSent ? journal::State::Finished : journal::State::Failed);
-    tell({entry, isSent ? Outcome::Finished : Outcome::TakenBack, {}});
+    const std::optional<QStringList> gone = finishSend({entry.number, entry.subquote}, entry.pastPoint);
+    if (!isOfThisWorkstation(entry) && (!gone || !gone->isEmpty()))
+        return;  // that workstation may have another folder, with the document or the pictures
+    const bool isKnown = isUnfinished(entry) && entry.pastPoint;  // the user has seen what could not be written
+    operation.end(!gone ? journal::State::Failed : isKnown ? journal::State::Done : journal::State::Finished);
+    QStringList left;
+    for (const QString& picture : gone.value_or(QStringList()))
+        left.append(u"Its picture %1 is gone and was not sent."_s.arg(picture));
+    if (!isKnown || !left.isEmpty())
+        tell({entry, gone ? Outcome::Finished : Outcome::TakenBack, left});
 }
 
 /// Ends an operation whose tables are complete. It stays unfinished until its message is moved.
@@ -121,8 +126,8 @@ void settleIncomplete(const journal::Entry& entry, journal::Operation& operation
 
 void settleUndo(const journal::Entry& entry, journal::Operation& operation)
 {
-    const QStringList left = finishUndo();
-    endComplete(entry, operation, !isMessageToMove(), left);
+    const QStringList left = finishUndo(entry.workstation);
+    endComplete(entry, operation, !isMessageToMove(entry.workstation), left);
 }
 
 void settleAlone(journal::Entry entry, const QString& lockedFile)

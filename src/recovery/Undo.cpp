@@ -24,15 +24,19 @@ bool isIn(const journal::Entry& entry, journal::State state)
     return entry.state == journal::wordOf(state);
 }
 
-QString pathInReadFolder(const journal::Entry& load)
+QString readName(const journal::Entry& load)
 {
-    return gsReadPath + load.facts[u"newName"_s].toString();
+    return load.facts[u"newName"_s].toString();
 }
 
 bool isMessageRead(const journal::Entry& load)
 {
-    return !load.facts[u"newName"_s].toString().isEmpty() && files::exists(pathInReadFolder(load)) &&
-           journal::hashOf(files::read(pathInReadFolder(load))) == load.hash;
+    return isThere(gsReadPath, readName(load), load.hash);
+}
+
+bool isMessageUnread(const journal::Entry& load)
+{
+    return isThere(gsUnreadPath, load.file, load.hash);
 }
 
 QStringList obstaclesOfFiles(const journal::Entry& load)
@@ -125,8 +129,8 @@ QStringList undo(qint64 operation)
     journal::Operation work(journal::Kind::Undo, load.file, load.hash);
     journal::keep(u"undoes"_s, load.id);
     journal::openNow(load.number, load.subquote);
-    const QStringList left = finishUndo();
-    work.end(isMessageToMove() ? journal::State::Unfinished : journal::State::Done);
+    const QStringList left = finishUndo(GetComputerName());
+    work.end(isMessageToMove(GetComputerName()) ? journal::State::Unfinished : journal::State::Done);
     return left;
 }
 
@@ -150,7 +154,7 @@ bool askAndUndo(qint64 operation)
     return true;
 }
 
-QStringList finishUndo()
+QStringList finishUndo(const QString& workstation)
 {
     const journal::Entry load = loadToUndo();
     QStringList left = takeBack(load.id, journal::record);
@@ -159,20 +163,22 @@ QStringList finishUndo()
     attempt([&] {
         try {
             if (isMessageRead(load) && !files::exists(gsUnreadPath + load.file))
-                files::move(pathInReadFolder(load), gsUnreadPath + load.file);
+                files::move(gsReadPath + readName(load), gsUnreadPath + load.file);
         } catch (const RuntimeError& error) {
             logFailure(error, u"Undo.finishUndo"_s);
             throw;
         }
     });
-    if (isMessageToMove())
+    if (isMessageToMove(workstation))
         left.append(u"Its message could not be moved yet; it is moved as soon as that is possible."_s);
     return left;
 }
 
-bool isMessageToMove()
+bool isMessageToMove(const QString& workstation)
 {
-    return isMessageRead(loadToUndo());
+    const journal::Entry load = loadToUndo();
+    const bool isInSight = workstation == GetComputerName() && files::folderExists(gsReadPath);
+    return isMessageRead(load) || (!isInSight && !isMessageUnread(load));
 }
 
 }  // namespace kest::recovery

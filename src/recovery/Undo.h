@@ -24,9 +24,10 @@ QStringList undo(qint64 operation);
 /// if it was undone.
 bool askAndUndo(qint64 operation);
 
-/// Goes on with an undo inside its operation.
-QStringList finishUndo();
-/// Returns true if the message of the load that is undone still has to be moved.
-bool isMessageToMove();
+/// Goes on with an undo inside its operation, which that workstation began.
+QStringList finishUndo(const QString& workstation);
+/// Returns true if the message of the load that is undone still has to be moved, or if that can't be seen from here. It
+/// was in sight of the workstation that began the undo.
+bool isMessageToMove(const QString& workstation);
 
 }  // namespace kest::recovery

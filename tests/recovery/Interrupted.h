@@ -28,6 +28,19 @@ struct Interrupted : Sending {
         return connection;
     }
 
+    /// Settles an operation whose folder is away, and then that of another workstation with a folder of its own.
+    static void settleOutOfSight(QString& folder)
+    {
+        files::makeFolder(u"c:\\own"_s);
+        for (const auto& [workstation, path] :
+             {std::pair(GetComputerName(), u"c:\\gone\\"_s), {u"OTHER"_s, u"c:\\own\\"_s}}) {
+            gConn->execute(sql("UPDATE KESTOperation SET Workstation='{}'", workstation));
+            const QScopedValueRollback away(folder, path);
+            recovery::settle();
+            EXPECT_EQ(newest().text("State"), "unfinished") << path;
+        }
+    }
+
     static Row newest() { return Row("KESTOperation", "Operation=(SELECT MAX(Operation) FROM KESTOperation)"); }
 };
 

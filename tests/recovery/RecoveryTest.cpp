@@ -151,6 +151,26 @@ TEST_F(Interrupted, ALoadedMessageThatCouldNotBeMovedIsMovedLater)
     EXPECT_NE(quote("500").notes(), loaded);
 }
 
+TEST_F(Interrupted, AMessageOutOfSightIsNotTakenForMoved)
+{
+    const QScopedValueRollback unread(gsUnreadPath);
+    const QString seen = gsUnreadPath;
+    putTemplate(710);
+    arrive("m.xml", quoteRequest("QR9"));
+    frmMessageList window;
+    window.openUnread();
+    const Hands hands({{u"frmPrintPreview"_s, [](QDialog&) { gsUnreadPath = u"c:\\gone\\"_s; }}});
+    EXPECT_TRUE(window.loadFile(u"m.xml"_s));
+    EXPECT_EQ(newest().text("State"), "unfinished");
+    gsUnreadPath = seen;
+    settleOutOfSight(gsUnreadPath);
+    gConn->execute(u"UPDATE KESTOperation SET State='open'"_s);  // the workstation died before it could end the load
+    settleOutOfSight(gsUnreadPath);
+    recovery::settle();
+    EXPECT_EQ(newest().text("State"), "done");
+    EXPECT_EQ(filesIn(gsUnreadPath).size() + 1, filesIn(gsReadPath).size());
+}
+
 TEST_F(Interrupted, AMoveThatBeganEndsUnderItsName)
 {
     arrive("m.xml", adjustedQuote("500"));
@@ -207,6 +227,8 @@ TEST_F(Interrupted, PicturesThatCouldNotBeSentAreSentLater)
     EXPECT_EQ(newest().text("State"), "unfinished");
     QDir(files::systemPath(gsUnsentPath + u"I_600_0002.jpg"_s)).removeRecursively();
     files::remove(gsUnsentPath + u"I_600_0001.jpg"_s);  // the transport has taken it
+    settleOutOfSight(gsImagesPath);
+    files::write(gsImagesPath + u"600_0003.jpg"_s, u"picture"_s);  // the document does not count it
     recovery::settle();
     EXPECT_EQ(filesIn(gsUnsentPath),
               (QStringList{u"600.0_1.xml"_s, u"I_600_0001.xml"_s, u"I_600_0002.jpg"_s, u"I_600_0002.xml"_s}));

@@ -2,6 +2,7 @@
 
 #include "base/Journal.h"
 #include "inbound/modLoadXML.h"
+#include "messages/Folders.h"
 #include "recovery/Recovery.h"
 
 namespace kest::test {
@@ -91,8 +92,9 @@ bool loadAsTheWindow(const QString& fileName)
         taken = LoadXML(text, fileName);
         if (taken)
             MoveMessage(fileName, u"read"_s);
-        const bool isMoved = !files::exists(gsUnreadPath + fileName);
-        operation.end(!taken ? journal::State::Failed : isMoved ? journal::State::Done : journal::State::Unfinished);
+        operation.end(!taken              ? journal::State::Failed
+                      : isMoved(fileName) ? journal::State::Done
+                                          : journal::State::Unfinished);
     });
     return taken;
 }
