@@ -54,6 +54,12 @@ bool isEnter(int key)
     return key == Qt::Key_Return || key == Qt::Key_Enter;
 }
 
+/// Returns true for the keys that open a list below its field.
+bool isDropKey(const QKeyEvent& key)
+{
+    return key.key() == Qt::Key_F4 || (key.key() == Qt::Key_Down && key.modifiers() & Qt::AltModifier);
+}
+
 }  // namespace
 
 ExtraInfoResult frmExtraInfo::ShowForm(const QString& quoteNumber, const QString& subquote)
@@ -244,6 +250,7 @@ bool frmExtraInfo::eventFilter(QObject* watched, QEvent* event)
 {
     const bool keyDown = event->type() == QEvent::KeyPress;
     const int key = keyDown || event->type() == QEvent::KeyRelease ? static_cast<QKeyEvent*>(event)->key() : 0;
+    const bool drops = keyDown && isDropKey(static_cast<const QKeyEvent&>(*event));
 
     if (event->type() == QEvent::FocusOut) {
         if (watched == txtBuildYear)
@@ -251,8 +258,7 @@ bool frmExtraInfo::eventFilter(QObject* watched, QEvent* event)
         if (watched == lvColour || watched == txtColour)
             hideColoursUnlessUsed();
     } else if (watched == txtColour) {
-        const bool isAltDown = key == Qt::Key_Down && static_cast<QKeyEvent*>(event)->modifiers() & Qt::AltModifier;
-        if (keyDown && isAltDown) {
+        if (drops || (keyDown && key == Qt::Key_Escape && lvColour->isVisible())) {
             txtColour_ButtonClick();
             return true;
         }
@@ -261,6 +267,11 @@ bool frmExtraInfo::eventFilter(QObject* watched, QEvent* event)
         if (event->type() == QEvent::KeyRelease)
             txtColour_KeyUp(key);
     } else if (watched == lvColour) {
+        if (drops || (keyDown && key == Qt::Key_Escape)) {
+            txtColour->setFocus();
+            lvColour->hide();
+            return true;
+        }
         if (keyDown && (isEnter(key) || key == Qt::Key_Tab)) {
             lvColour_ItemClick();
             return true;
