@@ -171,7 +171,7 @@ void frmViewPDF::save()
     if (target.isEmpty())
         return;
     try {
-        files::writeBytes(target, files::readBytes(path));
+        files::writeExactly(target, files::readBytes(path));
     } catch (const RuntimeError& error) {
         desktop::msgBox(u"The document can't be saved as %1: %2"_s.arg(target, error.description()),
                         desktop::Icon::Critical);

@@ -90,7 +90,9 @@ TEST_F(Sublet, ADocumentThatContainsItselfIsRefused)
 TEST_F(Sublet, ASavedCopyIsNamedByItsQuoteAndLine)
 {
     realDocument(u"500.2_7.pdf"_s);
-    const QString copy = root() + u"/copy.pdf"_s;
+    const QString folder = root() + uR"(/my\documents/)"_s;
+    ASSERT_TRUE(QDir().mkpath(folder) && QFile(folder + u"COPY.pdf"_s).open(QFile::WriteOnly));
+    const QString copy = folder + u"copy.pdf"_s;
     QString offered;
     const test::Hands hands({{u"frmViewPDF"_s, [](QDialog& window) { gestures::press(window, Qt::CTRL | Qt::Key_S); }},
                              {u"SaveDialog"_s, [&](QDialog& dialog) {
@@ -102,7 +104,10 @@ TEST_F(Sublet, ASavedCopyIsNamedByItsQuoteAndLine)
                               }}});
     frmViewPDF::ShowForm(u"c:\\wirdoc\\PDF\\500.2_7.pdf"_s);
     EXPECT_TRUE(offered.endsWith(u"/Sublet authority 500-2 line 7.pdf"_s)) << offered;
-    EXPECT_EQ(files::readBytes(copy), files::readBytes(u"c:\\wirdoc\\PDF\\500.2_7.pdf"_s));
+    EXPECT_TRUE(QFile::exists(folder + u"COPY.pdf"_s)) << "another file";
+    QFile saved(copy);
+    EXPECT_TRUE(saved.open(QFile::ReadOnly));
+    EXPECT_EQ(saved.readAll(), files::readBytes(u"c:\\wirdoc\\PDF\\500.2_7.pdf"_s));
 }
 
 TEST_F(Sublet, PageKeysTurnThePagesWhereverTheFocusIs)
@@ -119,6 +124,14 @@ TEST_F(Sublet, PageKeysTurnThePagesWhereverTheFocusIs)
                                           gestures::press(window, Qt::Key_PageUp);
                                       EXPECT_EQ(page.text(), u"Page 1 of 2"_s) << focused;
                                   }
+                                  for (int presses = 0; presses < 3; ++presses)
+                                      gestures::press(window, Qt::CTRL | Qt::Key_Minus);
+                                  const QScrollBar& bar =
+                                      *test::control<QAbstractScrollArea>(window, "AcroPDF1").verticalScrollBar();
+                                  for (int presses = 0; presses < 9; ++presses)
+                                      gestures::press(window, Qt::Key_PageDown);
+                                  EXPECT_GT(bar.maximum(), 0);
+                                  EXPECT_EQ(bar.value(), bar.maximum()) << page.text();
                               }}});
     frmViewPDF::ShowForm(u"c:\\wirdoc\\PDF\\500.0_1.pdf"_s);
 }

@@ -60,7 +60,7 @@ QToolButton* PageTools::add(const char* name, const char* caption, const char* h
     return tool;
 }
 
-// At the end of a page it goes on to the next one.
+// At the end of the view, goes on to the next page if the view shows only one.
 void PageTools::scroll(const PageActions& actions, int direction)
 {
     QScrollBar& bar = *actions.view->verticalScrollBar();
@@ -68,7 +68,7 @@ void PageTools::scroll(const PageActions& actions, int direction)
     const int next = current + direction;
     if (bar.value() != end) {
         bar.triggerAction(direction > 0 ? QAbstractSlider::SliderPageStepAdd : QAbstractSlider::SliderPageStepSub);
-    } else if (next >= 1 && next <= count) {
+    } else if (actions.showsOnePage && next >= 1 && next <= count) {
         actions.goTo(next);
         bar.setValue(direction > 0 ? bar.minimum() : bar.maximum());
     }

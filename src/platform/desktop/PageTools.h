@@ -23,6 +23,7 @@ struct PageActions {
     std::function<void()> fitWidth;
     std::function<void()> fitPage;
     QAbstractScrollArea* view = nullptr;  // scrolled by PgUp and PgDn, wherever the focus is
+    bool showsOnePage = false;            // the view does not scroll from page to page
 };
 
 /// A row of buttons for printing, saving, pages and zoom, with the number of the page. All windows that show pages have

@@ -66,6 +66,11 @@ void writeBytes(const QString& path, const QByteArray& bytes, Access access)
         access == Access::OwnerAlone ? std::optional(ownerAlone) : std::nullopt);
 }
 
+void writeExactly(const QString& systemPath, const QByteArray& bytes)
+{
+    replaceFile(systemPath, systemPath, [&](SystemFile& file) { file.write(bytes); });
+}
+
 void restrictToOwner(const QString& path)
 {
     SystemFile(systemPath(path), O_RDONLY).setMode(ownerAlone);

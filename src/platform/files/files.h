@@ -38,6 +38,9 @@ void write(const QString& path, const QString& text);
 /// Who can read a written file.
 enum class Access { AsBefore, OwnerAlone };
 void writeBytes(const QString& path, const QByteArray& bytes, Access access = Access::AsBefore);
+/// Writes a file at exactly this path of this system, such as a file dialog returns: a file in another case stays, and
+/// a backslash is part of a name.
+void writeExactly(const QString& systemPath, const QByteArray& bytes);
 /// Removes the rights of everyone except the owner.
 void restrictToOwner(const QString& path);
 /// Adds text to the end of a file. Creates a missing file.

@@ -319,7 +319,7 @@ void writePdf(const Report& report, const QString& systemPath)
     writer.setTitle(report.heading());
     setPaper(writer);
     paint(report, writer);
-    files::writeBytes(systemPath, withAuthor(pdf, report.author()));
+    files::writeExactly(systemPath, withAuthor(pdf, report.author()));
 }
 
 }  // namespace kest::report

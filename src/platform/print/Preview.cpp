@@ -43,7 +43,8 @@ Preview::Preview(QWidget* parent, const std::function<void()>& print)
                                     .reduce = [this] { view->zoomOut(zoomStep); },
                                     .fitWidth = [this] { view->fitToWidth(); },
                                     .fitPage = [this] { view->fitInView(); },
-                                    .view = sheet});
+                                    .view = sheet,
+                                    .showsOnePage = true});
     auto* all = new QVBoxLayout(this);
     all->setContentsMargins({});
     all->setSpacing(0);
