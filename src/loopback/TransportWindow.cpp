@@ -10,6 +10,7 @@
 #include <QHBoxLayout>
 #include <QLabel>
 #include <QPushButton>
+#include <QScrollBar>
 #include <QThread>
 #include <QTime>
 #include <QTreeWidget>
@@ -124,10 +125,14 @@ void TransportWindow::addRow(const QStringList& cells)
     auto* row = new QTreeWidgetItem(QStringList(QTime::currentTime().toString(u"HH:mm:ss"_s)) + cells);
     for (int column = 0; column < row->columnCount(); ++column)
         row->setToolTip(column, row->text(column));
+    const QScrollBar* bar = carriedList->verticalScrollBar();
+    const bool isEndVisible = bar->value() == bar->maximum();
     carriedList->addTopLevelItem(row);
-    if (carriedList->topLevelItemCount() > mostRows)
-        delete carriedList->takeTopLevelItem(0);
-    carriedList->scrollToItem(row);
+    arrived.append(row);
+    if (arrived.size() > mostRows)
+        delete arrived.takeFirst();
+    if (isEndVisible && !carriedList->itemBelow(row))  // otherwise the user reads other rows, or has sorted them
+        carriedList->scrollToItem(row);
 }
 
 }  // namespace kest::app

@@ -6,6 +6,7 @@
 
 class QPushButton;
 class QTreeWidget;
+class QTreeWidgetItem;
 
 namespace kest::desktop {
 class StatusLine;
@@ -35,6 +36,7 @@ private:
     QString call;  // a file with which another start calls this window
     QFileSystemWatcher calls;
     QTreeWidget* carriedList;
+    QList<QTreeWidgetItem*> arrived;  // its rows, the oldest first
     desktop::StatusLine* status;
     QPushButton* carryButton;
     QPushButton* closeButton;

@@ -204,3 +204,31 @@ TEST_F(Loopback, ASecondStartShowsTheWindowThatIsOpen)
     EXPECT_TRUE(app::runTransport(app::TransportMode::Window, {}));
     EXPECT_EQ(desktop->boxTexts(), QStringList());
 }
+
+TEST_F(Loopback, TheListOfTheWindowStaysWhereItsUserReads)
+{
+    const auto work = [this](QDialog& window) {
+        auto& list = control<QTreeWidget>(window, "carriedList");
+        const auto carry = [&](int times) {
+            for (int i = 0; i < times; ++i) {
+                rules(u"no rule"_s + u"!"_s.repeated(i % 2));  // a new fault, and so a new row
+                control<QPushButton>(window, "carryButton").click();
+            }
+            desktop::gestures::settle();
+        };
+        QScrollBar& bar = *list.verticalScrollBar();
+        carry(50);
+        EXPECT_EQ(bar.value(), bar.maximum()) << "follows the newest";
+        bar.setValue(3);
+        carry(1);
+        EXPECT_EQ(bar.value(), 3);
+        QTreeWidgetItem* newest = list.topLevelItem(list.topLevelItemCount() - 1);
+        list.sortByColumn(0, Qt::DescendingOrder);
+        carry(2001 - list.topLevelItemCount());
+        EXPECT_EQ(list.topLevelItemCount(), 2000);
+        EXPECT_GE(list.indexOfTopLevelItem(newest), 0) << "only the oldest are taken away";
+        EXPECT_EQ(list.topLevelItem(0)->text(1), u"Fault"_s);
+    };
+    const Hands hands({{u"KESTWeb"_s, work}});
+    app::TransportWindow(folders()).run();
+}
