@@ -1,6 +1,6 @@
 #include "messagelist/MessageListModel.h"
 
-#include "base/SharedVariables.h"
+#include "platform/desktop/Lists.h"
 #include "platform/files/files.h"
 
 #include <QCollator>
@@ -33,11 +33,26 @@ const QCollator& naturalOrder()
     return collator;
 }
 
+/// Returns what happened when a file of the folder was written.
+QString eventOf(MessageFolder folder)
+{
+    switch (folder) {
+        case MessageFolder::Unread:
+            return u"Arrived"_s;
+        case MessageFolder::Read:
+            return u"Loaded"_s;
+        case MessageFolder::Sent:
+            break;
+    }
+    return u"Written"_s;
+}
+
 }  // namespace
 
-void MessageListModel::setMessages(QList<ListedMessage> messages)
+void MessageListModel::setMessages(QList<ListedMessage> messages, MessageFolder theirFolder)
 {
     beginResetModel();
+    folder = theirFolder;
     all = std::move(messages);
     texts.clear();
     texts.reserve(all.size());
@@ -134,12 +149,14 @@ QVariant MessageListModel::data(const QModelIndex& index, int role) const
     const QString text = cell(shown[index.row()], index.column());
     if (role == Qt::DisplayRole || index.column() > 0)
         return text;
-    const QDateTime arrived = QFileInfo(files::systemPath(gsCurFolder + text)).lastModified();
-    return arrived.isValid() ? text + u"\nArrived "_s + arrived.toString(u"dd/MM/yyyy HH:mm"_s) : text;
+    const QDateTime time = QFileInfo(files::systemPath(pathOf(folder) + text)).lastModified();
+    return time.isValid() ? text + u'\n' + eventOf(folder) + time.toString(u" dd/MM/yyyy HH:mm"_s) : text;
 }
 
 QVariant MessageListModel::headerData(int section, Qt::Orientation orientation, int role) const
 {
+    if (orientation == Qt::Horizontal && role == Qt::ToolTipRole)
+        return desktop::sortTip(section);
     if (orientation == Qt::Vertical || role != Qt::DisplayRole)
         return QAbstractTableModel::headerData(section, orientation, role);
     return QString(captions[static_cast<size_t>(section)]);

@@ -14,8 +14,8 @@ class MessageListModel final : public QAbstractTableModel {
 public:
     using QAbstractTableModel::QAbstractTableModel;
 
-    /// Replaces the messages. The sort order and the search stay.
-    void setMessages(QList<ListedMessage> messages);
+    /// Replaces the messages by those of a folder. The sort order and the search stay.
+    void setMessages(QList<ListedMessage> messages, MessageFolder theirFolder);
     /// All messages, hidden ones included, in the order of the folder.
     const QList<ListedMessage>& messages() const { return all; }
 
@@ -41,6 +41,7 @@ private:
     void putInOrder();
     void narrow();
 
+    MessageFolder folder = MessageFolder::Unread;
     QList<ListedMessage> all;  // in the folder's order
     QStringList texts;         // the searchable text of each message
     QList<qsizetype> ordered;  // indexes into `all`, sorted

@@ -86,7 +86,8 @@ void frmMessageList::connectControls()
         return new QShortcut(key, ListView1, nullptr, nullptr, Qt::WidgetShortcut);
     };
     on(inList(Qt::Key_Delete), &QShortcut::activated, u"Command6_Click"_s, [this] { Command6_Click(); });
-    on(inList(Qt::Key_Return), &QShortcut::activated, u"ListView1_DblClick"_s, [this] { ListView1_DblClick(); });
+    for (const Qt::Key enter : {Qt::Key_Return, Qt::Key_Enter})
+        on(inList(enter), &QShortcut::activated, u"ListView1_DblClick"_s, [this] { ListView1_DblClick(); });
     on(txtFind, &QLineEdit::textChanged, u"txtFind_Change"_s, [this] { txtFind_Change(); });
     on(new QShortcut(Qt::Key_F5, this), &QShortcut::activated, u"Form_KeyRefresh"_s, [this] { Form_KeyRefresh(); });
     on(new QShortcut(QKeySequence::Paste, this), &QShortcut::activated, u"Form_Paste"_s, [this] { Form_Paste(); });
@@ -182,17 +183,17 @@ void frmMessageList::fill()
             listed = BuildMessageList(iFolder, hooks);
         } catch (const RuntimeError& error) {
             fillFailure = error.description();
+            heldBack.clear();
         }
     }
-    messages->setMessages(std::move(listed));
+    messages->setMessages(std::move(listed), iFolder);
     choose(0);
     for (const recovery::Settled& operation : recovery::takeSettled())
         settled.append(operation.sentence());
-    const QString held = u"%1 held back (F4)"_s.arg(heldBack.size());
-    lblStatus->tell((settled + QStringList(status())).join(u' '), heldBack.isEmpty() ? QString() : held);
-    cmdHeld->setText(held);
+    cmdHeld->setText((isStopped ? u"%1 or more held back (F4)"_s : u"%1 held back (F4)"_s).arg(heldBack.size()));
     cmdHeld->setShortcut(Qt::Key_F4);  // a new text takes the key away
     cmdHeld->setVisible(!heldBack.isEmpty());
+    tellStatus();
 }
 
 const QList<ListedMessage>& frmMessageList::rows() const
@@ -212,6 +213,16 @@ QString frmMessageList::status() const
     const QString found =
         txtFind->text().isEmpty() ? counted : written().toString(messages->rowCount()) + " of "_L1 + counted;
     return isStopped ? found + "; not all, because Esc has stopped the reading (F5 reads all)"_L1 : found;
+}
+
+void frmMessageList::tell(const QString& text)
+{
+    lblStatus->tell(text, heldBack.isEmpty() ? QString() : cmdHeld->text());
+}
+
+void frmMessageList::tellStatus()
+{
+    tell((settled + QStringList(status())).join(u' '));
 }
 
 void frmMessageList::Option1_Click(MessageFolder folder)
@@ -292,7 +303,7 @@ bool frmMessageList::load(const QString& file)
         }
         RefreshList();
         if (!isMoved(file))
-            lblStatus->tell(
+            tell(
                 u"%1 is loaded, but could not be moved to the read messages: it is moved as soon as that "
                 "is possible."_s.arg(file));
         desktop::msgBox(u"Message Loaded"_s);
@@ -355,7 +366,7 @@ void frmMessageList::txtFind_Change()
     if (messages->rowCount() == 0)
         sCurFile.clear();  // a hidden message can't be reprinted
     choose(qMax(messages->rowOf(chosen), 0));
-    lblStatus->tell(status());
+    tellStatus();
 }
 
 // Keeps the selected message, unlike the refreshes after a load or a deletion.
@@ -370,9 +381,9 @@ void frmMessageList::Form_Paste()
 {
     const QMimeData* clipboard = QGuiApplication::clipboard()->mimeData();
     if (iFolder != MessageFolder::Unread)
-        lblStatus->tell(u"Files can be taken in only while the unread messages are shown."_s);
+        tell(u"Files can be taken in only while the unread messages are shown."_s);
     else if (!clipboard || !clipboard->hasUrls())
-        lblStatus->tell(u"The clipboard contains no files."_s);
+        tell(u"The clipboard contains no files."_s);
     else
         takeIn(clipboard->urls());
 }
@@ -383,12 +394,12 @@ void frmMessageList::dragEnterEvent(QDragEnterEvent* event)
         return;
     event->setDropAction(Qt::CopyAction);  // with a move, the source program would delete the files
     event->accept();
-    lblStatus->tell(u"Let go to take the files in."_s);
+    tell(u"Let go to take the files in."_s);
 }
 
 void frmMessageList::dragLeaveEvent(QDragLeaveEvent*)
 {
-    lblStatus->tell(status());
+    tellStatus();
 }
 
 void frmMessageList::dropEvent(QDropEvent* event)
@@ -414,8 +425,8 @@ void frmMessageList::takeIn(const QList<QUrl>& brought)
                                   return taken.toList.contains(message.file);
                               });
     const QString held = u" %1 not listed yet: held back by missing pictures or an earlier message."_s;
-    lblStatus->tell(taken.summary() + (waiting > 0 && fillFailure.isEmpty() ? held.arg(waiting) : QString()) + u' ' +
-                    lblStatus->text());
+    tell(taken.summary() + (waiting > 0 && fillFailure.isEmpty() ? held.arg(waiting) : QString()) + u' ' +
+         lblStatus->text());
     if (!taken.refused.isEmpty())
         desktop::msgBox(taken.refusals(), desktop::Icon::Exclamation);
 }

@@ -68,6 +68,8 @@ private:
     void refill();
     void fill();
     QString status() const;
+    void tell(const QString& text);
+    void tellStatus();
     bool load(const QString& file);
     bool loadOnce(const QString& file);
     void takeIn(const QList<QUrl>& brought);

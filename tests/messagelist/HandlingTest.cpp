@@ -27,12 +27,20 @@ TEST_F(Handling, SeveralRowsAreCopiedButOneIsLoaded)
     EXPECT_EQ(desktop->boxTexts().size(), 1) << "the refusal of one message";
 }
 
-TEST_F(Handling, TheNameTellsWhenAFileArrived)
+TEST_F(Handling, TheNameTellsWhatHappenedWhen)
 {
     work([](QDialog& window) {
-        const QModelIndex name = control<QTreeView>(window, "ListView1").model()->index(0, 0);
-        EXPECT_EQ(name.data(Qt::ToolTipRole).toString().section(u' ', 0, 1),
-                  u"a.xml\nArrived "_s + QDate::currentDate().toString(u"dd/MM/yyyy"_s));
+        QStringList told;
+        for (const char* option : {"Option1(0)", "Option1(1)", "Option1(2)"}) {
+            files::write(gsReadPath + u"a.xml"_s, cancellation("QR1").text());
+            files::write(gsSentPath + u"a.xml"_s, cancellation("QR1").text());
+            control<QAbstractButton>(window, option).click();
+            const QModelIndex name = control<QTreeView>(window, "ListView1").model()->index(0, 0);
+            told << name.data(Qt::ToolTipRole).toString().section(u' ', 0, 1);
+        }
+        const QString today = QDate::currentDate().toString(u"dd/MM/yyyy"_s);
+        EXPECT_EQ(told, (QStringList{u"a.xml\nArrived "_s + today, u"a.xml\nLoaded "_s + today,
+                                     u"a.xml\nWritten "_s + today}));
     });
 }
 

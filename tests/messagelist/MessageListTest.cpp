@@ -91,6 +91,7 @@ TEST_F(MessageListWindow, TheLineUnderTheListNamesTheFileThatEndedTheFill)
         {u"R_500_0.xml"_s, answer + u"<more/>"_s, u"contains no complete answer to quote 500"_s},
     };
     arrive("m.xml", cancellation("QR1"));
+    arrive("m2.xml", cancellation("QR1"));
     for (const auto& [file, text, reason] : cases) {
         arrive(file, text);
         frmMessageList window;
@@ -99,6 +100,7 @@ TEST_F(MessageListWindow, TheLineUnderTheListNamesTheFileThatEndedTheFill)
                   u"The list could not be filled: %1 %2. Move the file out of the folder; until then no messages are "
                   "listed."_s.arg(file, reason));
         EXPECT_TRUE(window.rows().isEmpty());
+        EXPECT_TRUE(window.heldMessages().isEmpty()) << "of half a folder";
         files::remove(gsUnreadPath + file);
     }
     EXPECT_EQ(shown(), "");
@@ -224,7 +226,8 @@ TEST_F(MessageListWindow, ADoubleClickShowsOnlyASentMessage)
 TEST(MessageListModel, NeitherSortsNorShowsLeadingBlanks)
 {
     MessageListModel model;
-    model.setMessages({{u"a.xml"_s, {u"Type"_s, {}, {}, u"  Zeta"_s}}, {u"b.xml"_s, {u"Type"_s, {}, {}, u" Alpha"_s}}});
+    model.setMessages({{u"a.xml"_s, {u"Type"_s, {}, {}, u"  Zeta"_s}}, {u"b.xml"_s, {u"Type"_s, {}, {}, u" Alpha"_s}}},
+                      MessageFolder::Unread);
     model.sort(4);
     EXPECT_EQ(model.data(model.index(0, 4)).toString() + model.data(model.index(1, 4)).toString(), u"AlphaZeta"_s);
 }

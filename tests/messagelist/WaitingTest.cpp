@@ -37,9 +37,10 @@ struct Waiting : Shop {
 
 TEST_F(Waiting, AFillTakesNoKeyButEscWhichStopsIt)
 {
+    arrive("0.xml", quoteRequest("QR1").images({"1"}));  // is held back
     for (const char* name : {"a", "b", "c"})
         arrive(std::string(name) + ".xml", cancellation(name));
-    const QString stopped = u"1 message; not all, because Esc has stopped the reading (F5 reads all)"_s;
+    const QString stopped = u"0 messages; not all, because Esc has stopped the reading (F5 reads all)"_s;
     QStringList lines;
     const auto work = [&](QDialog& window) {
         auto& read = control<QAbstractButton>(window, "Option1(1)");
@@ -61,6 +62,7 @@ TEST_F(Waiting, AFillTakesNoKeyButEscWhichStopsIt)
         EXPECT_FALSE(read.isChecked());
         fill([&] { gestures::press(window, Qt::Key_Escape); });
         EXPECT_TRUE(window.isVisible()) << "Esc closes it only at rest";
+        EXPECT_EQ(control<QToolButton>(window, "cmdHeld").text(), u"1 or more held back (F4)"_s);
         gestures::press(window, Qt::Key_F5);
         lines << control<QLabel>(window, "lblStatus").text();
         gestures::click(read, read.rect().center());
@@ -71,7 +73,7 @@ TEST_F(Waiting, AFillTakesNoKeyButEscWhichStopsIt)
     frmMessageList::ShowForm();
     desktop.emplace();
     EXPECT_EQ(lines, (QStringList{u"3 messages"_s, stopped, u"3 messages"_s}));
-    EXPECT_EQ(filesIn(gsUnreadPath).size(), 3);
+    EXPECT_EQ(filesIn(gsUnreadPath).size(), 4);
 }
 
 TEST_F(Waiting, ASilentServerIsNamedAfterASecond)

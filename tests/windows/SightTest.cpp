@@ -117,7 +117,8 @@ TEST_F(EveryWindow, ShowsWhichControlHasTheFocus)
 TEST_F(EveryWindow, OffersButtonsAndCopyInTheMenuOfItsList)
 {
     each([](QDialog& window) {
-        for (QTreeView* list : visible<QTreeView>(window)) {
+        const QList<QTreeView*> lists = visible<QTreeView>(window);
+        for (QTreeView* list : lists + lists) {
             const QPoint place = list->viewport()->rect().center();
             QContextMenuEvent asks(QContextMenuEvent::Mouse, place, list->viewport()->mapToGlobal(place));
             QCoreApplication::sendEvent(list->viewport(), &asks);
@@ -126,9 +127,11 @@ TEST_F(EveryWindow, OffersButtonsAndCopyInTheMenuOfItsList)
             EXPECT_TRUE(menu->actions().last()->text().startsWith(u"&Copy"_s));
             for (const QAction* action : menu->actions().first(menu->actions().size() - 1))
                 EXPECT_TRUE(std::ranges::any_of(window.findChildren<QPushButton*>(), [&](const QPushButton* button) {
-                    return button->text() == action->text() && button->isEnabled() == action->isEnabled();
+                    return button->text() == action->text() &&
+                           action->isEnabled() == (button->isEnabled() && list->selectionModel()->hasSelection());
                 })) << action->text();
             menu->close();
+            list->clearSelection();  // the second time
         }
     });
 }
@@ -152,6 +155,9 @@ TEST_F(EveryWindow, AnnouncesWhatItsStatusLineSays)
         if (window.objectName() == "frmMessageList"_L1) {
             control<QLineEdit>(window, "txtFind").setText(u"nothing like it"_s);
             EXPECT_TRUE(announced.value(0).startsWith(u"0 of "_s)) << announced.join(u'|');
+            EXPECT_TRUE(control<QToolButton>(window, "cmdHeld").isHidden() ||
+                        announced.value(0).endsWith(u", 1 held back (F4)"_s))
+                << announced.join(u'|');
             announced.clear();
             arrive("d.xml", cancellation("QR2"));
             gestures::press(window, Qt::Key_F5);

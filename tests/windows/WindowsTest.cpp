@@ -136,6 +136,8 @@ TEST_F(EveryWindow, HasTextsAndRowsThatCanBeCopied)
     each([&](QDialog& window) {
         for (QTreeView* list : visible<QTreeView>(window)) {
             EXPECT_TRUE(list->header()->stretchLastSection());
+            const QVariant tip = list->model()->headerData(1, Qt::Horizontal, Qt::ToolTipRole);
+            EXPECT_EQ(tip.toString(), u"Sort by this column (Ctrl+2)"_s);
             list->setFocus();
             if (const QString row = copied(window); list->currentIndex().isValid()) {
                 EXPECT_EQ(row.count(u'\t'), list->header()->count() - 1) << row;
@@ -259,6 +261,16 @@ TEST_F(EveryWindow, NamesEveryControlForAScreenReader)
             EXPECT_TRUE(heard->role() != QAccessible::Client || isA<QAbstractScrollArea>(*control)) << nameOf(*control);
         }
         EXPECT_FALSE(window.windowTitle().isEmpty());
+        for (QTreeView* list : visible<QTreeView>(window)) {
+            QAccessibleTableInterface* table = QAccessible::queryAccessibleInterface(list)->tableInterface();
+            ASSERT_TRUE(table) << nameOf(*list);
+            for (int row = 0; row < list->model()->rowCount(); ++row) {
+                QAccessibleInterface* cell = table->cellAt(row, 1);
+                EXPECT_EQ(cell->tableCellInterface()->rowIndex(), row);
+                EXPECT_EQ(cell->tableCellInterface()->columnIndex(), 1);
+                EXPECT_EQ(cell->text(QAccessible::Name), list->model()->index(row, 1).data().toString());
+            }
+        }
     });
 }
 

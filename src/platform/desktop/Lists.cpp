@@ -21,6 +21,11 @@ namespace {
 
 constexpr int numberKeys = 9;
 
+QKeySequence sortKeys(int column)
+{
+    return Qt::CTRL | static_cast<Qt::Key>(Qt::Key_1 + column);
+}
+
 /// Acts as a click on the header of the column.
 void sortBy(QHeaderView& header, int column)
 {
@@ -65,11 +70,8 @@ void prepareList(QTreeView& list, const QString& window, Qt::ShortcutContext key
     const QString source = window + u'.' + list.objectName() + u"_ColumnClick"_s;
     onEvent(header, &QHeaderView::sortIndicatorChanged, &list, source, [&list] { list.scrollTo(list.currentIndex()); });
     for (int column = 0; column < qMin(header->count(), numberKeys); ++column) {
-        const QKeySequence keys(Qt::CTRL | static_cast<Qt::Key>(Qt::Key_1 + column));
-        list.model()->setHeaderData(column, Qt::Horizontal,
-                                    u"Sort by this column (%1)"_s.arg(keys.toString(QKeySequence::NativeText)),
-                                    Qt::ToolTipRole);
-        onEvent(new QShortcut(keys, &list, nullptr, nullptr, keysOf), &QShortcut::activated, &list, source,
+        list.model()->setHeaderData(column, Qt::Horizontal, sortTip(column), Qt::ToolTipRole);
+        onEvent(new QShortcut(sortKeys(column), &list, nullptr, nullptr, keysOf), &QShortcut::activated, &list, source,
                 [header, column] { sortBy(*header, column); });
     }
     auto* copy = new QShortcut(QKeySequence::Copy, &list, nullptr, nullptr, Qt::WidgetShortcut);
@@ -84,18 +86,24 @@ void prepareList(QTreeView& list, const QString& window, Qt::ShortcutContext key
     });
 }
 
+QString sortTip(int column)
+{
+    return u"Sort by this column (%1)"_s.arg(sortKeys(column).toString(QKeySequence::NativeText));
+}
+
 void addListMenu(QTreeView& list, const QString& window, const QList<QPushButton*>& buttons)
 {
     list.setContextMenuPolicy(Qt::CustomContextMenu);
     const QString source = window + u'.' + list.objectName() + u"_MouseUp"_s;
     onEvent(&list, &QTreeView::customContextMenuRequested, &list, source, [&list, buttons](const QPoint& place) {
+        const bool isCurrentSelected = list.selectionModel()->isSelected(list.currentIndex());
         auto* menu = new QMenu(&list);
         menu->setAttribute(Qt::WA_DeleteOnClose);
         for (QPushButton* button : buttons) {
             if (!button->isVisible())
                 continue;
             QAction* action = menu->addAction(button->text(), button, &QPushButton::click);
-            action->setEnabled(button->isEnabled() && list.currentIndex().isValid());
+            action->setEnabled(button->isEnabled() && isCurrentSelected);
         }
         menu->addAction(u"&Copy\tCtrl+C"_s, &list, [&list] { copyRows(list); });
         menu->popup(list.viewport()->mapToGlobal(place));

@@ -2,10 +2,10 @@
 #pragma once
 
 #include <QList>
+#include <QString>
 #include <Qt>
 
 class QPushButton;
-class QString;
 class QTreeView;
 
 namespace kest::desktop {
@@ -19,7 +19,12 @@ namespace kest::desktop {
 /// If the window has more than one list, the keys of each must be `Qt::WidgetShortcut`, for the list with the focus.
 void prepareList(QTreeView& list, const QString& window, Qt::ShortcutContext keysOf = Qt::WindowShortcut);
 
-/// Adds a context menu with the visible ones of these buttons, and with "Copy".
+/// Returns the tool tip of a column's header, counted from 0. prepareList() sets it, but only in a model that stores
+/// it.
+QString sortTip(int column);
+
+/// Adds a context menu with the visible ones of these buttons, which need a selected row, and with
+/// "Copy".
 void addListMenu(QTreeView& list, const QString& window, const QList<QPushButton*>& buttons);
 
 }  // namespace kest::desktop
