@@ -11,6 +11,7 @@
 #include "base/SharedVariables.h"
 #include "jobexport/JobLinkSettings.h"
 #include "platform/RuntimeError.h"
+#include "platform/desktop/Form.h"
 #include "platform/desktop/Person.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/Background.h"
@@ -433,6 +434,8 @@ int run(const CommandLine& line)
             desktop::usePerson();
         else
             script = answeringScript(line);
+        desktop::showWaits();
+        desktop::setAbout(aboutText);
         report::setOutputFolder(line.reports);
     } catch (const RuntimeError& error) {
         return refuse(line, error.description(), Usage);

@@ -19,7 +19,7 @@ namespace kest::app {
 
 using namespace Qt::StringLiterals;
 
-ProfileWindow::ProfileWindow() : Form(u"frmProfile"_s, u"New Shop"_s), txtFolder(new QLineEdit)
+ProfileWindow::ProfileWindow() : Form(u"frmProfile"_s, u"New Shop"_s), txtFolder(new QLineEdit), txtName(new QLineEdit)
 {
     auto* question = new QLabel(
         u"There is no shop on this computer yet. &Folder for its settings, messages, pictures "
@@ -29,6 +29,9 @@ ProfileWindow::ProfileWindow() : Form(u"frmProfile"_s, u"New Shop"_s), txtFolder
     txtFolder->setObjectName(u"txtFolder"_s);
     txtFolder->setText(QDir::toNativeSeparators(profile::root()));
     txtFolder->setMinimumWidth(desktop::pixels(6000));
+    auto* nameQuestion = new QLabel(u"&Name of the shop, the author of its saved reports:"_s);
+    nameQuestion->setBuddy(txtName);
+    txtName->setObjectName(u"txtName"_s);
     auto* cmdBrowse = button(u"cmdBrowse"_s, u"&Browse..."_s, [this] { cmdBrowse_Click(); });
     auto* cmdOK = button(u"cmdOK"_s, u"C&reate"_s, [this] { cmdOK_Click(); });
     auto* cmdCancel = button(u"cmdCancel"_s, u"Cancel"_s, [this] { close(); });
@@ -44,7 +47,10 @@ ProfileWindow::ProfileWindow() : Form(u"frmProfile"_s, u"New Shop"_s), txtFolder
     auto* layout = new QVBoxLayout(this);
     layout->addWidget(question);
     layout->addLayout(folder);
+    layout->addWidget(nameQuestion);
+    layout->addWidget(txtName);
     layout->addLayout(buttons);
+    fixSize();
 }
 
 void ProfileWindow::ShowForm()
@@ -70,6 +76,7 @@ void ProfileWindow::cmdOK_Click()
         const desktop::WaitPointer pointer(u"Creating the shop..."_s);
         placeProfile(QDir::fromNativeSeparators(txtFolder->text().trimmed()));
         initProfile(registerClass, Shop::New);
+        nameShop(txtName->text().trimmed());
     } catch (const RuntimeError& error) {
         desktop::msgBox(u"The shop can't be created in this folder: "_s + error.description(), desktop::Icon::Critical);
         txtFolder->setFocus();

@@ -11,8 +11,9 @@ namespace kest::app {
 class ProfileWindow final : public desktop::Form {
     Q_OBJECT
 public:
-    /// Asks for a folder and creates the profile there. If it is another folder than that of the profile, the profile
-    /// becomes a link to it. A folder that already has a profile is used as it is. Does nothing if the user cancels.
+    /// Asks for a folder and the name of the shop, and creates the profile there. If it is another folder than that of
+    /// the profile, the profile becomes a link to it. A folder that already has a profile is used as it is. Does
+    /// nothing if the user cancels.
     static void ShowForm();
 
 private:
@@ -22,6 +23,7 @@ private:
     void cmdOK_Click();
 
     QLineEdit* txtFolder;
+    QLineEdit* txtName;
 };
 
 }  // namespace kest::app

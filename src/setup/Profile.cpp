@@ -29,6 +29,8 @@ const QString home = u"c:\\wirdoc\\"_s;
 const QString images = u"c:\\wirimg\\"_s;
 const QString reports = u"c:\\wirra32\\report\\"_s;
 const QString databaseName = u"WirSql"_s;
+const QString lockName = u"init.lock"_s;
+const QString nameOfDemoShop = u"Marlin Smash Repairs"_s;
 
 struct Setting {
     QString key;
@@ -50,13 +52,14 @@ const QList<Setting>& settingsOfNewProfile()
     return all;
 }
 
-void writeSettings()
+/// Stores a setting that is missing.
+void writeSetting(const Setting& setting)
 {
-    for (const auto& [key, name, value] : settingsOfNewProfile())
-        if (RegGetValue(Hive::LocalMachine, key, name).isEmpty() &&
-            (!settings::createKey(Hive::LocalMachine, key) ||
-             !settings::setValue(Hive::LocalMachine, key, name, {settings::Type::Text, value})))
-            throw RuntimeError(FileInputOutput, u"The setting %1 can't be written."_s.arg(name));
+    const auto& [key, name, value] = setting;
+    if (RegGetValue(Hive::LocalMachine, key, name).isEmpty() &&
+        (!settings::createKey(Hive::LocalMachine, key) ||
+         !settings::setValue(Hive::LocalMachine, key, name, {settings::Type::Text, value})))
+        throw RuntimeError(FileInputOutput, u"The setting %1 can't be written."_s.arg(name));
 }
 
 /// Returns a setting of the host or, if it is missing, the value of a new profile.
@@ -67,6 +70,21 @@ QString hostSetting(const QString& name)
         if (setting.name == name)
             ofNewProfile = setting.value;
     return GetRegSetting(u"wirra32"_s, u"frmsplash"_s, name, ofNewProfile, CopyUp::No);
+}
+
+/// Returns true if initProfile() has begun to fill the folder, but failed before it stored a setting.
+bool isUnfinished(const QDir& folder)
+{
+    return folder.exists(lockName) && !folder.exists(u"registry.ini"_s);
+}
+
+/// Returns the path, with a number behind it if something else has that name.
+QString freeName(const QString& path)
+{
+    QString name = path;
+    for (int number = 2; QFileInfo::exists(name); ++number)
+        name = path + QString::number(number);
+    return name;
 }
 
 /// Returns true if initProfile() has finished before. A host that starts without a profile also writes settings, but
@@ -138,7 +156,7 @@ bool initProfile(const std::function<bool()>& registerClass, Shop shop, const QD
     files::makeFolder(profile::root());
     // a second init at the same time would delete the unfinished database
     constexpr int longestInit = 60000;  // milliseconds
-    const files::Lock making(profile::root() + u"/init.lock"_s, {}, longestInit);
+    const files::Lock making(profile::root() + u'/' + lockName, {}, longestInit);
     if (!making.isHeld())
         throw RuntimeError(PermissionDenied, u"Another \"kest2 init\" is still creating "_s + profile::root());
     if (isWhole())
@@ -152,8 +170,17 @@ bool initProfile(const std::function<bool()>& registerClass, Shop shop, const QD
         putDemoFiles(hostSetting(u"EcomHome"_s), hostSetting(u"ImagesPath"_s), today);
     if (!registerClass())
         throw RuntimeError(FileInputOutput, u"The class can't be registered in the settings."_s);
-    writeSettings();  // last, because they mark the profile as complete
+    if (shop == Shop::Demo)
+        nameShop(nameOfDemoShop);
+    for (const Setting& setting : settingsOfNewProfile())  // last, because they mark the profile as complete
+        writeSetting(setting);
     return true;
+}
+
+void nameShop(const QString& name)
+{
+    if (!name.isEmpty())
+        writeSetting({hostKey, u"ShopName"_s, name});
 }
 
 void placeProfile(const QString& folder)
@@ -162,16 +189,18 @@ void placeProfile(const QString& folder)
         throw RuntimeError(PathNotFound, u"a whole path is needed, from the first \"/\" on"_s);
     const QString place = profile::root();
     const QString chosen = QDir::cleanPath(folder);
+    if (QFileInfo(place).isSymLink() && (chosen != place || isUnfinished(place)))
+        QFile::remove(place);  // of an attempt that has failed
     const QDir there(chosen);
     const bool isEmpty = there.isEmpty(QDir::AllEntries | QDir::Hidden | QDir::NoDotAndDotDot);
-    if (there.exists() && !isEmpty && !there.exists(u"registry.ini"_s))
+    if (there.exists() && !isEmpty && !there.exists(u"registry.ini"_s) && !isUnfinished(chosen))
         throw RuntimeError(FileExists, u"it contains other files"_s);
     if (chosen == place)
         return;
     files::makeFolder(chosen);
-    if (QFileInfo(place).isSymLink())
-        QFile::remove(place);  // of an attempt that has failed
-    QDir().rmdir(place);       // which fails if anything is in it
+    if (isUnfinished(place))
+        QDir().rename(place, freeName(place + u".unfinished"_s));
+    QDir().rmdir(place);  // which fails if anything is in it
     files::makeFolder(QFileInfo(place).path());
     if (!QFile::link(chosen, place))
         throw RuntimeError(PermissionDenied, u"%1 can't become a link to it"_s.arg(place));

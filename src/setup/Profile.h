@@ -19,9 +19,13 @@ enum class Shop { New, Demo };
 /// Throws RuntimeError if a file can't be written.
 bool initProfile(const std::function<bool()>& registerClass, Shop shop, const QDate& today = QDate::currentDate());
 
+/// Stores the name of the shop, the author of its reports, unless it has one or the name is empty.
+void nameShop(const QString& name);
+
 /// Makes `folder`, an absolute path of this system, the place of the profile, before initProfile(): if it is another
-/// folder than profile::root(), that becomes a link to it. Throws RuntimeError if `folder` is no absolute path, if it
-/// has other files in it but no profile, or if the link can't be made.
+/// folder than profile::root(), that becomes a link to it. What an initProfile() that failed has left in `folder` is
+/// used, and what it has left in profile::root() is moved to a name with ".unfinished". Throws RuntimeError if `folder`
+/// is no absolute path, if it has other files in it but no profile, or if the link can't be made.
 void placeProfile(const QString& folder);
 
 /// Returns absolute paths of this system: `profile`, `database`, `unread`, `read`, `unsent`, `sent`, `images`, `pdf`,

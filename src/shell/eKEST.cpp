@@ -6,8 +6,8 @@
 #include "base/modLoggerEx.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
-#include "platform/Waiting.h"
-#include "platform/desktop/Progress.h"
+#include "platform/desktop/Form.h"
+#include "platform/desktop/Person.h"
 #include "platform/desktop/Window.h"
 #include "platform/files/Background.h"
 #include "platform/files/files.h"
@@ -36,24 +36,23 @@ void reportUntrapped(const RuntimeError& error, const QString& source)
     LogError(error, source, source.mid(source.indexOf(u'.') + 1));
 }
 
-QString about()
+}  // namespace
+
+QString aboutText()
 {
+    if (gsServer.isEmpty())  // nothing has opened the database yet
+        readConnectionSettings();
     const QString lastError = lastLogRecord();
     return u"KEST2 " KEST_VERSION "\nProfile: "_s + profile::root() + u"\nDatabase: "_s + databaseDescription() +
            u"\nError log: "_s + errorLogPath() + u"\nLast error: "_s + (lastError.isEmpty() ? u"none"_s : lastError);
 }
 
-}  // namespace
-
 eKEST::eKEST()
 {
     ++objects;
-    desktop::setAbout(about);
+    desktop::setAbout(aboutText);
     desktop::setFailureReporter(reportUntrapped);
-    if (desktop::isPersonPresent()) {
-        setWorkStep(desktop::stillWaiting);
-        setWait(desktop::waitFor);
-    }
+    desktop::showWaits();
     gConn = GetConnection();
     gsUnreadPath = homeFolder() + u"AUnread\\"_s;
     gsReadPath = homeFolder() + u"ARead\\"_s;

@@ -19,6 +19,8 @@ public:
     void ShowKESTWindow(const QString& sQTNNO, const QString& sSubQuote);
 };
 
+/// Returns the text of the box "About KEST2": version, profile, database, error log and last error.
+QString aboutText();
 /// Returns true if there is a connection. Otherwise shows a box and returns false.
 bool hasConnection();
 /// Opens `grsQuote` for the host's open quote. Returns false if hasConnection() does.

@@ -2,7 +2,9 @@
 #include "app/CommandLine.h"
 #include "app/Commands.h"
 #include "app/ProfileWindow.h"
+#include "base/ModRegistry.h"
 #include "platform/Waiting.h"
+#include "platform/script/Gestures.h"
 #include "support/Hands.h"
 #include "support/ScriptedDesktop.h"
 #include "support/Test.h"
@@ -18,7 +20,7 @@ struct Start : ::testing::Test {
     }
 
     /// Starts the command as the menu does. Operates the windows that a person would see, or closes them.
-    int open(const Hands::Work& inTheQuestion)
+    int open(const Hands::Work& inTheQuestion, const QStringList& words = {u"open"_s})
     {
         names.clear();
         QPointer<QDialog> last;
@@ -30,17 +32,28 @@ struct Start : ::testing::Test {
             last = window;
             names << window->objectName();
             if (window->objectName() == u"frmProfile"_s)
-                inTheQuestion(*window);
-            else
-                window->close();
+                return inTheQuestion(*window);
+            askAbout(*window);
+            window->close();
         });
         look.start(5);
-        return app::run(app::parsed({u"open"_s}));
+        return app::run(app::parsed(words));
+    }
+
+    /// Presses F1 and notes what the box says.
+    void askAbout(QDialog& window)
+    {
+        whenShown<QMessageBox>([this](QMessageBox& box) {
+            about << box.text();
+            box.close();
+        });
+        desktop::gestures::press(window, Qt::Key_F1);
     }
 
     QTemporaryDir folder{memoryFolder(u"start"_s)};
     QString place = folder.path() + u"/data/kest2"_s;
     QStringList names;
+    QStringList about;
 };
 
 /// Types a folder and clicks "Create".
@@ -48,6 +61,7 @@ static Hands::Work create(const QString& path)
 {
     return [path](QDialog& window) {
         control<QLineEdit>(window, "txtFolder").setText(path);
+        control<QLineEdit>(window, "txtName").setText(u" Café Repairs"_s);
         control<QPushButton>(window, "cmdOK").click();
     };
 }
@@ -60,6 +74,7 @@ TEST_F(Start, AsksWhereTheShopIsToBeAndOpensIt)
         EXPECT_EQ(names, both);
         EXPECT_TRUE(QFile::exists(chosen + u"/databases/WirSql.db"_s));
         EXPECT_EQ(QFileInfo(place).canonicalFilePath(), chosen);
+        EXPECT_EQ(GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"ShopName"_s, {}), u"Café Repairs"_s);
         EXPECT_EQ(open({}), app::Done);
         EXPECT_EQ(names, QStringList(u"frmKEST"_s)) << "the next start finds it";
         if (!QFile::remove(place))  // a link
@@ -72,7 +87,11 @@ TEST_F(Start, AsksWhereTheShopIsToBeAndOpensIt)
 TEST_F(Start, CreatesNothingAfterCancelOrInAFolderThatItCannotUse)
 {
     const auto cancel = [](QDialog& window) {
-        window.resize(window.size() + QSize(90, 0));  // nor remembers it
+        whenShown<QFileDialog>([](QFileDialog& browser) {
+            browser.resize(browser.size() + QSize(90, 0));  // nor remembers it
+            browser.close();
+        });
+        control<QPushButton>(window, "cmdBrowse").click();
         control<QPushButton>(window, "cmdCancel").click();
     };
     EXPECT_EQ(open(cancel), app::NoConnection);
@@ -84,4 +103,38 @@ TEST_F(Start, CreatesNothingAfterCancelOrInAFolderThatItCannotUse)
     }
     EXPECT_EQ(desk.boxTexts().size(), 3);
     EXPECT_FALSE(QFileInfo::exists(folder.path() + u"/data"_s));
+}
+
+TEST_F(Start, RepeatsACreationThatHasFailed)
+{
+    const QString other = folder.path() + u"/other shop"_s;
+    for (const auto& [first, second] : {std::pair(place, place), {place, other}, {other, place}}) {
+        open([&](QDialog& window) {
+            qputenv("KEST2_COMPONENT_DIR", "/proc/kest2");  // can't be created
+            whenShown<QMessageBox>([](QMessageBox& box) { box.close(); });
+            create(first)(window);
+            qunsetenv("KEST2_COMPONENT_DIR");
+            create(second)(window);
+        });
+        EXPECT_EQ(names.last(), u"frmKEST"_s);
+        EXPECT_EQ(QFileInfo(place).canonicalFilePath(), second);
+        EXPECT_EQ(QFile::exists(place + u".unfinished"_s), second == other) << "what the first attempt has left";
+        for (const QString& made : {place, place + u".unfinished"_s, other})
+            if (!QFile::remove(made))
+                QDir(made).removeRecursively();
+    }
+}
+
+TEST_F(Start, TellsAboutItselfWithoutAConnection)
+{
+    const auto ask = [this](QDialog& window) {
+        askAbout(window);
+        create(place)(window);
+    };
+    EXPECT_EQ(open(ask, {u"transport"_s, u"--window"_s}), app::Done);
+    EXPECT_EQ(names, (QStringList{u"frmProfile"_s, u"KESTWeb"_s}));
+    EXPECT_EQ(about.size(), 2);
+    for (const QString& text : std::as_const(about))
+        for (const QString& part : {u"KEST2 " KEST_VERSION ""_s, place, u"WirSql (embedded)"_s})
+            EXPECT_TRUE(text.contains(part)) << text;
 }

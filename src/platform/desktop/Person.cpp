@@ -1,6 +1,7 @@
 #include "platform/desktop/Person.h"
 
 #include "platform/Prompt.h"
+#include "platform/Waiting.h"
 #include "platform/desktop/Colours.h"
 #include "platform/desktop/Programs.h"
 #include "platform/desktop/Progress.h"
@@ -143,6 +144,14 @@ void usePerson()
 {
     setAnswerer(std::make_shared<PersonAnswerer>());
     setWindowDriver(nullptr);
+}
+
+void showWaits()
+{
+    if (!isPersonPresent())
+        return;
+    setWorkStep(stillWaiting);
+    setWait(waitFor);
 }
 
 }  // namespace kest::desktop
