@@ -1,11 +1,18 @@
 // Tests what a person can expect of every window: a key for everything, readable texts at any size, and names for
 // screen readers.
+#include "base/Journal.h"
+#include "base/SharedVariables.h"
 #include "base/modLoggerEx.h"
 #include "messagelist/frmMessageList.h"
 #include "outbound/frmExtraInfo.h"
+#include "platform/desktop/Person.h"
+#include "platform/files/files.h"
+#include "platform/profile.h"
 #include "platform/script/Gestures.h"
 #include "reports/PrintXML.h"
 #include "support/Hands.h"
+#include "support/ShopDatabase.h"
+#include "utilities/frmLogin.h"
 #include "utilities/frmUtilities.h"
 #include "windows/EveryWindow.h"
 
@@ -304,6 +311,7 @@ TEST_F(EveryWindow, GoesOnAfterTheServerHasDroppedTheConnection)
              click(window, "Command9");
              click(window, "Command1");
              EXPECT_FALSE(window.isVisible());
+             dropConnection();
          }},
         {u"frmMessageList"_s,
          [&](QDialog& window) {
@@ -311,6 +319,16 @@ TEST_F(EveryWindow, GoesOnAfterTheServerHasDroppedTheConnection)
              EXPECT_EQ(control<QLabel>(window, "lblStatus").text(), u"2 messages"_s);
          }},
         {u"frmPrintPreview"_s, [](QDialog&) { dropConnection(); }},
+        {u"frmLogin"_s,
+         [](QDialog& window) {
+             control<QLineEdit>(window, "txtPassword").setText(QString::number(dayPassword(QDate::currentDate())));
+             control<QPushButton>(window, "cmdOK").click();
+         }},
+        {u"frmKEST"_s,
+         [&](QDialog& window) {
+             control<QRadioButton>(window, "Option1(3)").click();
+             control<QPushButton>(window, "cmdOK").click();
+         }},
         {u"frmSubletAuth"_s,
          [&](QDialog& window) { documents = control<QTreeWidget>(window, "ListView1").topLevelItemCount(); }},
     });
@@ -318,8 +336,35 @@ TEST_F(EveryWindow, GoesOnAfterTheServerHasDroppedTheConnection)
     PrintXML(u"501.xml"_s, true);
     EXPECT_EQ(documents, 1);
     frmMessageList::ShowForm();
-    gsQTNNO = u"500"_s;
-    gsSubQuote = u"0"_s;
-    frmUtilities::ShowForm(u"500"_s, u"0"_s);
+    eKEST().ShowKESTWindow(u"500"_s, u"0"_s);
     EXPECT_EQ(shown(), "");
+}
+
+TEST_F(EveryWindow, TellsBeforeASendWhatTheLostConnectionHasInterrupted)
+{
+    eKEST component;
+    QStringList told;
+    QTimer closer;
+    QObject::connect(&closer, &QTimer::timeout, &closer, [&] {
+        if (auto* box = qobject_cast<QMessageBox*>(QApplication::activeModalWidget())) {
+            told << box->text();
+            box->close();
+        }
+    });
+    closer.start(1);
+    desktop::usePerson();
+    const auto sendAfterLoss = [](QDialog& window) {
+        {
+            const journal::Operation operation(journal::Kind::Save);
+            gConn->execute(u"UPDATE QUOTE1 SET CLAIM='7700003' WHERE QTNNO='500'"_s);
+            dropConnection();
+        }
+        control<QRadioButton>(window, "Option1(2)").click();
+        control<QPushButton>(window, "cmdOK").click();
+    };
+    const Hands hands({{u"frmKEST"_s, sendAfterLoss}});
+    component.ShowKESTWindow(u"500"_s, u"0"_s);
+    desktop.emplace();
+    ASSERT_EQ(told.size(), 2);
+    EXPECT_TRUE(told[0].endsWith(u"It has been taken back."_s)) << told[0].toStdString();
 }
