@@ -4,6 +4,7 @@
 #include "platform/database/Dialect.h"
 #include "platform/database/Schema.h"
 
+#include <QDeadlineTimer>
 #include <QList>
 #include <QString>
 #include <QStringList>
@@ -88,12 +89,16 @@ struct MySqlAddress {
     QString password;
 };
 
+/// How long all steps of opening a connection may take.
+inline constexpr int openMilliseconds = 4500;
+
 /// How to reach a server through an ODBC driver.
 struct OdbcTarget {
     QString connectionText;
     // a server that must show first that it answers, because its driver could wait without end; may be empty
     QString host = QString();
     int port = 0;
+    QDeadlineTimer deadline{openMilliseconds};  // for all steps until the first statement is answered
 };
 
 /// These functions throw CannotOpen. A server that does not answer costs less than five seconds.

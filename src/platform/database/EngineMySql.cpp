@@ -4,8 +4,14 @@
 #include "platform/database/MySqlServer.h"
 #include "platform/database/QtSqlEngine.h"
 
+#include <QLibrary>
+#include <QSqlDriver>
 #include <QSqlError>
 
+#include <sys/socket.h>
+
+#include <chrono>
+#include <future>
 #include <optional>
 
 namespace kest::db {
@@ -14,9 +20,22 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-constexpr int connectSeconds = 4;
-constexpr int graceSeconds = 5;  // more than the limit that the server observes itself
-constexpr qint64 freshMilliseconds = 1000;
+constexpr int answerSeconds = 4;  // for each step of opening a connection, and for a statement that takes no time
+constexpr int graceSeconds = 5;   // more than the limit that the server observes itself
+
+/// Returns the socket of an open connection, or -1 if the library of its driver is unknown.
+int socketOf(const QSqlDriver& driver)
+{
+    using GetSocket = int (*)(void* connection);
+    const auto get = reinterpret_cast<GetSocket>(QLibrary::resolve(u"mariadb"_s, 3, "mysql_get_socket"));
+    const QVariant handle = driver.handle();
+    return get ? get(*static_cast<void* const*>(handle.constData())) : -1;
+}
+
+QString versionIn(const Answer& answer)
+{
+    return answer.values.front().toString();
+}
 
 class EngineMySql final : public QtSqlEngine {
 public:
@@ -30,27 +49,25 @@ public:
         database.setDatabaseName(address.database);
         database.setUserName(address.user);
         database.setPassword(address.password);
-        QString options = u"CLIENT_FOUND_ROWS=1;MYSQL_OPT_CONNECT_TIMEOUT=%1"_s.arg(connectSeconds);
+        QString options = u"CLIENT_FOUND_ROWS=1;MYSQL_OPT_CONNECT_TIMEOUT=%1"_s.arg(answerSeconds);
         if (statementSeconds > 0)
             options += u";MYSQL_OPT_READ_TIMEOUT=%1;MYSQL_OPT_WRITE_TIMEOUT=%1"_s.arg(statementSeconds + graceSeconds);
         database.setConnectOptions(options);
         openDatabase();
         // strict mode, so that a value that is too long is refused and not cut, even if the server is configured
         // otherwise
-        run(u"SET SESSION sql_mode=CONCAT(@@sql_mode, ',NO_BACKSLASH_ESCAPES,PIPES_AS_CONCAT,STRICT_ALL_TABLES'), "
+        runShortly(
+            u"SET SESSION sql_mode=CONCAT(@@sql_mode, ',NO_BACKSLASH_ESCAPES,PIPES_AS_CONCAT,STRICT_ALL_TABLES'), "
             "autocommit=1"_s);
-        server.emplace(*this);
+        server.emplace(*this, versionIn(runShortly(MySqlServer::versionStatement())));
     }
 
     const Dialect& dialect() const override { return mySqlDialect(); }
-    void setTimeout(int seconds) override { run(server->timeoutStatement(seconds)); }
+    void setTimeout(int seconds) override { runShortly(server->timeoutStatement(seconds)); }
 
-    // A second connection asks first. On this one, the ping of a silent server would take as long as a statement may.
     void ping() override
     {
-        if (!lastAnswer.isValid() || lastAnswer.hasExpired(freshMilliseconds))
-            greet();
-        QtSqlEngine::ping();
+        patiently(u"Waiting for "_s + database.hostName() + u"..."_s, [&] { runShortly(u"SELECT 1"_s); });
     }
 
     QStringList tableNames() override { return tableNamesOf(*this, MySqlServer::informationSchema()); }
@@ -71,20 +88,14 @@ protected:
     QString sqlState(const QSqlError& error) const override { return MySqlServer::sqlState(error.nativeErrorCode()); }
 
 private:
-    void greet()
+    /// Executes a statement that takes no time. The connection of a server that does not answer for seconds is lost.
+    Answer runShortly(const QString& statement)
     {
-        const QString name = database.connectionName() + u"-ping"_s;
-        QSqlError error;
-        patiently(u"Waiting for "_s + database.hostName() + u"..."_s, [&] {
-            {
-                QSqlDatabase second = QSqlDatabase::cloneDatabase(database, name);
-                if (!second.open())
-                    error = second.lastError();
-            }
-            QSqlDatabase::removeDatabase(name);
-        });
-        if (meansConnectionLost(error))  // any other error is an answer
-            fail(error);
+        std::future<Answer> answer = std::async(std::launch::async, [&] { return run(statement); });
+        if (answer.wait_for(std::chrono::seconds(answerSeconds)) != std::future_status::ready)
+            ::shutdown(socketOf(*database.driver()),
+                       SHUT_RDWR);  // otherwise it waits as long as any statement may take
+        return answer.get();
     }
 
     std::optional<MySqlServer> server;
@@ -94,9 +105,9 @@ private:
 class EngineMySqlOverOdbc final : public EngineOdbc {
 public:
     explicit EngineMySqlOverOdbc(std::unique_ptr<OdbcConnection> connection)
-        : EngineOdbc(std::move(connection)), server(*this)
+        : EngineOdbc(std::move(connection)), server(*this, versionIn(runShortly(MySqlServer::versionStatement())))
     {
-        run(u"SET SESSION sql_mode=CONCAT(@@sql_mode, ',PIPES_AS_CONCAT')"_s);
+        runShortly(u"SET SESSION sql_mode=CONCAT(@@sql_mode, ',PIPES_AS_CONCAT')"_s);
     }
 
     const Dialect& dialect() const override { return mySqlOverOdbcDialect(); }
@@ -105,7 +116,7 @@ public:
         run(statement);
         return run(u"SELECT LAST_INSERT_ID()"_s).values.front();
     }
-    void setTimeout(int seconds) override { run(server.timeoutStatement(seconds)); }
+    void setTimeout(int seconds) override { runShortly(server.timeoutStatement(seconds)); }
 
     QStringList tableNames() override { return tableNamesOf(*this, MySqlServer::informationSchema()); }
     std::unique_ptr<TableInfo> readTable(const QString& name) override

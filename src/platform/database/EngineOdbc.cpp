@@ -15,9 +15,9 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-constexpr int connectSeconds = 4;
+constexpr int loginMilliseconds = 1000;  // at least this is left for the login of the driver, which counts seconds
 // A silent server costs twice that, because a driver also waits for the answer to its cancellation.
-constexpr int pingSeconds = 2;
+constexpr int answerSeconds = 2;
 
 /// Returns the message that says what failed: the first that is more than a warning.
 OdbcMessage decisive(const QList<OdbcMessage>& messages)
@@ -40,7 +40,12 @@ QString plain(QString message)
 
 void EngineOdbc::ping()
 {
-    patiently(u"Waiting for the database..."_s, [&] { run(u"SELECT 1"_s, pingSeconds); });
+    patiently(u"Waiting for the database..."_s, [&] { runShortly(u"SELECT 1"_s); });
+}
+
+Answer EngineOdbc::runShortly(const QString& statement)
+{
+    return run(statement, answerSeconds);
 }
 
 Answer EngineOdbc::run(const QString& statement, int seconds)
@@ -69,11 +74,13 @@ void EngineOdbc::fail(const OdbcFailure& failure)
 
 std::unique_ptr<Engine> openOdbc(const OdbcTarget& target)
 {
-    if (!target.host.isEmpty() && !answersHello(target.host, target.port, connectSeconds * 1000))
+    const int helloMilliseconds = int(target.deadline.remainingTime()) - loginMilliseconds;
+    if (!target.host.isEmpty() && !answersHello(target.host, target.port, helloMilliseconds))
         throw RuntimeError(CannotOpen, u"The server %1 does not answer on port %2."_s.arg(target.host).arg(target.port))
             .withDatabaseCodes(u"0"_s, u"08001"_s);
+    const int loginSeconds = int(std::max<qint64>(target.deadline.remainingTime(), loginMilliseconds) / 1000);
     try {
-        auto connection = std::make_unique<OdbcConnection>(target.connectionText, connectSeconds);
+        auto connection = std::make_unique<OdbcConnection>(target.connectionText, loginSeconds);
         const QString name = connection->databaseName();
         if (name.contains(u"MySQL"_s, Qt::CaseInsensitive) || name.contains(u"MariaDB"_s, Qt::CaseInsensitive))
             return mySqlOverOdbc(std::move(connection));

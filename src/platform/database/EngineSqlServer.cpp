@@ -23,7 +23,7 @@ class EngineSqlServer final : public EngineOdbc {
 public:
     explicit EngineSqlServer(std::unique_ptr<OdbcConnection> connection) : EngineOdbc(std::move(connection))
     {
-        run(u"SET NOCOUNT ON"_s);  // otherwise the counts of triggers come before that of the statement
+        runShortly(u"SET NOCOUNT ON"_s);  // otherwise the counts of triggers come before that of the statement
     }
 
     const Dialect& dialect() const override { return sqlServerDialect(); }
@@ -50,7 +50,7 @@ public:
     void setTimeout(int seconds) override
     {
         timeout = seconds;
-        run(u"SET LOCK_TIMEOUT "_s + QString::number(seconds > 0 ? qint64(seconds) * 1000 : -1));
+        runShortly(u"SET LOCK_TIMEOUT "_s + QString::number(seconds > 0 ? qint64(seconds) * 1000 : -1));
     }
 
     QStringList tableNames() override { return tableNamesOf(*this, terms()); }

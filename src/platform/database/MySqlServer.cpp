@@ -7,9 +7,9 @@ namespace kest::db {
 
 using namespace Qt::StringLiterals;
 
-MySqlServer::MySqlServer(Engine& engine) : engine_(engine)
+MySqlServer::MySqlServer(Engine& engine, const QString& version)
+    : engine_(engine), isMariaDb(version.contains(u"MariaDB"_s, Qt::CaseInsensitive))
 {
-    isMariaDb = engine.run(u"SELECT VERSION()"_s).values.front().toString().contains(u"MariaDB"_s, Qt::CaseInsensitive);
 }
 
 const InformationSchemaTerms& MySqlServer::informationSchema()

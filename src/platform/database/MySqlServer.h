@@ -11,8 +11,9 @@ namespace kest::db {
 /// The statements and error codes of MariaDB and MySQL.
 class MySqlServer {
 public:
-    /// Finds out which of the two it is.
-    explicit MySqlServer(Engine& engine);
+    /// `version` is what the server answers to the version statement.
+    MySqlServer(Engine& engine, const QString& version);
+    static QString versionStatement() { return QStringLiteral("SELECT VERSION()"); }
 
     /// Returns the terms for queries to INFORMATION_SCHEMA.
     static const InformationSchemaTerms& informationSchema();
@@ -33,7 +34,7 @@ private:
     QString lockName(const QString& name) const;
 
     Engine& engine_;
-    bool isMariaDb = false;
+    bool isMariaDb;
     QSet<QString> locks;  // checked here, because the server grants a lock twice to the same connection
 };
 

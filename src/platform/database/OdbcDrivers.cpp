@@ -16,7 +16,7 @@ using namespace Qt::StringLiterals;
 namespace {
 
 constexpr int defaultPort = 1433;
-constexpr int connectSeconds = 4;
+constexpr int connectSeconds = openMilliseconds / 1000;
 constexpr int networkSeconds = 125;  // a little more than the longest statement
 constexpr int instanceMilliseconds = 900;
 
@@ -67,8 +67,10 @@ struct Server {
 };
 
 /// Reads "host\instance", "host,port\" and "(local)\".
-Server serverOf(const QString& name, int givenPort)
+Server serverOf(const ConnectionText& text)
 {
+    const QString name = text.value(u"Server");
+    const int givenPort = text.value(u"Port").toInt();
     const QString host = name.section(u'\\', 0, 0).section(u',', 0, 0).trimmed();
     const QString instance = name.section(u'\\', 1).trimmed();
     const QString portText = name.section(u'\\', 0, 0).section(u',', 1).trimmed();
@@ -103,21 +105,22 @@ QString sqlServerDriver()
 
 OdbcTarget odbcTarget(const ConnectionText& given, const QString& driver, const ConnectionText& options)
 {
+    const QDeadlineTimer deadline(openMilliseconds);
     ConnectionText text = given;
     text.set(u"Driver"_s, u'{' + driver + u'}');
     text.add(options);
     switch (familyOf(driver)) {
         case Family::FreeTds: {
-            const Server server = serverOf(text.value(u"Server"), text.value(u"Port").toInt());
+            const Server server = serverOf(text);
             text.set(u"Server"_s, server.host);
             text.set(u"Port"_s, QString::number(server.port));
-            return {text.text(), server.host, server.port};
+            return {text.text(), server.host, server.port, deadline};
         }
         case Family::Microsoft: {
-            const Server server = serverOf(text.value(u"Server"), text.value(u"Port").toInt());
+            const Server server = serverOf(text);
             text.remove(u"Port");
             text.set(u"Server"_s, u"%1,%2"_s.arg(server.host).arg(server.port));
-            return {text.text()};
+            return {text.text(), {}, 0, deadline};
         }
         case Family::MySql:
             // without this option, an update that sets the same value would count as no row

@@ -91,7 +91,6 @@ void QtSqlEngine::execute(QSqlQuery& query, const QString& statement)
     beforeStatement();
     if (!query.exec(statement))
         fail(query.lastError());
-    lastAnswer.start();
 }
 
 void QtSqlEngine::fail(const QSqlError& error)

@@ -3,7 +3,6 @@
 
 #include "platform/database/Engine.h"
 
-#include <QElapsedTimer>
 #include <QSqlDatabase>
 
 class QSqlError;
@@ -35,7 +34,6 @@ protected:
     [[noreturn]] void fail(const QSqlError& error);
 
     QSqlDatabase database;
-    QElapsedTimer lastAnswer;  // since the database has last answered
 
 private:
     void execute(QSqlQuery& query, const QString& statement);

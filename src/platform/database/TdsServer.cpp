@@ -19,12 +19,13 @@ constexpr quint16 browserPort = 1434;
 
 int portOfInstance(const QString& host, const QString& instance, int milliseconds)
 {
+    const QDeadlineTimer deadline(milliseconds);
     QUdpSocket browser;
     browser.connectToHost(host, browserPort);
     if (!browser.waitForConnected(milliseconds))
         return 0;
     browser.write('\x04' + instance.toLatin1() + '\0');  // asks for a single instance
-    if (!browser.waitForReadyRead(milliseconds) || !browser.hasPendingDatagrams())
+    if (!browser.waitForReadyRead(int(deadline.remainingTime())) || !browser.hasPendingDatagrams())
         return 0;
     // three bytes, then "ServerName;HOST;InstanceName;NAME;IsClustered;No;Version;15.0.2000.5;tcp;49172;;"
     const QList<QByteArray> words = browser.read(browser.pendingDatagramSize()).mid(3).split(';');
