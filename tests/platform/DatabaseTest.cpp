@@ -182,6 +182,20 @@ TEST_P(Database, ReadsWhatAnotherToolHasWritten)
 
 INSTANTIATE_TEST_SUITE_P(Engines, Database, ::testing::Values(On::Embedded, On::MySql, On::Odbc, On::Tds));
 
+TEST(EmbeddedLock, BelongsToAllWhoMayWriteTheDatabase)
+{
+    const TestProfile profile;
+    const auto connection = std::make_shared<db::Connection>();
+    connection->open(createDatabase(On::Embedded));
+    const QString file = profile.root() + u"/databases/shop.db"_s;
+    const QString locks = file + u"-locks"_s;
+    QFile::setPermissions(file, QFile::ReadOwner | QFile::WriteOwner | QFile::ReadGroup | QFile::WriteGroup);
+    EXPECT_TRUE(db::Lock(connection, u"x"_s).isHeld());
+    EXPECT_EQ(QFile::permissions(locks), QFile::permissions(file));
+    EXPECT_TRUE(QFile::remove(locks) && QDir().mkdir(locks));
+    EXPECT_EQ(failureOf([&] { db::Lock(connection, u"x"_s); }), PermissionDenied) << "nobody has what can't be locked";
+}
+
 TEST(connectionText, ChoosesTheEngineThatAnswersWithinSeconds)
 {
     const TestProfile profile;

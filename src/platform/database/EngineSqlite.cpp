@@ -173,9 +173,7 @@ public:
 
     bool lock(const QString& name, int seconds) override
     {
-        std::unique_ptr<files::Lock> lock;
-        if (!attempt([&] { lock = std::make_unique<files::Lock>(file_ + u"-locks"_s, name, seconds * 1000); }))
-            return true;  // the folder can't be written, which the next statement will report
+        auto lock = std::make_unique<files::Lock>(file_ + u"-locks"_s, name, seconds * 1000, file_);
         if (!lock->isHeld())
             return false;
         locks[name] = std::move(lock);

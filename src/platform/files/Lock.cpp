@@ -1,5 +1,6 @@
 #include "platform/files/Lock.h"
 
+#include "platform/RuntimeError.h"
 #include "platform/files/SystemFile.h"
 #include "platform/files/files.h"
 
@@ -25,11 +26,13 @@ qint64 byteOf(const QString& name)
 
 }  // namespace
 
-Lock::Lock(const QString& path, const QString& name, int milliseconds)
+Lock::Lock(const QString& path, const QString& name, int milliseconds, const QString& like)
 {
     constexpr unsigned long pause = 2;  // milliseconds
     const QDeadlineTimer deadline(milliseconds);
     auto opened = std::make_unique<SystemFile>(systemPath(path), O_RDWR | O_CREAT);
+    if (!like.isEmpty())
+        attempt([&] { opened->shareLike(systemPath(like)); });  // only its owner can do this
     const qint64 byte = byteOf(name);
     while (!opened->lockByte(byte)) {
         if (deadline.hasExpired())

@@ -13,8 +13,9 @@ class SystemFile;
 /// deleted, and its content does not matter.
 class Lock {
 public:
-    /// Tries to get the lock and waits up to this time. Throws RuntimeError if the file can't be opened or locked.
-    explicit Lock(const QString& path, const QString& name = {}, int milliseconds = 0);
+    /// Tries to get the lock and waits up to this time. A new file gets the group and the rights of the file `like`, so
+    /// that all who may write that one can lock. Throws RuntimeError if the file can't be opened or locked.
+    explicit Lock(const QString& path, const QString& name = {}, int milliseconds = 0, const QString& like = {});
     ~Lock();
     Lock(const Lock&) = delete;
     Lock& operator=(const Lock&) = delete;

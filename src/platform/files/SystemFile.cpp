@@ -32,12 +32,6 @@ constexpr char16_t lastByte = 0xDCFF;
 std::mutex faultMutex;
 std::function<bool()> currentFault;
 
-QString folderOf(const QString& systemPath)
-{
-    const qsizetype slash = systemPath.lastIndexOf(u'/');
-    return slash <= 0 ? u"/"_s : systemPath.first(slash);
-}
-
 std::optional<struct stat> stateOf(const QString& systemPath)
 {
     struct stat state {};
@@ -223,6 +217,19 @@ void SystemFile::setMode(unsigned mode)
         throwSystemError(path);
 }
 
+void SystemFile::shareLike(const QString& other)
+{
+    constexpr mode_t rights = 07777;
+    struct stat own {};
+    const auto model = stateOf(other);
+    if (!model || ::fstat(descriptor, &own) != 0)
+        throwSystemError(other);
+    if (own.st_gid != model->st_gid && ::fchown(descriptor, uid_t(-1), model->st_gid) != 0)
+        throwSystemError(path);
+    if ((own.st_mode & rights) != (model->st_mode & rights))
+        setMode(model->st_mode & rights);
+}
+
 bool SystemFile::lockByte(qint64 at)
 {
     struct flock range {};
@@ -245,6 +252,12 @@ void SystemFile::commit()
     const int closing = std::exchange(descriptor, -1);
     if (::close(closing) != 0 && errno != EINTR)
         throwSystemError(path);
+}
+
+QString folderOf(const QString& systemPath)
+{
+    const qsizetype slash = systemPath.lastIndexOf(u'/');
+    return slash <= 0 ? u"/"_s : systemPath.first(slash);
 }
 
 bool isFile(const QString& systemPath)

@@ -27,6 +27,8 @@ public:
     void cutTo(qint64 size);
     /// Sets the permission bits.
     void setMode(unsigned mode);
+    /// Sets the group and the permission bits to those of another file.
+    void shareLike(const QString& other);
     /// Locks a byte, which need not exist, until the file is closed. Returns false if another open file has locked it.
     bool lockByte(qint64 at);
     /// Waits until the bytes are on the disk and closes the file. Throws RuntimeError if this fails.
@@ -51,6 +53,8 @@ void checkReadable(const QString& systemPath);
 void checkWritable(const QString& systemPath);
 void checkFolderWritable(const QString& systemPath);
 
+/// Returns the path of the folder that contains a file or folder.
+QString folderOf(const QString& systemPath);
 bool isFile(const QString& systemPath);
 bool isFolder(const QString& systemPath);
 
