@@ -1,6 +1,7 @@
 #include "inbound/Loading.h"
 
 #include "base/QuoteKey.h"
+#include "base/modDBAccess.h"
 #include "platform/Prompt.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
@@ -44,11 +45,14 @@ bool isUnknown(const QString& number, const db::Recordset& quote)
 
 void tellOldTotals(const db::Recordset& quote)
 {
+    const bool isOpen = gConn->state() == 1;  // it may get lost while the box is open
     desktop::msgBox(
         u"The lines of quote %1 are loaded, but its totals could not be stored. Open the quote in the "
         "estimating program and save it there, so that its totals are calculated again."_s.arg(
             QuoteKey::fromRow(quote).reference()),
         desktop::Icon::Exclamation);
+    if (isOpen)  // otherwise it was lost before, and the load fails and is repeated
+        EnsureConnection();
 }
 
 bool refuse(const QString& text)

@@ -26,7 +26,7 @@ void respellColour(db::Recordset& car, db::Recordset& colours);
 bool isBlank(const QString& number);
 /// Returns true if a number in a message leads to no quote. A blank number is always unknown.
 bool isUnknown(const QString& number, const db::Recordset& quote);
-/// Shows a box that says that the totals of a loaded quote could not be stored.
+/// Shows a box that says that the totals of a loaded quote could not be calculated or stored.
 void tellOldTotals(const db::Recordset& quote);
 /// Shows a critical box that says why a message is refused. Returns false.
 bool refuse(const QString& text);

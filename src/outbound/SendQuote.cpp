@@ -72,6 +72,14 @@ QString refusalOf(const db::Recordset& quote, const QuoteKey& key)
     return mainQuoteRefusal(quote, remarks);
 }
 
+void tellOldTotals(const QuoteKey& key)
+{
+    desktop::msgBox(
+        u"Quote %1 is sent, but its totals could not be stored. The error log says why. Check the totals in the "
+        "estimating program."_s.arg(key.reference()),
+        desktop::Icon::Exclamation);
+}
+
 double refuse(const QString& message)
 {
     desktop::msgBox(message, desktop::Icon::Critical);
@@ -97,8 +105,10 @@ double SendQuote(db::Recordset& quote, bool* sent)
 
     journal::Operation operation(journal::Kind::Send);
     try {
-        RoundQuoteLines(quote);
+        const bool hasTotals = RoundQuoteLines(quote);
         const double total = CreateQuoteXML(quote);
+        if (total != 0 && !hasTotals)
+            tellOldTotals(key);
         if (sent)
             *sent = total != 0;
         if (total != 0)

@@ -165,6 +165,7 @@ double CreateQuoteXML(db::Recordset& quote)
         return refuse(
             u"Error: Cannot send $0 variations to ORLA. Please call your assessor to discuss the variation."_s);
     const QStringList images = addImages(request, rows);
+    EnsureConnection();  // it may have been lost while a box about the pictures was open
 
     // write the document before the quote is locked: a full disk must not lock it
     const QString name = documentName(rows);

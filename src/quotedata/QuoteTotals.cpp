@@ -85,48 +85,44 @@ void addLine(SectionTotals& totals, const db::Recordset& line, EmptyHours emptyH
         totals.miscellaneous += toDouble(line.value(u"unitcost"_s));
 }
 
+/// Names the line in the reason if the step fails.
+void ofLine(const db::Recordset& line, const QString& what, const std::function<void()>& step)
+{
+    try {
+        step();
+    } catch (const RuntimeError& error) {
+        throw RuntimeError(error.number(),
+                           u"%1: %2 of the quote line \"%3\""_s.arg(error.description(), what, line.text(u"script"_s)));
+    }
+}
+
 /// Adds up the lines from the current one to the last.
 SectionTotals totalsOf(db::Recordset& lines, EmptyHours emptyHours)
 {
     SectionTotals totals;
     for (; !lines.eof(); lines.moveNext())
-        if (counts(lines))
-            addLine(totals, lines, emptyHours);
+        ofLine(lines, u"amount"_s, [&] {
+            if (counts(lines))
+                addLine(totals, lines, emptyHours);
+        });
     return totals;
 }
 
-double roundedColumn(const db::Recordset& line, const QString& column)
-{
-    try {
-        return RoundAmount(toDouble(line.value(column)), 2);
-    } catch (const RuntimeError& error) {
-        throw RuntimeError(error.number(), u"%1: %2 of the quote line \"%3\""_s.arg(error.description(), column,
-                                                                                    line.text(u"script"_s)));
-    }
-}
-
-void storeTotals(db::Recordset& quote)
-{
-    try {
-        quote.update();
-    } catch (const RuntimeError& error) {
-        attempt([&] { logFailure(error, u"QuoteTotals.storeTotals"_s); });
-        throw;
-    }
-}
-
-/// Stores the totals that `set` puts into the quote. If it fails to work them out, the quote stays as it is. Returns
-/// false if the totals could not be stored.
+/// Stores the totals that `set` puts into the quote. Returns false if this fails; the reason is in the error log.
 bool storeTotals(db::Recordset& quote, const std::function<void()>& set)
 {
-    bool stored = true;
-    attempt([&] {
-        set();
-        quote.set(u"quotechanged"_s, true);
-        stored = attempt([&] { storeTotals(quote); });
-        if (!stored)
-            quote.cancelUpdate();  // totals that could not be stored must not go with a later change
+    const bool stored = attempt([&] {
+        try {
+            set();
+            quote.set(u"quotechanged"_s, true);
+            quote.update();
+        } catch (const RuntimeError& error) {
+            attempt([&] { logFailure(error, u"QuoteTotals.storeTotals"_s); });
+            throw;
+        }
     });
+    if (!stored)
+        quote.cancelUpdate();  // totals that could not be stored must not go with a later change
     return stored;
 }
 
@@ -159,17 +155,17 @@ bool CalcAuthorisedTotals(db::Recordset& quote, db::Recordset& lines)
     });
 }
 
-void RoundQuoteLines(db::Recordset& quote)
+bool RoundQuoteLines(db::Recordset& quote)
 {
     db::Recordset lines = Quote::openLines(QuoteKey::fromRow(quote));
     for (; !lines.eof(); lines.moveNext()) {
         for (const auto& column : {u"unitcost"_s, u"rrhour"_s, u"rahour"_s, u"pthour"_s})
             if (!lines.text(column).isEmpty())
-                lines.set(column, roundedColumn(lines, column));
+                ofLine(lines, column, [&] { lines.set(column, RoundAmount(toDouble(lines.value(column)), 2)); });
         lines.update();
     }
     lines.requery();
-    CalcQuoteTotals(quote, lines);
+    return CalcQuoteTotals(quote, lines);
 }
 
 }  // namespace kest

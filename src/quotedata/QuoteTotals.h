@@ -7,8 +7,7 @@ namespace kest {
 
 /// Stores the six totals and the change mark of a quote, calculated from all its lines. Deleted lines, lines that
 /// another line replaces, and report items do not count. `lines` is at its end afterwards. If anything fails, such as a
-/// Null quantity or rate, the quote keeps its totals and no error is reported. Returns false if the totals are known
-/// but could not be stored; the reason is in the error log.
+/// Null quantity or rate, the quote keeps its totals, the reason is in the error log, and the result is false.
 bool CalcQuoteTotals(db::Recordset& quote, db::Recordset& lines);
 
 /// Does the same for a quote whose lines have authorised amounts: adds all labour to `TOTAL`, leaves the totals of the
@@ -16,8 +15,8 @@ bool CalcQuoteTotals(db::Recordset& quote, db::Recordset& lines);
 /// caller must move `lines` to the first.
 bool CalcAuthorisedTotals(db::Recordset& quote, db::Recordset& lines);
 
-/// Rounds the money and hours of all lines of a quote, then calls CalcQuoteTotals(). Throws RuntimeError if rounding
-/// fails.
-void RoundQuoteLines(db::Recordset& quote);
+/// Rounds the money and hours of all lines of a quote, then returns the result of CalcQuoteTotals(). Throws
+/// RuntimeError if rounding fails.
+bool RoundQuoteLines(db::Recordset& quote);
 
 }  // namespace kest

@@ -85,6 +85,14 @@ TEST_F(AuthorisedQuotes, TotalsFollowTheMergedLines)
         EXPECT_TRUE(report.contains(onlyNow)) << onlyNow;
 }
 
+TEST_F(AuthorisedQuotes, TotalsThatCannotBeCalculatedAreTold)
+{
+    quote("500").line(1).set("rrhour", 2).set("rr_rate2", nullptr);
+    EXPECT_TRUE(load(authorisedQuote("500").labour(2, "I")));
+    EXPECT_EQ(quote("500").number("TOTAL"), 0);
+    EXPECT_TRUE(QString::fromStdString(shown()).startsWith(u"[exclamation] The lines of quote 500 are loaded, but"_s));
+}
+
 TEST_F(AuthorisedQuotes, ANoteOfTheRequestIsAddedOnlyWhereItHasOne)
 {
     gConn->execute(u"DELETE FROM QUOTE3"_s);

@@ -1,3 +1,4 @@
+#include "base/modLoggerEx.h"
 #include "quotedata/QuoteTotals.h"
 #include "quotedata/Rounding.h"
 #include "support/Shop.h"
@@ -10,10 +11,10 @@ struct Opened {
     db::Recordset lines = kest::opened(u"SELECT * FROM QUOTE2 WHERE QTNNO='500'"_s);
 };
 
-static void calc(bool (*routine)(db::Recordset& quote, db::Recordset& lines))
+static bool calc(bool (*routine)(db::Recordset& quote, db::Recordset& lines))
 {
     Opened opened;
-    routine(opened.header, opened.lines);
+    return routine(opened.header, opened.lines);
 }
 
 static std::string totals()
@@ -98,12 +99,13 @@ TEST_F(Totals, ANullThatMattersLeavesTheQuoteAsItWas)
         for (const auto& [routine, effect] :
              {std::pair(&CalcQuoteTotals, send), {&CalcAuthorisedTotals, authorisation}}) {
             quote("500").set("MISTOTAL", 7);
-            calc(routine);
+            EXPECT_EQ(calc(routine), effect == u"totalled"_s) << column;
             EXPECT_EQ(quote("500").number("MISTOTAL"), effect == u"totalled"_s ? 0 : 7) << column;
         }
         gConn->execute(u"DELETE FROM QUOTE2"_s);
     }
     EXPECT_EQ(shown(), "");
+    EXPECT_TRUE(lastLogRecord().contains(u"of the quote line"_s));
 }
 
 TEST_F(Totals, RoundedLinesAreStored)
