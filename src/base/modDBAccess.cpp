@@ -138,7 +138,8 @@ void OpenDatabase()
             open(*gcnDB, driverNumber());
             journal::watch(gcnDB);
         } catch (const RuntimeError& error) {
-            gcnDB->close();  // also if only the journal did not answer: work without it could not be taken back
+            gcnDB->close(error.description());  // also if only the journal did not answer: work without it could not be
+                                                // taken back
             lastFailure = error;
             if (error.description() != failureBefore)  // only once, because each event of an open window tries again
                 logFailure(error, u"modDBAccess.OpenDatabase"_s);

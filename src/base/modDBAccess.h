@@ -20,7 +20,8 @@ extern QString gsInstance;
 /// Returns the connection, which it opens if necessary, or null if that fails.
 db::ConnectionPtr GetConnection();
 /// Opens the connection if it is closed or if the server has dropped it, and returns whether it is open. Every action
-/// of a user that needs the database calls this first.
+/// of a user that needs the database calls this first. If it fails, whatever uses the connection then throws
+/// CannotOpen with the reason.
 bool EnsureConnection();
 /// Sets what runs each time that EnsureConnection() has opened the connection.
 void setAfterOpening(std::function<void()> step);

@@ -65,6 +65,7 @@ TEST_F(ShopConnection, WhyItFailedIsTold)
     EXPECT_EQ(
         desktop->boxTexts(),
         QStringList{u"Could not connect to the quote database, Please contact MarlinDesk Support.\r\n\r\n"_s + reason});
+    EXPECT_EQ(failure([] { opened(u"SELECT * FROM CINFO"_s); }).description(), reason);
     EXPECT_EQ(files::read(errorLogPath()).count(u"Description: "_s + reason), 1);
     EXPECT_FALSE(OpenRecordset(u"SELECT * FROM CINFO"_s, false, true));
     EXPECT_TRUE(desktop->boxTexts().last().startsWith(u"-2147467259: Could not Initialize Database! - "_s));

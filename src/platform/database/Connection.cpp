@@ -92,7 +92,10 @@ void setConnectionFault(std::function<bool()> fault)
     connectionFault = std::move(fault);
 }
 
-Connection::Connection() = default;
+Connection::Connection()
+{
+    close();
+}
 Connection::~Connection() = default;
 
 void Connection::open(const QString& connectionText)
@@ -115,8 +118,9 @@ void Connection::open(const QString& connectionText)
     ++generation_;
 }
 
-void Connection::close()
+void Connection::close(const QString& reason)
 {
+    whyClosed_ = reason;
     session_.reset();
 }
 
@@ -203,7 +207,7 @@ Lock::~Lock()
 Session& Connection::session() const
 {
     if (state() != 1)
-        throw RuntimeError(CannotOpen, u"The connection to the database is closed."_s);
+        throw RuntimeError(CannotOpen, whyClosed_);
     return *session_;
 }
 

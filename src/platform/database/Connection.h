@@ -26,8 +26,8 @@ public:
     /// without such a driver, the embedded engine is used. Throws CannotOpen; if a server does not answer, this takes
     /// some seconds.
     void open(const QString& connectionText);
-    /// Closes the connection. Recordsets keep their rows.
-    void close();
+    /// Closes the connection. Recordsets keep their rows. Whoever uses it afterwards gets `reason` as the description.
+    void close(const QString& reason = QStringLiteral("The connection to the database is closed."));
     /// Returns 1 if the connection is open, otherwise 0. A connection that the server has dropped is closed.
     int state() const;
     /// Returns how often the connection has been opened. What belongs to a session of the server, such as a lock, ends
@@ -74,6 +74,7 @@ private:
     int generation_ = 0;
     int commandTimeout_ = 30;
     QString odbcOptions_;
+    QString whyClosed_;
 };
 
 using ConnectionPtr = std::shared_ptr<Connection>;
