@@ -12,7 +12,9 @@
 
 #include <QSet>
 
+#include <algorithm>
 #include <array>
+#include <functional>
 #include <span>
 #include <utility>
 
@@ -23,6 +25,8 @@ using namespace Qt::StringLiterals;
 namespace {
 
 using CodeRange = std::pair<int, int>;  // first and last
+
+constexpr int mostNumbers = 256;  // of quotes, in one statement
 
 constexpr CodeRange labourCodes[] = {{137, 151}, {287, 303}, {447, 459}};
 constexpr CodeRange otherPaintCodes[] = {{153, 155}, {304, 306}, {462, 464}};
@@ -67,6 +71,24 @@ QString freeCode(db::Recordset& rows, std::span<const CodeRange> ranges)
     return {};
 }
 
+/// Returns the first number that no quote has, or the last one if all are taken.
+QString firstFree(const QStringList& numbers, const std::function<QString(const QString& number)>& searched)
+{
+    QStringList pasted;
+    for (const QString& number : numbers)
+        pasted += sql("'{}'", searched(number));
+    db::Recordset taken = opened(sql("SELECT QTNNO FROM QUOTE1 WHERE QTNNO IN (") + pasted.join(u", "_s) + u')');
+    for (const QString& number : numbers) {
+        if (taken.recordCount() == 0)
+            return number;
+        taken.moveFirst();
+        taken.find(u"QTNNO"_s, searched(number));
+        if (taken.eof())
+            return number;
+    }
+    return numbers.constLast();
+}
+
 /// The last number that NextLineNumber() returned, and its quote.
 struct LastNumber {
     QuoteKey quote{{}, {}};
@@ -89,18 +111,25 @@ QString NextQuoteNumber(const QString& given, const db::Recordset& cinfo, db::Re
 {
     const QString prefix = cinfo.text(u"QUOTE_PRE"_s);
     const QString suffix = cinfo.text(u"QUOTE_SUF"_s);
+    const auto searched = [&](const QString& number) { return valueOnly ? prefix + number + suffix : number; };
     const auto isTaken = [&](const QString& number) {
         if (quote.isOpen())
             quote.close();
-        quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}'", valueOnly ? prefix + number + suffix : number));
+        quote.open(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}'", searched(number)));
         return !quote.eof();
     };
     const auto counted = [&](const QString& value) { return valueOnly ? value : prefix + value + suffix; };
 
     const bool usable = given != u"MANQ"_s && given.size() >= 2 && given.size() <= 8;
     QString number = usable ? given : counted(toText(cinfo.value(u"QUOTE_VAL"_s)));
-    for (qint64 counter = 1; isTaken(number); ++counter)
-        number = counted(QString::number(toLong(cinfo.value(u"QUOTE_VAL"_s)) + counter));
+    qint64 counter = 0;
+    // More and more at a time: manual quotes take numbers, but don't move the counter.
+    for (int count = 1; isTaken(number); count = std::min(count * 4, mostNumbers)) {
+        QStringList next;
+        for (int i = 0; i < count; ++i)
+            next += counted(QString::number(toLong(cinfo.value(u"QUOTE_VAL"_s)) + ++counter));
+        number = firstFree(next, searched);
+    }
     return number;
 }
 

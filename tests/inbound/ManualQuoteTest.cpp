@@ -1,5 +1,6 @@
 // Tests the load of manual quotes: which quote they become, and what they replace.
 
+#include "platform/database/FaultInjection.h"
 #include "support/Shop.h"
 
 using ManualQuotes = Shop;
@@ -34,6 +35,26 @@ TEST_F(ManualQuotes, EachHasItsQuoteAsTheTableSays)
     }
     EXPECT_FALSE(load(Message::told("MANQ quoteBody/quoteType=AS quoteBody/quoteReference=500/x")));
     EXPECT_NE(shown().find("modLoadXML.LoadXML"), std::string::npos);
+}
+
+TEST_F(ManualQuotes, ANewNumberIsTheFirstFreeOneHoweverManyAreTaken)
+{
+    car("ABC123");
+    const Snapshot before;
+    QList<int> statements;
+    for (const int taken : {3, 300}) {
+        for (int i = 0; i < taken; ++i)
+            quote(std::to_string(1001 + i));
+        quote(std::to_string(1001 + taken + 1));  // after a gap
+        int count = 0;
+        db::setStatementFault([&] { return ++count == 0; });
+        EXPECT_TRUE(load(manualQuote("MANQ")));
+        db::setStatementFault({});
+        EXPECT_EQ(loadedQuote(), std::to_string(1001 + taken) + "/0");
+        statements.append(count);
+        before.restore();
+    }
+    EXPECT_LT(statements[1] - statements[0], 12);
 }
 
 TEST_F(ManualQuotes, TheQuoteIsReplaced)
