@@ -67,8 +67,9 @@ frmViewXML::frmViewXML(const QString& file)
     on(Command1, &QPushButton::clicked, u"Command1_Click"_s, [this] { Command1_Click(); });
     on(Command2, &QPushButton::clicked, u"Command2_Click"_s, [this] { Command2_Click(); });
     on(new QShortcut(QKeySequence::Save, this), &QShortcut::activated, u"Command2_Click"_s,
-       [this] { Command2_Click(); });
+       [this] { Command2->click(); });
     on(txtXML, &QPlainTextEdit::cursorPositionChanged, u"txtXML_SelChange"_s, [this] { showPosition(); });
+    on(txtXML, &QPlainTextEdit::textChanged, u"txtXML_Change"_s, [this] { enableSave(); });
     on(txtXML, &QPlainTextEdit::updateRequest, u"txtXML_Paint"_s, [this] { colourVisibleTags(); });
 }
 
@@ -112,7 +113,10 @@ void frmViewXML::fillFindBar()
 void frmViewXML::ShowForm(const QString& file)
 {
     frmViewXML form(file);
-    form.txtXML->setExactText(FormatXML(gsCurFolder + file));
+    const QString text = FormatXML(gsCurFolder + file);
+    form.txtXML->setExactText(text);
+    form.isShown = !text.isEmpty();
+    form.enableSave();
     form.showPosition();
     desktop::showModal(form);
 }
@@ -195,6 +199,11 @@ void frmViewXML::Command2_Click()
     unchanged = true;
     txtXML->document()->setModified(false);
     close();
+}
+
+void frmViewXML::enableSave()
+{
+    Command2->setEnabled(isShown || !txtXML->document()->isEmpty());
 }
 
 void frmViewXML::findNext(QTextDocument::FindFlags direction)

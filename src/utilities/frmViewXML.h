@@ -39,11 +39,14 @@ private:
     void Command1_Click();
     void Command2_Click();
     void findNext(QTextDocument::FindFlags direction);
+    /// A message that could not be shown is not overwritten with an empty text.
+    void enableSave();
     void showPosition();
     void colourVisibleTags();
 
     QString sFile;
-    bool unchanged = true;          // since the text was loaded or saved
+    bool unchanged = true;  // since the text was loaded or saved
+    bool isShown = false;
     std::array<int, 3> coloured{};  // first line, last line and revision of the text that is coloured
 
     ExactTextEdit* txtXML;

@@ -66,6 +66,14 @@ TEST_F(Viewer, NothingIsWrittenWithoutThePasswordOrTheYes)
     EXPECT_EQ(written(), "<a>1</a>");
 }
 
+TEST_F(Viewer, AMessageThatCannotBeShownIsNotReplacedByAnEmptyText)
+{
+    EXPECT_THROW(view("no message", save), desktop::NeedsAnswer) << "the button is disabled";
+    EXPECT_EQ(written(), "no message");
+    view("no message", R"({"set": "txtXML", "text": "<a>1</a>"}, )" + save);
+    EXPECT_EQ(written(), "<a>1</a>");
+}
+
 TEST_F(Viewer, LeavingWithUnsavedTypingIsAskedAbout)
 {
     QGuiApplication::clipboard()->setText(u"pasted"_s);
