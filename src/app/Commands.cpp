@@ -163,7 +163,7 @@ Outcome setSetting(const QString& key, const QString& name, const QString& value
 {
     RegCreateSubKey(settings::Hive::LocalMachine, key);
     if (!RegSetValue(settings::Hive::LocalMachine, key, name, value))
-        return refused(u"the setting could not be written"_s, Refused);
+        return refused(u"the setting could not be written. "_s + settings::changeFailure(), Refused);
     if (isPassword(name))
         return {};
     return {.fields = {{u"value"_s, RegGetValue(settings::Hive::LocalMachine, key, name)}}};

@@ -7,6 +7,7 @@
 #include <QDir>
 
 #include <fcntl.h>
+#include <sys/stat.h>
 
 #include <cerrno>
 #include <optional>
@@ -146,9 +147,11 @@ void makeFolder(const QString& path)
         throwFileError(PathNotFound, place);
     if (isFile(place))
         throwFileError(FileExists, place);
+    if (const QString above = folderOf(place); above != place)
+        makeFolder(above);
     failOnRequest(place);
-    if (!QDir().mkpath(place))
-        throwFileError(PermissionDenied, place);
+    if (::mkdir(encodedPath(place).constData(), 0777) != 0 && errno != EEXIST)
+        throwSystemError(place);
 }
 
 }  // namespace kest::files

@@ -106,25 +106,38 @@ RegistryFile readable()
     return content;
 }
 
+QString whyUnchanged;
+
 /// Reads, edits and replaces the file under a lock. Returns false if `edit` does, or if the file can't be written.
 bool change(const std::function<bool(RegistryFile&)>& edit)
 {
     constexpr int longestWait = 10000;  // milliseconds
     const QString path = registryPath();
     bool done = false;
+    whyUnchanged.clear();
     const bool written = attempt([&] {
-        const files::Lock lock(path + u".lock"_s, {}, longestWait);
-        if (!lock.isHeld())
-            return;
-        RegistryFile content = present();
-        done = edit(content);
-        if (done)
-            files::writeBytes(path, content.toBytes(), files::Access::OwnerAlone);
+        try {
+            const files::Lock lock(path + u".lock"_s, {}, longestWait);
+            if (!lock.isHeld())
+                throw RuntimeError(PermissionDenied, u"Another process is writing the settings."_s);
+            RegistryFile content = present();
+            done = edit(content);
+            if (done)
+                files::writeBytes(path, content.toBytes(), files::Access::OwnerAlone);
+        } catch (const RuntimeError& error) {
+            whyUnchanged = error.description();
+            throw;
+        }
     });
     return written && done;
 }
 
 }  // namespace
+
+QString changeFailure()
+{
+    return whyUnchanged;
+}
 
 void check()
 {

@@ -45,6 +45,8 @@ bool setValue(Hive hive, const QString& key, const QString& name, const Value& v
 bool createKey(Hive hive, const QString& key);
 /// Removes a key and its values. Returns false if it is missing, has subkeys or can't be removed.
 bool removeKey(Hive hive, const QString& key);
+/// Returns why the last change failed. The text is empty if it did not, or if there was nothing to change.
+QString changeFailure();
 /// Returns all values.
 QList<Entry> entries();
 
