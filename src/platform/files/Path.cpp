@@ -217,6 +217,8 @@ void removeLeftOvers(const QString& folder)
     if (!open)
         return;
     while (const dirent* entry = ::readdir(open.get())) {
+        if (entry->d_name[0] != '.')
+            continue;  // most names, in a folder with all the shop's messages
         const QString name = decodedName(entry->d_name);
         if (isTemporaryName(name) && ageOf(place + u'/' + name) > day)
             attempt([&] { removeFile(place + u'/' + name); });

@@ -40,6 +40,12 @@ std::optional<struct stat> stateOf(const QString& systemPath)
     return state;
 }
 
+void checkMayRead(const struct stat& state, const QString& systemPath)
+{
+    if (!S_ISREG(state.st_mode) || (state.st_mode & anyoneMayRead) == 0)
+        throwFileError(PermissionDenied, systemPath);
+}
+
 QString temporaryName()
 {
     return u".kest-"_s + QString::number(QRandomGenerator::global()->generate64(), 36) + u".tmp"_s;
@@ -140,6 +146,7 @@ void throwSystemError(const QString& systemPath)
         case EBUSY:
         case ETXTBSY:
         case EISDIR:
+        case ENXIO:
         case ENOTEMPTY:
             throwFileError(PermissionDenied, systemPath);
         case ENOSPC:
@@ -160,18 +167,29 @@ SystemFile::SystemFile(const QString& systemPath, int flags, unsigned mode) : pa
         throwSystemError(path);
 }
 
+// Checks the open file, because a question by name would be one more trip to a share.
+SystemFile::SystemFile(const QString& systemPath) : SystemFile(systemPath, O_RDONLY)
+{
+    checkMayRead(state(), path);
+}
+
 SystemFile::~SystemFile()
 {
     if (descriptor >= 0)
         ::close(descriptor);
 }
 
-qint64 SystemFile::size() const
+struct stat SystemFile::state() const
 {
     struct stat state {};
     if (::fstat(descriptor, &state) != 0)
         throwSystemError(path);
-    return state.st_size;
+    return state;
+}
+
+qint64 SystemFile::size() const
+{
+    return state().st_size;
 }
 
 QByteArray SystemFile::read(qsizetype most)
@@ -277,8 +295,7 @@ void checkReadable(const QString& systemPath)
     const auto state = stateOf(systemPath);
     if (!state)
         throwFileError(isFolder(folderOf(systemPath)) ? FileNotFound : PathNotFound, systemPath);
-    if (!S_ISREG(state->st_mode) || (state->st_mode & anyoneMayRead) == 0)
-        throwFileError(PermissionDenied, systemPath);
+    checkMayRead(*state, systemPath);
 }
 
 void checkWritable(const QString& systemPath)

@@ -4,6 +4,8 @@
 #include <QByteArray>
 #include <QString>
 
+#include <sys/stat.h>
+
 #include <functional>
 #include <optional>
 
@@ -12,6 +14,8 @@ namespace kest::files {
 /// An open file. The destructor closes it.
 class SystemFile {
 public:
+    /// Opens a file to read it. Throws PermissionDenied if it is not a file or if nobody may read it.
+    explicit SystemFile(const QString& path);
     /// A new file gets this mode, reduced by the umask of the process.
     SystemFile(const QString& path, int flags, unsigned mode = 0666);
     ~SystemFile();
@@ -35,6 +39,8 @@ public:
     void commit();
 
 private:
+    struct stat state() const;
+
     QString path;
     int descriptor;
 };

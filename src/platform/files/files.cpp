@@ -15,8 +15,15 @@
 namespace kest::files {
 
 namespace {
+
 constexpr unsigned ownerAlone = 0600;
 constexpr qint64 largestFile = 512LL * 1024 * 1024;  // bytes; larger files are not read
+
+QString placeOf(const QString& path, Target target)
+{
+    return target == Target::Free ? spelledPath(path) : systemPath(path);
+}
+
 }  // namespace
 
 bool exists(const QString& path)
@@ -31,16 +38,13 @@ bool folderExists(const QString& path)
 
 qint64 size(const QString& path)
 {
-    const QString place = systemPath(path);
-    checkReadable(place);
-    return SystemFile(place, O_RDONLY).size();
+    return SystemFile(systemPath(path)).size();
 }
 
 QByteArray readBytes(const QString& path)
 {
     const QString place = systemPath(path);
-    checkReadable(place);
-    SystemFile file(place, O_RDONLY);
+    SystemFile file(place);
     const qint64 bytes = file.size();
     if (bytes > largestFile)
         throwFileError(FileInputOutput, place);
@@ -49,9 +53,7 @@ QByteArray readBytes(const QString& path)
 
 QByteArray readStart(const QString& path, qint64 most)
 {
-    const QString place = systemPath(path);
-    checkReadable(place);
-    SystemFile file(place, O_RDONLY);
+    SystemFile file(systemPath(path));
     return file.read(qMin(file.size(), most));
 }
 
@@ -99,34 +101,32 @@ void append(const QString& path, const QString& text)
     file.commit();
 }
 
-void copy(const QString& from, const QString& to)
+void copy(const QString& from, const QString& to, Target target)
 {
     constexpr qsizetype piece = 1024LL * 1024;
-    const QString source = systemPath(from);
-    checkReadable(source);
-    SystemFile original(source, O_RDONLY);
-    replaceFile(systemPath(to), spelledPath(to), [&](SystemFile& file) {
+    SystemFile original(systemPath(from));
+    replaceFile(placeOf(to, target), spelledPath(to), [&](SystemFile& file) {
         for (QByteArray bytes = original.read(piece); !bytes.isEmpty(); bytes = original.read(piece))
             file.write(bytes);
     });
 }
 
-void move(const QString& from, const QString& to)
+void move(const QString& from, const QString& to, Target target)
 {
     const QString source = systemPath(from);
-    const QString target = systemPath(to);
+    const QString place = placeOf(to, target);
     checkReadable(source);
     checkFolderWritable(source);
-    checkFolderWritable(target);
-    checkWritable(target);
-    if (sameVolume(source, target)) {
-        renameFile(source, target);
+    checkFolderWritable(place);
+    checkWritable(place);
+    if (sameVolume(source, place)) {
+        renameFile(source, place);
         const QString asAsked = spelledPath(to);
-        if (asAsked != target)
-            renameFile(target, asAsked);
+        if (asAsked != place)
+            renameFile(place, asAsked);
         return;
     }
-    copy(from, to);
+    copy(from, to, target);
     removeFile(source);
 }
 

@@ -46,10 +46,12 @@ void restrictToOwner(const QString& path);
 /// Adds text to the end of a file. Creates a missing file.
 void append(const QString& path, const QString& text);
 
+/// What the caller knows of a target: if list() has not shown its name in any case, the folder is not searched again.
+enum class Target { Unknown, Free };
 /// Copies a file and replaces the target. No reader sees part of the target.
-void copy(const QString& from, const QString& to);
+void copy(const QString& from, const QString& to, Target target = Target::Unknown);
 /// Moves a file and replaces the target.
-void move(const QString& from, const QString& to);
+void move(const QString& from, const QString& to, Target target = Target::Unknown);
 enum class Force { No, Yes };
 /// Deletes a file. Throws FileNotFound if it does not exist, and PermissionDenied if it is read-only, unless forced.
 void remove(const QString& path, Force force = Force::No);
