@@ -66,13 +66,13 @@ QuoteKey quoteKeyIn(const xml::Document& message, const MessageType& type)
     return lastOfNetworkNumber(key());
 }
 
-// Returns the highest number that a message of this quote has in the read folder, or 0 if there is none. Throws if the
-// name of such a file has no valid number.
-qint64 runningNumber(const QuoteKey& quote)
+// Returns the highest number that a message of this quote has among these names, or 0 if there is none. Throws if such
+// a name has no valid number.
+qint64 runningNumber(const QuoteKey& quote, const QStringList& names)
 {
     constexpr qsizetype extension = 4;  // ".xml"
     qint64 largest = 0;
-    for (const QString& name : files::list(gsReadPath, quote.number + u'*')) {
+    for (const QString& name : names) {
         if (quote.begins(name))
             largest =
                 qMax(largest, toInteger(name.chopped(qMin(extension, name.size())).mid(quote.filePrefix().size())));
@@ -93,6 +93,38 @@ QString plainOrNone(const QString& name)
     return files::isPlainName(name) ? name : QString();
 }
 
+/// A name in the read folder.
+struct ReadName {
+    QString name;
+    files::Target target = files::Target::Unknown;
+};
+
+/// Returns the name of the quote's next message, or of its request. It is empty if it can't be determined.
+ReadName nextName(const QuoteKey& quote, bool isQuoteRequest)
+{
+    ReadName next;
+    attempt([&] {
+        const QStringList names = files::list(gsReadPath, quote.number + u'*');
+        const qint64 running = runningNumber(quote, names);
+        next.name = plainOrNone(isQuoteRequest ? quote.number + ".xml"_L1 : numberedName(quote, running));
+        if (!names.contains(next.name, Qt::CaseInsensitive))
+            next.target = files::Target::Free;
+    });
+    return next;
+}
+
+/// Returns the name for the message of a file. Forgets the deleted quote, which only this name needs.
+ReadName nextNameOf(const QString& path)
+{
+    MessageQuoteKey key;
+    attempt([&] { key = GetMessageQuoteKey(files::read(path)); });
+    gsDeletedQTNNO.clear();
+    gsDeletedSubquote.clear();
+    if (key.quote.number.isEmpty() || key.quote.subquote.isEmpty())
+        return {};
+    return nextName(key.quote, key.isQuoteRequest);
+}
+
 /// Returns true if a move of the file under that name may have begun.
 bool isFreeFor(const QString& file, const QString& name)
 {
@@ -101,16 +133,16 @@ bool isFreeFor(const QString& file, const QString& name)
 }
 
 /// Returns the name under which an interrupted move began, or else a new one.
-QString nameInReadFolder(const QString& file)
+ReadName nameInReadFolder(const QString& file)
 {
     const QString begun = journal::kept(u"newName"_s).toString();
     bool goesOn = false;
     attempt([&] { goesOn = files::isPlainName(begun) && isFreeFor(file, begun); });
     if (goesOn)
-        return begun;
-    const QString name =
-        gsMatchedQTNNO.isEmpty() ? GetReadFileName(gsUnreadPath + file) : GetMatchedFileName(gsMatchedQTNNO);
-    return name.isEmpty() ? file : name;
+        return {begun};
+    const ReadName next =
+        gsMatchedQTNNO.isEmpty() ? nextNameOf(gsUnreadPath + file) : nextName(QuoteKey{gsMatchedQTNNO}, false);
+    return next.name.isEmpty() ? ReadName{file} : next;
 }
 
 /// Ignores a failure like attempt(), but writes it to the error log.
@@ -162,13 +194,13 @@ bool isBareName(const QString& file)
 void MoveMessage(const QString& file, const QString& action)
 {
     if (action == "read"_L1 && isBareName(file) && files::exists(gsUnreadPath + file)) {
-        const QString name = nameInReadFolder(file);
+        const ReadName next = nameInReadFolder(file);
         // replace an older message of that name only after the copy exists, because the disk may be full
         const bool copied = attemptLogged([&] {
-            journal::keep(u"newName"_s, name);  // first, so that an interrupted move ends under this name
-            files::copy(gsUnreadPath + file, gsReadPath + name);
+            journal::keep(u"newName"_s, next.name);  // first, so that an interrupted move ends under this name
+            files::copy(gsUnreadPath + file, gsReadPath + next.name, next.target);
         });
-        if (copied && files::exists(gsReadPath + name))
+        if (copied && files::exists(gsReadPath + next.name))
             attemptLogged([&] { files::remove(gsUnreadPath + file); });
     }
     gsMatchedQTNNO.clear();
@@ -181,27 +213,12 @@ bool isMoved(const QString& file)
 
 QString GetReadFileName(const QString& path)
 {
-    MessageQuoteKey key;
-    attempt([&] { key = GetMessageQuoteKey(files::read(path)); });
-    gsDeletedQTNNO.clear();
-    gsDeletedSubquote.clear();
-    if (key.quote.number.isEmpty() || key.quote.subquote.isEmpty())
-        return {};
-
-    QString name;
-    attempt([&] {
-        const qint64 running = runningNumber(key.quote);
-        name = plainOrNone(key.isQuoteRequest ? key.quote.number + ".xml"_L1 : numberedName(key.quote, running));
-    });
-    return name;
+    return nextNameOf(path).name;
 }
 
 QString GetMatchedFileName(const QString& quoteNumber)
 {
-    const QuoteKey quote{quoteNumber};
-    QString name;
-    attempt([&] { name = plainOrNone(numberedName(quote, runningNumber(quote))); });
-    return name;
+    return nextName(QuoteKey{quoteNumber}, false).name;
 }
 
 MessageQuoteKey GetMessageQuoteKey(QString text)
