@@ -151,8 +151,9 @@ QString colourOf(const QString& code, db::Recordset& colours)
     return colours.eof() ? u""_s : colours.text(u"Script"_s).trimmed();
 }
 
-void fillNewCar(db::Recordset& car, const Request& request, const db::Recordset& model, db::Recordset& colours)
+void fillNewCar(db::Recordset& car, const Request& request, db::Recordset& colours)
 {
+    const db::Recordset model = opened(u"SELECT * FROM MODEL WHERE MODEL_ID1='Z000'"_s);
     const QString none = u""_s;
     setColumns(car, {
                         {"PAINT_GP"_L1, paintGroupOfCode(request.paintType)},
@@ -181,8 +182,7 @@ void fillNewCar(db::Recordset& car, const Request& request, const db::Recordset&
 
 /// Fills the car and the customer of a request, adding those that the shop does not have. Returns the customer. Stores
 /// only the mark of a known car.
-db::Recordset fillCarAndCustomer(db::Recordset& car, const Request& request, const db::Recordset& model,
-                                 db::Recordset& colours)
+db::Recordset fillCarAndCustomer(db::Recordset& car, const Request& request, db::Recordset& colours)
 {
     const bool carFound = !car.eof();
     if (carFound) {
@@ -198,7 +198,7 @@ db::Recordset fillCarAndCustomer(db::Recordset& car, const Request& request, con
         respellColour(car, colours);
     } else {
         car.addNew();
-        fillNewCar(car, request, model, colours);
+        fillNewCar(car, request, colours);
     }
     if (car.isNull(u"PAINT_GP"_s))
         throw RuntimeError(NullValue, u"The column PAINT_GP of the car %1 is Null."_s.arg(request.rego));
@@ -237,42 +237,50 @@ void fillQuote(db::Recordset& quote, const QString& quoteNumber, const Request& 
         quote.set(u"kms"_s, request.odometer);
 }
 
-/// Returns a path that no image has. NextImageNumber() reads only three digits, so above 999 it returns numbers that
-/// are taken.
-QString newImagePath(const QString& quoteNumber)
+/// Returns a path that no image of the quote has, and adds it to them. NextImageNumber() reads only three digits, so
+/// above 999 it returns numbers that are taken.
+QString newImagePath(const QString& quoteNumber, QStringList& images)
 {
-    for (int number = NextImageNumber(quoteNumber);; ++number) {
+    for (int number = NextImageNumber(quoteNumber, images);; ++number) {
         const QString name = quoteNumber + u"_0"_s + PadZeroLeft(QString::number(number), 3) + u".jpg"_s;
-        const QString path = files::pathForWriting(gsImagesPath, name);
-        if (!files::exists(path))
-            return path;
+        if (images.contains(name, Qt::CaseInsensitive))
+            continue;
+        images.append(name);
+        return files::pathForWriting(gsImagesPath, name);
     }
 }
 
 /// Moves a picture to the host's images of the quote. The name is kept before, so that an interrupted move ends under
 /// it.
-void takePhotograph(const QString& arrived, const QString& path, const QString& quoteNumber)
+void takePhotograph(const QString& arrived, const QString& path, const QString& quoteNumber, QStringList& images)
 {
     const QString begun = journal::kept(arrived).toString();
     if (!begun.isEmpty() && files::exists(begun) && files::readBytes(begun) == files::readBytes(path))
         return files::remove(path);
-    const QString target = begun.isEmpty() || files::exists(begun) ? newImagePath(quoteNumber) : begun;
+    const QString target = begun.isEmpty() || files::exists(begun) ? newImagePath(quoteNumber, images) : begun;
     journal::keep(arrived, target);
-    files::move(path, target);
+    files::move(path, target, files::Target::Free);
 }
 
 /// Moves the pictures of the request that have arrived to the host's images of the quote.
 void takePhotographs(const xml::Node& root, const QString& requestNumber, const QString& quoteNumber)
 {
-    for (const xml::Node& imageId : root.selectNodes(u"rootns:quoteRequestImageIds/*"_s)) {
+    const QList<xml::Node> imageIds = root.selectNodes(u"rootns:quoteRequestImageIds/*"_s);
+    if (imageIds.isEmpty())
+        return;
+    const QStringList unread = files::list(gsUnreadPath, requestNumber + u"_*"_s);
+    QStringList images = files::list(gsImagesPath, quoteNumber + u"_*"_s);
+    const auto isHere = [&](const QString& name) {
+        return unread.contains(name, Qt::CaseInsensitive) && files::exists(gsUnreadPath + name);
+    };
+    for (const xml::Node& imageId : imageIds) {
         workStep();
         const QString arrived = requestNumber + u'_' + PadZeroLeft(imageId.text(), 3);
-        const bool isHere = files::isPlainName(arrived) && files::exists(gsUnreadPath + arrived + u".jpg"_s);
-        if (isHere)
-            takePhotograph(arrived, gsUnreadPath + arrived + u".jpg"_s, quoteNumber);
+        if (files::isPlainName(arrived) && isHere(arrived + u".jpg"_s))
+            takePhotograph(arrived, gsUnreadPath + arrived + u".jpg"_s, quoteNumber, images);
         else if (journal::kept(arrived).isUndefined())
             continue;
-        if (files::exists(gsUnreadPath + arrived + u".txt"_s))
+        if (isHere(arrived + u".txt"_s))
             files::remove(gsUnreadPath + arrived + u".txt"_s);
     }
 }
@@ -282,15 +290,17 @@ void takePhotographs(const xml::Node& root, const QString& requestNumber, const 
 void countOn(db::Recordset& cinfo)
 {
     const auto moveOn = [&] {
-        cinfo.cancelUpdate();
-        cinfo.requery();
         db::Recordset tried(gConn);
         cinfo.set(u"QUOTE_VAL"_s, NextQuoteNumber({}, cinfo, tried, true));
         cinfo.update();  // fails if another workstation has moved it meanwhile, perhaps to a number now taken
     };
-    bool moved = false;
-    for (int tries = 0; tries < 5 && !moved; ++tries)
-        moved = attempt(moveOn);
+    bool moved = attempt(moveOn);
+    for (int again = 0; again < 4 && !moved; ++again)
+        moved = attempt([&] {
+            cinfo.cancelUpdate();
+            cinfo.requery();
+            moveOn();
+        });
 }
 
 }  // namespace
@@ -299,20 +309,18 @@ bool LoadQREQ(QString& text, const QString& fileName)
 {
     const SharedMessage message = sharedMessage(text);
 
-    db::Recordset cinfo = opened(u"SELECT * FROM CINFO"_s);
     db::Recordset insurer = opened(u"SELECT * FROM INSURER WHERE KEST=1 or name='KEST Universal Insurer'"_s);
     if (!chooseInsurer(insurer))
         return refuse(u"Error locating a valid insurer, Please contact MarlinDesk Support."_s);
 
     std::unique_ptr<db::Lock> newQuotes = lockNewQuotes();
-    cinfo.requery();  // another workstation may have changed the counter before this one got the lock
+    db::Recordset cinfo = opened(u"SELECT * FROM CINFO"_s);  // after the lock, because its last owner moved the counter
     db::Recordset quote(gConn);
     const QString quoteNumber = NextQuoteNumber({}, cinfo, quote, false);
     db::Recordset notes = opened(sql("SELECT * FROM QUOTE3 WHERE QTNNO='{}'", quoteNumber));
     Request request;
     request.readKey(*message);
     db::Recordset car = opened(sql("SELECT * FROM CAR WHERE REGO='{}'", request.rego));
-    const db::Recordset model = opened(u"SELECT * FROM MODEL WHERE MODEL_ID1='Z000'"_s);
     db::Recordset colours = opened(u"SELECT * FROM KESTColours"_s);
 
     const db::Recordset known = opened(sql("SELECT * FROM QUOTE1 WHERE SUBQUOTE=0 AND KESTQRNO='{}' AND KESTQRVER='{}'",
@@ -326,7 +334,7 @@ bool LoadQREQ(QString& text, const QString& fileName)
     quote.addNew();
     // before the first update, so that a text that is too long is refused before anything is stored
     fillQuote(quote, quoteNumber, request, insurer, cinfo);
-    db::Recordset customer = fillCarAndCustomer(car, request, model, colours);
+    db::Recordset customer = fillCarAndCustomer(car, request, colours);
     quote.set(u"paint_rate"_s, insurer.value(car.text(u"PAINT_GP"_s) + u"_RATE"_s));
     if (notes.eof())
         notes.addNew();

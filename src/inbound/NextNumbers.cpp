@@ -133,10 +133,10 @@ QString NextQuoteNumber(const QString& given, const db::Recordset& cinfo, db::Re
     return number;
 }
 
-int NextImageNumber(const QString& quoteNumber)
+int NextImageNumber(const QString& quoteNumber, const QStringList& images)
 {
     int highest = 0;
-    for (const QString& name : files::list(gsImagesPath, quoteNumber + u"_*"_s)) {
+    for (const QString& name : images) {
         // the digits follow the quote number, "_" and the digit of the subquote; names match in any case
         if (!name.startsWith(quoteNumber + u'_', Qt::CaseInsensitive))
             continue;
@@ -152,13 +152,13 @@ qint64 NextLineNumber(qint64 number, const QString& qtnno, const QString& subquo
 {
     if (number > 0)
         return number;
-    const db::Recordset rows =
-        opened(sql("SELECT MAX(SEQ_NO) FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", qtnno, subquote));
     const QuoteKey quote{qtnno, subquote};
-    const qint64 highest =
-        lastNumber.quote == quote ? lastNumber.number : toLong(rows.value(rows.columns().constFirst()));
-    lastNumber = {quote, highest + 1};
-    return lastNumber.number;
+    if (lastNumber.quote != quote) {
+        const db::Recordset rows =
+            opened(sql("SELECT MAX(SEQ_NO) FROM QUOTE2 WHERE QTNNO='{}' AND SUBQUOTE='{}'", qtnno, subquote));
+        lastNumber = {quote, toLong(rows.value(rows.columns().constFirst()))};
+    }
+    return ++lastNumber.number;
 }
 
 QString NextItemNo(db::Recordset& rsLines)

@@ -5,6 +5,7 @@
 #include "platform/database/Recordset.h"
 
 #include <QString>
+#include <QStringList>
 
 #include <memory>
 
@@ -14,8 +15,8 @@ namespace kest {
 /// shop's counter. If `valueOnly` is true, the number has no prefix and suffix, but the search still adds them. `quote`
 /// is open afterwards, on an empty result.
 QString NextQuoteNumber(const QString& given, const db::Recordset& cinfo, db::Recordset& quote, bool valueOnly);
-/// Returns one more than the highest number of the quote's files in the images folder.
-int NextImageNumber(const QString& quoteNumber);
+/// Returns one more than the highest number of the quote's files among these names of the images folder.
+int NextImageNumber(const QString& quoteNumber, const QStringList& images);
 
 /// Locks out other workstations while this one searches for a free quote number and stores the quote. Throws
 /// RuntimeError if another one holds the lock for too long.
