@@ -2,6 +2,7 @@
 
 #include "base/Helpers.h"
 #include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 #include "messages/Envelope.h"
 #include "messages/MessageTypes.h"
 #include "platform/RuntimeError.h"
@@ -9,6 +10,10 @@
 #include "platform/database/Sql.h"
 #include "platform/values.h"
 #include "quotedata/Quote.h"
+
+#include <map>
+#include <optional>
+#include <utility>
 
 using namespace Qt::StringLiterals;
 
@@ -66,12 +71,27 @@ QString customerOfRequest(const xml::Document& message)
     return personName(message.selectSingleNode(u"//rootns:claimCustomer"_s), u"rootns:"_s);
 }
 
+using NameQuery = std::pair<QString, RowsNeeded>;
+std::optional<std::map<NameQuery, QString>> keptNames;
+
+/// Returns the name that a query finds, or an empty text if it does not find the rows that are needed.
+QString nameFrom(const NameQuery& query, QString (*nameIn)(const db::Recordset& rows))
+{
+    if (keptNames && keptNames->contains(query))
+        return keptNames->at(query);
+    const db::Recordset rows = opened(query.first);
+    const QString name = suffices(rows, query.second) ? nameIn(rows) : QString();
+    if (keptNames)
+        keptNames->emplace(query, name);
+    return name;
+}
+
 QString customerName(const QVariant& customer, RowsNeeded needed)
 {
-    db::Recordset names(gConn);
-    names.open(
-        sql("SELECT SALUTATION + ' ' + FIRSTNAME + ' ' + NAME AS NAME FROM CUSTOMER WHERE CUST_ID={}", customer));
-    return suffices(names, needed) ? names.text(u"Name"_s) : QString();
+    return nameFrom(
+        {sql("SELECT SALUTATION + ' ' + FIRSTNAME + ' ' + NAME AS NAME FROM CUSTOMER WHERE CUST_ID={}", customer),
+         needed},
+        [](const db::Recordset& names) { return names.text(u"Name"_s); });
 }
 
 QString customerOfCar(const QString& rego, RowsNeeded needed)
@@ -83,11 +103,10 @@ QString customerOfCar(const QString& rego, RowsNeeded needed)
 
 QString vehicleName(const QVariant& model)
 {
-    db::Recordset names(gConn);
-    names.open(sql("SELECT MAKE, MODEL FROM ALLMODEL WHERE MODEL_ID='{}'", model));
-    if (!suffices(names, RowsNeeded::ExactlyOne))
-        return {};
-    return toText(names.value(u"MAKE"_s)) + u' ' + toText(names.value(u"MODEL"_s));
+    return nameFrom({sql("SELECT MAKE, MODEL FROM ALLMODEL WHERE MODEL_ID='{}'", model), RowsNeeded::ExactlyOne},
+                    [](const db::Recordset& names) {
+                        return toText(names.value(u"MAKE"_s)) + u' ' + toText(names.value(u"MODEL"_s));
+                    });
 }
 
 void drawFromMessage(MessageRow& row, const xml::Document& message, const MessageType& type)
@@ -216,6 +235,16 @@ MessageRow GetMarkerRow(const xml::Document& marker, const QString& typeName)
     });
     dashWhereEmpty(row, {RegoField, ClaimField, CustomerField, QuoteField, VehicleField});
     return row;
+}
+
+KeptNames::KeptNames()
+{
+    keptNames.emplace();
+}
+
+KeptNames::~KeptNames()
+{
+    keptNames.reset();
 }
 
 }  // namespace kest

@@ -21,4 +21,13 @@ MessageRow GetMarkerRow(const QString& text, const QString& typeName);
 MessageRow GetMessageRow(const xml::Document& message, const QString& typeName);
 MessageRow GetMarkerRow(const xml::Document& marker, const QString& typeName);
 
+/// While an object exists, the names of customers and vehicles that were asked for are kept, because the rows of a list
+/// share many of them.
+class KeptNames {
+public:
+    KeptNames();
+    ~KeptNames();
+    Q_DISABLE_COPY_MOVE(KeptNames)
+};
+
 }  // namespace kest

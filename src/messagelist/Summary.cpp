@@ -215,6 +215,7 @@ QList<ListedMessage> BuildMessageList(MessageFolder folder, const FillHooks& hoo
     const QStringList names = files::list(gsCurFolder);
     settleFilter(folder, names.size(), hooks);
 
+    const KeptNames keptNames;
     Fill fill(folder, names, hooks);
     qint64 done = 0;
     for (const QString& file : names) {
