@@ -196,6 +196,7 @@ void prune()
         if (oldest.eof())
             return;
         const QVariant operation = oldest.value(u"Operation"_s);
+        setState(toLong(operation), State::Pruned);  // first: nobody may undo what is left of it
         db::Recordset rows =
             opened(sql("SELECT TOP {} Entry FROM KESTJournal WHERE Operation={} ORDER BY Entry", room, operation));
         if (!rows.eof()) {

@@ -21,8 +21,8 @@ using namespace Qt::StringLiterals;
 namespace {
 
 constexpr std::array kindWords{"load"_L1, "send"_L1, "save"_L1, "response"_L1, "undo"_L1};
-constexpr std::array stateWords{"open"_L1,       "unfinished"_L1,  "done"_L1,    "failed"_L1,
-                                "taken back"_L1, "interrupted"_L1, "finished"_L1};
+constexpr std::array stateWords{"open"_L1,       "unfinished"_L1,  "done"_L1,     "failed"_L1,
+                                "taken back"_L1, "interrupted"_L1, "finished"_L1, "pruned"_L1};
 
 std::shared_ptr<Recorder> recorder = std::make_shared<Recorder>();
 

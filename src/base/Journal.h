@@ -33,6 +33,7 @@ enum class State {
     TakenBack,    // interrupted, and its changes taken back
     Interrupted,  // interrupted, and not all of its changes could be taken back
     Finished,     // interrupted, and finished later
+    Pruned,       // so old that it is being deleted, so that some of its records may be gone
 };
 
 QString wordOf(Kind kind);

@@ -1,6 +1,7 @@
 #include "inbound/modLoadXML.h"
 
 #include "base/Helpers.h"
+#include "base/Journal.h"
 #include "base/SharedVariables.h"
 #include "base/modLoggerEx.h"
 #include "inbound/Loading.h"
@@ -11,6 +12,7 @@
 #include "platform/RuntimeError.h"
 #include "platform/files/files.h"
 
+#include <QJsonArray>
 #include <QStringList>
 
 namespace kest {
@@ -87,8 +89,9 @@ bool isPicture(const QString& path)
     return files::readStart(path, 1) == "\xFF";
 }
 
-void withdrawIfRequest(const QString& path, const QString& requestNumber)
+void withdrawIfRequest(const QString& name, const QString& requestNumber)
 {
+    const QString path = gsUnreadPath + name;
     if (isPicture(path))
         return;
     QString text = files::read(path);
@@ -97,8 +100,12 @@ void withdrawIfRequest(const QString& path, const QString& requestNumber)
         return;
     const xml::Node root = waiting.documentElement();
     const xml::Node number = root.selectSingleNode(u"//rootns:quoteRequestNumber"_s);
-    if (root.textOrEmptyOf(u"messageType"_s) == u"QREQ"_s && number && number.text() == requestNumber)
-        files::remove(path, files::Force::Yes);
+    if (root.textOrEmptyOf(u"messageType"_s) != u"QREQ"_s || !number || number.text() != requestNumber)
+        return;
+    QJsonArray withdrawn = journal::kept(u"withdrawn"_s).toArray();
+    withdrawn.append(name);
+    journal::keep(u"withdrawn"_s, withdrawn);
+    files::remove(path, files::Force::Yes);
 }
 
 /// Deletes unread quote requests that a manual quote has answered, so that they don't become a second quote.
@@ -110,7 +117,7 @@ void withdrawWaitingRequests(const QString& requestNumber, const QString& fileNa
         if (!isBareName(name) || name.compare(fileName, Qt::CaseInsensitive) == 0)
             continue;
         try {
-            withdrawIfRequest(gsUnreadPath + name, requestNumber);
+            withdrawIfRequest(name, requestNumber);
         } catch (const RuntimeError& error) {
             if (error.number() != FileNotFound)  // the transport may have removed it since the folder was listed
                 throw;

@@ -13,6 +13,8 @@
 #include "recovery/Recovery.h"
 #include "recovery/TakeBack.h"
 
+#include <QJsonArray>
+
 namespace kest::recovery {
 
 using namespace Qt::StringLiterals;
@@ -47,6 +49,8 @@ QStringList obstaclesOfFiles(const journal::Entry& load)
     for (const auto& fact : load.facts)
         if (fact.toString().endsWith(".jpg"_L1, Qt::CaseInsensitive))
             reasons.append(u"It has moved the picture %1."_s.arg(fact.toString()));
+    for (const QJsonValue request : load.facts[u"withdrawn"_s].toArray())
+        reasons.append(u"It has deleted the waiting request %1."_s.arg(request.toString()));
     if (!isMessageRead(load))
         reasons.append(u"Its message is no longer among the read messages."_s);
     if (files::exists(gsUnreadPath + load.file))
@@ -54,7 +58,8 @@ QStringList obstaclesOfFiles(const journal::Entry& load)
     return reasons;
 }
 
-QStringList quoteNumbers(const journal::Entry& load)
+/// Returns the numbers of the quotes that a load has changed.
+QStringList numbersOf(const journal::Entry& load)
 {
     QStringList numbers;
     for (const journal::RecordedChange& change : journal::changesOf(load.id))
@@ -63,14 +68,16 @@ QStringList quoteNumbers(const journal::Entry& load)
     return numbers;
 }
 
-/// The host invoices a quote without changing a column that a load writes.
+/// Returns a sentence for each quote that the host has invoiced. It may do so without a change of what the load wrote.
 QStringList invoices(const journal::Entry& load)
 {
     QStringList reasons;
-    for (const QString& number : quoteNumbers(load))
-        if (!opened(sql("SELECT QTNNO FROM QUOTE1 WHERE QTNNO='{}' AND invoiced=1", number)).eof() ||
-            (gConn->hasTable(u"DEBTOR"_s) && !opened(sql("SELECT QTNNO FROM DEBTOR WHERE QTNNO='{}'", number)).eof()))
-            reasons.append(u"Quote %1 has an invoice."_s.arg(number));
+    for (const QString& number : numbersOf(load)) {
+        const bool isInDebtors =
+            gConn->hasTable(u"DEBTOR"_s) && !opened(sql("SELECT QTNNO FROM DEBTOR WHERE QTNNO='{}'", number)).eof();
+        if (isInDebtors || !opened(sql("SELECT QTNNO FROM QUOTE1 WHERE QTNNO='{}' AND invoiced=1", number)).eof())
+            reasons.append(u"Quote %1 is invoiced."_s.arg(number));
+    }
     return reasons;
 }
 
@@ -78,7 +85,7 @@ QStringList invoices(const journal::Entry& load)
 QStringList newerOperations(const journal::Entry& load)
 {
     QStringList reasons;
-    for (const QString& number : quoteNumbers(load)) {
+    for (const QString& number : numbersOf(load)) {
         for (const journal::Entry& other : journal::historyOf(number, {})) {
             if (isIn(other, journal::State::TakenBack) || other.kind == journal::wordOf(journal::Kind::Undo))
                 continue;
@@ -105,6 +112,8 @@ QStringList obstaclesToUndo(qint64 operation)
         return {u"There is no operation %1."_s.arg(operation)};
     if (load.kind != journal::wordOf(journal::Kind::Load))
         return {u"Operation %1 is no load."_s.arg(operation)};
+    if (isIn(load, journal::State::Pruned))
+        return {u"It is so old that a part of what it changed is no longer recorded."_s};
     if (!isIn(load, journal::State::Done) && !isIn(load, journal::State::Finished))
         return {u"The state of the load is \"%1\"."_s.arg(load.state)};
     const QStringList newer = newerOperations(load);  // which explain changed rows, too

@@ -8,8 +8,8 @@
 namespace kest::recovery {
 
 /// Returns why an operation can't be undone, a sentence each, or nothing if it can be. Only a complete load can be
-/// undone that is the newest operation on its quotes, which have no invoice, that has neither moved a picture nor
-/// exported a job, and whose rows nobody has changed since.
+/// undone that is the newest operation on its quotes, that has moved no picture, deleted no request and exported no
+/// job, and whose rows nobody has changed or invoiced since.
 QStringList obstaclesToUndo(qint64 operation);
 
 /// The question to ask before undo().

@@ -100,6 +100,7 @@ TEST_F(JournalOfAShop, ForgetsOldOperationsSomeRowsAtATimeButNoOpenOne)
     EXPECT_EQ(rowCount("KESTOperation", "Operation IN (1, 3, 4, 5)"), 4);
     EXPECT_EQ(rowCount("KESTOperation"), 4);
     EXPECT_EQ(rowCount("KESTJournal", "Operation=3"), 101);
+    EXPECT_EQ(journal::entryOf(3).state, u"pruned"_s);
 
     journal::prune();
     EXPECT_EQ(rowCount("KESTOperation", "Operation IN (1, 4, 5)"), 3);

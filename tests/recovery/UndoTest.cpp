@@ -112,16 +112,28 @@ TEST_F(UndoOfALoad, IsRefusedWithTheReason)
              arrive("m.xml", authorisation());
              return load;
          }},
-        {"Quote 500 has an invoice.",
+        {"It has deleted the waiting request QREQ.xml.",
+         [this] {
+             arrive("QREQ.xml", quoteRequest("QR1"));
+             return loaded(u"m.xml"_s, manualQuote("500"));
+         }},
+        {"It is so old that a part of what it changed is no longer recorded.",
          [] {
              const qint64 load = loaded(u"m.xml"_s, authorisation());
-             addRow("DEBTOR", {{"QTNNO", u"500"_s}});
+             journal::setState(load, journal::State::Pruned);
              return load;
          }},
-        {"Quote 500 has an invoice.",
+        {"Quote 500 is invoiced.",
          [] {
-             const qint64 load = loaded(u"m.xml"_s, cancellation("QR1"));
+             quote("500").set("invoiced", 0);  // so that the load does not write it
+             const qint64 load = loaded(u"m.xml"_s, authorisation());
              quote("500").set("invoiced", 1);
+             return load;
+         }},
+        {"Quote 500 is invoiced.",
+         [] {
+             const qint64 load = loaded(u"m.xml"_s, authorisation());
+             addRow("DEBTOR", {{"QTNNO", "500"}});
              return load;
          }},
         {"The row of QUOTE1 with",
