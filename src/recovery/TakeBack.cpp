@@ -65,8 +65,8 @@ void putBefore(RowHistory& row, const db::RowChange& older)
     }
 }
 
-/// Returns the rows that an operation changed and that are not taken back yet, the one changed last first. New quotes
-/// come after all others, because a quote goes only after its lines and notes, and its totals are stored after them.
+/// Returns the rows that an operation changed and that are not taken back yet, the one changed last first, but a new
+/// quote after its lines and notes.
 QList<RowHistory> rowsOf(qint64 operation)
 {
     QList<RowHistory> rows;
@@ -89,7 +89,7 @@ QList<RowHistory> rowsOf(qint64 operation)
             known.insert(identityOf(change->row, Moment::Before), row);
     }
     rows.removeIf([](const RowHistory& row) { return row.isGone; });
-    std::ranges::stable_partition(rows, [](const RowHistory& row) { return !row.isNewQuote(); });
+    std::stable_partition(rows.begin(), rows.end(), [](const RowHistory& row) { return !row.isNewQuote(); });
     return rows;
 }
 
@@ -137,77 +137,97 @@ QSet<QString> quotesInUse(const QList<RowHistory>& rows)
     return inUse;
 }
 
-bool isSame(const QVariant& registration, const QString& other)
+/// Returns the registration that an operation has given to a known car, or an empty text if it changed at most its
+/// case.
+QString givenRego(const RowHistory& row)
 {
-    return textOrEmpty(registration).compare(other, Qt::CaseInsensitive) == 0;
+    const db::RowChange::Column* rego =
+        row.isOf("CAR"_L1) && row.net.kind == db::ChangeKind::Update ? row.net.column(u"REGO"_s) : nullptr;
+    const bool isNew = rego && textOrEmpty(rego->before).compare(textOrEmpty(rego->after), Qt::CaseInsensitive) != 0;
+    return isNew ? textOrEmpty(rego->after) : QString();
 }
 
-/// Returns the new registrations of cars that quotes from elsewhere use already. Not one that another car had to give
-/// up: that car gets it back.
-QStringList registrationsInUse(const QList<RowHistory>& rows)
+/// Returns true if a quote has that registration that the operation has not changed.
+bool hasOtherQuote(const QList<RowHistory>& rows, const QString& rego)
 {
-    QStringList inUse;
-    const auto count = [&](QLatin1StringView table, auto&& condition) {
-        return std::ranges::count_if(rows, [&](const RowHistory& row) {
-            const db::RowChange::Column* rego = row.isOf(table) ? row.net.column(u"REGO"_s) : nullptr;
-            return rego && condition(*rego);
-        });
-    };
-    for (const RowHistory& car : rows) {
-        const db::RowChange::Column* rego = car.isOf("CAR"_L1) ? car.net.column(u"REGO"_s) : nullptr;
-        const QString given = rego ? textOrEmpty(rego->after) : QString();
-        if (car.isNew() || !rego || isSame(rego->before, given) ||
-            count("CAR"_L1, [&](const auto& other) { return isSame(other.before, given); }) > 0)
-            continue;
-        const auto own = count("QUOTE1"_L1, [&](const auto& other) { return isSame(other.after, given); });
-        if (opened(sql("SELECT QTNNO FROM QUOTE1 WHERE REGO='{}'", given)).recordCount() > own)
-            inUse.append(given);
+    for (db::Recordset quotes = opened(sql("SELECT QTNNO, Subquote FROM QUOTE1 WHERE REGO='{}'", rego)); !quotes.eof();
+         quotes.moveNext()) {
+        const QString found = quotes.text(u"QTNNO"_s) + u'/' + quotes.text(u"Subquote"_s);
+        if (std::ranges::none_of(rows,
+                                 [&](const RowHistory& row) { return row.isOf("QUOTE1"_L1) && row.quote() == found; }))
+            return true;
     }
-    return inUse;
+    return false;
 }
 
-/// Lets a column stay as it is when its row is taken back.
-void leave(RowHistory& row, const QString& name, const QStringList& values = {})
+/// Returns the new registrations that cars keep, because other quotes would have no car without them.
+QStringList keptRegos(const QList<RowHistory>& rows)
 {
-    for (db::RowChange::Column& column : row.net.columns)
-        if (column.name.compare(name, Qt::CaseInsensitive) == 0 &&
-            (values.isEmpty() || values.contains(textOrEmpty(column.after), Qt::CaseInsensitive)))
-            column.before = column.after;
+    QStringList kept;
+    for (const RowHistory& car : rows) {
+        const QString rego = givenRego(car);
+        const bool isReturned = std::ranges::any_of(rows, [&](const RowHistory& other) {
+            return !givenRego(other).isEmpty() &&
+                   textOrEmpty(other.net.column(u"REGO"_s)->before).compare(rego, Qt::CaseInsensitive) == 0;
+        });  // to the car that has made way for this one
+        if (!rego.isEmpty() && !isReturned && hasOtherQuote(rows, rego))
+            kept.append(rego);
+    }
+    return kept;
 }
 
-/// What an operation is taken back in, and what stays because others use it.
-struct Work {
-    explicit Work(qint64 operation);
+/// Leaves a column of an updated row as it is if it now has one of these values.
+void leaveColumn(RowHistory& row, QLatin1StringView name, const std::function<bool(const QVariant& now)>& isLeft)
+{
+    if (row.net.kind == db::ChangeKind::Update)
+        row.net.columns.removeIf([&](const db::RowChange::Column& column) {
+            return column.name.compare(name, Qt::CaseInsensitive) == 0 && isLeft(column.after);
+        });
+}
 
+bool changesNothing(const RowHistory& row)
+{
+    return row.net.kind == db::ChangeKind::Update &&
+           std::ranges::all_of(row.net.columns, [](const db::RowChange::Column& column) {
+               return column.before == column.after && column.before.isNull() == column.after.isNull();
+           });
+}
+
+/// What is taken back of an operation.
+struct Plan {
     QList<RowHistory> rows;
-    QSet<QString> quotesInUse;
-    QStringList left;  // a sentence each
+    QStringList left;  // what is not, a sentence each
 };
 
-Work::Work(qint64 operation) : rows(rowsOf(operation)), quotesInUse(kest::recovery::quotesInUse(rows))
+Plan planOf(qint64 operation)
 {
-    for (const QString& quote : quotesInUse)
-        left.append(u"Quote %1 has lines, notes or an invoice from elsewhere and stays."_s.arg(quote));
-    const QStringList registrations = registrationsInUse(rows);
-    for (const QString& registration : registrations)
-        left.append(u"The car %1 keeps this registration, because another quote uses it."_s.arg(registration));
-    for (RowHistory& row : rows) {
-        if (row.isNew())
-            continue;
-        if (row.isOf("CAR"_L1))
-            leave(row, u"KEST"_s);  // a later load that found it set has recorded nothing
-        if (!registrations.isEmpty() && (row.isOf("CAR"_L1) || row.isOf("QUOTE1"_L1)))
-            leave(row, u"REGO"_s, registrations);
+    Plan plan{rowsOf(operation), {}};
+    const QSet<QString> inUse = quotesInUse(plan.rows);
+    for (const QString& quote : inUse)
+        plan.left.append(u"Quote %1 has lines, notes or an invoice from elsewhere and stays."_s.arg(quote));
+    const QStringList regos = keptRegos(plan.rows);
+    for (const QString& rego : regos)
+        plan.left.append(u"Other quotes have the registration %1 by now, so its car keeps it."_s.arg(rego));
+    const auto isKept = [&](const QVariant& rego) { return regos.contains(textOrEmpty(rego), Qt::CaseInsensitive); };
+    plan.rows.removeIf(
+        [&](const RowHistory& row) { return stays(row) || inUse.contains(row.quote()) || isKept(givenRego(row)); });
+    for (RowHistory& row : plan.rows) {
+        if (row.isOf("QUOTE1"_L1))
+            leaveColumn(row, "REGO"_L1, isKept);
+        if (row.isOf("CAR"_L1))  // other loads may count on the mark
+            leaveColumn(row, "KEST"_L1, [](const QVariant&) { return true; });
     }
+    plan.rows.removeIf(changesNothing);
+    return plan;
 }
 
-/// Goes through the rows that an operation would be taken back in. Returns a sentence for each that `undo` refuses.
+/// Returns a sentence for each row that `undo` refuses.
 template <class Undo>
-QStringList refused(const QList<RowHistory>& rows, const QSet<QString>& inUse, Undo&& undo)
+QStringList refused(const QList<RowHistory>& rows, Undo&& undo)
 {
     QStringList left;
     for (const RowHistory& row : rows)
-        if (!stays(row) && !inUse.contains(row.quote()) && !undo(row))
+        if (!undo(row))
             left.append(nameOf(row.net) + u" was changed by someone else and stays as it is."_s);
     return left;
 }
@@ -239,11 +259,11 @@ db::RowChange reversed(db::RowChange change)
 using Record = std::function<void(const db::RowChange&)>;
 
 /// Takes some rows back in one transaction, because each commit waits for the disk.
-QStringList takeBackTogether(const QList<RowHistory>& rows, const QSet<QString>& inUse, const Record& record)
+QStringList takeBackTogether(const QList<RowHistory>& rows, const Record& record)
 {
     db::TakeBack together(*gConn);
     QList<qint64> taken;
-    const QStringList left = refused(rows, inUse, [&](const RowHistory& row) {
+    const QStringList left = refused(rows, [&](const RowHistory& row) {
         if ((row.isNewQuote() && hasMore(row, 0, 0)) || !together.undo(row.net))
             return false;
         if (record)
@@ -261,18 +281,17 @@ QStringList takeBackTogether(const QList<RowHistory>& rows, const QSet<QString>&
 QStringList takeBack(qint64 operation, const std::function<void(const db::RowChange&)>& record)
 {
     constexpr qsizetype together = 100;  // rows
-    const Work work(operation);
-    QStringList left = work.left;
-    for (qsizetype first = 0; first < work.rows.size(); first += together)
-        left += takeBackTogether(work.rows.mid(first, together), work.quotesInUse, record);
+    const Plan plan = planOf(operation);
+    QStringList left = plan.left;
+    for (qsizetype first = 0; first < plan.rows.size(); first += together)
+        left += takeBackTogether(plan.rows.mid(first, together), record);
     return left;
 }
 
 QStringList obstaclesTo(qint64 operation)
 {
-    const Work work(operation);
-    return work.left +
-           refused(work.rows, work.quotesInUse, [](const RowHistory& row) { return db::stillHolds(*gConn, row.net); });
+    const Plan plan = planOf(operation);
+    return plan.left + refused(plan.rows, [](const RowHistory& row) { return db::stillHolds(*gConn, row.net); });
 }
 
 }  // namespace kest::recovery

@@ -6,8 +6,8 @@
 struct UndoOfALoad : Interrupted {
     UndoOfALoad()
     {
-        vendor("Straightline Alignment");  // a new one would stay, and so does a car's flag
-        car("ABC123").set("KEST", 1);
+        vendor("Straightline Alignment");  // a new one would stay
+        car("ABC123").set("KEST", 1);      // the new mark, too
     }
 
     /// Loads a message and returns the load's operation.
@@ -184,20 +184,28 @@ TEST_F(UndoOfALoad, KeepsWhatOtherLoadsMayUse)
     EXPECT_EQ(Row("CINFO", "1=1").value("QUOTE_VAL").toInt(), counter);
 }
 
-TEST_F(UndoOfALoad, KeepsTheRegistrationThatAnotherQuoteUses)
+TEST_F(UndoOfALoad, LeavesARegistrationThatOtherQuotesUse)
 {
-    car("XYZ 42");
-    quote("700").rego("XYZ 42");
-    const qint64 operation = loaded(u"m.xml"_s, manualQuote("700").rego("XYZ42").labour(1, "I"));
-    EXPECT_EQ(recovery::obstaclesTo(operation), QStringList());
-    quote("701").rego("XYZ42");
-    const QStringList left{u"The car XYZ42 keeps this registration, because another quote uses it."_s};
-    EXPECT_EQ(recovery::obstaclesTo(operation), left);
-    EXPECT_EQ(recovery::takeBack(operation), left);
-    EXPECT_EQ(rowCount("CAR", "REGO='XYZ 42'"), 0);
-    EXPECT_EQ(rowCount("CAR", "REGO='XYZ42' AND KEST=1"), 1) << "a load of the other quote relies on the flag, too";
-    EXPECT_EQ(quote("700").text("REGO"), "XYZ42");
-    EXPECT_EQ(quote("700").lines(), 0);
+    for (const char* statement : {"UPDATE CAR SET REGO='AB C123'", "UPDATE QUOTE1 SET REGO='AB C123'"})
+        gConn->execute(QString::fromLatin1(statement));
+    const Snapshot before;
+    for (const auto& [isInUse, isInTheWay] : {std::pair(false, false), {true, false}, {true, true}}) {
+        if (isInTheWay)
+            car("ABC123");
+        const qint64 operation = loaded(u"m.xml"_s, manualQuote("500"));
+        if (isInUse)
+            quote("501").rego("ABC123");
+        const bool stays = isInUse && !isInTheWay;  // otherwise quote 501 would have no car
+        QStringList told(stays, u"Other quotes have the registration ABC123 by now, so its car keeps it."_s);
+        EXPECT_EQ(recovery::obstaclesTo(operation), told);
+        EXPECT_EQ(recovery::takeBack(operation), told);
+        EXPECT_EQ(quote("500").text("REGO"), stays ? "ABC123" : "AB C123") << "which is that of its car";
+        EXPECT_EQ(rowCount("CAR", "REGO='AB C123'"), stays ? 0 : 1);
+        EXPECT_EQ(rowCount("CAR", "REGO='ABC123'"), isInUse ? 1 : 0);
+        EXPECT_EQ(quote("500").stage(), 3) << "the rest goes back";
+        before.restore();
+        EnsureConnection();
+    }
 }
 
 TEST_F(UndoOfALoad, LeavesARowThatSomeoneElseHasChangedWhole)
