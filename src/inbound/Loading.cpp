@@ -1,6 +1,7 @@
 #include "inbound/Loading.h"
 
 #include "base/QuoteKey.h"
+#include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "platform/Prompt.h"
 #include "platform/database/Sql.h"
