@@ -104,9 +104,7 @@ TEST_F(ManualQuotes, ACarTypedWithBlanksTakesTheNetworksRegistration)
 TEST_F(ManualQuotes, AQuoteThatExistsWaitsForNobodyWhoCreatesOne)
 {
     quote("500").line(7);
-    const auto other = std::make_shared<db::Connection>();
-    other->open(connectionText(driverNumber()));
-    const db::Lock creating(other, u"new quote"_s);
+    const db::Lock creating(anotherConnection(), u"new quote"_s);
     ASSERT_TRUE(creating.isHeld());
     EXPECT_TRUE(load(manualQuote("500").labour(1, "I"))) << shown();
 }

@@ -60,11 +60,9 @@ TEST_F(MessageListWindow, ALoadIsCompleteWhateverHappensWhileItsReportIsOpen)
 {
     putTemplate(710);
     arrive("m.xml", quoteRequest("QR1"));
-    const auto other = std::make_shared<db::Connection>();
-    other->open(connectionText(driverNumber()));
     std::optional<db::Lock> creating;
     const auto whileOpen = [&](QDialog&) {
-        creating.emplace(other, u"new quote"_s);
+        creating.emplace(anotherConnection(), u"new quote"_s);
         gConn->close();
     };
     const Hands hands({{u"frmPrintPreview"_s, whileOpen}});

@@ -19,14 +19,6 @@ struct Interrupted : Sending {
         quote("500", 1).quoteNumber("KQ2").line(1);
         recovery::takeSettled();
     }
-    ~Interrupted() override { db::setStatementFault({}); }
-
-    static db::ConnectionPtr anotherConnection()
-    {
-        auto connection = std::make_shared<db::Connection>();
-        connection->open(connectionText(driverNumber()));
-        return connection;
-    }
 
     /// Settles an operation whose folder is away, and then that of another workstation with a folder of its own.
     static void settleOutOfSight(QString& folder)

@@ -46,8 +46,7 @@ TEST_F(RecoveryOnAServer, EndsTheSessionOfItsOwnDeadProcess)
         gConn->execute(u"UPDATE QUOTE1 SET Claim='C9' WHERE QTNNO='500'"_s);
         operation.end(journal::State::Done);
     }
-    const auto dead = std::make_shared<db::Connection>();
-    dead->open(connectionText(driverNumber()));
+    const db::ConnectionPtr dead = anotherConnection();
     const QString lock = journal::historyOf(u"500"_s, {}).front().lock;
     const db::Lock held(dead, lock);
     administrator->execute(sql("UPDATE KESTOperation SET State='open', ServerSession='{}'", dead->serverSession()));

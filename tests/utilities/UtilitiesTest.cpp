@@ -158,9 +158,7 @@ TEST_F(Utilities, TheWindowStaysAfterASaveThatFails)
     for (const auto& [meanwhile, date, failure, stored] : cases) {
         quote("500").quoteNumber("before").remarks("before");
         const QStringList failures = failuresOf([&](QDialog& window) {
-            db::Connection workstation;
-            workstation.open(connectionText(driverNumber()));
-            workstation.execute(QString::fromLatin1(meanwhile));
+            anotherConnection()->execute(QString::fromLatin1(meanwhile));
             control<QLineEdit>(window, "txtQuoteNo").setText(u"repaired"_s);
             control<QLineEdit>(window, "txtAuthDate").setText(date);
             control<QPushButton>(window, "Command4").click();
