@@ -127,9 +127,7 @@ void withdrawWaitingRequests(const QString& requestNumber, const QString& fileNa
 
 bool load(QString& text, const QString& fileName)
 {
-    SharedMessage message = sharedMessage(text);
-    if (message->parseError().errorCode == xml::BareAmpersand && escapeAmpersands(text))
-        message = sharedMessage(text);
+    const SharedMessage message = repairedMessage(text);
     if (message->parseError().errorCode != 0) {
         reportParseError(message->parseError(), fileName);
         return false;

@@ -180,6 +180,14 @@ SharedMessage sharedMessage(QString& text)
     return document;
 }
 
+SharedMessage repairedMessage(QString& text)
+{
+    SharedMessage message = sharedMessage(text);
+    if (message->parseError().errorCode == xml::BareAmpersand && escapeAmpersands(text))
+        message = sharedMessage(text);
+    return message;
+}
+
 KeptMessage::KeptMessage()
 {
     ++keepers;

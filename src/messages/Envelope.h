@@ -53,6 +53,8 @@ using SharedMessage = std::shared_ptr<const xml::Document>;
 /// Does the same as parsedMessage(), but returns the document of the last call if a KeptMessage exists and the text is
 /// the same.
 SharedMessage sharedMessage(QString& text);
+/// Does the same, but escapes the ampersands of `text` first if a bare one makes it unreadable.
+SharedMessage repairedMessage(QString& text);
 
 /// While an object exists, the last document of sharedMessage() is kept, because the steps of a load read the same text
 /// one after the other. It is not kept longer, because a message can contain documents of many megabytes. A long text

@@ -34,9 +34,7 @@ bool isGone(const journal::Entry& entry)
 
 const MessageType* typeOf(QString& text)
 {
-    SharedMessage message = sharedMessage(text);
-    if (message->parseError().errorCode == xml::BareAmpersand && escapeAmpersands(text))
-        message = sharedMessage(text);
+    const SharedMessage message = repairedMessage(text);
     return findMessageType(message->textOf(u"messageType"_s).toUpper());
 }
 

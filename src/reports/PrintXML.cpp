@@ -221,9 +221,7 @@ bool printAuthorised(const xml::Document& message, bool Reprint)
 bool print(const QString& fileName, bool Reprint)
 {
     QString text = files::read(gsListFolder + fileName);
-    SharedMessage message = sharedMessage(text);
-    if (message->parseError().errorCode == xml::BareAmpersand && escapeAmpersands(text))
-        message = sharedMessage(text);  // repaired for the report as for the load
+    const SharedMessage message = repairedMessage(text);
     const MessageType* type = findMessageType(message->documentElement().textOrEmptyOf(u"//*[name()='messageType']"_s));
     if (!type)
         return true;
