@@ -80,28 +80,22 @@ void tellOldTotals(const QuoteKey& key)
         desktop::Icon::Exclamation);
 }
 
-double refuse(const QString& message)
-{
-    desktop::msgBox(message, desktop::Icon::Critical);
-    return 0;
-}
-
 }  // namespace
 
 double SendQuote(db::Recordset& quote, bool* sent)
 {
     EnsureConnection();
     if (quote.eof())
-        return refuse(quoteNotFound);
+        return refuseSend(quoteNotFound);
     const QString number = quote.text(u"QTNNO"_s);
     quote = opened(sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' ORDER BY SUBQUOTE DESC", number));
     if (quote.eof())
-        return refuse(quoteNotFound);
+        return refuseSend(quoteNotFound);
     const QuoteKey key{number, quote.text(u"Subquote"_s)};
     quote = Quote::openHeader(key);
 
     if (const QString refusal = refusalOf(quote, key); !refusal.isEmpty())
-        return refuse(refusal);
+        return refuseSend(refusal);
 
     journal::Operation operation(journal::Kind::Send);
     try {

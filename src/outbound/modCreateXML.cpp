@@ -31,12 +31,6 @@ namespace {
 
 constexpr int highestFileNumber = 9999;
 
-double refuse(const QString& message)
-{
-    desktop::msgBox(message, desktop::Icon::Critical);
-    return 0;
-}
-
 /// Returns the name of the quote's next document. Counts only the documents that the transport has sent, so a document
 /// that is still waiting is replaced.
 QString documentName(const QuoteRows& rows)
@@ -129,6 +123,12 @@ bool isThere(const QString& name, const QString& hash)
 
 }  // namespace
 
+double refuseSend(const QString& message)
+{
+    desktop::msgBox(message, desktop::Icon::Critical);
+    return 0;
+}
+
 double CreateQuoteXML(db::Recordset& quote)
 {
     QuoteRows rows(quote);
@@ -137,32 +137,33 @@ double CreateQuoteXML(db::Recordset& quote)
     QuoteBody body(rows.key, text(quote, "KESTAuthNo"));
 
     if (rows.model.eof() || text(rows.model, "MAKE").toUpper().contains("UNIVERSAL"_L1))
-        return refuse(u"Please Select a Make and Model for this car"_s);
+        return refuseSend(u"Please Select a Make and Model for this car"_s);
     rows.requireAll();
     const InsurerReference reference = referenceOf(rows);
     if (!rows.key.isMain() && reference.authorisedQuoteNumber.trimmed().isEmpty())
-        return refuse(u"The main quote has no ORLA quote number yet, this additional cannot be sent."_s);
+        return refuseSend(u"The main quote has no ORLA quote number yet, this additional cannot be sent."_s);
 
     const bool asked = isTrue(quote.value(u"ExtraInfo"_s));
     const ExtraInfoResult answer =
         asked ? frmExtraInfo::ShowForm(number, subquote) : BuildArrayFromDB(number, subquote);
     EnsureConnection();  // it may have been lost while the window was open
     if (asked && std::holds_alternative<QString>(answer))
-        return refuse(std::get<QString>(answer));
+        return refuseSend(std::get<QString>(answer));
     std::optional<ExtraValues> extra;
     if (const auto* values = std::get_if<ExtraValues>(&answer))
         extra = *values;
 
     const std::optional<qint64> days = repairDays(quote);
     if (days.value_or(0) < 0)
-        return refuse(u"Cannot have a target completion date before the start date. Please check the quote details."_s);
+        return refuseSend(
+            u"Cannot have a target completion date before the start date. Please check the quote details."_s);
 
     xml::Document document;
     const Branch request(document, "request", GetNamespaceURI());
     addHead(request, rows, reference, extra, days);
     const double total = body.addTo(request);
     if (total == 0)
-        return refuse(
+        return refuseSend(
             u"Error: Cannot send $0 variations to ORLA. Please call your assessor to discuss the variation."_s);
     const QStringList images = addImages(request, rows);
     EnsureConnection();  // it may have been lost while a box about the pictures was open

@@ -16,6 +16,9 @@ namespace kest {
 /// shown.
 double CreateQuoteXML(db::Recordset& quote);
 
+/// Shows a critical box that says why a quote is not sent. Returns the total 0.
+double refuseSend(const QString& message);
+
 /// Writes a document and a copy of each photograph of the quote to the outgoing folder.
 void CreateImageXML(const QString& imagesPath, db::Recordset& quote);
 
