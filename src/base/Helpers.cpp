@@ -69,6 +69,22 @@ std::pair<QString, QString> SplitQuoteRef(const QString& reference)
     return {reference.first(slash), reference.sliced(slash + 1)};
 }
 
+bool isBlank(const QString& text)
+{
+    return text.trimmed().isEmpty();
+}
+
+QString trimBlanks(const QString& text)
+{
+    qsizetype from = 0;
+    qsizetype to = text.size();
+    while (from < to && text[from] == u' ')
+        ++from;
+    while (to > from && text[to - 1] == u' ')
+        --to;
+    return text.sliced(from, to - from);
+}
+
 QString AlphaNumericOnly(const QString& text)
 {
     return onlyCharacters(text,

@@ -21,6 +21,10 @@ QString NormaliseRego(const QString& rego);
 QString NormaliseQuoteRef(const QString& reference);
 /// Returns the quote number and the subquote. Without a "/" the subquote is "0".
 std::pair<QString, QString> SplitQuoteRef(const QString& reference);
+/// Returns true if a text has no character but white space.
+bool isBlank(const QString& text);
+/// Removes the blanks, and no other white space, from both ends.
+QString trimBlanks(const QString& text);
 /// Returns the letters and digits of a text.
 QString AlphaNumericOnly(const QString& text);
 /// Returns the part after the last dot, trimmed and in upper case, or an empty text if there is no dot.

@@ -1,5 +1,6 @@
 #include "base/modLoggerEx.h"
 
+#include "base/Helpers.h"
 #include "platform/Prompt.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
@@ -90,14 +91,7 @@ QString lastLogRecord()
 
 QString QuoteClean(const QString& text)
 {
-    qsizetype first = 0;
-    qsizetype last = text.size();
-    while (first < last && text[first] == u' ')
-        ++first;
-    while (last > first && text[last - 1] == u' ')
-        --last;
-    QString cleaned = text.mid(first, last - first);
-    return cleaned.replace(u'"', u'\'');
+    return trimBlanks(text).replace(u'"', u'\'');
 }
 
 }  // namespace kest

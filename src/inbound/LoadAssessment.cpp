@@ -1,4 +1,5 @@
 // Loads the answers to a sent quote: submission responses, adjustments, assessment results and their back-outs.
+#include "base/Helpers.h"
 #include "base/Journal.h"
 #include "base/modDBAccess.h"
 #include "inbound/Loading.h"

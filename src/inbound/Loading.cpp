@@ -1,5 +1,6 @@
 #include "inbound/Loading.h"
 
+#include "base/Helpers.h"
 #include "base/QuoteKey.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
@@ -32,11 +33,6 @@ void respellColour(db::Recordset& car, db::Recordset& colours)
         return;
     colours.find(sql("Script='{}'", colour));
     car.set(u"COLOUR"_s, colours.eof() ? u""_s : colours.text(u"Script"_s).trimmed());
-}
-
-bool isBlank(const QString& number)
-{
-    return number.trimmed().isEmpty();
 }
 
 bool isUnknown(const QString& number, const db::Recordset& quote)

@@ -1,5 +1,6 @@
 #include "quotedata/NoteChain.h"
 
+#include "base/Helpers.h"
 #include "platform/values.h"
 
 #include <QStringList>
@@ -22,17 +23,6 @@ QString body(const QString& subject, const QString& status, const QString& detai
     if (!detail.isEmpty())
         text += u" - "_s + detail;
     return text + u')';
-}
-
-QString trimBlanks(const QString& text)
-{
-    qsizetype from = 0;
-    qsizetype to = text.size();
-    while (from < to && text[from] == u' ')
-        ++from;
-    while (to > from && text[to - 1] == u' ')
-        --to;
-    return text.sliced(from, to - from);
 }
 
 bool mentions(const QString& remarks, const QString& subject)

@@ -1,5 +1,6 @@
 #include "reports/QuoteComparison.h"
 
+#include "base/Helpers.h"
 #include "base/SharedVariables.h"
 #include "messages/MessageLines.h"
 #include "platform/RuntimeError.h"
@@ -100,11 +101,6 @@ constexpr StartField adjustedStart[] = {
     {"total_md",   {is("0"),                 is("0"),               is("0"),                is("0")}},
 };
 // clang-format on
-
-bool isBlank(const QString& text)
-{
-    return text.trimmed().isEmpty();
-}
 
 bool isDeleted(const MessageLine& line)
 {
