@@ -12,6 +12,7 @@
 
 namespace kest::journal {
 
+/// Sees the changes of the connection, and writes each to the journal while an operation is at work.
 class Recorder final : public db::ChangeObserver {
 public:
     /// Looks whether a database can keep a journal. If it can't, the error log says so once for each reason. Throws if

@@ -46,7 +46,7 @@ bool isOwnerDead(const Entry& entry)
            files::Lock(signFile(), entry.lock).isHeld();
 }
 
-/// Takes the lock that tells others that the owner of the work lives. Returns false if someone else has it.
+/// Takes the lock that shows others that the owner of the work lives. Returns false if someone else has it.
 bool Work::takeLock(int seconds)
 {
     lock.reset();  // first, because it may be that of a lost connection

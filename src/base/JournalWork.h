@@ -14,6 +14,7 @@
 
 namespace kest::journal {
 
+/// The operation, and what it needs to write its row.
 struct Work {
     Kind kind = Kind::Load;
     QString file;

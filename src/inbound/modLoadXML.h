@@ -21,16 +21,20 @@ void LoadSubmissionResponse(QString& text, const QString& fileName);
 // stay.
 
 bool LoadQREQ(QString& text, const QString& fileName);
+bool LoadMANQ(QString& text, const QString& fileName);
+bool LoadAUQT(QString& text, const QString& fileName);  // reports its failures itself and returns false
+
+// LoadStatus.cpp has these.
 bool LoadQMQR(QString& text, const QString& fileName);
 bool LoadEWAP(QString& text, const QString& fileName);
-bool LoadMANQ(QString& text, const QString& fileName);
 bool LoadQTDL(QString& text, const QString& fileName);
 bool LoadRRQT(QString& text, const QString& fileName);
 bool LoadQRCN(QString& text, const QString& fileName);
 bool LoadBCQR(QString& text, const QString& fileName);
+
+// LoadAssessment.cpp has these.
 bool LoadADQT(QString& text, const QString& fileName);
 bool LoadARES(QString& text, const QString& fileName);
 bool LoadBACA(QString& text, const QString& fileName);
-bool LoadAUQT(QString& text, const QString& fileName);  // reports its failures itself and returns false
 
 }  // namespace kest

@@ -31,7 +31,7 @@ double RoundAmount(double& value, int places)
 
 double RoundDown(const double& value)
 {
-    // the text has 15 digits, so for an amount that is not too close to a whole number it tells nothing else
+    // the text has 15 digits, so for an amount that is not too close to a whole number it says nothing else
     constexpr double mostExact = 1e9;
     constexpr double tooClose = 1e-5;
     const double whole = std::trunc(value);

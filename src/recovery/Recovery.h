@@ -36,9 +36,9 @@ void settle(const QString& lockedFile = {});
 
 /// Returns what was settled since the last call.
 QList<Settled> takeSettled();
-/// Sets who is told of each operation as soon as it is settled, in addition to takeSettled().
+/// Sets who hears of each operation as soon as it is settled, in addition to takeSettled().
 void setReporter(std::function<void(const Settled&)> reporter);
-/// If a person sees the windows, tells what was settled since the last call, a box for each operation.
+/// If a person sees the windows, shows what was settled since the last call, a box for each operation.
 void showSettled();
 
 /// What an earlier load of a message has left.

@@ -28,6 +28,7 @@ struct ServerWords {
     QList<std::pair<QString, QString>> facts;
 };
 
+/// Returns the words of a kind of server.
 const ServerWords& wordsOf(Server server);
 
 }  // namespace kest::app

@@ -243,7 +243,7 @@ void frmHistory::cmdUndo_Click()
     if (!undo(chosen()))
         return;
     isUndone = true;
-    changes.clear();  // it tells now which were taken back
+    changes.clear();  // they say now which were taken back
     fill();
 }
 

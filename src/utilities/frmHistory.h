@@ -1,4 +1,4 @@
-// The window that tells what changed a quote, from what to what.
+// The window that shows what changed a quote, from what to what.
 #pragma once
 
 #include "base/History.h"
