@@ -63,7 +63,7 @@ TEST_F(MessageListWindow, ALoadIsCompleteWhateverHappensWhileItsReportIsOpen)
     std::optional<db::Lock> creating;
     const auto whileOpen = [&](QDialog&) {
         creating.emplace(anotherConnection(), u"new quote"_s);
-        gConn->close();
+        dropConnection();
     };
     const Hands hands({{u"frmPrintPreview"_s, whileOpen}});
     frmMessageList window;

@@ -1,7 +1,6 @@
 // What becomes of interrupted work when it is settled, and what the user is told.
 #include "inbound/modLoadXML.h"
 #include "messagelist/frmMessageList.h"
-#include "messages/Folders.h"
 #include "recovery/Interrupted.h"
 #include "support/Hands.h"
 
@@ -185,17 +184,6 @@ TEST_F(Interrupted, AMoveThatBeganEndsUnderItsName)
     }
     recovery::settle();
     EXPECT_EQ(filesIn(gsReadPath), QStringList(u"500.0_1.xml"_s));
-    EXPECT_EQ(filesIn(gsUnreadPath), QStringList());
-}
-
-TEST_F(Interrupted, AReportMayStayOpenUntilTheConnectionIsLost)
-{
-    putTemplate(710);
-    arrive("QR9_001.jpg", "picture");
-    arrive("m.xml", quoteRequest("QR9").images({"1"}));
-    const Hands hands({{u"frmPrintPreview"_s, [](QDialog&) { dropConnection(); }}});
-    EXPECT_TRUE(loadAsTheWindow(u"m.xml"_s));
-    EXPECT_EQ(shown(), "");
     EXPECT_EQ(filesIn(gsUnreadPath), QStringList());
 }
 
