@@ -198,9 +198,6 @@ TEST_P(SqlServer, TheTextsOfTheHostConnect)
         db::Connection made;
         EXPECT_EQ(failureOf([&] { made.open(host.arg(server)); }), 0) << server;
     }
-    db::Connection made;
-    made.setOdbcOptions(u"Server=%1"_s.arg(tdsServer().address()));
-    EXPECT_EQ(failureOf([&] { made.open(host.arg(u"127.0.0.1,1\\"_s)); }), 0);
 }
 
 INSTANTIATE_TEST_SUITE_P(Alone, SqlServer, ::testing::Values(On::Tds));
