@@ -1,3 +1,4 @@
+// Tests the command: its exit codes, its JSON, and what it asks.
 #include "app/CommandLine.h"
 #include "platform/settings/registry.h"
 #include "setup/Profile.h"

@@ -1,3 +1,4 @@
+// Tests which database the settings name, and what happens if it does not answer.
 #include "base/modLoggerEx.h"
 #include "support/OdbcDrivers.h"
 #include "support/Shop.h"

@@ -1,3 +1,4 @@
+// Tests the error log: where an error is reported, and a log that is full or can't be written.
 #include "base/modLoggerEx.h"
 #include "support/ScriptedDesktop.h"
 #include "support/Test.h"

@@ -1,3 +1,4 @@
+// Tests the settings of the host: the order of their places, and their types.
 #include "base/ModRegistry.h"
 #include "support/Test.h"
 

@@ -1,3 +1,4 @@
+// Plays the day of the demo shop, and compares what each step leaves.
 #include "base/CredentialCipher.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"

@@ -1,3 +1,4 @@
+// Tests what all loads share: the parse, the choice of the loader, and reported failures.
 #include "base/modLoggerEx.h"
 #include "inbound/modLoadXML.h"
 #include "messagelist/frmMessageList.h"

@@ -1,3 +1,4 @@
+// Tests the load of quote requests: the new quote, its number, car, customer and pictures.
 #include "support/Shop.h"
 
 struct Requests : Shop {

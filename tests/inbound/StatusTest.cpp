@@ -1,3 +1,4 @@
+// Tests messages that move a quote to another state, and submission responses.
 #include "inbound/modLoadXML.h"
 #include "support/Shop.h"
 

@@ -1,3 +1,4 @@
+// Tests the rules of the simulated insurer: how they are read, and which one is chosen.
 #include "loopback/InsurerRules.h"
 #include "support/Test.h"
 

@@ -1,3 +1,4 @@
+// Tests the simulated transport: what it carries, when, and what it reports.
 #include "app/TransportCommand.h"
 #include "loopback/Transport.h"
 #include "loopback/TransportWindow.h"

@@ -1,3 +1,4 @@
+// Tests the window of the message list: folders, filter, search, load and removal.
 #include "messagelist/MessageListModel.h"
 #include "messagelist/frmMessageList.h"
 #include "platform/script/Gestures.h"

@@ -1,3 +1,4 @@
+// Tests the rows of the message list: what each shows, and which messages are held back.
 #include "support/Shop.h"
 
 struct MessageList : Shop {

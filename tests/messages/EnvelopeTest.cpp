@@ -1,3 +1,4 @@
+// Tests the names of message types, and the repair of ampersands.
 #include "messages/Envelope.h"
 #include "support/Messages.h"
 #include "support/Test.h"

@@ -1,3 +1,4 @@
+// Tests the names of messages in the read folder, and the move to it.
 #include "messages/Folders.h"
 #include "support/Shop.h"
 

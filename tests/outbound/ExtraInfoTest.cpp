@@ -1,3 +1,4 @@
+// Tests the window for the extra vehicle values, and their forms in the document.
 #include "Sending.h"
 #include "outbound/ExtraInfo.h"
 #include "outbound/frmExtraInfo.h"

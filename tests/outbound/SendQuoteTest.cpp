@@ -1,3 +1,4 @@
+// Tests which quotes are refused, what a send marks and writes, and its pictures.
 #include "Sending.h"
 #include "platform/files/FaultInjection.h"
 

@@ -1,3 +1,4 @@
+// Tests the codes of the network in both directions.
 #include "quotedata/NetworkCodes.h"
 #include "support/Test.h"
 

@@ -1,3 +1,4 @@
+// Tests how notes are added, found and removed.
 #include "quotedata/NoteChain.h"
 #include "support/Test.h"
 

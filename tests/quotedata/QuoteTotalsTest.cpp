@@ -1,3 +1,4 @@
+// Tests the totals of a quote, and how amounts are rounded.
 #include "base/modLoggerEx.h"
 #include "quotedata/QuoteTotals.h"
 #include "quotedata/Rounding.h"

@@ -1,3 +1,4 @@
+// Tests new profiles: their folders, settings and tables, and the demo shop.
 #include "setup/Profile.h"
 #include "setup/QuoteDatabase.h"
 #include "shell/component.h"

@@ -1,3 +1,4 @@
+// Tests the binary interface with a host that loads the library.
 #include "shell/component.h"
 #include "support/Shop.h"
 

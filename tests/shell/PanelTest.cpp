@@ -1,3 +1,4 @@
+// Tests the panel: its options, its keys, and a lost connection.
 #include "support/Hands.h"
 #include "support/Shop.h"
 

@@ -1,3 +1,4 @@
+// Translates the host's paths into those of this system, finds names in any case, and lists folders.
 #include "platform/RuntimeError.h"
 #include "platform/files/SystemFile.h"
 #include "platform/files/files.h"

@@ -1,3 +1,4 @@
+// Documents: their root, new nodes, and the memory that they share.
 #include "platform/RuntimeError.h"
 #include "platform/xml/DocumentData.h"
 

@@ -1,3 +1,4 @@
+// Nodes: their names, texts, children and attributes.
 #include "platform/RuntimeError.h"
 #include "platform/xml/DocumentData.h"
 

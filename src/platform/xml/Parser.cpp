@@ -1,3 +1,4 @@
+// Parses texts within limits of size and depth, and gives the two repairable errors their codes.
 #include "platform/xml/DocumentData.h"
 #include "platform/xml/FaultInjection.h"
 

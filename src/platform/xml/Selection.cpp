@@ -1,3 +1,4 @@
+// Selects nodes by XPath expressions, each of which is compiled once.
 #include "platform/RuntimeError.h"
 #include "platform/xml/DocumentData.h"
 

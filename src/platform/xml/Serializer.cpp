@@ -1,3 +1,4 @@
+// Writes documents without a declaration and without added white space.
 #include "platform/xml/DocumentData.h"
 
 using namespace Qt::StringLiterals;
