@@ -120,8 +120,8 @@ qint64 restoreRow(Session& session, const TableInfo& table, const RowChange& cha
     if (isSwitched)
         allowIdentity(u"ON"_s);
     const auto off = qScopeGuard([&] {  // after a failure too: with it on, other inserts into the table fail
-        if (isSwitched)
-            attempt([&] { allowIdentity(u"OFF"_s); });
+        if (isSwitched && !attempt([&] { allowIdentity(u"OFF"_s); }))
+            session.engine().drop();
     });
     return session.executeNative(u"INSERT INTO "_s + tableOf(session, change) + u" ("_s + names.join(u", "_s) +
                                  u") VALUES ("_s + literals.join(u", "_s) + u')');
