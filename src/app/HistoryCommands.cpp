@@ -87,9 +87,10 @@ Outcome undo(const QStringList& arguments)
         return refused(u"operation %1 can't be undone: "_s.arg(operation) + reasons.join(u' '), Refused);
     if (!desktop::ask(recovery::undoQuestion(operation), desktop::Icon::Exclamation, u"undo"_s, desktop::Answer::No))
         return {.exitCode = Refused};
-    const QStringList left = recovery::undo(operation);
-    return {.fields = {{u"left"_s, QJsonArray::fromStringList(left)}},
-            .text = (QStringList(u"The load is undone."_s) + left).join(u' ') + u'\n'};
+    const recovery::Undone undone = recovery::undo(operation);
+    return {.exitCode = undone.areRowsBack() ? Done : Refused,
+            .fields = {{u"left"_s, QJsonArray::fromStringList(undone.told)}},
+            .text = (QStringList(undone.sentence()) + undone.told).join(u' ') + u'\n'};
 }
 
 QJsonArray jsonOf(const QList<recovery::Settled>& operations)

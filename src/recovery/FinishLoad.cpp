@@ -7,6 +7,7 @@
 #include "messages/Envelope.h"
 #include "messages/Folders.h"
 #include "messages/MessageTypes.h"
+#include "platform/RuntimeError.h"
 #include "platform/files/files.h"
 
 #include <QJsonArray>
@@ -119,13 +120,19 @@ bool isOfThisWorkstation(const journal::Entry& entry)
     return entry.workstation == GetComputerName();
 }
 
-void removeDocuments(const journal::Entry& entry)
+QStringList removeDocuments(const journal::Entry& entry)
 {
+    QStringList left;
     for (const QJsonValue written : entry.facts[u"documents"_s].toArray()) {
         const QString path = written[0].toString();
-        if (files::exists(path) && journal::hashOf(files::readBytes(path)) == written[1].toString())
-            files::remove(path);
+        const bool isGone = attempt([&] {
+            if (files::exists(path) && journal::hashOf(files::readBytes(path)) == written[1].toString())
+                files::remove(path);
+        });
+        if (!isGone)
+            left.append(u"Its document %1 could not be removed."_s.arg(path));
     }
+    return left;
 }
 
 }  // namespace kest::recovery

@@ -20,7 +20,7 @@ bool isThere(const QString& folder, const QString& file, const QString& hash);
 /// Another workstation may have folders of its own, with what its operation has left.
 bool isOfThisWorkstation(const journal::Entry& entry);
 
-/// Removes the documents of sublet work that a load has written.
-void removeDocuments(const journal::Entry& entry);
+/// Removes the documents of sublet work that a load has written. Returns which could not be removed, a sentence each.
+QStringList removeDocuments(const journal::Entry& entry);
 
 }  // namespace kest::recovery

@@ -119,15 +119,19 @@ void settleComplete(const journal::Entry& entry, journal::Operation& operation)
 void settleIncomplete(const journal::Entry& entry, journal::Operation& operation)
 {
     const QStringList left = takeBack(entry.id);
-    removeDocuments(entry);
-    operation.end(left.isEmpty() ? journal::State::TakenBack : journal::State::Interrupted);
-    tell({entry, left.isEmpty() ? Outcome::TakenBack : Outcome::Left, left});
+    const bool isBack = left.isEmpty();
+    const QStringList documents = removeDocuments(entry);
+    operation.end(isBack ? journal::State::TakenBack : journal::State::Interrupted);
+    tell({entry, isBack ? Outcome::TakenBack : Outcome::Left, left + documents});
 }
 
 void settleUndo(const journal::Entry& entry, journal::Operation& operation)
 {
-    const QStringList left = finishUndo(entry.workstation);
-    endComplete(entry, operation, !isMessageToMove(entry.workstation), left);
+    const Undone undone = finishUndo(entry.workstation);
+    if (undone.areRowsBack())
+        return endComplete(entry, operation, undone.state == journal::State::Done, undone.told);
+    operation.end(undone.state);
+    tell({entry, undone.state == journal::State::Failed ? Outcome::TakenBack : Outcome::Left, undone.told});
 }
 
 void settleAlone(journal::Entry entry, const QString& lockedFile)
@@ -183,6 +187,8 @@ QString Settled::sentence() const
     else if (outcome == Outcome::Left)
         tail = u"Not all of it could be taken back; check the quote%1."_s.arg(
             operation.number.isEmpty() ? QString() : u' ' + operation.number);
+    else if (isOf(operation, journal::Kind::Undo))
+        tail = u"The load was not undone."_s;
     else
         tail = isLoad ? u"It has been taken back; load the message again."_s : u"It has been taken back."_s;
     return (QStringList(head + tail) + left).join(u' ');

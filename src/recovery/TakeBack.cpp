@@ -258,10 +258,8 @@ db::RowChange reversed(db::RowChange change)
 
 using Record = std::function<void(const db::RowChange&)>;
 
-/// Takes some rows back in one transaction, because each commit waits for the disk.
-QStringList takeBackTogether(const QList<RowHistory>& rows, const Record& record)
+QStringList takeBackTogether(db::TakeBack& together, const QList<RowHistory>& rows, const Record& record)
 {
-    db::TakeBack together(*gConn);
     QList<qint64> taken;
     const QStringList left = refused(rows, [&](const RowHistory& row) {
         if ((row.isNewQuote() && hasMore(row, 0, 0)) || !together.undo(row.net))
@@ -272,19 +270,24 @@ QStringList takeBackTogether(const QList<RowHistory>& rows, const Record& record
         return true;
     });
     markTakenBack(taken);
-    together.commit();
     return left;
 }
 
 }  // namespace
 
-QStringList takeBack(qint64 operation, const std::function<void(const db::RowChange&)>& record)
+QStringList takeBack(qint64 operation, const std::function<void(const db::RowChange&)>& record,
+                     const std::function<bool()>& mayBegin)
 {
-    constexpr qsizetype together = 100;  // rows
+    constexpr qsizetype together = 100;  // rows in a transaction, because each commit waits for the disk
     const Plan plan = planOf(operation);
     QStringList left = plan.left;
-    for (qsizetype first = 0; first < plan.rows.size(); first += together)
-        left += takeBackTogether(plan.rows.mid(first, together), record);
+    for (qsizetype first = 0; first < plan.rows.size(); first += together) {
+        db::TakeBack transaction(*gConn);
+        if (first == 0 && mayBegin && !mayBegin())
+            return {};
+        left += takeBackTogether(transaction, plan.rows.mid(first, together), record);
+        transaction.commit();
+    }
     return left;
 }
 

@@ -14,8 +14,9 @@ namespace kest::recovery {
 /// mark of a car stay, because other loads may use them. A new quote that has lines, notes or an invoice from elsewhere
 /// stays with all its rows, and so does the new registration of a car that other quotes have. Can be interrupted and
 /// run again. Returns what could not be taken back, a sentence each. `record` gets the change that takes a row back, in
-/// its transaction.
-QStringList takeBack(qint64 operation, const std::function<void(const db::RowChange&)>& record = {});
+/// its transaction. `mayBegin` is asked in the first transaction; if it says no, nothing is taken back.
+QStringList takeBack(qint64 operation, const std::function<void(const db::RowChange&)>& record = {},
+                     const std::function<bool()>& mayBegin = {});
 
 /// Returns what takeBack() could not take back, a sentence each, and changes nothing.
 QStringList obstaclesTo(qint64 operation);

@@ -15,6 +15,8 @@
 
 #include <QJsonArray>
 
+#include <algorithm>
+
 namespace kest::recovery {
 
 using namespace Qt::StringLiterals;
@@ -98,9 +100,54 @@ QStringList newerOperations(const journal::Entry& load)
     return reasons;
 }
 
-journal::Entry loadToUndo()
+/// Takes the rows of a load back and removes its documents.
+Undone takeRowsBack(const journal::Entry& load)
 {
-    return journal::entryOf(journal::kept(u"undoes"_s).toInteger());
+    const QList<journal::RecordedChange> changes = journal::changesOf(load.id);
+    const bool isBegun =
+        std::ranges::any_of(changes, [](const journal::RecordedChange& change) { return change.isTakenBack; });
+    QStringList reasons;
+    const auto mayBegin = [&] {  // others may have worked since the last check
+        if (!isBegun)
+            reasons = obstaclesToUndo(load.id);
+        return reasons.isEmpty();
+    };
+    const QStringList left = takeBack(load.id, journal::record, mayBegin);
+    if (!reasons.isEmpty())
+        return {journal::State::Failed, reasons};
+    const Undone undone{left.isEmpty() ? journal::State::Done : journal::State::Interrupted,
+                        left + removeDocuments(load)};
+    journal::setState(load.id, left.isEmpty() ? journal::State::TakenBack : journal::State::Interrupted);
+    return undone;
+}
+
+/// Returns true if somebody has put the message of a load back, under whatever name, and loaded it again.
+bool isLoadedAgain(const journal::Entry& load)
+{
+    return !opened(sql("SELECT Operation FROM KESTOperation WHERE Operation>{} AND OperationKind='load' AND "
+                       "FileHash='{}' AND State<>'taken back'",
+                       load.id, load.hash))
+                .eof();
+}
+
+/// Moves the message of a load to the unread folder. Returns false if that is not possible yet.
+bool moveMessageBack(const journal::Entry& load, const QString& workstation)
+{
+    if (isLoadedAgain(load))
+        return true;
+    if (!isMessageRead(load))
+        return (workstation == GetComputerName() && files::folderExists(gsReadPath)) || isMessageUnread(load);
+    journal::keep(u"isMoving"_s, true);  // throws if another workstation goes on with this undo
+    return attempt([&] {
+        try {
+            if (files::exists(gsUnreadPath + load.file) && !isMessageUnread(load))
+                throw RuntimeError(PermissionDenied, u"Another %1 is among the unread messages."_s.arg(load.file));
+            files::move(gsReadPath + readName(load), gsUnreadPath + load.file);
+        } catch (const RuntimeError& error) {
+            logFailure(error, u"Undo.finishUndo"_s);
+            throw;
+        }
+    });
 }
 
 }  // namespace
@@ -127,20 +174,36 @@ QString undoQuestion(qint64 operation)
            "messages."_s.arg(journal::titleOf(load), load.started.toString(u"dd/MM/yyyy HH:mm"_s));
 }
 
-QStringList undo(qint64 operation)
+QString Undone::sentence() const
+{
+    return areRowsBack() ? u"The load is undone."_s
+                         : u"The load is undone only in part, so its message stays read; check the quote."_s;
+}
+
+Undone undo(qint64 operation)
 {
     const journal::Entry load = journal::entryOf(operation);
     const db::Lock alone(gConn, loadLock(load.file));
-    const QStringList reasons =
-        alone.isHeld() ? obstaclesToUndo(operation) : QStringList(u"Another workstation is loading its message."_s);
-    if (!reasons.isEmpty())
-        throw RuntimeError(RowChanged, reasons.join(u' '));
+    const auto refuse = [](const QStringList& reasons) {
+        if (!reasons.isEmpty())
+            throw RuntimeError(RowChanged, reasons.join(u' '));
+    };
+    refuse(alone.isHeld() ? obstaclesToUndo(operation) : QStringList(u"Another workstation is loading its message."_s));
     journal::Operation work(journal::Kind::Undo, load.file, load.hash);
     journal::keep(u"undoes"_s, load.id);
     journal::openNow(load.number, load.subquote);
-    const QStringList left = finishUndo(GetComputerName());
-    work.end(isMessageToMove(GetComputerName()) ? journal::State::Unfinished : journal::State::Done);
-    return left;
+    Undone undone;
+    try {
+        undone = finishUndo(GetComputerName());
+    } catch (const RuntimeError& error) {
+        work.end(journal::State::Open);  // so that it is finished later
+        throw RuntimeError(error.number(),
+                           error.description() + u" The undo is finished as soon as that is possible."_s);
+    }
+    work.end(undone.state);
+    if (undone.state == journal::State::Failed)
+        refuse(undone.told);
+    return undone;
 }
 
 bool askAndUndo(qint64 operation)
@@ -157,37 +220,25 @@ bool askAndUndo(qint64 operation)
     if (!desktop::ask(undoQuestion(operation), desktop::Icon::Exclamation, title, desktop::Answer::No))
         return false;
     EnsureConnection();  // the question may have been open for hours
-    const QStringList left = undo(operation);
-    if (!left.isEmpty())
-        tell(u"The load is undone."_s, left);
+    const Undone undone = undo(operation);
+    if (!undone.told.isEmpty())
+        tell(undone.sentence(), undone.told);
     return true;
 }
 
-QStringList finishUndo(const QString& workstation)
+Undone finishUndo(const QString& workstation)
 {
-    const journal::Entry load = loadToUndo();
-    QStringList left = takeBack(load.id, journal::record);
-    removeDocuments(load);
-    journal::setState(load.id, left.isEmpty() ? journal::State::TakenBack : journal::State::Interrupted);
-    attempt([&] {
-        try {
-            if (isMessageRead(load) && !files::exists(gsUnreadPath + load.file))
-                files::move(gsReadPath + readName(load), gsUnreadPath + load.file);
-        } catch (const RuntimeError& error) {
-            logFailure(error, u"Undo.finishUndo"_s);
-            throw;
-        }
-    });
-    if (isMessageToMove(workstation))
-        left.append(u"Its message could not be moved yet; it is moved as soon as that is possible."_s);
-    return left;
-}
-
-bool isMessageToMove(const QString& workstation)
-{
-    const journal::Entry load = loadToUndo();
-    const bool isInSight = workstation == GetComputerName() && files::folderExists(gsReadPath);
-    return isMessageRead(load) || (!isInSight && !isMessageUnread(load));
+    const journal::Entry load = journal::entryOf(journal::kept(u"undoes"_s).toInteger());
+    if (isIn(load, journal::State::Interrupted))
+        return {journal::State::Interrupted, {}};
+    Undone undone;
+    if (!isIn(load, journal::State::TakenBack))
+        undone = takeRowsBack(load);
+    if (undone.areRowsBack() && !moveMessageBack(load, workstation)) {
+        undone.state = journal::State::Unfinished;
+        undone.told.append(u"Its message could not be moved yet; it is moved as soon as that is possible."_s);
+    }
+    return undone;
 }
 
 }  // namespace kest::recovery

@@ -15,19 +15,29 @@ QStringList obstaclesToUndo(qint64 operation);
 /// The question to ask before undo().
 QString undoQuestion(qint64 operation);
 
+/// What became of an undo.
+struct Undone {
+    /// Done; Unfinished if only its message waits to be moved; Interrupted if rows have stayed, and its message, too;
+    /// or Failed if it was refused.
+    journal::State state = journal::State::Done;
+    QStringList told;  // what was not done, or why it was refused, a sentence each
+
+    bool areRowsBack() const { return state == journal::State::Done || state == journal::State::Unfinished; }
+    /// "The load is undone.", or that it is so only in part.
+    QString sentence() const;
+};
+
 /// Takes the changes of a load back as takeBack() does, and moves its message to the unread folder under its old name.
-/// This is an operation of its own. If it is interrupted, it is finished later. Returns what was not done, a sentence
-/// each. Throws RowChanged with the reasons if the operation can't be undone.
-QStringList undo(qint64 operation);
+/// This is an operation of its own. If it is interrupted or fails, it is finished later. Throws RowChanged with the
+/// reasons if the operation can't be undone.
+Undone undo(qint64 operation);
 
 /// Undoes a load if the user answers Yes. A box says why the load can't be undone, or what was not done. Returns true
 /// if it was undone.
 bool askAndUndo(qint64 operation);
 
-/// Goes on with an undo inside its operation, which that workstation began.
-QStringList finishUndo(const QString& workstation);
-/// Returns true if the message of the load that is undone still has to be moved, or if that can't be seen from here. It
-/// was in sight of the workstation that began the undo.
-bool isMessageToMove(const QString& workstation);
+/// Goes on with an undo inside its operation, which that workstation began. It may be refused as long as no row is
+/// back. Its message waits to be moved also if it can't be seen from here: it was in sight of that workstation.
+Undone finishUndo(const QString& workstation);
 
 }  // namespace kest::recovery

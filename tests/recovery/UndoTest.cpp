@@ -40,7 +40,7 @@ TEST_F(UndoOfALoad, LeavesAllAsItWas)
         const std::string before = holdings();
         const qint64 load = loaded(u"m.xml"_s, message);
         EXPECT_NE(holdings(), before);
-        EXPECT_EQ(recovery::undo(load), QStringList());
+        EXPECT_EQ(recovery::undo(load).told, QStringList());
         EXPECT_EQ(difference(before, holdings()), "\n") << "the message is unread again, too";
     }
 }
@@ -171,6 +171,80 @@ TEST_F(UndoOfALoad, AsksFirstAndSaysWhyItIsRefused)
     desktop.emplace(R"({"boxes": [{"text": "Undo the load", "answer": "yes"}]})");
     EXPECT_TRUE(recovery::askAndUndo(load));
     EXPECT_TRUE(files::exists(gsUnreadPath + u"m.xml"_s));
+}
+
+TEST_F(UndoOfALoad, IsDoneThoughADocumentCouldNotBeRemoved)
+{
+    const std::pair<Text, const char*> sublet("subletAuthorityDocument", "JVBERi0xLjQ=");
+    const qint64 load = loaded(u"m.xml"_s, authorisation().sublet(5, "I", {sublet}));
+    const QString document = journal::entryOf(load).facts[u"documents"_s][0][0].toString();
+    QFile::setPermissions(files::systemPath(document), QFile::ReadOwner);
+    const recovery::Undone undone = recovery::undo(load);
+    EXPECT_EQ(undone.told, QStringList(u"Its document %1 could not be removed."_s.arg(document)));
+    EXPECT_EQ(titleAndState(newest().id()), u"undo of the load of m.xml: done"_s);
+    EXPECT_TRUE(files::exists(gsUnreadPath + u"m.xml"_s));
+}
+
+TEST_F(UndoOfALoad, IsRefusedOrToldIfARowIsChangedMeanwhile)
+{
+    Message message = authorisation();
+    for (int line = 10; line < 130; ++line)
+        message.labour(line, "I");  // more than a transaction takes back
+    const std::tuple<const char*, QLatin1StringView, QLatin1StringView> cases[] = {
+        {"SELECT * FROM KESTOperation WHERE OperationKind='undo'", "done"_L1, "failed"_L1},
+        {"SELECT * FROM KESTJournal WHERE Settled=1", "interrupted"_L1, "interrupted"_L1},
+    };
+    const Snapshot before;
+    for (const auto& [moment, loadAfter, undoAfter] : cases) {
+        before.restore();
+        EnsureConnection();
+        const db::ConnectionPtr host = anotherConnection();
+        const qint64 load = loaded(u"m.xml"_s, message);
+        bool isWatching = true;
+        db::setStatementFault([&, reached = moment] {
+            if (!std::exchange(isWatching, false))
+                return false;
+            db::Recordset rows(host);
+            rows.open(QString::fromLatin1(reached));
+            isWatching = rows.eof();
+            if (!isWatching)
+                host->execute(u"UPDATE QUOTE2 SET rrhour=77 WHERE QTNNO='500' AND SEQ_NO=10"_s);
+            return false;
+        });
+        attempt([&] { EXPECT_TRUE(recovery::undo(load).sentence().contains(u"only in part"_s)); });
+        db::setStatementFault({});
+        recovery::settle();
+        EXPECT_EQ(titleAndState(load), u"load of m.xml: "_s + loadAfter);
+        EXPECT_EQ(titleAndState(newest().id()), u"undo of the load of m.xml: "_s + undoAfter);
+        EXPECT_EQ(quote("500").stage(), loadAfter == "done"_L1 ? 4 : 3);
+        EXPECT_EQ(quote("500").line(10).number("rrhour"), 77);
+        EXPECT_EQ(filesIn(gsUnreadPath), QStringList()) << "or it would be loaded over the rest";
+    }
+}
+
+TEST_F(UndoOfALoad, PutsItsMessageBackOnce)
+{
+    const Snapshot before;
+    for (const bool isPutBack : {false, true}) {
+        for (const bool isLoadedAgain : {false, true}) {
+            const qint64 load = loaded(u"m.xml"_s, authorisation());
+            files::makeFolder(gsUnreadPath + u"m.xml"_s);  // in the way of the move
+            EXPECT_EQ(recovery::undo(load).state, journal::State::Unfinished);
+            if (isLoadedAgain)  // under another name
+                loaded(u"n.xml"_s, authorisation());
+            QDir(files::systemPath(gsUnreadPath + u"m.xml"_s)).removeRecursively();
+            if (isPutBack)
+                arrive("m.xml", authorisation());
+            if (!isPutBack && !isLoadedAgain)
+                settleOutOfSight(gsReadPath);
+            recovery::settle();
+            EXPECT_EQ(rowCount("KESTOperation", "State='unfinished'"), 0);
+            EXPECT_EQ(filesIn(gsUnreadPath).size(), isPutBack || !isLoadedAgain ? 1 : 0);
+            EXPECT_EQ(filesIn(gsReadPath).size(), isLoadedAgain ? 2 : 0);
+            before.restore();
+            EnsureConnection();
+        }
+    }
 }
 
 TEST_F(UndoOfALoad, KeepsWhatOtherLoadsMayUse)
