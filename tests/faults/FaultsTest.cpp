@@ -5,6 +5,7 @@
 #include "jobexport/WriteQuote.h"
 #include "messages/Folders.h"
 #include "outbound/SendQuote.h"
+#include "platform/Prompt.h"
 #include "quotedata/QuoteTotals.h"
 #include "recovery/Recovery.h"
 #include "recovery/Undo.h"
@@ -162,8 +163,10 @@ TEST_F(Lines, Undo)
     arrive("m.xml", authorisedQuote("500").set("excess", "400").labour(1, "C").part(2, "D").sublet(4, "I"));
     const auto isUnread = [] { return files::exists(gsUnreadPath + u"m.xml"_s); };
     survives(u"Undo"_s, {[=] {
-                             if (!isUnread())
-                                 recovery::undo(load);
+                             if (isUnread())
+                                 return;
+                             for (const QString& sentence : recovery::undo(load).told)
+                                 desktop::msgBox(sentence);  // as the window does
                          },
                          isUnread,
                          [] {
