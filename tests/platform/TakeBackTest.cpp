@@ -129,4 +129,13 @@ TEST_P(TakeBackOn, AComputedColumnIsLeftToTheDatabase)
     }
 }
 
+TEST_P(TakeBackOn, AStatementThatCannotBeRecordedIsRefused)
+{
+    for (const QString& statement :
+         {u"INSERT INTO CAR (REGO) VALUES ('X')"_s, u"REPLACE INTO CAR (REGO) VALUES ('X')"_s})
+        EXPECT_EQ(failureOf([&] { connection->execute(statement); }), StatementFailed) << statement;
+    connection->execute(u"UPDATE CAR SET owner='Bob'"_s);
+    EXPECT_EQ(seen->changes.size(), 1) << "without a condition, all rows";
+}
+
 INSTANTIATE_TEST_SUITE_P(On, TakeBackOn, ::testing::Values(On::Embedded, On::MySql, On::Odbc, On::Tds));

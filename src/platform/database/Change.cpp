@@ -136,15 +136,23 @@ std::optional<PastedChange> pastedChange(const QString& statement)
     static const QRegularExpression head(u"\\A\\s*(?:(DELETE)\\s+FROM|UPDATE)\\s+(\\w+)\\s*(SET\\s)?"_s,
                                          QRegularExpression::CaseInsensitiveOption);
     const QRegularExpressionMatch match = head.match(statement);
-    const qsizetype where = match.hasMatch() ? wordAt(statement, u"WHERE") : -1;
-    if (where < 0)
+    if (!match.hasMatch())
         return {};
+    const qsizetype where = wordAt(statement, u"WHERE");
+    const qsizetype end = where < 0 ? statement.size() : where;
     PastedChange pasted;
     pasted.kind = match.captured(1).isEmpty() ? ChangeKind::Update : ChangeKind::Delete;
     pasted.table = match.captured(2);
-    pasted.assignments = statement.sliced(match.capturedEnd(), where - match.capturedEnd()).trimmed();
-    pasted.condition = statement.sliced(where + 5).trimmed();
+    pasted.assignments = statement.sliced(match.capturedEnd(), end - match.capturedEnd()).trimmed();
+    pasted.condition = where < 0 ? u"1=1"_s : statement.sliced(where + 5).trimmed();
     return pasted;
+}
+
+bool changesRows(const QString& statement)
+{
+    static const QRegularExpression head(u"\\A\\s*(INSERT|UPDATE|DELETE|MERGE|REPLACE|TRUNCATE)\\b"_s,
+                                         QRegularExpression::CaseInsensitiveOption);
+    return head.match(statement).hasMatch();
 }
 
 qint64 executeObserved(Connection& connection, const PastedChange& pasted, const QString& statement)

@@ -86,6 +86,8 @@ struct PastedChange {
 };
 /// Returns nothing for any other statement.
 std::optional<PastedChange> pastedChange(const QString& statement);
+/// Returns true if a statement of text changes rows, in a form that may be no PastedChange.
+bool changesRows(const QString& statement);
 /// Runs the statement. Reads the rows that it changes first, and locks them.
 qint64 executeObserved(Connection& connection, const PastedChange& pasted, const QString& statement);
 

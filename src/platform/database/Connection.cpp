@@ -148,9 +148,13 @@ void Connection::setCommandTimeout(int seconds)
 
 qint64 Connection::execute(const QString& statement)
 {
-    if (const std::optional<PastedChange> pasted = observer_ && !inChange_ ? pastedChange(statement) : std::nullopt;
-        pasted && observerOf(pasted->table))
-        return executeObserved(*this, *pasted, statement);
+    if (observer_ && !inChange_) {
+        const std::optional<PastedChange> pasted = pastedChange(statement);
+        if (pasted && observerOf(pasted->table))
+            return executeObserved(*this, *pasted, statement);
+        if (!pasted && changesRows(statement) && observerOf({}))
+            throw RuntimeError(StatementFailed, u"What this statement changes can't be recorded: "_s + statement);
+    }
     return session().execute(statement);
 }
 
