@@ -5,6 +5,7 @@
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "platform/RuntimeError.h"
+#include "platform/database/ColumnValues.h"
 #include "platform/database/Sql.h"
 #include "platform/values.h"
 
@@ -127,8 +128,8 @@ QList<ColumnStory> columnsOf(const db::RowChange& row)
 {
     QList<ColumnStory> told;
     for (const db::RowChange::Column& column : row.columns) {
-        const QVariant& before = column.before;
-        const QVariant& after = column.after;
+        const QVariant before = db::normalised(column.before, column.kind);
+        const QVariant after = db::normalised(column.after, column.kind);
         if (before.isNull() == after.isNull() && before == after)
             continue;
         if (row.kind == db::ChangeKind::Insert)

@@ -26,6 +26,8 @@ QJsonValue jsonOf(const QVariant& value)
             return QJsonArray{u"n"_s, QString::number(value.toLongLong())};
         case QMetaType::Double:
             return QJsonArray{u"f"_s, QString::number(value.toDouble(), 'g', QLocale::FloatingPointShortest)};
+        case QMetaType::QByteArray:
+            return QJsonArray{u"b"_s, QString::fromLatin1(value.toByteArray().toBase64())};
         case QMetaType::QDateTime:
             return QJsonArray{u"d"_s, value.toDateTime().toString(Qt::ISODateWithMs)};
         default:
@@ -49,6 +51,8 @@ QVariant valueIn(const QJsonValue& json)
         return text.toDouble();
     if (letter == "d"_L1)
         return QDateTime::fromString(text, Qt::ISODateWithMs);
+    if (letter == "b"_L1)
+        return QByteArray::fromBase64(text.toLatin1());
     throw RuntimeError(TypeMismatch, u"The journal holds a value of an unknown type: "_s + letter);
 }
 

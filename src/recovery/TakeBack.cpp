@@ -4,6 +4,7 @@
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "platform/RuntimeError.h"
+#include "platform/database/ColumnValues.h"
 #include "platform/database/Sql.h"
 #include "platform/database/TakeBack.h"
 #include "platform/values.h"
@@ -42,7 +43,9 @@ QString identityOf(const db::RowChange& row, Moment moment)
     QStringList parts(row.table.toLower());
     for (const QString& name : row.key) {
         const db::RowChange::Column* column = row.column(name);
-        const QVariant value = !column ? QVariant() : moment == Moment::Before ? column->before : column->after;
+        const QVariant value =
+            !column ? QVariant()
+                    : db::normalised(moment == Moment::Before ? column->before : column->after, column->kind);
         parts.append(name.toLower() + u'=' + (value.isNull() ? u"NULL"_s : u'\'' + toText(value)));
     }
     return parts.join(u'\n');

@@ -136,7 +136,7 @@ TEST(JournalRecord, GivesEachValueBackBitForBit)
     for (const QVariant& value :
          {QVariant(), QVariant(u""_s), QVariant(u"O'Brien \\ \"x\" \r\n\t \u20ac \u0131 %1"_s),
           QVariant(qint64(9007199254740993)), QVariant(0.1 + 0.2), QVariant(-1e308), QVariant(true), QVariant(false),
-          QVariant(QDateTime(QDate(2026, 10, 25), QTime(2, 30, 0, 7)))}) {
+          QVariant(QByteArray("\0\xff", 2)), QVariant(QDateTime(QDate(2026, 10, 25), QTime(2, 30, 0, 7)))}) {
         const db::RowChange stored{
             db::ChangeKind::Update, u"T"_s, {u"k"_s}, {{u"k"_s, db::Kind::Text, value, QVariant()}}};
         const db::RowChange read = journal::changeIn(journal::textOf(stored));

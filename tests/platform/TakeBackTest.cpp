@@ -1,4 +1,5 @@
 // A recorded change is taken back whole, and only while the row holds what the change left there.
+#include "base/JournalRecord.h"
 #include "platform/Databases.h"
 #include "platform/database/TakeBack.h"
 
@@ -126,6 +127,43 @@ TEST_P(TakeBackOn, AComputedColumnIsLeftToTheDatabase)
         connection->execute(statement);
         EXPECT_TRUE(takenBack(seen->changes.front())) << statement;
         EXPECT_EQ(count(u"CODE='A' AND twice=2"_s), 1) << statement;
+    }
+}
+
+/// The columns of a table of the host, their types, and two values that look the same if they are rounded.
+static std::vector<std::array<QString, 5>> hostColumns(On engine)
+{
+    std::vector<std::array<QString, 5>> columns = casesIn<5>("host-columns.txt");
+    std::erase_if(columns, [&](const auto& row) {
+        return !row[0].split(u' ').contains(engine == On::Embedded ? u"embedded"_s : u"servers"_s);
+    });
+    return columns;
+}
+
+TEST_P(TakeBackOn, AValueOfTheHostComesBackBitForBitAndIsNotTakenForAnother)
+{
+    if (GetParam() == On::Tds)  // the simulated server has not these types
+        return;
+    for (const auto& [engines, type, value, other, bits] : hostColumns(GetParam())) {
+        const QString same = QString(bits).replace(u"%1"_s, u"host"_s) + u'=' + QString(bits).replace(u"%1"_s, value);
+        connection->setObserver(nullptr);
+        connection->execute(u"CREATE TABLE HOST (id INTEGER PRIMARY KEY, host %1)"_s.arg(type));
+        connection->execute(u"INSERT INTO HOST VALUES (1, %1)"_s.arg(value));
+        connection->setObserver(seen);
+        seen->changes.clear();
+        for (const QString& statement : {u"DELETE FROM HOST"_s, u"UPDATE HOST SET host=NULL"_s}) {
+            connection->execute(statement);
+            EXPECT_TRUE(takenBack(journal::changeIn(journal::textOf(seen->changes.takeFirst())))) << type << statement;
+            Recordset found = query(u"SELECT COUNT(*) AS n FROM HOST WHERE "_s + same);
+            EXPECT_EQ(toLong(found.value(u"n"_s)), 1) << type << statement;
+        }
+        connection->execute(u"UPDATE HOST SET host=NULL"_s);
+        connection->setObserver(nullptr);
+        db::RowChange written = seen->changes.takeFirst();
+        std::swap(written.columns[1].before, written.columns[1].after);
+        connection->execute(u"UPDATE HOST SET host=%1"_s.arg(other));
+        EXPECT_FALSE(takenBack(written)) << type;
+        connection->execute(u"DROP TABLE HOST"_s);
     }
 }
 

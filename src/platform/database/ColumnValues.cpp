@@ -137,4 +137,22 @@ QVariant normalised(const QVariant& value, Kind kind)
     return value;
 }
 
+QVariant exact(const QVariant& value, const TableColumn& column)
+{
+    if (value.isNull())
+        return {};
+    switch (value.typeId()) {
+        case QMetaType::Bool:
+        case QMetaType::Double:
+            return value;
+        case QMetaType::QByteArray:
+            return column.isText ? QVariant(textOf(value)) : value;
+        case QMetaType::QString:
+            return column.kind == Kind::Flag ? asFlag(value) : value;  // a bit may be a raw byte
+        default:
+            return kindOfValue(value) == Kind::WholeNumber ? QVariant(value.toLongLong())
+                                                           : normalised(value, column.kind);
+    }
+}
+
 }  // namespace kest::db

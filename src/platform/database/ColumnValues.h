@@ -2,6 +2,7 @@
 #pragma once
 
 #include "platform/database/Recordset.h"
+#include "platform/database/Schema.h"
 
 #include <QVariant>
 
@@ -13,6 +14,8 @@ Kind kindOfValue(const QVariant& value);
 /// Converts a value from a driver to the C++ type of its kind. If a text can't be converted, it stays a text, so that
 /// it can be read and shown; using it as a number or a date then fails.
 QVariant normalised(const QVariant& value, Kind kind);
+/// Returns a value that can be written back bit for bit: converts only what loses nothing.
+QVariant exact(const QVariant& value, const TableColumn& column);
 /// Returns true if the value already has that type, as most values do.
 bool isNormal(const QVariant& value, Kind kind);
 

@@ -46,6 +46,8 @@ QString Dialect::literal(const QVariant& value) const
             const QString fraction = date.time().msec() == 0 ? QString() : u".zzz"_s;
             return u'\'' + date.toString(u"yyyy-MM-dd"_s) + separator + date.toString(u"HH:mm:ss"_s + fraction) + u'\'';
         }
+        case QMetaType::QByteArray:
+            return u"X'"_s + QString::fromLatin1(value.toByteArray().toHex()) + u'\'';
         default: {
             QString text = value.toString();
             text.replace(u'\'', u"''"_s);
@@ -56,13 +58,16 @@ QString Dialect::literal(const QVariant& value) const
     }
 }
 
-QString Dialect::holds(const QString& column, Kind kind, const QVariant& value) const
+QString Dialect::holds(const QString& column, Kind kind, const QVariant& value, int scale) const
 {
+    constexpr int digitsOfMilliseconds = 3;
     const QString name = quoted(column);
     if (value.isNull())
         return name + u" IS NULL"_s;
     if (kind == Kind::Flag && value.typeId() == QMetaType::Bool)
         return name + (value.toBool() ? u"<>0"_s : u"=0"_s);
+    if (kind == Kind::Date && value.typeId() == QMetaType::QDateTime && scale > digitsOfMilliseconds)
+        return name + u">="_s + literal(value) + u" AND "_s + name + u'<' + literal(value.toDateTime().addMSecs(1));
     if (kind == Kind::Date && value.typeId() == QMetaType::QDateTime)
         return sameDate.arg(name, literal(value));
     if (kind == Kind::LongText)
@@ -98,6 +103,9 @@ const Dialect& mySqlDialect()
         .lockedEnd = u" FOR UPDATE"_s,
         .sessionNumber = u"SELECT CONNECTION_ID()"_s,
         .withoutTransactions = tablesWithoutTransactions,
+        .exactDate = u"CAST(%1 AS CHAR)"_s,
+        .exactDecimal = u"CAST(%1 AS CHAR)"_s,
+        .exactSingle = u"%1+0e0"_s,
     };
     return dialect;
 }

@@ -30,6 +30,11 @@ struct Dialect {
     QString lockedEnd = QString();                  // the end of such a SELECT
     QString sessionNumber = QString();              // asks for the server's number of the connection
     QString withoutTransactions = QString();        // asks for the tables whose changes can't be taken back
+    // how to ask for a column whose value a driver would round: finer than a millisecond, of more than 15 digits, or of
+    // single precision
+    QString exactDate = QStringLiteral("%1");
+    QString exactDecimal = QStringLiteral("%1");
+    QString exactSingle = QStringLiteral("%1");
     QString identityInsert = QString();  // with ON or OFF after it: lets an INSERT give the identity of its row
 
     /// Returns a literal with the prefix that its letters need. An index on a text column serves only one without.
@@ -39,7 +44,8 @@ struct Dialect {
     /// Returns a value as a literal, in which the value is escaped. Null is NULL. Throws Overflow for infinity and NaN.
     QString literal(const QVariant& value) const;
     /// Returns the condition that a column still has a value, or an empty text for a long text that can't be compared.
-    QString holds(const QString& column, Kind kind, const QVariant& value) const;
+    /// `scale` is that of the column: a moment was read without what is finer than a millisecond.
+    QString holds(const QString& column, Kind kind, const QVariant& value, int scale = 0) const;
 };
 
 const Dialect& embeddedDialect();

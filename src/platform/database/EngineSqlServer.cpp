@@ -146,7 +146,7 @@ private:
                 InformationSchemaTerms::readOnly +
                 u"' WHEN CHARACTER_MAXIMUM_LENGTH=-1 OR DATA_TYPE IN ('text', 'ntext') THEN 'longtext' "
                 "ELSE DATA_TYPE END"_s,
-            u"COLUMNPROPERTY(OBJECT_ID(TABLE_SCHEMA + '.' + TABLE_NAME), COLUMN_NAME, 'IsIdentity')"_s};
+            u"COLUMNPROPERTY(OBJECT_ID(TABLE_SCHEMA + '.' + TABLE_NAME), COLUMN_NAME, 'IsIdentity')"_s, u"real"_s};
         return terms;
     }
 

@@ -15,12 +15,23 @@ QString textOf(const QVariant& value)
     return normalised(value, Kind::Text).toString();
 }
 
-TableColumn columnOf(const QVariant* row)
+/// Returns the seconds to which a column of that type rounds a date.
+int stepOf(const QString& type)
+{
+    if (type.compare("smalldatetime"_L1, Qt::CaseInsensitive) == 0)
+        return secondsOfMinute;
+    return type.compare("date"_L1, Qt::CaseInsensitive) == 0 ? secondsOfDay : 1;
+}
+
+TableColumn columnOf(const QVariant* row, const InformationSchemaTerms& terms)
 {
     TableColumn column;
     const QString type = textOf(row[1]);
     column.name = textOf(row[0]);
     column.kind = kindOfType(type);
+    column.step = stepOf(type);
+    column.isSingle = type.compare(terms.single, Qt::CaseInsensitive) == 0;
+    column.isText = !type.contains("BLOB"_L1, Qt::CaseInsensitive) && !type.contains("BINARY"_L1, Qt::CaseInsensitive);
     column.readOnly = type == InformationSchemaTerms::readOnly;
     column.size = column.kind == Kind::Text && row[2].toLongLong() <= longestText ? row[2].toInt() : 0;
     column.hasDefault = !row[3].isNull() && textOf(row[3]) != u"NULL"_s;
@@ -56,7 +67,7 @@ std::unique_ptr<TableInfo> tableOf(Engine& engine, const InformationSchemaTerms&
                    terms.identity + u", NUMERIC_SCALE, DATETIME_PRECISION FROM INFORMATION_SCHEMA.COLUMNS WHERE "_s +
                    ofTable + u" ORDER BY ORDINAL_POSITION"_s);
     for (size_t i = 0; i < columns.values.size(); i += size_t(columns.names.size()))
-        info->columns.append(columnOf(&columns.values[i]));
+        info->columns.append(columnOf(&columns.values[i], terms));
     const Answer key = engine.run(
         u"SELECT COLUMN_NAME FROM INFORMATION_SCHEMA.KEY_COLUMN_USAGE WHERE "_s + ofTable +
         u" AND CONSTRAINT_NAME IN (SELECT CONSTRAINT_NAME FROM INFORMATION_SCHEMA.TABLE_CONSTRAINTS WHERE "_s +

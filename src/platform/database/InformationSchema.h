@@ -12,6 +12,7 @@ struct InformationSchemaTerms {
     QString ofDatabase;  // the condition for the database of the connection
     QString type;        // the declared type of a column, or `readOnly`
     QString identity;    // 1 if the column is an identity
+    QString single;      // the declared type of floating-point numbers of single precision
 
     static constexpr QLatin1StringView readOnly{"readonly"};  // see TableColumn
 };

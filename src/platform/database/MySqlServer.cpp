@@ -18,7 +18,7 @@ const InformationSchemaTerms& MySqlServer::informationSchema()
         u"TABLE_SCHEMA=DATABASE()"_s,
         u"CASE WHEN EXTRA LIKE '%GENERATED%' THEN '"_s + InformationSchemaTerms::readOnly +
             u"' WHEN COLUMN_TYPE='tinyint(1)' THEN 'boolean' ELSE DATA_TYPE END"_s,
-        u"CASE WHEN EXTRA LIKE '%auto_increment%' THEN 1 ELSE 0 END"_s};
+        u"CASE WHEN EXTRA LIKE '%auto_increment%' THEN 1 ELSE 0 END"_s, u"float"_s};
     return terms;
 }
 

@@ -1,7 +1,5 @@
 #include "platform/database/RecordsetWriter.h"
 
-#include <QDateTime>
-
 #include <algorithm>
 #include <cmath>
 
@@ -18,15 +16,10 @@ namespace {
                        "last read."_s);
 }
 
-/// Returns the condition that a column still has a value. A moment was read without what is finer than a millisecond.
+/// Returns the condition that a column still has a value.
 QString holds(const Dialect& dialect, const ResultColumn& column, const QVariant& value)
 {
-    constexpr int digitsOfMilliseconds = 3;
-    if (column.kind != Kind::Date || column.scale <= digitsOfMilliseconds || value.typeId() != QMetaType::QDateTime)
-        return dialect.holds(column.name, column.kind, value);
-    const QString name = dialect.quoted(column.name);
-    return name + u">="_s + dialect.literal(value) + u" AND "_s + name + u'<' +
-           dialect.literal(value.toDateTime().addMSecs(1));
+    return dialect.holds(column.name, column.kind, value, column.scale);
 }
 
 /// The same, but an empty text for a floating-point number, and for an exact number with more digits than a double

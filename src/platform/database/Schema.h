@@ -15,11 +15,17 @@ struct TableColumn {
     Kind kind = Kind::Text;
     int size = 0;    // characters of a text; 0 means no limit
     int scale = -1;  // digits after the point, of an exact number or a date's second; -1 for a floating-point number
+    int step = 1;    // seconds to which a date is rounded: a minute; a day cuts the time off
+    bool isSingle = false;  // a floating-point number of single precision
+    bool isText = false;    // bytes that a driver returns are text in UTF-8
     bool identity = false;
     bool readOnly = false;  // computed, a version of the row, or a type that no statement compares or writes
     bool hasDefault = false;
     QVariant fixedDefault = {};  // the default if it is a number or a text; null for any other expression
 };
+
+constexpr int secondsOfMinute = 60;
+constexpr int secondsOfDay = 86400;
 
 /// A table of the database.
 struct TableInfo {

@@ -74,6 +74,17 @@ void normalise(Rows& rows)
     }
 }
 
+/// Returns how to ask for a column so that its driver rounds nothing.
+QString exactly(const Dialect& dialect, const TableColumn& column)
+{
+    constexpr int digitsOfMilliseconds = 3;
+    if (column.kind == Kind::Date && column.scale > digitsOfMilliseconds)
+        return dialect.exactDate;
+    if (column.kind == Kind::Number && column.scale >= 0)
+        return dialect.exactDecimal;
+    return column.isSingle ? dialect.exactSingle : u"%1"_s;
+}
+
 }  // namespace
 
 void setStatementFault(std::function<bool()> fault, int number)
@@ -196,12 +207,16 @@ Rows Session::selectLocked(const TableInfo& info, const QString& condition)
     QStringList names;
     for (const TableColumn& column : info.columns) {
         columns.append({column.name, info.name, column.kind, column.size, column.scale});
-        names.append(dialect().quoted(column.name));
+        names.append(QString(exactly(dialect(), column)).replace(u"%1"_s, dialect().quoted(column.name)));
     }
-    return selectNative(u"SELECT "_s + names.join(u", "_s) + u" FROM "_s +
-                            QString(dialect().lockedTable).replace(u"%1"_s, dialect().quoted(info.name)) +
-                            u" WHERE "_s + condition + dialect().lockedEnd,
-                        columns);
+    const QString statement = u"SELECT "_s + names.join(u", "_s) + u" FROM "_s +
+                              QString(dialect().lockedTable).replace(u"%1"_s, dialect().quoted(info.name)) +
+                              u" WHERE "_s + condition + dialect().lockedEnd;
+    checkFault();
+    Rows rows{columns, {}, answered([&] { return engine_->run(statement); }).values};
+    for (size_t i = 0; i < rows.values.size(); ++i)
+        rows.values[i] = exact(rows.values[i], info.columns[qsizetype(i) % info.columns.size()]);
+    return rows;
 }
 
 void Session::begin()

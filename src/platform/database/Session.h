@@ -64,7 +64,7 @@ public:
     QVariant insert(const TableInfo& table, const QStringList& columns, const QStringList& literals);
     /// A condition on a table, from the dialect of SQL Server into the engine's own.
     QString translatedCondition(const QString& table, const QString& condition);
-    /// Whole rows that nobody else may change until the transaction ends.
+    /// Whole rows that nobody else may change until the transaction ends, with exact() values.
     Rows selectLocked(const TableInfo& table, const QString& condition);
 
     void begin();

@@ -1,12 +1,14 @@
 #include "platform/database/TakeBack.h"
 
 #include "platform/RuntimeError.h"
+#include "platform/database/ColumnValues.h"
 #include "platform/database/Dialect.h"
 #include "platform/database/Session.h"
 
 #include <QDateTime>
 #include <QScopeGuard>
 
+#include <algorithm>
 #include <cmath>
 
 namespace kest::db {
@@ -16,14 +18,15 @@ using namespace Qt::StringLiterals;
 namespace {
 
 /// The condition for the row that a change left, or took away.
-QString rowCondition(const Dialect& dialect, const RowChange& change)
+QString rowCondition(const Dialect& dialect, const TableInfo& table, const RowChange& change)
 {
     QStringList conditions;
     for (const RowChange::Column& column : change.columns) {
         if (!change.key.contains(column.name, Qt::CaseInsensitive))
             continue;
         const QVariant& value = change.kind == ChangeKind::Delete ? column.before : column.after;
-        const QString held = dialect.holds(column.name, column.kind, value);
+        const TableColumn* base = table.column(column.name);
+        const QString held = dialect.holds(column.name, column.kind, value, base ? base->scale : 0);
         if (!held.isEmpty())
             conditions.append(held);
     }
@@ -39,20 +42,32 @@ QString withoutBlanksAtEnd(QString text)
     return text;
 }
 
-/// Returns true if the database has stored one value as the other: it may round a number or a time, and pad a text.
-bool isStoredAs(const QVariant& now, const QVariant& written, const ResultColumn& column)
+bool isSameMoment(const QDateTime& now, const QDateTime& written, int step)
 {
-    if (now.isNull() || written.isNull())
+    constexpr qint64 cut = 1000;  // milliseconds, if the column has none
+    if (step == secondsOfDay)
+        return now.date() == written.date();
+    return std::abs(now.msecsTo(written)) < std::max<qint64>(cut, step * cut / 2 + 1);
+}
+
+/// Returns true if the database has stored one value as the other: it may round a number or a time, and pad a text.
+bool isStoredAs(const QVariant& stored, const QVariant& recorded, const TableColumn& column)
+{
+    constexpr double lastDigits = 1e-14;
+    const QVariant now = normalised(stored, column.kind);
+    const QVariant written = normalised(recorded, column.kind);
+    if (now.isNull() || written.isNull() || now.typeId() != written.typeId())
         return now.isNull() && written.isNull();
     switch (column.kind) {
         case Kind::Number:
-            if (column.scale >= 0)
-                return std::abs(now.toDouble() - written.toDouble()) <= 0.51 * std::pow(10, -column.scale);
-            return float(now.toDouble()) == float(written.toDouble());
+            if (column.isSingle)
+                return float(now.toDouble()) == float(written.toDouble());
+            return std::abs(now.toDouble() - written.toDouble()) <=
+                   (column.scale < 0 ? std::abs(written.toDouble()) * lastDigits : 0.51 * std::pow(10, -column.scale));
         case Kind::Date:
-            if (now.typeId() != QMetaType::QDateTime || written.typeId() != QMetaType::QDateTime)
+            if (now.typeId() != QMetaType::QDateTime)
                 return now == written;
-            return std::abs(now.toDateTime().msecsTo(written.toDateTime())) < 1000;
+            return isSameMoment(now.toDateTime(), written.toDateTime(), column.step);
         case Kind::Text:
             return withoutBlanksAtEnd(now.toString()) == withoutBlanksAtEnd(written.toString());
         default:
@@ -72,11 +87,11 @@ bool holds(const TableInfo& table, const RowChange& change, const Rows& rows)
         if (base.readOnly)
             continue;
         if (const RowChange::Column* column = change.column(base.name)) {
-            if (!isStoredAs(now, column->after, rows.columns[i]))
+            if (!isStoredAs(now, column->after, base))
                 return false;
         } else if (change.kind == ChangeKind::Insert) {
             const bool isKnown = !base.hasDefault || !base.fixedDefault.isNull();
-            if (isKnown && !isStoredAs(now, base.fixedDefault, rows.columns[i]))
+            if (isKnown && !isStoredAs(now, base.fixedDefault, base))
                 return false;  // a column to which the new row gave no value has got one since
         }
     }
@@ -88,7 +103,7 @@ QString tableOf(const Session& session, const RowChange& change)
     return session.dialect().quoted(change.table);
 }
 
-qint64 restoreValues(Session& session, const RowChange& change)
+qint64 restoreValues(Session& session, const TableInfo& table, const RowChange& change)
 {
     const Dialect& dialect = session.dialect();
     QStringList assignments;
@@ -98,7 +113,7 @@ qint64 restoreValues(Session& session, const RowChange& change)
     if (assignments.isEmpty())
         return 1;
     return session.executeNative(u"UPDATE "_s + tableOf(session, change) + u" SET "_s + assignments.join(u", "_s) +
-                                 u" WHERE "_s + rowCondition(dialect, change));
+                                 u" WHERE "_s + rowCondition(dialect, table, change));
 }
 
 qint64 restoreRow(Session& session, const TableInfo& table, const RowChange& change)
@@ -133,10 +148,10 @@ void restore(Session& session, const TableInfo& table, const RowChange& change)
     switch (change.kind) {
         case ChangeKind::Insert:
             hit = session.executeNative(u"DELETE FROM "_s + tableOf(session, change) + u" WHERE "_s +
-                                        rowCondition(session.dialect(), change));
+                                        rowCondition(session.dialect(), table, change));
             break;
         case ChangeKind::Update:
-            hit = restoreValues(session, change);
+            hit = restoreValues(session, table, change);
             break;
         case ChangeKind::Delete:
             hit = restoreRow(session, table, change);
@@ -152,7 +167,8 @@ bool stillHolds(Connection& connection, const RowChange& change)
 {
     Session& session = connection.session();
     const TableInfo* table = session.table(change.table);
-    return table && holds(*table, change, session.selectLocked(*table, rowCondition(session.dialect(), change)));
+    return table &&
+           holds(*table, change, session.selectLocked(*table, rowCondition(session.dialect(), *table, change)));
 }
 
 TakeBack::TakeBack(Connection& connection) : connection_(connection)
