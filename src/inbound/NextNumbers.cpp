@@ -161,6 +161,11 @@ qint64 NextLineNumber(qint64 number, const QString& qtnno, const QString& subquo
     return ++lastNumber.number;
 }
 
+void forgetLineNumbers()
+{
+    lastNumber = {};
+}
+
 QString NextItemNo(db::Recordset& rsLines)
 {
     QString chosen = u"999"_s;

@@ -25,6 +25,8 @@ std::unique_ptr<db::Lock> lockNewQuotes();
 /// Returns the SEQ_NO of a line: `number` if it is above 0, otherwise the next one of the quote. Continues from the
 /// last number that it returned for the same quote, because that line may not be stored yet.
 qint64 NextLineNumber(qint64 number, const QString& qtnno, const QString& subquote);
+/// Lets the next line number continue from the stored lines, after lines were taken back.
+void forgetLineNumbers();
 /// Returns an item code of the current line's category that no line has, or "999" if all are taken. Never throws.
 /// `rsLines` keeps its position.
 QString NextItemNo(db::Recordset& rsLines);

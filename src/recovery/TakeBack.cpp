@@ -3,6 +3,7 @@
 #include "base/History.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
+#include "inbound/NextNumbers.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/ColumnValues.h"
 #include "platform/database/Sql.h"
@@ -283,6 +284,7 @@ QStringList takeBack(qint64 operation, const std::function<void(const db::RowCha
 {
     constexpr qsizetype together = 100;  // rows in a transaction, because each commit waits for the disk
     const Plan plan = planOf(operation);
+    forgetLineNumbers();
     QStringList left = plan.left;
     for (qsizetype first = 0; first < plan.rows.size(); first += together) {
         db::TakeBack transaction(*gConn);

@@ -60,6 +60,15 @@ TEST_F(UndoOfALoad, IsAnOperationItself)
     EXPECT_TRUE(loadAsTheWindow(u"m.xml"_s)) << "and can be loaded again";
 }
 
+TEST_F(UndoOfALoad, LeavesNoGapInTheNumbersOfLines)
+{
+    for (int time = 1; time <= 2; ++time) {
+        const qint64 load = loaded(u"m.xml"_s, authorisedQuote("500").labour(0, "I"));
+        EXPECT_EQ(rowCount("QUOTE2", "QTNNO='500' AND Subquote=0 AND SEQ_NO=5"), 1) << time;
+        recovery::undo(load);
+    }
+}
+
 TEST_F(UndoOfALoad, IsRefusedWithTheReason)
 {
     const struct {
