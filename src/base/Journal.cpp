@@ -100,20 +100,26 @@ Operation::Operation(Entry& entry, int patience)
     entry = entryOf(entry.id);
     if (entry.state != stateBefore)
         return;
+    auto resumed = std::make_unique<Work>();
+    resumed->file = entry.file;
+    resumed->hash = entry.hash;
+    resumed->number = entry.number;
+    resumed->subquote = entry.subquote;
+    resumed->lockName = entry.lock;
+    resumed->lock = std::move(lock);
+    resumed->id = entry.id;
+    resumed->isCommitted = true;
+    resumed->state = entry.state == wordOf(State::Open) ? State::Open : State::Unfinished;
+    resumed->facts = entry.facts;
+    resumed->own();
+    work = std::move(resumed);
     isOutermost = isResumed = true;
-    work = std::make_unique<Work>();
-    work->file = entry.file;
-    work->hash = entry.hash;
-    work->number = entry.number;
-    work->subquote = entry.subquote;
-    work->lockName = entry.lock;
-    work->lock = std::move(lock);
-    work->generation = gConn->generation();
-    work->serverSession = gConn->serverSession();
-    work->id = entry.id;
-    work->isCommitted = true;
-    work->state = entry.state == wordOf(State::Open) ? State::Open : State::Unfinished;
-    work->facts = entry.facts;
+}
+
+void Operation::beforeFirstChange(std::function<void()> check)
+{
+    if (isOutermost)
+        work->check = std::move(check);
 }
 
 Operation::~Operation()

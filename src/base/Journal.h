@@ -89,6 +89,8 @@ public:
     Operation(const Operation&) = delete;
     Operation& operator=(const Operation&) = delete;
 
+    /// Sets what is called before the operation's first change. If it throws, nothing is changed.
+    void beforeFirstChange(std::function<void()> check);
     /// Returns false if the interrupted work has an owner who is at work on it, or was settled meanwhile.
     bool isOwner() const { return isOutermost; }
     /// Stores what became of it. If the connection is lost it stays open.

@@ -79,9 +79,31 @@ bool Work::isStillOpen()
     const QJsonObject known = QJsonDocument::fromJson(stored.text(u"Facts"_s).toUtf8()).object();
     for (auto fact = known.begin(); fact != known.end(); ++fact)  // not all, because storing the last may have failed
         facts[fact.key()] = fact.value();
-    if (!serverSession.isEmpty())
-        gConn->execute(sql("UPDATE KESTOperation SET ServerSession='{}' WHERE Operation={}", serverSession, id));
+    storeOwner();
     return true;
+}
+
+void Work::leaveSign()
+{
+    if (!serverSession.isEmpty() && attempt([this] { sign = std::make_unique<files::Lock>(signFile(), lockName); }))
+        facts[u"place"_s] = place();
+    else
+        facts.remove(u"place"_s);
+}
+
+void Work::storeOwner()
+{
+    if (!serverSession.isEmpty())
+        gConn->execute(sql("UPDATE KESTOperation SET ServerSession='{}', Facts='{}' WHERE Operation={}", serverSession,
+                           asciiJson(facts), id));
+}
+
+void Work::own()
+{
+    generation = gConn->generation();
+    serverSession = gConn->serverSession();
+    leaveSign();
+    storeOwner();
 }
 
 void Work::requireOwner()
@@ -97,12 +119,13 @@ void Work::requireOwner()
 
 void Work::prepare()
 {
+    if (check)
+        check();
     lockName = u"operation "_s + QUuid::createUuid().toString(QUuid::WithoutBraces);
     if (!takeLock(0))
         throw RuntimeError(PermissionDenied, u"The database does not give the lock of this work."_s);
     generation = gConn->generation();
-    if (!serverSession.isEmpty() && attempt([this] { sign = std::make_unique<files::Lock>(signFile(), lockName); }))
-        facts[u"place"_s] = place();
+    leaveSign();
     row = opened(u"SELECT * FROM KESTOperation WHERE Operation=0"_s);
 }
 

@@ -9,6 +9,7 @@
 #include <QJsonObject>
 #include <QString>
 
+#include <functional>
 #include <memory>
 #include <optional>
 
@@ -34,6 +35,7 @@ struct Work {
     State state = State::Open;
     bool isPointAhead = false;  // the next change is the last
     bool isPointPassed = false;
+    std::function<void()> check;  // before the first change
     QJsonObject facts;
 
     /// A lost connection has lost the lock, too, so that another workstation may have settled the work. Throws
@@ -49,8 +51,13 @@ struct Work {
     void storeFacts();
     void markPoint();
     void storeEnd(State end);
+    /// Leaves a sign of life and, on a server, stores whose session has the lock, so that nobody takes it for the one
+    /// that died.
+    void own();
 
 private:
+    void leaveSign();
+    void storeOwner();
     bool takeLock(int seconds);
     void takeLockAgain();
     bool isStillOpen();

@@ -260,8 +260,9 @@ void frmMessageList::cmdProcess_Click()
         load(selectedFile());
 }
 
-/// Loads a message and moves it, or only moves it if it was loaded before. Nobody else may load it meanwhile.
-bool frmMessageList::loadOnce(const QString& file)
+/// Loads a message and moves it, or only moves it if it was loaded before. `alone` keeps others from loading it
+/// meanwhile; it is taken again if a box was open until the connection was lost.
+bool frmMessageList::loadOnce(const QString& file, std::optional<db::Lock>& alone)
 {
     QString text = files::read(gsCurFolder + file);
     const QString hash = journal::hashOf(text);
@@ -275,6 +276,14 @@ bool frmMessageList::loadOnce(const QString& file)
             break;
     }
     journal::Operation operation(journal::Kind::Load, file, hash);
+    operation.beforeFirstChange([&, generation = gConn->generation()] {
+        if (gConn->generation() == generation)
+            return;
+        alone.emplace(gConn, recovery::loadLock(file));
+        if (!alone->isHeld() || isMoved(file))
+            throw RuntimeError(RowChanged,
+                               u"Message %1 is being loaded, or was loaded, on another workstation."_s.arg(file));
+    });
     if (!LoadXML(text, file))
         return false;
     text.clear();  // otherwise a large text would be in memory twice
@@ -292,11 +301,11 @@ bool frmMessageList::load(const QString& file)
     const KeptMessage kept;
     try {
         EnsureConnection();
-        const db::Lock alone(gConn, recovery::loadLock(file));
-        if (!alone.isHeld())
+        std::optional<db::Lock> alone(std::in_place, gConn, recovery::loadLock(file));
+        if (!alone->isHeld())
             desktop::msgBox(u"Message %1 is being loaded on another workstation."_s.arg(file),
                             desktop::Icon::Information);
-        if (!alone.isHeld() || !loadOnce(file)) {
+        if (!alone->isHeld() || !loadOnce(file, alone)) {
             RefreshList();
             tmrRefresh->start();
             return false;

@@ -3,7 +3,10 @@
 
 #include "messagelist/MessageListControls.h"
 #include "messagelist/Summary.h"
+#include "platform/database/Connection.h"
 #include "platform/desktop/Form.h"
+
+#include <optional>
 
 namespace kest {
 
@@ -71,7 +74,7 @@ private:
     void tell(const QString& text);
     void tellStatus();
     bool load(const QString& file);
-    bool loadOnce(const QString& file);
+    bool loadOnce(const QString& file, std::optional<db::Lock>& alone);
     void takeIn(const QList<QUrl>& brought);
     bool hasSelection() const;
     QString selectedFile() const;

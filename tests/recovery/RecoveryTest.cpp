@@ -187,22 +187,68 @@ TEST_F(Interrupted, AMoveThatBeganEndsUnderItsName)
     EXPECT_EQ(filesIn(gsUnreadPath), QStringList());
 }
 
+namespace {
+
+/// Someone who answers a box late.
+struct Absent final : desktop::Answerer {
+    explicit Absent(std::function<void()> inBetween) : meanwhile(std::move(inBetween)) {}
+    desktop::Answer box(const desktop::Box&) override
+    {
+        meanwhile();
+        return desktop::Answer::Ok;
+    }
+    QString input(const desktop::Input&) override { return {}; }
+    void start(const QString&) override {}
+    std::function<void()> meanwhile;
+};
+
+}  // namespace
+
 TEST_F(Interrupted, ABoxMayStayOpenUntilTheConnectionIsLost)
 {
-    struct Absent final : desktop::Answerer {
-        desktop::Answer box(const desktop::Box&) override
-        {
-            dropConnection();
-            return desktop::Answer::Ok;
-        }
-        QString input(const desktop::Input&) override { return {}; }
-        void start(const QString&) override {}
-    };
     sendable("600");
     files::write(gsImagesPath + u"600_0001.jpg"_s, u"picture"_s);
-    desktop::setAnswerer(std::make_shared<Absent>());
+    desktop::setAnswerer(std::make_shared<Absent>(dropConnection));
     EXPECT_EQ(failureOf([] { send("600"); }), 0);
     EXPECT_EQ(newest().text("State"), "done");
+}
+
+TEST_F(Interrupted, AMessageThatAnotherLoadsWhileABoxIsOpenIsLeftAlone)
+{
+    arrive("m.xml", excessWaiver("500"));
+    frmMessageList window;
+    window.openUnread();
+    std::unique_ptr<db::Lock> theirs;
+    desktop::setAnswerer(std::make_shared<Absent>([&] {
+        if (theirs)
+            return;
+        dropConnection();
+        theirs = std::make_unique<db::Lock>(anotherConnection(), recovery::loadLock(u"m.xml"_s), 5);
+    }));
+    EXPECT_FALSE(window.loadFile(u"m.xml"_s));
+    EXPECT_EQ(quote("500").number("excess"), 500);
+    theirs.reset();
+    desktop.emplace();
+    EXPECT_TRUE(window.loadFile(u"m.xml"_s));
+}
+
+TEST_F(Interrupted, ARowThatTheHostChangesBeforeTheSettlingStays)
+{
+    arrive("m.xml", authorisedQuote("500").set("excess", "400").labour(1, "C").part(2, "D"));
+    db::setStatementFault([] { return quote("500").lines() == 2; }, CannotOpen);
+    attempt([] { loadAsTheWindow(u"m.xml"_s); });
+    db::setStatementFault({});
+    EXPECT_EQ(
+        anotherConnection()->execute(u"UPDATE QUOTE2 SET rrhour=77 WHERE QTNNO='500' AND SEQ_NO=1 AND Subquote=0"_s),
+        1);
+    EXPECT_TRUE(EnsureConnection());  // settles it
+    const QList<recovery::Settled> settled = recovery::takeSettled();
+    ASSERT_EQ(settled.size(), 1);
+    EXPECT_TRUE(settled[0].sentence().contains(u"check the quote 500. The row of QUOTE2 with itemid "_s));
+    EXPECT_EQ(newest().text("State"), "interrupted");
+    EXPECT_EQ(quote("500").line(1).number("rrhour"), 77);
+    EXPECT_TRUE(quote("500").line(2).shows("category=PRT rrhour=80"));
+    EXPECT_EQ(quote("500").number("excess"), 500);
 }
 
 TEST_F(Interrupted, PicturesThatCouldNotBeSentAreSentLater)

@@ -64,6 +64,12 @@ TEST_F(RecoveryOnAServer, EndsTheSessionOfItsOwnDeadProcess)
     recovery::settle();
     EXPECT_FALSE(dead->answers());
     EXPECT_EQ(quote("500").text("Claim"), "C0");
+
+    administrator->execute(u"UPDATE KESTOperation SET State='open'"_s);
+    journal::Entry entry = journal::pendingOperations().front();
+    const journal::Operation resumed(entry, 5);
+    EXPECT_EQ(journal::pendingOperations().front().serverSession, gConn->serverSession())
+        << "another session may get the number of the dead one";
 }
 
 TEST_F(RecoveryOnAServer, TablesWithoutTransactionsKeepNoJournal)
