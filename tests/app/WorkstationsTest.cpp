@@ -1,7 +1,11 @@
 // Tests two workstations with the same database and message folders. The second one is the command `kest2`.
 #include "messagelist/frmMessageList.h"
 #include "outbound/SendQuote.h"
+#include "support/Hands.h"
 #include "support/Shop.h"
+
+#include <QLineEdit>
+#include <QPushButton>
 
 struct Workstations : Shop {
     /// Creates a second profile that uses the database and drive C: of the first.
@@ -31,6 +35,15 @@ struct Workstations : Shop {
             codes.push_back(command->exitCode());
         }
         return codes;
+    }
+
+    /// Loses the connection and lets the other workstation fill its list, which settles what this one has begun.
+    void beAway() const
+    {
+        dropConnection();
+        for (int i = 0; i < 50 && rowCount("KESTOperation", "State='open'") > 0; ++i)
+            EXPECT_EQ(
+                QProcess::execute(QStringLiteral(KEST_COMMAND), {u"--profile"_s, second_, u"list"_s, u"unread"_s}), 0);
     }
 
 private:
@@ -118,4 +131,48 @@ TEST_F(Workstations, ALoadGoesOverANewConnectionWhereTheOldOneHasGone)
     window.openUnread();
     dropConnection();
     EXPECT_TRUE(window.loadFile(u"m.xml"_s)) << shown();
+}
+
+TEST_F(Workstations, AnOpenReportLeavesItsLoadToTheOtherThatHasSettledIt)
+{
+    putTemplate(710);
+    arrive("m.xml", quoteRequest("QR1"));
+    const Hands hands({{u"frmPrintPreview"_s, [this](QDialog&) { beAway(); }}});
+    frmMessageList window;
+    window.openUnread();
+    window.loadFile(u"m.xml"_s);
+    EXPECT_EQ(Row("KESTOperation", "1=1").text("State"), "finished");
+    EXPECT_EQ(filesIn(gsReadPath), QStringList(u"1001.xml"_s));
+    EXPECT_EQ(filesIn(gsUnreadPath), QStringList());
+    EXPECT_EQ(rowCount("QUOTE1") + rowCount("KESTOperation"), 2) << "loaded once";
+}
+
+TEST_F(Workstations, AnOpenDialogSendsNothingOnceTheOtherHasSettledTheSend)
+{
+    quote("500").set("ExtraInfo", 1).line(1).set("rrhour", 2).set("rr_rate2", 50.255);  // rounded first
+    const auto fill = [](QDialog& window) {
+        for (const auto& [field, text] : {std::pair("txtVIN", u"V1"_s),
+                                          {"txtCylinders", u"6"_s},
+                                          {"txtColour", u"Red"_s},
+                                          {"txtBuildMonth", u"12"_s},
+                                          {"txtBuildYear", u"2024"_s},
+                                          {"txtDamageDesc", u"dent"_s}})
+            control<QLineEdit>(window, field).setText(text);
+        control<QPushButton>(window, "Command1").click();
+    };
+    const auto sendAs = [&](const Hands::Work& user) {
+        const Hands hands({{u"frmExtraInfo"_s, user}});
+        EXPECT_TRUE(openHostQuote(u"500"_s, u"0"_s));
+        return failureOf([] { SendQuote(*grsQuote); });
+    };
+    EXPECT_EQ(sendAs([&](QDialog& window) {
+                  beAway();
+                  fill(window);
+              }),
+              RowChanged);
+    EXPECT_FALSE(quote("500").locked());
+    EXPECT_EQ(Row("KESTOperation", "1=1").text("State"), "failed");
+    EXPECT_EQ(filesIn(gsUnsentPath), QStringList());
+    EXPECT_EQ(sendAs(fill), 0);
+    EXPECT_TRUE(quote("500").locked());
 }

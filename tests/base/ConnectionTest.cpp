@@ -1,4 +1,5 @@
 // Tests which database the settings name, and what happens if it does not answer.
+#include "base/Journal.h"
 #include "base/modLoggerEx.h"
 #include "support/OdbcDrivers.h"
 #include "support/Shop.h"
@@ -78,6 +79,23 @@ TEST_F(ShopConnection, WhyItFailedIsTold)
     gcnDB->close();
     EXPECT_FALSE(EnsureConnection()) << "not to the database of the defaults";
     EXPECT_TRUE(connectionFailure().contains(u"damaged"_s));
+}
+
+TEST_F(ShopConnection, ADatabaseThatDoesNotSayWhetherItHasAJournalIsNotUsed)
+{
+    const auto statement = [](const QString& text) {
+        db::Connection administrator;
+        administrator.open(connectionText(driverNumber()));
+        administrator.execute(text);
+    };
+    statement(u"ALTER TABLE KESTJournal RENAME TO kept"_s);
+    statement(u"CREATE VIEW KESTJournal AS SELECT * FROM gone"_s);
+    OpenDatabase();
+    EXPECT_FALSE(gcnDB->answers()) << "work without the journal could not be taken back";
+    EXPECT_TRUE(files::read(errorLogPath()).contains(u"no such table: main.gone"_s));
+    statement(u"DROP VIEW KESTJournal"_s);
+    statement(u"ALTER TABLE kept RENAME TO KESTJournal"_s);
+    EXPECT_TRUE(EnsureConnection() && journal::isKept());
 }
 
 TEST_F(ShopConnection, ASilentServerCostsFiveSecondsForAllStepsTogether)

@@ -36,6 +36,14 @@ TEST_F(JournalOfAShop, RecordsNothingForALoadThatChangesNothing)
     EXPECT_FALSE(loadAsTheWindow(u"m.xml"_s));
     EXPECT_EQ(listed().size(), 1);
     EXPECT_EQ(records(), 0);
+
+    quote("500").note("Sending KEST Quote");
+    arrive("R_500_0.xml", submissionResponse("KQ7"));
+    listed();
+    const int first = records();
+    EXPECT_GT(first, 0);
+    listed();
+    EXPECT_EQ(records(), first) << "the response lies there at every fill";
 }
 
 TEST_F(JournalOfAShop, KeepsTheChangesOfALoadThatFailed)
