@@ -107,6 +107,7 @@ void announceDocument(const QuoteRows& rows, const QString& name, const QString&
                               {u"hash"_s, journal::hashOf(files::fromCodePage(files::toCodePage(content)))},
                               {u"status"_s, quoteStatus(rows.notes)},
                               {u"stage"_s, text(rows.quote, "Job_stage")},
+                              {u"number"_s, text(rows.quote, "KESTQuoteNo")},
                               {u"images"_s, QJsonArray::fromStringList(images)}});
 }
 
@@ -197,8 +198,10 @@ void markLate(const QuoteKey& key, Quote& quote, const QJsonObject& document)
 {
     const QString stage = text(quote.header(), "Job_stage");
     const QString status = quoteStatus(quote.notes());
-    const bool isReceived = status == submitted && status != document[u"status"_s].toString();
-    const bool isUntouched = status == document[u"status"_s].toString();
+    // a quote that is sent again after a revision was received before
+    const bool isUntouched = status == document[u"status"_s].toString() &&
+                             text(quote.header(), "KESTQuoteNo") == document[u"number"_s].toString();
+    const bool isReceived = status == submitted && !isUntouched;
     if (!(isReceived || isUntouched) || (stage != document[u"stage"_s].toString() && stage != sentStage))
         return;
     Transition sent = quoteSent;

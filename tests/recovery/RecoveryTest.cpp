@@ -24,6 +24,13 @@ TEST_F(Interrupted, ASendIsNotFinishedOverItsAnswer)
         recovery::settle();
         EXPECT_EQ(quote("600").state(), expected);
     }
+    // sent again after a revision, so that only the number tells the answer from the one before
+    quote("600").stage(1).remarks("").note("Submitted KEST Quote").quoteNumber("KQ7");
+    send("600");
+    gConn->execute(u"UPDATE KESTOperation SET State='open', PastPoint=0 WHERE State='done'"_s);
+    quote("600").locked(false).stage(1).remarks("").note("Submitted KEST Quote").quoteNumber("KQ8");
+    recovery::settle();
+    EXPECT_EQ(quote("600").state(), "3 locked KQ8 (01/02/2008 : Submitted KEST Quote)");
 }
 
 TEST_F(Interrupted, TheUserIsToldWhatBecameOfIt)
