@@ -1,6 +1,6 @@
 -- The journal on the embedded engine: what each operation changed in the quote database.
 
--- one row for each load, send, save or response that changed something
+-- one row for each load, undo, send, save or response that changed something
 CREATE TABLE KESTOperation (
     Operation     INTEGER PRIMARY KEY AUTOINCREMENT,
     OperationKind VARCHAR(10) COLLATE NOCASE NOT NULL,

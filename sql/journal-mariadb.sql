@@ -1,6 +1,6 @@
 -- The journal on MariaDB and MySQL: what each operation changed in the quote database. Its tables need InnoDB.
 
--- one row for each load, send, save or response that changed something
+-- one row for each load, undo, send, save or response that changed something
 CREATE TABLE KESTOperation (
     Operation     INTEGER NOT NULL AUTO_INCREMENT PRIMARY KEY,
     OperationKind VARCHAR(10) NOT NULL,

@@ -1,6 +1,6 @@
 -- The journal on SQL Server: what each operation changed in the quote database.
 
--- one row for each load, send, save or response that changed something
+-- one row for each load, undo, send, save or response that changed something
 CREATE TABLE KESTOperation (
     Operation     INT IDENTITY(1,1) NOT NULL PRIMARY KEY,
     OperationKind NVARCHAR(10) NOT NULL,
