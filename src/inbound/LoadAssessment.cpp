@@ -1,5 +1,6 @@
 // Loads the answers to a sent quote: submission responses, adjustments, assessment results and their back-outs.
 #include "base/Helpers.h"
+#include "base/History.h"
 #include "base/Journal.h"
 #include "base/modDBAccess.h"
 #include "inbound/Loading.h"
@@ -14,6 +15,7 @@
 #include "quotedata/StateTable.h"
 #include "reports/PrintXML.h"
 
+#include <algorithm>
 #include <optional>
 #include <utility>
 
@@ -117,6 +119,15 @@ bool LoadBACA(QString& text, const QString& fileName)
     return true;
 }
 
+/// Returns true if another workstation applies the response, or was interrupted and is not settled yet.
+static bool isResponsePending(const QString& file)
+{
+    return std::ranges::any_of(journal::pendingOperations(), [&](const journal::Entry& entry) {
+        return entry.kind == journal::wordOf(journal::Kind::Response) &&
+               entry.file.compare(file, Qt::CaseInsensitive) == 0;
+    });
+}
+
 void LoadSubmissionResponse(QString& text, const QString& fileName)
 {
     const auto fail = [&](int number, const QString& what) {
@@ -140,9 +151,20 @@ void LoadSubmissionResponse(QString& text, const QString& fileName)
     if (root.textOf(u"rootns:quoteSubmissionStatus"_s) == u"Submitted"_s)
         applyTransition(quoteSubmitted, quote);
     journal::Operation operation(journal::Kind::Response, fileName, journal::hashOf(text));
-    quote.header().update();
-    journal::passPoint([&] { quote.notes().update(); });
-    operation.end(journal::State::Done);
+    bool isPending = false;
+    operation.beforeFirstChange([&] {
+        isPending = isResponsePending(fileName);
+        if (isPending)
+            throw RuntimeError(RowChanged, u"The response %1 is applied once its last try is settled."_s.arg(fileName));
+    });
+    try {
+        quote.header().update();
+        journal::passPoint([&] { quote.notes().update(); });
+        operation.end(journal::State::Done);
+    } catch (const RuntimeError&) {
+        if (!isPending)  // otherwise a later fill applies it
+            throw;
+    }
 }
 
 }  // namespace kest

@@ -33,6 +33,20 @@ TEST_F(Interrupted, ASendIsNotFinishedOverItsAnswer)
     EXPECT_EQ(quote("600").state(), "3 locked KQ8 (01/02/2008 : Submitted KEST Quote)");
 }
 
+TEST_F(Interrupted, AResponseWaitsUntilItsLastTryIsSettled)
+{
+    arrive("R_500_0.xml", submissionResponse("KQ7"));
+    for (const char* state : {"open", "taken back"}) {
+        gConn->execute(
+            sql("INSERT INTO KESTOperation (OperationKind, State, FileName) VALUES ('response', '{}', "
+                "'R_500_0.XML')",
+                QString::fromLatin1(state)));
+        listed();
+        EXPECT_EQ(quote("500").text("KESTQuoteNo"), QLatin1StringView(state) == "open"_L1 ? "KQ1" : "KQ7") << state;
+        gConn->execute(u"DELETE FROM KESTOperation WHERE State='open'"_s);
+    }
+}
+
 TEST_F(Interrupted, TheUserIsToldWhatBecameOfIt)
 {
     const QDateTime started(QDate(2026, 11, 23), QTime(10, 31));
