@@ -28,7 +28,7 @@ ProfileWindow::ProfileWindow() : Form(u"frmProfile"_s, u"New Shop"_s), txtFolder
     question->setBuddy(txtFolder);
     txtFolder->setObjectName(u"txtFolder"_s);
     txtFolder->setText(QDir::toNativeSeparators(profile::root()));
-    txtFolder->setMinimumWidth(desktop::pixels(6000));
+    txtFolder->setMinimumWidth(desktop::pixels(7500));
     auto* nameQuestion = new QLabel(u"&Name of the shop, the author of its saved reports:"_s);
     nameQuestion->setBuddy(txtName);
     txtName->setObjectName(u"txtName"_s);

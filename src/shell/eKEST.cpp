@@ -16,6 +16,8 @@
 #include "recovery/Recovery.h"
 #include "shell/frmKEST.h"
 
+#include <QRegularExpression>
+
 namespace kest {
 
 using namespace Qt::StringLiterals;
@@ -42,7 +44,8 @@ QString aboutText()
 {
     if (gsServer.isEmpty())  // nothing has opened the database yet
         readConnectionSettings();
-    const QString lastError = lastLogRecord();
+    static const QRegularExpression indent(u"\\n\\s+"_s);
+    const QString lastError = lastLogRecord().replace(indent, u"\n"_s);
     return u"KEST2 " KEST_VERSION "\nProfile: "_s + profile::root() + u"\nDatabase: "_s + databaseDescription() +
            u"\nError log: "_s + errorLogPath() + u"\nLast error: "_s + (lastError.isEmpty() ? u"none"_s : lastError);
 }

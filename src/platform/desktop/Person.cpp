@@ -22,6 +22,8 @@ namespace kest::desktop {
 
 namespace {
 
+constexpr int inputWidth = 4200;  // twips, so that the title of an input box is visible, too
+
 QMessageBox::Icon pictureOf(Icon icon)
 {
     switch (icon) {
@@ -134,6 +136,8 @@ QString PersonAnswerer::input(const Input& input)
     window.setLabelText(input.prompt);
     for (QLabel* label : window.findChildren<QLabel*>())
         label->setTextFormat(Qt::PlainText);
+    for (QLineEdit* field : window.findChildren<QLineEdit*>())
+        field->setMinimumWidth(pixels(inputWidth));
     makeCopyable(window, input.prompt);
     return shown(window) == QDialog::Accepted ? window.textValue() : QString();
 }
