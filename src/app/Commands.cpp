@@ -9,6 +9,7 @@
 #include "base/CredentialCipher.h"
 #include "base/ModRegistry.h"
 #include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 #include "jobexport/JobLinkSettings.h"
 #include "platform/RuntimeError.h"
 #include "platform/desktop/Form.h"
@@ -288,6 +289,18 @@ bool hasProfile()
     return QFileInfo::exists(profile::root() + u"/registry.ini"_s);
 }
 
+/// Returns true if there is a shop. A host that has started before there was one has only written its settings.
+bool hasShop()
+{
+    bool isMissing = !hasProfile();
+    if (!isMissing)
+        attempt([&] {  // damaged settings are told later
+            settings::check();
+            isMissing = usesEmbeddedDatabase() && !isWholeProfile();
+        });
+    return !isMissing;
+}
+
 /// Returns why there is no usable profile, or an empty text if there is one.
 QString profileFault()
 {
@@ -319,9 +332,9 @@ Outcome runChecked(const CommandLine& line)
     const Command& command = found->second;
     if (line.arguments.size() < command.fewest || line.arguments.size() > command.most)
         return refused(u"wrong number of arguments for "_s + line.command, Usage);
-    if (command.needs != Needs::Nothing && isInteractive(line) && !hasProfile()) {
+    if (command.needs != Needs::Nothing && isInteractive(line) && !hasShop()) {
         ProfileWindow::ShowForm();  // the program may have been started from the menu
-        if (!hasProfile())
+        if (!hasShop())
             return refused(u"no profile was created"_s, NoConnection);
     }
     if (const QString why = command.needs == Needs::Nothing ? QString() : profileFault(); !why.isEmpty()) {

@@ -173,10 +173,17 @@ QString connectionText(int driverNumber)
     }
 }
 
+bool usesEmbeddedDatabase()
+{
+    readConnectionSettings();
+    return !db::embeddedName(connectionText(driverNumber(CopyUp::No))).isEmpty();
+}
+
 QString databaseDescription()
 {
     const QString embedded = db::embeddedName(connectionText(driverNumber(CopyUp::No)));
-    return embedded.isEmpty() ? gsDatabase + u" on "_s + gsServer + u' ' + gsInstance : embedded + u" (embedded)"_s;
+    const QString server = (gsServer + u' ' + gsInstance).trimmed();
+    return embedded.isEmpty() ? gsDatabase + u" on "_s + server : embedded + u" (embedded)"_s;
 }
 
 std::optional<db::Recordset> OpenRecordset(const QString& select, bool disconnect, bool reconnect)

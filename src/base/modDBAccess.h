@@ -37,6 +37,8 @@ void readConnectionSettings();
 QString connectionText(int driverNumber);
 /// Returns which database the settings choose and how it is reached, without its password.
 QString databaseDescription();
+/// Returns true if the settings choose the embedded database.
+bool usesEmbeddedDatabase();
 /// Returns the number of the driver that the settings choose.
 int driverNumber(CopyUp copyUp = CopyUp::Yes);
 /// Opens a query on a new recordset. If there is no connection, shows a critical box and returns nothing.

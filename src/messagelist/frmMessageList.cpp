@@ -430,12 +430,10 @@ void frmMessageList::takeIn(const QList<QUrl>& brought)
         taken = takeInFiles(brought, [&](qint64 done, qint64 total) { progress.step(done, total); });
     }
     Form_KeyRefresh();
-    const qsizetype waiting = taken.toList.size() - std::ranges::count_if(rows(), [&](const ListedMessage& message) {
-                                  return taken.toList.contains(message.file);
-                              });
+    const qsizetype waiting = std::ranges::count_if(
+        heldBack, [&](const HeldMessage& message) { return taken.toList.contains(message.file); });
     const QString held = u" %1 not listed yet: held back by missing pictures or an earlier message."_s;
-    tell(taken.summary() + (waiting > 0 && fillFailure.isEmpty() ? held.arg(waiting) : QString()) + u' ' +
-         lblStatus->text());
+    tell(taken.summary() + (waiting > 0 ? held.arg(waiting) : QString()) + u' ' + lblStatus->text());
     if (!taken.refused.isEmpty())
         desktop::msgBox(taken.refusals(), desktop::Icon::Exclamation);
 }

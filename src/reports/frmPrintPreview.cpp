@@ -144,9 +144,14 @@ void frmPrintPreview::crvPreview_PrintButtonClicked()
 {
     QPrinter printer(QPrinter::HighResolution);
     report::setPaper(printer);
-    if (report::askForPrinter(printer, this, crvPreview->pageCount()))
+    if (!report::askForPrinter(printer, this, crvPreview->pageCount()))
+        return;
+    try {
         report::paint(crvPreview->report(), printer,
                       [&](int pageCount) { return report::pagesToPrint(printer, pageCount); });
+    } catch (const RuntimeError& error) {
+        desktop::msgBox(u"The report can't be printed: %1"_s.arg(error.description()), desktop::Icon::Critical);
+    }
 }
 
 void frmPrintPreview::resizeEvent(QResizeEvent* event)

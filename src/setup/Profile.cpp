@@ -87,13 +87,6 @@ QString freeName(const QString& path)
     return name;
 }
 
-/// Returns true if initProfile() has finished before. A host that starts without a profile also writes settings, but
-/// only initProfile() writes the version of the system.
-bool isWhole()
-{
-    return !RegGetValue(Hive::LocalMachine, systemKey, u"CurrentVersion"_s).isEmpty();
-}
-
 void makeFolders()
 {
     const QString messages = hostSetting(u"EcomHome"_s);
@@ -146,10 +139,15 @@ void installTemplates()
 
 }  // namespace
 
+bool isWholeProfile()
+{
+    return !RegGetValue(Hive::LocalMachine, systemKey, u"CurrentVersion"_s).isEmpty();
+}
+
 bool initProfile(const std::function<bool()>& registerClass, Shop shop, const QDate& today)
 {
     settings::check();
-    if (isWhole()) {
+    if (isWholeProfile()) {
         repairDatabases();
         return false;
     }
@@ -159,7 +157,7 @@ bool initProfile(const std::function<bool()>& registerClass, Shop shop, const QD
     const files::Lock making(profile::root() + u'/' + lockName, {}, longestInit);
     if (!making.isHeld())
         throw RuntimeError(PermissionDenied, u"Another \"kest2 init\" is still creating "_s + profile::root());
-    if (isWhole())
+    if (isWholeProfile())
         return false;
     makeFolders();
     files::makeFolder(profile::root() + u"/databases"_s);
@@ -198,9 +196,13 @@ void placeProfile(const QString& folder)
     if (chosen == place)
         return;
     files::makeFolder(chosen);
-    if (isUnfinished(place))
+    const QString settings = u"/registry.ini"_s;
+    const bool hasHostSettings = QFile::exists(place + settings) && !isWholeProfile();
+    if (hasHostSettings)
+        QFile::rename(place + settings, chosen + settings);  // which fails if the folder has its own
+    QDir().rmdir(place);                                     // which fails if anything is in it
+    if (isUnfinished(place) || (hasHostSettings && QFileInfo::exists(place)))
         QDir().rename(place, freeName(place + u".unfinished"_s));
-    QDir().rmdir(place);  // which fails if anything is in it
     files::makeFolder(QFileInfo(place).path());
     if (!QFile::link(chosen, place))
         throw RuntimeError(PermissionDenied, u"%1 can't become a link to it"_s.arg(place));

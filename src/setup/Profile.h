@@ -11,6 +11,10 @@ namespace kest::app {
 /// What a new profile contains. The demo shop has quotes, messages and photographs.
 enum class Shop { New, Demo };
 
+/// Returns true if initProfile() has finished before. A host that starts without a profile also writes settings, but
+/// only initProfile() writes the version of the system. Throws RuntimeError if the settings can't be read.
+bool isWholeProfile();
+
 /// Creates the profile: folders, quote database, settings and the class registration. `registerClass` registers the
 /// class and returns false if it fails.
 ///
