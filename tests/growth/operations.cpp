@@ -120,13 +120,6 @@ const std::map<std::string, std::function<void(Bench&, int)>> operations{
          addRows("CAR", "REGO, CUST_ID, MODEL_ID", "'XBC' || i, 100 + i, 'C120'", quotes);
          measureLoad(manualQuote("Q5").rego("ABC123").labour(1, "C").text());
      }},
-    {"load-manual-new",
-     [](Bench&, int quotes) {
-         car("ABC123");
-         addRows("QUOTE1", "QTNNO, Subquote, REGO", "1000 + i, 0, 'R' || i", quotes);
-         measureLoad(manualQuote("MANQ").request("QRNEW").rego("ABC123").labour(1, "C").text());
-         expect(quote(std::to_string(1001 + quotes).c_str()).locked());
-     }},
     {"notes",
      [](Bench&, int notes) {
          QString chain;
