@@ -307,6 +307,26 @@ class ValuesTarget final : public Target {
     }
 };
 
+/// Returns true if the viewer shows a node by what it is, and its save escapes nothing that is in it.
+bool isKeptByViewer(const xml::Node& node)
+{
+    static const QRegularExpression markup(u"[<\r]|]]>|&(#|\\w+;)"_s, QRegularExpression::UseUnicodePropertiesOption);
+    if (node.nodeType() == xml::NodeType::Text || node.nodeType() == xml::NodeType::CDataSection) {
+        const bool isCData = node.nodeType() == xml::NodeType::CDataSection;
+        return isCData ? !node.text().contains(u'&') : !node.text().contains(markup);
+    }
+    if (node.nodeType() != xml::NodeType::Element)
+        return false;
+    for (const xml::Attribute& attribute : node.attributes())
+        if (attribute.value.contains(markup) || attribute.value.contains(QRegularExpression(u"[\"\t\n]"_s)))
+            return false;
+    const QList<xml::Node> children = node.childNodes();
+    const auto isElement = [](const xml::Node& child) { return child.nodeType() == xml::NodeType::Element; };
+    return std::all_of(children.begin(), children.end(), isKeptByViewer) &&
+           (std::all_of(children.begin(), children.end(), isElement) ||
+            std::none_of(children.begin(), children.end(), isElement));
+}
+
 class ViewerTarget final : public ShopTarget {
     void take(const QByteArray& input) override
     {
@@ -318,7 +338,11 @@ class ViewerTarget final : public ShopTarget {
         edit.setExactText(text);
         require(edit.exactText() == text, "the viewer holds the exact text");
         files::write(gsUnreadPath + message, withMarkupCharacters(withoutRequestWrapper(text)));
-        FormatXML(gsUnreadPath + message);
+        const QString again = FormatXML(gsUnreadPath + message);
+        xml::Document document;
+        const bool isKept = document.loadXML(files::fromCodePage(input)) && isKeptByViewer(document.documentElement());
+        const bool isWritten = files::fromCodePage(files::toCodePage(text)) == text && !text.startsWith(u"<request>"_s);
+        require(!isKept || !isWritten || again == text, "a message is shown as it was saved");
         files::remove(gsUnreadPath + message);
     }
 };
