@@ -14,7 +14,8 @@
 
 namespace kest::test {
 
-/// Runs a function for each window that is shown, chosen by the window's name, and then closes the window.
+/// Runs a function for each window that is shown, chosen by the window's name, and then closes the window. The name "*"
+/// stands for all others.
 class Hands {
 public:
     using Work = std::function<void(QDialog&)>;
@@ -26,7 +27,8 @@ public:
                 window.show();
                 window.activateWindow();
                 QCoreApplication::processEvents();
-                works.at(window.objectName())(window);
+                const auto found = works.find(window.objectName());
+                (found == works.end() ? works.at(QStringLiteral("*")) : found->second)(window);
                 if (window.isVisible())
                     window.close();
                 return true;

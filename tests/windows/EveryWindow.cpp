@@ -108,12 +108,14 @@ void EveryWindow::each(const Check& check)
         SCOPED_TRACE(name);
         desktop.emplace();
         int seen = 0;
-        const Hands hands({{QString::fromLatin1(name), [&](QDialog& window) {
-                                ++seen;
-                                checkOfWindow(window);
-                            }}});
+        const Hands hands({{QString::fromLatin1(name),
+                            [&](QDialog& window) {
+                                if (++seen == 1)
+                                    checkOfWindow(window);
+                            }},
+                           {u"*"_s, [](QDialog&) {}}});  // one that a button has opened
         show();
-        EXPECT_EQ(seen, 1);
+        EXPECT_GE(seen, 1);
     }
     showBox([] { desktop::ask(u"Are you SURE ?"_s, desktop::Icon::Critical); }, check);
     showBox([] { desktop::inputBox(u"Enter a Quote Number"_s, u"View KEST Messages"_s); }, check);

@@ -283,6 +283,28 @@ TEST_F(EveryWindow, NamesEveryControlForAScreenReader)
 
 // --- Connection ---
 
+TEST_F(EveryWindow, HasNoButtonThatFailsAfterTheServerHasDroppedTheConnection)
+{
+    const Snapshot before;
+    bool isThere = true;
+    for (int number = 0; isThere; ++number) {
+        isThere = false;
+        each([&](QDialog& window) {
+            QList<QAbstractButton*> buttons = visible<QAbstractButton>(window);
+            buttons.removeIf([](const QWidget* button) { return !button->isEnabled(); });
+            if (number >= buttons.size())
+                return;
+            isThere = true;
+            const std::string name = nameOf(*buttons[number]);
+            dropConnection();
+            buttons[number]->click();
+            EXPECT_EQ(shown().find("Line No"), std::string::npos) << name << shown();
+            EnsureConnection();  // for the next window
+        });
+        before.restore();
+    }
+}
+
 TEST_F(EveryWindow, GoesOnAfterTheServerHasDroppedTheConnection)
 {
     quote("500").request("QR1");
