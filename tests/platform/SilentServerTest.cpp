@@ -1,4 +1,4 @@
-// Tests the connection to a MariaDB server that stops to answer on it, as after a firewall has forgotten it.
+// Tests the connection to a MariaDB server that stops answering on it, as after a firewall has forgotten it.
 #include "platform/database/Connection.h"
 #include "support/MariaDbServer.h"
 #include "support/Test.h"
@@ -8,64 +8,40 @@
 
 #include <atomic>
 
-namespace {
-
-/// Passes what a client and the server say to each other, for the connections that it still remembers.
-class Firewall final : public QThread {
-public:
-    Firewall()
-    {
-        start();
-        opened.acquire();
-    }
-    ~Firewall() override
-    {
-        quit();
-        wait();
-    }
-    Q_DISABLE_COPY_MOVE(Firewall)
-
-    std::atomic<int> port = 0, made = 0, forgotten = 0;
-    std::atomic<bool> onlyGreets = false;  // what clients say does not reach the server
-
-private:
-    void run() override
-    {
-        QTcpServer front;
-        front.listen(QHostAddress::LocalHost);
-        port = front.serverPort();
-        QObject::connect(&front, &QTcpServer::newConnection, &front, [&] {
-            const int number = ++made;
-            QTcpSocket* client = front.nextPendingConnection();
-            auto* server = new QTcpSocket(client);
-            server->connectToHost(QHostAddress::LocalHost, quint16(mariaDb().port()));
-            for (const auto& [from, to] : {std::pair(client, server), {server, client}})
-                QObject::connect(from, &QTcpSocket::readyRead, to, [=, this, from = from, to = to] {
-                    const QByteArray said = from->readAll();
-                    if (number > forgotten && !(onlyGreets && from != server))
-                        to->write(said);
-                });
-        });
-        opened.release();
-        exec();
-    }
-
-    QSemaphore opened;
-};
-
-}  // namespace
-
 TEST(SilentServer, AConnectionThatAFirewallHasForgottenIsToldWithinSeconds)
 {
     mariaDb().createDatabase(u"shop"_s);
-    Firewall firewall;
+    std::atomic<int> made = 0;
+    std::atomic<int> forgotten = 0;        // how many of these connections
+    std::atomic<bool> onlyGreets = false;  // what clients say does not reach the server
+    QThread thread;
+    auto* firewall = new QTcpServer;
+    ASSERT_TRUE(firewall->listen(QHostAddress::LocalHost));
+    const QString text = mariaDb().connectionText(u"shop"_s).replace(QString::number(mariaDb().port()),
+                                                                     QString::number(firewall->serverPort()));
+    QObject::connect(firewall, &QTcpServer::newConnection, firewall, [&, firewall] {
+        QTcpSocket* client = firewall->nextPendingConnection();
+        auto* server = new QTcpSocket(client);
+        server->connectToHost(QHostAddress::LocalHost, quint16(mariaDb().port()));
+        const auto pass = [&, number = ++made](QTcpSocket* from, QTcpSocket* to, bool isClient) {
+            QObject::connect(from, &QTcpSocket::readyRead, to, [&, number, from, to, isClient] {
+                const QByteArray said = from->readAll();
+                if (number > forgotten && !(onlyGreets && isClient))
+                    to->write(said);
+            });
+        };
+        pass(client, server, true);
+        pass(server, client, false);
+    });
+    QObject::connect(&thread, &QThread::finished, firewall, &QObject::deleteLater);
+    firewall->moveToThread(&thread);
+    thread.start();
+
     db::Connection connection;
-    const QString text =
-        mariaDb().connectionText(u"shop"_s).replace(QString::number(mariaDb().port()), QString::number(firewall.port));
     connection.setCommandTimeout(30);
     connection.open(text);
     EXPECT_TRUE(connection.answers());
-    firewall.forgotten = int(firewall.made);
+    forgotten = int(made);
     QElapsedTimer time;
     time.start();
     EXPECT_FALSE(connection.answers());
@@ -73,8 +49,10 @@ TEST(SilentServer, AConnectionThatAFirewallHasForgottenIsToldWithinSeconds)
     EXPECT_TRUE(connection.answers()) << "the server itself answers";
     EXPECT_LT(time.elapsed(), 8000);
 
-    firewall.onlyGreets = true;
+    onlyGreets = true;
     time.start();
     EXPECT_EQ(failureOf([&] { connection.open(text); }), CannotOpen);
     EXPECT_LT(time.elapsed(), 5000);
+    thread.quit();
+    thread.wait();
 }
