@@ -33,6 +33,14 @@ QString homeFolder()
 
 int objects = 0;  // all objects share the connection and the folders; the last one closes them
 
+/// Not at the start, which would take longer with every message and picture in the folders.
+void removeLeftOvers()
+{
+    for (const QString& folder : {gsUnreadPath, gsReadPath, gsUnsentPath, gsSentPath, homeFolder() + u"PDF\\"_s,
+                                  gsImagesPath, profile::root(), profile::componentFolder()})
+        files::removeLeftOvers(folder);
+}
+
 void reportUntrapped(const RuntimeError& error, const QString& source)
 {
     LogError(error, source, source.mid(source.indexOf(u'.') + 1));
@@ -62,9 +70,6 @@ eKEST::eKEST()
     gsUnsentPath = homeFolder() + u"AUnsent\\"_s;
     gsSentPath = homeFolder() + u"ASent\\"_s;
     gsImagesPath = GetRegSetting(u"wirra32"_s, u"frmsplash"_s, u"ImagesPath"_s, u"c:\\wirimg\\"_s);
-    for (const QString& folder : {gsUnreadPath, gsReadPath, gsUnsentPath, gsSentPath, homeFolder() + u"PDF\\"_s,
-                                  gsImagesPath, profile::root(), profile::componentFolder()})
-        files::removeLeftOvers(folder);
     files::resumeRemovals();
     setAfterOpening([] { recovery::settle(); });
 }
@@ -73,6 +78,7 @@ eKEST::~eKEST()
 {
     if (--objects > 0)
         return;
+    attempt(removeLeftOvers);
     grsQuote.reset();
     gConn.reset();
     gcnDB.reset();

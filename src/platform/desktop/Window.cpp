@@ -6,6 +6,8 @@
 #include <QApplication>
 #include <QFontMetricsF>
 #include <QIcon>
+#include <QImageReader>
+#include <QPixmap>
 #include <QPointer>
 #include <QScreen>
 #include <QWindow>
@@ -140,7 +142,9 @@ int twips(int pixels)
 
 void giveIcon(QWidget& window)
 {
-    window.setWindowIcon(QIcon(QStringLiteral(":/kest2.png")));
+    QImageReader picture(QStringLiteral(":/kest2.png"), "png");
+    picture.setAutoDetectImageFormat(false);  // this would load the libraries of all other formats
+    window.setWindowIcon(QPixmap::fromImage(picture.read()));
 }
 
 void centre(QWidget& window)
