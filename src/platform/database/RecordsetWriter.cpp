@@ -239,7 +239,8 @@ RowChange Recordset::Data::Writer::rowChange(const TableInfo& table, ChangeKind 
     return change;
 }
 
-/// Reads what the database has set in the new row: its identity, and the defaults of the columns without a value.
+/// Stores what the database has set in the new row: its identity, and the defaults of the columns without a value. Asks
+/// the database only for defaults that the schema does not tell.
 void Recordset::Data::Writer::readBack(const TableInfo& table, const QVariant& identity)
 {
     QList<int> wanted;
@@ -251,6 +252,8 @@ void Recordset::Data::Writer::readBack(const TableInfo& table, const QVariant& i
             continue;
         if (base.identity) {
             data.store(data.row(), column, identity);
+        } else if (!base.fixedDefault.isNull()) {
+            data.store(data.row(), column, base.fixedDefault);
         } else {
             wanted.append(column);
             described.append(data.columns.at(column));
