@@ -247,7 +247,7 @@ qint64 takeDocument(const db::Recordset& quote, const MessageLine& line, qint64 
     QJsonArray written = journal::kept(u"documents"_s).toArray();
     written.append(QJsonArray{path, QString::fromLatin1(hash.result().toHex())});
     journal::keep(u"documents"_s, written);
-    files::writeBase64(path, base64);
+    files::writeBase64(path, base64, files::Target::Free);
     gbSubletDocumentArrived = true;
     return number;
 }

@@ -55,9 +55,9 @@ void decodeBase64(QByteArrayView text, const std::function<void(const QByteArray
         take(QByteArray::fromBase64(letters));
 }
 
-void writeBase64(const QString& path, QByteArrayView text)
+void writeBase64(const QString& path, QByteArrayView text, Target target)
 {
-    replaceFile(systemPath(path), spelledPath(path),
+    replaceFile(placeOf(path, target), spelledPath(path),
                 [&](SystemFile& file) { decodeBase64(text, [&](const QByteArray& bytes) { file.write(bytes); }); });
 }
 

@@ -1,6 +1,8 @@
 // Decodes documents piece by piece, because a document can have many megabytes.
 #pragma once
 
+#include "platform/files/files.h"
+
 #include <QByteArray>
 #include <QByteArrayView>
 #include <QString>
@@ -14,6 +16,6 @@ namespace kest::files {
 void decodeBase64(QByteArrayView text, const std::function<void(const QByteArray&)>& take);
 /// Writes the bytes that a base64 text means into a file. Throws as decodeBase64(), and then leaves the file as
 /// it was.
-void writeBase64(const QString& path, QByteArrayView text);
+void writeBase64(const QString& path, QByteArrayView text, Target target = Target::Unknown);
 
 }  // namespace kest::files

@@ -141,6 +141,11 @@ QString spelledPath(const QString& path)
     return found(route.start, route.names) + u'/' + name;
 }
 
+QString placeOf(const QString& path, Target target)
+{
+    return target == Target::Free ? spelledPath(path) : systemPath(path);
+}
+
 bool isPlainName(const QString& name)
 {
     if (name.isEmpty() || name == "."_L1 || name.contains(".."_L1))

@@ -1,6 +1,8 @@
 // The system calls for files.h: open files, errors as RuntimeError, and atomic writes.
 #pragma once
 
+#include "platform/files/files.h"
+
 #include <QByteArray>
 #include <QString>
 
@@ -81,6 +83,9 @@ bool isTemporaryName(const QString& name);
 
 /// Returns the path on this system with the last name in the spelling of the caller, even if it exists in another case.
 QString spelledPath(const QString& path);
+
+/// Returns the path on this system of a file that will be written.
+QString placeOf(const QString& path, Target target);
 
 /// Throws if a test has requested that this operation fails.
 void failOnRequest(const QString& path);

@@ -19,11 +19,6 @@ namespace {
 constexpr unsigned ownerAlone = 0600;
 constexpr qint64 largestFile = 512LL * 1024 * 1024;  // bytes; larger files are not read
 
-QString placeOf(const QString& path, Target target)
-{
-    return target == Target::Free ? spelledPath(path) : systemPath(path);
-}
-
 }  // namespace
 
 bool exists(const QString& path)
