@@ -247,7 +247,7 @@ bool isReplaced(db::Recordset& markers, const QVariant& itemId)
     if (markers.recordCount() == 0)
         return false;
     markers.moveFirst();
-    markers.find(sql("DELETEDITEM={}", itemId));
+    markers.find(u"DELETEDITEM"_s, itemId);
     return !markers.eof();
 }
 

@@ -256,7 +256,7 @@ void QuoteBody::addSublets(const Branch* sublets)
     const auto subletType = [&](const QString& partNumber) {
         if (types.recordCount() > 0)
             types.moveFirst();
-        types.find(sql("Type='{}'", partNumber));
+        types.find(u"Type"_s, partNumber);
         return types.eof() ? u"OTH"_s : types.text(u"Type"_s);
     };
     sublet.requery();  // in a supplementary quote they have got their numbers with the labour lines
