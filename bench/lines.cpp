@@ -1,4 +1,5 @@
 // Measures loads of authorised and manual quotes with many lines against the plain statements of the same load.
+#include "InTurn.h"
 #include "PlainStatements.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
@@ -10,7 +11,6 @@
 #include "setup/QuoteDatabase.h"
 
 #include <QCoreApplication>
-#include <QElapsedTimer>
 #include <QTemporaryDir>
 
 #include <benchmark/benchmark.h>
@@ -195,28 +195,18 @@ void statementsOfManual(int64_t lines, int round)
 void compare(benchmark::State& state, QString (*message)(int64_t, int), void (*statements)(int64_t, int))
 {
     const BenchShop shop(state.range(0));
-    qint64 floor = 0;  // nanoseconds
-    qint64 loading = 0;
+    InTurn times(state);
     int round = 0;
     for (auto _ : state) {
         ++round;
-        QElapsedTimer timer;
-        timer.start();
-        statements(state.range(0), round);
-        floor += timer.nsecsElapsed();
+        times.floor([&] { statements(state.range(0), round); });
         QString text = message(state.range(0), round);
         files::write(gsUnreadPath + u"m.xml"_s, text);
-        timer.restart();
-        const bool taken = LoadXML(text, u"m.xml"_s);
-        const qint64 elapsed = timer.nsecsElapsed();
-        loading += elapsed;
-        state.SetIterationTime(static_cast<double>(elapsed) / 1e9);
+        bool taken = false;
+        times.operation([&] { taken = LoadXML(text, u"m.xml"_s); });
         if (!taken)
             state.SkipWithError("the message was not loaded");
     }
-    const auto loaded = static_cast<double>(state.iterations() * state.range(0));
-    state.counters["microseconds_a_line"] = static_cast<double>(loading) / 1e3 / loaded;
-    state.counters["ratio_to_floor"] = static_cast<double>(loading) / static_cast<double>(floor);
 }
 
 void loadAuthorisedQuote(benchmark::State& state)
@@ -230,9 +220,9 @@ void loadManualQuote(benchmark::State& state)
 }
 
 BENCHMARK(loadAuthorisedQuote)->Arg(10)->Arg(100)->Iterations(20)->UseManualTime()->Unit(benchmark::kMillisecond);
-BENCHMARK(loadAuthorisedQuote)->Arg(1000)->Arg(5000)->Iterations(2)->UseManualTime()->Unit(benchmark::kMillisecond);
+BENCHMARK(loadAuthorisedQuote)->Arg(1000)->Iterations(5)->UseManualTime()->Unit(benchmark::kMillisecond);
 BENCHMARK(loadManualQuote)->Arg(10)->Arg(100)->Iterations(20)->UseManualTime()->Unit(benchmark::kMillisecond);
-BENCHMARK(loadManualQuote)->Arg(1000)->Arg(5000)->Iterations(2)->UseManualTime()->Unit(benchmark::kMillisecond);
+BENCHMARK(loadManualQuote)->Arg(1000)->Iterations(5)->UseManualTime()->Unit(benchmark::kMillisecond);
 
 }  // namespace
 }  // namespace kest

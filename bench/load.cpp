@@ -1,5 +1,6 @@
 // Measures the load of a message against the plain statements that it needs, on the same database. Also measures the
 // note chain.
+#include "InTurn.h"
 #include "PlainStatements.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
@@ -11,7 +12,6 @@
 #include "setup/QuoteDatabase.h"
 
 #include <QCoreApplication>
-#include <QElapsedTimer>
 #include <QTemporaryDir>
 
 #include <benchmark/benchmark.h>
@@ -105,24 +105,16 @@ QStringList statementsOfRequest(int number)
 template <class Load, class Statements>
 void compare(benchmark::State& state, Load load, Statements statements)
 {
-    qint64 floor = 0;  // nanoseconds
-    qint64 loading = 0;
+    InTurn times(state);
     int number = 0;
     for (auto _ : state) {
         ++number;
-        QElapsedTimer timer;
-        timer.start();
-        statements(number);
-        floor += timer.nsecsElapsed();
-        timer.restart();
-        const bool taken = load(number);
-        const qint64 elapsed = timer.nsecsElapsed();
-        loading += elapsed;
-        state.SetIterationTime(static_cast<double>(elapsed) / 1e9);
+        times.floor([&] { statements(number); });
+        bool taken = false;
+        times.operation([&] { taken = load(number); });
         if (!taken)
             state.SkipWithError("the message was not loaded");
     }
-    state.counters["ratio_to_floor"] = static_cast<double>(loading) / static_cast<double>(floor);
 }
 
 constexpr int requests = 500;

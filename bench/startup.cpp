@@ -1,4 +1,4 @@
-// Measures the time from process start to the visible panel against a program that shows one empty window.
+// Measures the time from process start to the visible panel against a program that shows one line of text.
 #include "platform/profile.h"
 #include "setup/Profile.h"
 #include "shell/component.h"
