@@ -1,11 +1,13 @@
 // Does one operation of the shop once, in a shop of a chosen size, for `count`, which counts its instructions,
 // statements and calls for files: operations NAME SIZE.
+#include "base/Journal.h"
 #include "messages/Envelope.h"
 #include "messages/Folders.h"
 #include "outbound/SendQuote.h"
 #include "platform/print/Pages.h"
 #include "platform/print/Report.h"
 #include "reports/BuildAuthReport.h"
+#include "sublets/SubletDocuments.h"
 #include "support/OdbcDrivers.h"
 #include "support/Places.h"
 #include "support/Shop.h"
@@ -53,7 +55,7 @@ void addQuotes(int quotes)
 
 void addLines(int lines)
 {
-    quote("500").quoteNumber("KQ1");
+    quote("500").request("QR1").quoteNumber("KQ1").remarks("(01/02/2026 : Active Quote Request)");
     addRows("QUOTE2", "QTNNO, Subquote, SEQ_NO, category, script, rrhour, rr_rate2, qty, PartNo, itemno, MARK",
             "'500', 0, i, CASE i % 3 WHEN 0 THEN 'R&R' WHEN 1 THEN 'RA' ELSE 'MIS' END, 'Front guard', 1, 38.5, 1, '', "
             "'137', ''",
@@ -73,9 +75,14 @@ void measureFill(qsizetype rows)
     measured([&] { expect(listed().size() == rows); });
 }
 
+/// Loads a message as the window does: what it changes is recorded.
 void measureLoad(const QString& text)
 {
-    measured([&] { expect(load(text)); });
+    measured([&] {
+        journal::Operation operation(journal::Kind::Load);
+        expect(load(text));
+        operation.end(journal::State::Done);
+    });
 }
 
 QString authorisation(int lines)
@@ -113,6 +120,25 @@ const std::map<std::string, std::function<void(Bench&, int)>> operations{
          addQuotes(quotes);
          measureLoad(quoteRequest("QRNEW").text());
      }},
+    {"load-pictures",
+     [](Bench& shop, int pictures) {
+         for (int i = 0; i < pictures; ++i)
+             files::write(gsImagesPath + u"%1_0001.jpg"_s.arg(i), {});
+         for (const char* file : {"QRNEW_001.jpg", "QRNEW_002.jpg", "QRNEW_003.jpg"})
+             shop.arrive(file, "picture");
+         measureLoad(quoteRequest("QRNEW").images({"1", "2", "3"}).text());
+         expect(files::exists(gsImagesPath + u"1001_0003.jpg"_s));
+     }},
+    {"load-documents",
+     [](Bench&, int documents) {
+         quote("500").quoteNumber("KQ1");
+         for (int i = 0; i < documents; ++i)
+             files::write(subletFolder() + u"%1.0_1.pdf"_s.arg(1000 + i), {});
+         Message message = manualQuote("500").rego("ABC123");
+         for (const int line : {11, 12, 13})
+             message.sublet(line, "I", {{"subletAuthorityDocument", "SGVsbG8="}});
+         measureLoad(message.text());
+     }},
     {"load-manual",
      [](Bench&, int quotes) {
          addQuotes(quotes);
@@ -136,7 +162,6 @@ const std::map<std::string, std::function<void(Bench&, int)>> operations{
     {"print",
      [](Bench&, int lines) {
          addLines(lines);
-         quote("500").request("QR1");
          QString text = authorisation(lines);
          QString number;
          QString subquote;
