@@ -128,7 +128,7 @@ QString NextQuoteNumber(const QString& given, const db::Recordset& cinfo, db::Re
         QStringList next;
         for (int i = 0; i < count; ++i)
             next += counted(QString::number(toLong(cinfo.value(u"QUOTE_VAL"_s)) + ++counter));
-        number = firstFree(next, searched);
+        number = count == 1 ? next.constFirst() : firstFree(next, searched);
     }
     return number;
 }

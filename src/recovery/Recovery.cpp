@@ -235,8 +235,11 @@ EarlierLoad settleLoadOf(const QString& file, const QString& hash)
 {
     if (!journal::isKept())
         return EarlierLoad::None;
+    const QList<journal::Entry> pending = journal::pendingOperations();
+    if (pending.isEmpty())
+        return EarlierLoad::None;
     bool isComplete = false;
-    for (const journal::Entry& entry : journal::pendingOperations())
+    for (const journal::Entry& entry : pending)
         isComplete =
             isComplete || (isLoadOf(entry, file) && entry.hash == hash && (entry.pastPoint || isUnfinished(entry)));
     settle(file);
