@@ -19,6 +19,8 @@
 #include "quotedata/Quote.h"
 #include "quotedata/StateTable.h"
 
+#include <QJsonArray>
+#include <QJsonObject>
 #include <QSet>
 
 #include <algorithm>

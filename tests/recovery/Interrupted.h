@@ -6,6 +6,8 @@
 #include "outbound/Sending.h"
 #include "recovery/Recovery.h"
 
+#include <QScopedValueRollback>
+
 namespace kest::test {
 
 struct Interrupted : Sending {
