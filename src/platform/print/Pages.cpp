@@ -68,19 +68,33 @@ void checkSpans(QStringView tag)
         throw RuntimeError(TypeMismatch, u"A cell of the report spans too many columns or rows"_s);
 }
 
+/// Throws TypeMismatch if the borders or spaces of a table have more than three digits. The layout of wide ones does
+/// not end.
+void checkSpaces(QStringView tag)
+{
+    static const QRegularExpression tooWide(
+        u"\\b(?:border|cellpadding|cellspacing)\\s*+=\\s*+[\"']?+(?!\\d{1,3}(?:px)?(?:[\"'\\s/]|$))"_s,
+        QRegularExpression::CaseInsensitiveOption);
+    if (tooWide.match(tag).hasMatch())
+        throw RuntimeError(TypeMismatch, u"A table of the report has borders or spaces of a wrong size"_s);
+}
+
 /// Throws TypeMismatch if tables contain each other too deeply, which doubles the time of the layout for each level, or
-/// if a cell spans too much.
+/// if a cell spans too much or a table has too much space.
 void checkTables(const QString& html)
 {
     int depth = 0;
     for (qsizetype at = html.indexOf(u'<'); at >= 0; at = html.indexOf(u'<', at + 1)) {
         const QStringView tag = QStringView(html).sliced(at + 1);
-        if (tag.startsWith("table"_L1, Qt::CaseInsensitive))
+        const auto inside = [tag] { return tag.first(tag.contains(u'>') ? tag.indexOf(u'>') : tag.size()); };
+        if (tag.startsWith("table"_L1, Qt::CaseInsensitive)) {
             ++depth;
-        else if (tag.startsWith("/table"_L1, Qt::CaseInsensitive))
+            checkSpaces(inside());
+        } else if (tag.startsWith("/table"_L1, Qt::CaseInsensitive)) {
             depth = std::max(0, depth - 1);
-        else if (tag.startsWith("td"_L1, Qt::CaseInsensitive) || tag.startsWith("th"_L1, Qt::CaseInsensitive))
-            checkSpans(tag.first(tag.contains(u'>') ? tag.indexOf(u'>') : tag.size()));
+        } else if (tag.startsWith("td"_L1, Qt::CaseInsensitive) || tag.startsWith("th"_L1, Qt::CaseInsensitive)) {
+            checkSpans(inside());
+        }
         if (depth > deepestTable)
             throw RuntimeError(TypeMismatch, u"The tables of the report contain each other too deeply"_s);
     }
