@@ -5,6 +5,8 @@
 #include "base/modLoggerEx.h"
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
+#include "platform/database/Engine.h"
+#include "platform/database/Session.h"
 #include "platform/settings/registry.h"
 #include "platform/values.h"
 
@@ -32,6 +34,7 @@ constexpr qint64 pauseMilliseconds = 5000;  // before a silent server is tried a
 constexpr auto mysqlServer = "mysql:"_L1;
 
 std::optional<RuntimeError> lastFailure;  // from the last attempt to open the connection
+QString versions;                         // of driver and server, as the last connection that was opened knows them
 std::function<void()> afterOpening;
 QDeadlineTimer silence;  // until then, a silent server is not tried again
 
@@ -136,6 +139,9 @@ void OpenDatabase()
             gcnDB->close();
             journal::unwatch();
             open(*gcnDB, driverNumber());
+            versions.clear();
+            for (const auto& [name, version] : gcnDB->session().engine().versions())
+                versions += u", "_s + name + u' ' + version;
             journal::watch(gcnDB);
         } catch (const RuntimeError& error) {
             gcnDB->close(error.description());  // also if only the journal did not answer: work without it could not be
@@ -183,7 +189,7 @@ QString databaseDescription()
 {
     const QString embedded = db::embeddedName(connectionText(driverNumber(CopyUp::No)));
     const QString server = (gsServer + u' ' + gsInstance).trimmed();
-    return embedded.isEmpty() ? gsDatabase + u" on "_s + server : embedded + u" (embedded)"_s;
+    return (embedded.isEmpty() ? gsDatabase + u" on "_s + server : embedded + u" (embedded)"_s) + versions;
 }
 
 std::optional<db::Recordset> OpenRecordset(const QString& select, bool disconnect, bool reconnect)

@@ -35,7 +35,8 @@ void readConnectionSettings();
 /// Returns the connection text for a driver, made from the variables above, or an empty text if there is no such
 /// driver.
 QString connectionText(int driverNumber);
-/// Returns which database the settings choose and how it is reached, without its password.
+/// Returns which database the settings choose, and the versions of the driver and the server that the last connection
+/// used. It holds no password.
 QString databaseDescription();
 /// Returns true if the settings choose the embedded database.
 bool usesEmbeddedDatabase();

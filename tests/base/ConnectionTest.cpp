@@ -132,6 +132,7 @@ TEST_F(ShopConnection, TheOptionsOfTheSettingOrTheVariableReachTheDriver)
     EXPECT_FALSE(gcnDB->answers());
     openWith(u"OdbcOptions"_s, options);
     EXPECT_TRUE(gcnDB->answers()) << connectionFailure();
+    EXPECT_TRUE(databaseDescription().contains(u", driver libtdsodbc"_s)) << databaseDescription();
     qputenv("KEST2_ODBC_OPTIONS", options.toUtf8());
     openWith(u"OdbcOptions"_s, u""_s);
     EXPECT_TRUE(gcnDB->answers()) << connectionFailure();
