@@ -70,6 +70,10 @@ void unwatch();
 /// which could hold its locks for hours. Returns in how many seconds its locks are free.
 int endDeadSession(const Entry& entry);
 
+/// Returns true if the operation began in this workstation's folders. Another workstation or profile may have folders
+/// of its own, with what its operation has left.
+bool isOfThisWorkstation(const Entry& entry);
+
 /// Returns true if the connection's database keeps a journal.
 bool isKept();
 

@@ -5,6 +5,7 @@
 #include "base/modDBAccess.h"
 #include "platform/RuntimeError.h"
 #include "platform/database/Sql.h"
+#include "platform/files/files.h"
 #include "platform/profile.h"
 #include "platform/values.h"
 
@@ -27,10 +28,25 @@ QString signFile()
     return profile::root() + u"/operations.lock"_s;
 }
 
+QString machine()
+{
+    const QByteArray id = QSysInfo::machineUniqueId();
+    return id.isEmpty() ? GetComputerName() : QString::fromLatin1(id);
+}
+
 /// Returns a text that only processes of this profile on this machine have.
 QString place()
 {
-    return hashOf(QString::fromLatin1(QSysInfo::machineUniqueId()) + profile::root());
+    return hashOf(machine() + profile::root());
+}
+
+/// Returns a text that only workstations with this machine's own folders have.
+QString folders()
+{
+    QString paths;
+    for (const QString& folder : {gsUnreadPath, gsReadPath, gsImagesPath})
+        paths += u'\n' + files::systemPath(folder);
+    return hashOf(machine() + paths);
 }
 
 }  // namespace
@@ -44,6 +60,12 @@ bool isOwnerDead(const Entry& entry)
 {
     return !entry.serverSession.isEmpty() && entry.facts[u"place"_s] == place() &&
            files::Lock(signFile(), entry.lock).isHeld();
+}
+
+bool isOfThisWorkstation(const Entry& entry)
+{
+    const QJsonValue known = entry.facts[u"folders"_s];
+    return known.isUndefined() ? entry.workstation == GetComputerName() : known == folders();
 }
 
 /// Takes the lock that shows others that the owner of the work lives. Returns false if someone else has it.
@@ -131,6 +153,7 @@ void Work::prepare()
 
 void Work::insert()
 {
+    facts[u"folders"_s] = folders();
     row->addNew();
     row->set(u"OperationKind"_s, wordOf(kind));
     row->set(u"State"_s, wordOf(State::Open));

@@ -1,7 +1,6 @@
 #include "recovery/FinishLoad.h"
 
 #include "base/SharedVariables.h"
-#include "base/modDBAccess.h"
 #include "inbound/Finishing.h"
 #include "jobexport/WriteQuote.h"
 #include "messages/Envelope.h"
@@ -30,7 +29,8 @@ bool isGone(const journal::Entry& entry)
 {
     if (!files::folderExists(gsUnreadPath) || isThere(gsUnreadPath, entry.file, entry.hash))
         return false;
-    return isOfThisWorkstation(entry) || isThere(gsReadPath, journal::kept(u"newName"_s).toString(), entry.hash);
+    return journal::isOfThisWorkstation(entry) ||
+           isThere(gsReadPath, journal::kept(u"newName"_s).toString(), entry.hash);
 }
 
 const MessageType* typeOf(QString& text)
@@ -113,11 +113,6 @@ bool stillWaits(const journal::Entry& entry)
 bool isThere(const QString& folder, const QString& file, const QString& hash)
 {
     return isBareName(file) && files::exists(folder + file) && journal::hashOf(files::read(folder + file)) == hash;
-}
-
-bool isOfThisWorkstation(const journal::Entry& entry)
-{
-    return entry.workstation == GetComputerName();
 }
 
 QStringList removeDocuments(const journal::Entry& entry)

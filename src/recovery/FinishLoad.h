@@ -17,9 +17,6 @@ bool stillWaits(const journal::Entry& entry);
 /// Returns true if the folder has that message.
 bool isThere(const QString& folder, const QString& file, const QString& hash);
 
-/// Another workstation may have folders of its own, with what its operation has left.
-bool isOfThisWorkstation(const journal::Entry& entry);
-
 /// Removes the documents of sublet work that a load has written. Returns which could not be removed, a sentence each.
 QStringList removeDocuments(const journal::Entry& entry);
 

@@ -85,7 +85,7 @@ void tell(Settled settled)
 void settleSend(const journal::Entry& entry, journal::Operation& operation)
 {
     const std::optional<QStringList> gone = finishSend({entry.number, entry.subquote}, entry.pastPoint);
-    if (!isOfThisWorkstation(entry) && (!gone || !gone->isEmpty()))
+    if (!journal::isOfThisWorkstation(entry) && (!gone || !gone->isEmpty()))
         return;  // that workstation may have another folder, with the document or the pictures
     const bool isKnown = isUnfinished(entry) && entry.pastPoint;  // the user has seen what could not be written
     operation.end(!gone ? journal::State::Failed : isKnown ? journal::State::Done : journal::State::Finished);
@@ -127,7 +127,7 @@ void settleIncomplete(const journal::Entry& entry, journal::Operation& operation
 
 void settleUndo(const journal::Entry& entry, journal::Operation& operation)
 {
-    const Undone undone = finishUndo(entry.workstation);
+    const Undone undone = finishUndo(journal::isOfThisWorkstation(entry));
     if (undone.areRowsBack())
         return endComplete(entry, operation, undone.state == journal::State::Done, undone.told);
     operation.end(undone.state);

@@ -131,12 +131,12 @@ bool isLoadedAgain(const journal::Entry& load)
 }
 
 /// Moves the message of a load to the unread folder. Returns false if that is not possible yet.
-bool moveMessageBack(const journal::Entry& load, const QString& workstation)
+bool moveMessageBack(const journal::Entry& load, bool isOwn)
 {
     if (isLoadedAgain(load))
         return true;
     if (!isMessageRead(load))
-        return (workstation == GetComputerName() && files::folderExists(gsReadPath)) || isMessageUnread(load);
+        return (isOwn && files::folderExists(gsReadPath)) || isMessageUnread(load);
     journal::keep(u"isMoving"_s, true);  // throws if another workstation goes on with this undo
     return attempt([&] {
         try {
@@ -194,7 +194,7 @@ Undone undo(qint64 operation)
     journal::openNow(load.number, load.subquote);
     Undone undone;
     try {
-        undone = finishUndo(GetComputerName());
+        undone = finishUndo(true);
     } catch (const RuntimeError& error) {
         work.end(journal::State::Open);  // so that it is finished later
         throw RuntimeError(error.number(),
@@ -226,7 +226,7 @@ bool askAndUndo(qint64 operation)
     return true;
 }
 
-Undone finishUndo(const QString& workstation)
+Undone finishUndo(bool isOwn)
 {
     const journal::Entry load = journal::entryOf(journal::kept(u"undoes"_s).toInteger());
     if (isIn(load, journal::State::Interrupted))
@@ -234,7 +234,7 @@ Undone finishUndo(const QString& workstation)
     Undone undone;
     if (!isIn(load, journal::State::TakenBack))
         undone = takeRowsBack(load);
-    if (undone.areRowsBack() && !moveMessageBack(load, workstation)) {
+    if (undone.areRowsBack() && !moveMessageBack(load, isOwn)) {
         undone.state = journal::State::Unfinished;
         undone.told.append(u"Its message could not be moved yet; it is moved as soon as that is possible."_s);
     }

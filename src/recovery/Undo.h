@@ -36,8 +36,8 @@ Undone undo(qint64 operation);
 /// if it was undone.
 bool askAndUndo(qint64 operation);
 
-/// Goes on with an undo inside its operation, which that workstation began. It may be refused as long as no row is
-/// back. Its message waits to be moved also if it can't be seen from here: it was in sight of that workstation.
-Undone finishUndo(const QString& workstation);
+/// Goes on with an undo inside its operation. It may be refused as long as no row is back. If another workstation began
+/// it (not `isOwn`), its message waits to be moved also if it can't be seen from here.
+Undone finishUndo(bool isOwn);
 
 }  // namespace kest::recovery

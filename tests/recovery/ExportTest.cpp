@@ -40,7 +40,8 @@ TEST_F(InterruptedExport, IsMadeUnlessItHasBegunAndToldIfItIsNotComplete)
                 journal::keep(u"job"_s, 1);
             }
         }
-        gConn->execute(u"UPDATE KESTOperation SET State='open'"_s);  // as if the process had died
+        // as if the process had died, and the workstation had been renamed
+        gConn->execute(u"UPDATE KESTOperation SET State='open', Workstation='OTHER'"_s);
         storeJobLinkSettings({u"127.0.0.1"_s, mariaDb().port(), u"jobs"_s, mariaDb().user(), mariaDb().password()});
         if (!isMessageThere)
             files::remove(gsUnreadPath + u"m.xml"_s);

@@ -22,16 +22,22 @@ struct Interrupted : Sending {
         recovery::takeSettled();
     }
 
-    /// Settles an operation whose folder is away, and then that of another workstation with a folder of its own.
+    /// Settles an operation whose folder is away, and then as another workstation or profile with a folder of its own.
     static void settleOutOfSight(QString& folder)
     {
+        const QString place = files::systemPath(folder);
+        QDir().rename(place, place + u".away"_s);
+        recovery::settle();
+        EXPECT_EQ(newest().text("State"), "unfinished");
+        QDir().rename(place + u".away"_s, place);
+
         files::makeFolder(u"c:\\own"_s);
-        for (const auto& [workstation, path] :
-             {std::pair(GetComputerName(), u"c:\\gone\\"_s), {u"OTHER"_s, u"c:\\own\\"_s}}) {
-            gConn->execute(sql("UPDATE KESTOperation SET Workstation='{}'", workstation));
-            const QScopedValueRollback away(folder, path);
+        const QScopedValueRollback own(folder, u"c:\\own\\"_s);
+        const char* older = "Workstation='OTHER', Facts=REPLACE(Facts, 'folders', 'not yet')";
+        for (const char* change : {"Workstation=Workstation", older}) {
+            gConn->execute(u"UPDATE KESTOperation SET "_s + QString::fromLatin1(change));
             recovery::settle();
-            EXPECT_EQ(newest().text("State"), "unfinished") << path;
+            EXPECT_EQ(newest().text("State"), "unfinished") << change;
         }
     }
 
