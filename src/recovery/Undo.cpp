@@ -100,12 +100,20 @@ QStringList newerOperations(const journal::Entry& load)
     return reasons;
 }
 
-/// Takes the rows of a load back and removes its documents.
-Undone takeRowsBack(const journal::Entry& load)
+/// Returns true if the message of a load can be seen from here if it is still read.
+bool isInSight(const journal::Entry& load, bool isOwn)
+{
+    return (isOwn && files::folderExists(gsReadPath)) || isMessageRead(load) || isMessageUnread(load);
+}
+
+/// Takes the rows of a load back and removes its documents. Throws PathNotFound if that can't be decided here.
+Undone takeRowsBack(const journal::Entry& load, bool isOwn)
 {
     const QList<journal::RecordedChange> changes = journal::changesOf(load.id);
     const bool isBegun =
         std::ranges::any_of(changes, [](const journal::RecordedChange& change) { return change.isTakenBack; });
+    if (!isBegun && !isInSight(load, isOwn))
+        throw RuntimeError(PathNotFound, u"Its message is not in sight here."_s);
     QStringList reasons;
     const auto mayBegin = [&] {  // others may have worked since the last check
         if (!isBegun)
@@ -136,7 +144,7 @@ bool moveMessageBack(const journal::Entry& load, bool isOwn)
     if (isLoadedAgain(load))
         return true;
     if (!isMessageRead(load))
-        return (isOwn && files::folderExists(gsReadPath)) || isMessageUnread(load);
+        return isInSight(load, isOwn);
     journal::keep(u"isMoving"_s, true);  // throws if another workstation goes on with this undo
     return attempt([&] {
         try {
@@ -233,7 +241,7 @@ Undone finishUndo(bool isOwn)
         return {journal::State::Interrupted, {}};
     Undone undone;
     if (!isIn(load, journal::State::TakenBack))
-        undone = takeRowsBack(load);
+        undone = takeRowsBack(load, isOwn);
     if (undone.areRowsBack() && !moveMessageBack(load, isOwn)) {
         undone.state = journal::State::Unfinished;
         undone.told.append(u"Its message could not be moved yet; it is moved as soon as that is possible."_s);
