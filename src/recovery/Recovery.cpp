@@ -243,9 +243,12 @@ EarlierLoad settleLoadOf(const QString& file, const QString& hash)
         isComplete =
             isComplete || (isLoadOf(entry, file) && entry.hash == hash && (entry.pastPoint || isUnfinished(entry)));
     settle(file);
-    for (const journal::Entry& entry : journal::pendingOperations())
-        if (isLoadOf(entry, file) && !isUnfinished(entry))
-            return EarlierLoad::Pending;
+    const auto isPending = [&](const journal::Entry& entry) {
+        return !isUnfinished(entry) &&
+               (isLoadOf(entry, file) || (isOf(entry, journal::Kind::Undo) && entry.hash == hash));
+    };
+    if (std::ranges::any_of(journal::pendingOperations(), isPending))
+        return EarlierLoad::Pending;
     return isComplete ? EarlierLoad::Complete : EarlierLoad::None;
 }
 

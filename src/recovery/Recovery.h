@@ -45,7 +45,7 @@ void showSettled();
 enum class EarlierLoad {
     None,
     Complete,  // it was loaded, and only had to be moved
-    Pending,   // it could not be settled
+    Pending,   // it, or its undo, could not be settled
 };
 /// Settles the earlier loads of a message. The caller has the lock for loads of that file.
 EarlierLoad settleLoadOf(const QString& file, const QString& hash);

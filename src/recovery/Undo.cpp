@@ -116,15 +116,17 @@ Undone takeRowsBack(const journal::Entry& load, bool isOwn)
         throw RuntimeError(PathNotFound, u"Its message is not in sight here."_s);
     QStringList reasons;
     const auto mayBegin = [&] {  // others may have worked since the last check
-        if (!isBegun)
-            reasons = obstaclesToUndo(load.id);
+        reasons = isBegun ? newerOperations(load) : obstaclesToUndo(load.id);
         return reasons.isEmpty();
     };
-    const QStringList left = takeBack(load.id, journal::record, mayBegin);
-    if (!reasons.isEmpty())
+    QStringList left = takeBack(load.id, journal::record, mayBegin);
+    if (!reasons.isEmpty() && !isBegun)
         return {journal::State::Failed, reasons};
+    left += reasons;
     const Undone undone{left.isEmpty() ? journal::State::Done : journal::State::Interrupted,
                         left + removeDocuments(load)};
+    if (!undone.areRowsBack())
+        journal::keep(u"left"_s, QJsonArray::fromStringList(undone.told));
     journal::setState(load.id, left.isEmpty() ? journal::State::TakenBack : journal::State::Interrupted);
     return undone;
 }
@@ -238,7 +240,7 @@ Undone finishUndo(bool isOwn)
 {
     const journal::Entry load = journal::entryOf(journal::kept(u"undoes"_s).toInteger());
     if (isIn(load, journal::State::Interrupted))
-        return {journal::State::Interrupted, {}};
+        return {journal::State::Interrupted, journal::kept(u"left"_s).toVariant().toStringList()};
     Undone undone;
     if (!isIn(load, journal::State::TakenBack))
         undone = takeRowsBack(load, isOwn);

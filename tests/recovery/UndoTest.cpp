@@ -201,6 +201,33 @@ TEST_F(UndoOfALoad, IsFinishedIfItFailed)
     }
 }
 
+TEST_F(UndoOfALoad, LeavesTheRestOnceItsQuoteIsChanged)
+{
+    const qint64 load = loaded(u"m.xml"_s, authorisation());
+    const journal::Entry entry = journal::entryOf(load);
+    {
+        journal::Operation undo(journal::Kind::Undo, entry.file, entry.hash);
+        journal::keep(u"undoes"_s, load);
+        journal::openNow(entry.number, entry.subquote);
+        undo.end(journal::State::Open);  // as one that has failed
+        const QScopedValueRollback away(gsReadPath, u"c:\\gone\\"_s);
+        EXPECT_EQ(recovery::settleLoadOf(u"n.xml"_s, entry.hash), recovery::EarlierLoad::Pending);
+    }
+    gConn->execute(sql("UPDATE KESTJournal SET Settled=1 WHERE Operation={} AND TableName='QUOTE2'", load));
+    journal::Operation save(journal::Kind::Save);
+    gConn->execute(u"UPDATE QUOTE1 SET Claim='C9' WHERE QTNNO='500'"_s);
+    save.end(journal::State::Done);
+    for (int time = 1; time <= 2; ++time) {  // the second as if the process had died before the undo's end
+        recovery::settle();
+        const QStringList left = recovery::takeSettled().value(0).left;
+        EXPECT_EQ(left.filter(u"not the newest operation on quote 500: the save in the utilities was later."_s).size(),
+                  1);
+        EXPECT_EQ(titleAndState(load), u"load of m.xml: interrupted"_s);
+        EXPECT_EQ(quote("500").stage(), 4);
+        gConn->execute(u"UPDATE KESTOperation SET State='open' WHERE OperationKind='undo'"_s);
+    }
+}
+
 TEST_F(UndoOfALoad, IsDoneThoughADocumentCouldNotBeRemoved)
 {
     const std::pair<Text, const char*> sublet("subletAuthorityDocument", "JVBERi0xLjQ=");
