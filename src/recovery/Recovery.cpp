@@ -11,6 +11,7 @@
 #include "recovery/TakeBack.h"
 #include "recovery/Undo.h"
 
+#include <QJsonArray>
 #include <QSet>
 
 #include <algorithm>
@@ -100,10 +101,18 @@ void settleSend(const journal::Entry& entry, journal::Operation& operation)
 void endComplete(const journal::Entry& entry, journal::Operation& operation, bool isMoved, const QStringList& left)
 {
     if (isUnfinished(entry)) {
-        if (isMoved)
-            operation.end(journal::State::Done);
+        if (!isMoved)
+            return;
+        QStringList news = left;  // such as a report that nobody saw, if the message was out of sight before
+        for (const QJsonValue sentence : journal::kept(u"told"_s).toArray())
+            news.removeAll(sentence.toString());
+        operation.end(journal::State::Done);
+        if (!news.isEmpty())
+            tell({entry, Outcome::Finished, news});
         return;
     }
+    if (!isMoved)
+        journal::keep(u"told"_s, QJsonArray::fromStringList(left));
     operation.end(isMoved ? journal::State::Finished : journal::State::Unfinished);
     tell({entry, Outcome::Finished, left});
 }

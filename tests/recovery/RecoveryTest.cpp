@@ -184,10 +184,12 @@ TEST_F(Interrupted, AMessageOutOfSightIsNotTakenForMoved)
     EXPECT_EQ(newest().text("State"), "unfinished");
     gsUnreadPath = seen;
     settleOutOfSight(gsUnreadPath);
-    gConn->execute(u"UPDATE KESTOperation SET State='open'"_s);  // the workstation died before it could end the load
+    // the workstation died before anybody saw the report
+    gConn->execute(u"UPDATE KESTOperation SET State='open', Facts=REPLACE(Facts, 'reportShown', 'not yet')"_s);
     settleOutOfSight(gsUnreadPath);
     recovery::settle();
     EXPECT_EQ(newest().text("State"), "done");
+    EXPECT_TRUE(recovery::takeSettled().value(1).left.value(0).startsWith(uR"(Its report "Quote Request" was not)"_s));
     EXPECT_EQ(filesIn(gsUnreadPath).size() + 1, filesIn(gsReadPath).size());
 }
 
