@@ -59,10 +59,10 @@ QStringList writeImageDocuments(const QString& folder, const QuoteKey& quote)
         workStep();
         if (journal::kept(image.file).toBool())
             continue;
-        if (!files::folderExists(folder))
-            throw RuntimeError(PathNotFound, u"The pictures' folder %1 was not found."_s.arg(folder));
         const QString picture = files::pathForWriting(folder, image.file);
         if (!files::exists(picture)) {
+            if (files::list(folder).isEmpty())  // it may be the place of a share that is not mounted
+                throw RuntimeError(PathNotFound, u"The pictures' folder %1 was not found, or is empty."_s.arg(folder));
             gone.append(image.file);
             continue;
         }
