@@ -77,7 +77,7 @@ QStringList invoices(const journal::Entry& load)
     for (const QString& number : numbersOf(load)) {
         const bool isInDebtors =
             gConn->hasTable(u"DEBTOR"_s) && !opened(sql("SELECT QTNNO FROM DEBTOR WHERE QTNNO='{}'", number)).eof();
-        if (isInDebtors || !opened(sql("SELECT QTNNO FROM QUOTE1 WHERE QTNNO='{}' AND invoiced=1", number)).eof())
+        if (isInDebtors || !opened(sql("SELECT QTNNO FROM QUOTE1 WHERE QTNNO='{}' AND invoiced<>0", number)).eof())
             reasons.append(u"Quote %1 is invoiced."_s.arg(number));
     }
     return reasons;

@@ -136,7 +136,7 @@ TEST_F(UndoOfALoad, IsRefusedWithTheReason)
          [] {
              quote("500").set("invoiced", 0);  // so that the load does not write it
              const qint64 load = loaded(u"m.xml"_s, authorisation());
-             quote("500").set("invoiced", 1);
+             quote("500").set("invoiced", -1);
              return load;
          }},
         {"Quote 500 is invoiced.",
