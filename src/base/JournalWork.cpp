@@ -81,7 +81,8 @@ bool Work::takeLock(int seconds)
 void Work::takeLockAgain()
 {
     const QString lostSession = serverSession;
-    attempt([&] { gConn->endSession(lostSession, lockName); });  // or the server does so later
+    if (lostSession != gConn->serverSession())  // otherwise it is this one, which has the lock from the last try
+        attempt([&] { gConn->endSession(lostSession, lockName); });  // or the server does so later
     if (takeLock(sessionEnd))
         return;
     serverSession = lostSession;
