@@ -1,6 +1,7 @@
 #include "utilities/frmHistory.h"
 
 #include "base/modDBAccess.h"
+#include "platform/RuntimeError.h"
 #include "platform/desktop/ListSearch.h"
 #include "platform/desktop/Lists.h"
 #include "platform/desktop/Progress.h"
@@ -240,11 +241,19 @@ void frmHistory::cmdUndo_Click()
 {
     EnsureConnection();
     const desktop::WaitPointer pointer(u"Undoing the load..."_s);
-    if (!undo(chosen()))
-        return;
-    isUndone = true;
-    changes.clear();  // they say now which were taken back
-    fill();
+    const auto showUndone = [this] {
+        isUndone = true;
+        changes.clear();  // they say now which were taken back
+        fill();
+    };
+    try {
+        if (!undo(chosen()))
+            return;
+    } catch (const RuntimeError&) {  // it may have failed half done
+        attempt(showUndone);
+        throw;
+    }
+    showUndone();
 }
 
 void frmHistory::tellCount(int visible)

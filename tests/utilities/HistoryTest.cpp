@@ -113,13 +113,15 @@ TEST_F(History, UndoesTheChosenLoad)
 {
     change("a.xml", {u"CLAIM='C2'"_s}, "QTNNO='500'");
     open([](QDialog& window) { EXPECT_FALSE(control<QPushButton>(window, "cmdUndo").isVisible()); });
-    const auto undo = [](const QString& statement) {
-        return [statement](qint64 operation) {
+    const auto undo = [](const QString& statement, bool fails) {
+        return [statement, fails](qint64 operation) {
             EXPECT_EQ(operation, 1);
             if (statement.isEmpty())
                 return false;
             gConn->execute(statement);
             gConn->execute(u"UPDATE KESTOperation SET State='taken back'"_s);
+            if (fails)
+                throw RuntimeError(StatementFailed, u"half done"_s);
             return true;
         };
     };
@@ -127,16 +129,16 @@ TEST_F(History, UndoesTheChosenLoad)
         gestures::press(window, Qt::ALT | Qt::Key_U);
         EXPECT_EQ(rowCount("KESTOperation", "State='done'") == 1, operations(window) == "LOAD OF A.XML DONE\n");
     };
-    const std::pair<QString, QString> cases[] = {
-        {{}, u"C2"_s},
-        {u"UPDATE QUOTE1 SET CLAIM='C1' WHERE QTNNO='500'"_s, u"C1"_s},
-        {u"DELETE FROM QUOTE1 WHERE QTNNO='500'"_s, u"closed"_s},
+    const std::tuple<QString, bool, QString> cases[] = {
+        {{}, false, u"C2"_s},
+        {u"UPDATE QUOTE1 SET CLAIM='C3' WHERE QTNNO='500'"_s, true, u"C3"_s},
+        {u"DELETE FROM QUOTE1 WHERE QTNNO='500'"_s, false, u"closed"_s},
     };
-    for (const auto& [statement, expected] : cases) {
-        open(press, undo(statement));
+    for (const auto& [statement, fails, expected] : cases) {
+        open(press, undo(statement, fails));
         EXPECT_EQ(claim, expected);
     }
-    EXPECT_EQ(shown(), "[information] Quote 500/0 no longer exists.");
+    EXPECT_TRUE(shown().ends_with("half done\n[information] Quote 500/0 no longer exists."));
 }
 
 TEST_F(History, SaysWhyItIsEmpty)
