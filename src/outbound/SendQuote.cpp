@@ -80,6 +80,14 @@ void tellOldTotals(const QuoteKey& key)
         desktop::Icon::Exclamation);
 }
 
+void tellGonePictures(const QuoteKey& key, const QStringList& gone)
+{
+    desktop::msgBox(
+        u"Quote %1 is sent, but without the pictures %2, which are gone from the pictures' folder. Send them to the "
+        "insurer in another way."_s.arg(key.reference(), gone.join(u", "_s)),
+        desktop::Icon::Exclamation);
+}
+
 }  // namespace
 
 double SendQuote(db::Recordset& quote, bool* sent)
@@ -105,9 +113,12 @@ double SendQuote(db::Recordset& quote, bool* sent)
             tellOldTotals(key);
         if (sent)
             *sent = total != 0;
+        QStringList gone;
         if (total != 0)
-            CreateImageXML(gsImagesPath, quote);
+            gone = CreateImageXML(gsImagesPath, quote);
         operation.end(total != 0 ? journal::State::Done : journal::State::Failed);
+        if (!gone.isEmpty())
+            tellGonePictures(key, gone);
         return total;
     } catch (const RuntimeError&) {
         if (isDocumentAnnounced())  // a picture that does not fit on the disk, a note that another user has changed

@@ -183,9 +183,9 @@ double CreateQuoteXML(db::Recordset& quote)
     return total;
 }
 
-void CreateImageXML(const QString& imagesPath, db::Recordset& quote)
+QStringList CreateImageXML(const QString& imagesPath, db::Recordset& quote)
 {
-    writeImageDocuments(imagesPath, QuoteKey::fromRow(quote));
+    return writeImageDocuments(imagesPath, QuoteKey::fromRow(quote));
 }
 
 bool isDocumentAnnounced()

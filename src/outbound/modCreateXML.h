@@ -19,8 +19,9 @@ double CreateQuoteXML(db::Recordset& quote);
 /// Shows a critical box that says why a quote is not sent. Returns the total 0.
 double refuseSend(const QString& message);
 
-/// Writes a document and a copy of each photograph of the quote to the outgoing folder.
-void CreateImageXML(const QString& imagesPath, db::Recordset& quote);
+/// Writes a document and a copy of each photograph of the quote to the outgoing folder. Returns the names of those that
+/// the quote's document counts and that are gone.
+QStringList CreateImageXML(const QString& imagesPath, db::Recordset& quote);
 
 /// Returns true if the send at work may have written its document, so that it has to be finished if it fails.
 bool isDocumentAnnounced();

@@ -215,14 +215,16 @@ namespace {
 /// Someone who answers a box late.
 struct Absent final : desktop::Answerer {
     explicit Absent(std::function<void()> inBetween) : meanwhile(std::move(inBetween)) {}
-    desktop::Answer box(const desktop::Box&) override
+    desktop::Answer box(const desktop::Box& box) override
     {
+        told.append(box.text);
         meanwhile();
         return desktop::Answer::Ok;
     }
     QString input(const desktop::Input&) override { return {}; }
     void start(const QString&) override {}
     std::function<void()> meanwhile;
+    QStringList told;
 };
 
 }  // namespace
@@ -230,10 +232,17 @@ struct Absent final : desktop::Answerer {
 TEST_F(Interrupted, ABoxMayStayOpenUntilTheConnectionIsLost)
 {
     sendable("600");
-    files::write(gsImagesPath + u"600_0001.jpg"_s, u"picture"_s);
-    desktop::setAnswerer(std::make_shared<Absent>(dropConnection));
+    for (const char* picture : {"600_0001.jpg", "600_0002.jpg"})
+        files::write(gsImagesPath + QString::fromLatin1(picture), u"picture"_s);
+    const auto absent = std::make_shared<Absent>([] {
+        dropConnection();
+        attempt([] { files::remove(gsImagesPath + u"600_0001.jpg"_s); });
+    });
+    desktop::setAnswerer(absent);
     EXPECT_EQ(failureOf([] { send("600"); }), 0);
+    EnsureConnection();
     EXPECT_EQ(newest().text("State"), "done");
+    EXPECT_TRUE(absent->told.last().contains(u"without the pictures 600_0001.jpg, which"_s));
 }
 
 TEST_F(Interrupted, AMessageThatAnotherLoadsWhileABoxIsOpenIsLeftAlone)
