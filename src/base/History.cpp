@@ -111,6 +111,11 @@ QList<Entry> pendingOperations()
     return entries(u"SELECT * FROM KESTOperation WHERE State IN ('open', 'unfinished') ORDER BY Operation"_s);
 }
 
+QList<Entry> loadsOf(const QString& hash)
+{
+    return entries(sql("SELECT * FROM KESTOperation WHERE OperationKind='load' AND FileHash='{}'", hash));
+}
+
 QList<RecordedChange> changesOf(qint64 operation)
 {
     QList<RecordedChange> changes;

@@ -105,6 +105,7 @@ void withdrawIfRequest(const QString& name, const QString& requestNumber)
     QJsonArray withdrawn = journal::kept(u"withdrawn"_s).toArray();
     withdrawn.append(name);
     journal::keep(u"withdrawn"_s, withdrawn);
+    journal::openNow({}, {});  // because the load may still be refused, and then its next try must know
     files::remove(path, files::Force::Yes);
 }
 

@@ -51,8 +51,9 @@ QStringList obstaclesOfFiles(const journal::Entry& load)
     for (const auto& fact : load.facts)
         if (fact.toString().endsWith(".jpg"_L1, Qt::CaseInsensitive))
             reasons.append(u"It has moved the picture %1."_s.arg(fact.toString()));
-    for (const QJsonValue request : load.facts[u"withdrawn"_s].toArray())
-        reasons.append(u"It has deleted the waiting request %1."_s.arg(request.toString()));
+    for (const journal::Entry& attempted : journal::loadsOf(load.hash))  // also by a load of it that was refused
+        for (const QJsonValue request : attempted.facts[u"withdrawn"_s].toArray())
+            reasons.append(u"It has deleted the waiting request %1."_s.arg(request.toString()));
     if (!isMessageRead(load))
         reasons.append(u"Its message is no longer among the read messages."_s);
     if (files::exists(gsUnreadPath + load.file))
@@ -134,10 +135,9 @@ Undone takeRowsBack(const journal::Entry& load, bool isOwn)
 /// Returns true if somebody has put the message of a load back, under whatever name, and loaded it again.
 bool isLoadedAgain(const journal::Entry& load)
 {
-    return !opened(sql("SELECT Operation FROM KESTOperation WHERE Operation>{} AND OperationKind='load' AND "
-                       "FileHash='{}' AND State<>'taken back'",
-                       load.id, load.hash))
-                .eof();
+    return std::ranges::any_of(journal::loadsOf(load.hash), [&](const journal::Entry& other) {
+        return other.id > load.id && !isIn(other, journal::State::TakenBack);
+    });
 }
 
 /// Moves the message of a load to the unread folder. Returns false if that is not possible yet.

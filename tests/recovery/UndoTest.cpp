@@ -124,6 +124,10 @@ TEST_F(UndoOfALoad, IsRefusedWithTheReason)
         {"It has deleted the waiting request QREQ.xml.",
          [this] {
              arrive("QREQ.xml", quoteRequest("QR1"));
+             arrive("m.xml", manualQuote("500"));
+             gConn->execute(u"UPDATE CAR SET REGO='GONE'"_s);
+             EXPECT_FALSE(loadAsTheWindow(u"m.xml"_s)) << "which has deleted it all the same";
+             gConn->execute(u"UPDATE CAR SET REGO='ABC123'"_s);
              return loaded(u"m.xml"_s, manualQuote("500"));
          }},
         {"It is so old that a part of what it changed is no longer recorded.",
