@@ -193,12 +193,15 @@ void prune()
     if (!isKept())
         return;
     const QDateTime limit = QDateTime::currentDateTime().addDays(-daysKept());
+    QStringList inUse{u"0"_s};
+    for (const Entry& pending : pendingOperations())
+        inUse.append(QString::number(pending.facts[u"undoes"_s].toInteger()));
     for (qint64 room = prunedAtOnce; room > 0;) {
         const db::Recordset oldest =
             opened(sql("SELECT TOP 1 Operation FROM KESTOperation WHERE StartedAt<'{}' AND State<>'open' AND "
-                       "State<>'unfinished' ORDER BY "
-                       "Operation",
-                       limit.toString(u"yyyy-MM-ddTHH:mm:ss"_s)));
+                       "State<>'unfinished' AND Operation NOT IN (",
+                       limit.toString(u"yyyy-MM-ddTHH:mm:ss"_s)) +
+                   inUse.join(u", "_s) + u") ORDER BY Operation"_s);
         if (oldest.eof())
             return;
         const QVariant operation = oldest.value(u"Operation"_s);

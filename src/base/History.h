@@ -50,8 +50,8 @@ QString keyOf(const db::RowChange& row);
 /// utilities".
 QString titleOf(const Entry& entry);
 
-/// Deletes operations that are older than the setting "JournalDays", but none that is open or unfinished. Deletes at
-/// most 1,000 rows at a time, the oldest first.
+/// Deletes operations that are older than the setting "JournalDays", but none that is open or unfinished, and no load
+/// whose undo is. Deletes at most 1,000 rows at a time, the oldest first.
 void prune();
 
 }  // namespace kest::journal

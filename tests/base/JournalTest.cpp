@@ -95,7 +95,7 @@ TEST_F(JournalOfAShop, IsNotNeededForALoad)
 TEST_F(JournalOfAShop, ForgetsOldOperationsSomeRowsAtATimeButNoOpenOne)
 {
     for (const auto& [state, daysAgo] :
-         {std::pair("open", 200), {"done", 100}, {"failed", 91}, {"done", 89}, {"unfinished", 200}})
+         {std::pair("open", 200), {"done", 100}, {"failed", 91}, {"done", 89}, {"unfinished", 200}, {"done", 95}})
         gConn->execute(sql("INSERT INTO KESTOperation (OperationKind, State, StartedAt) VALUES ('load', '{}', '{}')",
                            QString::fromLatin1(state),  // the server numbers them from 1
                            QDateTime::currentDateTime().addDays(-daysAgo).toString(u"yyyy-MM-ddTHH:mm:ss"_s)));
@@ -103,16 +103,17 @@ TEST_F(JournalOfAShop, ForgetsOldOperationsSomeRowsAtATimeButNoOpenOne)
         const QStringList records(count, u"(%1, 'T', 0)"_s.arg(number));
         gConn->execute(u"INSERT INTO KESTJournal (Operation, TableName, Settled) VALUES "_s + records.join(u','));
     }
+    gConn->execute(uR"(UPDATE KESTOperation SET Facts='{"undoes":6}' WHERE Operation=5)"_s);
 
     journal::prune();
-    EXPECT_EQ(rowCount("KESTOperation", "Operation IN (1, 3, 4, 5)"), 4);
-    EXPECT_EQ(rowCount("KESTOperation"), 4);
+    EXPECT_EQ(rowCount("KESTOperation", "Operation IN (1, 3, 4, 5, 6)"), 5);
+    EXPECT_EQ(rowCount("KESTOperation"), 5);
     EXPECT_EQ(rowCount("KESTJournal", "Operation=3"), 101);
     EXPECT_EQ(journal::entryOf(3).state, u"pruned"_s);
 
     journal::prune();
-    EXPECT_EQ(rowCount("KESTOperation", "Operation IN (1, 4, 5)"), 3);
-    EXPECT_EQ(rowCount("KESTOperation"), 3);
+    EXPECT_EQ(rowCount("KESTOperation", "Operation IN (1, 4, 5, 6)"), 4);
+    EXPECT_EQ(rowCount("KESTOperation"), 4);
     EXPECT_EQ(rowCount("KESTJournal"), 100);
 }
 
