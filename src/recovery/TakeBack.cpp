@@ -168,15 +168,19 @@ bool hasOtherQuote(const QList<RowHistory>& rows, const QString& rego)
 QStringList keptRegos(const QList<RowHistory>& rows)
 {
     QStringList kept;
-    for (const RowHistory& car : rows) {
+    const auto isNewlyKept = [&](const RowHistory& car) {
         const QString rego = givenRego(car);
         const bool isReturned = std::ranges::any_of(rows, [&](const RowHistory& other) {
-            return !givenRego(other).isEmpty() &&
+            const QString given = givenRego(other);
+            return !given.isEmpty() && !kept.contains(given, Qt::CaseInsensitive) &&
                    textOrEmpty(other.net.column(u"REGO"_s)->before).compare(rego, Qt::CaseInsensitive) == 0;
         });  // to the car that has made way for this one
-        if (!rego.isEmpty() && !isReturned && hasOtherQuote(rows, rego))
-            kept.append(rego);
-    }
+        return !rego.isEmpty() && !kept.contains(rego, Qt::CaseInsensitive) && !isReturned && hasOtherQuote(rows, rego);
+    };
+    // a car that keeps its registration returns none, so that the next may have to keep its own
+    for (auto car = std::ranges::find_if(rows, isNewlyKept); car != rows.end();
+         car = std::ranges::find_if(rows, isNewlyKept))
+        kept.append(givenRego(*car));
     return kept;
 }
 

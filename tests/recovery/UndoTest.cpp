@@ -322,14 +322,20 @@ TEST_F(UndoOfALoad, LeavesARegistrationThatOtherQuotesUse)
     for (const char* statement : {"UPDATE CAR SET REGO='AB C123'", "UPDATE QUOTE1 SET REGO='AB C123'"})
         gConn->execute(QString::fromLatin1(statement));
     const Snapshot before;
-    for (const auto& [isInUse, isInTheWay] : {std::pair(false, false), {true, false}, {true, true}}) {
+    const std::tuple<bool, bool, bool> cases[] = {
+        {false, false, false}, {true, false, false}, {true, true, false}, {true, true, true}};
+    for (const auto& [isInUse, isInTheWay, isWayInUse] : cases) {
         if (isInTheWay)
             car("ABC123");
         const qint64 operation = loaded(u"m.xml"_s, manualQuote("500"));
         if (isInUse)
             quote("501").rego("ABC123");
-        const bool stays = isInUse && !isInTheWay;  // otherwise quote 501 would have no car
-        QStringList told(stays, u"Other quotes have the registration ABC123 by now, so its car keeps it."_s);
+        if (isWayInUse)
+            quote("502").rego("ABC123.");                        // to which the car in the way was moved
+        const bool stays = isInUse && isInTheWay == isWayInUse;  // otherwise quote 501 would have no car
+        QStringList told;
+        for (const QString& rego : QStringList(isWayInUse, u"ABC123."_s) + QStringList(stays, u"ABC123"_s))
+            told += u"Other quotes have the registration %1 by now, so its car keeps it."_s.arg(rego);
         EXPECT_EQ(recovery::obstaclesTo(operation), told);
         EXPECT_EQ(recovery::takeBack(operation), told);
         EXPECT_EQ(quote("500").text("REGO"), stays ? "ABC123" : "AB C123") << "which is that of its car";
