@@ -264,6 +264,7 @@ void frmMessageList::cmdProcess_Click()
 /// meanwhile; it is taken again if a box was open until the connection was lost.
 bool frmMessageList::loadOnce(const QString& file, std::optional<db::Lock>& alone)
 {
+    const int generation = gConn->generation();
     QString text = files::read(gsCurFolder + file);
     const QString hash = journal::hashOf(text);
     switch (recovery::settleLoadOf(file, hash)) {
@@ -276,11 +277,12 @@ bool frmMessageList::loadOnce(const QString& file, std::optional<db::Lock>& alon
             break;
     }
     journal::Operation operation(journal::Kind::Load, file, hash);
-    operation.beforeFirstChange([&, generation = gConn->generation()] {
+    operation.beforeFirstChange([&] {
         if (gConn->generation() == generation)
             return;
         alone.emplace(gConn, recovery::loadLock(file));
-        if (!alone->isHeld() || isMoved(file))
+        if (!alone->isHeld() || !files::exists(gsUnreadPath + file) ||
+            recovery::settleLoadOf(file, hash) != recovery::EarlierLoad::None)
             throw RuntimeError(RowChanged,
                                u"Message %1 is being loaded, or was loaded, on another workstation."_s.arg(file));
     });

@@ -247,18 +247,28 @@ TEST_F(Interrupted, ABoxMayStayOpenUntilTheConnectionIsLost)
 
 TEST_F(Interrupted, AMessageThatAnotherLoadsWhileABoxIsOpenIsLeftAlone)
 {
-    arrive("m.xml", excessWaiver("500"));
     frmMessageList window;
-    window.openUnread();
     std::unique_ptr<db::Lock> theirs;
-    desktop::setAnswerer(std::make_shared<Absent>([&] {
-        if (theirs)
-            return;
-        dropConnection();
-        theirs = std::make_unique<db::Lock>(anotherConnection(), recovery::loadLock(u"m.xml"_s), 5);
-    }));
-    EXPECT_FALSE(window.loadFile(u"m.xml"_s));
-    EXPECT_EQ(quote("500").number("excess"), 500);
+    for (const bool isLoaded : {true, false}) {
+        arrive("m.xml", excessWaiver("500"));
+        window.openUnread();
+        bool isBegun = false;
+        desktop::setAnswerer(std::make_shared<Absent>([&] {
+            if (std::exchange(isBegun, true))
+                return;
+            dropConnection();
+            const db::ConnectionPtr other = anotherConnection();
+            if (isLoaded)  // but not moved
+                other->execute(
+                    sql("INSERT INTO KESTOperation (OperationKind, State, PastPoint, FileName, FileHash) "
+                        "VALUES ('load', 'unfinished', 1, 'm.xml', '{}')",
+                        journal::hashOf(files::read(gsUnreadPath + u"m.xml"_s))));
+            else
+                theirs = std::make_unique<db::Lock>(other, recovery::loadLock(u"m.xml"_s), 5);
+        }));
+        EXPECT_FALSE(window.loadFile(u"m.xml"_s));
+        EXPECT_EQ(quote("500").number("excess"), 500);
+    }
     theirs.reset();
     desktop.emplace();
     EXPECT_TRUE(window.loadFile(u"m.xml"_s));
