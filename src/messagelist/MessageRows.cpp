@@ -41,11 +41,24 @@ bool suffices(const db::Recordset& rows, RowsNeeded needed)
     return needed == RowsNeeded::ExactlyOne ? rows.recordCount() == 1 : rows.recordCount() >= 1;
 }
 
+// Ignores the failure of a step: the row stands with what was found. But a lost connection ends the fill, because it
+// would empty all the following rows.
+template <class Step>
+void attemptForRow(Step&& step)
+{
+    try {
+        step();
+    } catch (const RuntimeError& error) {
+        if (error.number() == CannotOpen)
+            throw;
+    }
+}
+
 // If the value can't be read, it stays as it is.
 template <class Draw>
 void draw(QString& value, Draw&& drawn)
 {
-    attempt([&] { value = drawn(); });
+    attemptForRow([&] { value = drawn(); });
 }
 
 void dashWhereEmpty(MessageRow& row, std::initializer_list<RowField> fields)
@@ -137,7 +150,7 @@ void drawFromQuote(MessageRow& row, const db::Recordset& quote)
 
 void drawThroughKey(MessageRow& row, const xml::Document& message, const MessageType& type)
 {
-    attempt([&] {
+    attemptForRow([&] {
         const QString key = message.textOf(type.rowKey);
         if (key.trimmed().isEmpty())
             return;  // quotes of the host may have an empty number too
@@ -170,7 +183,7 @@ MessageRow sentRow(const xml::Document& document)
 {
     MessageRow row{u"Sent Quote"_s};
     draw(row[RegoField], [&] { return NormaliseRego(document.textOf(u"//request/vehicleRegistration"_s)); });
-    attempt([&] {
+    attemptForRow([&] {
         const QString reference = document.textOf(u"//request/quoteBody/quoteReference"_s);
         row[QuoteField] = NormaliseQuoteRef(reference);
         row[ClaimField] = claimOfQuote(reference);
@@ -222,7 +235,7 @@ MessageRow GetMarkerRow(const xml::Document& marker, const QString& typeName)
     draw(row[QuoteField], [&] { return marker.textOf(u"qtnno"_s); });
     draw(subquote, [&] { return marker.textOf(u"subquote"_s); });
     draw(row[RegoField], [&] { return marker.textOf(u"rego"_s); });
-    attempt([&] {
+    attemptForRow([&] {
         if (row[QuoteField].trimmed().isEmpty())
             return;
         db::Recordset quote(gConn);

@@ -2,6 +2,7 @@
 
 #include "base/Helpers.h"
 #include "base/SharedVariables.h"
+#include "base/modDBAccess.h"
 #include "messages/Envelope.h"
 #include "messages/Folders.h"
 #include "platform/Prompt.h"
@@ -32,6 +33,7 @@ void settleFilter(MessageFolder folder, qsizetype fileCount, const FillHooks& ho
         return;
     gsListFilter =
         desktop::inputBox(u"Enter a Quote Number to search by (Leave blank for all quotes)"_s, u"View KEST Messages"_s);
+    EnsureConnection();  // it may have been lost while the box was open
     if (hooks.filterAsked)
         hooks.filterAsked(gsListFilter);
     gbFilterAsked = true;
@@ -41,6 +43,7 @@ void reportUnreadable(const QString& file)
 {
     desktop::msgBox("Message "_L1 + file + " unreadable, Please contact MarlinDesk Support."_L1,
                     desktop::Icon::Critical);
+    EnsureConnection();  // it may have been lost while the box was open
 }
 
 // Returns the number by which only one message of a request is listed, or null if the message has none.

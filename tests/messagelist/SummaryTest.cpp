@@ -141,6 +141,25 @@ TEST_F(MessageList, AFileThatHasGoneSinceTheListingIsPassedOver)
     EXPECT_EQ(shown(), "");
 }
 
+TEST_F(MessageList, ALostConnectionEndsTheFillUnlessABoxGivesTimeToOpenIt)
+{
+    quote("500").request("QR1").quoteNumber("KQ1");
+    car("ABC123");
+    for (const Message& message : {cancellation("QR1"), quoteDeletion("KQ1"), quoteMatch("500")}) {
+        arrive("b.xml", message);
+        const std::string whole = filled();
+        dropConnection();
+        EXPECT_EQ(failureOf([&] { filled(); }), CannotOpen) << whole;
+        arrive("a.xml", "<");
+        EXPECT_EQ(filled(), whole) << "after the box";
+        files::remove(gsUnreadPath + u"a.xml"_s);
+    }
+    for (int number = 0; number < 26; ++number)
+        files::write(gsReadPath + QString::number(number) + u".xml"_s, cancellation("QR1").text());
+    dropConnection();
+    EXPECT_NE(filled(MessageFolder::Read).find("25.xml: Quote Request Cancellation|ABC123|"), std::string::npos);
+}
+
 TEST_F(MessageList, ARequestWaitsUnreadForAllItsPictures)
 {
     arrive("in.xml", quoteRequest("QR1").images({"1", " ", "22"}));
