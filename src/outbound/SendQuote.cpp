@@ -78,6 +78,7 @@ void tellOldTotals(const QuoteKey& key)
         u"Quote %1 is sent, but its totals could not be stored. The error log says why. Check the totals in the "
         "estimating program."_s.arg(key.reference()),
         desktop::Icon::Exclamation);
+    EnsureConnection();  // it may have been lost while the box was open
 }
 
 void tellGonePictures(const QuoteKey& key, const QStringList& gone)

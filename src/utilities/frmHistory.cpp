@@ -242,6 +242,7 @@ void frmHistory::cmdUndo_Click()
     EnsureConnection();
     const desktop::WaitPointer pointer(u"Undoing the load..."_s);
     const auto showUndone = [this] {
+        EnsureConnection();  // it may have been lost while a box of the undo was open
         isUndone = true;
         changes.clear();  // they say now which were taken back
         fill();

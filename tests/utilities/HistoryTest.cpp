@@ -141,6 +141,20 @@ TEST_F(History, UndoesTheChosenLoad)
     EXPECT_TRUE(shown().ends_with("half done\n[information] Quote 500/0 no longer exists."));
 }
 
+TEST_F(History, IsShownAgainIfTheConnectionIsLostInABoxOfTheUndo)
+{
+    change("a.xml", {u"CLAIM='C2'"_s}, "QTNNO='500'");
+    const auto press = [](QDialog& window) {
+        gestures::press(window, Qt::ALT | Qt::Key_U);
+        EXPECT_EQ(operations(window), "LOAD OF A.XML DONE\n");
+    };
+    open(press, [](qint64) {
+        dropConnection();
+        return true;
+    });
+    EXPECT_EQ(shown(), "");
+}
+
 TEST_F(History, SaysWhyItIsEmpty)
 {
     open([](QDialog& window) { EXPECT_EQ(status(window), "Nothing is recorded for quote 500."); });
