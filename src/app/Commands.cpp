@@ -32,6 +32,7 @@
 #include <QFile>
 #include <QFileInfo>
 #include <QJsonDocument>
+#include <QRegularExpression>
 #include <QScopeGuard>
 
 #include <cstdio>
@@ -119,6 +120,13 @@ bool isPassword(const QString& setting)
     return setting.endsWith(u"Pwd"_s, Qt::CaseInsensitive);
 }
 
+/// Whether a setting is a password or contains one, as options of a driver can.
+bool isSecret(const QString& setting, const QString& value)
+{
+    static const QRegularExpression password(u"\\b(pwd|password)\\s*="_s, QRegularExpression::CaseInsensitiveOption);
+    return isPassword(setting) || (setting.endsWith(u"OdbcOptions"_s, Qt::CaseInsensitive) && value.contains(password));
+}
+
 QJsonArray settingsAsJson()
 {
     QJsonArray all;
@@ -126,10 +134,11 @@ QJsonArray settingsAsJson()
         static const std::map<settings::Hive, QString> hives{{settings::Hive::ClassesRoot, u"HKEY_CLASSES_ROOT"_s},
                                                              {settings::Hive::CurrentUser, u"HKEY_CURRENT_USER"_s},
                                                              {settings::Hive::LocalMachine, u"HKEY_LOCAL_MACHINE"_s}};
-        all.append(QJsonObject{{u"hive"_s, hives.at(entry.hive)},
-                               {u"key"_s, entry.key},
-                               {u"name"_s, entry.name},
-                               {u"value"_s, isPassword(entry.name) ? u"(not shown)"_s : entry.value.data}});
+        all.append(
+            QJsonObject{{u"hive"_s, hives.at(entry.hive)},
+                        {u"key"_s, entry.key},
+                        {u"name"_s, entry.name},
+                        {u"value"_s, isSecret(entry.name, entry.value.data) ? u"(not shown)"_s : entry.value.data}});
     }
     return all;
 }
@@ -193,13 +202,15 @@ Outcome setting(const QStringList& arguments)
     const QString key = u"SOFTWARE\\"_s + arguments[1] + u'\\' + arguments[2];
     const QString& name = arguments[3];
     if (what == u"get"_s && arguments.size() == 4) {
-        if (isPassword(name))
-            return refused(u"a password is not shown"_s, Refused);
         const QString value = RegGetValue(settings::Hive::LocalMachine, key, name);
+        if (isSecret(name, value))
+            return refused(u"a password is not shown"_s, Refused);
         return {.fields = {{u"value"_s, value}}, .text = value + u'\n'};
     }
     if (what != u"set"_s || arguments.size() != (isPassword(name) ? 4 : 5))
         return wrong();
+    if (!isPassword(name) && isSecret(name, arguments[4]))
+        return refused(u"options must not contain a password: set SAPwd or TabletMasterSAPwd"_s, Refused);
     if (!isPassword(name))
         return setSetting(key, name, arguments[4]);
     const std::optional<QString> password = passwordFromInput();

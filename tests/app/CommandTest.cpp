@@ -163,6 +163,9 @@ TEST_F(Command, AScriptChangesNothingThatDialogsRememberForAPerson)
 
 TEST_F(Command, NoSettingShowsAPassword)
 {
+    ASSERT_TRUE(settings::setValue(settings::Hive::LocalMachine, u"SOFTWARE\\wirra32\\frmsplash"_s,
+                                   u"TabletMasterOdbcOptions"_s,
+                                   {settings::Type::Text, u"Port=1;password = s3cret"_s}));
     for (const auto& [words, code] : casesIn<2>("app/secrets.txt")) {
         const Ended ended = kest2(words);
         EXPECT_EQ(ended.exitCode, code.toInt()) << words;
