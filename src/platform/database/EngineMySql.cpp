@@ -4,10 +4,10 @@
 #include "platform/database/MySqlServer.h"
 #include "platform/database/QtSqlEngine.h"
 
-#include <QLibrary>
 #include <QSqlDriver>
 #include <QSqlError>
 
+#include <dlfcn.h>
 #include <sys/socket.h>
 
 #include <chrono>
@@ -23,11 +23,13 @@ namespace {
 constexpr int answerSeconds = 4;  // for each step of opening a connection, and for a statement that takes no time
 constexpr int graceSeconds = 5;   // more than the limit that the server observes itself
 
-/// Returns the socket of an open connection, or -1 if the library of its driver is unknown.
+/// Returns the socket of an open connection, or -1 if its driver does not use MariaDB's library, because the
+/// connection of another one has another layout.
 int socketOf(const QSqlDriver& driver)
 {
     using GetSocket = int (*)(void* connection);
-    const auto get = reinterpret_cast<GetSocket>(QLibrary::resolve(u"mariadb"_s, 3, "mysql_get_socket"));
+    void* library = ::dlopen("libmariadb.so.3", RTLD_LAZY | RTLD_NOLOAD);
+    const auto get = library ? reinterpret_cast<GetSocket>(::dlsym(library, "mysql_get_socket")) : nullptr;
     const QVariant handle = driver.handle();
     return get ? get(*static_cast<void* const*>(handle.constData())) : -1;
 }
