@@ -81,7 +81,7 @@ int notDone(const frmMessageList& window, const QString& buttonName, const QStri
     return refused(caption + u" does nothing with "_s + file, Refused).exitCode;
 }
 
-/// Adds why the fill of the list has ended early, if it has.
+/// Adds why the fill of the list has ended early or values are missing, if so.
 Outcome unlessFailed(const frmMessageList& window, Outcome outcome)
 {
     if (!window.failure().isEmpty()) {

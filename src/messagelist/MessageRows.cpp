@@ -41,17 +41,22 @@ bool suffices(const db::Recordset& rows, RowsNeeded needed)
     return needed == RowsNeeded::ExactlyOne ? rows.recordCount() == 1 : rows.recordCount() >= 1;
 }
 
-// Ignores the failure of a step: the row stands with what was found. But a lost connection ends the fill, because it
-// would empty all the following rows.
+QString rowFailure;
+
+// Ignores the failure of a step: the row stands with what was found. A lost connection is remembered, because it
+// empties all the following rows too.
 template <class Step>
 void attemptForRow(Step&& step)
 {
-    try {
-        step();
-    } catch (const RuntimeError& error) {
-        if (error.number() == CannotOpen)
+    attempt([&] {
+        try {
+            step();
+        } catch (const RuntimeError& error) {
+            if (error.number() == CannotOpen)
+                rowFailure = error.description();
             throw;
-    }
+        }
+    });
 }
 
 // If the value can't be read, it stays as it is.
@@ -248,6 +253,11 @@ MessageRow GetMarkerRow(const xml::Document& marker, const QString& typeName)
     });
     dashWhereEmpty(row, {RegoField, ClaimField, CustomerField, QuoteField, VehicleField});
     return row;
+}
+
+QString takeRowFailure()
+{
+    return std::exchange(rowFailure, {});
 }
 
 KeptNames::KeptNames()

@@ -12,15 +12,17 @@ namespace kest {
 /// Message type, rego, claim number, customer, quote number, vehicle description.
 using MessageRow = std::array<QString, 6>;
 
-/// Returns the row of a network message or, if `typeName` is "SENT", of a wrapped outbound document. A value
-/// that can't be read stays empty or becomes "-". Throws CannotOpen if the connection is lost.
+/// Returns the row of a network message or, if `typeName` is "SENT", of a wrapped outbound document. Never throws: a
+/// value that can't be read stays empty or becomes "-".
 MessageRow GetMessageRow(const QString& text, const QString& typeName);
-/// Returns the row of a marker, such as a notice that a quote was sent twice. Throws CannotOpen if the
-/// connection is lost.
+/// Returns the row of a marker, such as a notice that a quote was sent twice. Never throws.
 MessageRow GetMarkerRow(const QString& text, const QString& typeName);
 /// The same for a text that has already been prepared and parsed.
 MessageRow GetMessageRow(const xml::Document& message, const QString& typeName);
 MessageRow GetMarkerRow(const xml::Document& marker, const QString& typeName);
+
+/// Returns why values are missing in the rows since the last call, if the connection was lost; otherwise an empty text.
+QString takeRowFailure();
 
 /// While an object exists, the names of customers and vehicles that were asked for are kept, because the rows of a list
 /// share many of them.

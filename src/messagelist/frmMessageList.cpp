@@ -180,7 +180,9 @@ void frmMessageList::fill()
         try {
             EnsureConnection();
             recovery::settle();
+            takeRowFailure();
             listed = BuildMessageList(iFolder, hooks);
+            fillFailure = takeRowFailure();
         } catch (const RuntimeError& error) {
             fillFailure = error.description();
             heldBack.clear();
@@ -204,7 +206,8 @@ const QList<ListedMessage>& frmMessageList::rows() const
 QString frmMessageList::status() const
 {
     if (!fillFailure.isEmpty())
-        return "The list could not be filled: "_L1 + fillFailure;
+        return (rows().isEmpty() ? "The list could not be filled: "_L1 : "Values are missing in the list: "_L1) +
+               fillFailure;
     const QString matching = gsListFilter.isEmpty() ? QString() : u" with \"%1\" in their name"_s.arg(gsListFilter);
     const qsizetype all = rows().size();
     if (all == 0 && !isStopped)

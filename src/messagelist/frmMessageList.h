@@ -40,7 +40,7 @@ public:
 
     /// Returns all rows of the last fill, even those that the search hides.
     const QList<ListedMessage>& rows() const;
-    /// Returns why the last fill ended early, or an empty text if it did not.
+    /// Returns why the last fill ended early or values are missing, or an empty text if it is complete.
     const QString& failure() const { return fillFailure; }
     /// Returns the messages that the last fill of the unread folder held back.
     const QList<HeldMessage>& heldMessages() const { return heldBack; }
