@@ -65,14 +65,29 @@ QList<journal::Entry> inOrder(QList<journal::Entry> pending)
     return pending;
 }
 
+QSet<QString> loggedFailures;  // since work was last settled without one
+
 /// Logs a failure once, not at each fill.
 void logOnce(const RuntimeError& error)
 {
-    static QSet<QString> logged;
-    if (logged.contains(error.description()))
+    if (loggedFailures.contains(error.description()))
         return;
-    logged.insert(error.description());
+    loggedFailures.insert(error.description());
     logFailure(error, source);
+}
+
+/// Returns false if the step failed. `what` is what could not be done.
+template <class Step>
+bool attemptAndLog(const QString& what, Step&& step)
+{
+    return attempt([&] {
+        try {
+            step();
+        } catch (const RuntimeError& error) {
+            logOnce(RuntimeError(error.number(), what + error.description()));
+            throw;
+        }
+    });
 }
 
 void tell(Settled settled)
@@ -208,18 +223,13 @@ void settle(const QString& lockedFile)
     if (journal::isAtWork() || !journal::isKept())
         return;
     QList<journal::Entry> pending;
-    attempt([&] { pending = journal::pendingOperations(); });
-    for (const journal::Entry& entry : inOrder(pending)) {
-        attempt([&] {
-            try {
-                settleAlone(entry, lockedFile);
-            } catch (const RuntimeError& error) {
-                const QString what = u"The %1 could not be settled yet: %2"_s;
-                logOnce(RuntimeError(error.number(), what.arg(journal::titleOf(entry), error.description())));
-                throw;
-            }
-        });
-    }
+    bool isAllSettled =
+        attemptAndLog(u"Interrupted work could not be looked for: "_s, [&] { pending = journal::pendingOperations(); });
+    for (const journal::Entry& entry : inOrder(pending))
+        isAllSettled &= attemptAndLog(u"The %1 could not be settled yet: "_s.arg(journal::titleOf(entry)),
+                                      [&] { settleAlone(entry, lockedFile); });
+    if (isAllSettled)
+        loggedFailures.clear();
 }
 
 QList<Settled> takeSettled()

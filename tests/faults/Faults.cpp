@@ -153,6 +153,9 @@ private:
     bool killAt(int number);
     void takeSeat();
     std::string shop() const { return numbered(work.result ? work.result() : holdings()); }
+    /// Returns whether a box or a sentence was shown that the undisturbed work does not show. The count below the list
+    /// tells nothing.
+    bool tellsMore(const QString& shown) const;
     /// Returns the differences that no known deviation explains.
     QStringList unexplained(Fault fault, const QString& account, QStringList differences);
 
@@ -228,6 +231,19 @@ bool Trial::killAt(int number)
     return WEXITSTATUS(status) == 0;
 }
 
+bool Trial::tellsMore(const QString& shown) const
+{
+    const auto sentences = [](QString text) {
+        static const QRegularExpression count(u"(No unread messages|\\d+ messages?)$"_s,
+                                              QRegularExpression::MultilineOption);
+        return text.remove(count).split(u'\n', Qt::SkipEmptyParts);
+    };
+    QStringList more = sentences(shown);
+    for (const QString& sentence : sentences(undisturbed))
+        more.removeOne(sentence);
+    return !more.isEmpty();
+}
+
 QStringList Trial::unexplained(Fault fault, const QString& account, QStringList differences)
 {
     for (Deviation& deviation : known) {
@@ -253,7 +269,7 @@ bool Trial::disturb(Fault fault, int number)
         isReached = killAt(number);
     else
         first = run(fault, number);
-    const bool isTold = first != undisturbed || logSize() > logBefore;
+    const bool isTold = fault == Fault::Kill || tellsMore(first) || logSize() > logBefore;
     const bool isDone = work.isDone();
     attempt([] { Faults::openList(); });  // this takes interrupted work back, or finishes it
     const QString second = work.isDone() ? QString() : run();
@@ -303,13 +319,13 @@ static void open(frmMessageList& window, const std::function<void()>& then)
 
 QStringList Faults::openList()
 {
-    QStringList files;
+    QStringList rows;
     frmMessageList window;
     open(window, [&] {
         for (const ListedMessage& message : window.rows())
-            files << message.file;
+            rows << message.file + u'|' + QStringList(message.row.begin(), message.row.end()).join(u'|');
     });
-    return files;
+    return rows;
 }
 
 void Faults::loadFirst()

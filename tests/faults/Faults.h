@@ -22,7 +22,7 @@ struct Work {
 /// tenth call has each other fault.
 class Faults : public Shop {
 public:
-    /// Opens the list of messages and returns its files.
+    /// Opens the list of messages and returns its rows.
     static QStringList openList();
     /// Opens the list of messages, and loads the first one.
     static void loadFirst();

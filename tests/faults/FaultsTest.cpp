@@ -121,12 +121,13 @@ TEST_F(Others, Fill)
     arrive("a.xml", quoteRequest("QR2"));
     arrive("b.xml", cancellation("QR1"));
     arrive("c.xml", "<a>&</a>");
+    const QString whole = u"b.xml|Quote Request Cancellation|ABC123|7700001|Ms Kim Holloway|500|CORELLA MERIDIAN GL"_s;
     static QStringList rows;
     survives(u"Fill"_s, {[] {
                              rows.clear();
                              rows = openList();
                          },
-                         [] { return rows.size() == 3; }});
+                         [whole] { return rows.size() == 3 && rows.contains(whole); }});
 }
 
 TEST_F(Others, Move)
