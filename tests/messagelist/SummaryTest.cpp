@@ -143,18 +143,14 @@ TEST_F(MessageList, AFileThatHasGoneSinceTheListingIsPassedOver)
 
 TEST_F(MessageList, ALostConnectionIsToldUnlessABoxGivesTimeToOpenIt)
 {
-    quote("500").request("QR1").quoteNumber("KQ1");
-    car("ABC123");
-    for (const Message& message : {cancellation("QR1"), quoteDeletion("KQ1"), quoteMatch("500")}) {
-        arrive("b.xml", message);
-        const std::string whole = filled();
-        dropConnection();
-        filled();
-        EXPECT_FALSE(takeRowFailure().isEmpty()) << whole;
-        arrive("a.xml", "<");
-        EXPECT_EQ(filled() + takeRowFailure().toStdString(), whole) << "after the box";
-        files::remove(gsUnreadPath + u"a.xml"_s);
-    }
+    quote("500").request("QR1");
+    arrive("b.xml", cancellation("QR1"));
+    const std::string whole = filled();
+    dropConnection();
+    EXPECT_NE(filled(), whole);
+    EXPECT_FALSE(takeRowFailure().isEmpty());
+    arrive("a.xml", "<");
+    EXPECT_EQ(filled() + takeRowFailure().toStdString(), whole) << "after the box";
     for (int number = 0; number < 26; ++number)
         files::write(gsReadPath + QString::number(number) + u".xml"_s, cancellation("QR1").text());
     dropConnection();
