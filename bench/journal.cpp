@@ -92,7 +92,7 @@ int main(int argumentCount, char** arguments)
                                u"/bench-XXXXXX"_s);  // on a disk, because each change is committed
     kest::profile::setRoot(folder.path());
     kest::gcnDB = kest::gConn = kest::app::openEmbedded(u"WirSql"_s);
-    kest::app::createTables(*kest::gConn, kest::app::Dialect::Embedded);
+    kest::app::createTables(*kest::gConn, kest::app::Server::Embedded);
     kest::app::fillNewShop(*kest::gConn);
     kest::journal::watch(kest::gConn);
     kest::measure();

@@ -36,7 +36,7 @@ public:
         }
         gsListFolder = gsUnreadPath;
         gcnDB = gConn = app::openEmbedded(u"WirSql"_s);
-        app::createTables(*gConn, app::Dialect::Embedded);
+        app::createTables(*gConn, app::Server::Embedded);
         app::fillNewShop(*gConn);
         runPlain(u"INSERT INTO CAR (REGO, CUST_ID, KEST) VALUES ('ABC123', 1, 1)"_s);
         runPlain(u"BEGIN"_s);

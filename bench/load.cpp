@@ -33,7 +33,7 @@ public:
             *variable = path;
         }
         gcnDB = gConn = app::openEmbedded(u"WirSql"_s);
-        app::createTables(*gConn, app::Dialect::Embedded);
+        app::createTables(*gConn, app::Server::Embedded);
         app::fillNewShop(*gConn);
     }
 

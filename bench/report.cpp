@@ -34,7 +34,7 @@ public:
         profile::setRoot(folder.path());
         files::makeFolder(folder.path() + u"/databases"_s);
         gcnDB = gConn = app::openEmbedded(u"WirSql"_s);
-        app::createTables(*gConn, app::Dialect::Embedded);
+        app::createTables(*gConn, app::Server::Embedded);
         app::fillNewShop(*gConn);
         gConn->execute(
             u"INSERT INTO QUOTE1 (QTNNO, Subquote, KESTQRNo, excess, contri) VALUES ('500', 0, 'QR1', 0, 0)"_s);

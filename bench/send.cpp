@@ -43,7 +43,7 @@ public:
             *variable = path;
         }
         gcnDB = gConn = app::openEmbedded(u"WirSql"_s);
-        app::createTables(*gConn, app::Dialect::Embedded);
+        app::createTables(*gConn, app::Server::Embedded);
         app::fillNewShop(*gConn);
         runPlain(u"INSERT INTO ALLMODEL (MODEL_ID, MAKE, MODEL) VALUES ('C120', 'CORELLA', 'MERIDIAN GL')"_s);
         runPlain(u"INSERT INTO CUSTOMER (CUST_ID, NAME, FIRSTNAME, SALUTATION) VALUES (1, 'Holloway', 'Kim', 'Ms')"_s);

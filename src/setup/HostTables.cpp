@@ -56,7 +56,7 @@ QList<db::TableInfo> ownTables()
     static const QRegularExpression column(u"^\\s*(\\w+)\\s+(\\w+)(?:\\((\\d+)\\))?([^,\\n]*)"_s,
                                            QRegularExpression::MultilineOption);
     QList<db::TableInfo> tables;
-    for (const QString& statement : schemaStatements(Dialect::Embedded)) {
+    for (const QString& statement : schemaStatements(Server::Embedded)) {
         const QRegularExpressionMatch found = table.match(statement);
         if (!found.hasMatch())
             continue;

@@ -1,14 +1,11 @@
 // Compares the quote tables that a host made with those that the component uses. Reads only.
 #pragma once
 
-#include "platform/database/Connection.h"
+#include "setup/QuoteDatabase.h"
 
 #include <QStringList>
 
 namespace kest::app {
-
-/// A kind of server. MySql is also MariaDB, and either of them through ODBC.
-enum class Server { Embedded, MySql, SqlServer };
 
 /// Returns the kind of server at the other end of a connection.
 Server serverOf(const db::ConnectionPtr& connection);

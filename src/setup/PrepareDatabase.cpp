@@ -76,10 +76,7 @@ bool isServed(const Index& wanted, const QList<ExistingIndex>& existing)
 /// Returns the statements that create what the journal lacks, of which another attempt may have created a part.
 QStringList missingOfJournal(const db::ConnectionPtr& connection, const QList<ExistingIndex>& existing)
 {
-    const Server server = serverOf(connection);
-    const QStringList statements = journalStatements(server == Server::Embedded ? Dialect::Embedded
-                                                     : server == Server::MySql  ? Dialect::MariaDb
-                                                                                : Dialect::SqlServer);
+    const QStringList statements = journalStatements(serverOf(connection));
     QStringList there;
     for (const Index& index : indexesIn(statements))
         if (isServed(index, existing))

@@ -104,7 +104,7 @@ void makeDatabase(Shop shop, const QDate& today)
         files::remove(profile::root() + u"/databases/"_s + leftOver);
     const db::ConnectionPtr database = openEmbedded(unfinished);
     database->execute(u"BEGIN"_s);  // one write to the disk instead of hundreds
-    createTables(*database, Dialect::Embedded);
+    createTables(*database, Server::Embedded);
     fillNewShop(*database);
     if (shop == Shop::Demo)
         fillDemoShop(*database, today);

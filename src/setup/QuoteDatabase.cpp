@@ -35,6 +35,15 @@ void run(db::Connection& database, const QString& text)
         database.execute(statement);
 }
 
+/// Returns the statements of a script that differs by the kind of server.
+QStringList statementsFor(Server server, const QString& what)
+{
+    const QString kind = server == Server::Embedded ? u"embedded"_s
+                         : server == Server::MySql  ? u"mariadb"_s
+                                                    : u"sqlserver"_s;
+    return statementsIn(script(u"%1-%2.sql"_s.arg(what, kind)));
+}
+
 }  // namespace
 
 void registerResources()
@@ -42,18 +51,18 @@ void registerResources()
     registerFiles();
 }
 
-QStringList schemaStatements(Dialect dialect)
+QStringList schemaStatements(Server server)
 {
-    return statementsIn(script(dialect == Dialect::Embedded ? u"quote-embedded.sql"_s : u"quote-mariadb.sql"_s));
+    return statementsFor(server, u"quote"_s);
 }
 
-void createTables(db::Connection& database, Dialect dialect)
+void createTables(db::Connection& database, Server server)
 {
-    for (const QString& statement : schemaStatements(dialect))
+    for (const QString& statement : schemaStatements(server))
         database.execute(statement);
     for (const Index& index : quoteIndexes())
         database.execute(index.statement);
-    createJournal(database, dialect);
+    createJournal(database, server);
 }
 
 QList<Index> indexesIn(const QStringList& statements)
@@ -80,16 +89,14 @@ void repairIndexes(db::Connection& database)
         database.execute(QString(index.statement).replace("INDEX "_L1, "INDEX IF NOT EXISTS "_L1));
 }
 
-QStringList journalStatements(Dialect dialect)
+QStringList journalStatements(Server server)
 {
-    return statementsIn(script(dialect == Dialect::Embedded  ? u"journal-embedded.sql"_s
-                               : dialect == Dialect::MariaDb ? u"journal-mariadb.sql"_s
-                                                             : u"journal-sqlserver.sql"_s));
+    return statementsFor(server, u"journal"_s);
 }
 
-void createJournal(db::Connection& database, Dialect dialect)
+void createJournal(db::Connection& database, Server server)
 {
-    for (const QString& statement : journalStatements(dialect))
+    for (const QString& statement : journalStatements(server))
         database.execute(statement);
 }
 

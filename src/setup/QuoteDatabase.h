@@ -10,7 +10,8 @@
 
 namespace kest::app {
 
-enum class Dialect { Embedded, MariaDb, SqlServer };
+/// A kind of server. MySql is also MariaDB, and either of them through ODBC.
+enum class Server { Embedded, MySql, SqlServer };
 
 /// An index of the quote database.
 struct Index {
@@ -28,14 +29,15 @@ QList<Index> quoteIndexes();
 void repairIndexes(db::Connection& database);
 
 /// Returns the statements that create the tables of the journal.
-QStringList journalStatements(Dialect dialect);
+QStringList journalStatements(Server server);
 /// Creates them.
-void createJournal(db::Connection& database, Dialect dialect);
+void createJournal(db::Connection& database, Server server);
 
-/// Returns the statements that create all tables of a quote database, which on SQL Server only the host creates.
-QStringList schemaStatements(Dialect dialect);
+/// Returns the statements that create all tables of a quote database. Throws for SQL Server, because there only the
+/// host creates them.
+QStringList schemaStatements(Server server);
 /// Creates all tables and indexes in an empty database.
-void createTables(db::Connection& database, Dialect dialect);
+void createTables(db::Connection& database, Server server);
 /// Adds what a host stores before the first quote: settings, stages, colours and the network's insurer.
 void fillNewShop(db::Connection& database);
 /// Adds quotes in every state of their network life, with cars, customers and vendors. Their dates are relative to

@@ -113,11 +113,11 @@ TEST_P(Agreement, AQueryFindsTheSameRowsOnBothEngines)
 TEST_P(Agreement, TheComponentsStatementsMeanTheSameOnBothEngines)
 {
     const db::ConnectionPtr embedded = app::openEmbedded(u"quotes"_s);
-    app::createTables(*embedded, app::Dialect::Embedded);
+    app::createTables(*embedded, app::Server::Embedded);
     mariaDb().createDatabase(u"quotes"_s, {});
     connection = std::make_shared<db::Connection>();
     connection->open(mariaDb().connectionText(u"quotes"_s));
-    app::createTables(*connection, app::Dialect::MariaDb);
+    app::createTables(*connection, app::Server::MySql);
     for (const db::ConnectionPtr& engine : {connection, embedded}) {
         app::fillNewShop(*engine);
         app::fillDemoShop(*engine, QDate(2026, 2, 28));

@@ -132,7 +132,7 @@ TEST(IncompleteDatabase, EachMissingTableAndColumnIsNamed)
     const TestProfile profile;
     const auto connect = [] { return app::openEmbedded(u"incomplete"_s); };
     const db::ConnectionPtr database = connect();
-    app::createTables(*database, app::Dialect::Embedded);
+    app::createTables(*database, app::Server::Embedded);
     database->execute(u"DROP TABLE SUBLET"_s);
     database->execute(u"DROP TABLE KESTColours"_s);
     database->execute(u"CREATE TABLE KESTColours (Code VARCHAR(10), Script DATETIME)"_s);

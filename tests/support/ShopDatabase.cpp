@@ -31,7 +31,7 @@ static void fillShop(db::Connection& database)
 static QByteArray newShopFile()
 {
     const db::ConnectionPtr database = app::openEmbedded(shopName);
-    app::createTables(*database, app::Dialect::Embedded);
+    app::createTables(*database, app::Server::Embedded);
     fillShop(*database);
     database->close();
     return files::readBytes(app::embeddedFile(shopName));
@@ -74,7 +74,7 @@ public:
         for (const QString& name : {shop, saved, fresh})
             mariaDb().createDatabase(name);
         administrator->open(mariaDb().connectionText(fresh));
-        app::createTables(*administrator, app::Dialect::MariaDb);
+        app::createTables(*administrator, app::Server::MySql);
         fillShop(*administrator);
         db::Recordset names(administrator);
         names.open(u"SELECT TABLE_NAME, AUTO_INCREMENT FROM INFORMATION_SCHEMA.TABLES WHERE TABLE_SCHEMA=DATABASE()"_s);
@@ -115,7 +115,7 @@ public:
         for (const QString& name : {shop, saved})
             tdsServer().createDatabase(name);
         tdsServer().createDatabase(fresh,
-                                   TdsServer::schemaOf(app::schemaStatements(app::Dialect::MariaDb).join(u";\n"_s)));
+                                   TdsServer::schemaOf(app::schemaStatements(app::Server::MySql).join(u";\n"_s)));
         administrator->open(tdsServer().connectionText(fresh));
         fillShop(*administrator);
         app::createParts(administrator, app::missingParts(administrator));
