@@ -134,7 +134,7 @@ QWidget* frmUtilities::setQuoteStatus()
     for (const StatusRepair& repair : statusRepairs()) {
         if (repair.startsGroup)
             row->addSpacing(desktop::pixels(600));
-        row->addWidget(Form::button(repair.button, repair.caption, [this, &repair] { SetStatus(repair); }));
+        row->addWidget(Form::button(repair.button, repair.caption, [this, &repair] { setStatus(repair); }));
     }
     row->addStretch();
     return frame;
@@ -182,13 +182,13 @@ void frmUtilities::ShowForm(const QString& sQTNNO, const QString& sSubQuote, con
 {
     EnsureConnection();
     frmUtilities form({sQTNNO, sSubQuote.isEmpty() ? u"0"_s : sSubQuote}, undoLoad);
-    form.AddTabs();
-    form.OpenRows();
-    form.Fill();
+    form.addTabs();
+    form.openRows();
+    form.fill();
     desktop::showModal(form);
 }
 
-void frmUtilities::AddTabs()
+void frmUtilities::addTabs()
 {
     const auto add = [this](const QString& caption, const QString& ofSubquote) {
         TabStrip1->setTabData(TabStrip1->addTab(caption), u'S' + ofSubquote);
@@ -208,21 +208,21 @@ void frmUtilities::AddTabs()
     on(TabStrip1, &QTabBar::currentChanged, u"TabStrip1_Click"_s, [this] { TabStrip1_Click(); });
 }
 
-void frmUtilities::OpenRows()
+void frmUtilities::openRows()
 {
     quote = Quote::openHeader(shown);
     lines = Quote::openLines(shown);
     remarks = Quote::openNotes(shown);
 }
 
-void frmUtilities::CloseRows()
+void frmUtilities::closeRows()
 {
     quote.close();
     lines.close();
     remarks.close();
 }
 
-void frmUtilities::Fill()
+void frmUtilities::fill()
 {
     for (const Field& field : fields) {
         if (!field.column.isEmpty())
@@ -256,9 +256,9 @@ void frmUtilities::TabStrip1_Click()
 
 void frmUtilities::Command9_Click()
 {
-    CloseRows();
-    OpenRows();
-    Fill();
+    closeRows();
+    openRows();
+    fill();
 }
 
 void frmUtilities::Command1_Click()
@@ -268,20 +268,20 @@ void frmUtilities::Command1_Click()
         box("txtClaimNo"_L1)->setFocus();
         return;
     }
-    WriteQuote();
-    WriteRemarks();
+    writeQuote();
+    writeRemarks();
     journal::Operation operation(journal::Kind::Save);
     quote.update();
     journal::passPoint([&] { remarks.update(); });
     operation.end(journal::State::Done);
-    CloseRows();
+    closeRows();
     close();  // first: the changes are saved even if the host's quote can't be opened
 
     // even if another subquote was edited
     grsQuote = std::make_shared<db::Recordset>(Quote::openHeader({gsQTNNO, gsSubQuote}));
 }
 
-void frmUtilities::WriteField(QLatin1StringView name, const QString& column)
+void frmUtilities::writeField(QLatin1StringView name, const QString& column)
 {
     const QString text = box(name)->text();
     const bool noDate = column == "AuthDate"_L1 && text.isEmpty();
@@ -293,17 +293,17 @@ void frmUtilities::WriteField(QLatin1StringView name, const QString& column)
     }
 }
 
-void frmUtilities::WriteQuote()
+void frmUtilities::writeQuote()
 {
     for (const Field& field : fields) {
         if (field.editable)
-            WriteField(field.name, field.column);
+            writeField(field.name, field.column);
     }
     quote.set(u"ReadOnly"_s, chkReadOnly->isChecked());
     quote.set(u"ExtraInfo"_s, chkExtraInfo->isChecked());
 }
 
-void frmUtilities::WriteRemarks()
+void frmUtilities::writeRemarks()
 {
     const QString text = txtRemarks->exactText();
     if (remarks.eof()) {
@@ -318,7 +318,7 @@ void frmUtilities::WriteRemarks()
 
 void frmUtilities::Command2_Click()
 {
-    CloseRows();
+    closeRows();
     close();
 }
 
@@ -332,7 +332,7 @@ void frmUtilities::cmdHistory_Click()
     Command2_Click();
 }
 
-void frmUtilities::SetStatus(const StatusRepair& repair)
+void frmUtilities::setStatus(const StatusRepair& repair)
 {
     chkReadOnly->setChecked(repair.locks);
     QString chain = txtRemarks->exactText();

@@ -36,20 +36,20 @@ private:
     QPushButton* button(const QString& name, const QString& caption, void (frmUtilities::*click)());
     QLineEdit* box(QLatin1StringView name) const;
 
-    void AddTabs();
-    void OpenRows();
-    void CloseRows();
-    void Fill();
-    void WriteField(QLatin1StringView name, const QString& column);
-    void WriteQuote();
-    void WriteRemarks();
+    void addTabs();
+    void openRows();
+    void closeRows();
+    void fill();
+    void writeField(QLatin1StringView name, const QString& column);
+    void writeQuote();
+    void writeRemarks();
 
     void TabStrip1_Click();
     void Command1_Click();  // Save
     void Command2_Click();  // Close
     void Command9_Click();  // Undo
     void cmdHistory_Click();
-    void SetStatus(const StatusRepair& repair);
+    void setStatus(const StatusRepair& repair);
 
     frmHistory::Undo undoLoad;
     QuoteKey shown;  // not read from `quote`, because another user may delete the row
