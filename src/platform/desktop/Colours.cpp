@@ -36,7 +36,7 @@ public:
         area.setLineWidth(frameWidth);
         area.setForegroundRole(QPalette::WindowText);  // in which the frame is drawn; QGraphicsView has another one
         area.installEventFilter(this);
-        colour(false);
+        colour(area.hasFocus());
     }
 
 protected:

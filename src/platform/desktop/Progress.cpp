@@ -27,18 +27,20 @@ constexpr int pollInterval = 10;
 
 constexpr int steps = 100;
 
+enum class Bar { Absent, Present };  // a progress bar
+
 struct Wait {
     QString what;  // empty while a box or a window is up
-    bool hasBar;   // a progress bar says it
+    Bar bar;       // which says it
     QElapsedTimer since;
     int waited;  // milliseconds, before `since`
 };
 QList<Wait> waits;  // the last one is the innermost
 std::unique_ptr<QWidget> notice;
 
-void beginWait(const QString& what, bool hasBar = false, int waited = 0)
+void beginWait(const QString& what, Bar bar = Bar::Absent, int waited = 0)
 {
-    Wait wait{what, hasBar, {}, waited};
+    Wait wait{what, bar, {}, waited};
     wait.since.start();
     waits.append(wait);
 }
@@ -57,7 +59,7 @@ void takeAway(std::unique_ptr<QWidget>& window)
     QCoreApplication::processEvents(QEventLoop::ExcludeUserInputEvents);
 }
 
-std::unique_ptr<QWidget> makeWindow(const QString& caption, const QString& what, bool hasBar)
+std::unique_ptr<QWidget> makeWindow(const QString& caption, const QString& what, Bar wanted)
 {
     auto window = std::make_unique<QWidget>(nullptr, Qt::Dialog | Qt::CustomizeWindowHint | Qt::WindowTitleHint);
     window->setWindowTitle(caption);
@@ -65,7 +67,7 @@ std::unique_ptr<QWidget> makeWindow(const QString& caption, const QString& what,
     auto* label = new QLabel(what);
     label->setTextFormat(Qt::PlainText);
     layout->addWidget(label);
-    if (hasBar) {
+    if (wanted == Bar::Present) {
         auto* bar = new QProgressBar;
         bar->setAccessibleName(what);
         layout->addWidget(bar);
@@ -96,7 +98,7 @@ void putOnScreen(QWidget& window)
 WaitPointer::WaitPointer(const QString& what, int waited)
 {
     QGuiApplication::setOverrideCursor(Qt::WaitCursor);
-    beginWait(what, false, waited);
+    beginWait(what, Bar::Absent, waited);
 }
 
 WaitPointer::~WaitPointer()
@@ -111,9 +113,9 @@ void stillWaiting()
     if (notice || waits.isEmpty() || !isPersonPresent())
         return;
     const Wait& wait = waits.last();
-    if (wait.what.isEmpty() || wait.hasBar || wait.since.elapsed() + wait.waited < explained)
+    if (wait.what.isEmpty() || wait.bar == Bar::Present || wait.since.elapsed() + wait.waited < explained)
         return;
-    notice = makeWindow(defaultTitle(), wait.what, false);
+    notice = makeWindow(defaultTitle(), wait.what, Bar::Absent);
     putOnScreen(*notice);
 }
 
@@ -192,7 +194,7 @@ bool Progress::step(qint64 done, qint64 total)
 void Progress::show()
 {
     shown = true;
-    beginWait(what, true);
+    beginWait(what, Bar::Present);
     takeAway(notice);
     QGuiApplication::setOverrideCursor(Qt::WaitCursor);
     if (bar && bar->window()->isVisible()) {
@@ -200,7 +202,7 @@ void Progress::show()
         if (QLayout* layout = bar->window()->layout())
             layout->activate();
     } else if (isPersonPresent()) {
-        ownWindow = makeWindow(caption, what, true);
+        ownWindow = makeWindow(caption, what, Bar::Present);
         bar = ownWindow->findChild<QProgressBar*>();
         putOnScreen(*ownWindow);
     } else {
