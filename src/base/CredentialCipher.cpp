@@ -4,11 +4,11 @@
 #include "platform/files/CodePage.h"
 #include "platform/files/files.h"
 
+#include <QRegularExpression>
+
 #include <nettle/blowfish.h>
 
-#include <algorithm>
 #include <array>
-#include <cctype>
 
 namespace kest {
 
@@ -25,21 +25,14 @@ constexpr std::array<int, 36> keyCodes{211, 74,  158, 39,  226, 93,  180, 61,  1
 
 blowfish_ctx cipher{};
 
-quint8 byteOf(QStringView digits)
-{
-    const auto isHexDigit = [](QChar digit) { return digit.unicode() < 128 && std::isxdigit(digit.unicode()); };
-    if (!std::all_of(digits.begin(), digits.end(), isHexDigit))
-        throw RuntimeError(TypeMismatch, u"The stored text contains a pair that is not hexadecimal."_s);
-    return static_cast<quint8>(digits.toUInt(nullptr, 16));
-}
-
+/// Returns a byte for each pair of digits, and one for a single digit at the end.
 QByteArray bytesOf(const QString& hex)
 {
-    QByteArray bytes;
-    bytes.reserve(hex.size() / 2 + 1);
-    for (qsizetype i = 0; i < hex.size(); i += 2)
-        bytes.append(static_cast<char>(byteOf(QStringView(hex).mid(i, 2))));
-    return bytes;
+    static const QRegularExpression digits(u"\\A[0-9A-Fa-f]*\\z"_s);
+    if (!digits.match(hex).hasMatch())
+        throw RuntimeError(TypeMismatch, u"The stored text contains a pair that is not hexadecimal."_s);
+    const qsizetype paired = hex.size() / 2 * 2;
+    return QByteArray::fromHex(hex.left(paired).toLatin1()) + QByteArray::fromHex(hex.mid(paired).toLatin1());
 }
 
 quint8* raw(QByteArray& bytes)
