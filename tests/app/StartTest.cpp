@@ -64,7 +64,7 @@ static Hands::Work create(const QString& path)
     };
 }
 
-TEST_F(Start, AsksWhereTheShopIsToBeAndOpensIt)
+TEST_F(Start, OpensTheShopAtTheChosenPlace)
 {
     const QStringList both{u"frmProfile"_s, u"frmKEST"_s};
     const QString other = folder.path() + u"/other shop"_s;

@@ -61,7 +61,7 @@ TEST_F(JournalOfAShop, KeepsTheChangesOfALoadThatFailed)
     EXPECT_EQ(quote("500").text("CLAIM"), "C'1");
 }
 
-TEST_F(JournalOfAShop, WritesAChangeAndItsRecordTogetherOrNeither)
+TEST_F(JournalOfAShop, WritesAChangeTogetherWithItsRecord)
 {
     quote("500").claim("C1");
     db::Recordset row = opened(u"SELECT * FROM QUOTE1 WHERE QTNNO='500'"_s);

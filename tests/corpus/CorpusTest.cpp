@@ -73,7 +73,7 @@ std::vector<Hostile> corpusOf(const QString& target)
 
 class Corpus : public ::testing::TestWithParam<const char*> {};
 
-TEST_P(Corpus, CostsLittleAndChangesNothingElse)
+TEST_P(Corpus, DoesNoHarm)
 {
     if (memoryIsReal) {
         rlimit limit{};

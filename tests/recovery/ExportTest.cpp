@@ -9,7 +9,7 @@
 
 using InterruptedExport = Shop;
 
-TEST_F(InterruptedExport, IsMadeUnlessItHasBegunAndToldIfItIsNotComplete)
+TEST_F(InterruptedExport, IsMadeUnlessItHasBegun)
 {
     const struct {
         std::optional<int> status;  // of the job that the load has made, if its number is known

@@ -171,7 +171,7 @@ TEST_F(UndoOfALoad, IsRefusedWithTheReason)
     }
 }
 
-TEST_F(UndoOfALoad, AsksFirstAndSaysWhyItIsRefused)
+TEST_F(UndoOfALoad, AsksUnlessItMustRefuse)
 {
     const qint64 load = loaded(u"m.xml"_s, authorisation());
     const std::string before = holdings();

@@ -207,7 +207,7 @@ TEST_F(Preview, TheViewerFillsTheWindowAboveItsButton)
     show(730, &rows);
 }
 
-TEST_F(Preview, ASaveOffersTheReportsNameAndTheLastFolderAndSaysWhatCannotBeWritten)
+TEST_F(Preview, ASaveGoesWhereThePersonSays)
 {
     db::Recordset rows = table(u"quote_ref=500/1 quote_type=AUTR comment=x"_s);
     const QString folder = root() + u"/chosen"_s;

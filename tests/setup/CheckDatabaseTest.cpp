@@ -32,7 +32,7 @@ struct CheckedDatabase : Shop {
     }
 };
 
-TEST_F(CheckedDatabase, HoldsAndIsLeftAsItWas)
+TEST_F(CheckedDatabase, PassesWithoutAChange)
 {
     quote("500").line(1);
     const QStringList before = tables();
@@ -56,7 +56,7 @@ TEST_F(CheckedDatabase, HoldsAndIsLeftAsItWas)
     EXPECT_EQ(holdings(), held);
 }
 
-TEST_F(CheckedDatabase, GetsTheIndexesThatItLacksAndKeepsThoseThatServe)
+TEST_F(CheckedDatabase, GetsOnlyThePartsThatItLacks)
 {
     const db::ConnectionPtr database = anotherConnection();
     app::createParts(database, app::missingParts(database));  // a server's may lack them, as a host's
@@ -115,7 +115,7 @@ TEST_F(CheckedDatabase, OnlyTriggersThatCanRunAreNoted)
               hasTriggers ? QStringList(u"CAR has the trigger WORKS"_s) : QStringList());
 }
 
-TEST_F(CheckedDatabase, AFailureOnTheWayIsToldAndLeavesNoTable)
+TEST_F(CheckedDatabase, AFailureOnTheWayLeavesNoTable)
 {
     const QStringList before = tables();
     constexpr int each = 31;
@@ -127,7 +127,7 @@ TEST_F(CheckedDatabase, AFailureOnTheWayIsToldAndLeavesNoTable)
     EXPECT_EQ(tables(), before);
 }
 
-TEST(IncompleteDatabase, EachMissingTableAndColumnIsNamed)
+TEST(IncompleteDatabase, EachMissingPartIsNamed)
 {
     const TestProfile profile;
     const auto connect = [] { return app::openEmbedded(u"incomplete"_s); };

@@ -143,7 +143,7 @@ TEST_F(NewShop, ItsTablesTakeWhatAHostWrites)
 }
 
 // A host's own profile, or one from before there were indexes.
-TEST_F(NewShop, GetsTheIndexesAndTablesThatItLacks)
+TEST_F(NewShop, GetsThePartsThatItLacks)
 {
     const QString ours = u"SELECT name FROM sqlite_master WHERE type='index' AND sql<>'' ORDER BY name"_s;
     const std::string all = column(ours);

@@ -88,7 +88,7 @@ TEST_F(Sublet, ADocumentThatContainsItselfIsRefused)
     EXPECT_EQ(windows().size(), 0);
 }
 
-TEST_F(Sublet, ASavedCopyIsNamedByItsQuoteAndLine)
+TEST_F(Sublet, ASavedCopyIsNamedAfterItsLine)
 {
     realDocument(u"500.2_7.pdf"_s);
     const QString folder = root() + uR"(/my\documents/)"_s;

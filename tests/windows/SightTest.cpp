@@ -70,7 +70,7 @@ static void setDesktop(const QPalette& colours)
     }
 }
 
-TEST_F(EveryWindow, CanBeReadOnDarkAndOnStarkDesktopsAndAfterAChange)
+TEST_F(EveryWindow, CanBeReadInTheColoursOfAnyDesktop)
 {
     const QPalette usual = QApplication::palette();
     QPalette stark(Qt::black, Qt::black);
@@ -114,7 +114,7 @@ TEST_F(EveryWindow, ShowsWhichControlHasTheFocus)
     });
 }
 
-TEST_F(EveryWindow, OffersButtonsAndCopyInTheMenuOfItsList)
+TEST_F(EveryWindow, OffersItsButtonsInTheMenuOfItsList)
 {
     each([](QDialog& window) {
         const QList<QTreeView*> lists = visible<QTreeView>(window);

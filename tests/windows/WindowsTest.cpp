@@ -115,7 +115,7 @@ TEST_F(EveryWindow, PressesTheButtonThatHasTheFocusByEnter)
     });
 }
 
-TEST_F(EveryWindow, TellsVersionProfileDatabaseAndLastErrorByF1)
+TEST_F(EveryWindow, TellsAboutItselfByF1)
 {
     logFailure(RuntimeError(FileNotFound, u"the last straw"_s), u"a test"_s);
     each([&](QDialog& window) {
@@ -133,7 +133,7 @@ TEST_F(EveryWindow, TellsVersionProfileDatabaseAndLastErrorByF1)
     });
 }
 
-TEST_F(EveryWindow, HasTextsAndRowsThatCanBeCopied)
+TEST_F(EveryWindow, HasTextsThatCanBeCopied)
 {
     const auto copied = [](QDialog& window) {
         QGuiApplication::clipboard()->clear();
@@ -174,11 +174,15 @@ TEST_F(EveryWindow, HasTextsAndRowsThatCanBeCopied)
 
 // --- Sizes ---
 
-TEST_F(EveryWindow, HasAnIconAndIsStretchedOnlyIfItProfits)
+TEST_F(EveryWindow, HasAnIcon)
+{
+    each([](QDialog& window) { EXPECT_FALSE(window.windowIcon().pixmap(16).isNull()); });
+}
+
+TEST_F(EveryWindow, IsStretchedOnlyIfItProfits)
 {
     const QStringList fixed{u"frmKEST"_s, u"frmLogin"_s, u"frmExtraInfo"_s, u"frmProfile"_s};
     each([&](QDialog& window) {
-        EXPECT_FALSE(window.windowIcon().pixmap(16).isNull());
         EXPECT_TRUE(!fixed.contains(window.objectName()) || window.minimumSize() == window.maximumSize());
     });
 }
