@@ -10,8 +10,8 @@ const auto lineFailure = u"\n[none] Error processing Quote Items, Please contact
 /// Returns the number and subquote of the quote that the last load created or found.
 static std::string loadedQuote()
 {
-    const db::Recordset row = opened(u"SELECT * FROM QUOTE1 WHERE KESTQuoteNo='KQ1'"_s);
-    return row.eof() ? "none" : (row.text(u"QTNNO"_s) + u'/' + row.text(u"Subquote"_s)).toStdString();
+    const Row row("QUOTE1", "KESTQuoteNo='KQ1'");
+    return row.exists() ? row.text("QTNNO") + '/' + row.text("Subquote") : "none";
 }
 
 TEST_F(ManualQuotes, EachHasItsQuoteAsTheTableSays)
@@ -30,7 +30,7 @@ TEST_F(ManualQuotes, EachHasItsQuoteAsTheTableSays)
         EXPECT_EQ(shown(), taken ? "" : "[critical] Failed matching to existing parent KEST Quote") << elements;
         EXPECT_EQ(loadedQuote(), quote.toStdString()) << elements;
         EXPECT_EQ(gsMatchedQTNNO, taken ? quote.section(u'/', 0, 0) : QString()) << elements;
-        EXPECT_EQ(opened(u"SELECT * FROM CINFO"_s).text(u"QUOTE_VAL"_s), u"1001"_s);  // the counter does not change
+        EXPECT_EQ(Row("CINFO", "1=1").text("QUOTE_VAL"), "1001");  // the counter does not change
         before.restore();
     }
     EXPECT_FALSE(load(Message::told("MANQ quoteBody/quoteType=AS quoteBody/quoteReference=500/x")));

@@ -31,10 +31,9 @@ static Message body()
 /// Returns the numbers of all lines in the order in which they were stored.
 static std::string numbers(const Text& number = "500")
 {
-    db::Recordset rows = opened(u"SELECT * FROM QUOTE2 WHERE QTNNO='%1' ORDER BY itemid"_s.arg(number));
     QStringList found;
-    for (; !rows.eof(); rows.moveNext())
-        found += rows.text(u"SEQ_NO"_s);
+    for (const QSqlRecord& row : plainRows(u"SELECT * FROM QUOTE2 WHERE QTNNO='%1' ORDER BY itemid"_s.arg(number)))
+        found += plainText(row.value(u"SEQ_NO"_s));
     return found.join(u' ').toStdString();
 }
 

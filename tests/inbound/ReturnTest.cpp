@@ -63,12 +63,11 @@ QStringList linesSeen()
         {u"PAINT"_s, {u"rr_rate2"_s, u"pthour"_s}}, {u"OPG"_s, {u"opg_rate"_s, u"pthour"_s}},
         {u"PRT"_s, {u"qty"_s, u"unitcost"_s}},      {u"MIS"_s, {{}, u"unitcost"_s}}};
     QStringList seen;
-    db::Recordset lines = opened(u"SELECT * FROM QUOTE2 ORDER BY SEQ_NO"_s);
-    for (; !lines.eof(); lines.moveNext()) {
-        const auto& [factor, hours] = factors[lines.text(u"category"_s)];
-        const double amount = (factor.isEmpty() ? 1 : toDouble(lines.value(factor))) * toDouble(lines.value(hours));
-        seen += u"%1 %2 %3"_s.arg(lines.text(u"SEQ_NO"_s), lines.text(u"script"_s).remove(u" blend"_s))
-                    .arg(qRound64(amount * 100));
+    for (const QSqlRecord& line : plainRows(u"SELECT * FROM QUOTE2 ORDER BY SEQ_NO"_s)) {
+        const auto held = [&](const QString& column) { return plainText(line.value(column)); };
+        const auto& [factor, hours] = factors[held(u"category"_s)];
+        const double amount = (factor.isEmpty() ? 1 : toDouble(line.value(factor))) * toDouble(line.value(hours));
+        seen += u"%1 %2 %3"_s.arg(held(u"SEQ_NO"_s), held(u"script"_s).remove(u" blend"_s)).arg(qRound64(amount * 100));
     }
     return seen;
 }
