@@ -1,4 +1,4 @@
-// Tests the panel: its options, its keys, and a lost connection.
+// Tests the panel: its options, its keys, and what it shows when it opens.
 #include "support/Hands.h"
 #include "support/Shop.h"
 
@@ -23,18 +23,6 @@ TEST_F(Panel, EnterRunsTheChosenOptionLikeOk)
         {R"json({"click": "Option1(0)"}, {"click": "cmdOK"}, {"click": "cmdOK"}, {"click": "cmdExit"})json", {}}};
     for (const auto& [steps, boxes] : cases)
         EXPECT_EQ(show("0", steps), boxes) << steps;
-}
-
-TEST_F(Panel, AConnectionThatWasLostIsOpenedAgainByTheNextClick)
-{
-    test::quote("500");
-    int statements = 0;
-    db::setStatementFault([&] { return ++statements == 4; }, CannotOpen);  // the first of the send itself
-    show("500", R"json({"click": "Option1(2)"}, {"click": "cmdOK"}, {"click": "cmdOK"})json");
-    const QStringList texts = desktop->boxTexts();
-    ASSERT_EQ(texts.size(), 2) << texts.join(u'\n');
-    EXPECT_TRUE(texts[0].contains(u"-2147467259"_s)) << texts[0];
-    EXPECT_TRUE(texts[1].contains(u"$0 variations"_s)) << texts[1];
 }
 
 TEST_F(Panel, APersonIsToldOnceWhatWasSettled)
