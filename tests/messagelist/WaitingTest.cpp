@@ -177,14 +177,10 @@ TEST_F(Waiting, ALongLoadSaysWhatItDoesButNotBesideABox)
         desktop::stillWaiting();
         seen += notice();
     });
-    QTimer close;
-    QObject::connect(&close, &QTimer::timeout, &close, [&] {
-        if (auto* box = qobject_cast<QMessageBox*>(QApplication::activeModalWidget())) {
-            EXPECT_EQ(box->text() + notice(), u"Message Loaded"_s);
-            box->close();
-        }
+    whenShown<QMessageBox>([](QMessageBox& box) {
+        EXPECT_EQ(box.text() + notice(), u"Message Loaded"_s);
+        box.close();
     });
-    close.start(1);
     desktop::usePerson();
     const Hands hands({{u"frmMessageList"_s, [&](QDialog& window) {
                             isSlow = true;

@@ -13,14 +13,6 @@ static QJsonObject parsed(const QByteArray& text)
     return document.object();
 }
 
-static QStringList texts(const QJsonArray& entries, const QString& key)
-{
-    QStringList result;
-    for (const QJsonValue entry : entries)
-        result.append(entry[key].toString());
-    return result;
-}
-
 ScriptedDesktop::ScriptedDesktop(const QByteArray& json) : script(std::make_shared<desktop::Script>(parsed(json)))
 {
     for (const QString& window : {u"frmPrintPreview"_s, u"frmSubletAuth"_s, u"frmViewPDF"_s})
@@ -36,7 +28,10 @@ ScriptedDesktop::~ScriptedDesktop()
 
 QStringList ScriptedDesktop::boxTexts() const
 {
-    return texts(record().boxes, u"text"_s);
+    QStringList texts;
+    for (const QJsonValue box : record().boxes)
+        texts.append(box[u"text"_s].toString());
+    return texts;
 }
 
 QStringList ScriptedDesktop::boxes() const
@@ -47,11 +42,6 @@ QStringList ScriptedDesktop::boxes() const
                                   box[u"answer"_s].toString()}
                           .join(u'|'));
     return result;
-}
-
-QStringList ScriptedDesktop::prompts() const
-{
-    return texts(record().inputs, u"prompt"_s);
 }
 
 QJsonValue ScriptedDesktop::read(const QString& control, const QString& what) const

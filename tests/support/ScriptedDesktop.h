@@ -10,6 +10,7 @@
 
 namespace kest::test {
 
+/// A script that answers as long as it lives.
 class ScriptedDesktop {
 public:
     /// `script` is the JSON text of a script file. If it has no visit for frmPrintPreview, frmSubletAuth or frmViewPDF,
@@ -24,8 +25,6 @@ public:
     QStringList boxTexts() const;
     /// Returns the boxes as "icon|title|text|answer".
     QStringList boxes() const;
-    /// Returns the prompts of the input boxes.
-    QStringList prompts() const;
     /// Returns what the last reading step read of a control, such as `read("txtFilter", "text")`, or null if none did.
     QJsonValue read(const QString& control, const QString& what = QStringLiteral("text")) const;
 
