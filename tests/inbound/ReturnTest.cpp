@@ -5,30 +5,6 @@
 
 namespace {
 
-/// Adds a line of any kind with all the values that a document can carry.
-void addLine(db::Recordset& lines, int number, Chance& chance)
-{
-    const QString category = chance.one({u"PRT"_s, u"R&R"_s, u"RA"_s, u"PAINT"_s, u"OPG"_s, u"MIS"_s});
-    lines.addNew();
-    lines.set(u"QTNNO"_s, u"500"_s);
-    lines.set(u"Subquote"_s, 0);
-    if (!chance.once(4))
-        lines.set(u"SEQ_NO"_s, number);
-    lines.set(u"category"_s, category);
-    lines.set(u"script"_s,
-              chance.one({u"L/H guard & liner"_s, u"caf\u00e9 \u20ac <5>"_s, u"Bonnet 'x' blend"_s, u""_s}));
-    lines.set(u"PartNo"_s, category == u"R&R"_s && chance.once(3) ? u"M"_s : chance.one({u""_s, u"53876-C1200"_s}));
-    lines.set(u"MARK"_s, chance.one({u""_s, u" "_s, u"U"_s, u"X"_s}));
-    for (const auto& column : {u"rr_rate2"_s, u"opg_rate"_s, u"qty"_s})
-        lines.set(column, chance.number(1, 900) / 10.0);
-    for (const auto& column : {u"rrhour"_s, u"rahour"_s, u"pthour"_s, u"unitcost"_s})
-        lines.set(column, chance.number(0, 90'000) / 1000.0);  // the send rounds them
-    lines.set(u"blend"_s, chance.once(4));
-    lines.set(u"itemno"_s, chance.one({u""_s, u"140"_s}));
-    lines.set(u"VENDOR"_s, chance.once(3) ? vendor("Straight Track").id() : 0);
-    lines.update();
-}
-
 /// Returns the authorised quote with the body of a sent document, in which each line has that indicator.
 Message returned(const QString& document, const char* indicator)
 {
@@ -58,17 +34,13 @@ QStringList linesHeld()
 /// cents. That of a part is its price, as its mark-up comes back as a rounded percentage.
 QStringList linesSeen()
 {
-    static const QMap<QString, std::pair<QString, QString>> factors{
-        {u"R&R"_s, {u"rr_rate2"_s, u"rrhour"_s}},   {u"RA"_s, {u"rr_rate2"_s, u"rahour"_s}},
-        {u"PAINT"_s, {u"rr_rate2"_s, u"pthour"_s}}, {u"OPG"_s, {u"opg_rate"_s, u"pthour"_s}},
-        {u"PRT"_s, {u"qty"_s, u"unitcost"_s}},      {u"MIS"_s, {{}, u"unitcost"_s}}};
     QStringList seen;
-    for (const QSqlRecord& line : plainRows(u"SELECT * FROM QUOTE2 ORDER BY SEQ_NO"_s)) {
-        const auto held = [&](const QString& column) { return plainText(line.value(column)); };
-        const auto& [factor, hours] = factors[held(u"category"_s)];
-        const double amount = (factor.isEmpty() ? 1 : toDouble(line.value(factor))) * toDouble(line.value(hours));
-        seen += u"%1 %2 %3"_s.arg(held(u"SEQ_NO"_s), held(u"script"_s).remove(u" blend"_s)).arg(qRound64(amount * 100));
-    }
+    for (const QSqlRecord& line : plainRows(
+             u"SELECT SEQ_NO, script, CASE category WHEN 'R&R' THEN rr_rate2*rrhour WHEN 'RA' THEN rr_rate2*rahour "
+             "WHEN 'PAINT' THEN rr_rate2*pthour WHEN 'OPG' THEN opg_rate*pthour WHEN 'PRT' THEN qty*unitcost "
+             "ELSE unitcost END FROM QUOTE2 ORDER BY SEQ_NO"_s))
+        seen += u"%1 %2 %3"_s.arg(line.value(0).toString(), line.value(1).toString().remove(u" blend"_s))
+                    .arg(qRound64(line.value(2).toDouble() * 100));
     return seen;
 }
 
@@ -78,6 +50,8 @@ using Return = Sending;
 
 TEST_F(Return, LinesThatTheInsurerKeepsOrChangesToTheSameStayAsTheyAre)
 {
+    const Grammar lines("inbound/made-up-lines.txt");
+    EXPECT_EQ(vendor("Straight Track").id(), 1);
     const Snapshot empty;
     for (quint32 seed = 0; seed < 12; ++seed)
         for (const bool isChanged : {false, true}) {
@@ -85,9 +59,10 @@ TEST_F(Return, LinesThatTheInsurerKeepsOrChangesToTheSameStayAsTheyAre)
             empty.restore();
             Chance chance(seed);
             sendable().request("QR1").note("Active Quote Request");
-            db::Recordset lines = opened(u"SELECT * FROM QUOTE2 WHERE 1=0"_s);
             for (int number = 2, last = chance.number(2, 12); number <= last; ++number)
-                addLine(lines, number, chance);
+                addRow("QUOTE2",
+                       {{"QTNNO", "500"}, {"Subquote", 0}, {"SEQ_NO", chance.once(4) ? QVariant() : QVariant(number)}},
+                       lines.text(chance, u"line"_s));
             const double total = send("500");
             ASSERT_GT(total, 0) << shown();
             const QStringList seen = linesSeen();

@@ -71,16 +71,9 @@ TEST_F(Totals, ALineThatAnotherOneReplacesDoesNotCount)
 TEST_F(Totals, LinesOfOneKeyAreEachCountedOnce)
 {
     quote("500").line(1, "MIS").set("unitcost", 5);
+    const QString line = u"SELECT * FROM QUOTE2"_s;
     Opened opened;
-    db::Recordset damaged;
-    for (const QString& column : opened.lines.columns())
-        damaged.declare(column, opened.lines.kind(column));
-    damaged.openDeclared();
-    for (int line = 1; line <= 3; ++line) {
-        damaged.addNew();
-        for (const QString& column : opened.lines.columns())
-            damaged.set(column, opened.lines.value(column));
-    }
+    db::Recordset damaged = kest::opened(QStringList{line, line, line}.join(u" UNION ALL "_s));
     for (const auto& routine : {&CalcQuoteTotals, &CalcAuthorisedTotals}) {
         quote("500").set("MISTOTAL", 0);
         opened.header.requery();

@@ -73,7 +73,7 @@ void addRow(const Text& table, std::initializer_list<std::pair<const char*, Valu
     for (const auto& [column, value] : values)
         rows.set(QString::fromLatin1(column), value);
     for (const auto& [column, value] : pairsIn(more))
-        rows.set(column, value);
+        rows.set(column, value == u"-"_s ? QVariant() : QVariant(value));
     rows.update();
 }
 

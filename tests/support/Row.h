@@ -42,7 +42,7 @@ private:
     QString condition_;
 };
 
-/// Adds a row with these values, and with more in the form "column=value".
+/// Adds a row with these values, and with more in the form "column=value". "-" is Null.
 void addRow(const Text& table, std::initializer_list<std::pair<const char*, Value>> values, const Text& more = "");
 
 /// A quote: its header, with access to its note chain and its lines.
