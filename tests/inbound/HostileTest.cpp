@@ -1,5 +1,4 @@
-// Loads messages in which each element in turn is missing, doubled or has an unexpected value, and messages whose text
-// is damaged at random. KEST2_TEST_DAMAGED sets how many of the latter there are of each type.
+// Loads messages in which each element in turn is missing, doubled or has an unexpected value.
 #include "corpus/Targets.h"
 #include "messages/Envelope.h"
 #include "platform/files/CodePage.h"
@@ -8,28 +7,7 @@
 
 const QString leaves = u"//*[not(*)]"_s;
 
-/// Returns the text with one to four pieces of it removed, doubled, or replaced by markup.
-static QString damaged(QString text, QRandomGenerator& random)
-{
-    static const QString markup[] = {u"<"_s,      u">"_s,         u"&"_s,     u"\""_s,     u"</"_s,
-                                     u"]]>"_s,    u"<![CDATA["_s, u"<!--"_s,  u"<?x ?>"_s, u"&#x0;"_s,
-                                     u"\u0000"_s, u"\ufffe"_s,    u"-9e99"_s, u"'"_s,      u"<!DOCTYPE a>"_s};
-    for (int change = random.bounded(1, 5); change > 0; --change) {
-        const int at = random.bounded(int(text.size()));
-        const int length = random.bounded(1, 30);
-        const int kind = random.bounded(int(std::size(markup)) + 2);
-        const QString piece = text.mid(at, length);
-        text.replace(at, kind < 2 ? int(piece.size()) : kind % 2,
-                     kind == 0   ? QString()
-                     : kind == 1 ? piece + piece
-                                 : markup[kind - 2]);
-        if (text.isEmpty())
-            break;
-    }
-    return text;
-}
-
-/// Returns the message, and all variants that differ from it in a single element, and damaged ones.
+/// Returns the message, and all variants that differ from it in a single element.
 static QStringList variantsOf(QString text)
 {
     QStringList wrong = linesOf("inbound/hostile-values.txt");
@@ -56,9 +34,6 @@ static QStringList variantsOf(QString text)
         for (const QString& value : wrong)
             changed(leaf, [&](xml::Document&, xml::Node element) { element.setText(value); });
     }
-    QRandomGenerator random(20551);
-    for (int left = qEnvironmentVariable("KEST2_TEST_DAMAGED", u"40"_s).toInt(); left > 0; --left)
-        variants += damaged(text, random);
     return variants;
 }
 

@@ -58,13 +58,6 @@ TEST_F(Dispatcher, TheTypeDecidesInAnyCase)
     EXPECT_EQ(shown(), "");
 }
 
-TEST_F(Dispatcher, AFailureStandsInTheLog)
-{
-    EXPECT_FALSE(load(Message("", "getQRCancellationResponse")));
-    EXPECT_NE(shown().find("Error Number: 91\r\n"), std::string::npos);
-    EXPECT_TRUE(files::read(errorLogPath()).contains(u"Source: modLoadXML.LoadXML"_s));
-}
-
 TEST_F(Dispatcher, AFailingLogAddsNoBox)
 {
     quote("500").line(1);

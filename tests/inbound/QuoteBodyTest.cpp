@@ -57,19 +57,6 @@ TEST_F(QuoteBody, ANewLineIsFilledAsItsSectionSays)
         EXPECT_TRUE(line(++number).shows(columns + u" blend=0 Tag=1 delitem=0 tosend=A"_s)) << elements;
 }
 
-TEST_F(QuoteBody, TheIndicatorSaysWhatHappensToTheLine)
-{
-    for (const auto& [indicator, number, left, first] : casesIn<4>("inbound/indicators.txt"))
-        for (const QString& kind : {u"labour"_s, u"part"_s, u"paint"_s, u"sublet"_s}) {
-            gConn->execute(u"DELETE FROM QUOTE2"_s);
-            quote("500").line(1, "R&R", "old");
-            quote("500").line(2, "PRT");
-            EXPECT_TRUE(apply(body().line(kind, number.toInt(), indicator, {{kind + u"Description"_s, "new"}})));
-            EXPECT_EQ(numbers() + ' ' + line(1).text("script"), (left + u' ' + first).toStdString())
-                << indicator << number;
-        }
-}
-
 TEST_F(QuoteBody, LinesAreMergedAsTheTableSays)
 {
     QString number = u"500"_s;
