@@ -6,11 +6,6 @@
 #include "support/Test.h"
 
 #include <sys/resource.h>
-#include <sys/time.h>
-#include <unistd.h>
-
-#include <csignal>
-#include <cstring>
 
 namespace {
 
@@ -20,29 +15,12 @@ struct Limits {
 };
 constexpr Limits ofMessages{200 * slowness, 100};  // what is promised for each load and fill
 constexpr Limits ofOthers{2000 * slowness, 200};
-constexpr int hangAfter = memoryIsReal ? 60 : 180;  // seconds of the processor, however busy the machine is
-constexpr rlim_t mostData = rlim_t(2048) << 20;     // bytes; ends a flood before it fills the machine
+constexpr rlim_t mostData = rlim_t(2048) << 20;  // bytes; ends a flood before it fills the machine
 
 struct Hostile {
     std::string name;
     QByteArray content;
 };
-
-std::string current;  // the file that is read
-
-void limitTime(int seconds)
-{
-    const itimerval limit{{}, {seconds, 0}};
-    ::setitimer(ITIMER_PROF, &limit, nullptr);
-}
-
-void tellHang(int)
-{
-    for (const std::string_view text : {std::string_view("The corpus hangs at "), std::string_view(current)})
-        if (::write(STDERR_FILENO, text.data(), text.size()) < 0)
-            break;
-    ::_exit(1);
-}
 
 /// Returns the files for a target: those in its folder, and those that the index describes by a repeated piece.
 std::vector<Hostile> corpusOf(const QString& target)
@@ -81,7 +59,6 @@ TEST_P(Corpus, DoesNoHarm)
         limit.rlim_cur = mostData;
         ASSERT_EQ(::setrlimit(RLIMIT_DATA, &limit), 0);
     }
-    std::signal(SIGPROF, tellHang);
     const std::unique_ptr<Target> target = makeTarget(GetParam());
     const QString name = QString::fromLatin1(GetParam());
     const Limits& most = (name == u"load"_s || name == u"fill"_s) ? ofMessages : ofOthers;
@@ -89,10 +66,9 @@ TEST_P(Corpus, DoesNoHarm)
     EXPECT_GT(files.size(), 4U);
     const std::string held = target->holdsShop() ? holdings() : std::string();
     for (const Hostile& file : files) {
-        const std::string& read = current = file.name;
-        limitTime(hangAfter);
+        const std::string& read = file.name;
+        std::cout << read << std::endl;  // names the file that hangs
         const Cost cost = costOf([&] { EXPECT_NO_THROW(target->take(file.content)) << read; });
-        limitTime(0);
         EXPECT_LT(cost.milliseconds, most.milliseconds) << read;
         EXPECT_TRUE(cost.megabytes < most.megabytes || !memoryIsReal) << read << ": " << cost.megabytes;
         if (target->holdsShop()) {

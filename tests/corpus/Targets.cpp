@@ -19,11 +19,9 @@
 #include "utilities/ExactTextEdit.h"
 #include "utilities/FormatXML.h"
 
-#include <fcntl.h>
-#include <unistd.h>
-
 #include <cmath>
 #include <filesystem>
+#include <fstream>
 
 namespace kest::test {
 
@@ -44,7 +42,24 @@ public:
 
 protected:
     void TestBody() override {}
-    void newDesktop() { desktop.emplace(); }
+    void remember()
+    {
+        before.emplace();
+        held = holdings();
+    }
+    /// Returns what the shop holds, and makes it as it was remembered.
+    std::string takeBack()
+    {
+        std::string now = holdings();
+        if (now != held)
+            before->restore();
+        return now;
+    }
+
+    std::string held;
+
+private:
+    std::optional<Snapshot> before;
 };
 
 /// Takes the first line off an input.
@@ -61,13 +76,9 @@ bool create(const QString& folder, const QByteArray& name, const QByteArray& con
 {
     if (name.isEmpty() || name.size() > 200 || name.contains('/') || name.contains('\0') || name == "." || name == "..")
         return false;
-    const QByteArray path = QFile::encodeName(files::systemPath(folder)) + '/' + name;
-    const int file = ::open(path.constData(), O_WRONLY | O_CREAT | O_TRUNC | O_CLOEXEC, 0600);
-    if (file < 0)
-        return false;
-    const bool written = ::write(file, content.constData(), size_t(content.size())) == content.size();
-    ::close(file);
-    return written;
+    std::ofstream file(files::systemPath(folder).toStdString() + '/' + name.toStdString(), std::ios::binary);
+    file << content.toStdString() << std::flush;
+    return file.good();
 }
 
 void emptyFolder(const QString& folder)
@@ -139,8 +150,7 @@ public:
         quote("BYSTANDER2").rego(bystander).request("", "").quoteNumber("").line(1);
         files::write(gsUnsentPath + bystander, bystander);
         quote("500").request("QR1").quoteNumber("KQ1").stage(3).note("Responded Quote Request").line(1);
-        before.emplace();
-        held = holdings();
+        remember();
     }
 
     void take(const QByteArray& input) override
@@ -148,7 +158,7 @@ public:
         const std::optional<QString> text = messageIn(input);
         if (!text)
             return;
-        newDesktop();
+        desktop.emplace();
         arrive(message, *text);
         const bool isTaken = loadAsTheWindow(message);
         if (!isTaken)
@@ -156,10 +166,9 @@ public:
         const QString code = text->section(u"messageType>"_s, 1, 1).section(u'<', 0, 0).toUpper();
         const bool isOfKnownType = findMessageType(code) != nullptr;  // no other is told of
         require(isTaken || !isOfKnownType || !desktop->boxes().isEmpty(), "a refusal has a box");
-        const std::string now = holdings();
+        const std::string now = takeBack();
         if (now == held)
             return;
-        before->restore();
         const bool isMerged = code == "AUQT"_L1 || code == "MANQ"_L1;  // lines before the one that fails stay
         require(isTaken || isMerged || withoutCarMark(now) == withoutCarMark(held), "a refusal changes nothing");
         if (!text->contains(u"BYSTANDER"_s))
@@ -179,9 +188,6 @@ private:
         static const QRegularExpression mark(u"^(CAR REGO=.*) KEST=\\S+"_s, QRegularExpression::MultilineOption);
         return QString::fromStdString(text).replace(mark, u"\\1"_s);
     }
-
-    std::optional<Snapshot> before;
-    std::string held;
 };
 
 /// Fills the list from folders that contain the files of the input.
@@ -190,13 +196,12 @@ public:
     FillTarget()
     {
         quote("500").request("QR1").quoteNumber("KQ1").stage(3).note("Sending KEST Quote");
-        before.emplace();
-        held = holdings();
+        remember();
     }
 
     void take(const QByteArray& input) override
     {
-        newDesktop();
+        desktop.emplace();
         for (const MessageFolder folder : messageFolders) {
             gsListFilter.clear();
             gbFilterAsked = false;
@@ -213,10 +218,7 @@ public:
                     attempt([&] { GetReadFileName(path + file); });
             emptyFolder(path);
         }
-        const std::string now = holdings();
-        if (now == held)
-            return;
-        before->restore();
+        const std::string now = takeBack();
         for (const QString& line : QString::fromStdString(difference(held, now)).split(u'\n', Qt::SkipEmptyParts))
             require(line.mid(2).startsWith(u"QUOTE1 "_s) || line.mid(2).startsWith(u"QUOTE3 "_s),
                     "a fill changes only the quote of a response");
@@ -245,9 +247,6 @@ private:
             all += file.fileName().toUtf8() + ' ' + QByteArray::number(file.size()) + '\n';
         return all;
     }
-
-    std::optional<Snapshot> before;
-    std::string held;
 };
 
 class NotesTarget final : public Target {
@@ -330,7 +329,7 @@ bool isKeptByViewer(const xml::Node& node)
 class ViewerTarget final : public ShopTarget {
     void take(const QByteArray& input) override
     {
-        newDesktop();
+        desktop.emplace();
         files::writeBytes(gsUnreadPath + message, input);
         const QString text = FormatXML(gsUnreadPath + message);
         require(files::readBytes(gsUnreadPath + message) == input, "viewing changes no file");
@@ -454,7 +453,7 @@ public:
 private:
     void take(const QByteArray& input) override
     {
-        newDesktop();
+        desktop.emplace();
         QByteArray content = input;
         const QByteArray name = firstLine(content);
         if (!create(subletFolder(), name, content))
