@@ -4,9 +4,6 @@
 #include "support/Hands.h"
 #include "support/Shop.h"
 
-#include <QLineEdit>
-#include <QPushButton>
-
 struct Workstations : Shop {
     /// Creates a second profile that uses the database and drive C: of the first.
     Workstations()
@@ -123,16 +120,6 @@ TEST_F(Workstations, ALoadDuringASendLosesNothing)
     EXPECT_GT(overtakenCount, 0);
 }
 
-TEST_F(Workstations, ALoadGoesOverANewConnectionWhereTheOldOneHasGone)
-{
-    quote("500").request("QR1");
-    arrive("m.xml", cancellation("QR1"));
-    frmMessageList window;
-    window.openUnread();
-    dropConnection();
-    EXPECT_TRUE(window.loadFile(u"m.xml"_s)) << shown();
-}
-
 TEST_F(Workstations, AnOpenReportLeavesItsLoadToTheOtherThatHasSettledIt)
 {
     putTemplate(710);
@@ -145,34 +132,4 @@ TEST_F(Workstations, AnOpenReportLeavesItsLoadToTheOtherThatHasSettledIt)
     EXPECT_EQ(filesIn(gsReadPath), QStringList(u"1001.xml"_s));
     EXPECT_EQ(filesIn(gsUnreadPath), QStringList());
     EXPECT_EQ(rowCount("QUOTE1") + rowCount("KESTOperation"), 2) << "loaded once";
-}
-
-TEST_F(Workstations, AnOpenDialogSendsNothingOnceTheOtherHasSettledTheSend)
-{
-    quote("500").set("ExtraInfo", 1).line(1).set("rrhour", 2).set("rr_rate2", 50.255);  // rounded first
-    const auto fill = [](QDialog& window) {
-        for (const auto& [field, text] : {std::pair("txtVIN", u"V1"_s),
-                                          {"txtCylinders", u"6"_s},
-                                          {"txtColour", u"Red"_s},
-                                          {"txtBuildMonth", u"12"_s},
-                                          {"txtBuildYear", u"2024"_s},
-                                          {"txtDamageDesc", u"dent"_s}})
-            control<QLineEdit>(window, field).setText(text);
-        control<QPushButton>(window, "Command1").click();
-    };
-    const auto sendAs = [&](const Hands::Work& user) {
-        const Hands hands({{u"frmExtraInfo"_s, user}});
-        EXPECT_TRUE(openHostQuote(u"500"_s, u"0"_s));
-        return failureOf([] { SendQuote(*grsQuote); });
-    };
-    EXPECT_EQ(sendAs([&](QDialog& window) {
-                  beAway();
-                  fill(window);
-              }),
-              RowChanged);
-    EXPECT_FALSE(quote("500").locked());
-    EXPECT_EQ(Row("KESTOperation", "1=1").text("State"), "failed");
-    EXPECT_EQ(filesIn(gsUnsentPath), QStringList());
-    EXPECT_EQ(sendAs(fill), 0);
-    EXPECT_TRUE(quote("500").locked());
 }
