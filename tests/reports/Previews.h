@@ -1,7 +1,10 @@
 // Sets the report templates of a test's shop, and reads the reports that were shown.
 #pragma once
 
+#include "platform/print/OutputFolder.h"
 #include "support/Shop.h"
+
+#include <QPdfDocument>
 
 namespace kest::test {
 
@@ -12,6 +15,7 @@ protected:
         for (const int report : {710, 720, 730})
             Shop::putTemplate(report);
     }
+    ~Previews() override { report::setOutputFolder({}); }
 
     /// Writes the template of a report.
     static void putTemplate(const char* name, const QByteArray& content)
@@ -59,6 +63,14 @@ inline QString pdfText(const QString& file)
     EXPECT_TRUE(reader.waitForFinished());
     EXPECT_EQ(reader.exitCode(), 0);
     return QString::fromUtf8(reader.readAllStandardOutput());
+}
+
+/// Returns the value of a PDF file that its title or its author is.
+inline QString pdfValue(const QString& file, QPdfDocument::MetaDataField field = QPdfDocument::MetaDataField::Title)
+{
+    QPdfDocument document;
+    EXPECT_EQ(document.load(file), QPdfDocument::Error::None);
+    return document.metaData(field).toString();
 }
 
 }  // namespace kest::test
