@@ -117,29 +117,6 @@ TEST_F(JournalOfAShop, ForgetsOldOperationsSomeRowsAtATimeButNoOpenOne)
     EXPECT_EQ(rowCount("KESTJournal"), 100);
 }
 
-// Each statement is a round trip on a server.
-TEST_F(JournalOfAShop, CostsThreeMoreStatementsForEachChange)
-{
-    quote("500");
-    db::Recordset row = opened(u"SELECT * FROM QUOTE1 WHERE QTNNO='500'"_s);
-    const auto statementsOfAChange = [&](const QString& claim) {
-        int statements = 0;
-        db::setStatementFault([&] {
-            ++statements;
-            return false;
-        });
-        row.set(u"CLAIM"_s, claim);
-        row.update();
-        db::setStatementFault({});
-        return statements;
-    };
-    EXPECT_EQ(statementsOfAChange(u"C1"_s), 1);
-    const journal::Operation operation(journal::Kind::Save);
-    statementsOfAChange(u"C2"_s);  // opens the operation
-    EXPECT_EQ(statementsOfAChange(u"C3"_s), 1 + 3);
-    journal::passPoint([&] { EXPECT_EQ(statementsOfAChange(u"C4"_s), 1 + 4); });
-}
-
 TEST(JournalRecord, GivesEachValueBackBitForBit)
 {
     for (const QVariant& value :
