@@ -29,22 +29,13 @@ static void addRows(Holdings& all, db::Recordset rows)
 static Holdings found(const MariaDbServer& server)
 {
     Holdings all;
-    addRows(all, opened(u"SELECT QTNNO||'/'||Subquote AS name, Job_stage AS stage, ReadOnly AS locked, "
-                        "KESTQRNo AS request, KESTQRVer AS version, KESTQuoteNo AS network, KESTAuthNo AS authority, "
-                        "TOTAL AS labour, PRTTOTAL AS parts, MISTOTAL AS miscellaneous, excess, "
-                        "contri AS contribution FROM QUOTE1 WHERE QTNNO>'1028'"_s));
-    addRows(all, opened(u"SELECT QTNNO||'/'||Subquote||' texts' AS name, remarks FROM QUOTE3 "
-                        "WHERE QTNNO>'1028'"_s));
-    addRows(all, opened(u"SELECT QTNNO||'/'||Subquote||' '||category||' '||script AS name, SEQ_NO, rrhour, rahour, "
-                        "pthour, rr_rate2, qty, unitcost, itemno, tosend FROM QUOTE2 WHERE QTNNO>'1028'"_s));
     const auto jobLink = std::make_shared<db::Connection>();
     jobLink->open(server.connectionText(u"jobs"_s));
-    db::Recordset jobs(jobLink);
-    jobs.open(
-        u"SELECT CONCAT('job ', nJobID_PK) AS name, Status, JobNr, custName, vehReg, COUNT(nJobDtlID_PK) AS details, "
-        "SUM(lineSale) AS sale FROM newJob JOIN newJobHdr h ON h.nJobID_FK=nJobID_PK "
-        "JOIN newJobDtl d ON d.nJobID_FK=nJobID_PK GROUP BY nJobID_PK, Status, JobNr, custName, vehReg"_s);
-    addRows(all, std::move(jobs));
+    for (const auto& [database, select] : casesIn<2>("app/day-rows.txt")) {
+        db::Recordset rows(database == "JobLink"_L1 ? jobLink : gConn);
+        rows.open(select);
+        addRows(all, std::move(rows));
+    }
     for (const auto& [name, path] : {std::pair(u"unread "_s, gsUnreadPath),
                                      {u"read "_s, gsReadPath},
                                      {u"unsent "_s, gsUnsentPath},

@@ -1,5 +1,4 @@
 // Tests the load of authorised quotes: which quote they find, what is refused, and what is stored.
-#include "base/modLoggerEx.h"
 #include "inbound/LoadQuoteBody.h"
 #include "support/Shop.h"
 

@@ -1,6 +1,4 @@
 // Tests the load of manual quotes: which quote they become, and what they replace.
-
-#include "platform/database/FaultInjection.h"
 #include "support/Shop.h"
 
 using ManualQuotes = Shop;

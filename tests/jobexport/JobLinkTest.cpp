@@ -95,15 +95,6 @@ TEST_F(JobLink, LinesOfAllSubquotesGoInTheirOrder)
               expected.join(u'|').toStdString());
 }
 
-TEST_F(JobLink, ALineThatAMarkerPointsAtIsLeftOut)
-{
-    quote("500").line(1, "RA", "old").set("tosend", "A");
-    const QString replaced = QString::fromStdString(quote("500").line(1).text("itemid"));
-    quote("500").line(2, "RA", "new").set("tosend", "A").set("DELETEDITEM", replaced.toInt());
-    exportQuote();
-    EXPECT_EQ(details("lineDescn"), "new");
-}
-
 TEST_F(JobLink, AMissingDateIsAnEmptyText)
 {
     quote("500").set("qtndate", nullptr);

@@ -1,6 +1,5 @@
 // Tests which quotes are refused, what a send marks and writes, and its pictures.
 #include "Sending.h"
-#include "platform/files/FaultInjection.h"
 
 static void empty(std::initializer_list<const char*> tables)
 {

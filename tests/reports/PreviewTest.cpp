@@ -2,7 +2,6 @@
 #include "platform/desktop/Person.h"
 #include "platform/print/Pages.h"
 #include "platform/script/Gestures.h"
-#include "reports/BuildAuthReport.h"
 #include "reports/Previews.h"
 #include "reports/frmPrintPreview.h"
 #include "support/FullDisk.h"

@@ -38,38 +38,28 @@ TEST_F(Sublet, ADocumentBelongsToTheQuoteWithWhoseNumberItsNameBegins)
     EXPECT_EQ(subletDocumentNumbers({u"500"_s, u"1"_s}), QStringList());
 }
 
-TEST_F(Sublet, TheListShowsTheLineOfEachDocument)
+TEST_F(Sublet, TheListShowsTheLineOfEachDocumentAndOpensTheChosenOne)
 {
     auto row = quote("500");
     row.line(1, "MIS", "Wheel alignment").set("VENDOR", test::vendor("Straight Track").id());
     row.line(2, "MIS", "Windscreen").set("VENDOR", 0);
     row.line(3, "MIS", "Trim").set("VENDOR", nullptr);
-    for (const char* name : {"500.0_1.pdf", "500.0_2.pdf", "500.0_3.pdf", "500.0_9.pdf"})
-        document(name);
-    frmSubletAuth::ShowForm(u"500"_s, u"1"_s);
-    EXPECT_EQ(windows().size(), 0) << "no documents, no window";
-    frmSubletAuth::ShowForm(u"500"_s, u"0"_s);
-    ASSERT_EQ(windows().size(), 1);
-    EXPECT_EQ(windows()[0][u"rows"_s],
-              (QJsonArray{QJsonArray{u"Wheel alignment"_s, u"Straight Track"_s}, QJsonArray{u"Windscreen"_s, QString()},
-                          QJsonArray{u"Trim"_s, QString()}}));
-}
-
-TEST_F(Sublet, OpenShowsTheChosenDocument)
-{
-    auto row = quote("500");
-    row.line(1, "MIS", "Wheel alignment");
-    row.line(2, "MIS", "Windscreen");
-    document("500.0_1.pdf", "this is no PDF");
+    for (const char* name : {"500.0_1.pdf", "500.0_3.pdf", "500.0_9.pdf"})
+        document(name, "this is no PDF");
     realDocument(u"500.0_2.pdf"_s);
     desktop.emplace(R"({"windows": {"frmSubletAuth": [[ {"click": "Command1"},
         {"select": "ListView1", "item": "Windscreen"}, {"click": "Command1"}, {"click": "Command2"} ]],
         "frmViewPDF": [[ {"key": "AcroPDF1", "keys": ["Ctrl+=", "End", "Ctrl+1", "Home", "PgDown", "PgDown"]},
                          {"read": true} ]]}})");
+    frmSubletAuth::ShowForm(u"500"_s, u"1"_s);
+    EXPECT_EQ(windows().size(), 0) << "no documents, no window";
     frmSubletAuth::ShowForm(u"500"_s, u"0"_s);
     EXPECT_EQ(shown(),
               "[critical] The document c:\\wirdoc\\PDF\\500.0_1.pdf can't be shown: the file is not a PDF document.");
     ASSERT_EQ(windows().size(), 2);
+    EXPECT_EQ(windows()[0][u"rows"_s],
+              (QJsonArray{QJsonArray{u"Wheel alignment"_s, u"Straight Track"_s}, QJsonArray{u"Windscreen"_s, QString()},
+                          QJsonArray{u"Trim"_s, QString()}}));
     EXPECT_EQ(windows()[1][u"file"_s], u"c:\\wirdoc\\PDF\\500.0_2.pdf"_s);
     EXPECT_EQ(desktop->read(u"lblPage"_s), u"Page 2 of 2"_s);
 
