@@ -25,8 +25,8 @@ QString imageId(const QString& file);
 
 /// Writes a document and a copy of each image to the outgoing folder: of those that the quote's document counts, if a
 /// send is at work. Leaves out those that it has written before it was interrupted. Returns the names of images that
-/// are gone. Throws PathNotFound if there are images to write and their folder is away, or empty as the place of a share
-/// that is not mounted.
+/// are gone. Throws PathNotFound if there are images to write and their folder is away, or empty as the place of a
+/// share that is not mounted.
 QStringList writeImageDocuments(const QString& folder, const QuoteKey& quote);
 
 }  // namespace kest
