@@ -38,7 +38,7 @@ struct Interrupted : Sending {
         const QScopedValueRollback own(folder, u"c:\\own\\"_s);
         const char* older = "Workstation='OTHER', Facts=REPLACE(Facts, 'folders', 'not yet')";
         for (const char* change : {"Workstation=Workstation", older}) {
-            gConn->execute(u"UPDATE KESTOperation SET "_s + QString::fromLatin1(change));
+            plainRows(u"UPDATE KESTOperation SET "_s + QString::fromLatin1(change));
             recovery::settle();
             EXPECT_EQ(newest().text("State"), "unfinished") << change;
         }

@@ -185,7 +185,7 @@ TEST_F(Interrupted, AMessageOutOfSightIsNotTakenForMoved)
     gsUnreadPath = seen;
     settleOutOfSight(gsUnreadPath);
     // the workstation died before anybody saw the report
-    gConn->execute(u"UPDATE KESTOperation SET State='open', Facts=REPLACE(Facts, 'reportShown', 'not yet')"_s);
+    plainRows(u"UPDATE KESTOperation SET State='open', Facts=REPLACE(Facts, 'reportShown', 'not yet')"_s);
     settleOutOfSight(gsUnreadPath);
     recovery::settle();
     EXPECT_EQ(newest().text("State"), "done");
