@@ -140,7 +140,7 @@ TEST_F(UndoOfALoad, IsRefusedWithTheReason)
          [] {
              quote("500").set("invoiced", 0);  // so that the load does not write it
              const qint64 load = loaded(u"m.xml"_s, authorisation());
-             quote("500").set("invoiced", -1);
+             gConn->execute(u"UPDATE QUOTE1 SET invoiced=-1 WHERE QTNNO='500'"_s);
              return load;
          }},
         {"Quote 500 is invoiced.",
