@@ -11,6 +11,7 @@
 
 #include <QCoreApplication>
 #include <QDateTime>
+#include <QFileInfo>
 #include <QJsonDocument>
 #include <QSysInfo>
 #include <QUuid>
@@ -44,8 +45,11 @@ QString place()
 QString folders()
 {
     QString paths;
-    for (const QString& folder : {gsUnreadPath, gsReadPath, gsImagesPath})
-        paths += u'\n' + files::systemPath(folder);
+    for (const QString& folder : {gsUnreadPath, gsReadPath, gsImagesPath}) {
+        const QString path = files::systemPath(folder);
+        const QString place = QFileInfo(path).canonicalFilePath();  // profiles may share folders by links
+        paths += u'\n' + (place.isEmpty() ? path : place);
+    }
     return hashOf(machine() + paths);
 }
 
