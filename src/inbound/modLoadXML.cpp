@@ -11,6 +11,7 @@
 #include "platform/Prompt.h"
 #include "platform/RuntimeError.h"
 #include "platform/files/files.h"
+#include "quotedata/Vendors.h"
 
 #include <QJsonArray>
 #include <QStringList>
@@ -152,7 +153,8 @@ bool load(QString& text, const QString& fileName)
 
 bool LoadXML(QString& text, const QString& fileName)
 {
-    const KeptMessage kept;
+    const KeptMessage keptMessage;
+    const KeptVendors keptVendors;
     try {
         return load(text, fileName);
     } catch (const RuntimeError& error) {

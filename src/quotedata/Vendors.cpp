@@ -3,6 +3,8 @@
 #include "base/modDBAccess.h"
 #include "platform/database/Sql.h"
 
+#include <map>
+#include <optional>
 #include <utility>
 
 namespace kest {
@@ -13,12 +15,10 @@ namespace {
 
 constexpr int vendorAccount = 293;  // of the ledger
 
-}  // namespace
+std::optional<std::map<QString, QVariant>> keptNumbers;  // by the name
 
-QVariant findOrAddVendor(const QString& name, const QString& street, const QString& phone)
+QVariant foundOrAdded(const QString& name, const QString& street, const QString& phone)
 {
-    if (name.trimmed().isEmpty())
-        return 0;
     db::Recordset vendor = opened(sql("SELECT * FROM VENDOR WHERE NAME LIKE '%{}%'", likeText(name)));
     if (vendor.eof()) {
         vendor.addNew();
@@ -33,6 +33,30 @@ QVariant findOrAddVendor(const QString& name, const QString& street, const QStri
         vendor.update();
     }
     return vendor.value(u"VENDOR_ID"_s);
+}
+
+}  // namespace
+
+QVariant findOrAddVendor(const QString& name, const QString& street, const QString& phone)
+{
+    if (name.trimmed().isEmpty())
+        return 0;
+    if (keptNumbers && keptNumbers->contains(name))
+        return keptNumbers->at(name);
+    const QVariant number = foundOrAdded(name, street, phone);
+    if (keptNumbers)
+        keptNumbers->emplace(name, number);
+    return number;
+}
+
+KeptVendors::KeptVendors()
+{
+    keptNumbers.emplace();
+}
+
+KeptVendors::~KeptVendors()
+{
+    keptNumbers.reset();
 }
 
 }  // namespace kest

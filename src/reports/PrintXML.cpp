@@ -12,6 +12,7 @@
 #include "platform/files/files.h"
 #include "platform/values.h"
 #include "quotedata/NetworkCodes.h"
+#include "quotedata/Vendors.h"
 #include "reports/BuildAuthReport.h"
 #include "reports/QuoteComparison.h"
 #include "reports/ReportTable.h"
@@ -210,7 +211,11 @@ bool printAuthorised(const xml::Document& message, bool Reprint)
 {
     QString number;
     QString subquote;
-    std::optional<db::Recordset> table = BuildAuthReport(message, number, subquote, Reprint);
+    std::optional<db::Recordset> table;
+    {
+        const KeptVendors keptVendors;
+        table = BuildAuthReport(message, number, subquote, Reprint);
+    }
     frmPrintPreview::ShowForm(ComparisonReport, u""_s, table ? &*table : nullptr);
     const QuoteKey quote = QuoteKey::fromReference(message.textOf(u"//rootns:quoteBody/rootns:quoteReference"_s));
     if (hasSubletDocument(quote))

@@ -159,6 +159,15 @@ const std::map<std::string, std::function<void(Bench&, int)>> operations{
          addLines(lines);
          measureLoad(authorisation(lines));
      }},
+    {"load-sublets",
+     [](Bench&, int vendors) {
+         addLines(10);
+         addRows("VENDOR", "NAME", "'Vendor ' || i", vendors);
+         Message message = authorisedQuote("500").rego("ABC123");
+         for (int line = 11; line <= 30; ++line)
+             message.sublet(line, "I", {{"subletRepairer", "Windscreens"}});
+         measureLoad(message.text());
+     }},
     {"print",
      [](Bench&, int lines) {
          addLines(lines);
