@@ -15,6 +15,7 @@
 #include "quotedata/Rounding.h"
 
 #include <array>
+#include <map>
 #include <utility>
 
 namespace kest {
@@ -32,6 +33,7 @@ struct Export {
     db::Recordset lines, annotations, markers, debtor;
     db::Recordset insurer, car, model, customer;
     db::Recordset header{jobLink}, details{jobLink};
+    std::map<qint64, QString> suppliers;  // names by the number of the vendor
 };
 
 struct PartType {
@@ -67,10 +69,14 @@ constexpr Price prices[] = {
 
 void openRows(db::Recordset& rows, const QString& select)
 {
-    std::optional<db::Recordset> opened = OpenRecordset(select);
-    if (!opened)
+    if (gConn && gConn->state() == 1) {  // without asking the server each time whether it answers
+        rows = opened(select);
+        return;
+    }
+    std::optional<db::Recordset> reopened = OpenRecordset(select);
+    if (!reopened)
         throw RuntimeError(CannotOpen, u"There is no connection to the quote database."_s);
-    rows = std::move(*opened);
+    rows = std::move(*reopened);
 }
 
 /// Returns the row with JobLink's address, closed if it can't be read.
@@ -273,14 +279,17 @@ QVariant partTypeOf(const QString& mark)
     return {};
 }
 
-QString supplierOf(const db::Recordset& line)
+QString supplierOf(const QVariant& vendor, std::map<qint64, QString>& suppliers)
 {
-    const QVariant vendor = line.value(u"VENDOR"_s);
-    if (vendor.isNull() || toLong(vendor) <= 0)
+    const qint64 number = vendor.isNull() ? 0 : toLong(vendor);
+    if (number <= 0)
         return u""_s;
+    const auto known = suppliers.find(number);
+    if (known != suppliers.end())
+        return known->second;
     db::Recordset found;
     openRows(found, sql("SELECT Name FROM VENDOR WHERE vendor_id={}", vendor));
-    return found.eof() ? u""_s : found.text(u"NAME"_s);
+    return suppliers.emplace(number, found.eof() ? u""_s : found.text(u"NAME"_s)).first->second;
 }
 
 void writeLine(Export& job)
@@ -306,7 +315,7 @@ void writeLine(Export& job)
         detail.set(u"linePartNr"_s, partNumber.trimmed().isEmpty() ? QString(u""_s) : partNumber);
     else
         detail.set(u"linePartNr"_s, QVariant());
-    detail.set(u"lineSupplierName"_s, supplierOf(line));
+    detail.set(u"lineSupplierName"_s, supplierOf(line.value(u"VENDOR"_s), job.suppliers));
     detail.update();
 }
 
@@ -353,6 +362,7 @@ void finish(Export& job)
 void WriteQuote(const QString& quoteNumber, const QString& subquote)
 {
     Export job;
+    EnsureConnection();
     db::Recordset settings = joblinkSettings();
     if (!settings.isOpen() || settings.eof())
         return;
@@ -365,6 +375,7 @@ void WriteQuote(const QString& quoteNumber, const QString& subquote)
     if (!openJobLink(job, settings))
         return;
     settings.close();
+    EnsureConnection();  // JobLink may have answered late
     makeJob(job);
     try {
         if (job.jobId != 0)  // as soon as it is known, so that the job of an interrupted load is not made again

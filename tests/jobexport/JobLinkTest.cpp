@@ -59,7 +59,11 @@ TEST_F(JobLink, TheHeaderHoldsWhatTheShopKnows)
 {
     fill(insurer(), "street=1 HIGH ST suburb=RICHMOND 3121 phone=03 1");
     fill(customer("Holloway"), "street=Unit 2\\3 O'Hara's Row suburb=Zoë's Point SALUTATION=");
+    int asked = 0;
+    db::setConnectionFault([&] { return ++asked < 0; });
     exportQuote();
+    db::setConnectionFault({});
+    EXPECT_EQ(asked, 3) << "each is a trip: before and after the server of the jobs is asked, not before each question";
 
     for (const auto& [column, value] : casesIn<2>("jobexport/header.txt"))
         EXPECT_EQ(header(column), value.toStdString()) << column;
