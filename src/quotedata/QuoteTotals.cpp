@@ -158,13 +158,19 @@ bool CalcAuthorisedTotals(db::Recordset& quote, db::Recordset& lines)
 bool RoundQuoteLines(db::Recordset& quote)
 {
     db::Recordset lines = Quote::openLines(QuoteKey::fromRow(quote));
+    bool isChanged = false;
     for (; !lines.eof(); lines.moveNext()) {
-        for (const auto& column : {u"unitcost"_s, u"rrhour"_s, u"rahour"_s, u"pthour"_s})
-            if (!lines.text(column).isEmpty())
-                ofLine(lines, column, [&] { lines.set(column, RoundAmount(toDouble(lines.value(column)), 2)); });
+        for (const auto& column : {u"unitcost"_s, u"rrhour"_s, u"rahour"_s, u"pthour"_s}) {
+            if (lines.text(column).isEmpty())
+                continue;
+            const QVariant given = lines.value(column);
+            ofLine(lines, column, [&] { lines.set(column, RoundAmount(toDouble(given), 2)); });
+            isChanged = isChanged || lines.value(column) != given;
+        }
         lines.update();
     }
-    lines.requery();
+    if (isChanged)
+        lines.requery();  // the database may store another value than it gets
     return CalcQuoteTotals(quote, lines);
 }
 

@@ -93,6 +93,14 @@ QString authorisation(int lines)
     return message.text();
 }
 
+void measureSend(int lines, int otherQuotes = 1)
+{
+    addQuotes(otherQuotes);
+    addLines(lines);
+    db::Recordset panel = opened(u"SELECT * FROM QUOTE1 WHERE QTNNO='500'"_s);
+    measured([&] { expect(SendQuote(panel) > 0); });
+}
+
 /// What is done, in a shop of that size.
 const std::map<std::string, std::function<void(Bench&, int)>> operations{
     {"fill",
@@ -181,12 +189,8 @@ const std::map<std::string, std::function<void(Bench&, int)>> operations{
          const QTemporaryDir folder;
          measured([&] { report::writePdf(report, folder.filePath(u"report.pdf"_s)); });
      }},
-    {"send",
-     [](Bench&, int lines) {
-         addLines(lines);
-         db::Recordset panel = opened(u"SELECT * FROM QUOTE1 WHERE QTNNO='500'"_s);
-         measured([&] { expect(SendQuote(panel) > 0); });
-     }},
+    {"send", [](Bench&, int lines) { measureSend(lines); }},
+    {"send-one", [](Bench&, int quotes) { measureSend(10, quotes); }},
     {"move-loaded",
      [](Bench& shop, int readFiles) {
          quote("500").request("QR1");
