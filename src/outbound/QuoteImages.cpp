@@ -9,6 +9,7 @@
 #include "platform/xml/Branch.h"
 
 #include <QJsonArray>
+#include <QSet>
 
 #include <cmath>
 
@@ -55,7 +56,16 @@ static QList<QuoteImage> countedImages(const QString& folder, const QuoteKey& qu
 QStringList writeImageDocuments(const QString& folder, const QuoteKey& quote)
 {
     QStringList gone;
-    for (const QuoteImage& image : countedImages(folder, quote)) {
+    const QList<QuoteImage> images = countedImages(folder, quote);
+    if (images.isEmpty())
+        return gone;
+    QSet<QString> waiting;  // with their case folded
+    for (const QString& name : files::list(gsUnsentPath, u"I_"_s + quote.number + u'*'))
+        waiting.insert(name.toCaseFolded());
+    const auto target = [&](const QString& name) {
+        return waiting.contains(name.toCaseFolded()) ? files::Target::Unknown : files::Target::Free;
+    };
+    for (const QuoteImage& image : images) {
         workStep();
         if (journal::kept(image.file).toBool())
             continue;
@@ -75,8 +85,9 @@ QStringList writeImageDocuments(const QString& folder, const QuoteKey& quote)
             {"imageDescription", always, {}},
         });
         const QString name = u"I_"_s + image.file;
-        files::write(gsUnsentPath + name.chopped(3) + u"xml"_s, request.xml());
-        files::copy(picture, gsUnsentPath + name);
+        const QString documentName = name.chopped(3) + u"xml"_s;
+        files::write(gsUnsentPath + documentName, request.xml(), target(documentName));
+        files::copy(picture, gsUnsentPath + name, target(name));
         journal::keep(image.file, true);
     }
     return gone;

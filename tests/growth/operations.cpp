@@ -191,6 +191,15 @@ const std::map<std::string, std::function<void(Bench&, int)>> operations{
      }},
     {"send", [](Bench&, int lines) { measureSend(lines); }},
     {"send-one", [](Bench&, int quotes) { measureSend(10, quotes); }},
+    {"send-pictures",
+     [](Bench&, int waiting) {
+         for (int i = 0; i < waiting; ++i)
+             files::write(gsUnsentPath + u"I_%1_0001.jpg"_s.arg(i), {});
+         for (int i = 1; i <= 3; ++i)
+             files::write(gsImagesPath + u"500_000%1.jpg"_s.arg(i), {});
+         measureSend(10);
+         expect(files::exists(gsUnsentPath + u"I_500_0003.xml"_s));
+     }},
     {"move-loaded",
      [](Bench& shop, int readFiles) {
          quote("500").request("QR1");

@@ -74,9 +74,9 @@ void restrictToOwner(const QString& path)
     SystemFile(systemPath(path), O_RDONLY).setMode(ownerAlone);
 }
 
-void write(const QString& path, const QString& text)
+void write(const QString& path, const QString& text, Target target)
 {
-    writeBytes(path, toCodePage(text));
+    replaceFile(placeOf(path, target), spelledPath(path), [&](SystemFile& file) { file.write(toCodePage(text)); });
 }
 
 void append(const QString& path, const QString& text)

@@ -31,10 +31,12 @@ QByteArray readBytes(const QString& path);
 /// Reads at most that many bytes from the beginning of a file, as they are.
 QByteArray readStart(const QString& path, qint64 most);
 
+/// What the caller knows of a target: if list() has not shown its name in any case, the folder is not searched again.
+enum class Target { Unknown, Free };
 /// Writes a file in Windows-1252; other characters become "?". Writes to a temporary name first, which list() never
 /// returns, and then renames it, so that no reader sees part of a file. A file in another case is replaced and gets the
 /// new spelling.
-void write(const QString& path, const QString& text);
+void write(const QString& path, const QString& text, Target target = Target::Unknown);
 /// Who can read a written file.
 enum class Access { AsBefore, OwnerAlone };
 void writeBytes(const QString& path, const QByteArray& bytes, Access access = Access::AsBefore);
@@ -46,8 +48,6 @@ void restrictToOwner(const QString& path);
 /// Adds text to the end of a file. Creates a missing file.
 void append(const QString& path, const QString& text);
 
-/// What the caller knows of a target: if list() has not shown its name in any case, the folder is not searched again.
-enum class Target { Unknown, Free };
 /// Copies a file and replaces the target. No reader sees part of the target.
 void copy(const QString& from, const QString& to, Target target = Target::Unknown);
 /// Moves a file and replaces the target.
