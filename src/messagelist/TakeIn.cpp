@@ -9,8 +9,10 @@
 #include "quotedata/Quote.h"
 
 #include <QFileInfo>
+#include <QSet>
 
 #include <algorithm>
+#include <optional>
 
 using namespace Qt::StringLiterals;
 
@@ -74,11 +76,41 @@ FileKind kindOf(const QString& path, const QString& name)
     return isPicture ? FileKind::Picture : FileKind::Description;
 }
 
-bool mayBeWritten(const QString& name)
+/// The names in the unread folder. Lists the folder once for many files.
+class UnreadNames {
+public:
+    bool contains(const QString& name)
+    {
+        if (!folded) {
+            folded.emplace();
+            for (const QString& found : files::list(gsUnreadPath))
+                add(found);
+        }
+        return folded->contains(name.toCaseFolded());
+    }
+    void add(const QString& name) { folded->insert(name.toCaseFolded()); }
+    /// Lets the next question list the folder again.
+    void forget() { folded.reset(); }
+
+private:
+    std::optional<QSet<QString>> folded;
+};
+
+/// Copies a file into the unread folder. Returns false if the user does not want to replace the one of that name.
+bool copyUnlessKept(const QString& path, const QString& name, UnreadNames& unread)
 {
-    return !files::exists(gsUnreadPath + name) ||
-           desktop::ask(name + " is already in the unread folder. Replace it?"_L1, desktop::Icon::Question, {},
-                        desktop::Answer::No);
+    const QString target = files::pathForWriting(gsUnreadPath, name);
+    if (!unread.contains(name)) {
+        files::copy(path, target, files::Target::Free);
+        unread.add(name);
+        return true;
+    }
+    unread.forget();  // the question may stay open for long
+    if (!desktop::ask(name + " is already in the unread folder. Replace it?"_L1, desktop::Icon::Question, {},
+                      desktop::Answer::No))
+        return false;
+    files::copy(path, target);
+    return true;
 }
 
 struct Brought {
@@ -139,11 +171,11 @@ TakenIn takeInFiles(const QList<QUrl>& urls, const std::function<void(qint64 don
     std::ranges::stable_sort(brought, {}, &Brought::kind);
 
     qint64 done = 0;
+    UnreadNames unread;
     for (const Brought& file : std::as_const(brought)) {
         unlessRefused(file.name, [&] {
-            if (!mayBeWritten(file.name))
+            if (!copyUnlessKept(file.path, file.name, unread))
                 return;
-            files::copy(file.path, files::pathForWriting(gsUnreadPath, file.name));
             ++(file.kind == FileKind::Message   ? result.messages
                : file.kind == FileKind::Picture ? result.pictures
                                                 : result.descriptions);

@@ -34,6 +34,7 @@
 #include <QPushButton>
 #include <QRadioButton>
 #include <QScopedValueRollback>
+#include <QSet>
 #include <QShortcut>
 #include <QThread>
 #include <QTimer>
@@ -435,8 +436,9 @@ void frmMessageList::takeIn(const QList<QUrl>& brought)
         taken = takeInFiles(brought, [&](qint64 done, qint64 total) { progress.step(done, total); });
     }
     Form_KeyRefresh();
-    const qsizetype waiting = std::ranges::count_if(
-        heldBack, [&](const HeldMessage& message) { return taken.toList.contains(message.file); });
+    const QSet<QString> toList(taken.toList.begin(), taken.toList.end());
+    const qsizetype waiting =
+        std::ranges::count_if(heldBack, [&](const HeldMessage& message) { return toList.contains(message.file); });
     const QString held = u" %1 not listed yet: held back by missing pictures or an earlier message."_s;
     tell(taken.summary() + (waiting > 0 ? held.arg(waiting) : QString()) + u' ' + lblStatus->text());
     if (!taken.refused.isEmpty())

@@ -1,6 +1,7 @@
 // Does one operation of the shop once, in a shop of a chosen size, for `count`, which counts its instructions,
 // statements and calls for files: operations NAME SIZE.
 #include "base/Journal.h"
+#include "messagelist/TakeIn.h"
 #include "messages/Envelope.h"
 #include "messages/Folders.h"
 #include "outbound/SendQuote.h"
@@ -32,6 +33,7 @@ namespace {
 
 struct Bench : Shop {
     using Shop::arrive;
+    using Shop::bring;
     void TestBody() override {}
 };
 
@@ -199,6 +201,13 @@ const std::map<std::string, std::function<void(Bench&, int)>> operations{
              files::write(gsImagesPath + u"500_000%1.jpg"_s.arg(i), {});
          measureSend(10);
          expect(files::exists(gsUnsentPath + u"I_500_0003.xml"_s));
+     }},
+    {"take-in",
+     [](Bench& shop, int descriptions) {
+         QList<QUrl> brought;
+         for (int i = 0; i < descriptions; ++i)
+             brought.append(shop.bring(u"%1_001.txt"_s.arg(i), {}));
+         measured([&] { expect(takeInFiles(brought).descriptions == descriptions); });
      }},
     {"move-loaded",
      [](Bench& shop, int readFiles) {
