@@ -18,6 +18,8 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
+constexpr qsizetype recordsAtOnce = 100;  // in one statement
+
 /// Fails with "42501" if this user may not write what settling an operation writes. That a row can be inserted shows
 /// with the first one.
 void requireRights()
@@ -48,6 +50,13 @@ void tellNoJournal(const QString& why)
     reasons.insert(why);
     const QString told = why + u": what changes a quote is not recorded, and interrupted work is not taken back."_s;
     attempt([&] { logFailure(RuntimeError(NoObject, told), u"Journal.watch"_s); });
+}
+
+void insert(const QStringList& records)
+{
+    gConn->execute(
+        sql("INSERT INTO KESTJournal (Operation, ChangedAt, TableName, QTNNO, Subquote, RowData, Settled) VALUES ") +
+        records.join(u", "_s));
 }
 
 QVariant valueOf(const db::RowChange& row, const QString& name)
@@ -171,14 +180,16 @@ void Recorder::write(const QList<db::RowChange>& rows)
     else if (work->isNumberNew)
         work->storeNumber();
     const QString moment = now();
+    QStringList records;
     for (const db::RowChange& row : rows) {
-        const QVariant number = valueOf(row, u"QTNNO"_s);
-        const QVariant subquote = valueOf(row, u"Subquote"_s);
-        gConn->execute(
-            sql("INSERT INTO KESTJournal (Operation, ChangedAt, TableName, QTNNO, Subquote, RowData, "
-                "Settled) VALUES ({}, '{}', '{}', '{}', '{}', '{}', 0)",
-                work->id, moment, row.table, textOrEmpty(number), textOrEmpty(subquote), textOf(row)));
+        records.append(sql("({}, '{}', '{}', '{}', '{}', '{}', 0)", work->id, moment, row.table,
+                           textOrEmpty(valueOf(row, u"QTNNO"_s)), textOrEmpty(valueOf(row, u"Subquote"_s)),
+                           textOf(row)));
+        if (records.size() == recordsAtOnce)
+            insert(std::exchange(records, {}));
     }
+    if (!records.isEmpty())
+        insert(records);
     if (work->isPointAhead)
         work->markPoint();
 }

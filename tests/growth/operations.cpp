@@ -34,6 +34,7 @@ namespace {
 struct Bench : Shop {
     using Shop::arrive;
     using Shop::bring;
+    using Shop::desktop;
     void TestBody() override {}
 };
 
@@ -177,6 +178,14 @@ const std::map<std::string, std::function<void(Bench&, int)>> operations{
          for (int line = 11; line <= 30; ++line)
              message.sublet(line, "I", {{"subletRepairer", "Windscreens"}});
          measureLoad(message.text());
+     }},
+    {"delete-quote",
+     [](Bench& shop, int lines) {
+         addLines(lines);
+         gConn->execute(u"UPDATE QUOTE2 SET Subquote=1"_s);
+         quote("500", 1).quoteNumber("KQ2");
+         shop.desktop.emplace(R"({"boxes": [{"text": "DELETED", "answer": "yes"}]})");
+         measureLoad(quoteDeletion("KQ2").text());
      }},
     {"print",
      [](Bench&, int lines) {
