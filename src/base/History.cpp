@@ -10,6 +10,7 @@
 #include "platform/values.h"
 
 #include <QJsonDocument>
+#include <QSet>
 
 #include <algorithm>
 
@@ -20,6 +21,7 @@ using namespace Qt::StringLiterals;
 namespace {
 
 constexpr int prunedAtOnce = 1000;  // rows
+constexpr int lookedAt = 100;       // operations
 
 Entry entryAt(const db::Recordset& row)
 {
@@ -193,18 +195,21 @@ void prune()
     if (!isKept())
         return;
     const QDateTime limit = QDateTime::currentDateTime().addDays(-daysKept());
-    QStringList inUse{u"0"_s};
+    QSet<qint64> inUse;
     for (const Entry& pending : pendingOperations())
-        inUse.append(QString::number(pending.facts[u"undoes"_s].toInteger()));
-    for (qint64 room = prunedAtOnce; room > 0;) {
-        const db::Recordset oldest =
-            opened(sql("SELECT TOP 1 Operation FROM KESTOperation WHERE StartedAt<'{}' AND State<>'open' AND "
-                       "State<>'unfinished' AND Operation NOT IN (",
-                       limit.toString(u"yyyy-MM-ddTHH:mm:ss"_s)) +
-                   inUse.join(u", "_s) + u") ORDER BY Operation"_s);
-        if (oldest.eof())
-            return;
-        const QVariant operation = oldest.value(u"Operation"_s);
+        inUse.insert(pending.facts[u"undoes"_s].toInteger());
+    // Looks at the first ones only: a search for old ones among all would take longer with each operation that is kept.
+    // They begin with the oldest, unless the clock of a workstation is wrong.
+    db::Recordset first = opened(sql(
+        "SELECT TOP {} Operation, StartedAt FROM KESTOperation WHERE State<>'open' AND State<>'unfinished' ORDER BY "
+        "Operation",
+        lookedAt));
+    qint64 room = prunedAtOnce;
+    for (; room > 0 && !first.eof(); first.moveNext()) {
+        const QDateTime started = first.value(u"StartedAt"_s).toDateTime();
+        const QVariant operation = first.value(u"Operation"_s);
+        if (!started.isValid() || started >= limit || inUse.contains(toLong(operation)))
+            continue;
         setState(toLong(operation), State::Pruned);  // first: nobody may undo what is left of it
         db::Recordset rows =
             opened(sql("SELECT TOP {} Entry FROM KESTJournal WHERE Operation={} ORDER BY Entry", room, operation));

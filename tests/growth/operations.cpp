@@ -1,5 +1,6 @@
 // Does one operation of the shop once, in a shop of a chosen size, for `count`, which counts its instructions,
 // statements and calls for files: operations NAME SIZE.
+#include "base/History.h"
 #include "base/Journal.h"
 #include "messagelist/TakeIn.h"
 #include "messages/Envelope.h"
@@ -217,6 +218,11 @@ const std::map<std::string, std::function<void(Bench&, int)>> operations{
          for (int i = 0; i < descriptions; ++i)
              brought.append(shop.bring(u"%1_001.txt"_s.arg(i), {}));
          measured([&] { expect(takeInFiles(brought).descriptions == descriptions); });
+     }},
+    {"prune",
+     [](Bench&, int settled) {
+         addRows("KESTOperation", "OperationKind, State, StartedAt", "'load', 'done', '2999-01-01T00:00:00'", settled);
+         measured([] { journal::prune(); });
      }},
     {"move-loaded",
      [](Bench& shop, int readFiles) {
