@@ -88,8 +88,9 @@ bool LoadARES(QString& text, const QString&)
 {
     const SharedMessage message = sharedMessage(text);
     const QString number = message->textOf(u"//rootns:getAssmntResultResponse/rootns:kestOriginalQuoteNumber"_s);
-    db::Recordset header = opened(sql("SELECT * FROM QUOTE1 WHERE KESTQuoteNo='{}' ORDER BY rec_id DESC", number));
-    if (isUnknown(number, header))
+    db::Recordset header =
+        Quote::openNumbered(number, sql("SELECT * FROM QUOTE1 WHERE KESTQuoteNo='{}' ORDER BY rec_id DESC", number));
+    if (header.eof())
         return refuseRequestNumber();
     header.moveLast();  // the oldest quote with that number
     Quote quote(std::move(header));
@@ -108,8 +109,9 @@ bool LoadBACA(QString& text, const QString& fileName)
     const SharedMessage message = sharedMessage(text);
     const QString request = message->textOf(u"//rootns:getBackoutAssmntResponse/rootns:kestQuoteRequestNumber"_s);
     // the first is the newest quote of the request
-    Quote quote(opened(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request)));
-    if (isUnknown(request, quote.header()))
+    Quote quote(
+        Quote::openNumbered(request, sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request)));
+    if (quote.header().eof())
         return refuseRequestNumber();
 
     applyTransition(backOutOf(quote), quote);

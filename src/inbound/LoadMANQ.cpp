@@ -68,16 +68,17 @@ std::optional<QuoteKey> matchSupplementary(const ManualQuote& manual, const db::
     const qint64 subquote = toLong(manual.told.subquote);
     const QString number = subquote == 0 ? newNumber(manual.told.number, cinfo) : manual.told.number;
 
-    db::Recordset quotes =
-        opened(sql("SELECT QTNNO, subquote FROM QUOTE1 WHERE QTNNO = '{}' ORDER BY subquote", number));
-    if (!isUnknown(number, quotes)) {
+    db::Recordset quotes = Quote::openNumbered(
+        number, sql("SELECT QTNNO, subquote FROM QUOTE1 WHERE QTNNO = '{}' ORDER BY subquote", number));
+    if (!quotes.eof()) {
         quotes.moveLast();
         const bool isAbove = subquote > toLong(quotes.value(u"subquote"_s));
         return QuoteKey{number, isAbove ? manual.told.subquote : behind(quotes)};
     }
-    quotes =
-        opened(sql("SELECT QTNNO, SUBQUOTE FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY SUBQUOTE DESC", manual.request));
-    if (!isUnknown(manual.request, quotes))
+    quotes = Quote::openNumbered(
+        manual.request,
+        sql("SELECT QTNNO, SUBQUOTE FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY SUBQUOTE DESC", manual.request));
+    if (!quotes.eof())
         return QuoteKey{quotes.text(u"QTNNO"_s), behind(quotes)};
     refuse(u"Failed matching to existing parent KEST Quote"_s);
     return {};
@@ -110,9 +111,10 @@ QuoteKey matchMain(const ManualQuote& manual, const db::Recordset& cinfo)
     const QString rego = manual.rego.trimmed().toUpper();
     const auto isOfCar = [&](const QString& typed) { return AlphaNumericOnly(typed).toUpper() == rego; };
 
-    const db::Recordset numbered = opened(
+    const db::Recordset numbered = Quote::openNumbered(
+        manual.told.number,
         sql("SELECT QTNNO, subquote, Rego FROM QUOTE1 WHERE QTNNO = '{}' ORDER BY subquote", manual.told.number));
-    if (!isUnknown(manual.told.number, numbered)) {
+    if (!numbered.eof()) {
         const QString typed = numbered.text(u"Rego"_s);
         if (typed.trimmed().toUpper() == rego)
             return QuoteKey::fromRow(numbered);
@@ -122,9 +124,9 @@ QuoteKey matchMain(const ManualQuote& manual, const db::Recordset& cinfo)
         }
         return {newNumber(manual.told.number, cinfo)};
     }
-    const db::Recordset requested =
-        opened(sql("SELECT QTNNO, Subquote, Rego FROM QUOTE1 WHERE KESTQRNO='{}'", manual.request));
-    if (!isUnknown(manual.request, requested) && isOfCar(requested.text(u"Rego"_s)))
+    const db::Recordset requested = Quote::openNumbered(
+        manual.request, sql("SELECT QTNNO, Subquote, Rego FROM QUOTE1 WHERE KESTQRNO='{}'", manual.request));
+    if (!requested.eof() && isOfCar(requested.text(u"Rego"_s)))
         return QuoteKey::fromRow(requested);
     return {newNumber(manual.told.number, cinfo)};
 }

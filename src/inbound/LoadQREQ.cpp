@@ -14,6 +14,7 @@
 #include "platform/files/files.h"
 #include "platform/values.h"
 #include "quotedata/NetworkCodes.h"
+#include "quotedata/Quote.h"
 #include "quotedata/StateTable.h"
 #include "reports/PrintXML.h"
 
@@ -323,9 +324,10 @@ bool LoadQREQ(QString& text, const QString& fileName)
     db::Recordset car = opened(sql("SELECT * FROM CAR WHERE REGO='{}'", request.rego));
     db::Recordset colours = opened(u"SELECT * FROM KESTColours"_s);
 
-    const db::Recordset known = opened(sql("SELECT * FROM QUOTE1 WHERE SUBQUOTE=0 AND KESTQRNO='{}' AND KESTQRVER='{}'",
-                                           request.number, request.version));
-    if (!isUnknown(request.number, known)) {
+    const db::Recordset known = Quote::openNumbered(
+        request.number, sql("SELECT * FROM QUOTE1 WHERE SUBQUOTE=0 AND KESTQRNO='{}' AND KESTQRVER='{}'",
+                            request.number, request.version));
+    if (!known.eof()) {
         newQuotes.reset();  // a box may stay open for hours
         return refuse(u"Quote Request already exists as quote number "_s + known.text(u"QTNNO"_s) + u'!');
     }

@@ -38,7 +38,8 @@ void tell(const QStringList& lines)
 /// Returns the oldest quote of the request, which is usually the main quote.
 Quote oldestOfRequest(const QString& request)
 {
-    db::Recordset header = opened(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request));
+    db::Recordset header =
+        Quote::openNumbered(request, sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request));
     if (!header.eof())
         header.moveLast();
     return Quote(std::move(header));
@@ -119,8 +120,8 @@ bool LoadQTDL(QString& text, const QString&)
 {
     const SharedMessage message = sharedMessage(text);
     const QString networkNumber = message->textOf(u"//rootns:getQuoteDeletionResponse/rootns:kestQuoteNumber"_s);
-    Quote quote(opened(sql("SELECT * FROM QUOTE1 WHERE KESTQuoteNo='{}'", networkNumber)));
-    if (isUnknown(networkNumber, quote.header()))
+    Quote quote(Quote::openNumbered(networkNumber, sql("SELECT * FROM QUOTE1 WHERE KESTQuoteNo='{}'", networkNumber)));
+    if (quote.header().eof())
         return refuse(noSuchQuoteNumber);
 
     const QString reason = message->textOf(u"//rootns:getQuoteDeletionResponse/rootns:reason"_s);
@@ -151,8 +152,9 @@ bool LoadRRQT(QString& text, const QString&)
 {
     const SharedMessage message = sharedMessage(text);
     const QString request = message->textOf(u"//rootns:getReqForRevQteResponse/rootns:quoteRequestNumber"_s);
-    Quote quote(opened(sql("SELECT TOP 1 * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request)));
-    if (isUnknown(request, quote.header()))
+    Quote quote(Quote::openNumbered(
+        request, sql("SELECT TOP 1 * FROM QUOTE1 WHERE KESTQRNO='{}' ORDER BY rec_id DESC", request)));
+    if (quote.header().eof())
         return refuse(noSuchRequest);
 
     const QString comments = message->textOf(u"//rootns:getReqForRevQteResponse/rootns:comments"_s);
@@ -172,7 +174,7 @@ bool LoadQRCN(QString& text, const QString&)
     const SharedMessage message = sharedMessage(text);
     const QString request = message->textOf(u"//rootns:getQRCancellationResponse/rootns:quoteRequestNumber"_s);
     Quote quote = oldestOfRequest(request);
-    if (isUnknown(request, quote.header()))
+    if (quote.header().eof())
         return refuse(noSuchRequest);
 
     const QString reason = message->textOf(u"//rootns:getQRCancellationResponse/rootns:qrCancellationReason"_s);
@@ -187,7 +189,7 @@ bool LoadBCQR(QString& text, const QString&)
     const SharedMessage message = sharedMessage(text);
     const QString request = message->textOf(u"//rootns:getBackoutCancelledQRResponse/rootns:kestQuoteRequestNumber"_s);
     Quote quote = oldestOfRequest(request);
-    if (isUnknown(request, quote.header()))
+    if (quote.header().eof())
         return refuse(noSuchRequest);
 
     applyTransition(requestReinstated, quote);

@@ -1,6 +1,5 @@
 #include "inbound/Loading.h"
 
-#include "base/Helpers.h"
 #include "base/QuoteKey.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
@@ -33,11 +32,6 @@ void respellColour(db::Recordset& car, db::Recordset& colours)
         return;
     colours.find(sql("Script='{}'", colour));
     car.set(u"COLOUR"_s, colours.eof() ? u""_s : colours.text(u"Script"_s).trimmed());
-}
-
-bool isUnknown(const QString& number, const db::Recordset& quote)
-{
-    return isBlank(number) || quote.eof();
 }
 
 void tellOldTotals(const db::Recordset& quote)

@@ -21,9 +21,6 @@ void setColumns(db::Recordset& row, std::initializer_list<ColumnValue> columns);
 void fillWithoutTotals(db::Recordset& quote);
 /// Changes a car's colour to the spelling of the colour table, or clears it if the table does not have the colour.
 void respellColour(db::Recordset& car, db::Recordset& colours);
-/// Returns true if a number in a message leads to no quote. A blank number is always unknown, because quotes of the
-/// host may have an empty number too.
-bool isUnknown(const QString& number, const db::Recordset& quote);
 /// Shows a box that says that the totals of a loaded quote could not be calculated or stored.
 void tellOldTotals(const db::Recordset& quote);
 /// Shows a critical box that says why a message is refused. Returns false.

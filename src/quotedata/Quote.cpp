@@ -57,6 +57,11 @@ QString Quote::headerQuery(const QuoteKey& key)
     return sql("SELECT * FROM QUOTE1 WHERE QTNNO='{}' AND SUBQUOTE='{}'", key.number, key.subquote);
 }
 
+db::Recordset Quote::openNumbered(const QString& number, const QString& select)
+{
+    return opened(number.trimmed().isEmpty() ? sql("SELECT * FROM QUOTE1 WHERE rec_id=0") : select);
+}
+
 db::Recordset Quote::openHeader(const QuoteKey& key)
 {
     return opened(headerQuery(key));

@@ -32,6 +32,9 @@ public:
 
     /// Returns the statement that openHeader() opens.
     static QString headerQuery(const QuoteKey& key);
+    /// Opens the quotes that a number in a message leads to. A blank number leads to none: quotes of the host may have
+    /// an empty number too, perhaps all of them.
+    static db::Recordset openNumbered(const QString& number, const QString& select);
     /// Open the records of a quote directly.
     static db::Recordset openHeader(const QuoteKey& key);
     static db::Recordset openLines(const QuoteKey& key);

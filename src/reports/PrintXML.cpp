@@ -12,6 +12,7 @@
 #include "platform/files/files.h"
 #include "platform/values.h"
 #include "quotedata/NetworkCodes.h"
+#include "quotedata/Quote.h"
 #include "quotedata/Vendors.h"
 #include "reports/BuildAuthReport.h"
 #include "reports/QuoteComparison.h"
@@ -134,10 +135,10 @@ void fillRequest(db::Recordset& row, const xml::Document& message, const QString
 bool printRequest(const xml::Document& message)
 {
     const QString requestNumber = message.textOf(u"//rootns:quoteRequestNumber"_s);
-    db::Recordset quote(gConn);
-    quote.open(sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' AND KESTQRVer='{}' ORDER BY rec_id DESC", requestNumber,
-                   message.textOf(u"//rootns:quoteRequestVersionNumber"_s)));
-    if (quote.eof() || requestNumber.trimmed().isEmpty()) {
+    db::Recordset quote = Quote::openNumbered(
+        requestNumber, sql("SELECT * FROM QUOTE1 WHERE KESTQRNO='{}' AND KESTQRVer='{}' ORDER BY rec_id DESC",
+                           requestNumber, message.textOf(u"//rootns:quoteRequestVersionNumber"_s)));
+    if (quote.eof()) {
         desktop::msgBox(u"Quote does not exist in database, please contact MarlinDesk Support."_s,
                         desktop::Icon::Critical);
         return false;
@@ -158,9 +159,9 @@ bool printRequest(const xml::Document& message)
 bool printResult(const xml::Document& message)
 {
     const QString requestNumber = message.textOf(u"//rootns:kestQuoteRequestNumber"_s);
-    db::Recordset quote(gConn);
-    quote.open(sql("SELECT * FROM QUOTE1 WHERE KESTQRNo='{}' ORDER BY rec_id DESC", requestNumber));
-    if (quote.recordCount() != 1 || requestNumber.trimmed().isEmpty()) {
+    db::Recordset quote = Quote::openNumbered(
+        requestNumber, sql("SELECT * FROM QUOTE1 WHERE KESTQRNo='{}' ORDER BY rec_id DESC", requestNumber));
+    if (quote.recordCount() != 1) {
         desktop::msgBox(u"Failed Matching Quote. Please contact MarlinDesk Support"_s, desktop::Icon::Critical);
         return false;
     }

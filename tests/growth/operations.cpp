@@ -158,6 +158,12 @@ const std::map<std::string, std::function<void(Bench&, int)>> operations{
          addRows("CAR", "REGO, CUST_ID, MODEL_ID", "'XBC' || i, 100 + i, 'C120'", quotes);
          measureLoad(manualQuote("Q5").rego("ABC123").labour(1, "C").text());
      }},
+    {"load-unasked",
+     [](Bench&, int quotes) {
+         addRows("QUOTE1", "QTNNO, Subquote, KESTQRNo", "'Q' || i, 0, ''", quotes);  // the host's own
+         car("ABC123");
+         measureLoad(manualQuote("999").request("").rego("ABC123").labour(1, "C").text());
+     }},
     {"notes",
      [](Bench&, int notes) {
          QString chain;
