@@ -11,7 +11,6 @@
 #include "shell/eKEST.h"
 #include "support/MariaDbServer.h"
 
-#include <QApplication>
 #include <QElapsedTimer>
 #include <QFile>
 #include <QTemporaryDir>
@@ -28,6 +27,7 @@ class Shop {
 public:
     Shop()
     {
+        desktop::useScript(std::make_shared<desktop::Script>());
         profile::setRoot(folder.filePath(u"shop"_s));
         app::initProfile(registerClass, app::Shop::Demo);
         host = std::make_unique<eKEST>();
@@ -101,13 +101,3 @@ void exportOfLines(benchmark::State& state)
 BENCHMARK(exportOfLines)->Arg(10)->Arg(100)->Arg(1000)->UseManualTime()->Unit(benchmark::kMillisecond);
 
 }  // namespace
-
-int main(int argc, char** argv)
-{
-    qputenv("QT_QPA_PLATFORM", "offscreen");
-    QApplication application(argc, argv);
-    desktop::useScript(std::make_shared<desktop::Script>());
-    benchmark::Initialize(&argc, argv);
-    benchmark::RunSpecifiedBenchmarks();
-    return 0;
-}

@@ -1,17 +1,12 @@
 // Measures loads of authorised and manual quotes with many lines against the plain statements of the same load.
+#include "BenchShop.h"
 #include "InTurn.h"
 #include "PlainStatements.h"
 #include "base/SharedVariables.h"
-#include "base/modDBAccess.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
-#include "platform/profile.h"
-#include "setup/QuoteDatabase.h"
-
-#include <QCoreApplication>
-#include <QTemporaryDir>
 
 #include <benchmark/benchmark.h>
 
@@ -23,48 +18,25 @@ namespace {
 constexpr const char* categories[] = {"R&R", "RA", "MIS"};
 constexpr const char* labourTypes[] = {"RR", "REPR", "OTH"};
 
-/// A new shop with the quotes 1 and 2, each with `lines` labour lines: one for the load, one for the plain statements.
-class BenchShop {
-public:
-    explicit BenchShop(int64_t lines)
-    {
-        profile::setRoot(folder.path());
-        for (const auto& [variable, path] :
-             {std::pair(&gsUnreadPath, u"c:\\wirdoc\\AUnread\\"_s), std::pair(&gsReadPath, u"c:\\wirdoc\\ARead\\"_s)}) {
-            files::makeFolder(path);
-            *variable = path;
-        }
-        gsListFolder = gsUnreadPath;
-        gcnDB = gConn = app::openEmbedded(u"WirSql"_s);
-        app::createTables(*gConn, app::Server::Embedded);
-        app::fillNewShop(*gConn);
-        runPlain(u"INSERT INTO CAR (REGO, CUST_ID, KEST) VALUES ('ABC123', 1, 1)"_s);
-        runPlain(u"BEGIN"_s);
-        for (const int quote : {1, 2}) {
+/// Adds the quotes 1 and 2, each with `lines` labour lines: one for the load, one for the plain statements.
+void addQuotes(int64_t lines)
+{
+    runPlain(u"INSERT INTO CAR (REGO, CUST_ID, KEST) VALUES ('ABC123', 1, 1)"_s);
+    runPlain(u"BEGIN"_s);
+    for (const int quote : {1, 2}) {
+        runPlain(
+            sql("INSERT INTO QUOTE1 (QTNNO, Subquote, REGO, INSURER_ID, KESTQRNo, excess, contri) "
+                "VALUES ('{}', 0, 'ABC123', 1, 'QR1', 0, 0)",
+                quote));
+        runPlain(sql("INSERT INTO QUOTE3 (QTNNO, Subquote, remarks) VALUES ('{}', 0, '')", quote));
+        for (qint64 line = 1; line <= lines; ++line)
             runPlain(
-                sql("INSERT INTO QUOTE1 (QTNNO, Subquote, REGO, INSURER_ID, KESTQRNo, excess, contri) "
-                    "VALUES ('{}', 0, 'ABC123', 1, 'QR1', 0, 0)",
-                    quote));
-            runPlain(sql("INSERT INTO QUOTE3 (QTNNO, Subquote, remarks) VALUES ('{}', 0, '')", quote));
-            for (qint64 line = 1; line <= lines; ++line)
-                runPlain(
-                    sql("INSERT INTO QUOTE2 (QTNNO, Subquote, SEQ_NO, category, script, rrhour, rr_rate2, PartNo, "
-                        "itemno, allow_tick) VALUES ('{}', 0, {}, '{}', 'Left front guard', 1, 38, '', '137', 7)",
-                        quote, line, QString::fromLatin1(categories[line % 3])));
-        }
-        runPlain(u"COMMIT"_s);
+                sql("INSERT INTO QUOTE2 (QTNNO, Subquote, SEQ_NO, category, script, rrhour, rr_rate2, PartNo, "
+                    "itemno, allow_tick) VALUES ('{}', 0, {}, '{}', 'Left front guard', 1, 38, '', '137', 7)",
+                    quote, line, QString::fromLatin1(categories[line % 3])));
     }
-
-    ~BenchShop()
-    {
-        gConn.reset();
-        gcnDB.reset();
-        profile::setRoot({});
-    }
-
-private:
-    QTemporaryDir folder;
-};
+    runPlain(u"COMMIT"_s);
+}
 
 QString element(const char* name, const QString& text)
 {
@@ -194,7 +166,8 @@ void statementsOfManual(int64_t lines, int round)
 /// Runs loads and statements in turn and reports the ratio of their times.
 void compare(benchmark::State& state, QString (*message)(int64_t, int), void (*statements)(int64_t, int))
 {
-    const BenchShop shop(state.range(0));
+    const BenchShop shop;
+    addQuotes(state.range(0));
     InTurn times(state);
     int round = 0;
     for (auto _ : state) {
@@ -226,11 +199,3 @@ BENCHMARK(loadManualQuote)->Arg(1000)->Iterations(5)->UseManualTime()->Unit(benc
 
 }  // namespace
 }  // namespace kest
-
-int main(int argc, char** argv)
-{
-    const QCoreApplication application(argc, argv);
-    benchmark::Initialize(&argc, argv);
-    benchmark::RunSpecifiedBenchmarks();
-    return 0;
-}

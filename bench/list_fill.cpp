@@ -6,7 +6,6 @@
 #include "platform/files/files.h"
 #include "platform/profile.h"
 
-#include <QCoreApplication>
 #include <QFile>
 #include <QTemporaryDir>
 
@@ -86,11 +85,3 @@ BENCHMARK(fillList)->Arg(100)->Arg(1000)->Arg(10000)->Iterations(5)->UseManualTi
 
 }  // namespace
 }  // namespace kest
-
-int main(int argc, char** argv)
-{
-    const QCoreApplication application(argc, argv);
-    benchmark::Initialize(&argc, argv);
-    benchmark::RunSpecifiedBenchmarks();
-    return 0;
-}

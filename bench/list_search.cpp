@@ -74,12 +74,3 @@ BENCHMARK(searchKey)->Arg(1000)->Arg(10000)->Iterations(280)->Unit(benchmark::kM
 
 }  // namespace
 }  // namespace kest
-
-int main(int argc, char** argv)
-{
-    qputenv("QT_QPA_PLATFORM", "offscreen");
-    const QApplication application(argc, argv);
-    benchmark::Initialize(&argc, argv);
-    benchmark::RunSpecifiedBenchmarks();
-    return 0;
-}

@@ -1,18 +1,13 @@
 // Measures the load of a message against the plain statements that it needs, on the same database. Also measures the
 // note chain.
+#include "BenchShop.h"
 #include "InTurn.h"
 #include "PlainStatements.h"
 #include "base/SharedVariables.h"
-#include "base/modDBAccess.h"
 #include "inbound/modLoadXML.h"
 #include "messages/Envelope.h"
 #include "platform/files/files.h"
-#include "platform/profile.h"
 #include "quotedata/NoteChain.h"
-#include "setup/QuoteDatabase.h"
-
-#include <QCoreApplication>
-#include <QTemporaryDir>
 
 #include <benchmark/benchmark.h>
 
@@ -20,33 +15,6 @@ using namespace Qt::StringLiterals;
 
 namespace kest {
 namespace {
-
-/// A new shop that can execute plain statements.
-class BenchShop {
-public:
-    BenchShop()
-    {
-        profile::setRoot(folder.path());
-        for (const auto& [variable, path] :
-             {std::pair(&gsUnreadPath, u"c:\\wirdoc\\AUnread\\"_s), std::pair(&gsImagesPath, u"c:\\wirimg\\"_s)}) {
-            files::makeFolder(path);
-            *variable = path;
-        }
-        gcnDB = gConn = app::openEmbedded(u"WirSql"_s);
-        app::createTables(*gConn, app::Server::Embedded);
-        app::fillNewShop(*gConn);
-    }
-
-    ~BenchShop()
-    {
-        gConn.reset();
-        gcnDB.reset();
-        profile::setRoot({});
-    }
-
-private:
-    QTemporaryDir folder;
-};
 
 QString message(const QString& type, const QString& root, const QString& elements)
 {
@@ -121,8 +89,7 @@ constexpr int requests = 500;
 
 void loadRequest(benchmark::State& state)
 {
-    BenchShop shop;
-    gsListFolder = gsUnreadPath;  // a load prints its message from this folder; without a template there is no page
+    const BenchShop shop;
     for (int number = 1; number <= requests; ++number)
         files::write(gsUnreadPath + u"%1.xml"_s.arg(number), request(number));
     compare(
@@ -140,7 +107,7 @@ BENCHMARK(loadRequest)->UseManualTime()->Iterations(requests)->Unit(benchmark::k
 
 void loadStatusMessage(benchmark::State& state)
 {
-    BenchShop shop;
+    const BenchShop shop;
     for (int number = 0; number < 1000; ++number) {
         runPlain(
             u"INSERT INTO QUOTE1 (QTNNO, Subquote, KESTQRNo, Job_stage) VALUES ('%1', 0, 'QR%1', 1)"_s.arg(number));
@@ -182,11 +149,3 @@ BENCHMARK(changeNoteInPlace)->RangeMultiplier(10)->Range(10, 100000)->Complexity
 
 }  // namespace
 }  // namespace kest
-
-int main(int argc, char** argv)
-{
-    const QCoreApplication application(argc, argv);
-    benchmark::Initialize(&argc, argv);
-    benchmark::RunSpecifiedBenchmarks();
-    return 0;
-}

@@ -3,7 +3,6 @@
 #include "platform/database/Sql.h"
 #include "platform/profile.h"
 
-#include <QCoreApplication>
 #include <QDir>
 #include <QFile>
 #include <QSqlDatabase>
@@ -106,11 +105,3 @@ BENCHMARK(open)->RangeMultiplier(10)->Range(100, mostRows);
 BENCHMARK(openBare)->RangeMultiplier(10)->Range(100, mostRows);
 
 }  // namespace
-
-int main(int argc, char** argv)
-{
-    const QCoreApplication application(argc, argv);
-    benchmark::Initialize(&argc, argv);
-    benchmark::RunSpecifiedBenchmarks();
-    return 0;
-}

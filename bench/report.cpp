@@ -1,22 +1,18 @@
 // Measures report 730: the table for each line of the quote, and the PDF against painting the same document.
 #include "platform/print/Report.h"
 
+#include "BenchShop.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "messages/Envelope.h"
 #include "platform/database/Sql.h"
-#include "platform/files/files.h"
 #include "platform/print/Pages.h"
-#include "platform/profile.h"
 #include "reports/BuildAuthReport.h"
-#include "setup/QuoteDatabase.h"
 
 #include <QAbstractTextDocumentLayout>
-#include <QApplication>
 #include <QElapsedTimer>
 #include <QPainter>
 #include <QPdfWriter>
-#include <QTemporaryDir>
 #include <QTextDocument>
 
 #include <benchmark/benchmark.h>
@@ -27,15 +23,10 @@ namespace kest {
 namespace {
 
 /// A shop with a quote, and a message that changes all its lines.
-class ChangedQuote {
+class ChangedQuote : public BenchShop {
 public:
     explicit ChangedQuote(int lines)
     {
-        profile::setRoot(folder.path());
-        files::makeFolder(folder.path() + u"/databases"_s);
-        gcnDB = gConn = app::openEmbedded(u"WirSql"_s);
-        app::createTables(*gConn, app::Server::Embedded);
-        app::fillNewShop(*gConn);
         gConn->execute(
             u"INSERT INTO QUOTE1 (QTNNO, Subquote, KESTQRNo, excess, contri) VALUES ('500', 0, 'QR1', 0, 0)"_s);
         const auto element = [](const QString& name, const QString& text) {
@@ -66,13 +57,6 @@ public:
         text += u"</p754:getAuthorisedQuoteResponse>"_s;
         message = parsedMessage(text);
     }
-    ~ChangedQuote()
-    {
-        gConn.reset();
-        gcnDB.reset();
-        profile::setRoot({});
-    }
-    Q_DISABLE_COPY_MOVE(ChangedQuote)
 
     db::Recordset table() const
     {
@@ -83,10 +67,9 @@ public:
             qFatal("no table");
         return std::move(*built);
     }
-    QString pdf(const char* name) const { return folder.path() + u'/' + QString::fromLatin1(name); }
+    QString pdf(const char* name) const { return root() + u'/' + QString::fromLatin1(name); }
 
 private:
-    QTemporaryDir folder;
     xml::Document message;
 };
 
@@ -153,12 +136,3 @@ BENCHMARK(writePdf)->Name("PDF")->Arg(10)->Arg(100)->Arg(1000)->UseManualTime()-
 
 }  // namespace
 }  // namespace kest
-
-int main(int argc, char** argv)
-{
-    qputenv("QT_QPA_PLATFORM", "offscreen");
-    const QApplication application(argc, argv);
-    benchmark::Initialize(&argc, argv);
-    benchmark::RunSpecifiedBenchmarks();
-    return 0;
-}

@@ -1,5 +1,6 @@
 // Measures a send against the plain statements that it needs and the serialisation of the same tree. Also measures the
 // totals.
+#include "BenchShop.h"
 #include "InTurn.h"
 #include "PlainStatements.h"
 #include "base/SharedVariables.h"
@@ -8,13 +9,8 @@
 #include "platform/Prompt.h"
 #include "platform/database/Sql.h"
 #include "platform/files/files.h"
-#include "platform/profile.h"
 #include "platform/xml/xml.h"
 #include "quotedata/QuoteTotals.h"
-#include "setup/QuoteDatabase.h"
-
-#include <QCoreApplication>
-#include <QTemporaryDir>
 
 #include <benchmark/benchmark.h>
 
@@ -29,52 +25,28 @@ class SaysYes final : public desktop::Answerer {
     void start(const QString&) override {}
 };
 
-/// A new shop with the quote 1, which has `lines` lines of every kind.
-class BenchShop {
-public:
-    explicit BenchShop(int64_t lines)
-    {
-        profile::setRoot(folder.path());
-        desktop::setAnswerer(std::make_shared<SaysYes>());
-        for (const auto& [variable, path] :
-             {std::pair(&gsUnsentPath, u"c:\\wirdoc\\AUnsent\\"_s), std::pair(&gsSentPath, u"c:\\wirdoc\\ASent\\"_s),
-              std::pair(&gsImagesPath, u"c:\\wirimg\\"_s)}) {
-            files::makeFolder(path);
-            *variable = path;
-        }
-        gcnDB = gConn = app::openEmbedded(u"WirSql"_s);
-        app::createTables(*gConn, app::Server::Embedded);
-        app::fillNewShop(*gConn);
-        runPlain(u"INSERT INTO ALLMODEL (MODEL_ID, MAKE, MODEL) VALUES ('C120', 'CORELLA', 'MERIDIAN GL')"_s);
-        runPlain(u"INSERT INTO CUSTOMER (CUST_ID, NAME, FIRSTNAME, SALUTATION) VALUES (1, 'Holloway', 'Kim', 'Ms')"_s);
+/// Adds the quote 1, which has `lines` lines of every kind.
+void addQuote(int64_t lines)
+{
+    runPlain(u"INSERT INTO ALLMODEL (MODEL_ID, MAKE, MODEL) VALUES ('C120', 'CORELLA', 'MERIDIAN GL')"_s);
+    runPlain(u"INSERT INTO CUSTOMER (CUST_ID, NAME, FIRSTNAME, SALUTATION) VALUES (1, 'Holloway', 'Kim', 'Ms')"_s);
+    runPlain(
+        u"INSERT INTO CAR (REGO, CUST_ID, MODEL_ID, BODY_ID2, Year, XMission, COLOUR) "
+        "VALUES ('ABC123', 1, 'C120', '4S', '03/2005', 'Manual', 'Silver')"_s);
+    runPlain(
+        u"INSERT INTO QUOTE1 (QTNNO, Subquote, REGO, INSURER_ID, Claim, ReadOnly) "
+        "VALUES ('1', 0, 'ABC123', 1, '7700001', 0)"_s);
+    runPlain(u"INSERT INTO QUOTE3 (QTNNO, Subquote, remarks) VALUES ('1', 0, '')"_s);
+    const char* categories[] = {"R&R", "RA", "PAINT", "PRT", "MIS"};
+    runPlain(u"BEGIN"_s);
+    for (int64_t i = 0; i < lines; ++i)
         runPlain(
-            u"INSERT INTO CAR (REGO, CUST_ID, MODEL_ID, BODY_ID2, Year, XMission, COLOUR) "
-            "VALUES ('ABC123', 1, 'C120', '4S', '03/2005', 'Manual', 'Silver')"_s);
-        runPlain(
-            u"INSERT INTO QUOTE1 (QTNNO, Subquote, REGO, INSURER_ID, Claim, ReadOnly) "
-            "VALUES ('1', 0, 'ABC123', 1, '7700001', 0)"_s);
-        runPlain(u"INSERT INTO QUOTE3 (QTNNO, Subquote, remarks) VALUES ('1', 0, '')"_s);
-        const char* categories[] = {"R&R", "RA", "PAINT", "PRT", "MIS"};
-        runPlain(u"BEGIN"_s);
-        for (int64_t i = 0; i < lines; ++i)
-            runPlain(
-                sql("INSERT INTO QUOTE2 (QTNNO, Subquote, category, script, rrhour, rahour, pthour, rr_rate2, qty, "
-                    "unitcost, PartNo, MARK) VALUES ('1', 0, '{}', 'Left front guard {}', 1.25, 1.5, 2, 38.5, 1, 20.5, "
-                    "'P{}', '')",
-                    QString::fromLatin1(categories[i % 5]), static_cast<qint64>(i), static_cast<qint64>(i)));
-        runPlain(u"COMMIT"_s);
-    }
-
-    ~BenchShop()
-    {
-        gConn.reset();
-        gcnDB.reset();
-        profile::setRoot({});
-    }
-
-private:
-    QTemporaryDir folder;
-};
+            sql("INSERT INTO QUOTE2 (QTNNO, Subquote, category, script, rrhour, rahour, pthour, rr_rate2, qty, "
+                "unitcost, PartNo, MARK) VALUES ('1', 0, '{}', 'Left front guard {}', 1.25, 1.5, 2, 38.5, 1, 20.5, "
+                "'P{}', '')",
+                QString::fromLatin1(categories[i % 5]), static_cast<qint64>(i), static_cast<qint64>(i)));
+    runPlain(u"COMMIT"_s);
+}
 
 /// Restores the state before the first send: no line has a number.
 void takeBack()
@@ -113,7 +85,9 @@ void bareStatements(int64_t lines)
 void sendQuote(benchmark::State& state)
 {
     const int64_t lines = state.range(0);
-    const BenchShop shop(lines);
+    const BenchShop shop;
+    addQuote(lines);
+    desktop::setAnswerer(std::make_shared<SaysYes>());
     db::Recordset panel(gConn);
     panel.open(u"SELECT * FROM QUOTE1 WHERE QTNNO='1'"_s);
     InTurn times(state);
@@ -139,7 +113,8 @@ BENCHMARK(sendQuote)->Arg(1000)->Iterations(5)->UseManualTime()->Unit(benchmark:
 
 void calcTotals(benchmark::State& state)
 {
-    const BenchShop shop(state.range(0));
+    const BenchShop shop;
+    addQuote(state.range(0));
     db::Recordset quote(gConn);
     quote.open(u"SELECT * FROM QUOTE1 WHERE QTNNO='1'"_s);
     db::Recordset lines(gConn);
@@ -154,11 +129,3 @@ BENCHMARK(calcTotals)->RangeMultiplier(10)->Range(10, 10000)->Unit(benchmark::kM
 
 }  // namespace
 }  // namespace kest
-
-int main(int argc, char** argv)
-{
-    const QCoreApplication application(argc, argv);
-    benchmark::Initialize(&argc, argv);
-    benchmark::RunSpecifiedBenchmarks();
-    return 0;
-}
