@@ -54,6 +54,19 @@ db::Recordset Databases::query(const QString& select) const
     return rows;
 }
 
+QStringList Databases::rowsOf(const db::ConnectionPtr& connection, const QString& select)
+{
+    QStringList all;
+    db::Recordset rows(connection);
+    for (rows.open(select); !rows.eof(); rows.moveNext()) {
+        QStringList values;
+        for (const QString& column : rows.columns())
+            values += column.toUpper() + u'=' + (rows.isNull(column) ? u"Null"_s : rows.text(column));
+        all += values.join(u' ');
+    }
+    return all;
+}
+
 int Databases::count(const QString& condition) const
 {
     return query(u"SELECT * FROM LINE WHERE "_s + condition).recordCount();

@@ -25,6 +25,8 @@ protected:
     db::ConnectionPtr connect() const;
     db::Recordset query(const QString& select) const;
     int count(const QString& condition) const;
+    /// Returns all rows of a query, such as "CODE=A SEQ=Null".
+    static QStringList rowsOf(const db::ConnectionPtr& connection, const QString& select);
     /// Executes a statement as another user.
     void elsewhere(const QString& statement) const { connect()->execute(statement); }
     /// Sets a column of the current row and updates the row. Returns the number of the error, or 0.

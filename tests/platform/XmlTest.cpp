@@ -70,19 +70,10 @@ TEST(XmlErrors, NoTextOfAMegabyteCostsMuchTimeOrMemory)
     }
 }
 
-TEST(XmlErrors, ElementsHaveALimitThatNoPdfReaches)
+TEST(XmlErrors, ElementsHaveALimit)
 {
-    const Cost flood = costOf(u"<a>"_s + u"<a/>"_s.repeated(3'000'000) + u"</a>"_s, u"other"_s);
-    const QString large(50'000'000, u'A');
-    const QString text = u"<a><pdf>"_s + large + u"</pdf></a>"_s;
-    const Cost largePdf = costOf([&] {
-        const Document document = parsed(text);
-        EXPECT_EQ(document.selectSingleNode(u"//pdf"_s).utf8().size(), large.size());
-    });
-    if (memoryIsReal) {
-        EXPECT_LT(flood.megabytes, 250);
-        EXPECT_LT(largePdf.megabytes, 90) << "with the 95 of the text less than four times its size";
-    }
+    const Cost cost = costOf(u"<a>"_s + u"<a/>"_s.repeated(3'000'000) + u"</a>"_s, u"other"_s);
+    EXPECT_TRUE(cost.megabytes < 250 || !memoryIsReal) << cost.megabytes;
 }
 
 TEST(XmlErrors, TheReportShowsTheLineOfTheError)
@@ -128,29 +119,6 @@ TEST(XmlNodes, SelectionsKnowThePrefixesOfTheDocument)
     EXPECT_EQ(failureOf([&] { document.textOf(u"nothing"_s); }), NoObject);
     for (const QString& path : {u"//["_s, u"//unknown:x"_s, u"count(//l)"_s})
         EXPECT_EQ(failureOf([&] { document.selectNodes(path); }), TypeMismatch) << path;
-}
-
-TEST(XmlBuilding, TheNamespaceIsDeclaredOnceAtTheRoot)
-{
-    const QString space = u"urn:quote>x"_s;
-    Document document;
-    const auto element = [&](const QString& name, const QString& uri) {
-        return document.createNode(NodeType::Element, name, uri);
-    };
-    const Node root = element(u"request"_s, space);
-    const Node body = root.appendChild(element(u"quoteBody"_s, space));
-    body.appendChild(element(u"n"_s, space));  // the leaves before the root
-    document.appendChild(root);
-    const Node plain = body.appendChild(element(u"plain"_s, {}));
-    plain.appendChild(element(u"q:back"_s, space));
-    EXPECT_EQ(document.xml(),
-              u"<request xmlns=\"urn:quote&gt;x\"><quoteBody><n/><plain xmlns=\"\">"
-              "<q:back xmlns:q=\"urn:quote&gt;x\"/></plain></quoteBody></request>"_s);
-    EXPECT_EQ(failureOf([&] { element(u"a b"_s, {}); }), TypeMismatch);
-    EXPECT_EQ(failureOf([&] { document.appendChild(element(u"two"_s, {})); }), TypeMismatch);
-    EXPECT_EQ(failureOf([&] { plain.appendChild(root); }), TypeMismatch) << "not below itself";
-    root.appendChild(plain);
-    EXPECT_EQ(names(document.selectNodes(u"//*"_s)), u"request quoteBody n plain q:back"_s) << "moved";
 }
 
 TEST(XmlBuilding, TextIsWrittenAsItselfWithoutForbiddenCharacters)

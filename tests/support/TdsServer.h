@@ -14,8 +14,6 @@ public:
     /// Returns an address of this machine that nothing else uses. The port is SQL Server's usual one, so a client needs
     /// only the address.
     QString address() const { return address_; }
-    /// Returns the instance that the browser service at that address knows.
-    static QString instance() { return QStringLiteral("SHOP"); }
     QString connectionText(const QString& database) const override;
     /// Returns a script for MariaDB that creates tables with the types that a host's tables have on SQL Server.
     static QString schemaOf(QString mariaDbScript);
