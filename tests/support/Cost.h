@@ -16,6 +16,7 @@ constexpr bool memoryIsReal = true;
 constexpr double slowness = 3;
 #endif
 
+/// What a step has used.
 struct Cost {
     double milliseconds = 0;  // of the processor
     double megabytes = 0;     // the most that was used at a time

@@ -17,6 +17,7 @@ using Fields = std::vector<std::pair<Text, Text>>;
 /// Returns the elements of a line from a cell, as pairsIn() reads it.
 Fields fieldsIn(const QString& cell);
 
+/// A message of the insurer, which a test changes and then loads.
 class Message {
 public:
     /// Reads the message from the file of that name in tests/data/messages.

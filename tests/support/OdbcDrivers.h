@@ -9,6 +9,7 @@ namespace kest::test {
 constexpr auto odbcMariaDb = "Shop Server";
 constexpr auto odbcTds = "TDS Server";
 
+/// Lists the drivers for ODBC as long as it lives.
 class OdbcDrivers {
 public:
     /// `WithSqlServer` also registers the driver for the simulated server under the name that shops use.

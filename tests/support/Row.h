@@ -17,6 +17,7 @@ namespace kest::test {
 /// Returns how many rows of `table` meet the condition.
 int rowCount(const Text& table, const Text& condition = "1=1");
 
+/// A row, which is read anew each time.
 class Row {
 public:
     /// Refers to the first row that meets the condition. The row must exist when it is read or written.

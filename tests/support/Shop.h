@@ -41,6 +41,7 @@ bool loadAsTheWindow(const QString& fileName);
 /// Returns the files that a fill lists. The fill also applies answers to sent quotes.
 QStringList listed(MessageFolder folder = MessageFolder::Unread);
 
+/// A test that has a shop.
 class Shop : public ::testing::Test {
 protected:
     Shop();

@@ -12,6 +12,7 @@
 
 namespace kest::test {
 
+/// A profile that is the current one as long as it lives.
 class TestProfile {
 public:
     TestProfile()

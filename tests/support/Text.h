@@ -9,6 +9,7 @@
 
 namespace kest::test {
 
+/// A text in any form.
 class Text {
 public:
     Text(const char* literal) : text(QString::fromUtf8(literal)) {}
