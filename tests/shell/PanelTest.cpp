@@ -1,4 +1,5 @@
 // Tests the panel: its options, its keys, and what it shows when it opens.
+#include "base/Journal.h"
 #include "support/Hands.h"
 #include "support/Shop.h"
 
@@ -42,11 +43,26 @@ TEST_F(Panel, APersonIsToldOnceWhatWasSettled)
         "'open', 'm.xml', 'x', '2026-11-23T10:31:00')"_s);
     const auto person = std::make_shared<Person>();
     desktop::setAnswerer(person);
-    const test::Hands hands({{u"frmKEST"_s, [](QDialog&) {}}});
+    const auto sendAfterLoss = [](QDialog& window) {
+        if (!test::control<QRadioButton>(window, "Option1(2)").isEnabled())
+            return;
+        {
+            const journal::Operation operation(journal::Kind::Save);
+            gConn->execute(u"UPDATE QUOTE1 SET CLAIM='7700003' WHERE QTNNO='500'"_s);
+            test::dropConnection();
+        }
+        test::control<QRadioButton>(window, "Option1(2)").click();
+        test::control<QPushButton>(window, "cmdOK").click();
+    };
+    const test::Hands hands({{u"frmKEST"_s, sendAfterLoss}});
     for (int opened = 0; opened < 2; ++opened)
         eKEST().ShowKESTWindow(u"0"_s, u"0"_s);
     EXPECT_EQ(person->texts, QStringList(u"The load of m.xml was interrupted on 23/11/2026 at 10:31. It has been taken "
                                          "back; load the message again."_s));
+    test::quote("500");
+    eKEST().ShowKESTWindow(u"500"_s, u"0"_s);
+    ASSERT_EQ(person->texts.size(), 3) << "before the send, and by it";
+    EXPECT_TRUE(person->texts[1].endsWith(u"It has been taken back."_s)) << person->texts[1];
 }
 
 TEST_F(Panel, WithoutAConnectionItIsNotShown)

@@ -1,9 +1,7 @@
 // Tests what a person can expect of every window: a key for everything, readable texts at any size, and names for
 // screen readers.
-#include "base/Journal.h"
 #include "base/SharedVariables.h"
 #include "base/modLoggerEx.h"
-#include "platform/desktop/Person.h"
 #include "platform/files/files.h"
 #include "platform/profile.h"
 #include "platform/script/Gestures.h"
@@ -343,29 +341,4 @@ TEST_F(EveryWindow, GoesOnIfTheConnectionIsLostWhileAnotherIsOpen)
     EXPECT_EQ(documents, 1);
     eKEST().ShowKESTWindow(u"500"_s, u"0"_s);
     EXPECT_EQ(shown(), "");
-}
-
-TEST_F(EveryWindow, TellsBeforeASendWhatTheLostConnectionHasInterrupted)
-{
-    eKEST component;
-    QString told;
-    desktop::usePerson();
-    whenShown<QMessageBox>([&](QMessageBox& box) {
-        told = box.text();
-        whenShown<QMessageBox>([](QMessageBox& ofSend) { ofSend.close(); });
-        box.close();
-    });
-    const auto sendAfterLoss = [](QDialog& window) {
-        {
-            const journal::Operation operation(journal::Kind::Save);
-            gConn->execute(u"UPDATE QUOTE1 SET CLAIM='7700003' WHERE QTNNO='500'"_s);
-            dropConnection();
-        }
-        control<QRadioButton>(window, "Option1(2)").click();
-        control<QPushButton>(window, "cmdOK").click();
-    };
-    const Hands hands({{u"frmKEST"_s, sendAfterLoss}});
-    component.ShowKESTWindow(u"500"_s, u"0"_s);
-    desktop.emplace();
-    EXPECT_TRUE(told.endsWith(u"It has been taken back."_s)) << told;
 }
