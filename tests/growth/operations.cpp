@@ -17,7 +17,6 @@
 #include <QApplication>
 #include <QTemporaryDir>
 
-#include <cstdio>
 #include <cstdlib>
 #include <functional>
 #include <map>
@@ -68,10 +67,8 @@ void addLines(int lines)
 
 void expect(bool happened)
 {
-    if (!happened) {
-        std::fputs("The operation did not do its work.\n", stderr);
-        std::exit(1);
-    }
+    if (!happened)
+        qFatal("The operation did not do its work.");
 }
 
 void measureFill(qsizetype rows)
@@ -248,11 +245,8 @@ int main(int argc, char** argv)
     qputenv("QT_QPA_PLATFORM", "offscreen");
     const OdbcDrivers drivers(OdbcDrivers::Own);
     const QApplication application(argc, argv);
-    if (argc != 3 || !operations.contains(argv[1])) {
-        for (const auto& [name, operation] : operations)
-            std::puts(name.c_str());
+    if (argc != 3 || !operations.contains(argv[1]))
         return 2;
-    }
     Bench shop;
     operations.at(argv[1])(shop, std::atoi(argv[2]));
     return 0;

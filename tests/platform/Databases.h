@@ -22,6 +22,12 @@ protected:
     Databases();
     ~Databases() override { db::setStatementFault({}); }
 
+    /// Returns true if a cell such as "embedded mysql" names the engine of this run.
+    static bool isOneOf(const QString& engines)
+    {
+        const QStringList names{u"embedded"_s, u"mysql"_s, u"odbc"_s, u"tds"_s};
+        return engines.split(u' ').contains(names[int(GetParam())]);
+    }
     db::ConnectionPtr connect() const;
     db::Recordset query(const QString& select) const;
     int count(const QString& condition) const;
