@@ -81,19 +81,10 @@ TEST_F(MessageListWindow, TheLineUnderTheListNamesTheFileThatEndedTheFill)
     quote("500");
     quote("501");
     gConn->execute(u"DELETE FROM QUOTE3 WHERE QTNNO='501'"_s);
-    const QString answer = submissionResponse("KQ1").text();
-    const std::tuple<QString, QString, QString> cases[] = {
-        {u"R_502_1.xml"_s, answer, u"answers quote 502/1, which is no longer there"_s},
-        {u"R_501_0.xml"_s, answer, u"answers quote 501, which has no notes row"_s},
-        {u"R_500.xml"_s, answer, u"does not name the quote that it answers"_s},
-        {u"R_500_.xml"_s, answer, u"does not name the quote that it answers"_s},
-        {u"R_500_A.xml"_s, answer, u"does not name the quote that it answers"_s},
-        {u"R_500_0.xml"_s, answer + u"<more/>"_s, u"contains no complete answer to quote 500"_s},
-    };
     arrive("m.xml", cancellation("QR1"));
     arrive("m2.xml", cancellation("QR1"));
-    for (const auto& [file, text, reason] : cases) {
-        arrive(file, text);
+    for (const auto& [file, more, reason] : casesIn<3>("messages/answers.txt")) {
+        arrive(file, submissionResponse("KQ1").text() + more);
         frmMessageList window;
         window.openUnread();
         EXPECT_EQ(window.findChild<QLabel*>(u"lblStatus"_s)->text(),
