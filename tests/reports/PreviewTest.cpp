@@ -236,23 +236,13 @@ TEST_F(Preview, ThePrintButtonPrintsWhatWasChosen)
 {
     const QString output = root() + u"/printed.pdf"_s;
     db::Recordset rows = table(u"comment="_s + u"word\n"_s.repeated(300));
-    const struct {
-        const char* pages;
-        int copies;
-        bool isCollated;
-        const char* printed;
-    } choices[] = {{"", 1, true, "12345"},
-                   {"2", 1, true, "2"},
-                   {"1,3", 1, true, "13"},
-                   {"1,4-9", 2, true, "145145"},
-                   {"1,3", 2, false, "1133"}};
-    for (const auto& [pages, copies, isCollated, printed] : choices) {
-        const Hands hands(printing(u"frmPrintPreview"_s, output, QString::fromLatin1(pages), copies, isCollated));
+    for (const auto& [pages, copies, order, printed] : casesIn<4>("reports/printed-pages.txt")) {
+        const Hands hands(printing(u"frmPrintPreview"_s, output, pages, copies.toInt(), order == "collated"_L1));
         show(730, &rows);
         static const QRegularExpression number(u"Page (\\d) of 5"_s);
         QString found;
         for (auto matches = number.globalMatch(pdfText(output)); matches.hasNext();)
             found += matches.next().captured(1);
-        EXPECT_EQ(found, QLatin1StringView(printed));
+        EXPECT_EQ(found, printed);
     }
 }

@@ -44,17 +44,13 @@ const QString leave = u"Are you sure you want to exit without saving this messag
 TEST_F(Viewer, ASaveWritesTheTextWithoutTheWrapper)
 {
     const QByteArray longValue(3'000'000, 'Q');  // a base64 document
-    const std::tuple<std::string, QByteArray, QByteArray> cases[] = {
-        {"", "<a>1</a><b>2</b>", "\r\n\t<a>1</a>\r\n\t<b>2</b>\r\n"},
-        {"", "<request><a>1</a></request>", "\r\n\t<a>1</a>\r\n"},
-        {"", "<a>&lt;b&gt; &amp;amp; &amp;lt; &amp;amp;lt;</a>", "<a><b> & < &lt;</a>\r\n"},
-        {"", "<a>caf\xe9\xa0\x80 one\ntwo</a>", "<a>caf\xe9\xa0\x80 one\ntwo</a>\r\n"},
-        {"", "<a><pdf>" + longValue + "</pdf></a>", "<a>\r\n\t<pdf>" + longValue + "</pdf>\r\n</a>\r\n"},
-        {R"({"set": "txtXML", "text": "<a>\n2</a>"}, )", "<a>1</a>", "<a>\r\n2</a>"}};
-    for (const auto& [typed, content, expected] : cases) {
-        EXPECT_EQ(view(content, typed + save), QStringList(overwrite));
+    const auto saves = [](const QString& typed, const QByteArray& content, const QByteArray& expected) {
+        EXPECT_EQ(view(content, typed.toStdString() + save), QStringList(overwrite));
         EXPECT_TRUE(written() == expected) << written().left(100).toStdString();
-    }
+    };
+    for (const QStringList& row : rowsIn("utilities-saves.txt"))
+        saves(row[0], row[1].toLatin1(), row[2].toLatin1());
+    saves({}, "<a><pdf>" + longValue + "</pdf></a>", "<a>\r\n\t<pdf>" + longValue + "</pdf>\r\n</a>\r\n");
 }
 
 TEST_F(Viewer, NothingIsWrittenWithoutThePasswordOrTheYes)
@@ -98,16 +94,12 @@ TEST_F(Viewer, AFileThatIsGoneIsNotCalledCorrupt)
 
 TEST_F(Viewer, AFindGoesRoundTheText)
 {
-    const std::tuple<std::string, std::string, QString> cases[] = {
-        {"<b>", R"("Return", "Return", "Return")", u"Line 2, column 5"_s},
-        {"<b>", R"("Return", "F3")", u"Line 3, column 5"_s},
-        {"<b>", R"("Shift+F3")", u"Line 3, column 5"_s},
-        {"<b>", R"("Escape", "Return")", u"Line 1, column 1"_s},  // it clears the field and leaves the window
-        {"x", R"("Return")", u"Not found"_s}};
-    for (const auto& [wanted, keys, place] : cases) {
-        const std::string find = R"({"key": "txtXML", "keys": "Ctrl+F"}, {"set": "txtFind", "text": ")" + wanted +
-                                 R"("}, {"key": "txtFind", "keys": [)" + keys + R"(]}, {"read": "lblPosition"})";
-        EXPECT_EQ(view("<a><b>1</b><b>2</b></a>", find), QStringList()) << keys;
+    for (const auto& [wanted, keys, place] : casesIn<3>("utilities-find.txt")) {
+        const QString find =
+            uR"({"key": "txtXML", "keys": "Ctrl+F"}, {"set": "txtFind", "text": "%1"},
+                                 {"key": "txtFind", "keys": ["%2"]}, {"read": "lblPosition"})"_s.arg(
+                wanted, QString(keys).replace(u" "_s, u"\", \""_s));
+        EXPECT_EQ(view("<a><b>1</b><b>2</b></a>", find.toStdString()), QStringList()) << keys;
         EXPECT_EQ(shown, place) << keys;
     }
 }
