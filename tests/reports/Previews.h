@@ -2,6 +2,7 @@
 #pragma once
 
 #include "platform/print/OutputFolder.h"
+#include "reports/PrintXML.h"
 #include "support/Shop.h"
 
 #include <QPdfDocument>
@@ -30,6 +31,25 @@ protected:
             shown.append(desktop->record().windows[seen].toObject());
         return shown;
     }
+    /// Prints a message of the read folder, or a new one.
+    static void print(const Text& message, bool reprint = true)
+    {
+        gsListFolder = gsReadPath;
+        files::write(gsReadPath + u"message.xml"_s, message);
+        PrintXML(u"message.xml"_s, reprint);
+    }
+    QJsonObject onlyWindow()
+    {
+        const QList<QJsonObject> all = windows();
+        EXPECT_EQ(all.size(), 1);
+        return all.value(0);
+    }
+    /// Returns the window of a message's report.
+    QJsonObject printed(const Text& message, bool reprint = false)
+    {
+        print(message, reprint);
+        return onlyWindow();
+    }
     /// Returns their names and report numbers, separated by blanks.
     std::string shownReports()
     {
@@ -39,7 +59,7 @@ protected:
         return names.join(u' ').toStdString();
     }
     /// Returns the cells of a row in the table of a recorded window, with "-" for a field that was never set.
-    static std::string cells(const QJsonObject& window, int row, const Text& fields)
+    static std::string cells(const QJsonObject& window, int row, const Text& fields, QChar between = u'|')
     {
         const QVariantList names = window[u"table"][u"fields"].toArray().toVariantList();
         QStringList texts;
@@ -48,7 +68,15 @@ protected:
             const QJsonValue value = window[u"table"][u"rows"][row][names.indexOf(field)];
             texts.append(value.isNull() ? u"-"_s : value.toString());
         }
-        return texts.join(u'|').toStdString();
+        return texts.join(between).toStdString();
+    }
+    /// Returns a field of all rows.
+    static std::string column(const QJsonObject& window, const Text& field)
+    {
+        std::string texts;
+        for (int row = 0; row < window[u"table"][u"rows"].toArray().size(); ++row)
+            texts += (row > 0 ? ", " : "") + cells(window, row, field);
+        return texts;
     }
 
 private:

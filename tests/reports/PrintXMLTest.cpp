@@ -1,22 +1,8 @@
 // Tests which report a message gets, with which values, and which box appears if it gets none.
 #include "messagelist/frmMessageList.h"
 #include "reports/Previews.h"
-#include "reports/PrintXML.h"
 
-struct Printing : Previews {
-    static void print(const Text& message, bool reprint = true)
-    {
-        gsListFolder = gsReadPath;
-        files::write(gsReadPath + u"message.xml"_s, message);
-        PrintXML(u"message.xml"_s, reprint);
-    }
-    QJsonObject onlyWindow()
-    {
-        const QList<QJsonObject> all = windows();
-        EXPECT_EQ(all.size(), 1);
-        return all.value(0);
-    }
-};
+using Printing = Previews;
 
 TEST_F(Printing, ARequestShowsOneRowForEachImage)
 {
