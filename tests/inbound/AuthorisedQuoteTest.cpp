@@ -16,15 +16,13 @@ TEST_F(AuthorisedQuotes, TheQuoteIsFoundByNumberOrByTheNetworksNumbers)
     quote("600").request("QR6").quoteNumber("KQ6").rego("XYZ789").line(1);
     car("XYZ789");
     const Message byNumbers = authorisedQuote("wrong").request("QR6").quoteNumber("KQ6").rego("XYZ789");
-    const struct {
-        Message message;
-        const char* quote;
-        int subquote;
-    } cases[] = {{authorisedQuote("500/0"), "500", 0}, {authorisedQuote("500/2"), "500", 2}, {byNumbers, "600", 0}};
-    for (const auto& c : cases) {
-        EXPECT_TRUE(load(c.message));
+    const std::pair<Message, QuoteRow> cases[] = {{authorisedQuote("500/0"), quote("500")},
+                                                  {authorisedQuote("500/2"), quote("500", 2)},
+                                                  {byNumbers, quote("600")}};
+    for (const auto& [message, row] : cases) {
+        EXPECT_TRUE(load(message));
         EXPECT_EQ(shown(), "");
-        EXPECT_EQ(quote(c.quote, c.subquote).text("KESTAuthNo"), "KA1");
+        EXPECT_EQ(row.text("KESTAuthNo"), "KA1");
         EXPECT_EQ(rowCount("QUOTE1", "KESTAuthNo='KA1'"), 1);
         gConn->execute(u"UPDATE QUOTE1 SET KESTAuthNo=NULL"_s);
     }
