@@ -62,20 +62,6 @@ struct Person : testing::Test {
     TestProfile profile;
 };
 
-TEST_F(Person, SeesABoxAsItWasMeant)
-{
-    for (const QString& title : {QString(), u"Login"_s}) {
-        whenShown<QMessageBox>([&](QMessageBox& box) {
-            EXPECT_EQ(box.text(), u"<b>not bold</b>"_s);
-            EXPECT_EQ(box.textFormat(), Qt::PlainText);
-            EXPECT_EQ(box.icon(), QMessageBox::Critical);
-            EXPECT_EQ(box.windowTitle(), title.isEmpty() ? u"KEST"_s : title);
-            box.close();
-        });
-        desktop::msgBox(u"<b>not bold</b>"_s, Icon::Critical, title);
-    }
-}
-
 TEST_F(Person, AnswersQuestionsByKey)
 {
     for (const auto& [preset, key, yes] :

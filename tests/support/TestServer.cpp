@@ -7,6 +7,7 @@
 #include <QDeadlineTimer>
 
 #include <sys/prctl.h>
+#include <sys/wait.h>
 
 #include <csignal>
 #include <stdexcept>
@@ -38,6 +39,18 @@ void TestServer::start(const QString& program, const QStringList& arguments, con
             throw std::runtime_error(program.toStdString() + ": " + server_.readAll().toStdString());
         server_.waitForReadyRead(20);
     }
+}
+
+void TestServer::halt() const
+{
+    const auto process = pid_t(server_.processId());
+    ::kill(process, SIGSTOP);
+    ::waitpid(process, nullptr, WUNTRACED);  // all its threads have stopped
+}
+
+void TestServer::resume() const
+{
+    ::kill(pid_t(server_.processId()), SIGCONT);
 }
 
 void TestServer::createDatabase(const QString& name, const QString& script) const
