@@ -113,9 +113,10 @@ QList<Entry> pendingOperations()
     return entries(u"SELECT * FROM KESTOperation WHERE State IN ('open', 'unfinished') ORDER BY Operation"_s);
 }
 
-QList<Entry> loadsOf(const QString& hash)
+QList<Entry> loadsOf(const QString& hash, qint64 after)
 {
-    return entries(sql("SELECT * FROM KESTOperation WHERE OperationKind='load' AND FileHash='{}'", hash));
+    return entries(
+        sql("SELECT * FROM KESTOperation WHERE Operation>{} AND OperationKind='load' AND FileHash='{}'", after, hash));
 }
 
 QList<RecordedChange> changesOf(qint64 operation)

@@ -25,8 +25,8 @@ QList<Entry> historyOf(const QString& number, const QString& subquote);
 Entry entryOf(qint64 operation);
 /// Returns the operations that are running, were interrupted, or have files that wait.
 QList<Entry> pendingOperations();
-/// Returns the loads of a message, under whatever name it came.
-QList<Entry> loadsOf(const QString& hash);
+/// Returns the loads of a message, under whatever name it came, after an operation.
+QList<Entry> loadsOf(const QString& hash, qint64 after = 0);
 /// Returns what an operation changed, in the order of the changes.
 QList<RecordedChange> changesOf(qint64 operation);
 

@@ -41,14 +41,16 @@ QString place()
     return hashOf(machine() + profile::root());
 }
 
-/// Returns a text that only workstations with this machine's own folders have.
+/// Returns a text that only workstations with this machine's own folders have, or an empty one if a folder is away.
 QString folders()
 {
     QString paths;
     for (const QString& folder : {gsUnreadPath, gsReadPath, gsImagesPath}) {
-        const QString path = files::systemPath(folder);
-        const QString place = QFileInfo(path).canonicalFilePath();  // profiles may share folders by links
-        paths += u'\n' + (place.isEmpty() ? path : place);
+        // profiles may share folders by links
+        const QString place = QFileInfo(files::systemPath(folder)).canonicalFilePath();
+        if (place.isEmpty())
+            return {};
+        paths += u'\n' + place;
     }
     return hashOf(machine() + paths);
 }
@@ -153,12 +155,13 @@ void Work::prepare()
         throw RuntimeError(PermissionDenied, u"The database does not give the lock of this work."_s);
     generation = gConn->generation();
     leaveSign();
+    if (const QString own = folders(); !own.isEmpty())  // otherwise the name of the workstation decides
+        facts[u"folders"_s] = own;
     row = opened(u"SELECT * FROM KESTOperation WHERE Operation=0"_s);
 }
 
 void Work::insert()
 {
-    facts[u"folders"_s] = folders();
     row->addNew();
     row->set(u"OperationKind"_s, wordOf(kind));
     row->set(u"State"_s, wordOf(State::Open));

@@ -44,8 +44,8 @@ QStringList finishExport(const journal::Entry& entry)
 {
     const QJsonValue job = journal::kept(u"job"_s);
     if (job.isUndefined() && !journal::kept(u"isExportTried"_s).toBool()) {
-        journal::keep(u"isExportTried"_s, true);  // or each fill would try again until the message is moved
         WriteQuote(entry.number, entry.subquote);
+        journal::keep(u"isExportTried"_s, true);  // or each fill would try again until the message is moved
     } else if (!job.isUndefined() && !isJobComplete(job.toInteger())) {
         return {u"JobLink may have only a part of job %1: check it there."_s.arg(job.toInteger())};
     }

@@ -124,8 +124,8 @@ Undone takeRowsBack(const journal::Entry& load, bool isOwn)
     if (!reasons.isEmpty() && !isBegun)
         return {journal::State::Failed, reasons};
     left += reasons;
-    const Undone undone{left.isEmpty() ? journal::State::Done : journal::State::Interrupted,
-                        left + removeDocuments(load)};
+    const QStringList documents = reasons.isEmpty() ? removeDocuments(load) : QStringList();
+    const Undone undone{left.isEmpty() ? journal::State::Done : journal::State::Interrupted, left + documents};
     if (!undone.areRowsBack())
         journal::keep(u"left"_s, QJsonArray::fromStringList(undone.told));
     journal::setState(load.id, left.isEmpty() ? journal::State::TakenBack : journal::State::Interrupted);
@@ -135,9 +135,8 @@ Undone takeRowsBack(const journal::Entry& load, bool isOwn)
 /// Returns true if somebody has put the message of a load back, under whatever name, and loaded it again.
 bool isLoadedAgain(const journal::Entry& load)
 {
-    return std::ranges::any_of(journal::loadsOf(load.hash), [&](const journal::Entry& other) {
-        return other.id > load.id && !isIn(other, journal::State::TakenBack);
-    });
+    return std::ranges::any_of(journal::loadsOf(load.hash, load.id),
+                               [](const journal::Entry& other) { return !isIn(other, journal::State::TakenBack); });
 }
 
 /// Moves the message of a load to the unread folder. Returns false if that is not possible yet.
