@@ -2,13 +2,16 @@
 #include "platform/files/Background.h"
 #include "platform/files/Base64.h"
 #include "platform/files/CodePage.h"
+#include "platform/files/Lock.h"
 #include "support/FullDisk.h"
 #include "support/Test.h"
 
 #include <fcntl.h>
 #include <sys/stat.h>
+#include <sys/wait.h>
 #include <unistd.h>
 
+#include <csignal>
 #include <future>
 #include <numeric>
 
@@ -219,4 +222,33 @@ TEST_F(Files, LeftOversOfKilledWritersGoAfterADay)
     files::removeLeftOvers(box);
     EXPECT_EQ(allNames().join(u' '), u".kest-new.tmp .kest-old.xml old.xml"_s);
     files::removeLeftOvers(u"c:\\nowhere"_s);
+}
+
+TEST_F(Files, ALockGoesWithItsProcessWhateverItsFileHolds)
+{
+    const QString path = box + u"x.lock"_s;
+    const auto isFree = [&](const QString& name, int wait = 0) { return files::Lock(path, name, wait).isHeld(); };
+    for (const QString& leftOver : {u""_s, u"1\nkest2\nanother-machine\n"_s}) {
+        files::write(path, leftOver);
+        EXPECT_TRUE(isFree(u"load m.xml"_s)) << leftOver;
+    }
+    int ready[2];
+    ASSERT_EQ(::pipe(ready), 0);
+    const pid_t child = ::fork();
+    ASSERT_GE(child, 0);
+    if (child == 0) {
+        const files::Lock held(path, u"load m.xml"_s);
+        ::_exit(::write(ready[1], "x", 1) == 1 && ::pause());
+    }
+    char any = 0;
+    ASSERT_EQ(::read(ready[0], &any, 1), 1);
+    EXPECT_FALSE(isFree(u"load m.xml"_s, 20));
+    EXPECT_TRUE(isFree(u"load n.xml"_s));
+    ::kill(child, SIGKILL);
+    EXPECT_TRUE(isFree(u"load m.xml"_s, 10000));
+    ::waitpid(child, nullptr, 0);
+    for (const int end : ready)
+        ::close(end);
+    const files::Lock held(path);
+    EXPECT_FALSE(isFree({})) << "in one process too";
 }
