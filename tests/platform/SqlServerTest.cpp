@@ -179,7 +179,7 @@ TEST_P(SqlServer, ItsSimulationAnswersAsItDoes)
 {
     tdsServer().createDatabase(
         u"plain"_s,
-        u"CREATE TABLE LINE (id INT IDENTITY(1,1) NOT NULL PRIMARY KEY, CODE VARCHAR(20), SEQ INT, flag BIT, "
+        u"CREATE TABLE SIMULATED (id INT IDENTITY(1,1) NOT NULL PRIMARY KEY, CODE VARCHAR(20), SEQ INT, flag BIT, "
         "day DATETIME, notes TEXT, local NVARCHAR(20), version TIMESTAMP);"
         "CREATE TABLE AUDIT (id INT IDENTITY(1,1) PRIMARY KEY, what VARCHAR(20));"
         "INSERT INTO AUDIT (what) VALUES ('first'); INSERT INTO AUDIT (what) VALUES ('second')"_s);
