@@ -104,12 +104,33 @@ QString nameFrom(const NameQuery& query, QString (*nameIn)(const db::Recordset& 
     return name;
 }
 
+QString customerQuery(const QVariant& customer)
+{
+    return sql("SELECT SALUTATION + ' ' + FIRSTNAME + ' ' + NAME AS NAME FROM CUSTOMER WHERE CUST_ID={}", customer);
+}
+
 QString customerName(const QVariant& customer, RowsNeeded needed)
 {
-    return nameFrom(
-        {sql("SELECT SALUTATION + ' ' + FIRSTNAME + ' ' + NAME AS NAME FROM CUSTOMER WHERE CUST_ID={}", customer),
-         needed},
-        [](const db::Recordset& names) { return names.text(u"Name"_s); });
+    return nameFrom({customerQuery(customer), needed},
+                    [](const db::Recordset& names) { return names.text(u"Name"_s); });
+}
+
+/// Keeps the names of the customers of all these quotes.
+void keepCustomers(db::Recordset& quotes)
+{
+    QStringList numbers;
+    for (; !quotes.eof(); quotes.moveNext())
+        if (!quotes.isNull(u"CUST_ID"_s))
+            numbers.append(sql("{}", quotes.value(u"CUST_ID"_s)));
+    if (!keptNames || numbers.isEmpty())
+        return;
+    numbers.removeDuplicates();
+    db::Recordset names = opened(
+        sql("SELECT CUST_ID, SALUTATION + ' ' + FIRSTNAME + ' ' + NAME AS NAME FROM CUSTOMER WHERE CUST_ID IN (") +
+        numbers.join(u", "_s) + u')');
+    for (; !names.eof(); names.moveNext())
+        keptNames->emplace(NameQuery{customerQuery(names.value(u"CUST_ID"_s)), RowsNeeded::ExactlyOne},
+                           names.text(u"Name"_s));
 }
 
 QString customerOfCar(const QString& rego, RowsNeeded needed)
@@ -153,19 +174,62 @@ void drawFromQuote(MessageRow& row, const db::Recordset& quote)
     draw(row[CustomerField], [&] { return customerName(quote.value(u"CUST_ID"_s), RowsNeeded::ExactlyOne); });
 }
 
-void drawThroughKey(MessageRow& row, const xml::Document& message, const MessageType& type)
+void drawRegoAndQuote(MessageRow& row, const db::Recordset& quote)
 {
-    attemptForRow([&] {
-        const QString key = message.textOf(type.rowKey);
-        if (key.trimmed().isEmpty())
-            return;  // quotes of the host may have an empty number too
-        db::Recordset quote(gConn);
-        quote.open(sql(queryOf(type.rowSource), key));
-        if (!suffices(quote, type.rowsNeeded))
-            return;
-        draw(row[RegoField], [&] { return toText(quote.value(u"REGO"_s)); });
-        drawFromQuote(row, quote);
-    });
+    draw(row[RegoField], [&] { return toText(quote.value(u"REGO"_s)); });
+    drawFromQuote(row, quote);
+}
+
+void drawAlone(StartedRow& started)
+{
+    db::Recordset quote(gConn);
+    quote.open(sql(queryOf(started.type->rowSource), started.key));
+    if (suffices(quote, started.type->rowsNeeded))
+        drawRegoAndQuote(started.row, quote);
+}
+
+/// Moves to the first quote with that key. Returns how many there are; 2 means two or more.
+int moveToKey(db::Recordset& quotes, const QString& column, const QString& key)
+{
+    if (quotes.recordCount() == 0)
+        return 0;
+    quotes.moveFirst();
+    quotes.find(column, key);
+    if (quotes.eof())
+        return 0;
+    const int first = quotes.absolutePosition();
+    quotes.moveNext();
+    quotes.find(column, key);
+    const int count = quotes.eof() ? 1 : 2;
+    quotes.setAbsolutePosition(first);
+    return count;
+}
+
+/// Asks for the quotes of several rows at once, and then alone for those that this does not find: the database may
+/// compare texts in another way, or refuse all because of one key.
+void drawTogether(const QList<StartedRow*>& rows, bool isNetworkNumber)
+{
+    QStringList keys;
+    for (const StartedRow* started : rows)
+        keys.append(sql("'{}'", started->key));
+    const QString select =
+        isNetworkNumber ? sql("SELECT * FROM QUOTE1, CAR WHERE QUOTE1.REGO=CAR.REGO AND QUOTE1.KESTQuoteNo IN (") +
+                              keys.join(u", "_s) + u')'
+                        : sql("SELECT * FROM QUOTE1, CAR WHERE QUOTE1.REGO=CAR.REGO AND QUOTE1.KESTQRNo IN (") +
+                              keys.join(u", "_s) + u") ORDER BY QUOTE1.rec_id DESC"_s;
+    db::Recordset quotes(gConn);
+    const bool isAsked = rows.size() > 1 && attempt([&] { quotes.open(select); });
+    if (isAsked)
+        attempt([&] { keepCustomers(quotes); });
+    const QString column = isNetworkNumber ? u"KESTQuoteNo"_s : u"KESTQRNo"_s;
+    for (StartedRow* started : rows)
+        attemptForRow([&] {
+            const int count = isAsked ? moveToKey(quotes, column, started->key) : 0;
+            if (count == 0)
+                drawAlone(*started);
+            else if (count == 1 || started->type->rowsNeeded == RowsNeeded::AtLeastOne)
+                drawRegoAndQuote(started->row, quotes);
+        });
 }
 
 QString claimOfQuote(const QString& reference)
@@ -209,22 +273,47 @@ MessageRow GetMessageRow(const QString& text, const QString& typeName)
 
 MessageRow GetMessageRow(const xml::Document& message, const QString& typeName)
 {
+    StartedRow started = startMessageRow(message, typeName);
+    finishMessageRows({&started});
+    return started.row;
+}
+
+StartedRow startMessageRow(const xml::Document& message, const QString& typeName)
+{
     if (typeName == "SENT"_L1)
-        return sentRow(message);
+        return {sentRow(message)};
 
     const MessageType* type = nullptr;
     attempt([&] { type = findMessageType(message.textOf(u"messageType"_s)); });
     if (!type || type->rowSource == RowSource::None)
-        return {u"ERROR"_s};
-    MessageRow row{typeName};
+        return {{u"ERROR"_s}};
+    StartedRow started{{typeName}};
     if (type->rowSource == RowSource::Message) {
-        drawFromMessage(row, message, *type);
-        dashWhereEmpty(row, {RegoField, CustomerField, QuoteField, VehicleField});
+        drawFromMessage(started.row, message, *type);
+        dashWhereEmpty(started.row, {RegoField, CustomerField, QuoteField, VehicleField});
     } else {
-        drawThroughKey(row, message, *type);
-        dashWhereEmpty(row, {RegoField, ClaimField, CustomerField, QuoteField, VehicleField});
+        started.type = type;
+        draw(started.key, [&] { return message.textOf(type->rowKey); });
     }
-    return row;
+    return started;
+}
+
+void finishMessageRows(const QList<StartedRow*>& rows)
+{
+    constexpr qsizetype rowsAtOnce = 100;
+    for (const bool isNetworkNumber : {true, false}) {
+        QList<StartedRow*> alike;
+        for (StartedRow* started : rows)
+            if (started->type &&
+                !started->key.trimmed().isEmpty() &&  // quotes of the host may have an empty number too
+                (started->type->rowSource == RowSource::NetworkNumber) == isNetworkNumber)
+                alike.append(started);
+        for (qsizetype from = 0; from < alike.size(); from += rowsAtOnce)
+            drawTogether(alike.mid(from, rowsAtOnce), isNetworkNumber);
+    }
+    for (StartedRow* started : rows)
+        if (started->type)
+            dashWhereEmpty(started->row, {RegoField, ClaimField, CustomerField, QuoteField, VehicleField});
 }
 
 MessageRow GetMarkerRow(const QString& text, const QString& typeName)

@@ -3,11 +3,14 @@
 
 #include "platform/xml/xml.h"
 
+#include <QList>
 #include <QString>
 
 #include <array>
 
 namespace kest {
+
+struct MessageType;
 
 /// Message type, rego, claim number, customer, quote number, vehicle description.
 using MessageRow = std::array<QString, 6>;
@@ -20,6 +23,16 @@ MessageRow GetMarkerRow(const QString& text, const QString& typeName);
 /// The same for a text that has already been prepared and parsed.
 MessageRow GetMessageRow(const xml::Document& message, const QString& typeName);
 MessageRow GetMarkerRow(const xml::Document& marker, const QString& typeName);
+
+/// A row that may lack what comes from its quote, so that many quotes can be asked for at once.
+struct StartedRow {
+    MessageRow row;
+    const MessageType* type = nullptr;  // null if the row lacks nothing
+    QString key = {};                   // of the quote
+};
+/// Does the same as GetMessageRow() in two steps.
+StartedRow startMessageRow(const xml::Document& message, const QString& typeName);
+void finishMessageRows(const QList<StartedRow*>& rows);
 
 /// Returns why values are missing in the rows since the last call, if the connection was lost; otherwise an empty text.
 QString takeRowFailure();

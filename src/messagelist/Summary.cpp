@@ -13,6 +13,7 @@
 #include <QFileInfo>
 
 #include <algorithm>
+#include <map>
 #include <utility>
 
 using namespace Qt::StringLiterals;
@@ -117,6 +118,8 @@ public:
     }
 
     void take(const QString& file);
+    /// Adds what the rows take from their quotes, after all files.
+    void finish();
 
     QList<ListedMessage> listed;
 
@@ -126,8 +129,9 @@ private:
     bool isHeldUnread(const QString& file);
     void hold(const QString& file, const QString& type, const QString& waitsFor) const;
 
-    QByteArray text;         // of the current file, in the code page
-    xml::Document document;  // the parsed text
+    std::map<QString, StartedRow> started;  // by the file
+    QByteArray text;                        // of the current file, in the code page
+    xml::Document document;                 // the parsed text
     xml::Document reparsed;
     MessageFolder folder;
     QSet<QString> unread;  // names with their case folded; empty in other folders
@@ -152,8 +156,21 @@ void Fill::take(const QString& file)
         }
     } else if (!isHeldUnread(file)) {
         const xml::Document& message = prepared();
-        listed.append({file, GetMessageRow(message, GetMessageTypeName(message))});
+        const StartedRow& row = started[file] = startMessageRow(message, GetMessageTypeName(message));
+        listed.append({file, row.row});
     }
+}
+
+void Fill::finish()
+{
+    QList<StartedRow*> rows;
+    for (const ListedMessage& message : listed)
+        if (const auto found = started.find(message.file); found != started.end())
+            rows.append(&found->second);
+    finishMessageRows(rows);
+    for (ListedMessage& message : listed)
+        if (const auto found = started.find(message.file); found != started.end())
+            message.row = found->second.row;
 }
 
 bool Fill::isHeldUnread(const QString& file)
@@ -236,6 +253,7 @@ QList<ListedMessage> BuildMessageList(MessageFolder folder, const FillHooks& hoo
         if (hooks.progress && !hooks.progress(++done, names.size()))
             break;
     }
+    fill.finish();
     return std::move(fill.listed);
 }
 

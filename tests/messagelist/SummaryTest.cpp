@@ -44,18 +44,24 @@ TEST_F(MessageList, AMessageShowsWhatItSays)
 
 TEST_F(MessageList, OtherMessagesShowTheirQuote)
 {
-    const std::string found = "|ABC123|7700001|Ms Kim Holloway|500|CORELLA MERIDIAN GL";
-    const std::string newest = "|ABC123|88|Ms Kim Holloway|500/1|CORELLA MERIDIAN GL";
-    const auto expectRows = [&](const std::string& ofOldest, const std::string& ofNewest) {
-        for (const auto& [message, type, meant] : casesIn<3>("messages/quote-rows.txt"))
-            EXPECT_EQ(row(Message::told(message)), type.toStdString() + (meant == u"newest"_s ? ofNewest : ofOldest));
+    const QString found = u"|ABC123|7700001|Ms Kim Holloway|500|CORELLA MERIDIAN GL"_s;
+    files::write(gsReadPath + u"other.xml"_s, cancellation("QR9").text());
+    quote("600").request("QR9");
+    const auto expectRows = [&](const QString& ofOldest, const QString& ofNewest) {
+        QStringList rows;
+        for (const auto& [message, type, meant] : casesIn<3>("messages/quote-rows.txt")) {
+            const QString file = QString::number(rows.size()) + u".xml"_s;
+            files::write(gsReadPath + file, Message::told(message).text());
+            rows << file + u": "_s + type + (meant == u"newest"_s ? ofNewest : ofOldest);
+        }
+        rows << u"other.xml: Quote Request Cancellation"_s + QString(found).replace(u"500"_s, u"600"_s);
+        EXPECT_EQ(filled(MessageFolder::Read), rows.join(u'\n').toStdString());
     };
-    const std::string none = "|-|-|-|-|-";
-    expectRows(none, none);
+    expectRows(u"|-|-|-|-|-"_s, u"|-|-|-|-|-"_s);
     quote("500").request("QR1").quoteNumber("KQ1");
     expectRows(found, found);
     quote("500", 1).request("QR1").quoteNumber("KQ1").claim("88");
-    expectRows(none, newest);
+    expectRows(u"|-|-|-|-|-"_s, u"|ABC123|88|Ms Kim Holloway|500/1|CORELLA MERIDIAN GL"_s);
 }
 
 TEST_F(MessageList, AQuoteRowShowsWhatCanBeFound)
