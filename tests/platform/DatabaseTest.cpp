@@ -138,13 +138,14 @@ TEST_P(Database, AConnectionThatHasGoneIsNoticed)
 
 TEST_P(Database, AServerThatFallsSilentIsToldWithinSeconds)
 {
-    if (GetParam() != On::MySql)  // for SQL Server see SqlServerTest.cpp
+    if (GetParam() == On::Embedded || GetParam() == On::Odbc)
         return;
+    const TestServer& server = GetParam() == On::Tds ? static_cast<const TestServer&>(tdsServer()) : mariaDb();
     connection->setCommandTimeout(30);
     const auto open = [&] { connection->open(connectionText); };
     {
-        mariaDb().halt();
-        const auto resume = qScopeGuard([] { mariaDb().resume(); });
+        server.halt();
+        const auto resume = qScopeGuard([&] { server.resume(); });
         EXPECT_LT(milliseconds([&] { EXPECT_FALSE(connection->answers()); }), 8000);
         EXPECT_LT(milliseconds([&] { EXPECT_EQ(failureOf(open), CannotOpen); }), 5000);
     }

@@ -70,7 +70,7 @@ class Session:
     def __init__(self, server, number, database_name, interrupted):
         self.server, self.number, self.interrupted = server, number, interrupted
         self.database = databases.Database(server.folder, database_name)
-        self.no_count, self.lock_timeout, self.silent = False, -1, False
+        self.no_count, self.lock_timeout = False, -1
         self.identity = self.scope_identity = None
         self.row_count, self.variables = 0, {}
         self.identity_insert = None  # the table whose identities an INSERT must give
@@ -230,11 +230,6 @@ class Session:
             self.execute("ROLLBACK")
         raise ServerError(arguments["number"], "A failure that a test has asked for.")
 
-    def fall_silent(self, _):
-        """From the next batch on this session gets no answer, as on a line that has stalled."""
-        self.silent = True
-        return 0
-
     def copy_database(self, arguments):
         databases.copy(self.server.folder, arguments["from"], arguments["to"])
         return 0
@@ -310,9 +305,8 @@ class Session:
     STEPS = {"SET": set_option, "WAITFOR DELAY": wait_for, "BEGIN TRAN": transaction, "BEGIN TRANSACTION": transaction,
              "COMMIT": transaction, "ROLLBACK": transaction, "IF @@TRANCOUNT > 0 ROLLBACK": transaction, "CREATE": define, "ALTER": define,
              "DROP": define, "DISABLE": define, "KILL": kill}
-    PROCEDURES = {"sp_getapplock": get_lock, "sp_releaseapplock": release_lock, "standin_silence": fall_silent,
-                  "standin_copy": copy_database, "standin_fail": fail, "standin_attentions": count_attentions,
-                  "standin_refuse_locks": refuse_locks}
+    PROCEDURES = {"sp_getapplock": get_lock, "sp_releaseapplock": release_lock, "standin_copy": copy_database,
+                  "standin_fail": fail, "standin_attentions": count_attentions, "standin_refuse_locks": refuse_locks}
 
 
 def joined(parts):

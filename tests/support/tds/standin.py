@@ -2,7 +2,7 @@
 """A stand-in for SQL Server in tests: it speaks TDS 7.4 with a real driver and keeps its tables in SQLite files.
 
 What it shows: how the driver and the component cope with a server that names no base table of a column, sends one result
-at a time, counts what triggers do, gives identities, drops a connection, keeps silent, or is slow.
+at a time, counts what triggers do, gives identities, drops a connection, or is slow.
 
 What it is not: it has no lock manager (a change locks its whole database), knows few of the server's conversions, one
 collation (without regard to case and trailing blanks, accents told apart) and no query plans, and it takes only the
@@ -108,10 +108,9 @@ class Client(threading.Thread):
         return bool(select.select([self.connection], [], [], 0)[0])
 
     def batch(self, text):
-        if not self.session.silent:
-            tokens = self.session.answer(text)
-            if tokens is not None:
-                self.send(tokens)
+        tokens = self.session.answer(text)
+        if tokens is not None:
+            self.send(tokens)
 
     def transaction(self, message):
         kind = struct.unpack_from("<H", message, struct.unpack_from("<I", message)[0])[0]
