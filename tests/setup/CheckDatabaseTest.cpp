@@ -30,6 +30,17 @@ struct CheckedDatabase : Shop {
         names.sort();
         return names;
     }
+    /// Changes the database by the statements of a step for its kind of server. Returns a connection that has read none
+    /// of it yet.
+    static db::ConnectionPtr changed(const QString& step)
+    {
+        static const QString servers[] = {u"embedded"_s, u"mysql"_s, u"sqlserver"_s};
+        const db::ConnectionPtr database = anotherConnection();
+        for (const auto& [of, on, statement] : casesIn<3>("host-changes.txt"))
+            if (of == step && on.split(u' ').contains(servers[int(app::serverOf(database))]))
+                database->session().engine().run(statement);
+        return anotherConnection();
+    }
 };
 
 TEST_F(CheckedDatabase, PassesWithoutAChange)
@@ -58,37 +69,21 @@ TEST_F(CheckedDatabase, PassesWithoutAChange)
 
 TEST_F(CheckedDatabase, GetsOnlyThePartsThatItLacks)
 {
-    const db::ConnectionPtr database = anotherConnection();
+    db::ConnectionPtr database = anotherConnection();
     app::createParts(database, app::missingParts(database));  // a server's may lack them, as a host's
-    const bool isEmbedded = app::serverOf(database) == app::Server::Embedded;
-    database->execute(isEmbedded ? u"DROP INDEX QUOTE2_QTNNO"_s : u"DROP INDEX QUOTE2_QTNNO ON QUOTE2"_s);
-    database->execute(isEmbedded ? u"DROP INDEX QUOTE1_QTNNO"_s : u"DROP INDEX QUOTE1_QTNNO ON QUOTE1"_s);
-    database->execute(u"CREATE INDEX OTHER ON QUOTE1 (QTNNO, REGO)"_s);
-    if (app::serverOf(database) == app::Server::SqlServer)
-        for (const QString& useless :
-             {u"CREATE INDEX FILTERED ON QUOTE2 (QTNNO, Subquote) WHERE QTNNO IS NOT NULL"_s,
-              u"CREATE INDEX ASLEEP ON QUOTE2 (QTNNO, Subquote)"_s, u"ALTER INDEX ASLEEP ON QUOTE2 DISABLE"_s,
-              u"CREATE SCHEMA other"_s, u"CREATE TABLE other.QUOTE2 (QTNNO INT, Subquote INT)"_s,
-              u"CREATE INDEX ELSEWHERE ON other.QUOTE2 (QTNNO, Subquote)"_s})
-            database->session().engine().run(useless);
-    else if (isEmbedded)
-        database->execute(u"CREATE INDEX FILTERED ON QUOTE2 (QTNNO, Subquote) WHERE QTNNO IS NOT NULL"_s);
-
+    database = changed(u"indexes"_s);
     const QList<app::MissingPart> missing = app::missingParts(database);
     ASSERT_EQ(missing.size(), 1);
     EXPECT_EQ(missing[0].what, u"index of QUOTE2 by QTNNO"_s);
     app::createParts(database, missing);
     EXPECT_TRUE(app::missingParts(database).isEmpty());
 
-    database->execute(u"DROP TABLE KESTJournal"_s);
-    database->execute(isEmbedded ? u"DROP INDEX KESTOperation_File"_s
-                                 : u"DROP INDEX KESTOperation_File ON KESTOperation"_s);
+    database = changed(u"journal"_s);
     const QList<app::MissingPart> journal = app::missingParts(database);
     ASSERT_EQ(journal.size(), 1);
     EXPECT_EQ(journal[0].statements.size(), 4) << "the table, its two indexes, and one of the other table";
     app::createParts(database, journal);
-
-    database->execute(isEmbedded ? u"DROP INDEX OTHER"_s : u"DROP INDEX OTHER ON QUOTE1"_s);
+    database = changed(u"end"_s);
     app::createParts(database, app::missingParts(database));
 }
 
@@ -102,17 +97,8 @@ TEST_F(CheckedDatabase, IsReachedByAnotherDriverIfTheHostsIsNotRegistered)
 
 TEST_F(CheckedDatabase, OnlyTriggersThatCanRunAreNoted)
 {
-    const db::ConnectionPtr database = anotherConnection();
-    const bool hasTriggers = app::serverOf(database) == app::Server::SqlServer;
-    const QStringList statements{
-        u"CREATE TRIGGER WORKS ON CAR AFTER UPDATE AS UPDATE CAR SET REGO='A' WHERE REGO='B'"_s,
-        u"CREATE TRIGGER RESTS ON CAR AFTER UPDATE AS UPDATE CAR SET REGO='A' WHERE REGO='B'"_s,
-        u"DISABLE TRIGGER RESTS ON CAR"_s, u"CREATE TABLE other.CAR (REGO INT)"_s,
-        u"CREATE TRIGGER ELSEWHERE ON other.CAR AFTER UPDATE AS UPDATE CAR SET REGO='A' WHERE REGO='B'"_s};
-    for (const QString& statement : hasTriggers ? statements : QStringList())
-        database->session().engine().run(statement);
-    EXPECT_EQ(app::lookAtHostTables(database).notes.filter(u"trigger"_s),
-              hasTriggers ? QStringList(u"CAR has the trigger WORKS"_s) : QStringList());
+    EXPECT_EQ(app::lookAtHostTables(changed(u"triggers"_s)).notes.filter(u"trigger"_s).join(u'\n'),
+              app::serverOf(gConn) == app::Server::SqlServer ? u"CAR has the trigger WORKS"_s : QString());
 }
 
 TEST_F(CheckedDatabase, AFailureOnTheWayLeavesNoTable)
