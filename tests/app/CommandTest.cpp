@@ -39,10 +39,11 @@ struct Command : ::testing::Test {
 TEST_F(Command, TheExitCodeTellsWhatBecameOfIt)
 {
     files::write(u"c:\\wirdoc\\AUnread\\a..xml"_s, u"<a><messageType>NONE</messageType></a>"_s);
-    for (const auto& [words, code, line] : casesIn<3>("app/commands.txt")) {
+    for (const auto& [words, code, line, json] : casesIn<4>("app/commands.txt")) {
         const Ended ended = kest2(words);
         EXPECT_EQ(ended.exitCode, code.toInt()) << words;
         EXPECT_TRUE(ended.errors.contains(line)) << ended.errors;
+        EXPECT_TRUE(QJsonDocument(ended.json).toJson(QJsonDocument::Compact).contains(json.toUtf8())) << words;
         EXPECT_FALSE(ended.errors.contains(u"propagateSizeHints"_s)) << words;
     }
     files::remove(profile.root() + u"/databases/WirSql.db"_s);
@@ -55,17 +56,6 @@ TEST_F(Command, TheExitCodeTellsWhatBecameOfIt)
         EXPECT_TRUE(damaged.errors.contains(u"registry.ini is empty or damaged"_s)) << damaged.errors;
     }
     EXPECT_EQ(files::size(profile.root() + u"/registry.ini"_s), 0);
-}
-
-TEST_F(Command, AFillThatEndedEarlyIsRefusedWithItsReason)
-{
-    ASSERT_TRUE(settings::setValue(settings::Hive::LocalMachine, u"SOFTWARE\\wirra32\\frmsplash"_s, u"EcomHome"_s,
-                                   {settings::Type::Text, u"c:\\gone\\"_s}));
-    const Ended ended = kest2(u"list unread"_s);
-    EXPECT_EQ(ended.exitCode, app::Refused);
-    EXPECT_EQ(ended.json[u"rows"].toArray(), QJsonArray());
-    EXPECT_EQ(ended.json[u"failure"].toString(), u"c:\\gone\\AUnread\\: the folder does not exist"_s);
-    EXPECT_TRUE(ended.errors.contains(ended.json[u"failure"].toString()));
 }
 
 TEST_F(Command, AnInterruptedLoadIsToldOnce)

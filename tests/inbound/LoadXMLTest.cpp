@@ -73,18 +73,15 @@ TEST_F(Dispatcher, AFailingLogAddsNoBox)
 
 TEST_F(Dispatcher, ANoticeIsPutAsideOnceItWasShown)
 {
-    EXPECT_FALSE(load(marker("500"), "MDMSG7.xml"));
     EXPECT_FALSE(load(marker("501"), "x.xml"));
-    EXPECT_EQ(shown(), "[exclamation] Quote 500 was sent twice.\n[exclamation] Quote 501 was sent twice.");
     EXPECT_TRUE(files::waitForBackground(5000));
     EXPECT_EQ(filesIn(gsUnreadPath), QStringList());
-    EXPECT_EQ(filesIn(gsReadPath), (QStringList{u"MDMSG000.xml"_s, u"MDMSG001.xml"_s}));
-
-    for (int number = 2; number <= 999; ++number)
+    EXPECT_EQ(filesIn(gsReadPath), QStringList(u"MDMSG000.xml"_s));
+    for (int number = 1; number <= 999; ++number)
         QFile(files::systemPath(gsReadPath) + u"/MDMSG%1.xml"_s.arg(number, 3, 10, QLatin1Char('0')))
             .open(QIODevice::WriteOnly);
     EXPECT_FALSE(load(marker("502"), "x.xml"));
-    EXPECT_EQ(shown(), "[exclamation] Quote 502 was sent twice.");
+    EXPECT_EQ(shown(), "[exclamation] Quote 501 was sent twice.\n[exclamation] Quote 502 was sent twice.");
     EXPECT_EQ(filesIn(gsUnreadPath), QStringList{u"x.xml"_s});
 }
 
