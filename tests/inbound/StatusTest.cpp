@@ -11,6 +11,7 @@ TEST_F(StatusMessages, EachMovesTheQuoteToItsState)
         gConn->execute(u"UPDATE QUOTE1 SET KESTQRNo=NULL, KESTQuoteNo=NULL"_s);
         QuoteRow row = quote("500", subquote.toInt()).request("QR1").quoteNumber("KQ1").stage(7).set("excess", 300);
         fill(row, before).remarks(notes.isEmpty() ? responded : notes);
+        row.line(1);
         EXPECT_TRUE(load(Message::told(message)));
         EXPECT_EQ(row.state(), state.toStdString());
         EXPECT_TRUE(row.shows(after)) << message << notes;
@@ -88,20 +89,12 @@ TEST_F(StatusMessages, AMessageWhoseQuoteIsUnknownIsRefused)
     EXPECT_EQ(quote("").state(), "1 open KQ9 ");
 }
 
-TEST_F(StatusMessages, EachAdjustmentAddsANoteToAQuoteWithLines)
+TEST_F(StatusMessages, AnAdjustmentIsOfAQuoteWithLines)
 {
-    quote("500").request("QR1").stage(3).locked(true).note("Responded Quote Request").line(1);
-    EXPECT_TRUE(load(adjustedQuote("500")));
-    EXPECT_TRUE(load(adjustedQuote("999")));  // with a wrong reference, the newest quote of the request is used
-    EXPECT_EQ(shown(), "[critical] Quote not found in database. Please contact MarlinDesk Support.") << "no report";
-    EXPECT_EQ(quote("500").state(),
-              "3 locked - (today : Adjustment Suggested) (today : Adjustment Suggested) "
-              "(01/02/2008 : Responded Quote Request)");
-
-    quote("500", 1).request("QR1");
-    EXPECT_FALSE(load(adjustedQuote("500/1")));
+    quote("500").request("QR1");
+    EXPECT_FALSE(load(adjustedQuote("500")));
     EXPECT_EQ(shown(), "[none] Error: Cannot load an Adjustment onto a blank quote!");
-    EXPECT_EQ(quote("500", 1).notes(), "");
+    EXPECT_EQ(quote("500").notes(), "");
 }
 
 static void takeResponse(const Text& file, const Text& number, const Text& status = "Submitted")
