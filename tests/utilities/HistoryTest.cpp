@@ -67,23 +67,13 @@ TEST_F(History, FindsWhoChangedAColumnFromWhatToWhat)
     change("c.xml", {u"CLAIM='C4'"_s}, "QTNNO='500' AND SUBQUOTE='1'");
     change("d.xml", {u"excess=2"_s}, "QTNNO='501'");
     open([](QDialog& window) {
-        EXPECT_EQ(operations(window), "LOAD OF C.XML DONE\nLOAD OF B.XML DONE\nLOAD OF A.XML DONE\n");
-        EXPECT_EQ(status(window), "3 operations");
-        auto& find = control<QLineEdit>(window, "txtFind");
-        find.setText(u"Excess"_s);
-        EXPECT_EQ(operations(window), "LOAD OF A.XML DONE\n");
-        EXPECT_EQ(changes(window), "QUOTE1 UPDATE EXCESS \"250\" \"400\"\n") << "only what was looked for";
-        EXPECT_EQ(status(window), "1 of 3 operations");
-        find.setText(u"a.xml"_s);
-        EXPECT_EQ(changes(window), "QUOTE1 UPDATE EXCESS \"250\" \"400\"\nQUOTE1 UPDATE CLAIM \"C1\" \"C2\"\n")
-            << "all that the operation changed, in its order";
-        dropConnection();
-        find.setText(u"b.xml"_s);
-        EXPECT_EQ(changes(window), "QUOTE1 UPDATE CLAIM \"C2\" \"C3\"\n");
-        find.setText(u"nothing"_s);
-        EXPECT_EQ(operations(window) + changes(window), "");
-        find.clear();
-        EXPECT_EQ(changes(window).substr(0, 19), "QUOTE1 UPDATE CLAIM") << "the newest is chosen again";
+        for (const auto& [typed, found, changed, line] : casesIn<4>("utilities-history.txt")) {
+            control<QLineEdit>(window, "txtFind").setText(typed);
+            EXPECT_EQ(QString::fromStdString(operations(window)).replace(u'\n', u';'), found) << typed;
+            EXPECT_EQ(QString::fromStdString(changes(window)).replace(u'\n', u';'), changed) << typed;
+            EXPECT_EQ(status(window), line.toStdString()) << typed;
+            dropConnection();
+        }
     });
 }
 
