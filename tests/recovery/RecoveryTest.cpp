@@ -172,15 +172,10 @@ TEST_F(Interrupted, AMessageOutOfSightIsNotTakenForMoved)
 TEST_F(Interrupted, AMoveThatBeganEndsUnderItsName)
 {
     arrive("m.xml", adjustedQuote("500"));
-    {
-        journal::Operation operation(journal::Kind::Load, u"m.xml"_s,
-                                     journal::hashOf(files::read(gsUnreadPath + u"m.xml"_s)));
-        QString text = files::read(gsUnreadPath + u"m.xml"_s);
-        EXPECT_TRUE(LoadXML(text, u"m.xml"_s));
-        journal::keep(u"newName"_s, u"500.0_1.xml"_s);
-        files::copy(gsUnreadPath + u"m.xml"_s, gsReadPath + u"500.0_1.xml"_s);
-        operation.end(journal::State::Unfinished);
-    }
+    files::setFault([copy = files::systemPath(gsReadPath + u"500.0_1.xml"_s)] { return QFile::exists(copy); });
+    EXPECT_TRUE(loadAsTheWindow(u"m.xml"_s));
+    files::setFault({});
+    EXPECT_EQ(filesIn(gsUnreadPath), QStringList(u"m.xml"_s));
     recovery::settle();
     EXPECT_EQ(filesIn(gsReadPath), QStringList(u"500.0_1.xml"_s));
     EXPECT_EQ(filesIn(gsUnreadPath), QStringList());
