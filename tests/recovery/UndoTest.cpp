@@ -67,6 +67,25 @@ TEST_F(UndoOfALoad, IsAskedForAndIsAnOperationItself)
     EXPECT_EQ(journal::historyOf(u"500"_s, {}).value(0).id, newest().id());
 }
 
+TEST_F(UndoOfALoad, IsFinishedIfItFailed)
+{
+    const Snapshot before;
+    for (int number = 1, statement = 1; statement >= number - 1; ++number) {  // until one is not reached
+        before.restore();
+        EnsureConnection();
+        const qint64 load = loaded(u"m.xml"_s, authorisation());
+        statement = 0;
+        db::setStatementFault([&] { return ++statement == number; });
+        attempt([&] { recovery::undo(load); });
+        db::setStatementFault({});
+        EnsureConnection();  // the fault may have cost the connection
+        recovery::settle();
+        const bool isBegun = newest().id() != load;
+        EXPECT_EQ(titleAndState(load), isBegun ? u"load of m.xml: taken back"_s : u"load of m.xml: done"_s) << number;
+        EXPECT_EQ(files::exists(gsUnreadPath + u"m.xml"_s), isBegun) << number;
+    }
+}
+
 TEST_F(UndoOfALoad, IsRefusedWithTheReason)
 {
     qint64 load = 0;
