@@ -2,6 +2,7 @@
 // statements and calls for files: operations NAME SIZE.
 #include "base/History.h"
 #include "base/Journal.h"
+#include "base/modDBAccess.h"
 #include "messagelist/TakeIn.h"
 #include "messages/Envelope.h"
 #include "messages/Folders.h"
@@ -63,6 +64,11 @@ void addLines(int lines)
             "'500', 0, i, CASE i % 3 WHEN 0 THEN 'R&R' WHEN 1 THEN 'RA' ELSE 'MIS' END, 'Front guard', 1, 38.5, 1, '', "
             "'137', ''",
             lines);
+}
+
+void addSettledOperations(int operations)
+{
+    addRows("KESTOperation", "OperationKind, State, StartedAt", "'load', 'done', '2999-01-01T00:00:00'", operations);
 }
 
 void expect(bool happened)
@@ -174,6 +180,22 @@ const std::map<std::string, std::function<void(Bench&, int)>> operations{
          addLines(lines);
          measureLoad(authorisation(lines));
      }},
+    {"load-authorised-one",
+     [](Bench&, int quotes) {
+         addQuotes(quotes);
+         addLines(10);
+         measureLoad(authorisation(10));
+     }},
+    {"load-cancellation",
+     [](Bench&, int quotes) {
+         addQuotes(quotes);
+         measureLoad(cancellation("QR5").text());
+     }},
+    {"load-result",
+     [](Bench&, int quotes) {
+         addQuotes(quotes);
+         measureLoad(assessmentResult("KQ5").text());
+     }},
     {"load-sublets",
      [](Bench&, int vendors) {
          addLines(10);
@@ -222,9 +244,15 @@ const std::map<std::string, std::function<void(Bench&, int)>> operations{
              brought.append(shop.bring(u"%1_001.txt"_s.arg(i), {}));
          measured([&] { expect(takeInFiles(brought).descriptions == descriptions); });
      }},
+    {"connect",
+     [](Bench&, int settled) {
+         addSettledOperations(settled);
+         gConn->close();
+         measured([] { expect(EnsureConnection()); });
+     }},
     {"prune",
      [](Bench&, int settled) {
-         addRows("KESTOperation", "OperationKind, State, StartedAt", "'load', 'done', '2999-01-01T00:00:00'", settled);
+         addSettledOperations(settled);
          measured([] { journal::prune(); });
      }},
     {"move-loaded",
