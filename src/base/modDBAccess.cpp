@@ -140,9 +140,10 @@ void OpenDatabase()
             journal::unwatch();
             open(*gcnDB, driverNumber());
             versions.clear();
-            for (const auto& [name, version] : gcnDB->session().engine().versions())
+            db::Engine& engine = gcnDB->session().engine();
+            for (const auto& [name, version] : engine.versions())
                 versions += u", "_s + name + u' ' + version;
-            journal::watch(gcnDB);
+            engine.shortly([] { journal::watch(gcnDB); });
         } catch (const RuntimeError& error) {
             gcnDB->close(error.description());  // also if only the journal did not answer: work without it could not be
                                                 // taken back

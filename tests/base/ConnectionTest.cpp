@@ -1,6 +1,7 @@
 // Tests which database the settings name, and what happens if it does not answer.
 #include "base/Journal.h"
 #include "base/modLoggerEx.h"
+#include "support/MariaDbServer.h"
 #include "support/OdbcDrivers.h"
 #include "support/Shop.h"
 #include "support/TdsServer.h"
@@ -111,6 +112,30 @@ TEST_F(ShopConnection, ASilentServerCostsFiveSecondsForAllStepsTogether)
     EXPECT_LT(time.elapsed(), 5000);
     openWith(u"ServerName"_s, u"(local)"_s);
     EXPECT_TRUE(EnsureConnection());
+}
+
+TEST_F(ShopConnection, AServerThatFallsSilentAfterTheLoginCostsFiveSeconds)
+{
+    const OdbcDrivers drivers(OdbcDrivers::WithSqlServer);
+    const QStringList names{u"mysql:127.0.0.1:%1"_s, u"127.0.0.1,%1"_s};
+    for (const QString& name : names) {
+        const bool isMySql = name == names[0];
+        (isMySql ? static_cast<TestServer&>(mariaDb()) : tdsServer()).createDatabase(u"WirSql"_s);
+        QProcess proxy;
+        proxy.start(u"/usr/bin/python3"_s,
+                    {u"-B"_s, checkoutFile(u"tests/support/falls_silent.py"_s),
+                     isMySql ? u"127.0.0.1"_s : tdsServer().address(),
+                     QString::number(isMySql ? mariaDb().port() : 1433), u"INFORMATION_SCHEMA"_s});
+        ASSERT_TRUE(proxy.waitForReadyRead());
+        QElapsedTimer time;
+        time.start();
+        openWith(u"ServerName"_s, name.arg(proxy.readLine().toInt()));
+        EXPECT_LT(time.elapsed(), 5000) << name;
+        EXPECT_EQ(gcnDB->state(), 0) << name;
+        EXPECT_NE(connectionFailure(), QString());
+        proxy.closeWriteChannel();
+        EXPECT_TRUE(proxy.waitForFinished());
+    }
 }
 
 TEST_F(ShopConnection, ASettingLowersTheTimeOfAStatement)

@@ -6,10 +6,12 @@
 
 #include <QDeadlineTimer>
 #include <QList>
+#include <QScopedValueRollback>
 #include <QString>
 #include <QStringList>
 #include <QVariant>
 
+#include <functional>
 #include <memory>
 #include <utility>
 #include <vector>
@@ -57,6 +59,12 @@ public:
     virtual void ping() { run(QStringLiteral("SELECT 1")); }
     /// Sets how many seconds a statement may take. 0 means no limit.
     virtual void setTimeout(int seconds) = 0;
+    /// Runs a step whose statements take no time. A server that does not answer one of them for seconds is lost.
+    void shortly(const std::function<void()>& step)
+    {
+        const QScopedValueRollback set(isShort_, true);
+        step();
+    }
 
     /// Returns the names of all tables in the spelling of the database.
     virtual QStringList tableNames() = 0;
@@ -76,8 +84,12 @@ public:
     /// Rebuilds all indexes, if another program can have damaged them.
     virtual void rebuildIndexes() {}
 
+protected:
+    bool isShort() const { return isShort_; }
+
 private:
     bool isOpen_ = true;
+    bool isShort_ = false;
 };
 
 /// The address of a MySQL or MariaDB server.

@@ -65,6 +65,10 @@ public:
     }
 
     const Dialect& dialect() const override { return mySqlDialect(); }
+    Answer run(const QString& statement) override
+    {
+        return isShort() ? runShortly(statement) : QtSqlEngine::run(statement);
+    }
     void setTimeout(int seconds) override { runShortly(server->timeoutStatement(seconds)); }
 
     void ping() override
@@ -93,7 +97,7 @@ private:
     /// Executes a statement that takes no time. The connection of a server that does not answer for seconds is lost.
     Answer runShortly(const QString& statement)
     {
-        std::future<Answer> answer = std::async(std::launch::async, [&] { return run(statement); });
+        std::future<Answer> answer = std::async(std::launch::async, [&] { return QtSqlEngine::run(statement); });
         if (answer.wait_for(std::chrono::seconds(answerSeconds)) != std::future_status::ready)
             ::shutdown(socketOf(*database.driver()),
                        SHUT_RDWR);  // otherwise it waits as long as any statement may take

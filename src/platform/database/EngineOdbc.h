@@ -12,7 +12,10 @@ namespace kest::db {
 class EngineOdbc : public Engine {
 public:
     QList<std::pair<QString, QString>> versions() const override { return connection_->versions(); }
-    Answer run(const QString& statement) override { return run(statement, statementSeconds()); }
+    Answer run(const QString& statement) override
+    {
+        return isShort() ? runShortly(statement) : run(statement, statementSeconds());
+    }
     void ping() override;
 
 protected:
