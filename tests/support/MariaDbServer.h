@@ -12,6 +12,7 @@ public:
     Q_DISABLE_COPY_MOVE(MariaDbServer)
 
     int port() const { return port_; }
+    // as mariadb.sql creates them
     QString user() const { return QStringLiteral("kest"); }
     QString password() const { return QStringLiteral("s3cret"); }
     QString connectionText(const QString& database) const override { return connectionText(database, "MySQL"); }
@@ -19,9 +20,7 @@ public:
     QString connectionText(const QString& database, const char* driver) const;
 
 private:
-    void createData();
-
-    int port_ = 0;
+    int port_;
 };
 
 inline MariaDbServer& mariaDb()
