@@ -2,7 +2,7 @@
 // concern. index.txt says what each file attacks.
 #include "corpus/Targets.h"
 #include "support/Cost.h"
-#include "support/Snapshot.h"
+#include "support/ShopDatabase.h"
 #include "support/Test.h"
 
 #include <sys/resource.h>

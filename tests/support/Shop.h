@@ -14,7 +14,6 @@
 #include "support/Row.h"
 #include "support/ScriptedDesktop.h"
 #include "support/ShopDatabase.h"
-#include "support/Snapshot.h"
 #include "support/Test.h"
 
 namespace kest::test {

@@ -210,29 +210,88 @@ void closeConnections()
     QSqlDatabase::database(plainName, false).close();
 }
 
-QByteArray savedShopDatabase()
+constexpr const char* tables[] = {"QUOTE1", "QUOTE2",          "QUOTE3", "CAR",   "CUSTOMER", "INSURER",     "CINFO",
+                                  "VENDOR", "ALLMODEL",        "MODEL",  "BODY2", "JOBSTAGE", "KESTColours", "SUBLET",
+                                  "DEBTOR", "ReportDefinition"};
+
+static QString driveC()
+{
+    return profile::root() + u"/drive_c"_s;
+}
+
+static QMap<QString, QByteArray> filesOnDisk()
+{
+    QMap<QString, QByteArray> found;
+    QDirIterator walk(driveC(), QDir::Files | QDir::Hidden, QDirIterator::Subdirectories);
+    while (walk.hasNext()) {
+        QFile file(walk.next());
+        if (file.open(QIODevice::ReadOnly))
+            found.insert(file.fileName(), file.readAll());
+    }
+    return found;
+}
+
+std::string holdings()
+{
+    QStringList lines;
+    for (const char* table : tables) {
+        const QString name = QString::fromLatin1(table);
+        QStringList ofTable;
+        for (const QSqlRecord& row : plainRows(u"SELECT * FROM "_s + name)) {
+            QStringList values{name};
+            for (int i = 0; i < row.count(); ++i)
+                if (row.fieldName(i) != u"itemid"_s)  // a line that is stored again gets another one
+                    values += row.fieldName(i) + u'=' + (row.isNull(i) ? u"Null"_s : plainText(row.value(i)));
+            ofTable += values.join(u' ');
+        }
+        ofTable.sort();
+        lines += ofTable;
+    }
+    const QMap<QString, QByteArray> files = filesOnDisk();
+    for (auto file = files.begin(); file != files.end(); ++file)
+        lines += file.key().sliced(driveC().size()) + u": "_s + QString::fromLatin1(file.value());
+    return lines.join(u'\n').toStdString();
+}
+
+std::string difference(const std::string& expected, const std::string& found)
+{
+    const QStringList before = QString::fromStdString(expected).split(u'\n');
+    const QStringList after = QString::fromStdString(found).split(u'\n');
+    QStringList lines;
+    for (const QString& line : before + after)
+        if (before.contains(line) != after.contains(line))
+            lines += (before.contains(line) ? u"- "_s : u"+ "_s) + line;
+    return '\n' + lines.join(u'\n').toStdString();
+}
+
+Snapshot::Snapshot() : files_(filesOnDisk())
 {
     if (shopIsOnServer()) {
         serverShop().copy(serverShop().shop, serverShop().saved);
-        return {};
+        return;
     }
     closeConnections();  // so that the file contains all changes
-    const QByteArray file = files::readBytes(app::embeddedFile(shopName));
+    database_ = files::readBytes(app::embeddedFile(shopName));
     EnsureConnection();
-    return file;
 }
 
-void restoreShopDatabase(const QByteArray& file)
+void Snapshot::restore() const
 {
     if (shopIsOnServer()) {
         serverShop().copy(serverShop().saved, serverShop().shop);
-        return;
+    } else {
+        closeConnections();
+        for (const char* suffix : {"-wal", "-shm"})
+            QFile::remove(app::embeddedFile(shopName) + QString::fromLatin1(suffix));
+        files::writeBytes(app::embeddedFile(shopName), database_);
+        EnsureConnection();
     }
-    closeConnections();
-    for (const char* suffix : {"-wal", "-shm"})
-        QFile::remove(app::embeddedFile(shopName) + QString::fromLatin1(suffix));
-    files::writeBytes(app::embeddedFile(shopName), file);
-    EnsureConnection();
+    for (const QString& file : filesOnDisk().keys())
+        QFile::remove(file);
+    for (auto file = files_.begin(); file != files_.end(); ++file)
+        files::writeBytes(file.key(), file.value());
+    for (QString* passed : {&gsMatchedQTNNO, &gsDeletedQTNNO, &gsDeletedSubquote})
+        passed->clear();
 }
 
 }  // namespace kest::test

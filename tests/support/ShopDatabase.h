@@ -1,10 +1,14 @@
-// The quote database of a test's shop: embedded, or on the server in KEST2_TEST_ENGINE, "mariadb" or "tds".
+// The data of a test's shop: its files, and its quote database, which is embedded or on the server in
+// KEST2_TEST_ENGINE, "mariadb" or "tds".
 #pragma once
 
 #include <QByteArray>
 #include <QList>
+#include <QMap>
 #include <QSqlRecord>
 #include <QString>
+
+#include <string>
 
 namespace kest::test {
 
@@ -25,9 +29,22 @@ QString plainText(const QVariant& value);
 /// server, only sets `ServerName`.
 void makeShopDatabase();
 
-/// Saves all rows, for one restoreShopDatabase() at a time. Returns the file of the embedded database.
-QByteArray savedShopDatabase();
-/// Restores the rows. The connection may be a new one.
-void restoreShopDatabase(const QByteArray& file);
+/// Returns all rows of all tables and all files of the drive as text.
+std::string holdings();
+/// Returns the lines that only one of two such texts has.
+std::string difference(const std::string& expected, const std::string& found);
+
+/// Saves the state of a shop. Only one object may exist at a time.
+class Snapshot {
+public:
+    Snapshot();
+    /// Restores the files, the rows and the variables that a load passes to the file move. The connection may be a new
+    /// one.
+    void restore() const;
+
+private:
+    QMap<QString, QByteArray> files_;
+    QByteArray database_;  // the file, if it is embedded
+};
 
 }  // namespace kest::test
