@@ -207,9 +207,11 @@ TEST(connectionText, ChoosesTheEngine)
         QFile(profile.root() + u"/databases/"_s + name).open(QIODevice::WriteOnly);
     files::write(profile.root() + u"/databases/junk.db"_s, QString(5000, u'x'));
     mariaDb().createDatabase(u"shop"_s);
+    tdsServer().createDatabase(u"shop"_s);
     for (auto [text, outcome] : casesIn<2>("connection-texts.txt")) {
         text.replace(u"THISHOST"_s, QSysInfo::machineHostName());
         text.replace(u"MARIADB"_s, QString::number(mariaDb().port()));
+        text.replace(u"TDSHOST"_s, tdsServer().address());
         const bool opens = outcome == u"opens"_s;
         db::Connection connection;
         const RuntimeError thrown = failure([&] { connection.open(text); });

@@ -163,31 +163,4 @@ TEST_P(SqlServer, EachDriverGetsTheServerInItsOwnForm)
     qputenv("ODBCSYSINI", before);
 }
 
-// What other tests rely on.
-TEST_P(SqlServer, ItsSimulationAnswersAsItDoes)
-{
-    tdsServer().createDatabase(
-        u"plain"_s,
-        u"CREATE TABLE SIMULATED (id INT IDENTITY(1,1) NOT NULL PRIMARY KEY, CODE VARCHAR(20), SEQ INT, flag BIT, "
-        "day DATETIME, notes TEXT, local NVARCHAR(20), version TIMESTAMP);"
-        "CREATE TABLE AUDIT (id INT IDENTITY(1,1) PRIMARY KEY, what VARCHAR(20));"
-        "INSERT INTO AUDIT (what) VALUES ('first'); INSERT INTO AUDIT (what) VALUES ('second')"_s);
-    const QString text = tdsServer().connectionText(u"plain"_s);
-    db::Connection one, two;
-    for (db::Connection* client : {&one, &two})
-        client->open(text);
-    const QString numberOfOne = one.session().engine().run(u"SELECT @@SPID"_s).values[0].toString();
-    for (auto [client, statement, expected] : casesIn<3>("tds-answers.txt")) {
-        db::Engine& engine = (client == u"one"_s ? one : two).session().engine();
-        QString found;
-        const RuntimeError thrown = failure([&, &batch = statement.replace(u"(number of one)"_s, numberOfOne)] {
-            const db::Answer answer = engine.run(batch);
-            found = answer.values.empty() ? u"0"_s : answer.values.back().toString();
-        });
-        EXPECT_EQ(thrown.number() ? u"error "_s + thrown.nativeCode() : found, expected) << statement;
-    }
-    for (const QString& wrong : {QString(text).replace(u"Pwd="_s, u"Pwd=x"_s), tdsServer().connectionText(u"nosuch"_s)})
-        EXPECT_EQ(failureOf([&] { one.open(wrong); }), CannotOpen) << wrong;
-}
-
 INSTANTIATE_TEST_SUITE_P(Alone, SqlServer, ::testing::Values(On::Tds));
