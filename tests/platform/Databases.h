@@ -49,14 +49,6 @@ protected:
         rows.addNew();
         return written(rows, column, value);
     }
-    template <class Step>
-    static qint64 milliseconds(Step&& step)
-    {
-        QElapsedTimer time;
-        time.start();
-        step();
-        return time.elapsed();
-    }
     /// Returns a date as a literal that a statement can store: as in the embedded file, or with a "T" for servers.
     static QString stored(const QString& day, const QString& time)
     {

@@ -62,10 +62,9 @@ TEST_F(Files, NamesAreTakenAsTheTableSays)
     EXPECT_EQ(files::systemPath(onDisk(u"x"_s)), onDisk(u"x"_s));
     EXPECT_FALSE(files::isPlainName(u"..\\x"_s));
 
-    QElapsedTimer time;
-    time.start();
+    const QDeadlineTimer limit(2000);
     EXPECT_FALSE(files::matches(QString(5000, u'a'), u"*a"_s.repeated(500) + u"b"_s));
-    EXPECT_LT(time.elapsed(), 2000);
+    EXPECT_FALSE(limit.hasExpired());
 }
 
 TEST_F(Files, NamesAreFoundWithoutRegardToCase)
