@@ -35,6 +35,7 @@ struct RecordsetOn : Databases {
             {u"update"_s, &Recordset::update},   {u"cancel"_s, &Recordset::cancelUpdate},
             {u"requery"_s, &Recordset::requery}, {u"close"_s, &Recordset::close}};
         const std::map<QString, std::function<void(const QString&)>> others{
+            {u"execute"_s, [&](const QString& statement) { connection->execute(statement); }},
             {u"elsewhere"_s, [&](const QString& statement) { elsewhere(statement); }},
             {u"open"_s, [&](const QString& select) { lines = query(select); }},
             {u"add"_s, [&](const QString& columns) { add(columns); }},
@@ -91,43 +92,24 @@ TEST_P(RecordsetOn, AKindOfColumnHasOneTypeOnEveryEngine)
     EXPECT_EQ(lines.size(u"code"_s), 20);
     EXPECT_EQ(query(u"SELECT COUNT(*) AS n FROM LINE"_s).value(u"n"_s), QVariant(qint64(1)));
     EXPECT_TRUE(query(u"SELECT MAX(SEQ) AS n FROM LINE WHERE SEQ=1"_s).isNull(u"N"_s));
-
-    const std::pair<QString, QString> wrong[] = {{u"SEQ"_s, u"x"_s}, {u"amount"_s, u""_s}, {u"day"_s, u"soon"_s}};
-    for (const auto& [column, text] : wrong)
-        EXPECT_EQ(failureOf([&] { lines.set(column, text); }), TypeMismatch) << column;
-    EXPECT_EQ(failureOf([&] { lines.value(u"nosuch"_s); }), NoSuchColumn);
 }
 
 TEST_P(RecordsetOn, DoesWhatTheTableOfStepsSays)
 {
     QString rule;
+    bool isOfThisEngine = false;
     for (const QStringList& row : rowsIn("recordset-steps.txt")) {
-        if (row.size() == 2) {
+        if (row.size() == 1) {
+            rule = row[0];
+            isOfThisEngine = !rule.startsWith(u'[') || isOneOf(rule.section(u']', 0, 0).sliced(1));
+            connection = connect();
+            for (const QString& table : {u"LINE"_s, u"CAR"_s, u"Tints"_s})
+                connection->execute(u"DELETE FROM "_s + table);
+            lines = query(u"SELECT * FROM LINE ORDER BY id"_s);
+        } else if (isOfThisEngine) {
             EXPECT_EQ(outcomeOf([&] { return done(row[0]); }), row[1]) << rule << ' ' << row[0];
-            continue;
         }
-        rule = row[0];
-        connection = connect();
-        for (const QString& table : {u"LINE"_s, u"CAR"_s, u"Tints"_s})
-            connection->execute(u"DELETE FROM "_s + table);
-        lines = query(u"SELECT * FROM LINE ORDER BY id"_s);
     }
-}
-
-TEST_P(RecordsetOn, AnUpdateWritesOnlyWhatDiffers)
-{
-    add(u"CODE=A SEQ=1"_s);
-    lines.update();
-    elsewhere(u"UPDATE LINE SET SEQ=7"_s);
-    lines.set(u"SEQ"_s, 1);  // the same value, so it is not written
-    write(u"CODE"_s, u"B"_s);
-    EXPECT_EQ(count(u"CODE='B' AND SEQ=7"_s), 1);
-    int statements = 0;
-    db::setStatementFault([&] { return ++statements < 0; });
-    write(u"CODE"_s, u"B"_s);
-    EXPECT_EQ(statements, 0);
-    write(u"CODE"_s, u"b"_s);
-    EXPECT_EQ(statements, 1) << "another text, though it compares equal";
 }
 
 TEST_P(RecordsetOn, ARowThatSomeoneElseHasChangedIsNotOverwritten)

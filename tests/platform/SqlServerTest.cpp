@@ -45,17 +45,6 @@ TEST_P(SqlServer, AnyTextComesBackWhole)
     EXPECT_EQ(db::sqlServerDialect().literal(u"O'Brien"_s), u"'O''Brien'"_s) << "an index needs it without N";
 }
 
-TEST_P(SqlServer, ARowThatAnIndexRefusesSilentlyIsNotTakenForAdded)
-{
-    connection->execute(u"CREATE UNIQUE INDEX ONCE ON LINE (CODE) WITH (IGNORE_DUP_KEY = ON)"_s);
-    connection->execute(u"CREATE UNIQUE INDEX ONCETOO ON Tints (Code) WITH (IGNORE_DUP_KEY = ON)"_s);
-    for (const QString& table : {u"LINE"_s, u"Tints"_s})  // with and without an identity
-        for (const int expected : {0, int(StatementFailed)}) {
-            Recordset rows = query(u"SELECT * FROM "_s + table);
-            EXPECT_EQ(added(rows, u"CODE"_s, u"A"_s), expected) << table;
-        }
-}
-
 TEST_P(SqlServer, AFailureMeansWhatItsNumberMeansOnThisServer)
 {
     const std::tuple<int, QString, bool> cases[] = {
@@ -111,30 +100,6 @@ TEST_P(SqlServer, AWaitForALockIsLimitedLikeAStatement)
     EXPECT_EQ(asked(limit), 7000) << "it outlives the session";
     connection->setCommandTimeout(0);
     EXPECT_EQ(asked(limit), -1);
-}
-
-TEST_P(SqlServer, AValueThatItAloneHasIsNotChanged)
-{
-    connection->execute(
-        u"CREATE TABLE HOST (name VARCHAR(20), weight FLOAT, picture VARBINARY(20), photo IMAGE, tree XML, "
-        "mixed SQL_VARIANT, version TIMESTAMP)"_s);
-    connection->execute(u"INSERT INTO HOST (name, weight, tree, mixed) VALUES ('door', 0.1, '<a/>', 5)"_s);
-    Recordset rows = query(u"SELECT * FROM HOST"_s);
-    EXPECT_EQ(written(rows, u"weight"_s, 2.5), 0) << "no key, so all other columns tell the row";
-    for (const QString& column : {u"version"_s, u"picture"_s, u"photo"_s, u"tree"_s, u"mixed"_s})
-        EXPECT_EQ(failureOf([&] { rows.set(column, u"x"_s); }), StatementFailed) << column;
-    rows.remove();
-    EXPECT_TRUE(query(u"SELECT * FROM HOST"_s).eof());
-}
-
-TEST_P(SqlServer, ATableOfAnotherSchemaIsAnotherTable)
-{
-    connection->execute(u"CREATE SCHEMA other"_s);
-    connection->execute(u"CREATE TABLE other.LINE (number INT NOT NULL PRIMARY KEY, CODE DATETIME)"_s);
-    Recordset lines = query(u"SELECT * FROM LINE"_s);
-    EXPECT_EQ(added(lines, u"CODE"_s, u"A"_s), 0);
-    EXPECT_EQ(written(lines, u"SEQ"_s, 5), 0);
-    EXPECT_EQ(count(u"CODE='A' AND SEQ=5"_s), 1);
 }
 
 TEST_P(SqlServer, AnInstanceThatIsMissingIsNamed)
