@@ -124,7 +124,7 @@ TEST_F(Files, AFullDiskLeavesTheOldFile)
     files::write(box + u"a.xml"_s, u"old"_s);
     files::write(box + u"big.jpg"_s, QString(5000, u'x'));
     {
-        const test::FullDisk full(1000);
+        const auto full = test::fullDisk(1000);
         EXPECT_EQ(failureOf([&] { files::write(box + u"a.xml"_s, QString(5000, u'y')); }), DiskFull);
         EXPECT_EQ(failureOf([&] { files::append(box + u"a.xml"_s, QString(5000, u'y')); }), DiskFull);
         EXPECT_EQ(failureOf([&] { files::copy(box + u"big.jpg"_s, box + u"copy.jpg"_s); }), DiskFull);

@@ -163,7 +163,7 @@ TEST_F(Preview, ALayoutWithoutRoomIsAFailureThatIsTold)
 
 TEST_F(Preview, APdfThatCannotBeWrittenWholeIsNotThere)
 {
-    const FullDisk full(2000);
+    const auto full = fullDisk(2000);
     EXPECT_EQ(failureOf([&] { report::writePdf(comparisonOf(30, u"line %1"_s), root() + u"/out.pdf"_s); }), DiskFull);
     EXPECT_EQ(filesIn(root()).filter(u"pdf"_s), QStringList());
 }

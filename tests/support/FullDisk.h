@@ -1,7 +1,7 @@
 // Simulates a full disk.
 #pragma once
 
-#include <QtGlobal>
+#include <QScopeGuard>
 
 #include <sys/resource.h>
 
@@ -9,25 +9,17 @@
 
 namespace kest::test {
 
-/// Limits the size of all files that this process writes, as a full disk would.
-class FullDisk {
-public:
-    explicit FullDisk(rlim_t bytes) : handler(std::signal(SIGXFSZ, SIG_IGN))
-    {
-        ::getrlimit(RLIMIT_FSIZE, &before);
-        const rlimit small{bytes, before.rlim_max};
-        ::setrlimit(RLIMIT_FSIZE, &small);
-    }
-    ~FullDisk()
-    {
+/// Limits the size of all files that this process writes, as a full disk would, as long as the result lives.
+[[nodiscard]] inline auto fullDisk(rlim_t bytes)
+{
+    rlimit before{};
+    ::getrlimit(RLIMIT_FSIZE, &before);
+    const rlimit small{bytes, before.rlim_max};
+    ::setrlimit(RLIMIT_FSIZE, &small);
+    return qScopeGuard([before, handler = std::signal(SIGXFSZ, SIG_IGN)] {
         ::setrlimit(RLIMIT_FSIZE, &before);
         std::signal(SIGXFSZ, handler);
-    }
-    Q_DISABLE_COPY_MOVE(FullDisk)
-
-private:
-    rlimit before{};
-    void (*handler)(int);
-};
+    });
+}
 
 }  // namespace kest::test
