@@ -1,7 +1,6 @@
 // The journal records every change of an operation together with the change, and nothing else.
 #include "base/History.h"
 #include "base/Journal.h"
-#include "base/JournalRecord.h"
 #include "setup/PrepareDatabase.h"
 #include "support/Shop.h"
 
@@ -115,21 +114,4 @@ TEST_F(JournalOfAShop, ForgetsOldOperationsSomeRowsAtATimeButNoOpenOne)
     EXPECT_EQ(rowCount("KESTOperation", "Operation IN (1, 4, 5, 6)"), 4);
     EXPECT_EQ(rowCount("KESTOperation"), 4);
     EXPECT_EQ(rowCount("KESTJournal"), 100);
-}
-
-TEST(JournalRecord, GivesEachValueBackBitForBit)
-{
-    for (const QVariant& value :
-         {QVariant(), QVariant(u""_s), QVariant(u"O'Brien \\ \"x\" \r\n\t \u20ac \u0131 %1"_s),
-          QVariant(qint64(9007199254740993)), QVariant(0.1 + 0.2), QVariant(-1e308), QVariant(true), QVariant(false),
-          QVariant(QByteArray("\0\xff", 2)), QVariant(QDateTime(QDate(2026, 10, 25), QTime(2, 30, 0, 7)))}) {
-        const db::RowChange stored{
-            db::ChangeKind::Update, u"T"_s, {u"k"_s}, {{u"k"_s, db::Kind::Text, value, QVariant()}}};
-        const db::RowChange read = journal::changeIn(journal::textOf(stored));
-        const QVariant found = read.columns.front().before;
-        EXPECT_EQ(found, value);
-        EXPECT_EQ(found.isNull(), value.isNull());
-        EXPECT_EQ(found.typeId(), value.typeId());
-        EXPECT_EQ(read.key, stored.key);
-    }
 }
