@@ -88,33 +88,24 @@ TEST_F(Files, NamesAreFoundWithoutRegardToCase)
 
 TEST_F(Files, FailuresHaveTheirUsualNumbers)
 {
-    const QString full = box + u"full.txt"_s;
-    const QString locked = box + u"locked.txt"_s;
-    const QString missing = box + u"missing.txt"_s;
-    for (const QString& path : {full, locked})
-        files::write(path, u"text"_s);
+    for (const char* file : {"full.txt", "locked.txt"})
+        files::write(box + QLatin1StringView(file), u"text"_s);
     setMode(u"locked.txt"_s, 0444);
     QDir().mkpath(onDisk(u"sub"_s));
-    const std::pair<int, std::function<void()>> cases[] = {
-        {FileNotFound, [&] { files::read(missing); }},
-        {FileNotFound, [&] { files::remove(missing); }},
-        {FileNotFound, [&] { files::move(missing, full); }},
-        {PathNotFound, [&] { files::write(u"c:\\nowhere\\x.txt"_s, u"x"_s); }},
-        {PathNotFound, [&] { files::copy(full, full + u"\\x"_s); }},
-        {PathNotFound, [&] { files::write(box + u"a"_s + QChar(0) + u"b"_s, u"x"_s); }},
-        {PermissionDenied, [&] { files::write(locked, u"x"_s); }},
-        {PermissionDenied, [&] { files::append(locked, u"x"_s); }},
-        {PermissionDenied, [&] { files::copy(full, locked); }},
-        {PermissionDenied, [&] { files::move(full, locked); }},
-        {PermissionDenied, [&] { files::remove(locked); }},
-        {PermissionDenied, [&] { files::remove(box + u"sub"_s); }},
-        {FileExists, [&] { files::makeFolder(full); }}};
-    for (size_t i = 0; i < std::size(cases); ++i)
-        EXPECT_EQ(failureOf(cases[i].second), cases[i].first) << "case " << i;
-    EXPECT_EQ(files::read(full) + files::read(locked), u"texttext"_s);
+    const std::map<QString, void (*)(const QString&, const QString&)> steps{
+        {u"read"_s, [](const QString& path, const QString&) { files::read(path); }},
+        {u"write"_s, [](const QString& path, const QString&) { files::write(path, u"x"_s); }},
+        {u"append"_s, [](const QString& path, const QString&) { files::append(path, u"x"_s); }},
+        {u"remove"_s, [](const QString& path, const QString&) { files::remove(path); }},
+        {u"make folder"_s, [](const QString& path, const QString&) { files::makeFolder(path); }},
+        {u"copy"_s, [](const QString& path, const QString& to) { files::copy(path, to); }},
+        {u"move"_s, [](const QString& path, const QString& to) { files::move(path, to); }}};
+    for (const QStringList& row : rowsIn("file-failures.txt"))
+        EXPECT_EQ(failureOf([&] { steps.at(row[0])(box + row[2], box + row.value(3)); }), row[1].toInt()) << row[2];
+    EXPECT_EQ(files::read(box + u"full.txt"_s) + files::read(box + u"locked.txt"_s), u"texttext"_s);
 
-    files::remove(locked, files::Force::Yes);
-    EXPECT_FALSE(files::exists(locked));
+    files::remove(box + u"locked.txt"_s, files::Force::Yes);
+    EXPECT_FALSE(files::exists(box + u"locked.txt"_s));
     EXPECT_FALSE(files::exists(box + u"sub"_s)) << "a folder is no file";
     EXPECT_TRUE(files::folderExists(u"c:\\BOX\\sub\\"_s));
 }
