@@ -41,16 +41,12 @@ void TestServer::start(const QString& program, const QStringList& arguments, con
     }
 }
 
-void TestServer::halt() const
+QScopeGuard<std::function<void()>> TestServer::silence() const
 {
     const auto process = pid_t(server_.processId());
     ::kill(process, SIGSTOP);
     ::waitpid(process, nullptr, WUNTRACED);  // all its threads have stopped
-}
-
-void TestServer::resume() const
-{
-    ::kill(pid_t(server_.processId()), SIGCONT);
+    return QScopeGuard<std::function<void()>>([process] { ::kill(process, SIGCONT); });
 }
 
 void TestServer::createDatabase(const QString& name, const QString& script) const

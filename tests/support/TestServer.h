@@ -3,6 +3,7 @@
 
 #include <QCoreApplication>
 #include <QProcess>
+#include <QScopeGuard>
 #include <QString>
 #include <QTemporaryDir>
 
@@ -18,9 +19,8 @@ public:
     /// Creates an empty database, after dropping one of the same name, and runs a script in it.
     void createDatabase(const QString& name, const QString& script = {}) const;
     virtual QString connectionText(const QString& database) const = 0;
-    /// Lets it fall silent, with its connections open, until it is resumed.
-    void halt() const;
-    void resume() const;
+    /// Lets it fall silent, with its connections open, until the result is destroyed.
+    [[nodiscard]] QScopeGuard<std::function<void()>> silence() const;
 
 protected:
     /// `creation` are the statements that create the database "%1". They are run in the database `first`.
