@@ -14,8 +14,6 @@ public:
     virtual ~Target() = default;
     /// Reads an input. Throws std::logic_error if a promise is broken.
     virtual void take(const QByteArray& input) = 0;
-    /// Returns true if the target has a shop, which an input must leave as it was.
-    virtual bool holdsShop() const { return false; }
 };
 
 inline constexpr const char* targetNames[] = {"xml",    "load",     "fill",  "notes",    "values", "viewer",
