@@ -6,32 +6,26 @@
 #include "support/Shop.h"
 
 struct MessageListWindow : Shop {
-    /// Opens the window, does steps such as "click cmdView; key ListView1 Down; set txtFind abc; look", and closes it.
-    /// Returns what each look sees: the rows (if they are few), the line under them and the controls.
-    std::string visit(const QString& steps, const QByteArray& answers = R"("boxes": [])")
+    /// Opens the window, does these steps of a script and closes it. Returns what was seen, as visits.txt writes it.
+    QStringList visit(const QStringList& steps, const QString& answers = uR"("boxes": [])"_s)
     {
-        QJsonArray script;
-        for (const QString& step : steps.split(u"; "_s)) {
-            const QStringList words = step.split(u' ');
-            QJsonObject done{{words[0], words.value(1)}};
-            if (words[0] == u"key"_s)
-                done[u"keys"_s] = QJsonArray::fromStringList(words.mid(2));
-            else if (words[0] == u"set"_s)
-                done[u"text"_s] = words[2];
-            else if (words[0] == u"select"_s)
-                done[u"item"_s] = words[2].toInt();
-            else if (words[0] == u"wait"_s)
-                done[u"wait"_s] = words[1].toInt();
-            script.append(words[0] == u"look"_s ? QJsonObject{{u"read"_s, true}} : done);
-        }
-        desktop.emplace(R"({"windows": {"frmMessageList": [)" + QJsonDocument(script).toJson() +
-                        R"(], "frmViewXML": [[{"read": ["txtXML"]}]]}, )" + answers + '}');
+        const auto script =
+            uR"({"windows": {"frmHeld": [[{"read": ["ListView1"]}, {"click": "cmdView"}]],
+            "frmViewXML": [[{"read": ["txtXML"]}]], "frmMessageList": [[%1]]}, %2})"_s;
+        desktop.emplace(script.arg(steps.join(u", "_s), answers).toUtf8());
         frmMessageList::ShowForm();
         QStringList seen;
-        for (const QJsonValue read : desktop->record().reads)
-            if (const QJsonObject values = read[u"values"].toObject(); values.contains(u"lblStatus"_s))
-                seen += look(values);
-        return seen.join(u"; "_s).toStdString();
+        for (const QJsonValue read : desktop->record().reads) {
+            const QJsonObject values = read[u"values"].toObject();
+            const QJsonValue held = values[u"ListView1"][u"rows"][0];
+            const QString other = values[u"txtXML"][u"text"].toString().section(u' ', 0, 0) + held[3].toString();
+            seen += values.contains(u"lblStatus"_s) ? look(values) : u">> "_s + other;
+        }
+        for (const QString& box : desktop->boxes())
+            seen += u"! "_s + box;
+        for (const QJsonValue input : desktop->record().inputs)
+            seen += u"? "_s + input[u"prompt"].toString();
+        return seen;
     }
 
     static QString look(const QJsonObject& values)
@@ -39,8 +33,8 @@ struct MessageListWindow : Shop {
         QStringList names;
         for (const QJsonValue row : values[u"ListView1"][u"rows"].toArray())
             names += row[0].toString();
-        QString seen =
-            (names.size() > 3 ? u"..."_s : names.join(u' ')) + u": "_s + values[u"lblStatus"][u"text"].toString();
+        QString seen = u"> "_s + (names.size() > 3 ? u"..."_s : names.join(u' ')) + u": "_s +
+                       values[u"lblStatus"][u"text"].toString();
         for (const QString& button : {u"cmdProcess"_s, u"cmdPrint"_s, u"cmdHeld"_s})
             if (const QJsonValue state = values[button]; state[u"visible"].toBool())
                 seen += state[u"enabled"].toBool() ? u' ' + button : u" ("_s + button + u')';
@@ -98,106 +92,46 @@ TEST_F(MessageListWindow, TheLineUnderTheListNamesTheFileThatEndedTheFill)
     EXPECT_EQ(quote("500").text("KESTQuoteNo"), "");
 }
 
-TEST_F(MessageListWindow, ALoadedMessageMakesRoomForTheNextOfItsRequest)
+struct MessageListVisit : MessageListWindow, ::testing::WithParamInterface<QString> {};
+
+TEST_P(MessageListVisit, ShowsWhatIsWritten)
 {
     quote("500").request("QR1");
-    arrive("a.xml", cancellation("QR1"));
-    arrive("b.xml", cancellation("QR1"));
-    EXPECT_EQ(visit(u"look; click cmdProcess; look"_s),
-              "a.xml: 1 message cmdProcess cmdHeld; b.xml: 1 message cmdProcess");
-    EXPECT_EQ(shown(), "[none] Message Loaded");
+    QStringList steps, expected;
+    QString answers = uR"("boxes": [])"_s;
+    for (const QString& line : GetParam().split(u'\n', Qt::SkipEmptyParts).sliced(1)) {
+        if (line[0] == u'{') {
+            steps += line;
+        } else if (line[0] == u'"') {
+            answers = line;
+        } else if (u">!?"_s.contains(line[0])) {
+            expected += line;
+            steps += QStringList(line[1] == u' ' && line[0] == u'>', uR"({"read": true})"_s);
+        } else if (line == "tablet"_L1) {
+            gbTabletLocal = true;
+        } else {
+            const QStringList names = line.section(u':', 0, 0).split(u' ');
+            const QString told = line.section(u':', 1).trimmed();
+            const QString folder = line[0] == u'u' ? gsUnreadPath : line[0] == u'r' ? gsReadPath : gsSentPath;
+            for (const QString& name : names.sliced(1))
+                files::write(folder + name + u".xml"_s, told.isEmpty() ? told : Message::told(told).text());
+        }
+    }
+    EXPECT_EQ(visit(steps, answers).join(u'\n'), expected.join(u'\n')) << GetParam().section(u'\n', 0, 0);
 }
 
-TEST_F(MessageListWindow, F4ShowsTheMessagesThatAreHeldBack)
-{
-    arrive("a.xml", cancellation("QR1"));
-    arrive("b.xml", cancellation("QR1"));
-    desktop.emplace(R"json({"windows": {"frmMessageList": [[{"key": "ListView1", "keys": ["F4"]}]],
-                                        "frmHeld": [[{"read": ["ListView1"]}, {"click": "cmdView"}]],
-                                        "frmViewXML": [[{"read": ["txtXML"]}]]}})json");
-    frmMessageList::ShowForm();
-    const QJsonArray reads = desktop->record().reads;
-    ASSERT_EQ(reads.size(), 2);
-    const QJsonArray row = reads[0][u"values"][u"ListView1"][u"rows"][0].toArray();
-    EXPECT_EQ(row[0].toString() + row[3].toString(), u"b.xmla.xml, which must be loaded first"_s);
-    EXPECT_TRUE(reads[1][u"values"][u"txtXML"][u"text"].toString().contains(u"QR1"_s));
-}
+INSTANTIATE_TEST_SUITE_P(
+    Visits, MessageListVisit,
+    ::testing::ValuesIn(linesOf("messages/visits.txt").join(u'\n').split(u"== "_s, Qt::SkipEmptyParts)));
 
-TEST_F(MessageListWindow, TheListIsFilledTwiceMoreAfterARefusal)
-{
-    arrive("a.xml", cancellation("QR1"));
-    arrive("b.xml", "");
-    EXPECT_EQ(visit(u"click cmdProcess; wait 600; look"_s), "a.xml: 1 message cmdProcess");
-    const QString unreadable = u"Message b.xml unreadable, Please contact MarlinDesk Support."_s;
-    EXPECT_EQ(desktop->boxTexts().count(unreadable), 3);
-    EXPECT_EQ(desktop->boxTexts().size(), 4);
-    EXPECT_NE(desktop->boxTexts().value(1), unreadable) << "the refusal comes before the list is filled again";
-}
-
-TEST_F(MessageListWindow, EachFolderHasItsControls)
-{
-    arrive("a.xml", quoteRequest("QR1"));
-    files::write(gsReadPath + u"b.xml"_s, quoteMatch("123").text());
-    EXPECT_EQ(visit(u"look; click Option1(1); look; click Option1(2); look; click cmdView; click Command6; "
-                    "click Option1(0); look"_s),
-              "a.xml: 1 message cmdProcess; b.xml: 1 message cmdPrint []; : No sent messages []; "
-              "a.xml: 1 message cmdProcess");
-    EXPECT_EQ(desktop->boxes(), QStringList()) << "View and Delete do nothing without a message";
-}
-
-TEST_F(MessageListWindow, TheFilterNarrowsTheReadMessages)
-{
-    for (int i = 0; i < 25; ++i)
-        files::write(gsReadPath + u"%1.0_1.xml"_s.arg(100 + i), quoteMatch("123").text());
-    EXPECT_EQ(visit(u"click Option1(1); look"_s), "...: 25 messages cmdPrint []");
-    EXPECT_TRUE(desktop->record().inputs.isEmpty()) << "so many are listed unasked";
-    files::write(gsReadPath + u"125.0_1.xml"_s, quoteMatch("123").text());
-    EXPECT_EQ(visit(u"click Option1(1); look; set txtFilter 11; click Command1; look; set txtFilter 125; "
-                    "key txtFilter Return; look; set txtFilter ; click Command1; look; click Option1(2); look"_s,
-                    R"("inputs": [{"text": "Quote Number", "answer": "124"}])"),
-              "124.0_1.xml: 1 message with \"124\" in their name cmdPrint [124]; "
-              "...: 10 messages with \"11\" in their name cmdPrint [11]; "
-              "125.0_1.xml: 1 message with \"125\" in their name cmdPrint [125]; ...: 26 messages cmdPrint []; "
-              ": No sent messages []");
-    ASSERT_EQ(desktop->record().inputs.size(), 1) << "an empty filter that was typed asks nothing";
-    EXPECT_EQ(desktop->record().inputs[0][u"prompt"].toString(),
-              u"Enter a Quote Number to search by (Leave blank for all quotes)"_s);
-}
-
-TEST_F(MessageListWindow, ATabletOnItsOwnDatabaseLoadsRequestsOnly)
+TEST_F(MessageListWindow, ATabletLoadsNoOtherMessage)
 {
     gbTabletLocal = true;
-    arrive("a.xml", quoteRequest("QR1"));
     arrive("b.xml", cancellation("QR2"));
-    EXPECT_EQ(visit(u"look; key ListView1 Down; look; select ListView1 0; look"_s),
-              "a.xml b.xml: 2 messages cmdProcess; a.xml b.xml: 2 messages (cmdProcess); "
-              "a.xml b.xml: 2 messages cmdProcess");
     frmMessageList window;
     window.openUnread();
     EXPECT_FALSE(window.loadFile(u"b.xml"_s)) << "its button is disabled";
     EXPECT_EQ(desktop->boxes(), QStringList());
-}
-
-TEST_F(MessageListWindow, AMessageIsRemovedOnlyAfterYes)
-{
-    arrive("a.xml", quoteRequest("QR1"));
-    arrive("b.xml", quoteRequest("QR2"));
-    EXPECT_EQ(visit(u"key ListView1 Delete; look"_s), "a.xml b.xml: 2 messages cmdProcess");
-    EXPECT_EQ(desktop->boxes(), QStringList{u"critical||You are about to remove a.xml without loading into the "
-                                            "system. Are you SURE ?|no"_s});
-    EXPECT_EQ(visit(u"key ListView1 Delete; look"_s, R"("boxes": [{"text": "remove a.xml", "answer": "yes"}])"),
-              "b.xml: 1 message cmdProcess");
-    EXPECT_EQ(filesIn(gsUnreadPath), QStringList{u"b.xml"_s});
-}
-
-TEST_F(MessageListWindow, ADoubleClickShowsOnlyASentMessage)
-{
-    arrive("a.xml", quoteRequest("QR1"));
-    files::write(gsSentPath + u"s.xml"_s, sentDocument("500"));
-    visit(u"doubleClick ListView1; click Option1(2)"_s);
-    EXPECT_EQ(desktop->record().reads.size(), 0);
-    visit(u"click Option1(2); doubleClick ListView1"_s);
-    EXPECT_TRUE(desktop->read(u"txtXML"_s).toString().startsWith(u"<request>"_s));
 }
 
 TEST_F(MessageListWindow, SeveralRowsAreCopiedButOneIsLoaded)
@@ -206,7 +140,8 @@ TEST_F(MessageListWindow, SeveralRowsAreCopiedButOneIsLoaded)
         desktop::gestures::press(window, Qt::CTRL | Qt::Key_A);
         desktop::gestures::press(window, Qt::CTRL | Qt::Key_C);
         EXPECT_EQ(QGuiApplication::clipboard()->text().count(u'\n'), 2);
-        control<QAbstractButton>(window, "cmdProcess").click();
+        auto& load = control<QAbstractButton>(window, "cmdProcess");
+        desktop::gestures::click(load, load.rect().center());
     });
     EXPECT_EQ(desktop->boxTexts().size(), 1) << "the refusal of one message";
 }
@@ -288,19 +223,12 @@ struct Searched : MessageListWindow {
 TEST_F(Searched, WhatIsTypedInTheListLeavesTheRowsThatHoldIt)
 {
     for (const auto& [keys, rows, line, chosen] : casesIn<4>("messages/search.txt")) {
-        EXPECT_EQ(visit(u"key ListView1 %1; look; click Command6"_s.arg(keys)), (rows + u": "_s + line).toStdString());
+        const QString typed =
+            uR"({"key": "ListView1", "keys": ["%1"]})"_s.arg(QString(keys).replace(u" "_s, uR"(", ")"_s));
+        const QStringList seen = visit({typed, uR"({"read": true}, {"click": "Command6"})"_s});
+        EXPECT_EQ(seen[0], u"> "_s + rows + u": "_s + line) << keys;
         EXPECT_EQ(desktop->boxTexts().join(u' ').section(u' ', 5, 5), chosen) << keys;
     }
-}
-
-TEST_F(Searched, EndsWithTheFolder)
-{
-    files::write(gsReadPath + u"r.xml"_s, quoteRequest("QR9").text());
-    EXPECT_EQ(visit(u"set txtFind abc; key frmMessageList F5; look; set txtFind zz; click cmdProcess; click cmdView; "
-                    "click Option1(1); look; set txtFind zz; click cmdPrint; look"_s),
-              "a.xml: 1 of 3 messages cmdProcess; r.xml: 1 message cmdPrint []; : 0 of 1 message cmdPrint []");
-    EXPECT_EQ(desktop->boxes(), QStringList()) << "a row that is not shown is not loaded, viewed or printed";
-    EXPECT_EQ(filesIn(gsUnreadPath).size(), 3);
 }
 
 TEST_F(Searched, TheOrderOutlivesTheWindow)
@@ -369,6 +297,8 @@ TEST_F(Searched, FilesAreDroppedOrPastedWhileTheUnreadMessagesAreShown)
         EXPECT_FALSE(drop(window, *stick(u"f.xml"_s, cancellation("QR5").text())));
         EXPECT_EQ(paste(stick(u"f.xml"_s, cancellation("QR5").text())),
                   u"Files can be taken in only while the unread messages are shown."_s);
+        desktop::gestures::press(window,
+                                 Qt::Key_F5);  // no longer with Ctrl, which would choose no row of the next list
     };
     const Hands hands({{u"frmMessageList"_s, work}});
     frmMessageList::ShowForm();
