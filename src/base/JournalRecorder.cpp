@@ -33,12 +33,9 @@ void requireRights()
 /// Returns why the changes of this database can't be taken back, or an empty text if they can.
 QString transactionFault(const db::Connection& connection)
 {
-    const QStringList without = connection.tablesWithoutTransactions();
-    for (const QString& table :
-         u"KESTOperation KESTJournal QUOTE1 QUOTE2 QUOTE3 CAR CUSTOMER VENDOR CINFO"_s.split(u' '))
-        if (without.contains(table, Qt::CaseInsensitive))
-            return u"The table %1 has no transactions"_s.arg(table);
-    return {};
+    const QStringList without = connection.tablesWithoutTransactions(
+        u"KESTOperation KESTJournal QUOTE1 QUOTE2 QUOTE3 CAR CUSTOMER VENDOR CINFO"_s.split(u' '));
+    return without.isEmpty() ? QString() : u"The table %1 has no transactions"_s.arg(without.first());
 }
 
 /// Writes to the error log why the database keeps no journal, once for each reason.

@@ -158,13 +158,18 @@ qint64 Connection::execute(const QString& statement)
     return session().execute(statement);
 }
 
-QStringList Connection::tablesWithoutTransactions() const
+QStringList Connection::tablesWithoutTransactions(const QStringList& tables) const
 {
     QStringList names;
-    const QString question = session().dialect().withoutTransactions;
-    if (!question.isEmpty())
-        for (const QVariant& name : session().engine().run(question).values)
-            names.append(normalised(name, Kind::Text).toString());
+    const Dialect& dialect = session().dialect();
+    if (dialect.withoutTransactions.isEmpty())
+        return names;
+    QStringList literals;
+    for (const QString& table : tables)
+        literals.append(dialect.literal(table.toUpper()));
+    const QString question = dialect.withoutTransactions.arg(literals.join(u", "_s));
+    for (const QVariant& name : session().engine().run(question).values)
+        names.append(normalised(name, Kind::Text).toString());
     return names;
 }
 

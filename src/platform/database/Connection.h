@@ -52,8 +52,8 @@ public:
     /// Returns the server's own number of this connection, or an empty text for the embedded engine.
     QString serverSession() const;
     bool hasTable(const QString& name) const;
-    /// Returns the tables whose changes can't be taken back, because they have no transactions.
-    QStringList tablesWithoutTransactions() const;
+    /// Returns those of the tables whose changes can't be taken back, because they have no transactions.
+    QStringList tablesWithoutTransactions(const QStringList& tables) const;
     /// Ends another session of the server if it holds that lock.
     void endSession(const QString& serverSession, const QString& lock) const;
     /// Shows every change of a row to an observer from now on. Null ends this.

@@ -29,7 +29,7 @@ struct Dialect {
     QString lockedTable = QStringLiteral("%1");     // a table in a SELECT that locks its rows until the commit
     QString lockedEnd = QString();                  // the end of such a SELECT
     QString sessionNumber = QString();              // asks for the server's number of the connection
-    QString withoutTransactions = QString();        // asks for the tables whose changes can't be taken back
+    QString withoutTransactions = QString();        // asks which tables of a list have changes that can't be taken back
     // how to ask for a column whose value a driver would round: finer than a millisecond, of more than 15 digits, or of
     // single precision
     QString exactDate = QStringLiteral("%1");
