@@ -138,7 +138,7 @@ TEST_P(Database, AConnectionThatHasGoneIsNoticed)
 
 TEST_P(Database, AServerThatFallsSilentIsToldWithinSeconds)
 {
-    if (GetParam() == On::Embedded || GetParam() == On::Odbc)
+    if (GetParam() == On::Embedded)
         return;
     const TestServer& server = GetParam() == On::Tds ? static_cast<const TestServer&>(tdsServer()) : mariaDb();
     connection->setCommandTimeout(30);

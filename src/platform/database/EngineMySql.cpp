@@ -1,17 +1,12 @@
 // The engines for MariaDB and MySQL: one uses QMYSQL, the other an ODBC driver.
 #include "platform/Waiting.h"
+#include "platform/database/DriverSocket.h"
 #include "platform/database/EngineOdbc.h"
 #include "platform/database/MySqlServer.h"
 #include "platform/database/QtSqlEngine.h"
 
-#include <QSqlDriver>
 #include <QSqlError>
 
-#include <dlfcn.h>
-#include <sys/socket.h>
-
-#include <chrono>
-#include <future>
 #include <optional>
 
 namespace kest::db {
@@ -20,19 +15,8 @@ using namespace Qt::StringLiterals;
 
 namespace {
 
-constexpr int answerSeconds = 4;  // for each step of opening a connection, and for a statement that takes no time
-constexpr int graceSeconds = 5;   // more than the limit that the server observes itself
-
-/// Returns the socket of an open connection, or -1 if its driver does not use MariaDB's library, because the
-/// connection of another one has another layout.
-int socketOf(const QSqlDriver& driver)
-{
-    using GetSocket = int (*)(void* connection);
-    void* library = ::dlopen("libmariadb.so.3", RTLD_LAZY | RTLD_NOLOAD);
-    const auto get = library ? reinterpret_cast<GetSocket>(::dlsym(library, "mysql_get_socket")) : nullptr;
-    const QVariant handle = driver.handle();
-    return get ? get(*static_cast<void* const*>(handle.constData())) : -1;
-}
+constexpr int connectSeconds = 4;  // for each step of opening a connection
+constexpr int graceSeconds = 5;    // more than the limit that the server observes itself
 
 QString versionIn(const Answer& answer)
 {
@@ -51,11 +35,12 @@ public:
         database.setDatabaseName(address.database);
         database.setUserName(address.user);
         database.setPassword(address.password);
-        QString options = u"CLIENT_FOUND_ROWS=1;MYSQL_OPT_CONNECT_TIMEOUT=%1"_s.arg(answerSeconds);
+        QString options = u"CLIENT_FOUND_ROWS=1;MYSQL_OPT_CONNECT_TIMEOUT=%1"_s.arg(connectSeconds);
         if (statementSeconds > 0)
             options += u";MYSQL_OPT_READ_TIMEOUT=%1;MYSQL_OPT_WRITE_TIMEOUT=%1"_s.arg(statementSeconds + graceSeconds);
         database.setConnectOptions(options);
         openDatabase();
+        socket.find();
         // strict mode, so that a value that is too long is refused and not cut, even if the server is configured
         // otherwise
         runShortly(
@@ -97,13 +82,12 @@ private:
     /// Executes a statement that takes no time. The connection of a server that does not answer for seconds is lost.
     Answer runShortly(const QString& statement)
     {
-        std::future<Answer> answer = std::async(std::launch::async, [&] { return QtSqlEngine::run(statement); });
-        if (answer.wait_for(std::chrono::seconds(answerSeconds)) != std::future_status::ready)
-            ::shutdown(socketOf(*database.driver()),
-                       SHUT_RDWR);  // otherwise it waits as long as any statement may take
-        return answer.get();
+        Answer answer;
+        socket.limit([&] { answer = QtSqlEngine::run(statement); });
+        return answer;
     }
 
+    DriverSocket socket;
     std::optional<MySqlServer> server;
 };
 
@@ -135,6 +119,13 @@ public:
     void endSession(const QString& session, const QString& lock) override { server.endSession(session, lock); }
 
 protected:
+    /// Drivers don't limit statements themselves.
+    Answer runShortly(const QString& statement) override
+    {
+        Answer answer;
+        socket().limit([&] { answer = run(statement, 0); });
+        return answer;
+    }
     int statementSeconds() const override { return 0; }
     bool meansConnectionLost(const OdbcMessage& message) const override
     {

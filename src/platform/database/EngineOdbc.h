@@ -22,8 +22,9 @@ protected:
     explicit EngineOdbc(std::unique_ptr<OdbcConnection> connection) : connection_(std::move(connection)) {}
 
     Answer run(const QString& statement, int seconds);
+    const DriverSocket& socket() const { return connection_->socket(); }
     /// Executes a statement that takes no time. A server that does not answer for seconds is lost.
-    Answer runShortly(const QString& statement);
+    virtual Answer runShortly(const QString& statement);
     /// Returns the time limit that the driver must observe, or 0 if the server does so itself.
     virtual int statementSeconds() const = 0;
     /// Returns true if the message says that the connection is lost.

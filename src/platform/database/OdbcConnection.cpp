@@ -276,6 +276,7 @@ OdbcConnection::OdbcConnection(const QString& connectionText, int seconds) : han
                                          nullptr, 0, nullptr, SQL_DRIVER_NOPROMPT)))
         throw OdbcFailure{connection.messages(), true};
     handles->isConnected = true;
+    socket_.find();
 }
 
 OdbcConnection::~OdbcConnection() = default;

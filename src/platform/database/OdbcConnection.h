@@ -1,6 +1,7 @@
 // A client of the ODBC driver manager that reads the complete result of each statement.
 #pragma once
 
+#include "platform/database/DriverSocket.h"
 #include "platform/database/Engine.h"
 
 #include <QList>
@@ -37,6 +38,8 @@ public:
     /// and the number of changed rows of the last one that has none. 0 seconds means no limit. Throws OdbcFailure.
     Answer run(const QString& statement, int seconds);
 
+    const DriverSocket& socket() const { return socket_; }
+
     /// Returns the name of the database's product.
     QString databaseName() const;
     /// Returns the names and versions of the driver, the driver manager and the server.
@@ -45,6 +48,7 @@ public:
 private:
     QString information(unsigned short item) const;
 
+    DriverSocket socket_;
     struct Handles;
     std::unique_ptr<Handles> handles;
 };
