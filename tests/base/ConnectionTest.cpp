@@ -131,6 +131,7 @@ TEST_F(ShopConnection, AServerThatFallsSilentAfterTheLoginCostsFiveSeconds)
         openWith(u"ServerName"_s, name.arg(proxy.readLine().toInt()));
         EXPECT_LT(time.elapsed(), 5000) << name;
         EXPECT_EQ(gcnDB->state(), 0) << name;
+        EXPECT_TRUE(proxy.waitForReadyRead()) << "refused before: " << connectionFailure();
         EXPECT_NE(connectionFailure(), QString());
         proxy.closeWriteChannel();
         EXPECT_TRUE(proxy.waitForFinished());

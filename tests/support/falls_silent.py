@@ -2,7 +2,7 @@
 """Passes bytes between clients and a server until a client sends a word, and nothing from then on.
 
 The connections stay open, as those of a server that hangs. It takes the server's address and port and the word, prints
-its own port on 127.0.0.1, and ends when its standard input is closed.
+its own port on 127.0.0.1 and then that it is silent, and ends when its standard input is closed.
 """
 
 import socket
@@ -14,6 +14,7 @@ def pass_on(source, target, words, silent):
     while data := source.recv(65536):
         if any(word in data for word in words):
             silent.set()
+            print("silent", flush=True)
         if not silent.is_set():
             target.sendall(data)
 
