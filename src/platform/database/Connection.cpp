@@ -51,7 +51,7 @@ std::unique_ptr<Engine> openLocal(const QString& name)
     return openEmbedded(files::systemPath(profile::root() + u"/databases/"_s + name + u".db"_s));
 }
 
-std::unique_ptr<Engine> openEngine(const QString& connectionText, const ConnectionText& odbcOptions,
+std::unique_ptr<Engine> openServer(const QString& connectionText, const ConnectionText& odbcOptions,
                                    int statementSeconds)
 {
     const ConnectionText text(connectionText);
@@ -63,8 +63,6 @@ std::unique_ptr<Engine> openEngine(const QString& connectionText, const Connecti
     }
     if (isRegistered(driver))
         return openOdbc(odbcTarget(text, driver, odbcOptions));
-    if (const QString name = embeddedName(connectionText); !name.isEmpty())
-        return openLocal(name);
     const QString other = driver.contains(u"SQL"_s, Qt::CaseInsensitive) ? sqlServerDriver() : QString();
     if (other.isEmpty())
         throw RuntimeError(CannotOpen,
@@ -103,15 +101,14 @@ void Connection::open(const QString& connectionText)
     close();
     failOnRequest();
     std::unique_ptr<Engine> engine;
-    const auto connect = [&] { engine = openEngine(connectionText, ConnectionText(odbcOptions_), commandTimeout_); };
-    if (embeddedName(connectionText).isEmpty()) {
+    if (const QString name = embeddedName(connectionText); !name.isEmpty()) {
+        engine = openLocal(name);
+    } else {
         patiently(u"Connecting to "_s + ConnectionText(connectionText).value(u"Server") + u"..."_s,
                   [&, here = QThread::currentThread()] {
-                      connect();
+                      engine = openServer(connectionText, ConnectionText(odbcOptions_), commandTimeout_);
                       engine->moveTo(here);
                   });
-    } else {
-        connect();
     }
     session_ = std::make_unique<Session>(std::move(engine));
     session_->engine().setTimeout(commandTimeout_);
