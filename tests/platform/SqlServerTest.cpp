@@ -4,8 +4,13 @@
 #include "platform/database/Dialect.h"
 #include "platform/database/OdbcDrivers.h"
 #include "platform/database/Session.h"
+#include "platform/database/TdsServer.h"
+
+#include <QNetworkDatagram>
+#include <QUdpSocket>
 
 #include <clocale>
+#include <future>
 
 using db::Recordset;
 
@@ -108,6 +113,25 @@ TEST_P(SqlServer, AnInstanceThatIsMissingIsNamed)
     const QString text = QString(connectionText).replace(tdsServer().address(), u"127.0.0.1\\NOSUCH"_s);
     EXPECT_TRUE(
         failure([&] { other.open(QString(text).remove(u"Port=1433;"_s)); }).description().contains(u"NOSUCH"_s));
+}
+
+TEST(TdsServer, ItsBrowserTellsThePortOfAnInstance)
+{
+    // an address for each process, because the port is fixed
+    const qint64 process = QCoreApplication::applicationPid();
+    const QString host = u"127.7.%1.%2"_s.arg(process / 250 % 250).arg(process % 250 + 1);
+    EXPECT_EQ(db::portOfInstance(host, u"SHOP"_s, 5000), 0) << "nobody listens";
+    QUdpSocket browser;
+    ASSERT_TRUE(browser.bind(QHostAddress(host), 1434));
+    EXPECT_EQ(db::portOfInstance(host, u"SHOP"_s, 20), 0) << "a silent host";
+    auto port = std::async(std::launch::async, [&] { return db::portOfInstance(host, u"SHOP"_s, 5000); });
+    browser.receiveDatagram();  // the question that had no answer
+    ASSERT_TRUE(browser.waitForReadyRead(5000));
+    const QNetworkDatagram question = browser.receiveDatagram();
+    EXPECT_EQ(question.data(), QByteArray("\x04SHOP\0", 6));
+    browser.writeDatagram("\x05..ServerName;HOST;InstanceName;SHOP;tcp;49172;;", question.senderAddress(),
+                          quint16(question.senderPort()));
+    EXPECT_EQ(port.get(), 49172);
 }
 
 TEST_P(SqlServer, EachDriverGetsTheServerInItsOwnForm)
