@@ -5,6 +5,7 @@
 #include <QLocale>
 #include <QRegularExpression>
 
+#include <algorithm>
 #include <cmath>
 #include <limits>
 
@@ -25,6 +26,8 @@ const QRegularExpression& numberForm()
 /// Returns the number in a text: infinity if it is too large for the type, and 0 if it is too near to 0.
 std::optional<double> readNumber(const QString& text)
 {
+    if (text.isEmpty())
+        return {};  // the usual setting; the pattern is expensive when it is first used
     bool read = false;
     // reads most texts, but not digits in groups; also accepts "inf" and "nan", which are not numbers
     const double plain = text.toDouble(&read);
@@ -147,6 +150,8 @@ std::optional<double> numberIn(const QString& text)
 
 double leadingNumber(const QString& text)
 {
+    if (!text.isEmpty() && std::ranges::all_of(text, [](QChar letter) { return letter >= u'0' && letter <= u'9'; }))
+        return finite(text.toDouble());  // the usual text; the patterns are expensive when they are first used
     static const QRegularExpression blanks(u"[ \\t\\r\\n]"_s);
     static const QRegularExpression start(uR"(\A[-+]?(?:\d+\.?\d*|\.\d+)(?:[eE][-+]?\d+)?)"_s);
     return finite(start.match(QString(text).remove(blanks)).captured().toDouble());

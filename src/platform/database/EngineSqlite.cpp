@@ -207,7 +207,7 @@ public:
             column.kind = kindOfType(type);
             const qsizetype width = type.indexOf(u'(');
             if (column.kind == Kind::Text && width > 0)
-                column.size = int(leadingNumber(type.sliced(width + 1)));
+                column.size = int(leadingNumber(type.sliced(width + 1).section(u')', 0, 0)));
             column.hasDefault = !row[2].isNull() && row[2].toString().compare(u"NULL"_s, Qt::CaseInsensitive) != 0;
             if (column.hasDefault)
                 column.fixedDefault = fixedDefault(row[2].toString(), column.kind);
