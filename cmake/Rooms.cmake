@@ -3,12 +3,13 @@
 #
 #   kest_room(inbound USES reports messages)         an object library with the sources in src/inbound
 #   kest_room(setup STATIC USES base ...)            a static library, for rooms that are not part of the component
+#   kest_room(pdf MODULE USES base print ...)        a library that the component loads when it needs it
 #   kest_room(platform NAME values LINKS Qt6::Core)  a target name of its own, and libraries to link
 #
 # The target of src/platform/xml is kest_xml. To limit the headers, the build tree has a folder of links for each room,
 # and no target has the whole of src/ on its include path.
 function(kest_room folder)
-    cmake_parse_arguments(room "STATIC" "NAME" "USES;LINKS" ${ARGN})
+    cmake_parse_arguments(room "STATIC;MODULE" "NAME" "USES;LINKS" ${ARGN})
     if(NOT room_NAME)
         get_filename_component(room_NAME ${folder} NAME)
     endif()
@@ -17,6 +18,10 @@ function(kest_room folder)
     list(FILTER sources EXCLUDE REGEX "/main\\.cpp$")
     if(room_STATIC)
         add_library(${target} STATIC ${sources})
+        target_link_libraries(${target} PUBLIC kest2lib)
+    elseif(room_MODULE)
+        add_library(${target} MODULE ${sources})
+        set_target_properties(${target} PROPERTIES DEFINE_SYMBOL "")  # all rooms share the precompiled headers
         target_link_libraries(${target} PUBLIC kest2lib)
     else()
         add_library(${target} OBJECT ${sources})

@@ -5,7 +5,7 @@
 #include "platform/Prompt.h"
 #include "platform/desktop/Lists.h"
 #include "platform/desktop/Window.h"
-#include "sublets/frmViewPDF.h"
+#include "sublets/PdfViewer.h"
 
 #include <QHBoxLayout>
 #include <QHeaderView>
@@ -86,7 +86,7 @@ void frmSubletAuth::ShowForm(const QString& QTNNO, const QString& Subquote)
 void frmSubletAuth::Command1_Click()
 {
     for (const QTreeWidgetItem* chosen : ListView1->selectedItems())
-        frmViewPDF::ShowForm(folder + chosen->data(0, fileRole).toString());
+        showPdf(folder + chosen->data(0, fileRole).toString());
 }
 
 void frmSubletAuth::Command2_Click()

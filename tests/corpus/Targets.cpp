@@ -13,8 +13,8 @@
 #include "platform/print/Report.h"
 #include "platform/settings/RegistryFile.h"
 #include "quotedata/NoteChain.h"
+#include "sublets/PdfViewer.h"
 #include "sublets/SubletDocuments.h"
-#include "sublets/frmViewPDF.h"
 #include "support/Shop.h"
 #include "utilities/ExactTextEdit.h"
 #include "utilities/FormatXML.h"
@@ -416,9 +416,9 @@ void showSublets(ShopTarget&, const QByteArray& input)
         const QList<SubletDocument> documents = subletDocuments(key, numbers);
         require(documents.size() <= numbers.size(), "a document belongs to one line");
         for (const SubletDocument& document : documents)
-            frmViewPDF::ShowForm(subletFolder() + document.file);
+            showPdf(subletFolder() + document.file);
     }
-    frmViewPDF::ShowForm(subletFolder() + QFile::decodeName(name));
+    showPdf(subletFolder() + QFile::decodeName(name));
     emptyFolder(subletFolder());
 }
 

@@ -21,10 +21,11 @@ trap 'fail "line $LINENO"' ERR
 cpack --config "$build/CPackConfig.cmake" -B "$tmp/package"
 deb=$(echo "$tmp"/package/kest2_*.deb)
 dpkg-deb --contents "$deb" >"$tmp/contents"
-for path in bin/kest2 lib/libkest2.so.2 share/kest2/templates/730.html share/kest2/sql/quote-mariadb.sql \
-    share/kest2/sql/joblink.sql share/applications/kest2.desktop share/icons/hicolor/scalable/apps/kest2.svg \
-    share/icons/hicolor/16x16/apps/kest2.png share/icons/hicolor/256x256/apps/kest2.png share/man/man1/kest2.1.gz \
-    share/doc/kest2/copyright share/doc/kest2/docs/operating.md; do
+for path in bin/kest2 lib/libkest2.so.2 lib/kest2/libkest2pdf.so share/kest2/templates/730.html \
+    share/kest2/sql/quote-mariadb.sql share/kest2/sql/joblink.sql share/applications/kest2.desktop \
+    share/icons/hicolor/scalable/apps/kest2.svg share/icons/hicolor/16x16/apps/kest2.png \
+    share/icons/hicolor/256x256/apps/kest2.png share/man/man1/kest2.1.gz share/doc/kest2/copyright \
+    share/doc/kest2/docs/operating.md; do
     grep -qE "\./usr/$path( |$)" "$tmp/contents" || fail "the package has no /usr/$path"
 done
 ! grep -vE ' \./(usr/.*)?$' "$tmp/contents" || fail "the package has files outside /usr"
@@ -54,11 +55,13 @@ diff "$tmp/recorded" "$tmp/installed" || fail "the files installed are not those
 # its use
 kest2=$root/usr/bin/kest2
 library=$root/usr/lib/libkest2.so.2
-readelf -d "$kest2" "$library" >"$tmp/dynamic"
+viewer=$root/usr/lib/kest2/libkest2pdf.so
+readelf -d "$kest2" "$library" "$viewer" >"$tmp/dynamic"
 ! grep -E 'RPATH|RUNPATH' "$tmp/dynamic" || fail "a search path of the build is left"
 export LD_LIBRARY_PATH=${library%/*} XDG_RUNTIME_DIR=$tmp QT_QPA_PLATFORM=offscreen
 ldd "$kest2" >"$tmp/libraries"  # no pipe: a grep that ends early would make ldd fail
 grep -q "libkest2.so.2 => $library " "$tmp/libraries" || fail "the command does not use the installed library"
+! grep -E 'libQt6(Pdf|Network)' "$tmp/libraries" || fail "a start loads what only the PDF viewer needs"
 desktop-file-validate "$root/usr/share/applications/kest2.desktop"
 for picture in "$root"/usr/share/icons/hicolor/*/apps/kest2.png; do
     size=${picture#*/hicolor/}
@@ -75,6 +78,16 @@ export KEST2_PROFILE=$tmp/profile
 diff -r "$root/usr/share/kest2/templates" "$KEST2_PROFILE/drive_c/wirra32/report" || fail "other templates than those installed"
 "$host" "$library" show 1004 0 >"$tmp/shown" || fail "a host cannot load the installed library"
 grep -qx done "$tmp/shown" || fail "a host's call does not return"
+
+# a PDF document, with the viewer and without it
+echo '{"windows": {"frmSubletAuth": [[{"click": "Command1"}]]}}' >"$tmp/open"
+"$kest2" --json --script "$tmp/open" load AUQT_1007.xml >"$tmp/shown"
+grep -q '"frmViewPDF"' "$tmp/shown" || fail "a PDF document is not shown"
+mv "$viewer" "$tmp"
+"$kest2" --json --script "$tmp/open" reprint 1007.0_1.xml >"$tmp/shown"
+grep -q 'the PDF viewer of KEST2 is missing' "$tmp/shown" || fail "nobody is told that the PDF viewer is missing"
+grep -q "Description: .*$viewer" "$KEST2_PROFILE/component/kest2error.log" || fail "the log does not say which file is missing"
+mv "$tmp/${viewer##*/}" "$viewer"
 
 # the removal
 dpkg_here --purge kest2

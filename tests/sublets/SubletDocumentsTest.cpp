@@ -1,8 +1,8 @@
 // Tests sublet documents: which belong to a quote, how they are listed, and a file that is not a PDF.
 #include "platform/script/Gestures.h"
+#include "sublets/PdfViewer.h"
 #include "sublets/SubletDocuments.h"
 #include "sublets/frmSubletAuth.h"
-#include "sublets/frmViewPDF.h"
 #include "support/Hands.h"
 #include "support/Shop.h"
 
@@ -63,7 +63,7 @@ TEST_F(Sublet, TheListShowsTheLineOfEachDocumentAndOpensTheChosenOne)
     EXPECT_EQ(windows()[1][u"file"_s], u"c:\\wirdoc\\PDF\\500.0_2.pdf"_s);
     EXPECT_EQ(desktop->read(u"lblPage"_s), u"Page 2 of 2"_s);
 
-    frmViewPDF::ShowForm(u"c:\\wirdoc\\PDF\\gone.pdf"_s);
+    showPdf(u"c:\\wirdoc\\PDF\\gone.pdf"_s);
     EXPECT_EQ(shown(), "[critical] The document c:\\wirdoc\\PDF\\gone.pdf can't be shown: the file does not exist.");
 }
 
@@ -71,7 +71,7 @@ TEST_F(Sublet, ADocumentThatContainsItselfIsRefused)
 {
     const QByteArray file = files::readBytes(checkoutFile(u"tests/corpus/sublets/pages-circle.pdf"_s));
     document("500.0_1.pdf", file.sliced(file.indexOf('\n') + 1));
-    frmViewPDF::ShowForm(u"c:\\wirdoc\\PDF\\500.0_1.pdf"_s);
+    showPdf(u"c:\\wirdoc\\PDF\\500.0_1.pdf"_s);
     EXPECT_EQ(shown(),
               "[critical] The document c:\\wirdoc\\PDF\\500.0_1.pdf can't be shown: it is damaged, so that "
               "reading it does not end.");
@@ -93,7 +93,7 @@ TEST_F(Sublet, ASavedCopyIsNamedAfterItsLine)
                                   files.selectFile(copy);
                                   dialog.setResult(QDialog::Accepted);
                               }}});
-    frmViewPDF::ShowForm(u"c:\\wirdoc\\PDF\\500.2_7.pdf"_s);
+    showPdf(u"c:\\wirdoc\\PDF\\500.2_7.pdf"_s);
     EXPECT_TRUE(offered.endsWith(u"/Sublet authority 500-2 line 7.pdf"_s)) << offered;
     EXPECT_TRUE(QFile::exists(folder + u"COPY.pdf"_s)) << "another file";
     QFile saved(copy);
@@ -107,7 +107,7 @@ TEST_F(Sublet, APrintTakesThePagesThatWereChosen)
     const QString output = root() + u"/printed.pdf"_s;
     for (const int only : {0, 2}) {
         const test::Hands hands(test::printing(u"frmViewPDF"_s, output, only ? QString::number(only) : QString()));
-        frmViewPDF::ShowForm(u"c:\\wirdoc\\PDF\\500.0_1.pdf"_s);
+        showPdf(u"c:\\wirdoc\\PDF\\500.0_1.pdf"_s);
         QPdfDocument printed;
         ASSERT_EQ(printed.load(output), QPdfDocument::Error::None);
         EXPECT_EQ(printed.pageCount(), only ? 1 : 2);

@@ -10,8 +10,8 @@
 #include "platform/desktop/Person.h"
 #include "platform/script/Gestures.h"
 #include "reports/frmPrintPreview.h"
+#include "sublets/PdfViewer.h"
 #include "sublets/frmSubletAuth.h"
-#include "sublets/frmViewPDF.h"
 #include "support/Hands.h"
 #include "utilities/frmHistory.h"
 #include "utilities/frmLogin.h"
@@ -90,7 +90,7 @@ void EveryWindow::each(const Check& check)
          }},
         {"frmExtraInfo", check, [] { frmExtraInfo::ShowForm(u"500"_s, u"0"_s); }},
         {"frmSubletAuth", check, [] { frmSubletAuth::ShowForm(u"500"_s, u"0"_s); }},
-        {"frmViewPDF", check, [] { frmViewPDF::ShowForm(document); }},
+        {"frmViewPDF", check, [] { showPdf(document); }},
         {"frmPrintPreview", check, [] { frmPrintPreview::ShowForm(710, QString(), nullptr); }},
         {"frmLogin", check, [&] { frmLogin::ShowForm(passed); }},
         {"frmUtilities", check, [] { frmUtilities::ShowForm(u"500"_s, u"0"_s); }},

@@ -1,4 +1,4 @@
-#include "sublets/frmViewPDF.h"
+#include "pdf/frmViewPDF.h"
 
 #include "base/QuoteKey.h"
 #include "platform/Prompt.h"
