@@ -1,8 +1,12 @@
 // Replaces the ODBC drivers of this machine for a test program and its child processes.
 #pragma once
 
-#include <QByteArray>
+#include <QDir>
+#include <QFile>
+#include <QFileInfo>
 #include <QTemporaryDir>
+
+#include <stdexcept>
 
 namespace kest::test {
 
@@ -14,12 +18,31 @@ class OdbcDrivers {
 public:
     /// `WithSqlServer` also registers the driver for the simulated server under the name that shops use.
     enum Names { Own, WithSqlServer };
-    explicit OdbcDrivers(Names names);
+    explicit OdbcDrivers(Names names)
+    {
+        const QByteArray tds = "]\nDriver=" + library("libtdsodbc.so");
+        QByteArray list = QByteArray("[") + odbcTds + tds + "[" + odbcMariaDb + "]\nDriver=" + library("libmaodbc.so");
+        if (names == WithSqlServer)
+            list += "[SQL Server" + tds;
+        QFile file(folder_.filePath(QStringLiteral("odbcinst.ini")));
+        if (!file.open(QIODevice::WriteOnly) || file.write(list) < 0)
+            throw std::runtime_error("odbcinst.ini can't be written");
+        qputenv("ODBCSYSINI", QFile::encodeName(folder_.path()));
+    }
     /// Restores the drivers of the machine.
-    ~OdbcDrivers();
+    ~OdbcDrivers() { before_.isNull() ? qunsetenv("ODBCSYSINI") : qputenv("ODBCSYSINI", before_); }
     Q_DISABLE_COPY_MOVE(OdbcDrivers)
 
 private:
+    /// Returns the path of a library and a line end.
+    static QByteArray library(const char* name)
+    {
+        QDir::setSearchPaths(QStringLiteral("odbc"), {QStringLiteral("/usr/lib/x86_64-linux-gnu/odbc"),
+                                                      QStringLiteral("/usr/lib/aarch64-linux-gnu/odbc")});
+        return QFile::encodeName(QFileInfo(QStringLiteral("odbc:") + QLatin1StringView(name)).absoluteFilePath()) +
+               '\n';
+    }
+
     QTemporaryDir folder_;
     QByteArray before_ = qgetenv("ODBCSYSINI");
 };
