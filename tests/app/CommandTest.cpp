@@ -1,6 +1,5 @@
 // Tests the command: its exit codes, its JSON, and what it asks.
 #include "app/CommandLine.h"
-#include "platform/settings/registry.h"
 #include "setup/Profile.h"
 #include "setup/QuoteDatabase.h"
 #include "shell/component.h"
@@ -39,9 +38,7 @@ struct Command : ::testing::Test {
 TEST_F(Command, TheExitCodeTellsWhatBecameOfIt)
 {
     files::write(u"c:\\wirdoc\\AUnread\\a..xml"_s, u"<a><messageType>NONE</messageType></a>"_s);
-    ASSERT_TRUE(settings::setValue(settings::Hive::LocalMachine, u"SOFTWARE\\wirra32\\frmsplash"_s,
-                                   u"TabletMasterOdbcOptions"_s,
-                                   {settings::Type::Text, u"Port=1;password = s3cret"_s}));
+    setSetting(u"TabletMasterOdbcOptions"_s, u"Port=1;password = s3cret"_s);
     for (const auto& [words, code, line, json] : casesIn<4>("app/commands.txt")) {
         const Ended ended = kest2(words);
         EXPECT_EQ(ended.exitCode, code.toInt()) << words;

@@ -8,12 +8,6 @@
 
 #include <QTcpServer>
 
-static void setSetting(const QString& key, const QString& value, const QString& section = u"wirra32\\frmsplash"_s)
-{
-    RegCreateSubKey(settings::Hive::LocalMachine, u"SOFTWARE\\"_s + section);
-    ASSERT_TRUE(RegSetValue(settings::Hive::LocalMachine, u"SOFTWARE\\"_s + section, key, value));
-}
-
 TEST(connectionText, NamesTheServerAsItsDriverExpects)
 {
     gsDatabase = u"WirSql"_s;

@@ -136,12 +136,9 @@ TEST(TdsServer, ItsBrowserTellsThePortOfAnInstance)
 
 TEST_P(SqlServer, EachDriverGetsTheServerInItsOwnForm)
 {
-    QTemporaryDir folder;
-    files::writeBytes(folder.filePath(u"odbcinst.ini"_s),
-                      "[FreeTDS]\nDriver=libtdsodbc.so\n[ODBC Driver 18 for SQL Server]\nDriver=libmsodbcsql-18.3.so\n"
-                      "[Odd]\nDriver=libodd.so\n");
-    const QByteArray before = qgetenv("ODBCSYSINI");
-    qputenv("ODBCSYSINI", QFile::encodeName(folder.path()));
+    const OdbcDrivers drivers(
+        "[FreeTDS]\nDriver=libtdsodbc.so\n[ODBC Driver 18 for SQL Server]\nDriver=libmsodbcsql-18.3.so\n"
+        "[Odd]\nDriver=libodd.so\n");
     EXPECT_EQ(db::sqlServerDriver(), u"ODBC Driver 18 for SQL Server"_s);
     for (auto [driver, server, options, expected] : casesIn<4>("odbc-texts.txt")) {
         server.replace(u"STANDIN"_s, tdsServer().address());
@@ -149,7 +146,6 @@ TEST_P(SqlServer, EachDriverGetsTheServerInItsOwnForm)
         const db::ConnectionText given(u"Driver={SQL Server};Server=%1;Database=WirSql;Uid=sa;Pwd=p;"_s.arg(server));
         EXPECT_EQ(db::odbcTarget(given, driver, db::ConnectionText(options)).connectionText, expected);
     }
-    qputenv("ODBCSYSINI", before);
 }
 
 INSTANTIATE_TEST_SUITE_P(Alone, SqlServer, ::testing::Values(On::Tds));

@@ -68,8 +68,7 @@ TEST_F(Preview, WhatCannotBeShownEndsInSilenceButAnUnknownNumber)
     gConn->execute(u"UPDATE ReportDefinition SET ReportName='720.html' WHERE ReportID=720"_s);
     show(720);
     EXPECT_EQ(shownReports(), "frmPrintPreview720");
-    ASSERT_TRUE(settings::setValue(settings::Hive::LocalMachine, u"SOFTWARE\\wirra32\\frmsplash"_s, u"ReportPath"_s,
-                                   {settings::Type::Text, u"c:\\wirra32\\report"_s}));  // without the last backslash
+    setSetting(u"ReportPath"_s, u"c:\\wirra32\\report"_s);  // without the last backslash
     show(720);
     EXPECT_EQ(shownReports() + shown(), "");
 }
@@ -206,8 +205,7 @@ TEST_F(Preview, ASaveGoesWhereThePersonSays)
     db::Recordset rows = table(u"quote_ref=500/1 quote_type=AUTR comment=x"_s);
     const QString folder = root() + u"/chosen"_s;
     QDir().mkpath(folder + u"/folder.pdf"_s);
-    ASSERT_TRUE(settings::setValue(settings::Hive::LocalMachine, u"SOFTWARE\\wirra32\\frmsplash"_s, u"ShopName"_s,
-                                   {settings::Type::Text, u"Café (Smash) Repairs"_s}));
+    setSetting(u"ShopName"_s, u"Café (Smash) Repairs"_s);
     QStringList offered;
     const auto saveAs = [&](const QString& path) {
         const auto click = [](QDialog& window) { control<QToolButton>(window, "cmdSave").click(); };

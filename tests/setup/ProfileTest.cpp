@@ -74,8 +74,7 @@ TEST_F(Profile, IsMadeWhole)
 TEST_F(Profile, IsNotTouchedOnceItExists)
 {
     EXPECT_TRUE(app::initProfile(registerClass, app::Shop::New, today));
-    EXPECT_TRUE(settings::setValue(settings::Hive::LocalMachine, u"SOFTWARE\\wirra32\\frmsplash"_s, u"ImagesPath"_s,
-                                   {settings::Type::Text, u"d:\\pictures\\"_s}));
+    setSetting(u"ImagesPath"_s, u"d:\\pictures\\"_s);
     const QByteArray registry = files::readBytes(profile.root() + u"/registry.ini"_s);
     EXPECT_FALSE(app::initProfile(registerClass, app::Shop::Demo, today));
     EXPECT_EQ(files::readBytes(profile.root() + u"/registry.ini"_s), registry);

@@ -18,12 +18,10 @@ class OdbcDrivers {
 public:
     /// `WithSqlServer` also registers the driver for the simulated server under the name that shops use.
     enum Names { Own, WithSqlServer };
-    explicit OdbcDrivers(Names names)
+    explicit OdbcDrivers(Names names) : OdbcDrivers(listOf(names)) {}
+    /// Lists the drivers as a file odbcinst.ini does.
+    explicit OdbcDrivers(const QByteArray& list)
     {
-        const QByteArray tds = "]\nDriver=" + library("libtdsodbc.so");
-        QByteArray list = QByteArray("[") + odbcTds + tds + "[" + odbcMariaDb + "]\nDriver=" + library("libmaodbc.so");
-        if (names == WithSqlServer)
-            list += "[SQL Server" + tds;
         QFile file(folder_.filePath(QStringLiteral("odbcinst.ini")));
         if (!file.open(QIODevice::WriteOnly) || file.write(list) < 0)
             throw std::runtime_error("odbcinst.ini can't be written");
@@ -34,6 +32,12 @@ public:
     Q_DISABLE_COPY_MOVE(OdbcDrivers)
 
 private:
+    static QByteArray listOf(Names names)
+    {
+        const QByteArray tds = "]\nDriver=" + library("libtdsodbc.so");
+        return QByteArray("[") + odbcTds + tds + "[" + odbcMariaDb + "]\nDriver=" + library("libmaodbc.so") +
+               (names == WithSqlServer ? "[SQL Server" + tds : QByteArray());
+    }
     /// Returns the path of a library and a line end.
     static QByteArray library(const char* name)
     {

@@ -1,6 +1,5 @@
 #include "support/ShopDatabase.h"
 
-#include "base/ModRegistry.h"
 #include "base/SharedVariables.h"
 #include "base/modDBAccess.h"
 #include "setup/PrepareDatabase.h"
@@ -199,9 +198,7 @@ void makeShopDatabase()
         return;
     }
     serverShop().copy(serverShop().fresh, serverShop().shop);
-    RegCreateSubKey(settings::Hive::LocalMachine, u"SOFTWARE\\wirra32\\frmsplash"_s);
-    RegSetValue(settings::Hive::LocalMachine, u"SOFTWARE\\wirra32\\frmsplash"_s, u"ServerName"_s,
-                serverShop().serverName);
+    setSetting(u"ServerName"_s, serverShop().serverName);
 }
 
 void closeConnections()

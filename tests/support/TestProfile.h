@@ -2,6 +2,7 @@
 #pragma once
 
 #include "platform/profile.h"
+#include "platform/settings/registry.h"
 #include "support/Places.h"
 
 #include <QDir>
@@ -31,5 +32,14 @@ public:
 private:
     QTemporaryDir folder{memoryFolder(QStringLiteral("profile"))};
 };
+
+/// Sets a setting of the component for all users, or a value in another section of the registry's SOFTWARE.
+inline void setSetting(const QString& name, const QString& text,
+                       const QString& section = QStringLiteral("wirra32\\frmsplash"))
+{
+    const QString key = QStringLiteral("SOFTWARE\\") + section;
+    EXPECT_TRUE(settings::createKey(settings::Hive::LocalMachine, key));
+    EXPECT_TRUE(settings::setValue(settings::Hive::LocalMachine, key, name, {settings::Type::Text, text}));
+}
 
 }  // namespace kest::test
