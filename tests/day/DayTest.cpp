@@ -14,18 +14,7 @@
 /// What a clerk would look at: quotes with their notes and lines, files, and the jobs in JobLink.
 using Holdings = QMap<QString, QString>;
 
-/// Adds the columns of each row under the value of its first column.
-static void addRows(Holdings& all, db::Recordset rows)
-{
-    for (; !rows.eof(); rows.moveNext()) {
-        QStringList values;
-        for (const QString& column : rows.columns().sliced(1))
-            values << column + u' ' + (rows.text(column).isEmpty() ? u"-"_s : rows.text(column));
-        all[rows.text(rows.columns().first())] =
-            values.join(u", "_s).replace(shortDate(QDate::currentDate()), u"today"_s);
-    }
-}
-
+/// Returns the columns of each row under the value of its first column, and the names of the files.
 static Holdings found(const MariaDbServer& server)
 {
     Holdings all;
@@ -33,8 +22,13 @@ static Holdings found(const MariaDbServer& server)
     jobLink->open(server.connectionText(u"jobs"_s));
     for (const auto& [database, select] : casesIn<2>("app/day-rows.txt")) {
         db::Recordset rows(database == "JobLink"_L1 ? jobLink : gConn);
-        rows.open(select);
-        addRows(all, std::move(rows));
+        for (rows.open(select); !rows.eof(); rows.moveNext()) {
+            QStringList values;
+            for (const QString& column : rows.columns().sliced(1))
+                values << column + u' ' + (rows.text(column).isEmpty() ? u"-"_s : rows.text(column));
+            all[rows.text(rows.columns().first())] =
+                values.join(u", "_s).replace(shortDate(QDate::currentDate()), u"today"_s);
+        }
     }
     for (const auto& [name, path] : {std::pair(u"unread "_s, gsUnreadPath),
                                      {u"read "_s, gsReadPath},
