@@ -16,17 +16,15 @@ struct JournalOfAShop : Shop {
     static int records() { return rowCount("KESTOperation") + rowCount("KESTJournal"); }
 };
 
-/// Removes one of the two tables, and creates both anew on a server that keeps them for the next test.
-class NoJournalTable {
-public:
-    NoJournalTable() { gConn->execute(u"DROP TABLE KESTJournal"_s); }
-    ~NoJournalTable()
-    {
+/// Removes one of the two tables. The result creates both anew, on a server that keeps them for the next test.
+[[nodiscard]] static auto withoutJournal()
+{
+    gConn->execute(u"DROP TABLE KESTJournal"_s);
+    return qScopeGuard([] {
         gConn->execute(u"DROP TABLE KESTOperation"_s);
         app::createParts(gConn, app::missingParts(gConn));
-    }
-    Q_DISABLE_COPY_MOVE(NoJournalTable)
-};
+    });
+}
 
 TEST_F(JournalOfAShop, RecordsNothingForALoadThatChangesNothing)
 {
@@ -73,7 +71,7 @@ TEST_F(JournalOfAShop, WritesAChangeTogetherWithItsRecord)
 
     row = opened(u"SELECT * FROM QUOTE1 WHERE QTNNO='500'"_s);
     row.set(u"CLAIM"_s, u"C3"_s);
-    const NoJournalTable none;
+    const auto back = withoutJournal();
     EXPECT_EQ(failureOf([&] { row.update(); }), StatementFailed);
     EXPECT_EQ(failureOf([&] { gConn->execute(u"DELETE FROM QUOTE1 WHERE QTNNO='500'"_s); }), StatementFailed);
     EXPECT_EQ(quote("500").text("CLAIM"), "C2");
@@ -82,7 +80,7 @@ TEST_F(JournalOfAShop, WritesAChangeTogetherWithItsRecord)
 
 TEST_F(JournalOfAShop, IsNotNeededForALoad)
 {
-    const NoJournalTable none;
+    const auto back = withoutJournal();
     journal::watch(gConn);
     quote("500").request("QR1").note("Active Quote Request");
     arrive("m.xml", cancellation("QR1"));

@@ -8,11 +8,6 @@ using settings::Type;
 const QString splash = u"SOFTWARE\\wirra32\\frmsplash"_s;
 
 struct Settings : ::testing::Test {
-    static void machineWide(const QString& name, const settings::Value& value)
-    {
-        ASSERT_TRUE(settings::createKey(Hive::LocalMachine, splash));
-        ASSERT_TRUE(settings::setValue(Hive::LocalMachine, splash, name, value));
-    }
     static void forTheUser(const QString& text)
     {
         const QString key = u"Software\\ApplicationSettings\\wirra32\\frmsplash"_s;
@@ -39,7 +34,7 @@ TEST_F(Settings, TheFirstReadFixesAValueForTheMachine)
     EXPECT_FALSE(settings::keyExists(Hive::LocalMachine, splash));
     forTheUser(u"user"_s);
     EXPECT_EQ(setting(u"default"_s, CopyUp::No), u"user"_s);
-    machineWide(u"EcomHome"_s, {Type::Text, u""_s});
+    setSetting(u"EcomHome"_s, u""_s);
     EXPECT_EQ(setting(u"default"_s), u"user"_s);
     forTheUser(u"changed"_s);
     EXPECT_EQ(setting(u"elsewhere"_s), u"user"_s);
@@ -48,9 +43,9 @@ TEST_F(Settings, TheFirstReadFixesAValueForTheMachine)
 TEST_F(Settings, AValueHasItsType)
 {
     EXPECT_FALSE(store(u"a"_s, u"1"_s)) << "the key must be there";
-    machineWide(u"number"_s, {Type::Number, u"0x1A"_s});
-    machineWide(u"binary"_s, {Type::Binary, u"00ff"_s});
-    machineWide(u"long"_s, {Type::Text, QString(2000, u'x')});
+    setSetting(u"long"_s, QString(2000, u'x'));
+    settings::setValue(Hive::LocalMachine, splash, u"number"_s, {Type::Number, u"0x1A"_s});
+    settings::setValue(Hive::LocalMachine, splash, u"binary"_s, {Type::Binary, u"00ff"_s});
     EXPECT_EQ(stored(u"NUMBER"_s), u"26"_s);
     EXPECT_EQ(stored(u"binary"_s), u""_s);
     EXPECT_EQ(stored(u"long"_s).size(), 1023);
