@@ -36,14 +36,6 @@ static QByteArray newShopFile()
     return files::readBytes(app::embeddedFile(shopName));
 }
 
-enum class Engine { Embedded, MariaDb, Tds };
-
-static Engine engine()
-{
-    const QString name = qEnvironmentVariable("KEST2_TEST_ENGINE");
-    return name == u"mariadb"_s ? Engine::MariaDb : name == u"tds"_s ? Engine::Tds : Engine::Embedded;
-}
-
 /// The shop's database on a server. Keeps copies of it, because creating tables would be the slowest part of a test.
 class ServerShop {
 public:
@@ -134,19 +126,20 @@ public:
 
 static ServerShop& serverShop()
 {
-    static const std::unique_ptr<ServerShop> made =
-        engine() == Engine::Tds ? std::unique_ptr<ServerShop>(new TdsShop) : std::make_unique<MariaDbShop>();
+    static const std::unique_ptr<ServerShop> made = qgetenv("KEST2_TEST_ENGINE") == "tds"
+                                                        ? std::unique_ptr<ServerShop>(new TdsShop)
+                                                        : std::make_unique<MariaDbShop>();
     return *made;
 }
 
 bool shopIsOnServer()
 {
-    return engine() != Engine::Embedded;
+    return !qEnvironmentVariableIsEmpty("KEST2_TEST_ENGINE");
 }
 
 void dropConnection()
 {
-    if (engine() == Engine::Embedded)
+    if (!shopIsOnServer())
         gConn->close();
     else
         serverShop().administrator->execute(
@@ -155,7 +148,7 @@ void dropConnection()
 
 QList<QSqlRecord> plainRows(const QString& select)
 {
-    const bool isFile = engine() == Engine::Embedded;
+    const bool isFile = !shopIsOnServer();
     if (!QSqlDatabase::contains(plainName))
         QSqlDatabase::addDatabase(isFile ? u"QSQLITE"_s : serverShop().qtDriver, plainName);
     QSqlDatabase database = QSqlDatabase::database(plainName, false);
@@ -191,7 +184,7 @@ QString plainText(const QVariant& value)
 
 void makeShopDatabase()
 {
-    if (engine() == Engine::Embedded) {
+    if (!shopIsOnServer()) {
         static const QByteArray file = newShopFile();  // only once, because creating tables is slow
         files::makeFolder(profile::root() + u"/databases"_s);
         files::writeBytes(app::embeddedFile(shopName), file);
