@@ -132,23 +132,14 @@ void readXml(ShopTarget&, const QByteArray& input)
     GetMessageRow(document, u"SENT"_s);
 }
 
-/// Returns a message: the input itself, or the sample that its lines describe. Returns nothing if there is no such
-/// sample.
-std::optional<QString> messageIn(QByteArray input)
+/// Returns a message: the input itself, or the sample that it describes. Returns nothing if there is no such sample.
+std::optional<QString> messageIn(const QByteArray& input)
 {
     const bool isSample = input.size() >= 4 && input[0] >= 'A' && input[0] <= 'Z';
     if (!isSample)
         return files::fromCodePage(input);
     try {
-        Message told = Message::told(QString::fromUtf8(firstLine(input)));
-        while (!input.isEmpty()) {
-            const QString line = QString::fromUtf8(firstLine(input));
-            const QString kind = line.section(u' ', 0, 0);
-            if (QStringList{u"labour"_s, u"part"_s, u"paint"_s, u"sublet"_s}.contains(kind))
-                told.line(kind, line.section(u' ', 1, 1).toInt(), line.section(u' ', 2, 2).remove(u'-'),
-                          fieldsIn(line.section(u' ', 3)));
-        }
-        return told.text();
+        return Message::told(QString::fromUtf8(input)).text();
     } catch (const std::exception&) {
         return {};
     }

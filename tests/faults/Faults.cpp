@@ -52,7 +52,6 @@ public:
     QStringList kinds;
 };
 
-/// A row of deviations.txt.
 struct Deviation {
     QStringList works, faults;
     QRegularExpression condition, lines;
@@ -176,7 +175,6 @@ public:
     bool disturb(Fault fault, int number);
     void tellWhatCameUp(bool isWhole) const;
 
-    /// The kinds of the undisturbed work's calls.
     const QStringList& kinds() const { return kinds_; }
 
 private:
@@ -234,8 +232,7 @@ QString Trial::run(Fault fault, int number)
     return desktop->boxTexts().join(u'\n') + u'\n' + statusShown;
 }
 
-/// Ends another process of the same workstation at that call. Returns false if it has
-/// fewer calls.
+/// Ends another process of the same workstation at that call. Returns false if it has fewer calls.
 bool Trial::killAt(int number)
 {
     closeConnections();

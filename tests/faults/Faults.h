@@ -22,9 +22,7 @@ struct Work {
 /// tenth call has each other fault.
 class Faults : public Shop {
 public:
-    /// Opens the list of messages and returns its rows.
     static QStringList openList();
-    /// Opens the list of messages, and loads the first one.
     static void loadFirst();
 
 protected:
@@ -39,10 +37,17 @@ protected:
     {
         return {loadFirst, [] { return !files::exists(gsUnreadPath + QStringLiteral("m.xml")); }, [] {}, {}, answers};
     }
-    void survivesLoading(const char* name, const Message& message, const char* answers = "{}")
+    void survivesLoading(const Text& name, const Message& message, const char* answers = "{}")
     {
         arrive("m.xml", message);
-        survives(QString::fromLatin1(name), loadOf(answers));
+        survives(name, loadOf(answers));
+    }
+    /// Survives the loads of a group in tests/data/faults/loads.txt.
+    void survivesLoadingAll(const char* group)
+    {
+        for (const QStringList& row : rowsIn("faults/loads.txt"))
+            if (row[0] == QLatin1StringView(group))
+                survivesLoading(row[1], Message::told(row[2]));
     }
 };
 

@@ -44,20 +44,7 @@ TEST_F(Loads, StatusMessages)
 {
     quote("500").request("QR1").quoteNumber("KQ1").stage(3).note("Responded Quote Request").line(1);
     quote("500").remarks("O'Brien \\ says\r\nso", "p_remarks");
-    const std::pair<const char*, Message> cases[] = {
-        {"Match", quoteMatch("500")},
-        {"Revision", revisionRequest("QR1")},
-        {"Cancellation", cancellation("QR1")},
-        {"CancellationBackout", cancellationBackout("QR1")},
-        {"Assessment", assessmentResult("KQ1")},
-        {"AssessmentBackout", assessmentBackout("QR1")},
-        {"ExcessWaiver", excessWaiver("500")},
-        {"Deletion", quoteDeletion("KQ1")},
-        {"Adjustment", adjustedQuote("500")},
-    };
-    for (const auto& [name, message] : cases)
-        survivesLoading(name, message);
-
+    survivesLoadingAll("status");
     quote("500", 1).request("QR1").quoteNumber("KQ2").line(1);
     survivesLoading("DeletionOfASupplement", quoteDeletion("KQ2"),
                     R"({"boxes": [{"text": "DELETED", "answer": "yes"}]})");
@@ -71,21 +58,9 @@ TEST_F(Loads, BackoutOfAnAuthorisation)
     survivesLoading("AuthorisationBackout", assessmentBackout("QR1"));
 }
 
-TEST_F(Lines, AuthorisationThatChanges)
+TEST_F(Lines, AuthorisationsAndNewQuotes)
 {
-    survivesLoading("AuthorisationThatChanges", authorisedQuote("500")
-                                                    .set("excess", "400")
-                                                    .set("customerContribution", "110")
-                                                    .labour(1, "C", {{"labourType", "REPR"}})
-                                                    .part(2, "C", {{"partQuantity", "2"}})
-                                                    .paint(3, "C")
-                                                    .sublet(4, "D"));
-}
-
-TEST_F(Lines, AuthorisationThatAdds)
-{
-    survivesLoading("AuthorisationThatAdds",
-                    authorisedQuote("500").labour(6, "I").sublet(7, "I", {{"subletAuthorityDocument", "JVBERi0x"}}));
+    survivesLoadingAll("lines");
 }
 
 TEST_F(Lines, ManualQuote)
@@ -93,11 +68,6 @@ TEST_F(Lines, ManualQuote)
     car("ABC123").set("COLOUR", "sILVER");
     arrive("waiting.xml", quoteRequest("QR1"));
     survivesLoading("ManualQuote", manualQuote("500").labour(1, "I").part(2, "I").paint(3, "I").sublet(4, "I"));
-}
-
-TEST_F(Lines, NewManualQuote)
-{
-    survivesLoading("NewManualQuote", manualQuote("MANQ").request("QR9").labour(1, "I"));
 }
 
 TEST_F(Lines, ManualQuoteWithBlanksInRego)

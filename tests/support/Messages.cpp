@@ -86,7 +86,11 @@ Message& Message::with(const Text& elements)
 
 Message Message::told(const Text& text)
 {
-    return sample(QString(text).section(u' ', 0, 0)).with(QString(text).section(u' ', 1));
+    const QStringList lines = QString(text).split(u'\n', Qt::SkipEmptyParts);
+    Message message = sample(lines.value(0).section(u' ', 0, 0)).with(lines.value(0).section(u' ', 1));
+    for (const QString& line : lines.mid(1))
+        message.line(line);
+    return message;
 }
 
 Message& Message::images(std::initializer_list<Text> ids)
@@ -112,6 +116,14 @@ Message& Message::line(const Text& kind, int number, const Text& change, const F
         (usual ? usual : add(line, name)).setText(value);
     }
     return *this;
+}
+
+Message& Message::line(const QString& told)
+{
+    const QStringList words = told.split(u' ');
+    if (!QStringList{u"labour"_s, u"part"_s, u"paint"_s, u"sublet"_s}.contains(words[0]))
+        throw std::runtime_error("not a line: " + told.toStdString());
+    return line(words[0], words.value(1).toInt(), words.value(2).remove(u'-'), fieldsIn(told.section(u' ', 3)));
 }
 
 QString marker(const Text& quoteNumber, const Text& subquote, const Text& action)

@@ -22,7 +22,8 @@ class Message {
 public:
     /// Reads the message from the file of that name in tests/data/messages.
     static Message sample(const Text& name);
-    /// Returns a sample with changed elements, such as "AUQT excess=400 quoteBody/quoteReference=500/2".
+    /// Returns a sample with changed elements, such as "AUQT excess=400 quoteBody/quoteReference=500/2". Each further
+    /// line of the text adds one to the quote body.
     static Message told(const Text& text);
     /// Creates a message without other elements. An empty code leaves `messageType` out.
     Message(const Text& code, const Text& root);
@@ -57,6 +58,8 @@ public:
     Message& sublet(int number, const Text& change, Fields set = {}) { return line("sublet", number, change, set); }
 
     Message& line(const Text& kind, int number, const Text& change, const Fields& fields);
+    /// Adds a line such as "labour 1 C labourDescription=Front door". The indicator "-" leaves the element out.
+    Message& line(const QString& told);
 
     QString text() const { return document.xml(); }
     operator Text() const { return text(); }
