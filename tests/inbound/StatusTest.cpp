@@ -71,8 +71,9 @@ TEST_F(StatusMessages, ASupplementaryQuoteStaysIfItsDeletionCannotBeNoted)
     EXPECT_EQ(rowCount("QUOTE2") + rowCount("QUOTE3"), 2);
 }
 
-TEST_F(StatusMessages, AMessageWhoseQuoteIsUnknownIsRefused)
+TEST_F(StatusMessages, AMessageWhoseQuoteIsUnknownOrHasNoLinesIsRefused)
 {
+    quote("502").request("QR5");
     // an empty number does not match an empty number
     quote("500").request("").quoteNumber("").stage(7).line(1);
     quote("").request("").quoteNumber("KQ9").line(1);
@@ -85,16 +86,9 @@ TEST_F(StatusMessages, AMessageWhoseQuoteIsUnknownIsRefused)
     EXPECT_TRUE(load(manualQuote("888").request(""))) << shown();
     EXPECT_TRUE(quoteExists("888"));
     EXPECT_EQ(quote("500").state(), "7 open - ");
+    EXPECT_EQ(quote("502").state(), "1 open - ");
     EXPECT_EQ(quote("500").lines(), 1);
     EXPECT_EQ(quote("").state(), "1 open KQ9 ");
-}
-
-TEST_F(StatusMessages, AnAdjustmentIsOfAQuoteWithLines)
-{
-    quote("500").request("QR1");
-    EXPECT_FALSE(load(adjustedQuote("500")));
-    EXPECT_EQ(shown(), "[none] Error: Cannot load an Adjustment onto a blank quote!");
-    EXPECT_EQ(quote("500").notes(), "");
 }
 
 static void takeResponse(const Text& file, const Text& number, const Text& status = "Submitted")
