@@ -24,7 +24,6 @@ Message returned(const QString& document, const char* indicator)
     return message;
 }
 
-/// Returns all columns of all lines.
 QStringList linesHeld()
 {
     return QString::fromStdString(holdings()).split(u'\n').filter(QRegularExpression(u"^QUOTE2 "_s));

@@ -10,7 +10,6 @@ struct UndoOfALoad : Interrupted {
         car("ABC123").set("KEST", 1);      // the new mark, too
     }
 
-    /// Loads a message and returns the load's operation.
     static qint64 loaded(const QString& file, const Message& message)
     {
         files::write(gsUnreadPath + file, message.text());

@@ -14,7 +14,6 @@ struct Preview : Previews {
             number == 720 ? QVariant(QStringList{u""_s, u"Assessment Result"_s}) : QVariant(u""_s);
         frmPrintPreview::ShowForm(number, parameters, table);
     }
-    /// Returns a table with one row.
     static db::Recordset table(const QString& cells)
     {
         db::Recordset row;

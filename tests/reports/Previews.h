@@ -18,7 +18,6 @@ protected:
     }
     ~Previews() override { report::setOutputFolder({}); }
 
-    /// Writes the template of a report.
     static void putTemplate(const char* name, const QByteArray& content)
     {
         files::writeBytes(u"c:\\wirra32\\report\\"_s + QString::fromLatin1(name), content);
@@ -31,7 +30,6 @@ protected:
             shown.append(desktop->record().windows[seen].toObject());
         return shown;
     }
-    /// Prints a message of the read folder, or a new one.
     static void print(const Text& message, bool reprint = true)
     {
         gsListFolder = gsReadPath;
@@ -44,7 +42,6 @@ protected:
         EXPECT_EQ(all.size(), 1);
         return all.value(0);
     }
-    /// Returns the window of a message's report.
     QJsonObject printed(const Text& message, bool reprint = false)
     {
         print(message, reprint);

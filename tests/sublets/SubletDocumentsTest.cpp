@@ -15,8 +15,7 @@ struct Sublet : Shop {
     {
         files::writeBytes(u"c:\\wirdoc\\PDF\\"_s + QString::fromLatin1(name), content);
     }
-    /// Creates a PDF document of two pages.
-    static void realDocument(const QString& name)
+    static void documentOfTwoPages(const QString& name)
     {
         QPdfWriter writer(files::systemPath(u"c:\\wirdoc\\PDF\\"_s + name));
         const QPainter painter(&writer);
@@ -46,7 +45,7 @@ TEST_F(Sublet, TheListShowsTheLineOfEachDocumentAndOpensTheChosenOne)
     row.line(3, "MIS", "Trim").set("VENDOR", nullptr);
     for (const char* name : {"500.0_1.pdf", "500.0_3.pdf", "500.0_9.pdf"})
         document(name, "this is no PDF");
-    realDocument(u"500.0_2.pdf"_s);
+    documentOfTwoPages(u"500.0_2.pdf"_s);
     desktop.emplace(R"({"windows": {"frmSubletAuth": [[ {"click": "Command1"},
         {"select": "ListView1", "item": "Windscreen"}, {"click": "Command1"}, {"click": "Command2"} ]],
         "frmViewPDF": [[ {"key": "AcroPDF1", "keys": ["Ctrl+=", "End", "Ctrl+1", "Home", "PgDown", "PgDown"]},
@@ -80,7 +79,7 @@ TEST_F(Sublet, ADocumentThatContainsItselfIsRefused)
 
 TEST_F(Sublet, ASavedCopyIsNamedAfterItsLine)
 {
-    realDocument(u"500.2_7.pdf"_s);
+    documentOfTwoPages(u"500.2_7.pdf"_s);
     const QString folder = root() + uR"(/my\documents/)"_s;
     ASSERT_TRUE(QDir().mkpath(folder) && QFile(folder + u"COPY.pdf"_s).open(QFile::WriteOnly));
     const QString copy = folder + u"copy.pdf"_s;
@@ -103,7 +102,7 @@ TEST_F(Sublet, ASavedCopyIsNamedAfterItsLine)
 
 TEST_F(Sublet, APrintTakesThePagesThatWereChosen)
 {
-    realDocument(u"500.0_1.pdf"_s);
+    documentOfTwoPages(u"500.0_1.pdf"_s);
     const QString output = root() + u"/printed.pdf"_s;
     for (const int only : {0, 2}) {
         const test::Hands hands(test::printing(u"frmViewPDF"_s, output, only ? QString::number(only) : QString()));

@@ -4,7 +4,6 @@
 #include "utilities/frmUtilities.h"
 
 struct Utilities : Shop {
-    /// Shows the window for the quote 500 and does the steps.
     void work(const std::string& steps, const QString& subquote = u"0"_s)
     {
         desktop.emplace(("{\"windows\": {\"frmUtilities\": [[" + steps + "]]}}").c_str());
@@ -22,7 +21,6 @@ struct Utilities : Shop {
         desktop::setFailureReporter(nullptr);
         return failures;
     }
-    /// Returns the texts that were last read from the controls.
     std::string texts() const
     {
         QStringList result;
