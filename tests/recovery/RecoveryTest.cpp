@@ -46,10 +46,7 @@ TEST_F(Interrupted, TheUserIsToldWhatBecameOfIt)
         settled.operation.file = file;
         settled.operation.number = number;
         settled.operation.started = started;
-        for (const recovery::Outcome any :
-             {recovery::Outcome::TakenBack, recovery::Outcome::Finished, recovery::Outcome::Left})
-            if (recovery::wordOf(any) == outcome)
-                settled.outcome = any;
+        settled.outcome = recovery::Outcome(QStringList{u"taken back"_s, u"finished"_s, u"left"_s}.indexOf(outcome));
         EXPECT_EQ(settled.sentence(), sentence);
     }
 }
@@ -167,18 +164,6 @@ TEST_F(Interrupted, AMessageOutOfSightIsNotTakenForMoved)
     EXPECT_EQ(newest().text("State"), "done");
     EXPECT_TRUE(recovery::takeSettled().value(1).left.value(0).startsWith(uR"(Its report "Quote Request" was not)"_s));
     EXPECT_EQ(filesIn(gsUnreadPath).size() + 1, filesIn(gsReadPath).size());
-}
-
-TEST_F(Interrupted, AMoveThatBeganEndsUnderItsName)
-{
-    arrive("m.xml", adjustedQuote("500"));
-    files::setFault([copy = files::systemPath(gsReadPath + u"500.0_1.xml"_s)] { return QFile::exists(copy); });
-    EXPECT_TRUE(loadAsTheWindow(u"m.xml"_s));
-    files::setFault({});
-    EXPECT_EQ(filesIn(gsUnreadPath), QStringList(u"m.xml"_s));
-    recovery::settle();
-    EXPECT_EQ(filesIn(gsReadPath), QStringList(u"500.0_1.xml"_s));
-    EXPECT_EQ(filesIn(gsUnreadPath), QStringList());
 }
 
 namespace {
