@@ -18,18 +18,15 @@ struct GoldenDocument : Sending {
     /// Adds the lines to the quote, sends it, and compares the total and the document.
     static void sends(const QuoteRow& quote, const std::string& name, double total, const QString& file)
     {
-        db::Recordset lines = opened(u"SELECT * FROM QUOTE2 WHERE 1=0"_s);
-        for (const auto& [category, script, columns] : casesIn<3>("outbound/" + name + ".txt")) {
-            lines.addNew();
-            for (const char* column : {"QTNNO", "Subquote"})
-                lines.set(QString::fromLatin1(column), quote.value(column));
-            lines.set(u"category"_s, category);
-            lines.set(u"script"_s, script);
-            lines.set(u"PartNo"_s, u""_s);
-            for (const auto& [column, value] : pairsIn(columns))
-                lines.set(column, column == "VENDOR"_L1 ? QVariant(vendor(value).id()) : QVariant(value));
-            lines.update();
-        }
+        for (const auto& [category, script, repairer, columns] : casesIn<4>("outbound/" + name + ".txt"))
+            addRow("QUOTE2",
+                   {{"QTNNO", quote.value("QTNNO")},
+                    {"Subquote", quote.value("Subquote")},
+                    {"category", category},
+                    {"script", script},
+                    {"PartNo", ""},
+                    {"VENDOR", repairer.isEmpty() ? QVariant() : vendor(repairer).id()}},
+                   columns);
         EXPECT_DOUBLE_EQ(send(quote.text("QTNNO")), total);
         const QString document =
             u"<request xmlns=\"http://quote3.webservice.orla.example\">"_s + outgoing(file) + u"</request>"_s;
