@@ -64,13 +64,9 @@ TEST_F(ManualQuotes, TheQuoteIsReplaced)
     car("ABC123").set("COLOUR", "sILVER");
     gConn->execute(u"UPDATE INSURER SET new_mu=25"_s);
     gConn->execute(u"UPDATE CINFO SET second_mu=15, recore_mu=16, after_mu=17"_s);
-    EXPECT_TRUE(load(manualQuote("500")
-                         .request("QR9")
-                         .claim("8800")
-                         .labour(1, "I")
-                         .labour(2, "I", {{"labourType", "REPR"}, {"labourAmount", "60"}})
-                         .part(3, "", {{"partQuantity", "2"}})
-                         .paint(4, "I")));
+    EXPECT_TRUE(
+        load(Message::told("MANQ quoteBody/quoteReference=500 quoteRequestNumber=QR9 claimNumber=8800\nlabour 1 I\n"
+                           "labour 2 I labourType=REPR labourAmount=60\npart 3 - partQuantity=2\npaint 4 I")));
     EXPECT_EQ(shown(), "");
     EXPECT_EQ(rowCount("QUOTE2", "QTNNO='500' AND SEQ_NO<=4"), 4);
     EXPECT_EQ(rowCount("QUOTE2"), 4 + 1);

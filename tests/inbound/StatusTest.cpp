@@ -60,17 +60,6 @@ TEST_F(StatusMessages, ASupplementaryQuoteIsDeletedOnlyWhenTheUserAgrees)
         << "the file is named after the quote that has gone";
 }
 
-TEST_F(StatusMessages, ASupplementaryQuoteStaysIfItsDeletionCannotBeNoted)
-{
-    quote("500");
-    quote("500", 2).quoteNumber("KQ2").line(1);
-    gConn->execute(u"DELETE FROM QUOTE3 WHERE Subquote=0"_s);
-    desktop.emplace(R"({"boxes": [{"text": "will be DELETED", "answer": "yes"}]})");
-    EXPECT_FALSE(load(quoteDeletion("KQ2")));
-    EXPECT_TRUE(quoteExists("500", 2));
-    EXPECT_EQ(rowCount("QUOTE2") + rowCount("QUOTE3"), 2);
-}
-
 TEST_F(StatusMessages, AMessageWhoseQuoteIsUnknownOrHasNoLinesIsRefused)
 {
     quote("502").request("QR5");
