@@ -4,7 +4,6 @@
 #include "platform/script/Gestures.h"
 #include "reports/Previews.h"
 #include "reports/frmPrintPreview.h"
-#include "support/FullDisk.h"
 #include "support/Hands.h"
 
 struct Preview : Previews {
@@ -157,13 +156,6 @@ TEST_F(Preview, ALayoutWithoutRoomIsAFailureThatIsTold)
     putTemplate("720.html", "<title>T</title><body><header>" + tall + "</header><p>x</p></body>");
     show(720);
     EXPECT_NE(shown().find("The report \"T\" does not fit on this paper"), std::string::npos);
-}
-
-TEST_F(Preview, APdfThatCannotBeWrittenWholeIsNotThere)
-{
-    const auto full = fullDisk(2000);
-    EXPECT_EQ(failureOf([&] { report::writePdf(comparisonOf(30, u"line %1"_s), root() + u"/out.pdf"_s); }), DiskFull);
-    EXPECT_EQ(filesIn(root()).filter(u"pdf"_s), QStringList());
 }
 
 TEST_F(Preview, TheViewerFillsTheWindowAboveItsButton)
