@@ -137,11 +137,6 @@ void removeTemporaryFiles()
         QFile::remove(walk.next());
 }
 
-qint64 logSize()
-{
-    return QFileInfo(errorLogPath()).size();
-}
-
 /// Waits until the server has noticed that the killed process is gone.
 void waitForLocks()
 {
@@ -276,14 +271,14 @@ bool Trial::disturb(Fault fault, int number)
     bool isReached = true;
     before.restore();
     work.prepare();
-    const qint64 logBefore = logSize();
+    const qint64 logBefore = QFileInfo(errorLogPath()).size();
     QString first = u"killed"_s;
     if (fault == Fault::Kill)
         isReached = killAt(number);
     else
         first = run(fault, number);
-    const bool isTold =
-        fault == Fault::Kill || !(sentencesIn(first) - sentencesIn(undisturbed)).isEmpty() || logSize() > logBefore;
+    const bool isTold = fault == Fault::Kill || !(sentencesIn(first) - sentencesIn(undisturbed)).isEmpty() ||
+                        QFileInfo(errorLogPath()).size() > logBefore;
     const bool isDone = work.isDone();
     attempt([] { Faults::openList(); });  // this takes interrupted work back, or finishes it
     const QString second = work.isDone() ? QString() : run();
@@ -326,28 +321,23 @@ void Trial::tellWhatCameUp(bool isWhole) const
 
 }  // namespace
 
-static void open(frmMessageList& window, const std::function<void()>& then)
-{
-    window.openUnread();
-    then();
-    statusShown = control<QLabel>(window, "lblStatus").text();
-}
-
 QStringList Faults::openList()
 {
     QStringList rows;
     frmMessageList window;
-    open(window, [&] {
-        for (const ListedMessage& message : window.rows())
-            rows << message.file + u'|' + QStringList(message.row.begin(), message.row.end()).join(u'|');
-    });
+    window.openUnread();
+    for (const ListedMessage& message : window.rows())
+        rows << message.file + u'|' + QStringList(message.row.begin(), message.row.end()).join(u'|');
+    statusShown = control<QLabel>(window, "lblStatus").text();
     return rows;
 }
 
 void Faults::loadFirst()
 {
     frmMessageList window;
-    open(window, [&] { control<QPushButton>(window, "cmdProcess").click(); });
+    window.openUnread();
+    control<QPushButton>(window, "cmdProcess").click();
+    statusShown = control<QLabel>(window, "lblStatus").text();
 }
 
 void Faults::survives(const QString& name, const Work& work)
