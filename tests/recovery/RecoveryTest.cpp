@@ -1,8 +1,63 @@
 // What becomes of interrupted work when it is settled, and what the user is told.
+#include "base/CredentialCipher.h"
 #include "inbound/modLoadXML.h"
+#include "jobexport/JobLinkSettings.h"
 #include "messagelist/frmMessageList.h"
 #include "recovery/Interrupted.h"
 #include "support/Hands.h"
+#include "support/MariaDbServer.h"
+
+TEST_F(Interrupted, AnExportIsMadeUnlessItHasBegun)
+{
+    const struct {
+        std::optional<int> status;  // of the job that the load has made, if its number is known
+        QStringList statusAfter;    // of all jobs
+        QStringList told;
+        bool isMessageThere;
+    } cases[] = {
+        {{}, {u"1"_s}, {}, true},
+        {{}, {u"1"_s}, {u"Its message has been removed or changed since, so it was not moved."_s}, false},
+        {1, {u"1"_s}, {}, true},
+        {0, {u"0"_s}, {u"JobLink may have only a part of job 1: check it there."_s}, true},
+    };
+    InitCipherKey();
+    quote("500").line(1).set("tosend", "A");
+    putTemplate(730);
+    const db::ConnectionPtr jobs = std::make_shared<db::Connection>();
+    const Snapshot before;
+    for (const auto& [status, statusAfter, told, isMessageThere] : cases) {
+        mariaDb().createDatabase(u"jobs"_s, files::read(checkoutFile(u"sql/joblink.sql"_s)));
+        jobs->open(mariaDb().connectionText(u"jobs"_s));
+        {  // without JobLink's settings nothing is exported yet
+            QString text = authorisedQuote("500").labour(1, "C").text();
+            files::write(gsUnreadPath + u"m.xml"_s, text);
+            const journal::Operation operation(journal::Kind::Load, u"m.xml"_s, journal::hashOf(text));
+            ASSERT_TRUE(LoadXML(text, u"m.xml"_s));
+            if (status) {
+                jobs->execute(u"INSERT INTO newJob SET Status=%1"_s.arg(*status));
+                journal::keep(u"job"_s, 1);
+            }
+        }
+        // as if the process had died, and the workstation had been renamed
+        gConn->execute(u"UPDATE KESTOperation SET State='open', Workstation='OTHER'"_s);
+        storeJobLinkSettings({u"127.0.0.1"_s, mariaDb().port(), u"jobs"_s, mariaDb().user(), mariaDb().password()});
+        if (!isMessageThere)
+            files::remove(gsUnreadPath + u"m.xml"_s);
+
+        recovery::settle();
+
+        const QList<recovery::Settled> settled = recovery::takeSettled();
+        EXPECT_EQ(settled.value(0).left, told);
+        QStringList found;
+        db::Recordset rows(jobs);
+        for (rows.open(u"SELECT Status FROM newJob"_s); !rows.eof(); rows.moveNext())
+            found += rows.text(u"Status"_s);
+        EXPECT_EQ(found, statusAfter);
+        EXPECT_EQ(files::exists(gsUnreadPath + u"m.xml"_s), false);
+        before.restore();
+        EnsureConnection();
+    }
+}
 
 TEST_F(Interrupted, ASendIsNotFinishedOverItsAnswer)
 {
@@ -81,21 +136,19 @@ TEST_F(Interrupted, TheListTellsWhatWasSettledBesideItsMessages)
 
 TEST_F(Interrupted, WhatNobodySawIsTold)
 {
-    const std::pair<Text, const char*> document("subletAuthorityDocument", "JVBERi0xLjQ=");
     const QString sublets = uR"(window "Sublet Authority Documents")"_s;
-    const std::tuple<Message, const char*, QStringList> cases[] = {
-        {quoteRequest("QR9"), "frmPrintPreview", {uR"(report "Quote Request")"_s}},
-        {authorisedQuote("500").sublet(5, "I", {document}),
-         "frmPrintPreview",
-         {uR"(report "Authorised Quote")"_s, sublets}},
-        {authorisedQuote("500").sublet(6, "I", {document}), "frmSubletAuth", {sublets}},
-        {excessWaiver("500"), "", {}},
+    const QString document = u" I subletAuthorityDocument=JVBERi0xLjQ="_s;
+    const std::tuple<QString, const char*, QStringList> cases[] = {
+        {u"QREQ quoteRequestNumber=QR9"_s, "frmPrintPreview", {uR"(report "Quote Request")"_s}},
+        {u"AUQT\nsublet 5"_s + document, "frmPrintPreview", {uR"(report "Authorised Quote")"_s, sublets}},
+        {u"AUQT\nsublet 6"_s + document, "frmSubletAuth", {sublets}},
+        {u"EWAP"_s, "", {}},
     };
     for (const int number : {710, 730})
         putTemplate(number);
     for (const auto& [message, window, notShown] : cases) {  // the process ends while the window is open
         SCOPED_TRACE(window);
-        arrive("m.xml", message);
+        arrive("m.xml", Message::told(message));
         desktop.emplace(R"({"windows": {")" + QByteArray(window) + R"(": [[{"click": "nothing"}]]}})");
         if (*window) {
             EXPECT_ANY_THROW(loadAsTheWindow(u"m.xml"_s));  // as an unattended command ends
