@@ -38,12 +38,8 @@ TEST_F(Requests, ARequestBecomesANewQuote)
 
 TEST_F(Requests, TheUniversalInsurerIsPreferredAmongMany)
 {
-    const QString universal = u"KEST Universal Insurer"_s;
     int request = 0;
-    for (const auto& [names, chosen] : {std::pair(u"A, B"_s, u"A"_s),
-                                        {u"A, "_s + universal, u"A"_s},
-                                        {universal + u", B"_s, u"B"_s},
-                                        {u"A, B, %1, C"_s.arg(universal), universal}}) {
+    for (const auto& [names, chosen] : casesIn<2>("inbound/insurers.txt")) {
         insurers(names);
         const Row made("QUOTE1", "KESTQRNo='QR" + std::to_string(++request) + "'");
         EXPECT_TRUE(load(quoteRequest("QR" + std::to_string(request))));

@@ -21,17 +21,12 @@ TEST_F(StatusMessages, EachMovesTheQuoteToItsState)
 
 TEST_F(StatusMessages, EachMeansOneQuoteOfTheRequest)
 {
-    enum { oldest, newest };
-    const std::pair<Message, int> cases[] = {
-        {cancellation("QR1"), oldest},     {cancellationBackout("QR1"), oldest}, {revisionRequest("QR1"), newest},
-        {assessmentResult("KQ1"), oldest}, {assessmentBackout("QR1"), newest},
-    };
-    for (const auto& [message, meant] : cases) {
-        for (const int subquote : {oldest, newest})
+    for (const auto& [message, meant] : casesIn<2>("inbound/meant-quotes.txt")) {
+        for (const int subquote : {0, 1})
             quote("500", subquote).request("QR1").quoteNumber("KQ1").stage(7);
-        EXPECT_TRUE(load(message));
-        EXPECT_NE(quote("500", meant).stage(), 7) << message.text();
-        EXPECT_EQ(quote("500", 1 - meant).stage(), 7) << message.text();
+        EXPECT_TRUE(load(Message::told(message)));
+        for (const int subquote : {0, 1})
+            EXPECT_EQ(quote("500", subquote).stage() != 7, subquote == meant.toInt()) << message;
     }
 }
 
