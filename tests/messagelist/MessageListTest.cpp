@@ -18,8 +18,9 @@ struct MessageListWindow : Shop {
         for (const QJsonValue read : desktop->record().reads) {
             const QJsonObject values = read[u"values"].toObject();
             const QJsonValue held = values[u"ListView1"][u"rows"][0];
-            const QString other = values[u"txtXML"][u"text"].toString().section(u' ', 0, 0) + held[3].toString();
-            seen += values.contains(u"lblStatus"_s) ? look(values) : u">> "_s + other;
+            const QStringList other{values[u"txtXML"][u"text"].toString().section(u' ', 0, 0), held[0].toString(),
+                                    held[3].toString()};
+            seen += values.contains(u"lblStatus"_s) ? look(values) : u">> "_s + other.join(u' ').trimmed();
         }
         for (const QString& box : desktop->boxes())
             seen += u"! "_s + box;
@@ -117,6 +118,7 @@ TEST_P(MessageListVisit, ShowsWhatIsWritten)
                 files::write(folder + name + u".xml"_s, told.isEmpty() ? told : Message::told(told).text());
         }
     }
+    ASSERT_FALSE(expected.isEmpty());
     EXPECT_EQ(visit(steps, answers).join(u'\n'), expected.join(u'\n')) << GetParam().section(u'\n', 0, 0);
 }
 

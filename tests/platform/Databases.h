@@ -26,7 +26,10 @@ protected:
     static bool isOneOf(const QString& engines)
     {
         const QStringList names{u"embedded"_s, u"mysql"_s, u"odbc"_s, u"tds"_s};
-        return engines.split(u' ').contains(names[int(GetParam())]);
+        const QStringList chosen = engines.split(u' ');
+        if (!std::ranges::all_of(chosen, [&](const QString& engine) { return names.contains(engine); }))
+            throw std::invalid_argument("no engines: " + engines.toStdString());
+        return chosen.contains(names[int(GetParam())]);
     }
     db::ConnectionPtr connect() const;
     db::Recordset query(const QString& select) const;

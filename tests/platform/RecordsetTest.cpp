@@ -107,8 +107,22 @@ TEST_P(RecordsetOn, DoesWhatTheTableOfStepsSays)
                 connection->execute(u"DELETE FROM "_s + table);
             lines = query(u"SELECT * FROM LINE ORDER BY id"_s);
         } else if (isOfThisEngine) {
+            ASSERT_EQ(row.size(), 2) << rule << ' ' << row[0];
             EXPECT_EQ(outcomeOf([&] { return done(row[0]); }), row[1]) << rule << ' ' << row[0];
         }
+    }
+}
+
+TEST_P(RecordsetOn, AnUpdateThatNobodyWatchesIsOneStatement)
+{
+    add(u"CODE=A"_s);
+    lines.update();
+    int statements = 0;
+    db::setStatementFault([&] { return ++statements < 0; });
+    for (const auto& [code, sent] : {std::pair(u"A"_s, 0), {u"a"_s, 1}}) {
+        lines.set(u"CODE"_s, code);
+        lines.update();
+        EXPECT_EQ(statements, sent) << code;
     }
 }
 

@@ -21,6 +21,8 @@ QStringList linesOf(const std::string& name)
 {
     QStringList lines = QString::fromUtf8(dataFile(name)).split(u'\n', Qt::SkipEmptyParts);
     lines.removeIf([](const QString& line) { return line.startsWith(u'#'); });
+    if (lines.isEmpty())
+        throw std::runtime_error("no lines in " + name);
     return lines;
 }
 

@@ -14,7 +14,7 @@
 
 namespace kest::test {
 
-constexpr int startMilliseconds = 30000;
+constexpr int startMilliseconds = 60000;
 constexpr int stopMilliseconds = 10000;
 
 TestServer::TestServer(const QString& name, QString first, QString creation)
