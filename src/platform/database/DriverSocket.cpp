@@ -29,13 +29,23 @@ quint64 inodeOf(int descriptor)
     return isConnected ? status.st_ino : 0;
 }
 
+/// Returns true if a socket is one between programs of this machine.
+bool isLocal(int descriptor)
+{
+    sockaddr_storage own{};
+    socklen_t size = sizeof own;
+    return ::getsockname(descriptor, reinterpret_cast<sockaddr*>(&own), &size) == 0 && own.ss_family == AF_UNIX;
+}
+
 /// Returns the descriptors of all connected sockets of this process by their inodes.
 QHash<quint64, int> connectedSockets()
 {
     QHash<quint64, int> sockets;
     std::error_code failure;  // without the list of the system, no socket is known
-    for (const auto& entry : std::filesystem::directory_iterator("/proc/self/fd", failure)) {
-        const std::string name = entry.path().filename();
+    const std::filesystem::directory_iterator end;
+    for (std::filesystem::directory_iterator entry("/proc/self/fd", failure); !failure && entry != end;
+         entry.increment(failure)) {
+        const std::string name = entry->path().filename();
         int descriptor = -1;
         std::from_chars(name.data(), name.data() + name.size(), descriptor);
         if (const quint64 inode = inodeOf(descriptor); inode != 0)
@@ -56,6 +66,8 @@ void DriverSocket::find()
 {
     QHash<quint64, int> added = connectedSockets();
     added.removeIf([&](const std::pair<const quint64&, int&>& socket) { return before.contains(socket.first); });
+    if (added.size() > 1)  // the desktop and the system open local ones at any time
+        added.removeIf([](const std::pair<const quint64&, int&>& socket) { return isLocal(socket.second); });
     if (added.size() != 1)
         return;
     inode = added.cbegin().key();

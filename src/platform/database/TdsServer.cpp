@@ -61,9 +61,12 @@ QByteArray answerOf(const QString& host, int port, int socketType, const QByteAr
     if (::getaddrinfo(host.toUtf8().constData(), QByteArray::number(port).constData(), &wanted, &found) != 0)
         return {};
     const std::unique_ptr<addrinfo, decltype(&::freeaddrinfo)> addresses(found, &::freeaddrinfo);
+    int left = 0;
+    for (const addrinfo* address = found; address; address = address->ai_next)
+        ++left;
     QByteArray answer;
     for (const addrinfo* address = found; address && answer.isEmpty(); address = address->ai_next)
-        answer = answerOf(*address, question, deadline);
+        answer = answerOf(*address, question, QDeadlineTimer(deadline.remainingTime() / left--));
     return answer;
 }
 
