@@ -27,7 +27,7 @@ const QRegularExpression& numberForm()
 std::optional<double> readNumber(const QString& text)
 {
     if (text.isEmpty())
-        return {};  // the usual setting; the pattern is expensive when it is first used
+        return {};  // as many settings are; the pattern is expensive when it is first used
     bool read = false;
     // reads most texts, but not digits in groups; also accepts "inf" and "nan", which are not numbers
     const double plain = text.toDouble(&read);

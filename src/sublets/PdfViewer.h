@@ -1,4 +1,4 @@
-// Shows PDF documents. The window is in a library of its own, because the libraries that it needs are many.
+// Shows PDF documents. The window is in a library of its own, because it needs many others.
 #pragma once
 
 #include <QString>
